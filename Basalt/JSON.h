@@ -1,0 +1,64 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <concepts>
+#include <stdexcept>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include <nlohmann/json_fwd.hpp>
+
+#include <Platform/Api.h>
+
+namespace Basalt {
+
+using JSON = nlohmann::json;
+
+/// Why a JSON value could not become a value of some type. It is thrown by constructors and
+/// functions that import JSON, and by nothing else.
+class VARNEL_API JSONError final : public std::runtime_error {
+ public:
+  enum class Kind {
+    typeMismatch,  ///< A value of the wrong type stands at `path()`.
+    missingValue,  ///< Nothing stands at `path()`.
+    message,       ///< The value has the right shape and is refused; `what()` says why.
+  };
+
+  /// The value at `path` has not the shape that `typeName` needs. The top value's path is "root".
+  [[nodiscard]] static JSONError typeMismatch(std::string typeName, std::string path);
+  [[nodiscard]] static JSONError missingValue(std::string typeName, std::string path);
+  [[nodiscard]] static JSONError withMessage(const std::string& message);
+
+  [[nodiscard]] Kind kind() const { return kind_; }
+  [[nodiscard]] const std::string& typeName() const { return typeName_; }
+  [[nodiscard]] const std::string& path() const { return path_; }
+
+ private:
+  JSONError(Kind kind, const std::string& text, std::string typeName, std::string path);
+
+  Kind kind_;
+  std::string typeName_;
+  std::string path_;
+};
+
+/// A type that can be made from a JSON value; its constructor throws `JSONError`.
+template <typename Type>
+concept JSONImportable = std::constructible_from<Type, const JSON&> && Type::canImportJSON;
+
+/// A type that can be written as a JSON value.
+template <typename Type>
+concept JSONExportable = Type::canExportJSON && requires(const Type& value) {
+  { value.exportJSON() } -> std::same_as<JSON>;
+};
+
+/// A type that goes both ways.
+template <typename Type>
+concept JSONConvertable = JSONImportable<Type> && JSONExportable<Type> && Type::canConvertJSON;
+
+/// The strings of a JSON list. Throws the type mismatch, naming `typeName` and "root", when `json`
+/// is anything but a list of strings.
+[[nodiscard]] VARNEL_API std::vector<std::string> importStrings(const JSON& json,
+                                                                std::string_view typeName);
+
+}  // namespace Basalt

@@ -1,0 +1,59 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Ports/ProcessInfo.h>
+
+#include <dlfcn.h>
+
+#include <cstdlib>
+#include <filesystem>
+
+#include <Platform/Generic/BundleFolders.h>
+#include <Platform/Linux/Adapters.h>
+
+namespace Varnel::Platform::Linux {
+namespace {
+
+namespace fs = std::filesystem;
+
+std::optional<std::string> asText(const std::optional<fs::path>& path) {
+  if (!path) return std::nullopt;
+  return path->string();
+}
+
+class ProcProcessInfo final : public ProcessInfo {
+ public:
+  std::optional<std::string> environmentVariable(std::string_view name) const override {
+    const char* value = std::getenv(std::string(name).c_str());
+    if (!value) return std::nullopt;
+    return value;
+  }
+
+  std::string executablePath() const override {
+    std::error_code failed;
+    const fs::path path = fs::read_symlink("/proc/self/exe", failed);
+    return failed ? std::string() : path.string();
+  }
+
+  std::optional<std::string> mainBundleFolder() const override {
+    const fs::path executable = executablePath();
+    return asText(findBundleFolder(executable, executable.filename().string()));
+  }
+
+  std::optional<std::string> bundleFolderOfCode(const void* address,
+                                                std::string_view name) const override {
+    Dl_info image{};
+    if (::dladdr(address, &image) == 0 || !image.dli_fname) return std::nullopt;
+    std::error_code failed;
+    fs::path path = fs::canonical(image.dli_fname, failed);
+    // The loader names the executable itself as it was called, perhaps by a relative path.
+    if (failed) path = executablePath();
+    return asText(findBundleFolder(path, name));
+  }
+};
+
+}  // namespace
+
+std::unique_ptr<ProcessInfo> makeProcessInfo() {
+  return std::make_unique<ProcProcessInfo>();
+}
+
+}  // namespace Varnel::Platform::Linux

@@ -1,0 +1,48 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Ports/AppendFiles.h>
+#include <Platform/Ports/Clock.h>
+#include <Platform/Ports/DeviceRegistry.h>
+#include <Platform/Ports/DiskArbitration.h>
+#include <Platform/Ports/Ports.h>
+#include <Platform/Ports/ProcessInfo.h>
+#include <Platform/Ports/SecurityScope.h>
+#include <Platform/Ports/StandardOutput.h>
+#include <Platform/Ports/SystemLog.h>
+#include <Platform/Ports/UserAccount.h>
+#include <Platform/Ports/UserLocale.h>
+#include <Platform/Ports/VolumeCatalog.h>
+#include <Platform/Ports/Workspace.h>
+
+#include <Platform/Linux/Adapters.h>
+#include <Platform/POSIX/Adapters.h>
+
+namespace Varnel::Platform {
+namespace {
+
+// The process keeps its services for ever: threads that outlive main may still log.
+template <typename Port>
+Port& keep(std::unique_ptr<Port> adapter) {
+  return *adapter.release();
+}
+
+}  // namespace
+
+const Ports& systemPorts() {
+  static const Ports& ports = *new Ports{
+      .appendFiles = keep(POSIX::makeAppendFiles()),
+      .clock = keep(POSIX::makeClock()),
+      .deviceRegistry = keep(Linux::makeDeviceRegistry()),
+      .diskArbitration = keep(Linux::makeDiskArbitration()),
+      .processInfo = keep(Linux::makeProcessInfo()),
+      .securityScope = keep(POSIX::makeSecurityScope()),
+      .standardOutput = keep(POSIX::makeStandardOutput()),
+      .systemLog = keep(POSIX::makeSystemLog()),
+      .userAccount = keep(POSIX::makeUserAccount()),
+      .userLocale = keep(POSIX::makeUserLocale()),
+      .volumeCatalog = keep(Linux::makeVolumeCatalog()),
+      .workspace = keep(Linux::makeWorkspace()),
+  };
+  return ports;
+}
+
+}  // namespace Varnel::Platform

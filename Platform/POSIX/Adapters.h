@@ -1,0 +1,29 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+
+namespace Varnel::Platform {
+
+class AppendFiles;
+class Clock;
+class SecurityScope;
+class StandardOutput;
+class SystemLog;
+class UserAccount;
+class UserLocale;
+
+}  // namespace Varnel::Platform
+
+/// Adapters for any system of the POSIX family.
+namespace Varnel::Platform::POSIX {
+
+[[nodiscard]] std::unique_ptr<AppendFiles> makeAppendFiles();
+[[nodiscard]] std::unique_ptr<Clock> makeClock();
+[[nodiscard]] std::unique_ptr<SecurityScope> makeSecurityScope();
+[[nodiscard]] std::unique_ptr<StandardOutput> makeStandardOutput();
+[[nodiscard]] std::unique_ptr<SystemLog> makeSystemLog();
+[[nodiscard]] std::unique_ptr<UserAccount> makeUserAccount();
+[[nodiscard]] std::unique_ptr<UserLocale> makeUserLocale();
+
+}  // namespace Varnel::Platform::POSIX

@@ -1,0 +1,56 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Ports/AppendFiles.h>
+
+#include <fcntl.h>
+#include <sys/stat.h>
+
+#include <cerrno>
+
+#include <Platform/POSIX/Adapters.h>
+#include <Platform/POSIX/FileDescriptor.h>
+
+namespace Varnel::Platform::POSIX {
+namespace {
+
+std::error_code lastError() {
+  return {errno, std::generic_category()};
+}
+
+class DescriptorAppendFile final : public AppendFile {
+ public:
+  explicit DescriptorAppendFile(FileDescriptor descriptor) : descriptor_(std::move(descriptor)) {}
+
+  std::error_code append(std::string_view bytes) override {
+    while (!bytes.empty()) {
+      const ssize_t written = ::write(descriptor_.get(), bytes.data(), bytes.size());
+      if (written < 0 && errno == EINTR) continue;
+      if (written < 0) return lastError();
+      bytes.remove_prefix(static_cast<std::size_t>(written));
+    }
+    return {};
+  }
+
+ private:
+  FileDescriptor descriptor_;
+};
+
+class DescriptorAppendFiles final : public AppendFiles {
+ public:
+  Result<std::unique_ptr<AppendFile>, std::error_code> open(const std::string& path) override {
+    // O_APPEND makes the system choose the end anew for each write, so that two processes may share
+    // the file.
+    FileDescriptor descriptor(
+        ::open(path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_CLOEXEC, S_IRUSR | S_IWUSR));
+    if (!descriptor) return lastError();
+    return std::unique_ptr<AppendFile>(
+        std::make_unique<DescriptorAppendFile>(std::move(descriptor)));
+  }
+};
+
+}  // namespace
+
+std::unique_ptr<AppendFiles> makeAppendFiles() {
+  return std::make_unique<DescriptorAppendFiles>();
+}
+
+}  // namespace Varnel::Platform::POSIX

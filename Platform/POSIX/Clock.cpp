@@ -1,0 +1,22 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Ports/Clock.h>
+
+#include <Platform/POSIX/Adapters.h>
+
+namespace Varnel::Platform::POSIX {
+namespace {
+
+class WallClock final : public Clock {
+ public:
+  Date now() const override {
+    return std::chrono::floor<Date::duration>(std::chrono::system_clock::now());
+  }
+};
+
+}  // namespace
+
+std::unique_ptr<Clock> makeClock() {
+  return std::make_unique<WallClock>();
+}
+
+}  // namespace Varnel::Platform::POSIX

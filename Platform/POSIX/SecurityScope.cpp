@@ -1,0 +1,24 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Ports/SecurityScope.h>
+
+#include <unistd.h>
+
+#include <Platform/POSIX/Adapters.h>
+
+namespace Varnel::Platform::POSIX {
+namespace {
+
+// Without a sandbox there is no gate to open: a file is readable or it is not.
+class FileRights final : public SecurityScope {
+ public:
+  bool startAccessing(const URL& url) override { return ::access(url.path().c_str(), R_OK) == 0; }
+  void stopAccessing(const URL&) override {}
+};
+
+}  // namespace
+
+std::unique_ptr<SecurityScope> makeSecurityScope() {
+  return std::make_unique<FileRights>();
+}
+
+}  // namespace Varnel::Platform::POSIX

@@ -1,0 +1,63 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Ports/UserAccount.h>
+
+#include <pwd.h>
+#include <unistd.h>
+
+#include <cstdlib>
+#include <optional>
+#include <string_view>
+#include <vector>
+
+#include <Platform/POSIX/Adapters.h>
+
+namespace Varnel::Platform::POSIX {
+namespace {
+
+struct Record {
+  std::string name;
+  std::string homeFolder;
+};
+
+std::string withoutTrailingSlashes(std::string_view path) {
+  while (path.size() > 1 && path.back() == '/') path.remove_suffix(1);
+  return std::string(path);
+}
+
+std::optional<Record> recordOfUser() {
+  std::vector<char> buffer(16384);
+  passwd entry{};
+  passwd* found = nullptr;
+  if (::getpwuid_r(::getuid(), &entry, buffer.data(), buffer.size(), &found) != 0 || !found)
+    return std::nullopt;
+  return Record{found->pw_name, withoutTrailingSlashes(found->pw_dir)};
+}
+
+std::string environmentOr(const char* name, std::string fallback) {
+  const char* value = std::getenv(name);
+  return value && *value ? withoutTrailingSlashes(value) : std::move(fallback);
+}
+
+// A user without a record (a bare container) still has the environment; the root folder comes last.
+class PasswdAccount final : public UserAccount {
+ public:
+  std::string homeFolder() const override { return environmentOr("HOME", realHomeFolder()); }
+
+  std::string realHomeFolder() const override {
+    if (auto record = recordOfUser()) return record->homeFolder;
+    return environmentOr("HOME", "/");
+  }
+
+  std::string name() const override {
+    if (auto record = recordOfUser()) return record->name;
+    return environmentOr("USER", std::to_string(::getuid()));
+  }
+};
+
+}  // namespace
+
+std::unique_ptr<UserAccount> makeUserAccount() {
+  return std::make_unique<PasswdAccount>();
+}
+
+}  // namespace Varnel::Platform::POSIX

@@ -1,0 +1,20 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <Platform/Api.h>
+#include <Platform/Values/Date.h>
+
+namespace Varnel::Platform {
+
+/// Tells the wall-clock time. Any thread.
+///
+/// Tests hand in a `SimulatedClock`, which stands still until it is moved.
+class VARNEL_API Clock {
+ public:
+  virtual ~Clock() = default;
+
+  /// The present moment; it jumps when the user sets the clock.
+  [[nodiscard]] virtual Date now() const = 0;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,31 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <string>
+#include <vector>
+
+#include <Platform/Api.h>
+#include <Platform/Values/URL.h>
+
+namespace Varnel::Platform {
+
+/// Connects device names with the places they are mounted on. Any thread.
+class VARNEL_API DiskArbitration {
+ public:
+  /// One consistent view of the system's disks. One thread at a time.
+  class Session {
+   public:
+    virtual ~Session() = default;
+
+    /// The URLs of all places that the device ("sda1") is mounted on; empty when there are none.
+    [[nodiscard]] virtual std::vector<URL> mountURLs(const std::string& deviceName) = 0;
+  };
+
+  virtual ~DiskArbitration() = default;
+
+  /// Null when the service cannot be reached.
+  [[nodiscard]] virtual std::unique_ptr<Session> openSession() = 0;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,49 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <Platform/Api.h>
+
+namespace Varnel::Platform {
+
+class AppendFiles;
+class Clock;
+class DeviceRegistry;
+class DiskArbitration;
+class ProcessInfo;
+class SecurityScope;
+class StandardOutput;
+class SystemLog;
+class UserAccount;
+class UserLocale;
+class VolumeCatalog;
+class Workspace;
+
+/// One service of each kind. The objects behind the references outlive whoever uses them.
+struct Ports {
+  AppendFiles& appendFiles;
+  Clock& clock;
+  DeviceRegistry& deviceRegistry;
+  DiskArbitration& diskArbitration;
+  ProcessInfo& processInfo;
+  SecurityScope& securityScope;
+  StandardOutput& standardOutput;
+  SystemLog& systemLog;
+  UserAccount& userAccount;
+  UserLocale& userLocale;
+  VolumeCatalog& volumeCatalog;
+  Workspace& workspace;
+};
+
+/// The process's own services: those of the system, unless the host installed others before the
+/// first use. Any thread; made on first use and never destroyed.
+[[nodiscard]] VARNEL_API const Ports& processPorts();
+
+/// Makes `ports` the process's services. It must be called before anything of the framework is used
+/// and at most once; returns false, and changes nothing, when it comes too late.
+[[nodiscard]] VARNEL_API bool installProcessPorts(const Ports& ports);
+
+/// The services of the system that the library was built for. Whoever builds for another system
+/// supplies this function with the adapters. Made on first use and never destroyed.
+[[nodiscard]] VARNEL_API const Ports& systemPorts();
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,33 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include <Platform/Api.h>
+
+namespace Varnel::Platform {
+
+/// Facts of the running process that do not change while it runs. Any thread.
+class VARNEL_API ProcessInfo {
+ public:
+  virtual ~ProcessInfo() = default;
+
+  /// The value of an environment variable; absent when it is not set, empty when set to nothing.
+  [[nodiscard]] virtual std::optional<std::string> environmentVariable(
+      std::string_view name) const = 0;
+
+  /// The absolute path of the running executable; empty when the system does not tell.
+  [[nodiscard]] virtual std::string executablePath() const = 0;
+
+  /// The folder that holds the running application's Info.plist; absent when it has none.
+  [[nodiscard]] virtual std::optional<std::string> mainBundleFolder() const = 0;
+
+  /// The folder with the Info.plist of the library or executable whose code lies at `address`;
+  /// `name` is the name of its folder below the installation's shared data.
+  [[nodiscard]] virtual std::optional<std::string> bundleFolderOfCode(
+      const void* address, std::string_view name) const = 0;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,20 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <Platform/Api.h>
+#include <Platform/Values/URL.h>
+
+namespace Varnel::Platform {
+
+/// The sandbox's gate in front of files that the user has chosen. Any thread.
+class VARNEL_API SecurityScope {
+ public:
+  virtual ~SecurityScope() = default;
+
+  /// Opens the gate for a file or folder; false when the process may not read it. Every success
+  /// wants one `stopAccessing`.
+  [[nodiscard]] virtual bool startAccessing(const URL& url) = 0;
+  virtual void stopAccessing(const URL& url) = 0;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,19 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string_view>
+
+#include <Platform/Api.h>
+
+namespace Varnel::Platform {
+
+/// The system's own log, for what must be told below the framework's logger. Any thread.
+class VARNEL_API SystemLog {
+ public:
+  virtual ~SystemLog() = default;
+
+  /// Writes one line, without terminator. Never fails visibly.
+  virtual void write(std::string_view line) = 0;
+};
+
+}  // namespace Varnel::Platform

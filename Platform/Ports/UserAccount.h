@@ -1,0 +1,25 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+
+#include <Platform/Api.h>
+
+namespace Varnel::Platform {
+
+/// The user that the process runs as. Any thread. Paths have no trailing "/".
+class VARNEL_API UserAccount {
+ public:
+  virtual ~UserAccount() = default;
+
+  /// What "~" stands for. A sandbox may have moved it away from the real home.
+  [[nodiscard]] virtual std::string homeFolder() const = 0;
+
+  /// The home folder in the system's own records of users.
+  [[nodiscard]] virtual std::string realHomeFolder() const = 0;
+
+  /// The user's account name.
+  [[nodiscard]] virtual std::string name() const = 0;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,23 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include <Platform/Api.h>
+
+namespace Varnel::Platform {
+
+/// The user's language and formats. Any thread.
+class VARNEL_API UserLocale {
+ public:
+  virtual ~UserLocale() = default;
+
+  /// The languages the user prefers, best first, as BCP 47 tags ("en-US"); never empty.
+  [[nodiscard]] virtual std::vector<std::string> languages() const = 0;
+
+  /// The locale of dates and numbers, as an ICU identifier ("de_AT").
+  [[nodiscard]] virtual std::string identifier() const = 0;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,22 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include <Platform/Api.h>
+#include <Platform/Values/URL.h>
+
+namespace Varnel::Platform {
+
+/// Knows the applications installed for this user. Any thread; a call may read files.
+class VARNEL_API Workspace {
+ public:
+  virtual ~Workspace() = default;
+
+  /// Where the application with this bundle identifier is: its bundle folder where it has one, else
+  /// its executable. Identifiers are compared exactly. Absent when none is installed.
+  [[nodiscard]] virtual std::optional<URL> applicationURL(const std::string& bundleIdentifier) = 0;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,35 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <map>
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include <Platform/Ports/ProcessInfo.h>
+
+namespace Varnel::Platform::Testing {
+
+/// A process whose facts the test sets. Set them before other threads read.
+class FakeProcessInfo final : public ProcessInfo {
+ public:
+  std::map<std::string, std::string, std::less<>> environment;
+  std::string executable = "/usr/bin/host";
+  std::optional<std::string> mainBundle;
+  std::optional<std::string> codeBundle;
+
+  [[nodiscard]] std::optional<std::string> environmentVariable(
+      std::string_view name) const override {
+    const auto found = environment.find(name);
+    if (found == environment.end()) return std::nullopt;
+    return found->second;
+  }
+  [[nodiscard]] std::string executablePath() const override { return executable; }
+  [[nodiscard]] std::optional<std::string> mainBundleFolder() const override { return mainBundle; }
+  [[nodiscard]] std::optional<std::string> bundleFolderOfCode(const void*,
+                                                              std::string_view) const override {
+    return codeBundle;
+  }
+};
+
+}  // namespace Varnel::Platform::Testing

@@ -1,0 +1,34 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include <Platform/Ports/UserAccount.h>
+#include <Platform/Ports/UserLocale.h>
+
+namespace Varnel::Platform::Testing {
+
+/// A user account whose facts the test sets. Set them before other threads read.
+class FakeUserAccount final : public UserAccount {
+ public:
+  std::string home = "/home/ada";
+  std::string realHome = "/home/ada";
+  std::string accountName = "ada";
+
+  [[nodiscard]] std::string homeFolder() const override { return home; }
+  [[nodiscard]] std::string realHomeFolder() const override { return realHome; }
+  [[nodiscard]] std::string name() const override { return accountName; }
+};
+
+/// A user's language and formats as the test sets them. Set them before other threads read.
+class FakeUserLocale final : public UserLocale {
+ public:
+  std::vector<std::string> languageTags = {"en-US"};
+  std::string localeIdentifier = "en_US";
+
+  [[nodiscard]] std::vector<std::string> languages() const override { return languageTags; }
+  [[nodiscard]] std::string identifier() const override { return localeIdentifier; }
+};
+
+}  // namespace Varnel::Platform::Testing

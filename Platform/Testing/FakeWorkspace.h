@@ -1,0 +1,24 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <map>
+#include <optional>
+#include <string>
+
+#include <Platform/Ports/Workspace.h>
+
+namespace Varnel::Platform::Testing {
+
+/// A machine with the applications that the test installs. Set them before other threads read.
+class FakeWorkspace final : public Workspace {
+ public:
+  std::map<std::string, URL> applications;  ///< Location by bundle identifier.
+
+  [[nodiscard]] std::optional<URL> applicationURL(const std::string& bundleIdentifier) override {
+    const auto found = applications.find(bundleIdentifier);
+    if (found == applications.end()) return std::nullopt;
+    return found->second;
+  }
+};
+
+}  // namespace Varnel::Platform::Testing

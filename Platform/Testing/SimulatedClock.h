@@ -1,0 +1,27 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <atomic>
+
+#include <Platform/Ports/Clock.h>
+
+namespace Varnel::Platform::Testing {
+
+/// A clock that stands still until the test moves it. Any thread.
+///
+///     SimulatedClock clock(Date(std::chrono::sys_days(2026y / 3 / 14)));
+///     clock.advance(std::chrono::hours(24));
+class SimulatedClock final : public Clock {
+ public:
+  explicit SimulatedClock(Date start = {}) : now_(start) {}
+
+  [[nodiscard]] Date now() const override { return now_.load(); }
+
+  void set(Date now) { now_.store(now); }
+  void advance(Date::duration step) { now_.store(now_.load() + step); }
+
+ private:
+  std::atomic<Date> now_;
+};
+
+}  // namespace Varnel::Platform::Testing

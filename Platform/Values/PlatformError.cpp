@@ -1,0 +1,28 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Values/PlatformError.h>
+
+#include <utility>
+
+#include <fmt/format.h>
+
+namespace Varnel::Platform {
+
+PlatformError::PlatformError(std::string domain, long code, ErrorUserInfo userInfo)
+    : domain_(std::move(domain)), code_(code), userInfo_(std::move(userInfo)) {}
+
+PlatformError::PlatformError(std::error_code code)
+    : PlatformError(code.category().name(), code.value(),
+                    {{std::string(localizedDescriptionKey), code.message()}}) {}
+
+std::string PlatformError::localizedDescription() const {
+  if (const auto found = userInfo_.find(localizedDescriptionKey); found != userInfo_.end()) {
+    if (const auto* text = std::any_cast<std::string>(&found->second)) return *text;
+  }
+  return fmt::format("The operation couldn’t be completed. ({} error {}.)", domain_, code_);
+}
+
+std::string PlatformError::description() const {
+  return fmt::format("Error Domain={} Code={} \"{}\"", domain_, code_, localizedDescription());
+}
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,68 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <map>
+#include <string>
+#include <string_view>
+#include <variant>
+#include <vector>
+
+#include <Platform/Values/Date.h>
+
+namespace Varnel::Platform {
+
+class PropertyValue;
+
+using PropertyData = std::vector<std::byte>;
+using PropertyList = std::vector<PropertyValue>;
+using PropertyDictionary = std::map<std::string, PropertyValue, std::less<>>;
+
+/// A value as property lists and device registries hold it: a truth value, a number, a text, bytes,
+/// a date, a list or a dictionary. Text is UTF-8 where its source says so and otherwise untouched.
+///
+///     const PropertyValue* serial = find(characteristics, "Serial Number");
+///     if (const auto* text = serial ? serial->as<std::string>() : nullptr) use(*text);
+class PropertyValue final {
+ public:
+  using Storage = std::variant<bool, std::int64_t, double, std::string, PropertyData, Date,
+                               PropertyList, PropertyDictionary>;
+
+  PropertyValue(bool value) : storage_(value) {}
+  PropertyValue(std::int64_t value) : storage_(value) {}
+  PropertyValue(double value) : storage_(value) {}
+  PropertyValue(std::string value) : storage_(std::move(value)) {}
+  PropertyValue(const char* value) : storage_(std::string(value)) {}
+  PropertyValue(PropertyData value) : storage_(std::move(value)) {}
+  PropertyValue(Date value) : storage_(value) {}
+  PropertyValue(PropertyList value) : storage_(std::move(value)) {}
+  PropertyValue(PropertyDictionary value) : storage_(std::move(value)) {}
+
+  /// The value if it has exactly this type, else null. Nothing is converted.
+  template <typename Type>
+  [[nodiscard]] const Type* as() const {
+    return std::get_if<Type>(&storage_);
+  }
+
+  bool operator==(const PropertyValue&) const = default;
+
+ private:
+  Storage storage_;
+};
+
+/// The value under `key`, or null.
+[[nodiscard]] inline const PropertyValue* find(const PropertyDictionary& dictionary,
+                                               std::string_view key) {
+  const auto found = dictionary.find(key);
+  return found == dictionary.end() ? nullptr : &found->second;
+}
+
+/// The value under `key` if there is one of this type, else null.
+template <typename Type>
+[[nodiscard]] const Type* findAs(const PropertyDictionary& dictionary, std::string_view key) {
+  const PropertyValue* value = find(dictionary, key);
+  return value ? value->as<Type>() : nullptr;
+}
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,73 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <any>
+#include <cstddef>
+#include <functional>
+#include <map>
+#include <memory>
+#include <string>
+#include <string_view>
+
+#include <Platform/Api.h>
+
+namespace Varnel::Platform {
+
+/// The location of a file or folder, in the form of RFC 3986 and RFC 8089 ("file:///home/u/a%20b").
+///
+///     const URL folder = URL::fileURLWithPath("/home/u/Pictures/");
+///     folder.path();              // "/home/u/Pictures"
+///     folder.hasDirectoryPath();  // true
+///
+/// A path is a run of bytes, as the system sees it: every byte comes back from `path()` as it went
+/// in, valid UTF-8 or not. Nothing here asks the file system. An immutable value but for its
+/// temporary resource values; two URLs are equal when their texts are.
+class VARNEL_API URL final {
+ public:
+  /// The URL of a file system path. A trailing "/" marks a folder. A relative path stays relative.
+  [[nodiscard]] static URL fileURLWithPath(std::string_view path);
+
+  /// The whole text, percent-encoded.
+  [[nodiscard]] const std::string& absoluteString() const { return text_; }
+
+  /// The path, decoded, without the trailing "/" of a folder ("/" itself stays).
+  [[nodiscard]] std::string path() const;
+
+  /// Whether the path ends with "/".
+  [[nodiscard]] bool hasDirectoryPath() const;
+
+  /// The last component of the path, "/" for the root, empty for an empty path.
+  [[nodiscard]] std::string lastPathComponent() const;
+
+  /// What follows the last "." of the last component; empty without one. A leading dot starts a
+  /// name, not an extension, and an extension holds no space.
+  [[nodiscard]] std::string pathExtension() const;
+
+  /// Attaches a value to this URL and to its copies made afterwards; it is never written to disk
+  /// and has no part in equality. Not to be called while other threads read this object.
+  void setTemporaryResourceValue(std::string_view key, std::any value);
+
+  /// The value attached under `key`; an empty `any` when there is none.
+  [[nodiscard]] std::any temporaryResourceValue(std::string_view key) const;
+
+  bool operator==(const URL& other) const { return text_ == other.text_; }
+  auto operator<=>(const URL& other) const { return text_ <=> other.text_; }
+
+ private:
+  using ResourceValues = std::map<std::string, std::any, std::less<>>;
+
+  explicit URL(std::string text) : text_(std::move(text)) {}
+  [[nodiscard]] std::string_view encodedPath() const;
+
+  std::string text_;
+  std::shared_ptr<const ResourceValues> temporaryValues_;
+};
+
+}  // namespace Varnel::Platform
+
+template <>
+struct std::hash<Varnel::Platform::URL> {
+  std::size_t operator()(const Varnel::Platform::URL& url) const noexcept {
+    return std::hash<std::string>{}(url.absoluteString());
+  }
+};

@@ -1,0 +1,14 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+
+#include <Platform/Api.h>
+
+namespace Varnel::Platform {
+
+/// A new random UUID (RFC 4122, version 4) in its upper-case text form, as in
+/// "6F1C0E5A-2F8E-4C0B-9B1B-7B9D4E2A8C11". Any thread; the randomness is the system's own.
+[[nodiscard]] VARNEL_API std::string randomUUIDString();
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,33 @@
+// SPDX-License-Identifier: MIT
+#include <gtest/gtest.h>
+
+#include <Basalt/Identifier.h>
+#include <Basalt/Version.h>
+
+namespace Basalt {
+namespace {
+
+TEST(Identifier, NeedsBothSides) {
+  EXPECT_EQ(identifier("com.quennel.Orvane2", "Scan"), "com.quennel.Orvane2.Scan");
+  EXPECT_EQ(identifier("", "Scan"), "");
+  EXPECT_EQ(identifier("com.quennel.Orvane2", ""), "");
+}
+
+TEST(Identifier, BaseDropsOnlyWholeChannelComponents) {
+  EXPECT_EQ(baseBundleIdentifier("com.quennel.site.Other"), "com.quennel.Other");
+  EXPECT_EQ(baseBundleIdentifier("com.quennel.Other.trial"), "com.quennel.Other");
+  EXPECT_EQ(baseBundleIdentifier("com.website.Other"), "com.website.Other");
+  EXPECT_EQ(baseBundleIdentifier(""), "");
+}
+
+TEST(Version, ComparesByNumberNotByText) {
+  EXPECT_LT(Version("1.9"), Version("1.10"));
+  EXPECT_LT(Version("1.9.9"), Version("2"));
+  EXPECT_EQ(Version("1.0.0"), Version("1"));
+  EXPECT_EQ(Version("2.1b3 (7)").string(), "2.1");
+  EXPECT_EQ(Version("beta"), Version("0"));
+  EXPECT_EQ(Version("99999999999.1").component(1), 1u);
+}
+
+}  // namespace
+}  // namespace Basalt

@@ -1,0 +1,34 @@
+# The floors of the tree. Each is an object library; code includes its headers by the floor's name
+# (<Platform/Ports/Clock.h>), in the tree through links under the build's include folder and, once
+# installed, below include/varnel alike.
+
+set(VARNEL_INCLUDE_ROOT "${CMAKE_BINARY_DIR}/include")
+file(MAKE_DIRECTORY "${VARNEL_INCLUDE_ROOT}")
+
+# varnel_floor(TARGET PREFIX): declares the floor of the current folder, with headers under PREFIX.
+function(varnel_floor target prefix)
+  if(NOT IS_SYMLINK "${VARNEL_INCLUDE_ROOT}/${prefix}")
+    file(CREATE_LINK "${CMAKE_CURRENT_SOURCE_DIR}" "${VARNEL_INCLUDE_ROOT}/${prefix}" SYMBOLIC)
+  endif()
+  add_library(${target} OBJECT)
+  target_include_directories(${target} PUBLIC "${VARNEL_INCLUDE_ROOT}")
+  target_link_libraries(${target} PUBLIC Threads::Threads)
+  set_target_properties(${target} PROPERTIES
+    VARNEL_PREFIX "${prefix}" VARNEL_ROOT "${CMAKE_CURRENT_SOURCE_DIR}")
+endfunction()
+
+# varnel_sources(TARGET [PUBLIC_HEADERS …] [SOURCES …]): adds the current folder's files to a floor.
+# Public headers are installed and compiled alone; other headers need no listing.
+function(varnel_sources target)
+  cmake_parse_arguments(ARG "" "" "PUBLIC_HEADERS;SOURCES" ${ARGN})
+  get_target_property(prefix ${target} VARNEL_PREFIX)
+  get_target_property(root ${target} VARNEL_ROOT)
+  foreach(source IN LISTS ARG_SOURCES)
+    target_sources(${target} PRIVATE "${CMAKE_CURRENT_SOURCE_DIR}/${source}")
+  endforeach()
+  foreach(header IN LISTS ARG_PUBLIC_HEADERS)
+    file(RELATIVE_PATH relative "${root}" "${CMAKE_CURRENT_SOURCE_DIR}/${header}")
+    set_property(GLOBAL APPEND PROPERTY VARNEL_PUBLIC_HEADERS_${target}
+                 "${VARNEL_INCLUDE_ROOT}/${prefix}/${relative}")
+  endforeach()
+endfunction()
