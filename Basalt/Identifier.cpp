@@ -11,18 +11,17 @@ std::string identifier(std::string_view base, std::string_view component) {
   return joined;
 }
 
-std::string baseBundleIdentifier(std::string_view bundleIdentifier) {
-  std::string base;
-  while (!bundleIdentifier.empty()) {
-    const std::size_t end = bundleIdentifier.find('.');
-    const std::string_view component = bundleIdentifier.substr(0, end);
-    if (component != "site" && component != "trial") {
-      if (!base.empty()) base += '.';
-      base += component;
-    }
-    bundleIdentifier = end == std::string_view::npos ? "" : bundleIdentifier.substr(end + 1);
+std::string withoutChannelComponent(std::string_view bundleIdentifier) {
+  std::size_t start = 0;
+  for (std::size_t end = 0; (end = bundleIdentifier.find('.', start)) != std::string_view::npos;
+       start = end + 1) {
+    const std::string_view component = bundleIdentifier.substr(start, end - start);
+    if (component != "site" && component != "trial") continue;
+    std::string base(bundleIdentifier.substr(0, start));
+    base += bundleIdentifier.substr(end + 1);
+    return base;
   }
-  return base;
+  return std::string(bundleIdentifier);
 }
 
 }  // namespace Basalt

@@ -13,8 +13,9 @@ namespace Basalt {
 /// is empty. Any thread.
 [[nodiscard]] VARNEL_API std::string identifier(std::string_view base, std::string_view component);
 
-/// The suite-wide base of an application's bundle identifier, without the component that tells the
-/// channel ("site" or "trial"): "com.quennel.site.Other" gives "com.quennel.Other". Any thread.
-[[nodiscard]] VARNEL_API std::string baseBundleIdentifier(std::string_view bundleIdentifier);
+/// A bundle identifier without the component that tells the distribution channel: the first "site"
+/// or "trial" that something follows. "com.quennel.site.Other" gives "com.quennel.Other". Any
+/// thread.
+[[nodiscard]] VARNEL_API std::string withoutChannelComponent(std::string_view bundleIdentifier);
 
 }  // namespace Basalt

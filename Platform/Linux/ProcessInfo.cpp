@@ -19,6 +19,16 @@ std::optional<std::string> asText(const std::optional<fs::path>& path) {
   return path->string();
 }
 
+// "libvarnel.so.1.2" and an executable "orvane" go by "varnel" and "orvane".
+std::string nameOfImage(const fs::path& image) {
+  std::string name = image.filename().string();
+  if (const std::size_t suffix = name.find(".so"); suffix != std::string::npos) {
+    name.resize(suffix);
+    if (name.starts_with("lib")) name.erase(0, 3);
+  }
+  return name;
+}
+
 class ProcProcessInfo final : public ProcessInfo {
  public:
   std::optional<std::string> environmentVariable(std::string_view name) const override {
@@ -35,7 +45,7 @@ class ProcProcessInfo final : public ProcessInfo {
 
   std::optional<std::string> mainBundleFolder() const override {
     const fs::path executable = executablePath();
-    return asText(findBundleFolder(executable, executable.filename().string()));
+    return asText(findBundleFolder(executable, nameOfImage(executable)));
   }
 
   std::optional<std::string> bundleFolderOfCode(const void* address,
@@ -46,7 +56,7 @@ class ProcProcessInfo final : public ProcessInfo {
     fs::path path = fs::canonical(image.dli_fname, failed);
     // The loader names the executable itself as it was called, perhaps by a relative path.
     if (failed) path = executablePath();
-    return asText(findBundleFolder(path, name));
+    return asText(findBundleFolder(path, name.empty() ? nameOfImage(path) : std::string(name)));
   }
 };
 

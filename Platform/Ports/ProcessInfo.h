@@ -24,8 +24,9 @@ class VARNEL_API ProcessInfo {
   /// The folder that holds the running application's Info.plist; absent when it has none.
   [[nodiscard]] virtual std::optional<std::string> mainBundleFolder() const = 0;
 
-  /// The folder with the Info.plist of the library or executable whose code lies at `address`;
-  /// `name` is the name of its folder below the installation's shared data.
+  /// The folder with the Info.plist of the library or executable that contains `address`. `name` is
+  /// its folder's name below an installation's shared data; when empty, the image's own name
+  /// counts.
   [[nodiscard]] virtual std::optional<std::string> bundleFolderOfCode(
       const void* address, std::string_view name) const = 0;
 };

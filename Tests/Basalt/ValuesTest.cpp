@@ -13,11 +13,13 @@ TEST(Identifier, NeedsBothSides) {
   EXPECT_EQ(identifier("com.quennel.Orvane2", ""), "");
 }
 
-TEST(Identifier, BaseDropsOnlyWholeChannelComponents) {
-  EXPECT_EQ(baseBundleIdentifier("com.quennel.site.Other"), "com.quennel.Other");
-  EXPECT_EQ(baseBundleIdentifier("com.quennel.Other.trial"), "com.quennel.Other");
-  EXPECT_EQ(baseBundleIdentifier("com.website.Other"), "com.website.Other");
-  EXPECT_EQ(baseBundleIdentifier(""), "");
+TEST(Identifier, LosesOneWholeChannelComponentThatIsNotTheProduct) {
+  EXPECT_EQ(withoutChannelComponent("com.quennel.site.Other"), "com.quennel.Other");
+  EXPECT_EQ(withoutChannelComponent("com.quennel.trial.Other"), "com.quennel.Other");
+  EXPECT_EQ(withoutChannelComponent("com.quennel.trial.site.Other"), "com.quennel.site.Other");
+  EXPECT_EQ(withoutChannelComponent("com.website.Other"), "com.website.Other");
+  EXPECT_EQ(withoutChannelComponent("com.quennel.site"), "com.quennel.site");
+  EXPECT_EQ(withoutChannelComponent(""), "");
 }
 
 TEST(Version, ComparesByNumberNotByText) {

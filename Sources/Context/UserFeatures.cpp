@@ -1,0 +1,38 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Context/UserFeatures.h>
+
+#include <array>
+#include <string_view>
+#include <utility>
+
+#include <nlohmann/json.hpp>
+
+#include <Basalt/JSON.h>
+
+namespace Varnel {
+namespace {
+
+constexpr std::array<std::pair<std::string_view, UserFeatures>, 5> namesOfMembers{{
+    {"sharing", UserFeatures::sharing},
+    {"cross-promo", UserFeatures::crossPromo},
+    {"achievements", UserFeatures::achievements},
+    {"irate", UserFeatures::irate},
+    {"clean-results-promo", UserFeatures::cleanResultsPromo},
+}};
+
+}  // namespace
+
+UserFeatures::UserFeatures(const nlohmann::json& json) {
+  for (const std::string& name : Basalt::importStrings(json, "UserFeatures"))
+    for (const auto& [knownName, member] : namesOfMembers)
+      if (name == knownName) insert(member);
+}
+
+nlohmann::json UserFeatures::exportJSON() const {
+  auto names = nlohmann::json::array();
+  for (const auto& [name, member] : namesOfMembers)
+    if (contains(member)) names.push_back(name);
+  return names;
+}
+
+}  // namespace Varnel
