@@ -1,2 +1,88 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Text/ByteCountFormatter.h>
+
+#include <unicode/dcfmtsym.h>
+
+#include <array>
+
+namespace Varnel::Platform {
+namespace {
+
+struct Unit {
+  std::string_view name;
+  int maximumDecimals;
+};
+
+constexpr std::array units{Unit{"KB", 0}, Unit{"MB", 1}, Unit{"GB", 2},
+                           Unit{"TB", 2}, Unit{"PB", 2}, Unit{"EB", 2}};
+
+std::uint64_t unitStep(ByteCountStyle style) {
+  return style == ByteCountStyle::memory || style == ByteCountStyle::binary ? 1024 : 1000;
+}
+
+struct Rounded {
+  std::uint64_t whole;
+  std::uint64_t fraction;  ///< The decimals as one number.
+};
+
+// Long division, digit by digit: the remainder is below 2^60, so that ten of it fit into 64 bits.
+Rounded divide(std::uint64_t bytes, std::uint64_t unit, int decimals) {
+  Rounded result{bytes / unit, 0};
+  std::uint64_t remainder = bytes % unit;
+  std::uint64_t fractionEnd = 1;
+  for (int decimal = 0; decimal < decimals; ++decimal) {
+    result.fraction = result.fraction * 10 + remainder * 10 / unit;
+    remainder = remainder * 10 % unit;
+    fractionEnd *= 10;
+  }
+  if (remainder >= unit - remainder && ++result.fraction == fractionEnd) {
+    result.fraction = 0;
+    ++result.whole;
+  }
+  return result;
+}
+
+std::string decimalText(std::uint64_t fraction, int decimals) {
+  std::string text = std::to_string(fraction);
+  text.insert(0, static_cast<std::size_t>(decimals) - text.size(), '0');
+  text.erase(text.find_last_not_of('0') + 1);
+  return text;
+}
+
+}  // namespace
+
+ByteCountFormatter::ByteCountFormatter(std::string_view localeIdentifier) {
+  UErrorCode status = U_ZERO_ERROR;
+  const icu::Locale locale(std::string(localeIdentifier).c_str());
+  const icu::DecimalFormatSymbols symbols(locale, status);
+  if (U_SUCCESS(status))
+    symbols.getConstSymbol(icu::DecimalFormatSymbols::kDecimalSeparatorSymbol)
+        .toUTF8String(decimalSeparator_);
+  if (decimalSeparator_.empty()) decimalSeparator_ = ".";
+}
+
+std::string ByteCountFormatter::string(std::int64_t count, ByteCountStyle style) const {
+  if (count == 0) return "Zero KB";
+  const std::string sign = count < 0 ? "-" : "";
+  // Negated as unsigned, since the least count has no positive counterpart.
+  const auto bits = static_cast<std::uint64_t>(count);
+  const std::uint64_t bytes = count < 0 ? 0 - bits : bits;
+  const std::uint64_t step = unitStep(style);
+  if (bytes < step) return sign + std::to_string(bytes) + (bytes == 1 ? " byte" : " bytes");
+
+  std::uint64_t unitSize = step;
+  auto unit = units.begin();
+  Rounded value = divide(bytes, unitSize, unit->maximumDecimals);
+  // What rounds up to a full step is shown in the next unit.
+  while (value.whole >= step) {
+    unitSize *= step;
+    ++unit;
+    value = divide(bytes, unitSize, unit->maximumDecimals);
+  }
+  std::string text = sign + std::to_string(value.whole);
+  if (value.fraction != 0)
+    text += decimalSeparator_ + decimalText(value.fraction, unit->maximumDecimals);
+  return text.append(" ").append(unit->name);
+}
+
+}  // namespace Varnel::Platform

@@ -1,2 +1,113 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Text/DateFormatter.h>
+
+#include <unicode/smpdtfmt.h>
+#include <unicode/timezone.h>
+
+#include <array>
+#include <atomic>
+#include <cstdint>
+#include <cstring>
+#include <mutex>
+
+namespace Varnel::Platform {
+namespace {
+
+using Second = std::chrono::sys_seconds;
+
+/// The latest text of one formatter on one thread. It has no destructor, so that threads may still
+/// write dates while they end.
+struct CachedText {
+  std::uint64_t formatter = 0;
+  Second second{};
+  std::size_t size = 0;
+  std::array<char, 48> characters{};
+};
+
+// Formatters share a slot only when more than four are in turn on one thread.
+constinit thread_local std::array<CachedText, 4> cachedTexts{};
+
+// Never given twice, unlike an address.
+std::uint64_t nextIdentity() {
+  static std::atomic<std::uint64_t> last = 0;
+  return ++last;
+}
+
+// Whether the pattern has fractions of a second (S) or milliseconds of the day (A) outside quotes.
+bool isFinerThanSeconds(std::string_view pattern) {
+  bool isQuoted = false;
+  for (const char character : pattern) {
+    if (character == '\'') isQuoted = !isQuoted;
+    if (!isQuoted && (character == 'S' || character == 'A')) return true;
+  }
+  return false;
+}
+
+UDate icuDate(Date date) {
+  const auto milliseconds = std::chrono::floor<std::chrono::milliseconds>(date);
+  return static_cast<UDate>(milliseconds.time_since_epoch().count());
+}
+
+using Format = std::unique_ptr<icu::SimpleDateFormat>;
+
+// Null unless a date can be written with it.
+Format makeFormat(std::string_view pattern, const icu::Locale& locale) {
+  const icu::StringPiece bytes(pattern.data(), static_cast<std::int32_t>(pattern.size()));
+  UErrorCode status = U_ZERO_ERROR;
+  auto format =
+      std::make_unique<icu::SimpleDateFormat>(icu::UnicodeString::fromUTF8(bytes), locale, status);
+  icu::UnicodeString sample;
+  if (U_SUCCESS(status)) format->format(UDate(0), sample, nullptr, status);
+  if (U_FAILURE(status)) return nullptr;
+  // Asked of the system every time: the library's own default stays what it was at first use.
+  format->adoptTimeZone(icu::TimeZone::detectHostTimeZone());
+  return format;
+}
+
+}  // namespace
+
+struct DateFormatter::State {
+  State(std::string_view pattern, std::string_view localeIdentifier)
+      : isCached(!isFinerThanSeconds(pattern)),
+        format(makeFormat(pattern, icu::Locale(std::string(localeIdentifier).c_str()))) {
+    if (!format) format = makeFormat("yyyy-MM-dd HH:mm:ss", icu::Locale::getRoot());
+  }
+
+  [[nodiscard]] std::string compute(Date date) {
+    std::string text;
+    if (!format) return text;
+    icu::UnicodeString characters;
+    const std::lock_guard lock(mutex);
+    format->format(icuDate(date), characters);
+    return characters.toUTF8String(text);
+  }
+
+  const std::uint64_t identity = nextIdentity();
+  const bool isCached;
+  std::mutex mutex;  ///< Guards `format`.
+  Format format;
+};
+
+DateFormatter::DateFormatter(std::string_view pattern, std::string_view localeIdentifier)
+    : state_(std::make_unique<State>(pattern, localeIdentifier)) {}
+
+DateFormatter::~DateFormatter() = default;
+
+std::string DateFormatter::string(Date date) const {
+  if (!state_->isCached) return state_->compute(date);
+  const auto second = std::chrono::floor<std::chrono::seconds>(date);
+  CachedText& cached = cachedTexts[state_->identity % cachedTexts.size()];
+  if (cached.formatter == state_->identity && cached.second == second)
+    return {cached.characters.data(), cached.size};
+
+  std::string text = state_->compute(date);
+  if (text.size() <= cached.characters.size()) {
+    std::memcpy(cached.characters.data(), text.data(), text.size());
+    cached.formatter = state_->identity;
+    cached.second = second;
+    cached.size = text.size();
+  }
+  return text;
+}
+
+}  // namespace Varnel::Platform

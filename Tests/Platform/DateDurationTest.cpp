@@ -1,0 +1,164 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Text/DateFormatter.h>
+#include <Platform/Text/DurationFormatter.h>
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <latch>
+#include <limits>
+#include <thread>
+#include <vector>
+
+namespace Varnel::Platform {
+namespace {
+
+using namespace std::chrono;
+using namespace std::chrono_literals;
+
+constexpr const char* timestampPattern = "YYYY-MM-dd HH:mm:ss";
+
+class TimeZone final {
+ public:
+  explicit TimeZone(const char* name) { setenv("TZ", name, 1); }
+  ~TimeZone() { unsetenv("TZ"); }
+  TimeZone(const TimeZone&) = delete;
+  TimeZone& operator=(const TimeZone&) = delete;
+};
+
+TEST(DateFormatter, WritesTheYearOfTheLocalesWeek) {
+  const TimeZone utc("UTC");
+  const auto text = [](const char* pattern, const char* locale, sys_days day) {
+    return DateFormatter(pattern, locale).string(day);
+  };
+  EXPECT_EQ(text("YYYY-MM-dd", "en_US", 2024y / December / 28), "2024-12-28");
+  EXPECT_EQ(text("YYYY-MM-dd", "en_US", 2024y / December / 31), "2025-12-31");
+  EXPECT_EQ(text("yyyy-MM-dd", "en_US", 2024y / December / 31), "2024-12-31");
+  EXPECT_EQ(text("YYYY-MM-dd", "de_DE", 2023y / January / 1), "2022-01-01");
+  EXPECT_EQ(text("YYYY-MM-dd", "en_US", 2023y / January / 1), "2023-01-01");
+  EXPECT_EQ(text("yyyy-MM-dd", "en_US", 1969y / December / 31), "1969-12-31");
+}
+
+TEST(DateFormatter, FollowsTheTimeZoneThroughItsChanges) {
+  const TimeZone berlin("Europe/Berlin");
+  const DateFormatter formatter(timestampPattern, "en_US");
+  const sys_days spring = 2024y / March / 31;
+  EXPECT_EQ(formatter.string(spring + 59min + 59s), "2024-03-31 01:59:59");
+  EXPECT_EQ(formatter.string(spring + 1h), "2024-03-31 03:00:00");
+  const sys_days autumn = 2024y / October / 27;
+  EXPECT_EQ(formatter.string(autumn + 30min), "2024-10-27 02:30:00");
+  EXPECT_EQ(formatter.string(autumn + 1h + 30min), "2024-10-27 02:30:00");
+  EXPECT_EQ(formatter.string(autumn + 2h + 30min), "2024-10-27 03:30:00");
+
+  const TimeZone tokyo("Asia/Tokyo");
+  EXPECT_EQ(DateFormatter(timestampPattern, "en_US").string(autumn), "2024-10-27 09:00:00");
+  EXPECT_EQ(formatter.string(autumn), "2024-10-27 02:00:00") << "the zone it was made in";
+}
+
+TEST(DateFormatter, KeepsTextsOfFormattersAndSecondsApart) {
+  const TimeZone utc("UTC");
+  const Date date = sys_days(2024y / May / 5) + 1h;
+  const DateFormatter timestamp(timestampPattern, "en_US");
+  const DateFormatter milliseconds("ss.SSS", "en_US");
+  const DateFormatter quoted("ss 'SA' ''", "en_US");
+  const DateFormatter longer("'a text that is much too long to be kept with its second' ss",
+                             "en_US");
+  for (const auto part : {0us, 1000us, 999'999us, 1'000'000us, 0us, -1us}) {
+    const bool isNext = part >= 1s;
+    const bool isBefore = part < 0s;
+    const std::string second = isNext ? "01" : isBefore ? "59" : "00";
+    EXPECT_EQ(timestamp.string(date + part),
+              (isBefore ? "2024-05-05 00:59:" : "2024-05-05 01:00:") + second);
+    EXPECT_EQ(quoted.string(date + part), second + " SA '");
+    EXPECT_TRUE(longer.string(date + part).ends_with(second));
+  }
+  EXPECT_EQ(milliseconds.string(date + 1'234'567us), "01.234");
+  EXPECT_EQ(milliseconds.string(date + 1'235'000us), "01.235");
+  EXPECT_EQ(milliseconds.string(Date(-1us)), "59.999");
+
+  // Many formatters one after the other at one address and one second.
+  for (const char* pattern : {"ss", "mm", "HH", "dd", "MM", "yy", "ss"}) {
+    const DateFormatter formatter(pattern, "en_US");
+    EXPECT_EQ(formatter.string(date).size(), 2u);
+    EXPECT_EQ(formatter.string(date), DateFormatter(pattern, "en_US").string(date));
+  }
+  EXPECT_EQ(DateFormatter("dd", "en_US").string(date), "05");
+  EXPECT_EQ(DateFormatter("HH", "en_US").string(date), "01");
+}
+
+TEST(DateFormatter, SurvivesOddPatternsAndDates) {
+  const TimeZone utc("UTC");
+  const Date date = sys_days(2024y / May / 5) + 1h;
+  EXPECT_EQ(DateFormatter("", "en_US").string(date), "");
+  EXPECT_EQ(DateFormatter("'open quote", "en_US").string(date), "open quote");
+  EXPECT_EQ(DateFormatter("yyyy N P", "en_US").string(date), "2024-05-05 01:00:00");
+  EXPECT_EQ(DateFormatter("yyyy", "no such locale").string(date), "2024");
+  EXPECT_EQ(DateFormatter("d MMMM", "de_DE").string(date), "5 Mai");
+  const DateFormatter formatter(timestampPattern, "en_US");
+  EXPECT_FALSE(formatter.string(Date::min()).empty());
+  EXPECT_FALSE(formatter.string(Date::max()).empty());
+}
+
+TEST(DateFormatter, GivesEveryThreadTheTextOfItsOwnSecond) {
+  const TimeZone utc("UTC");
+  const DateFormatter formatter("HH:mm:ss", "en_US");
+  std::latch start(4);
+  std::vector<std::thread> threads;
+  for (int thread = 0; thread < 4; ++thread)
+    threads.emplace_back([&formatter, &start, thread] {
+      start.arrive_and_wait();
+      for (int step = 0; step < 4000; ++step) {
+        const int second = (thread * 7 + step / 4) % 60;
+        const std::string digits = (second < 10 ? "0" : "") + std::to_string(second);
+        ASSERT_EQ(formatter.string(Date(seconds(second))), "00:00:" + digits);
+      }
+    });
+  for (std::thread& thread : threads) thread.join();
+}
+
+TEST(DurationFormatter, CutsOffFractionsAndLeavesOutZeroUnits) {
+  struct Case {
+    TimeInterval interval;
+    const char* text;
+  };
+  constexpr TimeInterval hour = 3600;
+  constexpr TimeInterval dayLength = 24 * hour;
+  const Case cases[] = {
+      {0, "0s"},
+      {-0.0, "0s"},
+      {0.999, "0s"},
+      {-0.999, "0s"},
+      {1.999, "1s"},
+      {59.9999999, "59s"},
+      {60, "1m"},
+      {3903, "1h 5m 3s"},
+      {-3903.7, "-1h 5m 3s"},
+      {hour + 3, "1h 3s"},
+      {dayLength - 1, "23h 59m 59s"},
+      {dayLength, "1d"},
+      {30 * dayLength, "30d"},
+      {31 * dayLength, "1mo"},
+      {59 * dayLength, "2mo"},
+      {-31 * dayLength - 60, "-1mo 1m"},
+      {364 * dayLength, "11mo 30d"},
+      {365 * dayLength, "1y"},
+      {(4 * 365 + 1) * dayLength, "4y"},
+      {146'096 * dayLength, "399y 11mo 30d"},
+      {146'097 * dayLength, "400y"},
+      {100'000 * 365.2425 * dayLength, "100000y"},
+  };
+  for (const Case& test : cases)
+    EXPECT_EQ(DurationFormatter().string(test.interval), test.text) << test.interval;
+}
+
+TEST(DurationFormatter, HasNoTextForWhatNoCalendarHolds) {
+  using Limits = std::numeric_limits<TimeInterval>;
+  for (const TimeInterval interval : {Limits::quiet_NaN(), Limits::infinity(), -Limits::infinity(),
+                                      Limits::max(), Limits::lowest(), 1e13, -1e13})
+    EXPECT_EQ(DurationFormatter().string(interval), std::nullopt) << interval;
+  EXPECT_EQ(DurationFormatter().string(Limits::denorm_min()), "0s");
+  EXPECT_TRUE(DurationFormatter().string(-9e12).has_value());
+}
+
+}  // namespace
+}  // namespace Varnel::Platform
