@@ -35,9 +35,9 @@ struct VARNEL_API BuildSwitches {
   bool isMarkettaVersion = false;
   bool isPrivateBetaMode = false;
   bool isDebugMode = false;
-  std::string appName;
-  std::string appDisplayVersion;
-  std::string appArrangeVersion;
+  std::string appName = {};
+  std::string appDisplayVersion = {};
+  std::string appArrangeVersion = {};
 
   /// What the exported functions answer.
   [[nodiscard]] static BuildSwitches ofThisBuild();
