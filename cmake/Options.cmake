@@ -16,6 +16,9 @@ set(VARNEL_APP_DISPLAY_VERSION "${PROJECT_VERSION}" CACHE STRING
 set(VARNEL_APP_ARRANGE_VERSION "${VARNEL_APP_DISPLAY_VERSION}" CACHE STRING
     "The application's version as compared with others")
 
+set(VARNEL_BUILD_NUMBER "1" CACHE STRING "The framework's build number")
+set(VARNEL_SOURCE_VERSION "" CACHE STRING "The source revision that a release is built from")
+
 option(BUILD_SHARED_LIBS "Build the framework as a shared library" ON)
 option(VARNEL_BUILD_TESTS "Build the tests" ${PROJECT_IS_TOP_LEVEL})
 option(VARNEL_BUILD_EXAMPLES "Build the examples" ${PROJECT_IS_TOP_LEVEL})

@@ -70,7 +70,7 @@ TEST_F(ProcessFactsTest, DebugWinsOverBetaAndBetaOverTheLaunchDate) {
     Date::duration sinceLaunch;
     bool enabled;
   } cases[] = {
-      {true, true, -1h, true}, {false, true, 1h, false},  {false, false, -1us, false},
+      {true, true, -1h, true},    {false, true, 1h, false},  {false, false, -1us, false},
       {false, false, 0us, false}, {false, false, 1us, true},
   };
   for (const auto& [debug, beta, sinceLaunch, enabled] : cases) {
