@@ -6,15 +6,15 @@
 #include <filesystem>
 
 #include <Platform/Generic/BundleFolders.h>
+#include <Platform/Generic/UniqueHandle.h>
 #include <Platform/Linux/Adapters.h>
-#include <Platform/POSIX/UniqueHandle.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
 
 namespace fs = std::filesystem;
-using DesktopEntry = POSIX::UniqueHandle<GDesktopAppInfo*, g_object_unref>;
-using Text = POSIX::UniqueHandle<char*, g_free>;
+using DesktopEntry = UniqueHandle<GDesktopAppInfo*, g_object_unref>;
+using Text = UniqueHandle<char*, g_free>;
 
 // A desktop entry's Exec line starts with a name to be searched on PATH, or with a path.
 std::optional<fs::path> executableOf(const DesktopEntry& entry) {

@@ -1,7 +1,151 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Text/PropertyListParser.h>
+
+#include <plist/plist.h>
+
+#include <algorithm>
+#include <cstdlib>
+#include <limits>
+
+#include <Platform/Generic/UniqueHandle.h>
+#include <Platform/Text/PropertyListGuard.h>
+
 namespace Varnel::Platform {
-std::optional<PropertyValue> parsePropertyList(std::string_view) {
-  return std::nullopt;
+namespace {
+
+constexpr std::size_t maximumSize = std::size_t{16} << 20;
+
+void release(void* memory) {
+  std::free(memory);
 }
+
+using Tree = UniqueHandle<plist_t, plist_free>;
+using Iterator = UniqueHandle<void*, release>;
+using Text = UniqueHandle<char*, release>;
+
+std::optional<PropertyValue> valueOf(plist_t node);
+
+PropertyDictionary dictionaryOf(plist_t node) {
+  PropertyDictionary dictionary;
+  plist_dict_iter position = nullptr;
+  plist_dict_new_iter(node, &position);
+  const Iterator iterator(position);
+  while (true) {
+    char* rawKey = nullptr;
+    plist_t child = nullptr;
+    plist_dict_next_item(node, position, &rawKey, &child);
+    const Text key(rawKey);
+    if (!child) return dictionary;
+    if (auto value = valueOf(child); key && value)
+      dictionary.insert_or_assign(key.get(), *std::move(value));
+  }
+}
+
+PropertyList listOf(plist_t node) {
+  PropertyList list;
+  plist_array_iter position = nullptr;
+  plist_array_new_iter(node, &position);
+  const Iterator iterator(position);
+  while (true) {
+    plist_t child = nullptr;
+    plist_array_next_item(node, position, &child);
+    if (!child) return list;
+    if (auto value = valueOf(child)) list.push_back(*std::move(value));
+  }
+}
+
+std::string stringOf(plist_t node) {
+  std::uint64_t length = 0;
+  const char* characters = plist_get_string_ptr(node, &length);
+  return characters ? std::string(characters, length) : std::string();
+}
+
+PropertyData dataOf(plist_t node) {
+  std::uint64_t length = 0;
+  const char* first = plist_get_data_ptr(node, &length);
+  if (!first) return {};
+  PropertyData data(length);
+  std::transform(first, first + length, data.begin(),
+                 [](char byte) { return static_cast<std::byte>(byte); });
+  return data;
+}
+
+// The library counts seconds from 2001 in 32 bits; it gives an end of that range for what is
+// beyond it.
+std::optional<PropertyValue> dateOf(plist_t node) {
+  using namespace std::chrono;
+  using Range = std::numeric_limits<std::int32_t>;
+  std::int32_t wholeSeconds = 0;
+  std::int32_t fraction = 0;
+  plist_get_date_val(node, &wholeSeconds, &fraction);
+  if (wholeSeconds == Range::min() || wholeSeconds == Range::max()) return std::nullopt;
+  constexpr sys_days epoch = year_month_day(year(2001), January, day(1));
+  return Date(epoch + seconds(wholeSeconds) + microseconds(fraction));
+}
+
+// Absent for a value that has no counterpart.
+std::optional<PropertyValue> valueOf(plist_t node) {
+  switch (plist_get_node_type(node)) {
+    case PLIST_BOOLEAN: {
+      std::uint8_t value = 0;
+      plist_get_bool_val(node, &value);
+      return value != 0;
+    }
+    case PLIST_UINT: {
+      std::uint64_t value = 0;
+      plist_get_uint_val(node, &value);
+      return static_cast<std::int64_t>(value);
+    }
+    case PLIST_UID: {
+      std::uint64_t value = 0;
+      plist_get_uid_val(node, &value);
+      return static_cast<std::int64_t>(value);
+    }
+    case PLIST_REAL: {
+      double value = 0;
+      plist_get_real_val(node, &value);
+      return value;
+    }
+    case PLIST_KEY: {
+      char* characters = nullptr;
+      plist_get_key_val(node, &characters);
+      const Text text(characters);
+      return text ? std::string(text.get()) : std::string();
+    }
+    case PLIST_STRING:
+      return stringOf(node);
+    case PLIST_DATA:
+      return dataOf(node);
+    case PLIST_DATE:
+      return dateOf(node);
+    case PLIST_ARRAY:
+      return listOf(node);
+    case PLIST_DICT:
+      return dictionaryOf(node);
+    default:
+      return std::nullopt;
+  }
+}
+
+Tree parse(std::string_view bytes) {
+  constexpr std::string_view byteOrderMark = "\xEF\xBB\xBF";
+  if (bytes.starts_with(byteOrderMark)) bytes.remove_prefix(byteOrderMark.size());
+  const auto size = static_cast<std::uint32_t>(bytes.size());
+  plist_t root = nullptr;
+  if (bytes.starts_with("bplist00")) {
+    if (isTameBinary(bytes)) plist_from_bin(bytes.data(), size, &root);
+  } else {
+    if (isTameXML(bytes)) plist_from_xml(bytes.data(), size, &root);
+  }
+  return Tree(root);
+}
+
+}  // namespace
+
+std::optional<PropertyValue> parsePropertyList(std::string_view bytes) {
+  if (bytes.empty() || bytes.size() > maximumSize) return std::nullopt;
+  const Tree tree = parse(bytes);
+  return tree ? valueOf(tree.get()) : std::nullopt;
+}
+
 }  // namespace Varnel::Platform

@@ -3,7 +3,7 @@
 
 #include <utility>
 
-namespace Varnel::Platform::POSIX {
+namespace Varnel::Platform {
 
 /// Owns a foreign object that is released by a plain function, `Release(handle)`.
 ///
@@ -29,4 +29,4 @@ class UniqueHandle final {
   Handle handle_{};
 };
 
-}  // namespace Varnel::Platform::POSIX
+}  // namespace Varnel::Platform

@@ -1,0 +1,207 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Text/PropertyListParser.h>
+#include <Platform/Text/StringsTable.h>
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <thread>
+#include <vector>
+
+namespace Varnel::Platform {
+namespace {
+
+using namespace std::chrono;
+using namespace std::string_literals;
+
+std::string repeated(std::string_view text, int times) {
+  std::string result;
+  for (; times > 0; --times) result += text;
+  return result;
+}
+
+std::string nested(std::string_view opening, std::string_view closing, int depth) {
+  return "<plist>" + repeated(opening, depth) + "<true/>" + repeated(closing, depth) + "</plist>";
+}
+
+std::string bigEndian(std::uint64_t number, int size) {
+  std::string bytes;
+  for (int index = size - 1; index >= 0; --index) bytes += static_cast<char>(number >> (8 * index));
+  return bytes;
+}
+
+std::string binaryList(const std::vector<std::string>& objects, std::uint64_t root = 0) {
+  std::string bytes = "bplist00";
+  std::string table;
+  for (const std::string& object : objects) {
+    table += bigEndian(bytes.size(), 4);
+    bytes += object;
+  }
+  const std::size_t tableOffset = bytes.size();
+  return bytes + table + std::string(6, '\0') + "\4\2" + bigEndian(objects.size(), 8) +
+         bigEndian(root, 8) + bigEndian(tableOffset, 8);
+}
+
+std::string binaryArray(const std::vector<int>& references) {
+  std::string object = "\xAF\x12" + bigEndian(references.size(), 4);
+  for (const int reference : references)
+    object += bigEndian(static_cast<std::uint64_t>(reference), 2);
+  return object;
+}
+
+std::optional<PropertyValue> parsedElement(const std::string& element) {
+  return parsePropertyList("<plist version=\"1.0\">" + element + "</plist>");
+}
+
+TEST(PropertyList, ReadsAnInformationDictionary) {
+  const auto list = parsePropertyList(R"(<?xml version="1.0" encoding="UTF-8"?>
+<!DOCTYPE plist PUBLIC "-//Apple//DTD PLIST 1.0//EN" "http://www.apple.com/DTDs/PropertyList-1.0.dtd">
+<plist version="1.0">
+<dict>
+  <!-- It's what the host gives, <dict> in a comment included -->
+  <key>CFBundleName</key><string>Orvane &amp; S&#246;hne</string>
+  <key>Count</key><integer>-42</integer>
+  <key>Ratio</key><real>1.5</real>
+  <key>Beta</key><false/>
+  <key>Icon</key><data>AAH/</data>
+  <key>Built</key><date>2024-02-29T12:00:00Z</date>
+  <key>Old</key><date>1995-01-01T00:00:00Z</date>
+  <key>Languages</key><array><string>en</string><string/><array/></array>
+  <key>Nested</key><dict><key>a</key><string><![CDATA[<b>]]></string></dict>
+  <key>Twice</key><string>first</string><key>Twice</key><string>last</string>
+</dict>
+</plist>
+)");
+  const PropertyDictionary expected{
+      {"CFBundleName", "Orvane & Söhne"},
+      {"Count", std::int64_t{-42}},
+      {"Ratio", 1.5},
+      {"Beta", false},
+      {"Icon", PropertyData{std::byte{0}, std::byte{1}, std::byte{255}}},
+      {"Built", Date(sys_days(2024y / February / 29) + 12h)},
+      {"Old", Date(sys_days(1995y / January / 1))},
+      {"Languages", PropertyList{"en", "", PropertyList{}}},
+      {"Nested", PropertyDictionary{{"a", "<b>"}}},
+      {"Twice", "last"},
+  };
+  EXPECT_EQ(list, PropertyValue(expected));
+}
+
+TEST(PropertyList, ReadsTheBinaryForm) {
+  std::string dictionary = "\xD4";
+  for (std::uint64_t reference = 1; reference <= 8; ++reference)
+    dictionary += bigEndian(reference, 2);
+  const std::string number = "\x13" + bigEndian(static_cast<std::uint64_t>(-7), 8);
+  const std::string bytes = binaryList({dictionary, "Qa", "Qb", "Qc", "Qd", number,
+                                        "\x62\xD8\x3D\xDE\x00"s, "\x80\x05", binaryArray({6, 6})});
+  const PropertyDictionary expected{
+      {"a", std::int64_t{-7}}, {"b", "😀"}, {"c", std::int64_t{5}}, {"d", PropertyList{"😀", "😀"}}};
+  EXPECT_EQ(parsePropertyList(bytes), PropertyValue(expected));
+  for (std::size_t size = 0; size < bytes.size(); ++size)
+    EXPECT_EQ(parsePropertyList(std::string_view(bytes).substr(0, size)), std::nullopt) << size;
+}
+
+TEST(PropertyList, TakesExtremeScalarsAsFarAsTheyHaveACounterpart) {
+  EXPECT_EQ(parsedElement("<integer>-9223372036854775808</integer>"),
+            PropertyValue(std::numeric_limits<std::int64_t>::min()));
+  EXPECT_EQ(parsedElement("<integer>18446744073709551615</integer>"),
+            PropertyValue(std::int64_t{-1}));
+  EXPECT_EQ(parsedElement("<date>4001-01-01T00:00:00Z</date>"), std::nullopt);
+  EXPECT_EQ(parsedElement("<array><date>1601-01-01T00:00:00Z</date><true/></array>"),
+            PropertyValue(PropertyList{true}));
+  EXPECT_EQ(parsePropertyList("\xEF\xBB\xBF<plist><true/></plist>"), PropertyValue(true));
+}
+
+TEST(PropertyList, RefusesWhatIsNone) {
+  for (const char* bytes :
+       {"", " ", "bplist00", "garbage", "<", "<plist>", "<plist></plist>", "<plist/>", "<html/>",
+        "<plist><dict><key>a</key></plist>", "<plist><dict><true/></dict></plist>",
+        "<plist><array></dict></plist>", "<plist><array><!-- </array></plist>",
+        "<plist><string>&#0;</string></plist>", "<plist><string>&unknown;</string></plist>",
+        "<!DOCTYPE plist [<!ENTITY a 'b'>]><plist><string>&a;</string></plist>"})
+    EXPECT_EQ(parsePropertyList(bytes), std::nullopt) << bytes;
+  EXPECT_EQ(parsePropertyList(std::string(100, '\0')), std::nullopt);
+}
+
+// A thread has a smaller stack than the process, and the limit must fit all of them.
+TEST(PropertyList, RefusesAbsurdNesting) {
+  std::thread([] {
+    EXPECT_TRUE(parsePropertyList(nested("<array>", "</array>", 512)).has_value());
+    EXPECT_TRUE(parsePropertyList(nested("<dict><key>a</key>", "</dict>", 512)).has_value());
+    EXPECT_EQ(parsePropertyList(nested("<array>", "</array>", 513)), std::nullopt);
+    for (const char* opening : {
+             "<array>",
+             "<dict><key>a</key>",
+             "<array a=\"/>\">",
+             "<array a=\"</array>\">",
+             "<array\v>",
+             "<array><!-- </array> -->",
+             "<array><!--></array>-->",
+             "<array><?x \" ?></array><?y \" ?>",
+             "<array><?x > </array> ?>",
+             "<array><!DOCTYPE \"></array>\">",
+             "<array><string><![CDATA[</array>]]></string>",
+         })
+      for (const char* closing : {"", "</array>", "</dict>"})
+        EXPECT_EQ(parsePropertyList(nested(opening, closing, 100'000)), std::nullopt) << opening;
+
+    std::vector<std::string> chain;
+    for (int index = 0; index < 60'000; ++index) chain.push_back(binaryArray({index + 1}));
+    chain.emplace_back("\x09");
+    EXPECT_EQ(parsePropertyList(binaryList(chain)), std::nullopt);
+    EXPECT_TRUE(parsePropertyList(binaryList(chain, 60'000 - 500)).has_value());
+  }).join();
+}
+
+TEST(PropertyList, RefusesBinaryListsThatAreCyclicOrMultiply) {
+  EXPECT_EQ(parsePropertyList(binaryList({binaryArray({0})})), std::nullopt);
+  EXPECT_EQ(parsePropertyList(binaryList({binaryArray({1}), binaryArray({2}), binaryArray({0})})),
+            std::nullopt);
+  EXPECT_EQ(parsePropertyList(binaryList({binaryArray({7})})), std::nullopt);
+  EXPECT_EQ(parsePropertyList(binaryList({"\x09"}, 1)), std::nullopt);
+
+  std::vector<std::string> doubling;
+  for (int index = 0; index < 60; ++index) doubling.push_back(binaryArray({index + 1, index + 1}));
+  doubling.emplace_back("\x09");
+  EXPECT_EQ(parsePropertyList(binaryList(doubling)), std::nullopt);
+
+  const std::string longString = "\x5F\x12" + bigEndian(1 << 20, 4) + std::string(1 << 20, 'x');
+  EXPECT_EQ(parsePropertyList(binaryList({binaryArray(std::vector<int>(20'000, 1)), longString})),
+            std::nullopt);
+
+  for (const char marker : {'\x4F', '\x5F', '\x6F', '\xAF', '\xCF', '\xDF'})
+    for (const std::uint64_t count : {~0ull, ~0ull >> 1, 1ull << 32, 1ull << 20})
+      EXPECT_EQ(parsePropertyList(binaryList({marker + "\x13"s + bigEndian(count, 8)})),
+                std::nullopt);
+}
+
+TEST(PropertyList, RefusesWhatTakesQuadraticTime) {
+  EXPECT_EQ(parsedElement("<string>" + repeated("&amp;", 1'000'000) + "</string>"), std::nullopt);
+  EXPECT_EQ(parsedElement("<string>" + repeated("&amp;<!---->", 1'000'000) + "</string>"),
+            std::nullopt);
+  EXPECT_TRUE(parsedElement("<string>" + repeated("&amp;", 10'000) + "</string>").has_value());
+
+  const auto dictionary = [](int keyCount) {
+    std::string keys = "<dict>";
+    for (int key = 0; key < keyCount; ++key)
+      keys += "<key>" + std::to_string(key) + "</key><true/>";
+    return keys + "</dict>";
+  };
+  EXPECT_TRUE(parsedElement(dictionary(20'000)).has_value());
+  EXPECT_EQ(parsedElement(dictionary(200'000)), std::nullopt);
+  EXPECT_EQ(parsedElement("<string>" + std::string(17 << 20, 'x') + "</string>"), std::nullopt);
+}
+
+TEST(StringsTable, KeepsTextsAlone) {
+  const auto table = parseStringsTable(
+      "<plist><dict><key>Varnel_Quit</key><string>Beenden %@</string><key>a</key><integer>1"
+      "</integer><key></key><string>empty key</string></dict></plist>");
+  const StringsTable expected{{"", "empty key"}, {"Varnel_Quit", "Beenden %@"}};
+  EXPECT_EQ(table, expected);
+  EXPECT_EQ(parseStringsTable("<plist><array/></plist>"), std::nullopt);
+  EXPECT_EQ(parseStringsTable("\"key\" = \"value\";"), std::nullopt);
+  EXPECT_EQ(parseStringsTable("<plist><dict/></plist>"), StringsTable());
+}
+
+}  // namespace
+}  // namespace Varnel::Platform
