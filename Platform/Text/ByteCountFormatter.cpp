@@ -16,10 +16,6 @@ struct Unit {
 constexpr std::array units{Unit{"KB", 0}, Unit{"MB", 1}, Unit{"GB", 2},
                            Unit{"TB", 2}, Unit{"PB", 2}, Unit{"EB", 2}};
 
-std::uint64_t unitStep(ByteCountStyle style) {
-  return style == ByteCountStyle::memory || style == ByteCountStyle::binary ? 1024 : 1000;
-}
-
 struct Rounded {
   std::uint64_t whole;
   std::uint64_t fraction;  ///< The decimals as one number.

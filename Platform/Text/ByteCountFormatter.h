@@ -12,6 +12,11 @@ namespace Varnel::Platform {
 /// How many bytes make a KB: 1000 for `file` and `decimal`, 1024 for `memory` and `binary`.
 enum class ByteCountStyle { file, memory, decimal, binary };
 
+/// The factor from each unit to the next.
+[[nodiscard]] constexpr std::uint64_t unitStep(ByteCountStyle style) {
+  return style == ByteCountStyle::memory || style == ByteCountStyle::binary ? 1024 : 1000;
+}
+
 /// Writes byte counts for people: "Zero KB", "999 bytes", "12 KB", "1.5 MB", "2.25 GB".
 ///
 ///     ByteCountFormatter("en_US").string(1'500'000, ByteCountStyle::file);  // "1.5 MB"
