@@ -4,6 +4,7 @@
 #include <filesystem>
 #include <stdexcept>
 #include <string>
+#include <string_view>
 
 #include <Varnel/Logging/GenericError.h>
 #include <Varnel/Logging/Logger.h>
@@ -14,7 +15,7 @@ using Varnel::Platform::URL;
 
 class Importer final : public Varnel::LoggingObject {
  public:
-  std::string logAuthor() const override { return "Importer"; }
+  std::string_view logAuthor() const override { return "Importer"; }
 
   void run() const {
     log("Did start", {LoggingContextTag::jobDescription("import"),

@@ -11,20 +11,25 @@
 #include <Platform/Ports/ProcessInfo.h>
 #include <Platform/Ports/UserLocale.h>
 #include <Platform/Text/PropertyListParser.h>
+#include <Platform/Text/StringsTable.h>
 
 namespace Varnel {
 namespace {
 
 namespace fs = std::filesystem;
 using Platform::PropertyDictionary;
+using Platform::StringsTable;
 
 constexpr std::string_view developmentLanguage = "en";
 
-std::optional<PropertyDictionary> readDictionary(const fs::path& file) {
+// Empty, and so no property list, when the file cannot be read.
+std::string bytesOf(const fs::path& file) {
   std::ifstream stream(file, std::ios::binary);
-  if (!stream) return std::nullopt;
-  const std::string bytes((std::istreambuf_iterator<char>(stream)), {});
-  const auto list = Platform::parsePropertyList(bytes);
+  return std::string((std::istreambuf_iterator<char>(stream)), {});
+}
+
+std::optional<PropertyDictionary> readDictionary(const fs::path& file) {
+  const auto list = Platform::parsePropertyList(bytesOf(file));
   const auto* dictionary = list ? list->as<PropertyDictionary>() : nullptr;
   if (!dictionary) return std::nullopt;
   return *dictionary;
@@ -49,14 +54,15 @@ struct Bundle::Content {
   std::optional<PropertyDictionary> info;
 
   std::mutex mutex;  // Owns `tables`; a table, once there, never changes.
-  std::map<std::string, std::vector<PropertyDictionary>> tables;
+  std::map<std::string, std::vector<StringsTable>> tables;
 
   // The tables in the order in which they are asked: the first of the user's languages that the
   // bundle has, then English.
-  std::vector<PropertyDictionary> readTables(const std::string& name) const {
-    std::vector<PropertyDictionary> found;
+  std::vector<StringsTable> readTables(const std::string& name) const {
+    std::vector<StringsTable> found;
     const auto read = [&](const std::string& language) {
-      auto table = readDictionary(*folder / (language + ".lproj") / (name + ".strings"));
+      auto table = Platform::parseStringsTable(
+          bytesOf(*folder / (language + ".lproj") / (name + ".strings")));
       if (table) found.push_back(std::move(*table));
       return !found.empty();
     };
@@ -71,7 +77,7 @@ struct Bundle::Content {
     return found;
   }
 
-  const std::vector<PropertyDictionary>& tablesNamed(const std::string& name) {
+  const std::vector<StringsTable>& tablesNamed(const std::string& name) {
     const std::lock_guard lock(mutex);
     const auto known = tables.find(name);
     return known != tables.end() ? known->second : tables[name] = readTables(name);
@@ -115,8 +121,8 @@ std::optional<std::string> Bundle::identifier() const {
 
 std::string Bundle::localizedString(std::string_view key, std::string_view defaultValue,
                                     const std::optional<std::string>& tableName) const {
-  for (const PropertyDictionary& table : content_->tablesNamed(tableName.value_or("Localizable")))
-    if (const auto* text = Platform::findAs<std::string>(table, key)) return *text;
+  for (const StringsTable& table : content_->tablesNamed(tableName.value_or("Localizable")))
+    if (const auto text = table.find(key); text != table.end()) return text->second;
   return std::string(defaultValue.empty() ? key : defaultValue);
 }
 

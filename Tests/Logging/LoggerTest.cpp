@@ -101,7 +101,7 @@ TEST_F(LoggerTest, HidesPathsAndSizesInAnonymousMode) {
   EXPECT_EQ(location("/a/secret"), "absent");
   EXPECT_EQ(entryOf([](Logger& l) { l.log("m", "A", URL::fileURLWithPath("/a/secret")); }),
             stamp + "A:  m\n");
-  EXPECT_EQ(logger().stringForFileSize(3'456'789), "3 MB");
+  EXPECT_EQ(logger().stringForFileSize(3'456'789), "5 MB");
 }
 
 TEST_F(LoggerTest, TellsTimings) {

@@ -1,0 +1,53 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Context/VarnelModule.h>
+
+#include <mutex>
+#include <typeinfo>
+
+#include <Platform/Ports/Ports.h>
+#include <Platform/Ports/ProcessInfo.h>
+#include <Platform/Ports/UserLocale.h>
+
+namespace Varnel {
+namespace {
+
+struct SharedModule {
+  std::mutex mutex;  // Owns `module`.
+  std::shared_ptr<VarnelModule> module;
+};
+
+SharedModule& sharedModule() {
+  static SharedModule& shared = *new SharedModule();
+  return shared;
+}
+
+}  // namespace
+
+std::shared_ptr<VarnelModule> VarnelModule::instance() {
+  SharedModule& shared = sharedModule();
+  const std::lock_guard lock(shared.mutex);
+  if (!shared.module) shared.module = makeModule<VarnelModule>();
+  return shared.module;
+}
+
+void VarnelModule::setInstance(std::shared_ptr<VarnelModule> instance) {
+  SharedModule& shared = sharedModule();
+  const std::lock_guard lock(shared.mutex);
+  shared.module = std::move(instance);
+}
+
+std::string VarnelModule::identifier() const {
+  return "varnel-module";
+}
+
+Bundle VarnelModule::fetchBundle() const {
+  const Platform::Ports& ports = Platform::processPorts();
+  return Bundle(ports.processInfo.bundleFolderOfCode(&typeid(VarnelModule), "varnel"),
+                ports.userLocale.languages());
+}
+
+std::string VarnelModule::typeName() const {
+  return "VarnelModule";
+}
+
+}  // namespace Varnel
