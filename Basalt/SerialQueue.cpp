@@ -297,8 +297,15 @@ void SerialQueue::Core::work() {
     {
       const std::lock_guard lock(mutex_);
       if (line_.empty()) break;
-      block = popFront().block;
-      word_.store(bitsOfLine() | held, std::memory_order_relaxed);
+      // A thread that was woken in vain may have gone before the block meanwhile.
+      if (!line_.front().waiter) {
+        block = popFront().block;
+        word_.store(bitsOfLine() | held, std::memory_order_relaxed);
+      }
+    }
+    if (!block) {
+      passOn(0);
+      continue;
     }
     holder_.store(currentThreadID(), std::memory_order_relaxed);
     [&]() noexcept { block(); }();

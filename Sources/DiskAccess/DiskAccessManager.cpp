@@ -107,7 +107,8 @@ void DiskAccessManager::State::updateDiskDataUnsafe() {
   }
   // A disk that is gone is remembered while threads access it or wait to.
   for (auto& [uniqueID, record] : diskDataByUniqueID_)
-    if (!record->isIdle()) records.try_emplace(uniqueID, std::move(record));
+    if (record->accessCount() + record->requestCount() > 0)
+      records.try_emplace(uniqueID, std::move(record));
   diskDataByUniqueID_ = std::move(records);
 }
 

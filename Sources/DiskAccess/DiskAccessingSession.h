@@ -46,7 +46,9 @@ class VARNEL_API DiskAccessingSession final {
   [[nodiscard]] bool secureScope() const { return secureScope_; }
   [[nodiscard]] bool isAccessing() const { return isAccessing_; }
 
+  /// The disk that the access counts against, and its record.
   [[nodiscard]] const std::shared_ptr<const OVDiskInfo>& diskInfo() const;
+  [[nodiscard]] const std::shared_ptr<DiskData>& diskData() const { return diskData_; }
 
   /// Gives the place back and lets waiting threads in. On the thread that began, once.
   void endAccessing();

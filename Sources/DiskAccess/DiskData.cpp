@@ -1,9 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/DiskAccess/DiskData.h>
 
-#include <algorithm>
 #include <utility>
-#include <vector>
 
 #include <Basalt/SerialQueue.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
@@ -39,13 +37,10 @@ bool DiskData::hasFreePlace() const {
   return static_cast<std::int64_t>(accessingThreads_.count()) < limit;
 }
 
-bool DiskData::hasRequests() const {
-  return std::any_of(requests_.begin(), requests_.end(),
-                     [](const Requests& requests) { return !requests.empty(); });
-}
-
-bool DiskData::isIdle() const {
-  return accessingThreads_.count() == 0 && !hasRequests();
+std::size_t DiskData::requestCount() const {
+  std::size_t count = 0;
+  for (const Requests& requests : requests_) count += requests.size();
+  return count;
 }
 
 std::shared_ptr<DiskData::AccessRequest> DiskData::requestAccess(Basalt::ThreadID thread,
@@ -61,22 +56,28 @@ void DiskData::releaseAccess(Basalt::ThreadID thread) {
   accessingThreads_.remove(thread);
   // A request can only join a full disk, whose next release sees it: without any now, there is
   // nothing that a pass could find.
-  if (hasRequests()) queue_->submit([self = shared_from_this()] { self->grantPendingRequests(); });
+  if (requestCount() > 0)
+    queue_->submit([self = shared_from_this()] { self->grantPendingRequests(); });
 }
 
 void DiskData::grantPendingRequests() {
   Basalt::QNAssertOnQueue(*queue_);
   if (!hasFreePlace()) return;
+  Requests granted = claimPendingRequests();
+  if (granted.empty()) return;
+  queue_->afterRelease([granted = std::move(granted)] {
+    for (const std::shared_ptr<AccessRequest>& request : granted) request->sema.signal();
+  });
+}
+
+DiskData::Requests DiskData::claimPendingRequests() {
   Requests granted;
   for (Requests& requests : requests_) {
     for (std::shared_ptr<AccessRequest>& request : requests)
       if (request->claim()) granted.push_back(std::move(request));
     requests.clear();
   }
-  if (granted.empty()) return;
-  queue_->afterRelease([granted = std::move(granted)] {
-    for (const std::shared_ptr<AccessRequest>& request : granted) request->sema.signal();
-  });
+  return granted;
 }
 
 }  // namespace Varnel

@@ -68,17 +68,20 @@ class VARNEL_API DiskData final : public std::enable_shared_from_this<DiskData> 
   /// costs less to admit a few too many than to let a place stand empty while threads wake up.
   void grantPendingRequests();
 
-  /// Whether no thread accesses the disk and none waits to.
-  [[nodiscard]] bool isIdle() const;
-
-  /// How many places are taken.
-  [[nodiscard]] std::size_t accessCount() const { return accessingThreads_.count(); }
-
- private:
   using Requests = std::deque<std::shared_ptr<AccessRequest>>;
 
+  /// Empties the line: the requests that a pass grants, in the order in which it wakes their
+  /// threads. Those whose thread has given up are dropped.
+  [[nodiscard]] Requests claimPendingRequests();
+
+  /// How many places are taken, a thread counting once for each that it has.
+  [[nodiscard]] std::size_t accessCount() const { return accessingThreads_.count(); }
+
+  /// How many requests stand in line, those included whose thread has given up.
+  [[nodiscard]] std::size_t requestCount() const;
+
+ private:
   [[nodiscard]] bool hasFreePlace() const;
-  [[nodiscard]] bool hasRequests() const;
 
   const std::shared_ptr<const OVDiskInfo> diskInfo_;
   const std::shared_ptr<Basalt::SerialQueue> queue_;
