@@ -1,0 +1,67 @@
+// SPDX-License-Identifier: MIT
+#include <Basalt/NotificationCenter.h>
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <optional>
+#include <thread>
+#include <vector>
+
+namespace Basalt {
+namespace {
+
+TEST(NotificationCenter, TellsTheObserversOfANameInOrder) {
+  NotificationCenter center;
+  std::vector<int> calls;
+  const auto first =
+      center.addObserver("mounted", [&](const Notification&) { calls.push_back(1); });
+  const auto other =
+      center.addObserver("unmounted", [&](const Notification&) { calls.push_back(2); });
+  const auto last = center.addObserver("mounted", [&](const Notification&) { calls.push_back(3); });
+  center.post({.name = "mounted", .userInfo = {}});
+  EXPECT_EQ(calls, (std::vector{1, 3}));
+}
+
+TEST(NotificationCenter, LetsHandlersComeAndGoDuringAPost) {
+  NotificationCenter center;
+  int calls = 0;
+  std::vector<NotificationCenter::Observer> added;
+  std::optional<NotificationCenter::Observer> self, later;
+  self = center.addObserver("changed", [&](const Notification& notification) {
+    ++calls;
+    added.push_back(center.addObserver("changed", [&](const Notification&) { calls += 100; }));
+    self.reset();
+    later.reset();
+    center.post({.name = "nested", .userInfo = notification.userInfo});
+  });
+  later = center.addObserver("changed", [&](const Notification&) { calls += 10; });
+  const auto nested = center.addObserver("nested", [&](const Notification&) { calls += 1000; });
+  center.post({.name = "changed", .userInfo = {}});
+  EXPECT_EQ(calls, 1001) << "one that was dropped is not called, one that was added not yet";
+  center.post({.name = "changed", .userInfo = {}});
+  EXPECT_EQ(calls, 1101);
+}
+
+TEST(NotificationCenter, ServesSeveralThreadsAndMayGoBeforeItsObservers) {
+  std::optional<NotificationCenter::Observer> survivor;
+  std::atomic<int> calls = 0;
+  {
+    NotificationCenter center;
+    survivor = center.addObserver("tick", [&](const Notification&) { ++calls; });
+    std::vector<std::thread> threads;
+    for (int thread = 0; thread < 3; ++thread) {
+      threads.emplace_back([&] {
+        for (int i = 0; i < 500; ++i) {
+          const auto passing = center.addObserver("tick", [](const Notification&) {});
+          center.post({.name = "tick", .userInfo = {}});
+        }
+      });
+    }
+    for (std::thread& thread : threads) thread.join();
+  }
+  EXPECT_EQ(calls, 1500);
+}
+
+}  // namespace
+}  // namespace Basalt

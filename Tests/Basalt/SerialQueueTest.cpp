@@ -1,0 +1,251 @@
+// SPDX-License-Identifier: MIT
+#include <Basalt/SerialQueue.h>
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <latch>
+#include <memory>
+#include <random>
+#include <stdexcept>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include <Basalt/Semaphore.h>
+#include <Basalt/ThreadID.h>
+
+namespace Basalt {
+namespace {
+
+using Log = std::vector<std::string>;
+
+/// Keeps a queue busy with an `async` block until it is told to go on.
+class Occupation final {
+ public:
+  explicit Occupation(SerialQueue& queue) {
+    queue.async([gate = gate_, begun = begun_] {
+      begun->signal();
+      gate->wait();
+    });
+    begun_->wait();
+  }
+  void end() { gate_->signal(); }
+
+ private:
+  const std::shared_ptr<Semaphore> gate_ = std::make_shared<Semaphore>();
+  const std::shared_ptr<Semaphore> begun_ = std::make_shared<Semaphore>();
+};
+
+TEST(SerialQueue, RunsTheBlocksOfAThreadInItsOrder) {
+  SerialQueue queue("order");
+  Log log;
+  Occupation occupation(queue);
+  queue.async([&] { log.push_back("async"); });
+  queue.submit([&] { log.push_back("submit"); });
+  queue.async([&] { log.push_back("async again"); });
+  EXPECT_TRUE(log.empty());
+  occupation.end();
+  queue.sync([&] { log.push_back("sync"); });
+  EXPECT_EQ(log, Log({"async", "submit", "async again", "sync"}));
+}
+
+TEST(SerialQueue, ChoosesTheThread) {
+  SerialQueue queue("threads");
+  const ThreadID here = currentThreadID();
+  ThreadID asynchronous{};
+  ThreadID submitted{};
+  queue.async([&] { asynchronous = currentThreadID(); });
+  queue.sync([&] {
+    EXPECT_NE(asynchronous, here);
+    EXPECT_EQ(currentThreadID(), here);
+    EXPECT_TRUE(queue.isCurrent());
+  });
+  EXPECT_FALSE(queue.isCurrent());
+  queue.submit([&] { submitted = currentThreadID(); });
+  EXPECT_EQ(submitted, here) << "an idle queue runs a brief block at once";
+}
+
+TEST(SerialQueue, LeavesABriefBlockToWhoGivesTheQueueUp) {
+  SerialQueue queue("brief");
+  std::vector<ThreadID> runners;
+  Semaphore isHeld, goOn;
+  std::thread holder([&] {
+    queue.sync([&] {
+      isHeld.signal();
+      goOn.wait();
+    });
+  });
+  isHeld.wait();
+  for (int i = 0; i < 20; ++i) queue.submit([&] { runners.push_back(currentThreadID()); });
+  goOn.signal();
+  holder.join();
+  queue.sync([&] {
+    ASSERT_EQ(runners.size(), 20u);
+    EXPECT_NE(runners[0], currentThreadID());
+    EXPECT_EQ(runners[15], runners[0]) << "the holder runs a fair share";
+    EXPECT_NE(runners[16], runners[0]) << "and leaves the rest to the queue's own thread";
+    EXPECT_EQ(runners[19], runners[16]);
+  });
+}
+
+TEST(SerialQueue, RunsWhatABlockSubmitsOnceItHasEnded) {
+  SerialQueue queue("nested");
+  Log log;
+  queue.sync([&] {
+    queue.afterRelease([&] { queue.sync([&] { log.push_back("after release"); }); });
+    queue.submit([&] {
+      log.push_back("submitted");
+      queue.submit([&] { log.push_back("submitted by the submitted"); });
+    });
+    log.push_back("block");
+  });
+  EXPECT_EQ(log, Log({"block", "submitted", "submitted by the submitted", "after release"}));
+
+  log.clear();
+  queue.sync([&] {
+    queue.submit([&] { log.push_back("submitted"); });
+    queue.async([&] { log.push_back("asynchronous"); });
+    queue.submit([&] { log.push_back("submitted after it"); });
+  });
+  queue.sync([] {});
+  EXPECT_EQ(log, Log({"submitted", "asynchronous", "submitted after it"}));
+}
+
+TEST(SerialQueue, IsFreeAgainWhenAnExceptionArrives) {
+  SerialQueue queue("exception");
+  Log log;
+  try {
+    queue.sync([&] {
+      queue.submit([&] { log.push_back("submitted"); });
+      throw std::runtime_error("refused");
+    });
+    FAIL();
+  } catch (const std::runtime_error& error) {
+    log.push_back(error.what());
+    queue.sync([&] { log.push_back("next"); });
+  }
+  EXPECT_EQ(log, Log({"submitted", "refused", "next"}));
+}
+
+TEST(SerialQueue, MayLoseItsLastReferenceAnywhere) {
+  for (const auto drop : {&SerialQueue::async, &SerialQueue::submit}) {
+    auto queue = std::make_shared<SerialQueue>("last reference");
+    Semaphore gate, done;
+    SerialQueue& bare = *queue;
+    bare.async([&] { gate.wait(); });
+    (bare.*drop)([queue = std::move(queue)]() mutable { queue.reset(); });
+    bare.async([&] { done.signal(); });
+    gate.signal();
+    done.wait();
+  }
+  auto queue = std::make_shared<SerialQueue>("without a thread of its own");
+  SerialQueue& bare = *queue;
+  bare.submit([owner = std::move(queue)] {});
+  auto other = std::make_unique<SerialQueue>("in a synchronous block");
+  other->sync([&] { other.reset(); });
+}
+
+TEST(SerialQueue, IsDestroyedWithoutWaitingAndStillRunsWhatWasSubmitted) {
+  auto queue = std::make_unique<SerialQueue>("destroyed");
+  const auto done = std::make_shared<Semaphore>();
+  Occupation occupation(*queue);
+  queue->async([done] { done->signal(); });
+  queue->submit([done] { done->signal(); });
+  queue.reset();
+  occupation.end();
+  done->wait();
+  done->wait();
+}
+
+// Any mixture of calls from several threads: one block at a time, each thread's in their order, and
+// none lost.
+TEST(SerialQueue, KeepsItsPromisesUnderStress) {
+  constexpr int threadCount = 4;
+  constexpr int callCount = 4000;
+  for (unsigned round = 0; round < 3; ++round) {
+    auto queue = std::make_shared<SerialQueue>("stress");
+    struct State {
+      std::vector<int> last = std::vector<int>(threadCount, -1);
+      int running = 0;
+      int blocks = 0;
+      bool isInOrder = true;
+    };
+    const auto state = std::make_shared<State>();
+    std::latch start(threadCount);
+    std::vector<std::thread> threads;
+    for (int thread = 0; thread < threadCount; ++thread) {
+      threads.emplace_back([&, thread, queue] {
+        std::minstd_rand random(round * threadCount + static_cast<unsigned>(thread) + 1);
+        start.arrive_and_wait();
+        for (int call = 0; call < callCount; ++call) {
+          const auto block = [state, thread, call] {
+            if (++state->running != 1) state->isInOrder = false;
+            if (state->last[static_cast<std::size_t>(thread)] != call - 1) state->isInOrder = false;
+            state->last[static_cast<std::size_t>(thread)] = call;
+            ++state->blocks;
+            --state->running;
+          };
+          const unsigned kind = static_cast<unsigned>(random()) % 16;
+          if (kind == 0) {
+            queue->async(block);
+          } else if (kind == 1) {
+            queue->sync([&] { queue->submit(block); });
+          } else if (kind == 2) {
+            queue->async([block, owner = queue] { owner->submit(block); });
+            queue->sync([] {});
+          } else if (kind == 3) {
+            EXPECT_THROW(queue->sync([&] {
+              block();
+              throw std::runtime_error("on purpose");
+            }),
+                         std::runtime_error);
+          } else if (kind < 8) {
+            queue->submit(block);
+          } else {
+            queue->sync(block);
+          }
+        }
+      });
+    }
+    for (std::thread& thread : threads) thread.join();
+    queue->sync([&] {
+      EXPECT_TRUE(state->isInOrder);
+      EXPECT_EQ(state->blocks, threadCount * callCount);
+    });
+  }
+}
+
+// Many short-lived queues: whoever gives a queue up last, on whatever thread, takes it down.
+TEST(SerialQueue, ComesAndGoesUnderStress) {
+  const auto finished = std::make_shared<Semaphore>();
+  constexpr int rounds = 300;
+  for (int round = 0; round < rounds; ++round) {
+    auto queue = std::make_shared<SerialQueue>("short life");
+    std::thread other([queue] { queue->sync([queue] { queue->submit([queue] {}); }); });
+    queue->async([queue, finished] { queue->afterRelease([finished] { finished->signal(); }); });
+    queue->submit([queue] {});
+    queue.reset();
+    other.join();
+  }
+  for (int round = 0; round < rounds; ++round) finished->wait();
+}
+
+TEST(SerialQueueDeathTest, StopsCodeOnTheWrongQueue) {
+  GTEST_FLAG_SET(death_test_style, "threadsafe");
+  EXPECT_DEATH(
+      {
+        SerialQueue queue("own queue");
+        queue.sync([&] { queue.sync([] {}); });
+      },
+      "own queue");
+  EXPECT_DEATH(
+      {
+        const SerialQueue queue("other queue");
+        QNAssertOnQueue(queue);
+      },
+      "other queue");
+}
+
+}  // namespace
+}  // namespace Basalt

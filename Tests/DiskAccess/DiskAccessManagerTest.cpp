@@ -1,0 +1,297 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/DiskAccess/DiskAccessManager.h>
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <functional>
+#include <latch>
+#include <random>
+#include <thread>
+#include <vector>
+
+#include <Basalt/SerialQueue.h>
+#include <Platform/Testing/FakeDeviceRegistry.h>
+#include <Platform/Testing/FakeDiskArbitration.h>
+#include <Platform/Testing/FakeSecurityScope.h>
+#include <Platform/Testing/FakeVolumeCatalog.h>
+#include <Varnel/DiskAccess/DiskAccessGuard.h>
+#include <Varnel/DiskAccess/DiskData.h>
+#include <Varnel/DiskAccess/OVDiskInfo.h>
+#include <Varnel/DiskAccess/VolumeChangeRelay.h>
+
+namespace Varnel {
+namespace {
+
+using Platform::URL;
+using QoS = Platform::QualityOfService;
+using Session = std::unique_ptr<DiskAccessingSession>;
+
+const URL homeVolume = URL::fileURLWithPath("/home/");
+const URL archiveVolume = URL::fileURLWithPath("/archive/");
+const URL stickVolume = URL::fileURLWithPath("/stick/");
+const URL homeFile = URL::fileURLWithPath("/home/file");
+const URL stickFile = URL::fileURLWithPath("/stick/file");
+
+/// A machine with a solid-state disk under /home/, and a manager that knows it.
+class DiskAccessManagerTest : public ::testing::Test {
+ protected:
+  DiskAccessManagerTest() {
+    plugDisk("SSD-1", "nvme0n1", "Solid State", homeVolume);
+    volumes_.setVolumes({{.url = homeVolume, .isLocal = {}, .isInternal = {}, .uuid = {}}});
+    manager_.emplace(DiskAccessManager::Ports{.devices = devices_,
+                                              .disks = disks_,
+                                              .volumes = volumes_,
+                                              .securityScope = scope_,
+                                              .notificationCenter = center_});
+    awaitInventory();
+  }
+
+  void plugDisk(const char* serial, const char* name, const char* medium, const URL& volume) {
+    const auto device = devices_.plug(
+        {{"SMART Capable", true},
+         {"Device Characteristics",
+          Platform::PropertyDictionary{{"Serial Number", serial}, {"Medium Type", medium}}}});
+    devices_.plug({{"BSD Name", name}}, device);
+    disks_.setMountURLs(name, {volume});
+  }
+
+  /// The inventories that this thread has asked for precede its next access.
+  void awaitInventory() {
+    if (const auto session = begin(homeFile)) session->endAccessing();
+  }
+
+  Session begin(const URL& file, std::optional<double> timeout = {}, QoS qos = QoS::utility) {
+    return manager_->beginAccessingURL(file, "test", qos, true, timeout);
+  }
+
+  /// The same while other threads keep the manager too busy to look the disk up.
+  Session beginOnKnownDisk(const URL& file, std::optional<double> timeout = {}) {
+    Session session = begin(file, timeout);
+    while (session && session->diskInfo()->uniqueID() == "unknown") {
+      session->endAccessing();
+      session = begin(file, timeout);
+    }
+    return session;
+  }
+
+  static std::size_t accessCount(DiskData& disk) {
+    return disk.queue().sync([&] { return disk.accessCount(); });
+  }
+
+  static void awaitRequests(DiskData& disk, std::size_t count) {
+    while (disk.queue().sync([&] { return disk.requestCount(); }) < count)
+      std::this_thread::yield();
+  }
+
+  Platform::Testing::FakeDeviceRegistry devices_;
+  Platform::Testing::FakeDiskArbitration disks_;
+  Platform::Testing::FakeVolumeCatalog volumes_;
+  Platform::Testing::FakeSecurityScope scope_;
+  Basalt::NotificationCenter center_;
+  const VolumeChangeRelay relay_{volumes_, center_};
+  std::optional<DiskAccessManager> manager_;
+};
+
+TEST_F(DiskAccessManagerTest, CountsAnAccessAgainstTheDiskOfItsVolume) {
+  const DiskAccessGuard known(begin(homeFile));
+  EXPECT_EQ(known->diskInfo()->uniqueID(), "SSD-1");
+  EXPECT_TRUE(known->isAccessing());
+  const DiskAccessGuard told(
+      manager_->beginAccessingURL(stickFile, "test", QoS::utility, false, {}, homeVolume));
+  EXPECT_EQ(told->diskData(), known->diskData());
+  const DiskAccessGuard unknown(
+      manager_->beginAccessingURL(homeFile, "test", QoS::utility, false, {}, archiveVolume));
+  EXPECT_EQ(unknown->diskInfo()->uniqueID(), "unknown");
+  EXPECT_EQ(unknown->diskInfo()->maxTreads(), 1);
+}
+
+TEST_F(DiskAccessManagerTest, OpensASecurityScopeOnlyWhenAskedAndOnAVolume) {
+  EXPECT_FALSE(begin(stickFile)) << "it lies on no volume";
+  volumes_.setLookupError(Platform::PlatformError("Test", 1));
+  EXPECT_FALSE(begin(homeFile));
+  volumes_.setLookupError({});
+  const int before = scope_.startCount();
+  manager_->beginAccessingURL(homeFile, "test", QoS::utility, false)->endAccessing();
+  EXPECT_EQ(scope_.startCount(), before);
+
+  begin(homeFile)->endAccessing();
+  EXPECT_EQ(scope_.startCount(), before + 1);
+  EXPECT_EQ(scope_.openAccesses(homeFile), 0);
+
+  const URL secret = URL::fileURLWithPath("/home/secret");
+  scope_.forbid(secret);
+  EXPECT_FALSE(begin(secret));
+  DiskAccessGuard access(begin(homeFile));
+  EXPECT_EQ(accessCount(*access->diskData()), 1u);
+}
+
+TEST_F(DiskAccessManagerTest, ASessionThatIsDroppedKeepsItsPlaceAndItsScope) {
+  volumes_.mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
+  awaitInventory();
+  std::shared_ptr<DiskData> disk;
+  std::thread([&] { disk = begin(stickFile)->diskData(); }).join();
+  EXPECT_EQ(accessCount(*disk), 1u);
+  EXPECT_EQ(scope_.openAccesses(stickFile), 1);
+  for (const double timeout : {0.0, -1.0, 0.001}) EXPECT_FALSE(begin(stickFile, timeout));
+  EXPECT_EQ(scope_.openAccesses(stickFile), 4) << "a time-out leaves its scope open";
+}
+
+TEST_F(DiskAccessManagerTest, SessionsOfOneThreadNestAndCountEach) {
+  volumes_.mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
+  awaitInventory();
+  const Session outer = begin(stickFile);
+  const Session inner = begin(stickFile);
+  outer->endAccessing();
+  EXPECT_EQ(accessCount(*inner->diskData()), 1u);
+  std::thread([&] { EXPECT_FALSE(begin(stickFile, 0)); }).join();
+  inner->endAccessing();
+  std::thread([&] { EXPECT_TRUE(begin(stickFile)); }).join();
+}
+
+TEST_F(DiskAccessManagerTest, AMountThatAppearsWhileThreadsWaitGetsItsOwnDisk) {
+  const auto useUnknownDisk = [&] {
+    return manager_->beginAccessingURL(stickFile, "test", QoS::utility, false, {}, stickVolume);
+  };
+  const Session holder = useUnknownDisk();
+  std::atomic<int> admitted = 0;
+  std::vector<std::thread> waiting;
+  for (int i = 0; i < 3; ++i) {
+    waiting.emplace_back([&] {
+      const DiskAccessGuard access(useUnknownDisk());
+      EXPECT_EQ(access->diskInfo()->uniqueID(), "unknown");
+      ++admitted;
+    });
+  }
+  awaitRequests(*holder->diskData(), 3);
+  plugDisk("HDD-1", "sda1", "Rotational", stickVolume);
+  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  awaitInventory();
+  begin(stickFile)->endAccessing();
+  const Session known = begin(stickFile);
+  EXPECT_EQ(known->diskInfo()->uniqueID(), "HDD-1");
+  EXPECT_EQ(admitted, 0) << "an inventory leaves the lines as they are";
+  holder->endAccessing();
+  for (std::thread& thread : waiting) thread.join();
+  EXPECT_EQ(admitted, 3);
+
+  // Its record outlives the disk while somebody is on it, and is new afterwards.
+  const std::shared_ptr<DiskData> record = known->diskData();
+  disks_.setMountURLs("sda1", {});
+  volumes_.unmount(stickVolume);
+  awaitInventory();
+  disks_.setMountURLs("sda1", {stickVolume});
+  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  awaitInventory();
+  const Session again = begin(stickFile);
+  EXPECT_EQ(again->diskData(), record);
+  EXPECT_EQ(accessCount(*record), 2u);
+  again->endAccessing();
+  known->endAccessing();
+}
+
+TEST_F(DiskAccessManagerTest, AVolumeOverTwoDisksBelongsToTheLast) {
+  plugDisk("HDD-2", "sdb", "Rotational", homeVolume);
+  center_.post({.name = std::string(didMountNotification), .userInfo = {}});
+  awaitInventory();
+  EXPECT_EQ(DiskAccessGuard(begin(homeFile))->diskInfo()->uniqueID(), "HDD-2");
+}
+
+TEST_F(DiskAccessManagerTest, BackgroundModeOffWakesWaitersAndOnWakesNobody) {
+  const Session holder = begin(homeFile);
+  manager_->setIsBackgroundMode(true);
+  EXPECT_TRUE(manager_->isBackgroundMode());
+  awaitInventory();
+  std::latch admitted(3);
+  std::vector<std::thread> waiting;
+  for (int i = 0; i < 3; ++i) {
+    waiting.emplace_back([&] {
+      const DiskAccessGuard access(beginOnKnownDisk(homeFile));
+      admitted.count_down();
+    });
+  }
+  awaitRequests(*holder->diskData(), 3);
+  manager_->setIsBackgroundMode(true);
+  awaitInventory();
+  awaitRequests(*holder->diskData(), 3);
+  EXPECT_FALSE(admitted.try_wait());
+  manager_->setIsBackgroundMode(false);
+  admitted.wait();
+  holder->endAccessing();
+  for (std::thread& thread : waiting) thread.join();
+
+  // A disk that comes in background mode starts in it.
+  manager_->setIsBackgroundMode(true);
+  plugDisk("SSD-2", "nvme1n1", "Solid State", stickVolume);
+  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  awaitInventory();
+  const DiskAccessGuard access(begin(stickFile));
+  std::thread([&] { EXPECT_FALSE(begin(stickFile, 0)); }).join();
+}
+
+TEST_F(DiskAccessManagerTest, AGrantThatRacesATimeOutAdmitsTheThreadOnce) {
+  manager_->setIsBackgroundMode(true);
+  awaitInventory();
+  const Session holder = begin(homeFile);
+  const std::shared_ptr<DiskData> disk = holder->diskData();
+  std::thread waiting([&] {
+    const Session session = beginOnKnownDisk(homeFile, 0.02);
+    ASSERT_TRUE(session);
+    EXPECT_EQ(accessCount(*disk), 1u);
+    session->endAccessing();
+  });
+  awaitRequests(*disk, 1);
+  disk->queue().sync([&] {
+    // The wake-up is held back until the thread's time is up, although its place is granted.
+    disk->releaseAccess(Basalt::currentThreadID());
+    disk->grantPendingRequests();
+    std::this_thread::sleep_for(std::chrono::milliseconds(30));
+  });
+  waiting.join();
+  EXPECT_EQ(accessCount(*disk), 0u);
+}
+
+// Readers of all classes, with time-outs around the time that a place takes to come free, while the
+// mode and the mounts change: everybody comes in or gives up, and every place comes back.
+TEST_F(DiskAccessManagerTest, LosesNoPlaceUnderStress) {
+  constexpr QoS classes[] = {QoS::background, QoS::utility, QoS::default_, QoS::userInteractive};
+  std::atomic<int> readers = 4;
+  std::vector<std::thread> threads;
+  for (unsigned thread = 0; thread < 4; ++thread) {
+    threads.emplace_back([&, thread] {
+      std::minstd_rand random(thread + 1);
+      for (int i = 0; i < 3000; ++i) {
+        const unsigned choice = static_cast<unsigned>(random());
+        std::optional<double> timeout;
+        if (choice % 4 != 0) timeout = 1e-6 * (choice / 4 % 100);
+        const DiskAccessGuard access(begin(homeFile, timeout, classes[thread]));
+        if (!access) continue;
+        const DiskAccessGuard nested(choice % 7 == 0 ? begin(homeFile, 0) : nullptr);
+        if (choice % 3 == 0) std::this_thread::yield();
+      }
+      --readers;
+    });
+  }
+  for (bool isBackgroundMode = true; readers > 0; isBackgroundMode = !isBackgroundMode) {
+    manager_->setIsBackgroundMode(isBackgroundMode);
+    center_.post({.name = std::string(didUnmountNotification), .userInfo = {}});
+    awaitInventory();
+  }
+  for (std::thread& thread : threads) thread.join();
+  const Session last = begin(homeFile);
+  ASSERT_EQ(last->diskInfo()->uniqueID(), "SSD-1");
+  EXPECT_EQ(accessCount(*last->diskData()), 1u);
+  last->endAccessing();
+}
+
+TEST_F(DiskAccessManagerTest, MayGoWhileSessionsAreLeft) {
+  const Session left = begin(homeFile);
+  volumes_.announce({.kind = Platform::VolumeChange::Kind::mounted, .volumeURL = stickVolume});
+  manager_.reset();
+  volumes_.announce({.kind = Platform::VolumeChange::Kind::mounted, .volumeURL = stickVolume});
+  left->endAccessing();
+  EXPECT_EQ(accessCount(*left->diskData()), 0u);
+}
+
+}  // namespace
+}  // namespace Varnel
