@@ -9,7 +9,7 @@
 #include <sstream>
 
 #include <Tests/Programs/ScanFakes.h>
-#include <Tests/Programs/TemporaryFolder.h>
+#include <Tests/Programs/ScanFolder.h>
 #include <orvane/Scan/DuplicateFinder.h>
 
 namespace Orvane::Testing {
@@ -39,7 +39,7 @@ class Scan : public ::testing::Test {
     EXPECT_EQ(fileSystem.faults, 0) << "content was read outside an access";
   }
 
-  TemporaryFolder folder;
+  ScanFolder folder;
   FaultyFileSystem fileSystem;
   OpenAccess access;
   LossRecorder losses;
@@ -216,7 +216,7 @@ TEST_F(Scan, FindsWhatANaiveSearchFindsWhateverTheTree) {
   std::mt19937 random(20'240'501);
   const auto below = [&](unsigned bound) { return static_cast<unsigned>(random() % bound); };
   for (int round = 0; round < 20; ++round) {
-    const TemporaryFolder tree;
+    const ScanFolder tree;
     for (unsigned file = below(150); file > 0; --file) {
       std::string name;
       for (unsigned depth = below(4); depth > 0; --depth) name += std::to_string(below(3)) + "d/";
