@@ -1,0 +1,354 @@
+// SPDX-License-Identifier: MIT
+#include <Basalt/SerialQueue.h>
+
+#include <atomic>
+#include <cstdint>
+#include <cstdio>
+#include <cstdlib>
+#include <deque>
+#include <iterator>
+#include <mutex>
+#include <optional>
+#include <system_error>
+#include <thread>
+#include <vector>
+
+#include <fmt/format.h>
+
+#include <Basalt/Semaphore.h>
+#include <Basalt/ThreadID.h>
+#include <Platform/Concurrency/CurrentThread.h>
+
+namespace Basalt {
+namespace {
+
+/// How many brief blocks of others a thread runs when it gives a queue up.
+constexpr std::size_t briefBlockLimit = 16;
+
+[[noreturn]] void stop(const char* reason, const std::string& label) {
+  fmt::print(stderr, "{} (queue {})\n", reason, label);
+  std::abort();
+}
+
+/// Where a thread sleeps that waits for a queue. Shared, as the one that wakes it may still be
+/// about it when the thread has gone on.
+struct Waiter {
+  Semaphore wake;
+  bool ownsQueue = false;  ///< Set before the wake-up; otherwise the thread has to try again.
+};
+
+const std::shared_ptr<Waiter>& currentWaiter() {
+  thread_local const auto waiter = std::make_shared<Waiter>();
+  return waiter;
+}
+
+}  // namespace
+
+// The queue has one owner at a time: a thread, its own worker, or one to which it is being handed.
+// Who finds the word without `held` and `queued` may take it by one compare-and-swap and gives it
+// up by another as long as nobody stands in line. Whoever stands in line has said so in the word,
+// and makes the owner look: a block is run or handed on in its turn, the queue is handed to a
+// thread that has blocks behind it, and else the first thread is woken to try again, since a queue
+// that stays free for newcomers meanwhile is worth more than the order of threads that nothing
+// orders.
+class SerialQueue::Core final {
+ public:
+  Core(std::string label, QualityOfService quality) : label_(std::move(label)), quality_(quality) {
+    briefBlocks_.reserve(briefBlockLimit);
+  }
+
+  [[nodiscard]] const std::string& label() const { return label_; }
+  [[nodiscard]] bool isCurrent() const {
+    return holder_.load(std::memory_order_relaxed) == currentThreadID();
+  }
+
+  void acquire();
+  void release() noexcept;
+  void enqueue(Block block);
+  void submit(Block block);
+  void afterRelease(Block block);
+  void close();
+
+ private:
+  using Bits = std::uint32_t;
+  static constexpr Bits held = 1;     ///< It has an owner.
+  static constexpr Bits queued = 2;   ///< Blocks stand in line; newcomers join it. Never unheld.
+  static constexpr Bits waiting = 4;  ///< Threads stand in line.
+  static constexpr Bits closed = 8;   ///< Nobody can submit any more.
+
+  enum class Runner { anyThread, worker };
+  struct Entry {
+    Block block;
+    Runner runner = Runner::anyThread;
+    std::shared_ptr<Waiter> waiter;  ///< A thread instead of a block.
+  };
+
+  bool tryTake();
+  bool takeOrMark(Bits mark);
+  void acquireSlowly();
+  void pushBlock(Block block, Runner runner);
+  Entry popFront();
+  void runBriefBlocks() noexcept;
+  std::optional<Block> passOn(std::size_t mayRun) noexcept;
+  bool startWorker() noexcept;
+  void work();
+  [[nodiscard]] Bits bitsOfLine() const;
+
+  const std::string label_;
+  const QualityOfService quality_;
+  std::atomic<Bits> word_ = 0;
+  std::atomic<ThreadID> holder_ = ThreadID::none;  ///< Set only while a block runs.
+
+  // Owned by the holder.
+  std::vector<Block> briefBlocks_;
+  std::vector<Block> afterRelease_;
+
+  std::mutex mutex_;  ///< Owns what follows.
+  std::deque<Entry> line_;
+  std::size_t blocksInLine_ = 0;
+  bool hasWorker_ = false;
+  Semaphore work_;  ///< Signalled when the worker has become the owner.
+};
+
+void SerialQueue::Core::acquire() {
+  Bits idle = 0;
+  if (!word_.compare_exchange_strong(idle, held, std::memory_order_acquire,
+                                     std::memory_order_relaxed)) [[unlikely]]
+    acquireSlowly();
+  holder_.store(currentThreadID(), std::memory_order_relaxed);
+}
+
+bool SerialQueue::Core::tryTake() {
+  Bits word = word_.load(std::memory_order_relaxed);
+  while (!(word & held))
+    if (word_.compare_exchange_weak(word, word | held, std::memory_order_acquire,
+                                    std::memory_order_relaxed))
+      return true;
+  return false;
+}
+
+// Under the mutex: takes the queue if it is free, and otherwise makes its owner look at the line.
+bool SerialQueue::Core::takeOrMark(Bits mark) {
+  Bits word = word_.load(std::memory_order_relaxed);
+  while (!word_.compare_exchange_weak(word, word | (word & held ? mark : held),
+                                      std::memory_order_acquire, std::memory_order_relaxed)) {
+  }
+  return !(word & held);
+}
+
+void SerialQueue::Core::acquireSlowly() {
+  if (isCurrent()) stop("A block waits for the queue that it runs on", label_);
+  const std::shared_ptr<Waiter>& waiter = currentWaiter();
+  for (bool isNew = true; !tryTake(); isNew = false) {
+    {
+      const std::lock_guard lock(mutex_);
+      if (takeOrMark(waiting)) return;
+      waiter->ownsQueue = false;
+      // Who was woken in vain keeps the place at the front.
+      line_.insert(isNew ? line_.end() : line_.begin(), Entry{.block = {}, .waiter = waiter});
+    }
+    waiter->wake.wait();
+    if (waiter->ownsQueue) return;
+  }
+}
+
+void SerialQueue::Core::release() noexcept {
+  std::vector<Block> afterRelease;
+  std::size_t mayRun = briefBlockLimit;
+  for (;;) {
+    if (!briefBlocks_.empty()) runBriefBlocks();
+    if (!afterRelease_.empty()) {
+      std::move(afterRelease_.begin(), afterRelease_.end(), std::back_inserter(afterRelease));
+      afterRelease_.clear();
+    }
+    holder_.store(ThreadID::none, std::memory_order_relaxed);
+    Bits alone = held;
+    if (word_.compare_exchange_strong(alone, 0, std::memory_order_release,
+                                      std::memory_order_relaxed)) [[likely]]
+      break;
+    std::optional<Block> block = passOn(mayRun);
+    if (!block) break;
+    --mayRun;
+    holder_.store(currentThreadID(), std::memory_order_relaxed);
+    (*block)();
+  }
+  // From here on the queue may be gone.
+  for (Block& block : afterRelease) block();
+}
+
+void SerialQueue::Core::runBriefBlocks() noexcept {
+  // A block may append others, and so move the list.
+  for (std::size_t i = 0; i < briefBlocks_.size(); ++i) {
+    Block block = std::move(briefBlocks_[i]);
+    block();
+  }
+  briefBlocks_.clear();
+}
+
+// Gives the queue to whoever is next. The exception is a block that the calling thread may run:
+// that is returned, and the caller stays the owner.
+std::optional<Block> SerialQueue::Core::passOn(std::size_t mayRun) noexcept {
+  std::unique_lock lock(mutex_);
+  if (line_.empty()) {
+    if (!(word_.load(std::memory_order_relaxed) & closed)) {
+      word_.store(0, std::memory_order_release);
+    } else if (hasWorker_) {
+      work_.signal();
+    } else {
+      lock.unlock();
+      delete this;
+    }
+    return std::nullopt;
+  }
+  if (line_.front().waiter) {
+    const std::shared_ptr<Waiter> waiter = popFront().waiter;
+    waiter->ownsQueue = blocksInLine_ > 0;
+    word_.store(bitsOfLine() | (waiter->ownsQueue ? held : 0), std::memory_order_release);
+    lock.unlock();
+    waiter->wake.signal();
+    return std::nullopt;
+  }
+  const bool isForWorker = line_.front().runner == Runner::worker || mayRun == 0;
+  if (isForWorker && startWorker()) {
+    // Not after the mutex: the worker may be the last one to use the queue.
+    work_.signal();
+    return std::nullopt;
+  }
+  std::optional<Block> block = popFront().block;
+  word_.store(bitsOfLine() | held, std::memory_order_relaxed);
+  return block;
+}
+
+SerialQueue::Core::Entry SerialQueue::Core::popFront() {
+  Entry entry = std::move(line_.front());
+  line_.pop_front();
+  if (!entry.waiter) --blocksInLine_;
+  return entry;
+}
+
+SerialQueue::Core::Bits SerialQueue::Core::bitsOfLine() const {
+  return (word_.load(std::memory_order_relaxed) & closed) | (blocksInLine_ > 0 ? queued : 0) |
+         (line_.size() > blocksInLine_ ? waiting : 0);
+}
+
+void SerialQueue::Core::pushBlock(Block block, Runner runner) {
+  line_.push_back({.block = std::move(block), .runner = runner, .waiter = nullptr});
+  ++blocksInLine_;
+}
+
+void SerialQueue::Core::enqueue(Block block) {
+  {
+    const std::lock_guard lock(mutex_);
+    if (!startWorker())
+      throw std::system_error(std::make_error_code(std::errc::resource_unavailable_try_again));
+    pushBlock(std::move(block), Runner::worker);
+    if (word_.fetch_or(queued | held, std::memory_order_acquire) & held) return;
+  }
+  passOn(0);
+}
+
+void SerialQueue::Core::submit(Block block) {
+  const bool isInBlock = isCurrent();
+  const bool isQueued = word_.load(std::memory_order_acquire) & queued;
+  if (isInBlock && !isQueued && briefBlocks_.size() < briefBlockLimit) {
+    briefBlocks_.push_back(std::move(block));
+    return;
+  }
+  if (isInBlock || !tryTake()) {
+    const std::lock_guard lock(mutex_);
+    if (!takeOrMark(queued)) {
+      pushBlock(std::move(block), Runner::anyThread);
+      return;
+    }
+  }
+  holder_.store(currentThreadID(), std::memory_order_relaxed);
+  [&]() noexcept { block(); }();
+  block = Block();
+  release();
+}
+
+void SerialQueue::Core::afterRelease(Block block) {
+  if (!isCurrent()) stop("Only a block of the queue may act after it", label_);
+  afterRelease_.push_back(std::move(block));
+}
+
+void SerialQueue::Core::close() {
+  {
+    const std::lock_guard lock(mutex_);
+    if (word_.fetch_or(closed | held, std::memory_order_acquire) & held) return;
+  }
+  passOn(0);
+}
+
+// Under the mutex.
+bool SerialQueue::Core::startWorker() noexcept try {
+  if (!hasWorker_) std::thread([this] { work(); }).detach();
+  return hasWorker_ = true;
+} catch (const std::system_error&) {
+  return false;
+}
+
+void SerialQueue::Core::work() {
+  Varnel::Platform::nameCurrentThread(label_);
+  Varnel::Platform::setCurrentThreadQuality(quality_);
+  for (;;) {
+    work_.wait();
+    Block block;
+    {
+      const std::lock_guard lock(mutex_);
+      if (line_.empty()) break;
+      block = popFront().block;
+      word_.store(bitsOfLine() | held, std::memory_order_relaxed);
+    }
+    holder_.store(currentThreadID(), std::memory_order_relaxed);
+    [&]() noexcept { block(); }();
+    block = Block();
+    release();
+  }
+  delete this;
+}
+
+SerialQueue::SerialQueue(std::string label, QualityOfService quality)
+    : core_(new Core(std::move(label), quality)) {}
+
+SerialQueue::~SerialQueue() {
+  core_->close();
+}
+
+const std::string& SerialQueue::label() const {
+  return core_->label();
+}
+
+void SerialQueue::async(Block block) {
+  core_->enqueue(std::move(block));
+}
+
+void SerialQueue::submit(Block block) {
+  core_->submit(std::move(block));
+}
+
+void SerialQueue::afterRelease(Block block) {
+  core_->afterRelease(std::move(block));
+}
+
+bool SerialQueue::isCurrent() const {
+  return core_->isCurrent();
+}
+
+SerialQueue::Hold::Hold(Core& core) : core_(core) {
+  core_.acquire();
+}
+
+SerialQueue::Hold::~Hold() {
+  core_.release();
+}
+
+std::shared_ptr<SerialQueue> QNBuildInternalDispatchQueue(std::string label) {
+  return std::make_shared<SerialQueue>(std::move(label));
+}
+
+void QNAssertOnQueue(const SerialQueue& queue) {
+  if (!queue.isCurrent()) stop("Code ran off the queue that it belongs to", queue.label());
+}
+
+}  // namespace Basalt

@@ -1,0 +1,77 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <atomic>
+#include <map>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include <Platform/Ports/DiskArbitration.h>
+
+namespace Varnel::Platform::Testing {
+
+/// Disks mounted where the test says. Any thread.
+///
+///     FakeDiskArbitration disks;
+///     disks.setMountURLs("sda1", {URL::fileURLWithPath("/home/")});
+class FakeDiskArbitration final : public DiskArbitration {
+ public:
+  /// Where the device is mounted from now on. Sessions that are open keep the view they began with.
+  void setMountURLs(const std::string& deviceName, std::vector<URL> urls) {
+    const std::lock_guard lock(mutex_);
+    mounts_.insert_or_assign(deviceName, std::move(urls));
+  }
+
+  /// A service out of reach opens no session.
+  void setReachable(bool reachable) {
+    const std::lock_guard lock(mutex_);
+    reachable_ = reachable;
+  }
+
+  /// How many sessions exist right now, and how many were ever opened.
+  [[nodiscard]] int liveSessions() const { return counts_->live; }
+  [[nodiscard]] int openedSessions() const { return counts_->opened; }
+
+  std::unique_ptr<Session> openSession() override {
+    const std::lock_guard lock(mutex_);
+    if (!reachable_) return nullptr;
+    return std::make_unique<FakeSession>(mounts_, counts_);
+  }
+
+ private:
+  using Mounts = std::map<std::string, std::vector<URL>>;
+
+  struct Counts {
+    std::atomic<int> live = 0;
+    std::atomic<int> opened = 0;
+  };
+
+  class FakeSession final : public Session {
+   public:
+    FakeSession(Mounts mounts, std::shared_ptr<Counts> counts)
+        : mounts_(std::move(mounts)), counts_(std::move(counts)) {
+      ++counts_->live;
+      ++counts_->opened;
+    }
+    ~FakeSession() override { --counts_->live; }
+
+    std::vector<URL> mountURLs(const std::string& deviceName) override {
+      const auto found = mounts_.find(deviceName);
+      return found == mounts_.end() ? std::vector<URL>() : found->second;
+    }
+
+   private:
+    const Mounts mounts_;
+    const std::shared_ptr<Counts> counts_;
+  };
+
+  const std::shared_ptr<Counts> counts_ = std::make_shared<Counts>();
+  std::mutex mutex_;  ///< Owns what follows.
+  Mounts mounts_;
+  bool reachable_ = true;
+};
+
+}  // namespace Varnel::Platform::Testing

@@ -1,0 +1,201 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/DiskAccess/DiskAccessManager.h>
+
+#include <atomic>
+#include <unordered_map>
+#include <utility>
+
+#include <Basalt/SecurityScopeBookkeeping.h>
+#include <Basalt/SerialQueue.h>
+#include <Platform/Ports/Ports.h>
+#include <Platform/Ports/VolumeCatalog.h>
+#include <Varnel/DiskAccess/DiskData.h>
+#include <Varnel/DiskAccess/OVDiskInfo.h>
+#include <Varnel/DiskAccess/VolumeChangeRelay.h>
+
+namespace Varnel {
+namespace {
+
+/// What the look-up of a volume's record is asked, and in time finds. Whoever asks does not wait:
+/// it reads the answer if there is one.
+struct RecordLookup {
+  explicit RecordLookup(Platform::URL url) : volumeURL(std::move(url)) {}
+
+  const Platform::URL volumeURL;
+  std::shared_ptr<DiskData> record;  ///< To be read once `isAnswered` is true.
+  std::atomic<bool> isAnswered = false;
+};
+
+DiskAccessManager::Ports portsOfProcess() {
+  const Platform::Ports& ports = Platform::processPorts();
+  Basalt::NotificationCenter& center = Basalt::NotificationCenter::defaultCenter();
+  [[maybe_unused]] static const auto* const relay =
+      new VolumeChangeRelay(ports.volumeCatalog, center);
+  return {.devices = ports.deviceRegistry,
+          .disks = ports.diskArbitration,
+          .volumes = ports.volumeCatalog,
+          .securityScope = ports.securityScope,
+          .notificationCenter = center};
+}
+
+}  // namespace
+
+/// What blocks of the planning queue share with the manager. The queue owns it but for what is
+/// said to be anybody's.
+class DiskAccessManager::State final : public std::enable_shared_from_this<State> {
+ public:
+  explicit State(Ports ports)
+      : ports_(ports),
+        scopes_(std::make_shared<Basalt::SecurityScopeBookkeeping>(ports.securityScope)),
+        planningQueue_(Basalt::QNBuildInternalDispatchQueue("disk-access-manager.planning-queue")),
+        unknownDiskData_(std::make_shared<DiskData>(
+            std::make_shared<OVDiskInfo>("unknown", OVDiskInfo::VolumeURLs(), OVDiskKindUnknown),
+            false, planningQueue_)) {}
+
+  // Any thread.
+  [[nodiscard]] Platform::VolumeCatalog& volumes() const { return ports_.volumes; }
+  [[nodiscard]] const auto& scopes() const { return scopes_; }
+  [[nodiscard]] bool isBackgroundMode() const { return isBackgroundMode_; }
+  void setIsBackgroundMode(bool isBackgroundMode);
+  void scheduleUpdate();
+  [[nodiscard]] std::shared_ptr<DiskData> recordOfVolume(const Platform::URL& volumeURL);
+  void detachFromPorts();
+
+ private:
+  void updateDiskDataUnsafe();
+  void applyBackgroundMode(bool isBackgroundMode);
+  [[nodiscard]] std::shared_ptr<DiskData> knownRecord(const Platform::URL& volumeURL) const;
+
+  const Ports ports_;
+  const std::shared_ptr<Basalt::SecurityScopeBookkeeping> scopes_;
+  const std::shared_ptr<Basalt::SerialQueue> planningQueue_;
+  const std::shared_ptr<DiskData> unknownDiskData_;
+  std::atomic<bool> isBackgroundMode_ = false;
+
+  bool isDetached_ = false;
+  std::unordered_map<Platform::URL, std::string> diskUniqueIDsByVolumeURL_;
+  std::unordered_map<std::string, std::shared_ptr<DiskData>> diskDataByUniqueID_;
+};
+
+void DiskAccessManager::State::scheduleUpdate() {
+  planningQueue_->async([self = shared_from_this()] { self->updateDiskDataUnsafe(); });
+}
+
+void DiskAccessManager::State::detachFromPorts() {
+  if (planningQueue_->isCurrent())
+    isDetached_ = true;
+  else
+    planningQueue_->sync([this] { isDetached_ = true; });
+}
+
+void DiskAccessManager::State::updateDiskDataUnsafe() {
+  Basalt::QNAssertOnQueue(*planningQueue_);
+  if (isDetached_) return;
+  diskUniqueIDsByVolumeURL_.clear();
+  std::unordered_map<std::string, std::shared_ptr<DiskData>> records;
+  for (const auto& disk : OVDiskInfo::allDiskInfos(
+           {.devices = ports_.devices, .disks = ports_.disks, .volumes = ports_.volumes})) {
+    if (!disk->uniqueID() || !disk->volumeURLs() || disk->volumeURLs()->empty()) continue;
+    std::shared_ptr<DiskData>& record = records[*disk->uniqueID()];
+    if (const auto known = diskDataByUniqueID_.find(*disk->uniqueID());
+        known != diskDataByUniqueID_.end())
+      record = known->second;
+    else if (!record)
+      record = std::make_shared<DiskData>(disk, isBackgroundMode_, planningQueue_);
+    for (const Platform::URL& volumeURL : *disk->volumeURLs())
+      diskUniqueIDsByVolumeURL_[volumeURL] = *disk->uniqueID();
+  }
+  // A disk that is gone is remembered while threads access it or wait to.
+  for (auto& [uniqueID, record] : diskDataByUniqueID_)
+    if (!record->isIdle()) records.try_emplace(uniqueID, std::move(record));
+  diskDataByUniqueID_ = std::move(records);
+}
+
+void DiskAccessManager::State::setIsBackgroundMode(bool isBackgroundMode) {
+  isBackgroundMode_ = isBackgroundMode;
+  planningQueue_->async([self = shared_from_this(), isBackgroundMode] {
+    self->applyBackgroundMode(isBackgroundMode);
+  });
+}
+
+void DiskAccessManager::State::applyBackgroundMode(bool isBackgroundMode) {
+  for (const auto& [uniqueID, record] : diskDataByUniqueID_) {
+    record->setIsBackgroundMode(isBackgroundMode);
+    if (!isBackgroundMode) record->grantPendingRequests();
+  }
+}
+
+std::shared_ptr<DiskData> DiskAccessManager::State::knownRecord(
+    const Platform::URL& volumeURL) const {
+  const auto uniqueID = diskUniqueIDsByVolumeURL_.find(volumeURL);
+  if (uniqueID == diskUniqueIDsByVolumeURL_.end()) return nullptr;
+  const auto record = diskDataByUniqueID_.find(uniqueID->second);
+  return record == diskDataByUniqueID_.end() ? nullptr : record->second;
+}
+
+std::shared_ptr<DiskData> DiskAccessManager::State::recordOfVolume(const Platform::URL& volumeURL) {
+  const auto lookup = std::make_shared<RecordLookup>(volumeURL);
+  planningQueue_->submit([self = shared_from_this(), lookup] {
+    lookup->record = self->knownRecord(lookup->volumeURL);
+    lookup->isAnswered.store(true, std::memory_order_release);
+  });
+  const bool isKnown = lookup->isAnswered.load(std::memory_order_acquire) && lookup->record;
+  return isKnown ? lookup->record : unknownDiskData_;
+}
+
+DiskAccessManager::DiskAccessManager() : DiskAccessManager(portsOfProcess()) {}
+
+DiskAccessManager::DiskAccessManager(Ports ports) : state_(std::make_shared<State>(ports)) {
+  for (const std::string_view name : {didMountNotification, didUnmountNotification}) {
+    notificationCenterObservers_.push_back(ports.notificationCenter.addObserver(
+        std::string(name), [state = std::weak_ptr<State>(state_)](const Basalt::Notification&) {
+          if (const auto living = state.lock()) living->scheduleUpdate();
+        }));
+  }
+  state_->scheduleUpdate();
+}
+
+DiskAccessManager::~DiskAccessManager() {
+  notificationCenterObservers_.clear();
+  state_->detachFromPorts();
+}
+
+DiskAccessManager& DiskAccessManager::shared() {
+  static DiskAccessManager& manager = *new DiskAccessManager;
+  return manager;
+}
+
+bool DiskAccessManager::isBackgroundMode() const {
+  return state_->isBackgroundMode();
+}
+
+void DiskAccessManager::setIsBackgroundMode(bool isBackgroundMode) {
+  state_->setIsBackgroundMode(isBackgroundMode);
+}
+
+std::unique_ptr<DiskAccessingSession> DiskAccessManager::beginAccessingURL(
+    const Platform::URL& url, std::string propose, Platform::QualityOfService qos,
+    bool enableSecureScopedAccess, std::optional<Platform::TimeInterval> accessWaitingTimeout,
+    const std::optional<Platform::URL>& volumeURL) {
+  std::optional<Platform::URL> volume = volumeURL;
+  if (!volume) {
+    const auto found = state_->volumes().volumeURL(url);
+    if (!found || !*found) return nullptr;
+    volume = *found;
+  }
+  return beginAccessingVolume(*volume, std::move(propose), url, qos, enableSecureScopedAccess,
+                              accessWaitingTimeout);
+}
+
+std::unique_ptr<DiskAccessingSession> DiskAccessManager::beginAccessingVolume(
+    const Platform::URL& volumeURL, std::string propose, const Platform::URL& url,
+    Platform::QualityOfService qos, bool enableSecureScopedAccess,
+    std::optional<Platform::TimeInterval> accessWaitingTimeout) {
+  auto session =
+      std::make_unique<DiskAccessingSession>(url, std::move(propose), enableSecureScopedAccess,
+                                             state_->recordOfVolume(volumeURL), state_->scopes());
+  if (!session->beginAccessing(qos, accessWaitingTimeout)) return nullptr;
+  return session;
+}
+
+}  // namespace Varnel

@@ -1,0 +1,93 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include <Basalt/NotificationCenter.h>
+#include <Platform/Api.h>
+#include <Platform/Values/Date.h>
+#include <Platform/Values/QualityOfService.h>
+#include <Platform/Values/URL.h>
+#include <Varnel/DiskAccess/DiskAccessingSession.h>
+
+namespace Varnel::Platform {
+class DeviceRegistry;
+class DiskArbitration;
+class SecurityScope;
+class VolumeCatalog;
+}  // namespace Varnel::Platform
+
+namespace Varnel {
+
+/// Rations the reading of each physical disk among the threads of the process: a disk admits as
+/// many threads at a time as suits its kind, the others wait and come in by quality of service.
+///
+///     auto session = DiskAccessManager::shared().beginAccessingURL(file, "compare");
+///     if (!session) return;  // no access: do not touch the disk
+///     read(file);
+///     session->endAccessing();
+///
+/// Any thread. Nothing is reported: a failure is a null session. The disks are known soon after
+/// construction and are looked at anew with each mount and unmount; until then, and whenever the
+/// manager is too busy to say which disk a volume lies on, a request counts against one record for
+/// unknown disks, which admits one thread.
+class VARNEL_API DiskAccessManager final {
+ public:
+  using DiskData = Varnel::DiskData;
+  using DiskAccessingSession = Varnel::DiskAccessingSession;
+
+  /// The services that a manager asks, and the center that tells it of mounts and unmounts.
+  struct Ports {
+    Platform::DeviceRegistry& devices;
+    Platform::DiskArbitration& disks;
+    Platform::VolumeCatalog& volumes;
+    Platform::SecurityScope& securityScope;
+    Basalt::NotificationCenter& notificationCenter;
+  };
+
+  DiskAccessManager();
+  explicit DiskAccessManager(Ports ports);
+
+  /// Waits for an inventory that is under way, after which the ports are not used any more but by
+  /// the sessions that are left.
+  ~DiskAccessManager();
+  DiskAccessManager(const DiskAccessManager&) = delete;
+  DiskAccessManager& operator=(const DiskAccessManager&) = delete;
+
+  /// The process's manager, made on first use and never destroyed.
+  [[nodiscard]] static DiskAccessManager& shared();
+
+  /// In background mode every disk admits one thread only. Threads that are in stay in.
+  [[nodiscard]] bool isBackgroundMode() const;
+  void setIsBackgroundMode(bool isBackgroundMode);
+
+  /// Begins access to a file or folder and waits for a place on its disk, at most
+  /// `accessWaitingTimeout` seconds of the wall clock: without a value, or with one that is not a
+  /// number or too large for a date, for ever; a negative one not at all. A thread that has a place
+  /// on the disk gets another at once. `volumeURL` spares the search for the file's volume.
+  ///
+  /// Null when the volume cannot be told, the security scope cannot be opened, or the time is up.
+  /// In the last case a security scope that was opened stays open.
+  [[nodiscard]] std::unique_ptr<DiskAccessingSession> beginAccessingURL(
+      const Platform::URL& url, std::string propose,
+      Platform::QualityOfService qos = Platform::QualityOfService::utility,
+      bool enableSecureScopedAccess = true,
+      std::optional<Platform::TimeInterval> accessWaitingTimeout = {},
+      const std::optional<Platform::URL>& volumeURL = {});
+
+ private:
+  class State;
+
+  [[nodiscard]] std::unique_ptr<DiskAccessingSession> beginAccessingVolume(
+      const Platform::URL& volumeURL, std::string propose, const Platform::URL& url,
+      Platform::QualityOfService qos, bool enableSecureScopedAccess,
+      std::optional<Platform::TimeInterval> accessWaitingTimeout);
+
+  const std::shared_ptr<State> state_;
+  std::vector<Basalt::NotificationCenter::Observer> notificationCenterObservers_;
+};
+
+}  // namespace Varnel

@@ -1,0 +1,55 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/DiskAccess/DiskAccessingSession.h>
+
+#include <utility>
+
+#include <Basalt/SecurityScopeBookkeeping.h>
+#include <Basalt/SerialQueue.h>
+#include <Varnel/DiskAccess/DiskData.h>
+#include <Varnel/DiskAccess/WaitingDeadline.h>
+
+namespace Varnel {
+
+DiskAccessingSession::DiskAccessingSession(Platform::URL url, std::string propose, bool secureScope,
+                                           std::shared_ptr<DiskData> diskData,
+                                           std::shared_ptr<SecurityScopes> scopes)
+    : url_(std::move(url)),
+      propose_(std::move(propose)),
+      secureScope_(secureScope),
+      diskData_(std::move(diskData)),
+      scopes_(std::move(scopes)) {}
+
+const std::shared_ptr<const OVDiskInfo>& DiskAccessingSession::diskInfo() const {
+  return diskData_->diskInfo();
+}
+
+bool DiskAccessingSession::beginAccessing(Platform::QualityOfService qos,
+                                          std::optional<Platform::TimeInterval> waitingTimeout) {
+  if (secureScope_ && !scopes_->beginAccessingSecurityScopedResource(url_, propose_)) return false;
+  isAccessing_ = waitForAdmission(qos, waitingTimeout);
+  return isAccessing_;
+}
+
+bool DiskAccessingSession::waitForAdmission(Platform::QualityOfService qos,
+                                            std::optional<Platform::TimeInterval> waitingTimeout) {
+  const Basalt::ThreadID thread = Basalt::currentThreadID();
+  Basalt::SerialQueue& queue = diskData_->queue();
+  // The granter shares the request: it may still be signalling when this thread goes on.
+  const auto request = queue.sync([&] { return diskData_->requestAccess(thread, qos); });
+  if (!request) return true;
+  const Platform::Date now =
+      std::chrono::floor<Platform::Date::duration>(std::chrono::system_clock::now());
+  const bool isSignalled = request->sema.waitUntil(waitingDeadline(now, waitingTimeout));
+  if (!isSignalled && request->claim()) return false;
+  queue.sync([&] { diskData_->confirmAccess(thread); });
+  return true;
+}
+
+void DiskAccessingSession::endAccessing() {
+  isAccessing_ = false;
+  const Basalt::ThreadID thread = Basalt::currentThreadID();
+  diskData_->queue().sync([&] { diskData_->releaseAccess(thread); });
+  if (secureScope_) scopes_->endAccessingSecurityScopedResource(url_, propose_);
+}
+
+}  // namespace Varnel

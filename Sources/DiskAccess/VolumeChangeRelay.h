@@ -1,0 +1,33 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <string_view>
+
+#include <Platform/Api.h>
+#include <Platform/Ports/VolumeCatalog.h>
+
+namespace Basalt {
+class NotificationCenter;
+}
+
+namespace Varnel {
+
+/// The notifications of mounts and unmounts.
+inline constexpr std::string_view didMountNotification = "NSWorkspaceDidMountNotification";
+inline constexpr std::string_view didUnmountNotification = "NSWorkspaceDidUnmountNotification";
+
+/// The key of the volume's URL, a text, in the user information of either.
+inline constexpr std::string_view volumeURLKey = "NSWorkspaceVolumeURLKey";
+
+/// Posts a notification for each volume that comes or goes, on the catalogue's thread, as long as
+/// the relay lives. Both sides must outlive it.
+class VARNEL_API VolumeChangeRelay final {
+ public:
+  VolumeChangeRelay(Platform::VolumeCatalog& volumes, const Basalt::NotificationCenter& center);
+
+ private:
+  const std::unique_ptr<Platform::VolumeCatalog::Subscription> subscription_;
+};
+
+}  // namespace Varnel
