@@ -16,6 +16,23 @@ const Ports* choose(const Ports* ports) {
 
 }  // namespace
 
+Ports Ports::withStandardOutput(StandardOutput& output) const {
+  return {
+      .appendFiles = appendFiles,
+      .clock = clock,
+      .deviceRegistry = deviceRegistry,
+      .diskArbitration = diskArbitration,
+      .processInfo = processInfo,
+      .securityScope = securityScope,
+      .standardOutput = output,
+      .systemLog = systemLog,
+      .userAccount = userAccount,
+      .userLocale = userLocale,
+      .volumeCatalog = volumeCatalog,
+      .workspace = workspace,
+  };
+}
+
 const Ports& processPorts() {
   if (const Ports* ports = chosenPorts.load()) return *ports;
   return *choose(&systemPorts());

@@ -32,6 +32,9 @@ struct Ports {
   UserLocale& userLocale;
   VolumeCatalog& volumeCatalog;
   Workspace& workspace;
+
+  /// The same services with another standard output.
+  [[nodiscard]] VARNEL_API Ports withStandardOutput(StandardOutput& output) const;
 };
 
 /// The process's own services: those of the system, unless the host installed others before the

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <memory>
 #include <string_view>
 
 #include <Platform/Api.h>
@@ -16,5 +17,11 @@ class VARNEL_API StandardOutput {
   /// that is closed or full loses the text without a word.
   virtual void print(std::string_view text) = 0;
 };
+
+/// Prints on standard error instead, for hosts whose standard output is their result alone:
+///
+///     static const auto errorOutput = makeStandardErrorOutput();
+///     installProcessPorts(systemPorts().withStandardOutput(*errorOutput));
+[[nodiscard]] VARNEL_API std::unique_ptr<StandardOutput> makeStandardErrorOutput();
 
 }  // namespace Varnel::Platform

@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <concepts>
+#include <exception>
+#include <string>
+#include <string_view>
+#include <system_error>
+
+#include <Platform/Api.h>
+#include <Platform/Values/PlatformError.h>
+#include <Varnel/Logging/Error.h>
+
+namespace Varnel {
+
+/// What the log keeps of an error of any kind: the framework's error values, platform errors,
+/// standard exceptions and error codes all convert to it, so that whatever was caught or returned
+/// can be handed to `Logger::logError` as it is.
+///
+///     catch (const std::exception& exception) { logger.logError(exception, "Scanner"); }
+///
+/// An immutable value that refers to nothing.
+class VARNEL_API LoggedError final {
+ public:
+  LoggedError(const Error& error);
+  LoggedError(const Platform::PlatformError& error);
+  /// If the exception is an `Error` as well, that is what counts.
+  LoggedError(const std::exception& exception);
+  LoggedError(std::error_code code);
+
+  /// An error value that is thrown has two bases to choose from.
+  template <typename Thrown>
+  requires std::derived_from<Thrown, Error> && std::derived_from<Thrown, std::exception>
+  LoggedError(const Thrown& error) : LoggedError(static_cast<const Error&>(error)) {}
+
+  /// The name of the error's own type as far as it is known: that of an exception is its nearest
+  /// standard type.
+  [[nodiscard]] const std::string& typeName() const { return typeName_; }
+
+  /// The error's own text for the log, or "NSError: " and the description of its platform error.
+  [[nodiscard]] const std::string& logDescription() const { return logDescription_; }
+
+  /// The error's plain text: its `description()`, or an exception's `what()`.
+  [[nodiscard]] const std::string& description() const { return description_; }
+
+ private:
+  std::string typeName_;
+  std::string logDescription_;
+  std::string description_;
+};
+
+}  // namespace Varnel
