@@ -25,21 +25,8 @@ class ConsoleOutput final : public Varnel::Platform::StandardOutput {
 void sendLogTo(Console& console) {
   // Process ports are used until the process has ended.
   static ConsoleOutput& output = *new ConsoleOutput(console);
-  const Varnel::Platform::Ports& system = Varnel::Platform::systemPorts();
-  [[maybe_unused]] const bool isInTime = Varnel::Platform::installProcessPorts({
-      .appendFiles = system.appendFiles,
-      .clock = system.clock,
-      .deviceRegistry = system.deviceRegistry,
-      .diskArbitration = system.diskArbitration,
-      .processInfo = system.processInfo,
-      .securityScope = system.securityScope,
-      .standardOutput = output,
-      .systemLog = system.systemLog,
-      .userAccount = system.userAccount,
-      .userLocale = system.userLocale,
-      .volumeCatalog = system.volumeCatalog,
-      .workspace = system.workspace,
-  });
+  [[maybe_unused]] const bool isInTime = Varnel::Platform::installProcessPorts(
+      Varnel::Platform::systemPorts().withStandardOutput(output));
   assert(isInTime);
 }
 

@@ -2,25 +2,13 @@
 #include <orvane/ManagedContentAccess.h>
 
 #include <Platform/Ports/VolumeCatalog.h>
+#include <Varnel/DiskAccess/DiskAccessGuard.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
-#include <Varnel/DiskAccess/DiskAccessingSession.h>
 
 namespace Orvane {
 namespace {
 
 using Varnel::Platform::URL;
-
-/// Gives the place back on every way out, exceptions included.
-class Access final {
- public:
-  explicit Access(Varnel::DiskAccessingSession& session) : session_(session) {}
-  ~Access() { session_.endAccessing(); }
-  Access(const Access&) = delete;
-  Access& operator=(const Access&) = delete;
-
- private:
-  Varnel::DiskAccessingSession& session_;
-};
 
 }  // namespace
 
@@ -31,10 +19,9 @@ bool ManagedContentAccess::whileAccessing(const std::string& path, std::uint64_t
                                           const std::function<void()>& read) {
   const URL url = URL::fileURLWithPath(path);
   // No scope to open: the user named the folders, and what cannot be read shows when it is opened.
-  const auto session = ports_.manager.beginAccessingURL(url, "Search for duplicates", qos_, false,
-                                                        std::nullopt, volumeOf(url, device));
-  if (!session) return false;
-  const Access access(*session);
+  const Varnel::DiskAccessGuard access(ports_.manager.beginAccessingURL(
+      url, "Search for duplicates", qos_, false, std::nullopt, volumeOf(url, device)));
+  if (!access) return false;
   read();
   return true;
 }

@@ -39,10 +39,10 @@ std::string summary(const ScanTotals& totals, std::size_t groups, const std::str
   return text + "\n";
 }
 
-nlohmann::json jsonOf(const DuplicateGroup& group) {
-  nlohmann::json json = {{"size", group.size}, {"paths", group.paths}};
+nlohmann::ordered_json jsonOf(const DuplicateGroup& group) {
+  nlohmann::ordered_json json = {{"size", group.size}, {"paths", group.paths}};
   if (!std::all_of(group.paths.begin(), group.paths.end(), isUTF8)) {
-    nlohmann::json& urls = json["urls"] = nlohmann::json::array();
+    nlohmann::ordered_json& urls = json["urls"] = nlohmann::ordered_json::array();
     for (const std::string& path : group.paths)
       urls.push_back(URL::fileURLWithPath(path).absoluteString());
   }
