@@ -16,10 +16,16 @@ class Workspace;
 /// Adapters for Linux, beyond those that it shares with the rest of the POSIX family.
 namespace Varnel::Platform::Linux {
 
+class MountTable;
+
+/// The one view of the mount table that the volume catalogue and disk arbitration share.
+[[nodiscard]] std::shared_ptr<MountTable> makeMountTable();
+
 [[nodiscard]] std::unique_ptr<DeviceRegistry> makeDeviceRegistry();
-[[nodiscard]] std::unique_ptr<DiskArbitration> makeDiskArbitration();
+[[nodiscard]] std::unique_ptr<DiskArbitration> makeDiskArbitration(
+    std::shared_ptr<MountTable> table);
 [[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo();
-[[nodiscard]] std::unique_ptr<VolumeCatalog> makeVolumeCatalog();
+[[nodiscard]] std::unique_ptr<VolumeCatalog> makeVolumeCatalog(std::shared_ptr<MountTable> table);
 [[nodiscard]] std::unique_ptr<Workspace> makeWorkspace();
 
 }  // namespace Varnel::Platform::Linux

@@ -28,18 +28,20 @@ Port& keep(std::unique_ptr<Port> adapter) {
 }  // namespace
 
 const Ports& systemPorts() {
+  // The adapters own it together, and they are kept.
+  static const auto mountTable = Linux::makeMountTable();
   static const Ports& ports = *new Ports{
       .appendFiles = keep(POSIX::makeAppendFiles()),
       .clock = keep(POSIX::makeClock()),
       .deviceRegistry = keep(Linux::makeDeviceRegistry()),
-      .diskArbitration = keep(Linux::makeDiskArbitration()),
+      .diskArbitration = keep(Linux::makeDiskArbitration(mountTable)),
       .processInfo = keep(Linux::makeProcessInfo()),
       .securityScope = keep(POSIX::makeSecurityScope()),
       .standardOutput = keep(POSIX::makeStandardOutput()),
       .systemLog = keep(POSIX::makeSystemLog()),
       .userAccount = keep(POSIX::makeUserAccount()),
       .userLocale = keep(POSIX::makeUserLocale()),
-      .volumeCatalog = keep(Linux::makeVolumeCatalog()),
+      .volumeCatalog = keep(Linux::makeVolumeCatalog(mountTable)),
       .workspace = keep(Linux::makeWorkspace()),
   };
   return ports;

@@ -23,6 +23,10 @@ class FileDescriptor final {
   }
 
   [[nodiscard]] int get() const { return descriptor_; }
+
+  /// Gives the descriptor away, to be closed by somebody else.
+  [[nodiscard]] int release() { return std::exchange(descriptor_, -1); }
+
   explicit operator bool() const { return descriptor_ >= 0; }
 
  private:

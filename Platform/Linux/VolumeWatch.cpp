@@ -1,0 +1,103 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Linux/VolumeWatch.h>
+
+#include <poll.h>
+#include <pthread.h>
+#include <signal.h>
+#include <sys/eventfd.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdint>
+#include <iterator>
+#include <system_error>
+#include <utility>
+
+namespace Varnel::Platform::Linux {
+namespace {
+
+// Keeps the process's signals away from a thread that is started meanwhile.
+class SignalsBlocked final {
+ public:
+  SignalsBlocked() {
+    sigset_t all;
+    ::sigfillset(&all);
+    ::pthread_sigmask(SIG_SETMASK, &all, &before_);
+  }
+  ~SignalsBlocked() { ::pthread_sigmask(SIG_SETMASK, &before_, nullptr); }
+  SignalsBlocked(const SignalsBlocked&) = delete;
+  SignalsBlocked& operator=(const SignalsBlocked&) = delete;
+
+ private:
+  sigset_t before_;
+};
+
+void appendMissing(std::vector<VolumeChange>& changes, VolumeChange::Kind kind,
+                   const VolumeTable& some, const VolumeTable& others) {
+  for (const Volume& volume : some.volumes) {
+    const Volume* same = others.withMountID(volume.mountID);
+    if (!same || !same->isSameMount(volume))
+      changes.push_back({.kind = kind, .volumeURL = volume.url});
+  }
+}
+
+}  // namespace
+
+std::vector<VolumeChange> changesBetween(const VolumeTable& before, const VolumeTable& after) {
+  std::vector<VolumeChange> changes;
+  appendMissing(changes, VolumeChange::Kind::unmounted, before, after);
+  appendMissing(changes, VolumeChange::Kind::mounted, after, before);
+  return changes;
+}
+
+VolumeWatch::VolumeWatch(std::shared_ptr<MountTable> table, VolumeCatalog::ChangeHandler handler)
+    : table_(std::move(table)),
+      handler_(std::move(handler)),
+      mountInfo_(openMountInfo()),
+      stop_(::eventfd(0, EFD_CLOEXEC)) {}
+
+std::unique_ptr<VolumeWatch> VolumeWatch::start(std::shared_ptr<MountTable> table,
+                                                VolumeCatalog::ChangeHandler handler) {
+  std::unique_ptr<VolumeWatch> watch(new VolumeWatch(std::move(table), std::move(handler)));
+  return watch->begin() ? std::move(watch) : nullptr;
+}
+
+bool VolumeWatch::begin() {
+  if (!mountInfo_ || !stop_) return false;
+  // The file above counts changes from its opening on, so none can slip through before this.
+  told_ = table_->current();
+  if (!told_) return false;
+  try {
+    const SignalsBlocked blocked;
+    thread_ = std::thread([this] { run(); });
+  } catch (const std::system_error&) {
+    return false;
+  }
+  return true;
+}
+
+VolumeWatch::~VolumeWatch() {
+  if (!thread_.joinable()) return;
+  const std::uint64_t one = 1;
+  while (::write(stop_.get(), &one, sizeof one) < 0 && errno == EINTR) continue;
+  thread_.join();
+}
+
+void VolumeWatch::run() {
+  ::pthread_setname_np(::pthread_self(), "volume-watch");
+  pollfd waiting[] = {{.fd = mountInfo_.get(), .events = POLLPRI, .revents = 0},
+                      {.fd = stop_.get(), .events = POLLIN, .revents = 0}};
+  for (;;) {
+    if (::poll(waiting, std::size(waiting), -1) < 0) {
+      if (errno == EINTR) continue;
+      return;
+    }
+    if (waiting[1].revents != 0) return;
+    const auto now = table_->current();
+    if (!now || now == told_) continue;
+    for (const VolumeChange& change : changesBetween(*told_, *now)) handler_(change);
+    told_ = now;
+  }
+}
+
+}  // namespace Varnel::Platform::Linux
