@@ -15,6 +15,10 @@ class VARNEL_API GenericError final : public Error, public CustomLogStringConver
   enum class Case : int { fallback = 0 };
   static const GenericError fallback;
 
+  constexpr ~GenericError() override {}
+  GenericError(const GenericError&) = default;
+  GenericError& operator=(const GenericError&) = default;
+
   [[nodiscard]] Case case_() const { return kind_; }
 
   [[nodiscard]] std::string_view typeName() const override { return "GenericError"; }

@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: MIT
+#include <csignal>
+#include <cstdio>
+#include <cstdlib>
+#include <string>
+#include <string_view>
+#include <thread>
+
+#include <Platform/Ports/Ports.h>
+#include <Platform/Ports/StandardOutput.h>
+#include <Varnel/Logging/Logger.h>
+
+// A process that logs numbered entries and ends in a given way: LoggerProcess ENDING AUTHOR COUNT
+// PAUSE, the pause between entries being in milliseconds.
+
+namespace {
+
+// Made before the logger, and so destroyed after its exit handler has run.
+struct LogsAtTheVeryEnd {
+  ~LogsAtTheVeryEnd() {
+    if (!author.empty()) Varnel::Logger::instance().log("late", author);
+  }
+  std::string author;
+} logsAtTheVeryEnd;
+
+void printOnStandardError() {
+  static const auto errorOutput = Varnel::Platform::makeStandardErrorOutput();
+  if (!installProcessPorts(Varnel::Platform::systemPorts().withStandardOutput(*errorOutput)))
+    std::abort();
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  if (argc != 5) return EXIT_FAILURE;
+  const std::string_view ending = argv[1];
+  const std::string_view author = argv[2];
+  const int count = std::atoi(argv[3]);
+  const std::chrono::milliseconds pause(std::atoi(argv[4]));
+
+  if (ending == "standard-error") printOnStandardError();
+  // What has been printed is seen by the reader whatever happens next.
+  if (ending == "killed") std::setvbuf(stdout, nullptr, _IOLBF, 0);
+  for (int i = 0; i < count; ++i) {
+    Varnel::Logger::instance().log(std::to_string(i), author);
+    if (pause.count() > 0) std::this_thread::sleep_for(pause);
+  }
+  if (ending == "killed") std::raise(SIGKILL);
+  if (ending == "quick-exit") std::quick_exit(EXIT_SUCCESS);
+  if (ending == "late-entry") logsAtTheVeryEnd.author = author;
+  return EXIT_SUCCESS;
+}

@@ -1,0 +1,136 @@
+// SPDX-License-Identifier: MIT
+#include <algorithm>
+#include <cstdio>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <map>
+#include <memory>
+#include <sstream>
+#include <string>
+#include <vector>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <Tests/Support/TemporaryFolder.h>
+
+namespace Varnel {
+namespace {
+
+namespace fs = std::filesystem;
+using testing::EndsWith;
+using testing::HasSubstr;
+
+struct ClosePipe {
+  void operator()(std::FILE* pipe) const { ::pclose(pipe); }
+};
+using Process = std::unique_ptr<std::FILE, ClosePipe>;
+
+// Runs the logging process in a home folder of its own.
+class LoggerProcessTest : public testing::Test {
+ protected:
+  [[nodiscard]] Process start(const std::string& arguments) const {
+    const std::string command =
+        "HOME='" + home.path().string() + "' exec '" + VARNEL_LOGGER_PROCESS "' " + arguments;
+    return Process(::popen(command.c_str(), "r"));
+  }
+
+  // Everything that the process prints until it ends.
+  [[nodiscard]] static std::string outputOf(const Process& process) {
+    std::string output;
+    for (int byte = 0; (byte = std::fgetc(process.get())) != EOF;)
+      output += static_cast<char>(byte);
+    return output;
+  }
+  [[nodiscard]] std::string run(const std::string& arguments) const {
+    return outputOf(start(arguments));
+  }
+
+  // The only log file below the home folder.
+  [[nodiscard]] fs::path logPath() const {
+    for (const auto& entry : fs::recursive_directory_iterator(home.path() / "Library/Logs"))
+      if (entry.path().extension() == ".log") return entry.path();
+    return {};
+  }
+  [[nodiscard]] std::string log() const {
+    std::ifstream file(logPath());
+    return {std::istreambuf_iterator<char>(file), {}};
+  }
+
+  Tests::TemporaryFolder home;
+};
+
+// The entries alone, without what the logger prints for itself at its start.
+std::string entriesIn(const std::string& printed) {
+  std::istringstream lines(printed);
+  std::string entries;
+  for (std::string line; std::getline(lines, line);)
+    if (line.starts_with('[')) entries += line + "\n";
+  return entries;
+}
+
+TEST_F(LoggerProcessTest, LosesNothingWhenTheProcessExits) {
+  const std::string printed = run("exit A 300 0");
+  EXPECT_THAT(printed, HasSubstr("Will store log at " + logPath().string() + "\n"));
+  EXPECT_THAT(log(), EndsWith("A:  299\n"));
+  EXPECT_EQ(log(), entriesIn(printed));
+  EXPECT_EQ(fs::status(logPath()).permissions(), fs::perms::owner_read | fs::perms::owner_write);
+
+  (void)run("quick-exit B 1 0");
+  EXPECT_THAT(log(), EndsWith("B:  0\n"));
+  (void)run("late-entry C 1 0");
+  EXPECT_THAT(log(), EndsWith("C:  late\n"));
+}
+
+TEST_F(LoggerProcessTest, SharesTheFileWithAnotherProcess) {
+  const Process first = start("exit A 20000 0");
+  const Process second = start("exit B 20000 0");
+  EXPECT_FALSE(outputOf(first).empty());
+  EXPECT_FALSE(outputOf(second).empty());
+
+  std::istringstream lines(log());
+  std::map<char, int> next;
+  for (std::string line; std::getline(lines, line);) {
+    const std::string entry = line.substr(line.find(']') + 2);
+    ASSERT_EQ(entry.substr(1), ":  " + std::to_string(next[entry[0]]++)) << line;
+  }
+  EXPECT_EQ(next, (std::map<char, int>{{'A', 20000}, {'B', 20000}}));
+}
+
+TEST_F(LoggerProcessTest, LosesAtMostASecondOr4096BytesWhenKilled) {
+  constexpr std::size_t slowEntries = 60;
+  const Process slow = start("killed S 60 30");
+  const std::string printed = entriesIn(outputOf(slow));
+  // A second's worth at 30 ms each, and half as much again for a machine that is busy.
+  constexpr std::size_t lostInTime = 50;
+  const auto kept = static_cast<std::size_t>(std::ranges::count(log(), '\n'));
+  EXPECT_GE(kept, slowEntries - lostInTime);
+  EXPECT_TRUE(printed.starts_with(log()));
+
+  fs::remove(logPath());
+  const std::string manyPrinted = entriesIn(run("killed F 600 1"));
+  EXPECT_TRUE(manyPrinted.starts_with(log()));
+  EXPECT_LE(manyPrinted.size() - log().size(), 4096u + 4096u);
+}
+
+TEST_F(LoggerProcessTest, GoesOnWhenTheDiskIsFull) {
+  (void)run("exit A 1 0");
+  const fs::path path = logPath();
+  fs::remove(path);
+  fs::create_symlink("/dev/full", path);
+  const std::string printed = run("exit A 3 0");
+  EXPECT_EQ(entriesIn(printed).size(), 3 * entriesIn(run("exit A 1 0")).size());
+  const std::string report = "Did fail to write log to file with error No space left on device\n";
+  EXPECT_THAT(printed, HasSubstr(report + report + report));
+}
+
+TEST_F(LoggerProcessTest, LeavesStandardOutputToAHostThatAsksForIt) {
+  EXPECT_EQ(run("standard-error A 3 0 2>/dev/null"), "");
+  const std::string printed = entriesIn(run("standard-error B 3 0 2>&1 >/dev/null"));
+  EXPECT_THAT(printed, EndsWith("B:  2\n"));
+  EXPECT_THAT(log(), EndsWith(printed));
+}
+
+}  // namespace
+}  // namespace Varnel

@@ -1,0 +1,115 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Logging/Error.h>
+
+#include <filesystem>
+#include <future>
+#include <ios>
+#include <stdexcept>
+
+#include <gtest/gtest.h>
+
+#include <Varnel/Logging/CustomLogStringConvertible.h>
+#include <Varnel/Logging/ErrorBridging.h>
+#include <Varnel/Logging/GenericError.h>
+#include <Varnel/Logging/LoggedError.h>
+#include <Varnel/Logging/UserErrorType.h>
+
+namespace Varnel {
+namespace {
+
+using Platform::PlatformError;
+
+class ScanError : public UserErrorType {
+ public:
+  explicit ScanError(std::optional<UserErrorInfo> info = {}) : info_(std::move(info)) {}
+  std::string_view typeName() const override { return "ScanError"; }
+  std::string domain() const override { return "Host.ScanError"; }
+  long code() const override { return 3; }
+  std::optional<UserErrorInfo> userErrorInfo() const override { return info_; }
+
+ private:
+  std::optional<UserErrorInfo> info_;
+};
+
+class ThrownError final : public Error,
+                          public std::out_of_range,
+                          public LogsItsDescription<ThrownError> {
+ public:
+  ThrownError() : std::out_of_range("what") {}
+  std::string_view typeName() const override { return "ThrownError"; }
+  long code() const override { return 1; }
+  std::string description() const override { return "described"; }
+};
+
+class HostException final : public std::length_error {
+  using std::length_error::length_error;
+};
+
+TEST(LoggedError, DescribesWhateverWasCaught) {
+  struct Row {
+    LoggedError error;
+    std::string typeName;
+    std::string logDescription;
+    std::string description;
+  };
+  const ThrownError thrown;
+  const std::string scanText =
+      "Error Domain=Host.ScanError Code=3 \"The operation couldn’t be completed. "
+      "(Host.ScanError error 3.)\"";
+  const auto asException = [](const std::exception& exception) { return LoggedError(exception); };
+  const Row rows[] = {
+      {GenericError::fallback, "GenericError",
+       "Did fail to catch specifi error. Falling back to generic error.", "fallback"},
+      {ScanError(), "ScanError", "NSError: " + scanText, scanText},
+      {thrown, "ThrownError", "described", "described"},
+      {asException(thrown), "ThrownError", "described", "described"},
+      {HostException("long"), "length_error",
+       "NSError: Error Domain=std.length_error Code=0 \"long\"", "long"},
+      {std::exception(), "exception",
+       "NSError: Error Domain=std.exception Code=0 \"std::exception\"", "std::exception"},
+      {std::make_error_code(std::errc::no_space_on_device), "error_code",
+       "NSError: Error Domain=generic Code=28 \"No space left on device\"",
+       "Error Domain=generic Code=28 \"No space left on device\""},
+  };
+  for (const Row& row : rows) {
+    EXPECT_EQ(row.error.typeName(), row.typeName);
+    EXPECT_EQ(row.error.logDescription(), row.logDescription) << row.typeName;
+    EXPECT_EQ(row.error.description(), row.description) << row.typeName;
+  }
+}
+
+TEST(ErrorBridging, KeepsTheCodeOfAnExceptionThatHasOne) {
+  const auto denied = std::make_error_code(std::errc::permission_denied);
+  const PlatformError file = platformError(std::filesystem::filesystem_error("open", "/a", denied));
+  EXPECT_EQ(file.domain(), "generic");
+  EXPECT_EQ(file.code(), 13);
+  EXPECT_NE(file.localizedDescription().find("/a"), std::string::npos);
+  EXPECT_EQ(platformError(std::ios_base::failure("x", std::io_errc::stream)).domain(), "iostream");
+  EXPECT_EQ(platformError(std::future_error(std::future_errc::no_state)).code(),
+            static_cast<long>(std::future_errc::no_state));
+  EXPECT_EQ(LoggedError(std::filesystem::filesystem_error("open", denied)).typeName(),
+            "filesystem_error");
+}
+
+TEST(GenericError, BridgesToItsDomain) {
+  EXPECT_EQ(GenericError::fallback.platformError().domain(), "Varnel.GenericError");
+  EXPECT_EQ(GenericError::fallback.platformError().code(), 0);
+}
+
+TEST(UserErrorType, HasAnErrorForTheUserOnlyWithTexts) {
+  EXPECT_EQ(ScanError().userError(), std::nullopt);
+
+  const UserErrorInfo info("It is gone.", "Choose another.", {"OK", "Retry"},
+                           {{"NSLocalizedDescription", std::string("loses")}, {"extra", 7}});
+  const PlatformError error = ScanError(info).userError().value();
+  EXPECT_EQ(error.description(), "Error Domain=Host.ScanError Code=3 \"It is gone.\"");
+  EXPECT_EQ(std::any_cast<std::string>(error.userInfo().at("NSLocalizedRecoverySuggestion")),
+            "Choose another.");
+  EXPECT_EQ(
+      std::any_cast<std::vector<std::string>>(error.userInfo().at("NSLocalizedRecoveryOptions")),
+      (std::vector<std::string>{"OK", "Retry"}));
+  EXPECT_EQ(std::any_cast<int>(error.userInfo().at("extra")), 7);
+}
+
+}  // namespace
+}  // namespace Varnel
