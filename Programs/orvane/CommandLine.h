@@ -1,0 +1,32 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <functional>
+#include <string>
+#include <variant>
+
+namespace Orvane {
+
+class Console;
+
+/// What the arguments ask for.
+struct Invocation {
+  std::function<int(Console&)> command;  ///< Runs it and returns the exit status.
+  bool logsToStandardOutput = false;
+};
+
+/// The answer to --help or --version.
+struct Information {
+  std::string text;
+};
+
+/// What is wrong with the arguments, in one line.
+struct UsageError {
+  std::string message;
+};
+
+/// Reads the program's arguments; does nothing of what they ask for.
+[[nodiscard]] std::variant<Invocation, Information, UsageError> parseCommandLine(
+    int count, const char* const* arguments);
+
+}  // namespace Orvane

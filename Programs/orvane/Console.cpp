@@ -1,0 +1,39 @@
+// SPDX-License-Identifier: MIT
+#include <orvane/Console.h>
+
+#include <utility>
+
+#include <orvane/StandardStreams.h>
+#include <orvane/VisibleText.h>
+
+namespace Orvane {
+namespace {
+
+constexpr std::string_view eraseLine = "\r\x1b[K";
+
+}  // namespace
+
+void Console::print(std::string_view text) {
+  const std::lock_guard lock(mutex_);
+  if (status_.empty()) return writeStandardError(text);
+  writeStandardError(std::string(eraseLine).append(text).append(status_));
+}
+
+void Console::complain(std::string_view message) {
+  print("orvane: " + visibleText(message) + "\n");
+}
+
+bool Console::writeResult(std::string_view text) {
+  const std::error_code error = writeStandardOutput(text);
+  if (error) complain("cannot write the result: " + error.message());
+  return !error;
+}
+
+void Console::showStatus(std::string status) {
+  const std::lock_guard lock(mutex_);
+  if (status == status_) return;
+  status_ = std::move(status);
+  writeStandardError(std::string(eraseLine) + status_);
+}
+
+}  // namespace Orvane

@@ -1,0 +1,41 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <mutex>
+#include <string>
+#include <string_view>
+
+namespace Orvane {
+
+/// What the user sees: the result on standard output; complaints, log entries and a line of
+/// progress on standard error. Any thread: one lock keeps the texts apart.
+///
+///     Console console;
+///     console.showStatus("12 files");   // stays the last line until it is cleared
+///     console.print("An entry.\n");     // appears above it
+///     if (!console.writeResult(text)) return 1;
+class Console final {
+ public:
+  Console() = default;
+  Console(const Console&) = delete;
+  Console& operator=(const Console&) = delete;
+
+  /// Writes text that ends a line to standard error.
+  void print(std::string_view text);
+
+  /// Prints "orvane: " and the message on one line.
+  void complain(std::string_view message);
+
+  /// Writes the result to standard output; complains and returns false when that fails.
+  [[nodiscard]] bool writeResult(std::string_view text);
+
+  /// Replaces the status line. Only for terminals.
+  void showStatus(std::string status);
+  void clearStatus() { showStatus({}); }
+
+ private:
+  std::mutex mutex_;
+  std::string status_;
+};
+
+}  // namespace Orvane

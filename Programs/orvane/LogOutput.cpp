@@ -1,0 +1,33 @@
+// SPDX-License-Identifier: MIT
+#include <orvane/LogOutput.h>
+
+#include <cassert>
+
+#include <Platform/Ports/Ports.h>
+#include <Platform/Ports/StandardOutput.h>
+#include <orvane/Console.h>
+
+namespace Orvane {
+namespace {
+
+class ConsoleOutput final : public Varnel::Platform::StandardOutput {
+ public:
+  explicit ConsoleOutput(Console& console) : console_(console) {}
+
+  void print(std::string_view text) override { console_.print(text); }
+
+ private:
+  Console& console_;
+};
+
+}  // namespace
+
+void sendLogTo(Console& console) {
+  // Process ports are used until the process has ended.
+  static ConsoleOutput& output = *new ConsoleOutput(console);
+  [[maybe_unused]] const bool isInTime = Varnel::Platform::installProcessPorts(
+      Varnel::Platform::systemPorts().withStandardOutput(output));
+  assert(isInTime);
+}
+
+}  // namespace Orvane

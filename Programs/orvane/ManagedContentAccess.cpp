@@ -1,0 +1,41 @@
+// SPDX-License-Identifier: MIT
+#include <orvane/ManagedContentAccess.h>
+
+#include <Platform/Ports/VolumeCatalog.h>
+#include <Varnel/DiskAccess/DiskAccessGuard.h>
+#include <Varnel/DiskAccess/DiskAccessManager.h>
+
+namespace Orvane {
+namespace {
+
+using Varnel::Platform::URL;
+
+}  // namespace
+
+ManagedContentAccess::ManagedContentAccess(Ports ports, Varnel::Platform::QualityOfService qos)
+    : ports_(ports), qos_(qos) {}
+
+bool ManagedContentAccess::whileAccessing(const std::string& path, std::uint64_t device,
+                                          const std::function<void()>& read) {
+  const URL url = URL::fileURLWithPath(path);
+  // No scope to open: the user named the folders, and what cannot be read shows when it is opened.
+  const Varnel::DiskAccessGuard access(ports_.manager.beginAccessingURL(
+      url, "Search for duplicates", qos_, false, std::nullopt, volumeOf(url, device)));
+  if (!access) return false;
+  read();
+  return true;
+}
+
+std::optional<URL> ManagedContentAccess::volumeOf(const URL& url, std::uint64_t device) {
+  // A device's volumes all lie on one disk, so the first that is met stands for them; asking once
+  // saves a look-up for every file.
+  const std::lock_guard lock(mutex_);
+  const auto known = volumesByDevice_.find(device);
+  if (known != volumesByDevice_.end()) return known->second;
+  const auto volume = ports_.volumes.volumeURL(url);
+  if (!volume || !*volume) return std::nullopt;
+  volumesByDevice_.emplace(device, **volume);
+  return **volume;
+}
+
+}  // namespace Orvane

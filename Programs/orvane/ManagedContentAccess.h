@@ -1,0 +1,47 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <map>
+#include <mutex>
+#include <optional>
+#include <string>
+
+#include <Platform/Values/QualityOfService.h>
+#include <Platform/Values/URL.h>
+#include <orvane/Scan/ContentAccess.h>
+
+namespace Varnel {
+class DiskAccessManager;
+}
+namespace Varnel::Platform {
+class VolumeCatalog;
+}
+
+namespace Orvane {
+
+/// Reads under the rationing of the process's disk access manager: a session for each read.
+class ManagedContentAccess final : public ContentAccess {
+ public:
+  struct Ports {
+    Varnel::DiskAccessManager& manager;
+    Varnel::Platform::VolumeCatalog& volumes;
+  };
+
+  ManagedContentAccess(Ports ports, Varnel::Platform::QualityOfService qos);
+
+  bool whileAccessing(const std::string& path, std::uint64_t device,
+                      const std::function<void()>& read) override;
+
+ private:
+  std::optional<Varnel::Platform::URL> volumeOf(const Varnel::Platform::URL& url,
+                                                std::uint64_t device);
+
+  Ports ports_;
+  Varnel::Platform::QualityOfService qos_;
+  std::mutex mutex_;  ///< Guards the volumes that are known already.
+  std::map<std::uint64_t, Varnel::Platform::URL> volumesByDevice_;
+};
+
+}  // namespace Orvane

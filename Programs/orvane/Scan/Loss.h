@@ -1,0 +1,29 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <system_error>
+
+namespace Orvane {
+
+/// Why a file or folder had no part in the result.
+struct Loss {
+  enum class Kind {
+    unreadable,  ///< The system refused or failed to read it.
+    vanished,    ///< It was gone when its turn came.
+    changed,     ///< It is not, or no longer, what the walk saw.
+  };
+
+  Kind kind;
+  std::error_code error;  ///< The system's reason; none when the file changed.
+
+  /// The loss that an error of the file system stands for.
+  [[nodiscard]] static Loss because(std::error_code error) {
+    if (error == std::errc::no_such_file_or_directory) return {Kind::vanished, error};
+    // A symbolic link or another thing took the place of what the walk saw.
+    if (error == std::errc::too_many_symbolic_link_levels || error == std::errc::not_a_directory)
+      return {Kind::changed, {}};
+    return {Kind::unreadable, error};
+  }
+};
+
+}  // namespace Orvane

@@ -1,0 +1,119 @@
+// SPDX-License-Identifier: MIT
+#include <orvane/ScanCommand.h>
+
+#include <algorithm>
+#include <filesystem>
+#include <optional>
+#include <thread>
+
+#include <Platform/Ports/Ports.h>
+#include <Platform/Ports/UserLocale.h>
+#include <Platform/Text/ByteCountFormatter.h>
+#include <Varnel/Context/Globals.h>
+#include <Varnel/DiskAccess/DiskAccessManager.h>
+#include <Varnel/Logging/Logger.h>
+#include <Varnel/Logging/LoggingObject.h>
+#include <orvane/Console.h>
+#include <orvane/Interruption.h>
+#include <orvane/ManagedContentAccess.h>
+#include <orvane/ProgressLine.h>
+#include <orvane/ResultText.h>
+#include <orvane/Scan/DuplicateFinder.h>
+#include <orvane/Scan/FileSystem.h>
+#include <orvane/Scan/ScanObserver.h>
+#include <orvane/StandardStreams.h>
+
+namespace Orvane {
+namespace {
+
+namespace fs = std::filesystem;
+using Varnel::Globals;
+using Varnel::LoggingContextTag;
+using Varnel::Platform::URL;
+
+/// Names in the log what the scan leaves out.
+class ScanLog final : public ScanObserver, public Varnel::LoggingObject {
+ public:
+  [[nodiscard]] std::string_view logAuthor() const override { return "ScanCommand"; }
+
+  void fileLeftOut(const std::string& path, const Loss& loss) override { leftOut(path, loss); }
+  void folderLeftOut(const std::string& path, const Loss& loss) override {
+    leftOut(path + "/", loss);
+  }
+
+ private:
+  void leftOut(const std::string& path, const Loss& loss) const {
+    log(message(loss), URL::fileURLWithPath(path));
+  }
+
+  static std::string message(const Loss& loss) {
+    switch (loss.kind) {
+      case Loss::Kind::vanished:
+        return "Left out: it vanished";
+      case Loss::Kind::changed:
+        return "Left out: it changed meanwhile";
+      case Loss::Kind::unreadable:
+        break;
+    }
+    return "Left out: it cannot be read: " + loss.error.message();
+  }
+};
+
+/// The folders as the engine wants them, or none after a complaint about one that is not there.
+std::optional<std::vector<std::string>> resolved(const std::vector<std::string>& folders,
+                                                 Console& console) {
+  std::vector<std::string> paths;
+  for (const std::string& folder : folders) {
+    std::error_code error;
+    const fs::path path = fs::canonical(folder, error);
+    if (!error && !fs::is_directory(path, error) && !error)
+      error = std::make_error_code(std::errc::not_a_directory);
+    if (error) {
+      console.complain("cannot scan \"" + folder + "\": " + error.message());
+      return std::nullopt;
+    }
+    paths.push_back(path.string());
+  }
+  return paths;
+}
+
+unsigned readerThreads() {
+  const unsigned cores = std::thread::hardware_concurrency();
+  return std::max(2u, Globals::canUseAllCores() ? cores : cores / 2);
+}
+
+}  // namespace
+
+int ScanCommand::run(Console& console) const {
+  const auto paths = resolved(folders, console);
+  if (!paths) return 1;
+
+  ScanLog log;
+  for (const std::string& path : *paths) log.log("Will scan", URL::fileURLWithPath(path + "/"));
+
+  const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
+  ManagedContentAccess access(
+      {.manager = Varnel::DiskAccessManager::shared(), .volumes = ports.volumeCatalog}, qos);
+  DuplicateFinder finder({.fileSystem = systemFileSystem(), .access = access, .observer = log},
+                         readerThreads());
+  ScanControl control;
+  ScanResult result;
+  {
+    const Interruption interruption(control.isCancelled);
+    std::optional<ProgressLine> progress;
+    if (showsProgress && isStandardErrorATerminal()) progress.emplace(console, control);
+    result = finder.find(*paths, control);
+    progress.reset();
+    if (interruption.signal() != 0) {
+      log.log("Did cancel");
+      console.complain("interrupted");
+      return 128 + interruption.signal();
+    }
+  }
+  log.log("Did find " + std::to_string(result.groups.size()) + " groups of duplicates among " +
+          std::to_string(result.totals.files) + " files");
+  const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.identifier());
+  return console.writeResult(isJSON ? jsonOf(result) : textOf(result, byteCounts)) ? 0 : 1;
+}
+
+}  // namespace Orvane

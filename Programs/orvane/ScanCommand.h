@@ -1,0 +1,24 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include <Platform/Values/QualityOfService.h>
+
+namespace Orvane {
+
+class Console;
+
+/// `orvane scan`: finds the duplicate files in folders.
+struct ScanCommand {
+  std::vector<std::string> folders;
+  Varnel::Platform::QualityOfService qos = Varnel::Platform::QualityOfService::utility;
+  bool isJSON = false;
+  bool showsProgress = false;
+
+  /// Runs the command and returns the program's exit status.
+  [[nodiscard]] int run(Console& console) const;
+};
+
+}  // namespace Orvane

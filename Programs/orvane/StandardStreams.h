@@ -1,0 +1,24 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string_view>
+#include <system_error>
+
+namespace Orvane {
+
+/// Keeps files that are opened later from taking the place of a standard stream that the program
+/// was started without; such a stream fails when it is used. To be called first of all.
+void reserveStandardStreams();
+
+/// Makes a write to a closed pipe fail with an error rather than end the program without a word.
+void failOnClosedPipes();
+
+/// Writes all of the text to the standard output, or says what went wrong.
+[[nodiscard]] std::error_code writeStandardOutput(std::string_view text);
+
+/// Writes the text to standard error; a failure has nobody to be told to.
+void writeStandardError(std::string_view text);
+
+[[nodiscard]] bool isStandardErrorATerminal();
+
+}  // namespace Orvane

@@ -1,0 +1,239 @@
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include <chrono>
+#include <filesystem>
+#include <map>
+#include <random>
+#include <set>
+#include <sstream>
+
+#include <Tests/Programs/ScanFakes.h>
+#include <Tests/Programs/ScanFolder.h>
+#include <orvane/Scan/DuplicateFinder.h>
+
+namespace Orvane::Testing {
+namespace {
+
+namespace fs = std::filesystem;
+using ::testing::ElementsAre;
+using ::testing::IsEmpty;
+using ::testing::Pair;
+using Groups = std::vector<std::vector<std::string>>;
+
+class Scan : public ::testing::Test {
+ protected:
+  ScanResult scan(const std::vector<std::string>& folders) {
+    return DuplicateFinder({fileSystem, access, losses}, 4).find(folders, control);
+  }
+  ScanResult scan() { return scan({folder.path()}); }
+
+  static Groups paths(const ScanResult& result) {
+    Groups groups;
+    for (const DuplicateGroup& group : result.groups) groups.push_back(group.paths);
+    return groups;
+  }
+
+  void TearDown() override {
+    EXPECT_EQ(access.faults, 0) << "accesses were nested";
+    EXPECT_EQ(fileSystem.faults, 0) << "content was read outside an access";
+  }
+
+  ScanFolder folder;
+  FaultyFileSystem fileSystem;
+  OpenAccess access;
+  LossRecorder losses;
+  ScanControl control;
+};
+
+std::string bytes(std::size_t count, char last) {
+  std::string text(count, 'x');
+  text.back() = last;
+  return text;
+}
+
+TEST_F(Scan, TellsContentsApartToTheLastByte) {
+  Groups expected;
+  for (const std::size_t size : {1u, 4095u, 4096u, 4097u, 524'288u, 524'289u, 1'500'000u}) {
+    const std::string name = std::to_string(size);
+    expected.push_back({folder.write(name + "/1", bytes(size, 'a')),
+                        folder.write(name + "/2", bytes(size, 'a')),
+                        folder.write(name + "/3", bytes(size, 'a'))});
+    expected.push_back(
+        {folder.write(name + "/4", bytes(size, 'b')), folder.write(name + "/5", bytes(size, 'b'))});
+    folder.write(name + "/6", bytes(size, 'c'));
+  }
+  // Two of a size that differ behind a common beginning are compared without a digest.
+  folder.write("pair/1", bytes(70'000, 'a'));
+  folder.write("pair/2", bytes(70'000, 'b'));
+  EXPECT_THAT(paths(scan()), ::testing::UnorderedElementsAreArray(expected));
+}
+
+TEST_F(Scan, CountsEveryKindOfFileOnce) {
+  const std::string original = folder.write("b/original", "content");
+  const std::string copy = folder.write("b/deep/er/copy", "content");
+  fs::create_hard_link(original, folder.path("a-link"));
+  fs::create_symlink(original, folder.path("symlink"));
+  fs::create_directory_symlink(folder.path("b"), folder.path("symlinked"));
+  folder.write("empty1", "");
+  folder.write("empty2", "");
+  fs::create_hard_link(folder.write("alone", "other"), folder.path("alone-again"));
+
+  const ScanResult result = scan();
+  EXPECT_THAT(paths(result), ElementsAre(ElementsAre(folder.path("a-link"), copy)));
+  ScanTotals expected;
+  expected.folders = 4;
+  expected.files = 7;
+  expected.bytes = 19;
+  expected.emptyFiles = 2;
+  expected.hardLinks = 2;
+  expected.duplicateFiles = 1;
+  expected.wastedBytes = 7;
+  EXPECT_EQ(result.totals, expected);
+}
+
+TEST_F(Scan, WalksOverlappingFoldersOnce) {
+  folder.write("one/a", "same");
+  folder.write("one/two/b", "same");
+  const ScanResult once = scan();
+  const ScanResult twice =
+      scan({folder.path("one/two"), folder.path(), folder.path("one"), folder.path()});
+  EXPECT_EQ(twice.groups, once.groups);
+  EXPECT_EQ(twice.totals, once.totals);
+}
+
+TEST_F(Scan, TakesNamesAsBytes) {
+  std::vector<std::string> names = {"new\nline", "tab\t", "\xff\xfe", "\xc3\xa4", "sp ace", "-x"};
+  std::vector<std::string> expected;
+  for (const std::string& name : names) expected.push_back(folder.write(name, "same"));
+  std::sort(expected.begin(), expected.end());
+  EXPECT_THAT(paths(scan()), ElementsAre(expected));
+}
+
+TEST_F(Scan, LeavesOutWhatCannotBeRead) {
+  const std::string first = folder.write("1", "same");
+  const std::string second = folder.write("2", "same");
+  const std::string closed = folder.write("closed", "same");
+  const std::string broken = folder.write("broken", "same");
+  folder.write("locked/file", "same");
+  fileSystem.openFaults[closed] = std::errc::permission_denied;
+  fileSystem.readFaults[broken] = std::errc::io_error;
+  fileSystem.listFaults[folder.path("locked")] = std::errc::permission_denied;
+
+  const ScanResult result = scan();
+  EXPECT_THAT(paths(result), ElementsAre(ElementsAre(first, second)));
+  EXPECT_EQ(result.totals.unreadableFiles, 2u);
+  EXPECT_EQ(result.totals.unreadableFolders, 1u);
+  EXPECT_THAT(losses.files, ElementsAre(Pair(broken, Loss::Kind::unreadable),
+                                        Pair(closed, Loss::Kind::unreadable)));
+  EXPECT_THAT(losses.folders, ElementsAre(Pair(folder.path("locked"), Loss::Kind::unreadable)));
+}
+
+TEST_F(Scan, ReportsARefusedDiskAsUnreadable) {
+  folder.write("1", "same");
+  folder.write("2", "same");
+  access.refuses = true;
+  EXPECT_EQ(scan().totals.unreadableFiles, 2u);
+}
+
+TEST_F(Scan, LeavesOutFilesThatVanishOrChangeMeanwhile) {
+  const std::string first = folder.write("1", bytes(10'000, 'a'));
+  const std::string second = folder.write("2", bytes(10'000, 'a'));
+  const std::string gone = folder.write("gone", bytes(10'000, 'a'));
+  const std::string grows = folder.write("grows", bytes(10'000, 'a'));
+  const std::string shrinks = folder.write("shrinks", bytes(10'000, 'a'));
+  const std::string touched = folder.write("touched", bytes(10'000, 'a'));
+  const std::string replaced = folder.write("replaced", bytes(10'000, 'a'));
+  fileSystem.beforeOpen = [&](const std::string& path) {
+    if (path == gone) fs::remove(path);
+    if (path == replaced) {
+      fs::remove(path);
+      fs::create_symlink(first, path);
+    }
+  };
+  fileSystem.beforeRead = [&](const std::string& path) {
+    if (path == grows) std::ofstream(path, std::ios::app) << "more";
+    if (path == shrinks) fs::resize_file(path, 100);
+    if (path == touched)
+      fs::last_write_time(path, fs::file_time_type::clock::now() + std::chrono::hours(1));
+  };
+  const ScanResult result = scan();
+  EXPECT_THAT(paths(result), ElementsAre(ElementsAre(first, second)));
+  EXPECT_EQ(result.totals.vanishedFiles, 1u);
+  EXPECT_EQ(result.totals.changedFiles, 4u);
+  EXPECT_EQ(losses.files.size(), 5u);
+}
+
+TEST_F(Scan, LosingTheFileThatOthersAreComparedWithLosesNoOther) {
+  const std::string first = folder.write("1", "same");
+  const std::string second = folder.write("2", "same");
+  const std::string third = folder.write("3", "same");
+  std::atomic<int> opened{0};
+  fileSystem.beforeOpen = [&](const std::string& path) {
+    // The first time is for the digest, the next for a comparison.
+    if (path == first && ++opened == 2) fs::remove(path);
+  };
+  const ScanResult result = scan();
+  EXPECT_THAT(paths(result), ElementsAre(ElementsAre(second, third)));
+  EXPECT_THAT(losses.files, ElementsAre(Pair(first, Loss::Kind::vanished)));
+}
+
+TEST_F(Scan, StopsWhenAskedTo) {
+  for (int i = 0; i < 100; ++i) folder.write(std::to_string(i), "same");
+  std::atomic<int> opened{0};
+  fileSystem.beforeOpen = [&](const std::string&) {
+    ++opened;
+    control.isCancelled = true;
+  };
+  (void)scan();
+  EXPECT_LE(opened, 4) << "one a thread";
+}
+
+TEST_F(Scan, PassesOnWhatAWorkerThrows) {
+  folder.write("1", "same");
+  folder.write("2", "same");
+  fileSystem.beforeOpen = [](const std::string&) { throw std::bad_alloc(); };
+  EXPECT_THROW((void)scan(), std::bad_alloc);
+  OpenAccess::isInside() = false;
+}
+
+/// What the scan must find, by reading everything and looking at nothing else.
+std::set<std::set<std::string>> naiveDuplicates(const std::string& root) {
+  std::map<std::string, std::set<std::string>> byContent;
+  for (const auto& entry : fs::recursive_directory_iterator(root)) {
+    if (!entry.is_regular_file() || entry.is_symlink()) continue;
+    std::ostringstream content;
+    content << std::ifstream(entry.path(), std::ios::binary).rdbuf();
+    if (!content.str().empty()) byContent[content.str()].insert(entry.path());
+  }
+  std::set<std::set<std::string>> groups;
+  for (auto& [content, paths] : byContent)
+    if (paths.size() > 1) groups.insert(paths);
+  return groups;
+}
+
+TEST_F(Scan, FindsWhatANaiveSearchFindsWhateverTheTree) {
+  std::mt19937 random(20'240'501);
+  const auto below = [&](unsigned bound) { return static_cast<unsigned>(random() % bound); };
+  for (int round = 0; round < 20; ++round) {
+    const ScanFolder tree;
+    for (unsigned file = below(150); file > 0; --file) {
+      std::string name;
+      for (unsigned depth = below(4); depth > 0; --depth) name += std::to_string(below(3)) + "d/";
+      // Few sizes around the boundaries and few differences make many near misses.
+      constexpr std::size_t sizes[] = {0, 1, 4096, 4097, 9000};
+      std::string content(sizes[below(5)], 'x');
+      if (!content.empty() && below(2) == 0) content[below(2) * (content.size() - 1)] = 'y';
+      tree.write(name + std::to_string(file), content);
+    }
+    std::set<std::set<std::string>> found;
+    const ScanResult result = scan({tree.path()});
+    for (const DuplicateGroup& group : result.groups)
+      found.emplace(group.paths.begin(), group.paths.end());
+    ASSERT_EQ(found, naiveDuplicates(tree.path())) << "round " << round;
+    ASSERT_EQ(scan({tree.path()}).groups, result.groups) << "the order depends on the threads";
+  }
+}
+
+}  // namespace
+}  // namespace Orvane::Testing
