@@ -8,12 +8,12 @@
 #include <algorithm>
 #include <array>
 
-#include <Platform/POSIX/UniqueHandle.h>
+#include <Platform/Generic/UniqueHandle.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
 
-using Listing = POSIX::UniqueHandle<DIR*, ::closedir>;
+using Listing = UniqueHandle<DIR*, ::closedir>;
 using POSIX::FileDescriptor;
 
 bool isBlank(char c) {

@@ -5,15 +5,15 @@
 
 #include <charconv>
 
+#include <Platform/Generic/UniqueHandle.h>
 #include <Platform/Linux/BlockDevices.h>
 #include <Platform/Linux/KernelFolder.h>
-#include <Platform/POSIX/UniqueHandle.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
 
-using Udev = POSIX::UniqueHandle<udev*, udev_unref>;
-using UdevDevice = POSIX::UniqueHandle<udev_device*, udev_device_unref>;
+using Udev = UniqueHandle<udev*, udev_unref>;
+using UdevDevice = UniqueHandle<udev_device*, udev_device_unref>;
 
 }  // namespace
 
