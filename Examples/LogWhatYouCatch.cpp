@@ -34,4 +34,6 @@ class Importer final : public Varnel::LoggingObject {
   }
 };
 
-int main() { Importer().run(); }
+int main() {
+  Importer().run();
+}

@@ -18,7 +18,8 @@ using Varnel::Platform::URL;
 
 void printSize(const std::string& path) {
   const URL url = URL::fileURLWithPath(path);
-  // Waits for a free place on the file's disk; null when the volume is unknown or the file unreadable.
+  // Waits for a free place on the file's disk; null when the volume is unknown or the file
+  // unreadable.
   const auto session = DiskAccessManager::shared().beginAccessingURL(url, "printing its size",
                                                                      QualityOfService::utility);
   if (!session) {

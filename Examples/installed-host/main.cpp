@@ -6,7 +6,8 @@
 #include <Varnel/Context/VarnelModule.h>
 
 int main() {
+  const auto framework = Varnel::VarnelModule::instance();
   std::cout << Varnel::Globals::applicationName() << ' '
-            << Varnel::Globals::applicationVersionString() << '\n'
-            << "the framework's version is " << Varnel::VarnelModule::instance()->version() << '\n';
+            << Varnel::Globals::applicationVersionString() << " on version " << framework->version()
+            << " of the framework\n";
 }
