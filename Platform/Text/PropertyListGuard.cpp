@@ -167,10 +167,11 @@ class BinaryGuard final {
     if (count > bytes_.size()) return false;
     switch (kind) {
       case data:
-      case ascii:
         return budget_.spend(count);
+      case ascii:
+        return visitText(position, count, 1);
       case utf16:
-        return budget_.spend(count * 2);
+        return visitText(position, count, 2);
       case array:
         return visitAll(position, count, depth);
       // Of keys the worst is assumed: that each is compared with all before it.
@@ -179,6 +180,15 @@ class BinaryGuard final {
       default:
         return false;
     }
+  }
+
+  // The parser cuts texts off at a zero character, or aborts over one in a key.
+  [[nodiscard]] bool visitText(std::size_t position, std::uint64_t count, std::size_t unitSize) {
+    if (count > (bytes_.size() - position) / unitSize || !budget_.spend(count * unitSize))
+      return false;
+    for (; count > 0; --count, position += unitSize)
+      if (number(position, unitSize) == 0) return false;
+    return true;
   }
 
   [[nodiscard]] bool visitAll(std::size_t position, std::uint64_t count, std::size_t depth) {
