@@ -20,10 +20,10 @@ class Budget final {
     return true;
   }
 
-  [[nodiscard]] bool spendNode() { return spend(128); }
+  [[nodiscard]] bool spendNode() { return spend(64); }
 
  private:
-  std::uint64_t left_ = std::uint64_t{1} << 28;
+  std::uint64_t left_ = std::uint64_t{1} << 27;
 };
 
 /// Follows the tags of an XML text without looking at what they mean. Its depth is never less than
@@ -108,7 +108,7 @@ class XMLGuard final {
   [[nodiscard]] bool countKey() { return keyCounts_.empty() || budget_.spend(++keyCounts_.back()); }
 
   // Each entity that is replaced moves the rest of its text.
-  [[nodiscard]] std::uint64_t textCost() const { return entityCount_ * textLength_ / 1024; }
+  [[nodiscard]] std::uint64_t textCost() const { return entityCount_ * textLength_ / 256; }
 
   const std::string_view bytes_;
   std::size_t position_ = 0;
