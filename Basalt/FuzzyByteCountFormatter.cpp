@@ -10,10 +10,12 @@ using Varnel::Platform::ByteCountStyle;
 
 namespace {
 
+constexpr std::uint64_t factors[] = {1, 2, 5, 10, 20, 50, 100, 200, 500};
+
 std::uint64_t roundedUp(std::uint64_t bytes, std::uint64_t unitStep) {
   std::uint64_t unit = unitStep;
   while (bytes / unit >= unitStep) unit *= unitStep;
-  for (const std::uint64_t factor : {1, 2, 5, 10, 20, 50, 100, 200, 500})
+  for (const std::uint64_t factor : factors)
     if (bytes <= factor * unit) return factor * unit;
   return unitStep * unit;
 }

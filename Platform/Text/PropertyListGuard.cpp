@@ -20,10 +20,10 @@ class Budget final {
     return true;
   }
 
-  [[nodiscard]] bool spendNode() { return spend(128); }
+  [[nodiscard]] bool spendNode() { return spend(64); }
 
  private:
-  std::uint64_t left_ = std::uint64_t{1} << 28;
+  std::uint64_t left_ = std::uint64_t{1} << 27;
 };
 
 /// Follows the tags of an XML text without looking at what they mean. Its depth is never less than
@@ -108,7 +108,7 @@ class XMLGuard final {
   [[nodiscard]] bool countKey() { return keyCounts_.empty() || budget_.spend(++keyCounts_.back()); }
 
   // Each entity that is replaced moves the rest of its text.
-  [[nodiscard]] std::uint64_t textCost() const { return entityCount_ * textLength_ / 1024; }
+  [[nodiscard]] std::uint64_t textCost() const { return entityCount_ * textLength_ / 256; }
 
   const std::string_view bytes_;
   std::size_t position_ = 0;
@@ -167,10 +167,11 @@ class BinaryGuard final {
     if (count > bytes_.size()) return false;
     switch (kind) {
       case data:
-      case ascii:
         return budget_.spend(count);
+      case ascii:
+        return visitText(position, count, 1);
       case utf16:
-        return budget_.spend(count * 2);
+        return visitText(position, count, 2);
       case array:
         return visitAll(position, count, depth);
       // Of keys the worst is assumed: that each is compared with all before it.
@@ -179,6 +180,15 @@ class BinaryGuard final {
       default:
         return false;
     }
+  }
+
+  // The parser cuts texts off at a zero character, or aborts over one in a key.
+  [[nodiscard]] bool visitText(std::size_t position, std::uint64_t count, std::size_t unitSize) {
+    if (count > (bytes_.size() - position) / unitSize || !budget_.spend(count * unitSize))
+      return false;
+    for (; count > 0; --count, position += unitSize)
+      if (number(position, unitSize) == 0) return false;
+    return true;
   }
 
   [[nodiscard]] bool visitAll(std::size_t position, std::uint64_t count, std::size_t depth) {

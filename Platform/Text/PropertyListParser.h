@@ -16,9 +16,10 @@ namespace Varnel::Platform {
 ///       if (const auto* facts = list->as<PropertyDictionary>()) use(*facts);
 ///
 /// The bytes may come from anywhere: lists that are damaged, cyclic, nested more than 512 deep,
-/// larger than 16 MiB or have some 20,000 keys in one dictionary are refused. Of duplicate keys the
-/// last one counts. A unique identifier is read as its number, a number beyond the signed range as
-/// its 64 bits; dates more than 68 years from 2001 are left out. Any thread.
+/// larger than 16 MiB, have more than some 16,000 keys in one dictionary or zero characters in a
+/// text are refused. Of duplicate keys the last one counts. A unique identifier is read as its
+/// number, a number beyond the signed range as its 64 bits; dates more than 68 years from 2001 are
+/// left out. Any thread.
 [[nodiscard]] VARNEL_API std::optional<PropertyValue> parsePropertyList(std::string_view bytes);
 
 }  // namespace Varnel::Platform
