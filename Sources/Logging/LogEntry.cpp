@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Logging/LogEntry.h>
 
-#include <fmt/format.h>
-
 namespace Varnel::LogEntry {
 namespace {
 
@@ -12,28 +10,26 @@ std::string_view lastPathComponent(std::string_view path) {
 
 }  // namespace
 
-std::string text(std::string_view timestamp, std::string_view author, std::string_view message,
-                 std::span<const std::string> items) {
-  constexpr std::string_view afterAuthor = ":  ";
-  std::size_t size = 4 + timestamp.size() + author.size() + afterAuthor.size() + message.size();
-  for (const std::string& item : items) size += nextLinePrefix.size() + item.size();
-
-  // Appended piece by piece: this runs for every entry, on the caller's time.
-  std::string entry;
-  entry.reserve(size);
-  entry += '[';
-  entry += timestamp;
-  entry += "] ";
-  entry += author;
-  entry += afterAuthor;
-  entry += message;
+Buffer text(std::string_view timestamp, std::string_view author, std::string_view message,
+            std::span<const std::string> items) {
+  // Piece by piece, without parsing a format: this runs for every entry, on the caller's time.
+  Buffer entry;
+  const auto add = [&entry](std::string_view piece) {
+    entry.append(piece.data(), piece.data() + piece.size());
+  };
+  add("[");
+  add(timestamp);
+  add("] ");
+  add(author);
+  add(":  ");
+  add(message);
   std::string_view separator = nextLinePrefix;
   for (const std::string& item : items) {
-    entry += separator;
-    entry += item;
+    add(separator);
+    add(item);
     separator = ", ";
   }
-  entry += '\n';
+  add("\n");
   return entry;
 }
 

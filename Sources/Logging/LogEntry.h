@@ -5,6 +5,8 @@
 #include <string>
 #include <string_view>
 
+#include <fmt/format.h>
+
 #include <Varnel/Logging/LoggedError.h>
 #include <Varnel/Logging/SourcePosition.h>
 
@@ -14,10 +16,13 @@ namespace Varnel::LogEntry {
 /// Starts each further line of an entry.
 inline constexpr std::string_view nextLinePrefix = "\n\t\t\t\t\t";
 
+/// Holds an ordinary entry without allocation.
+using Buffer = fmt::basic_memory_buffer<char, 512>;
+
 /// A whole entry with its final line feed: the first line, and a line of the items if there are
 /// any.
-[[nodiscard]] std::string text(std::string_view timestamp, std::string_view author,
-                               std::string_view message, std::span<const std::string> items);
+[[nodiscard]] Buffer text(std::string_view timestamp, std::string_view author,
+                          std::string_view message, std::span<const std::string> items);
 
 /// The message of an error's entry: what it is, and below it the place in the code.
 [[nodiscard]] std::string errorMessage(const LoggedError& error, const SourcePosition& where);

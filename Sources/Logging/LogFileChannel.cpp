@@ -7,6 +7,8 @@
 
 #include <fmt/format.h>
 
+#include <Platform/Concurrency/CurrentThread.h>
+
 namespace Varnel {
 namespace {
 
@@ -82,6 +84,8 @@ void LogFileChannel::writeThrough() {
 }
 
 void LogFileChannel::runWriter() {
+  Platform::nameCurrentThread("Logging Queue");
+  Platform::setCurrentThreadQuality(Platform::QualityOfService::background);
   flush();
   std::unique_lock lock(gatherMutex_);
   while (!isClosing_) {

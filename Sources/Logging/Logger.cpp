@@ -92,8 +92,9 @@ void Logger::log(std::string_view message, std::string_view author, const Loggin
   std::vector<std::string> items;
   for (const LoggingContextTag& tag : tags)
     if (auto item = tag.text(*this)) items.push_back(*std::move(item));
-  const std::string entry =
+  const LogEntry::Buffer buffer =
       LogEntry::text(entryDates_.string(ports_.clock.now()), author, message, items);
+  const std::string_view entry(buffer.data(), buffer.size());
   ports_.standardOutput.print(entry);
   if (fileChannel_) fileChannel_->append(entry);
 }
