@@ -77,7 +77,7 @@ StorageDevice BlockDevices::storageDevice(const std::string& name, std::string_v
   if (device.bus == Bus::nvme) device.isHidden = flag(name + "/hidden");
   if (!isSmartCapable(device)) return device;
 
-  device.isRotational = flag(name + "/queue/rotational");
+  device.isSolidState = text(name + "/queue/rotational") == "0";
   device.place = withoutClimbing(carrierOf(place));
   if (device.bus == Bus::scsi) {
     device.serialPage = devices_.bytes(name + "/device/vpd_pg80").value_or(std::string());
