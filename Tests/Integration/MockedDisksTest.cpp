@@ -108,8 +108,9 @@ TEST_F(MockedDisks, FixedDisksAreDevicesWithTheirKindAndTheStickIsNone) {
   EXPECT_EQ(rotational.kind(), OVDiskKindRotational);
   EXPECT_EQ(rotational.maxTreads(), 2);
   // Where the running system's root lies on no block device, it cannot lie on a mocked one.
-  if (!numberOfRoot().starts_with("0:"))
+  if (!numberOfRoot().starts_with("0:")) {
     EXPECT_THAT(*rotational.volumeURLs(), Contains(Platform::URL::fileURLWithPath("/")));
+  }
   for (std::size_t i = 2; i < all.size(); ++i) EXPECT_NE(all[i]->uniqueID(), "USB-1");
 }
 

@@ -4,6 +4,7 @@
 #include <Platform/Linux/BlockDevices.h>
 #include <Platform/Linux/BlockTree.h>
 #include <Platform/Linux/UdevDatabase.h>
+#include <Platform/Linux/VirtioSerials.h>
 #include <Tests/Support/TemporaryFolder.h>
 
 namespace Varnel::Platform::Linux {
@@ -72,8 +73,8 @@ std::string drawn(const BlockTree& tree, std::size_t node) {
   return text;
 }
 
-std::vector<std::string> drawn(const Machine& machine) {
-  const BlockTree tree = readBlockTree(machine.devices());
+std::vector<std::string> drawn(const Machine& machine, VirtioSerials&& serials = {}) {
+  const BlockTree tree = readBlockTree(machine.devices(), serials);
   std::vector<std::string> roots;
   for (std::size_t node = 0; node < tree.nodes.size(); ++node)
     if (!tree.nodes[node].parent) roots.push_back(drawn(tree, node));
@@ -142,10 +143,22 @@ TEST(BlockTree, ADiskWithoutASerialNumberIsKnownByItsNameOrItsPlace) {
                                           "+(Rotational,devices/pci0/virtio3)[vda]"));
 }
 
+TEST(VirtioSerials, EachDiskIsAskedOnce) {
+  VirtioSerials serials;
+  int asked = 0;
+  const auto ask = [&] { return "S" + std::to_string(++asked); };
+  EXPECT_EQ(serials.of("7", ask), "S1");
+  EXPECT_EQ(serials.of("7", ask), "S1");
+  EXPECT_EQ(serials.of("8", ask), "S2") << "another disk in the same place";
+  EXPECT_EQ(serials.of("", ask), "S3");
+  EXPECT_EQ(serials.of("", ask), "S4");
+}
+
 TEST(BlockTree, AMissingTableIsNoTable) {
   const BlockDevices none("/nowhere");
   EXPECT_FALSE(none);
-  EXPECT_THAT(readBlockTree(none).nodes, IsEmpty());
+  VirtioSerials serials;
+  EXPECT_THAT(readBlockTree(none, serials).nodes, IsEmpty());
 }
 
 TEST(StorageDevice, MalformedPagesHoldNoSerialNumber) {
