@@ -2,6 +2,7 @@
 #include <Platform/Linux/BlockDevices.h>
 
 #include <Platform/Linux/UdevDatabase.h>
+#include <Platform/Linux/VirtioSerials.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
@@ -69,7 +70,8 @@ Bus BlockDevices::bus(std::string_view place) const {
   return busOf(subsystems);
 }
 
-StorageDevice BlockDevices::storageDevice(const std::string& name, std::string_view place) const {
+StorageDevice BlockDevices::storageDevice(const std::string& name, std::string_view place,
+                                          VirtioSerials& virtioSerials) const {
   StorageDevice device;
   device.bus = bus(place);
   device.isRemovable = flag(name + "/removable");
@@ -77,15 +79,17 @@ StorageDevice BlockDevices::storageDevice(const std::string& name, std::string_v
   if (device.bus == Bus::nvme) device.isHidden = flag(name + "/hidden");
   if (!isSmartCapable(device)) return device;
 
-  device.isRotational = flag(name + "/queue/rotational");
+  device.isSolidState = text(name + "/queue/rotational") == "0";
   device.place = withoutClimbing(carrierOf(place));
-  if (device.bus == Bus::scsi) {
+  if (device.bus == Bus::scsi)
     device.serialPage = devices_.bytes(name + "/device/vpd_pg80").value_or(std::string());
-    if (!serialInPage(device.serialPage).empty()) return device;
-  } else {
-    device.serialNumber = text(name + (device.bus == Bus::nvme ? "/device/serial" : "/serial"));
-    if (!device.serialNumber.empty()) return device;
-  }
+  else if (device.bus == Bus::nvme)
+    device.serialNumber = text(name + "/device/serial");
+  else
+    device.serialNumber =
+        virtioSerials.of(text(name + "/diskseq"), [&] { return text(name + "/serial"); });
+  if (!device.serialNumber.empty() || !serialInPage(device.serialPage).empty()) return device;
+
   device.recordedSerial = udevProperty(name, "ID_SERIAL_SHORT").value_or(std::string());
   device.worldWideName = text(name + (device.bus == Bus::nvme ? "/wwid" : "/device/wwid"));
   return device;

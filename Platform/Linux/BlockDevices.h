@@ -11,6 +11,8 @@
 
 namespace Varnel::Platform::Linux {
 
+class VirtioSerials;
+
 /// The kernel's table of block devices. Reads tables alone, never a device. Any thread.
 class BlockDevices final {
  public:
@@ -29,7 +31,8 @@ class BlockDevices final {
   [[nodiscard]] std::vector<std::string> lowerDevices(const std::string& name) const;
 
   /// The facts of a whole disk, of which the serial numbers are read only if they will be used.
-  [[nodiscard]] StorageDevice storageDevice(const std::string& name, std::string_view place) const;
+  [[nodiscard]] StorageDevice storageDevice(const std::string& name, std::string_view place,
+                                            VirtioSerials& virtioSerials) const;
 
   /// Whether all of these disks, partitions or logical devices stay in the machine; absent when one
   /// does not tell, or there are none. A disk image is put in and taken out like a stick.

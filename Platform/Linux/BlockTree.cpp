@@ -25,7 +25,8 @@ PropertyDictionary propertiesOf(const StorageDevice& device) {
 
 class Builder final {
  public:
-  explicit Builder(const BlockDevices& devices) : devices_(devices) {
+  Builder(const BlockDevices& devices, VirtioSerials& virtioSerials)
+      : devices_(devices), virtioSerials_(virtioSerials) {
     for (std::string& name : devices_.names()) {
       std::string place = devices_.place(name);
       places_.emplace(std::move(name), std::move(place));
@@ -52,7 +53,7 @@ class Builder final {
   void addDisk(const std::string& name, std::string_view place) {
     std::optional<Node> storage;
     if (!place.empty() && !isVirtual(place) && !isPartition(place))
-      storage = add(propertiesOf(devices_.storageDevice(name, place)));
+      storage = add(propertiesOf(devices_.storageDevice(name, place, virtioSerials_)));
     const Node disk = add({{"BSD Name", name}});
     nodes_.emplace(name, disk);
     if (storage) attach(disk, *storage);
@@ -84,6 +85,7 @@ class Builder final {
   }
 
   const BlockDevices& devices_;
+  VirtioSerials& virtioSerials_;
   std::map<std::string, std::string, std::less<>> places_;
   std::map<std::string, Node, std::less<>> nodes_;
   BlockTree tree_;
@@ -91,8 +93,8 @@ class Builder final {
 
 }  // namespace
 
-BlockTree readBlockTree(const BlockDevices& devices) {
-  return Builder(devices).build();
+BlockTree readBlockTree(const BlockDevices& devices, VirtioSerials& virtioSerials) {
+  return Builder(devices, virtioSerials).build();
 }
 
 }  // namespace Varnel::Platform::Linux

@@ -11,6 +11,7 @@
 namespace Varnel::Platform::Linux {
 
 class BlockDevices;
+class VirtioSerials;
 
 /// Storage devices, the disks on them, the partitions on those, and the logical devices on any of
 /// these, as they are at one moment. Nothing stands below itself.
@@ -25,6 +26,6 @@ struct BlockTree {
 };
 
 /// Reads the table of block devices.
-[[nodiscard]] BlockTree readBlockTree(const BlockDevices& devices);
+[[nodiscard]] BlockTree readBlockTree(const BlockDevices& devices, VirtioSerials& virtioSerials);
 
 }  // namespace Varnel::Platform::Linux

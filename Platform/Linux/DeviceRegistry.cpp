@@ -6,6 +6,7 @@
 #include <Platform/Linux/Adapters.h>
 #include <Platform/Linux/BlockDevices.h>
 #include <Platform/Linux/BlockTree.h>
+#include <Platform/Linux/VirtioSerials.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
@@ -46,7 +47,7 @@ class SysfsDeviceRegistry final : public DeviceRegistry {
                                                  const PropertyValue& value) override {
     const BlockDevices devices;
     if (!devices) return std::nullopt;
-    const auto tree = std::make_shared<const BlockTree>(readBlockTree(devices));
+    const auto tree = std::make_shared<const BlockTree>(readBlockTree(devices, virtioSerials_));
     Entries entries;
     for (std::size_t node = 0; node < tree->nodes.size(); ++node) {
       const PropertyValue* own = find(tree->nodes[node].properties, name);
@@ -54,6 +55,9 @@ class SysfsDeviceRegistry final : public DeviceRegistry {
     }
     return entries;
   }
+
+ private:
+  VirtioSerials virtioSerials_;
 };
 
 }  // namespace

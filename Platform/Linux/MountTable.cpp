@@ -22,21 +22,6 @@ namespace {
 constexpr std::size_t leastRoom = 8192;
 constexpr int mostAttempts = 4;
 
-// The whole file, over what the buffer held before.
-bool readAll(int file, std::string& buffer) {
-  std::size_t size = 0;
-  for (;;) {
-    if (buffer.size() < size + leastRoom) buffer.resize(size * 2 + leastRoom);
-    const ssize_t count =
-        ::pread(file, buffer.data() + size, buffer.size() - size, static_cast<off_t>(size));
-    if (count < 0) return false;
-    if (count == 0) break;
-    size += static_cast<std::size_t>(count);
-  }
-  buffer.resize(size);
-  return true;
-}
-
 // Finds the block devices below mounts.
 class DeviceNames final {
  public:
@@ -101,6 +86,20 @@ POSIX::FileDescriptor openMountInfo() {
   return POSIX::FileDescriptor(::open("/proc/self/mountinfo", O_RDONLY | O_CLOEXEC));
 }
 
+bool readWhole(const POSIX::FileDescriptor& file, std::string& buffer) {
+  std::size_t size = 0;
+  for (;;) {
+    if (buffer.size() < size + leastRoom) buffer.resize(size * 2 + leastRoom);
+    const ssize_t count =
+        ::pread(file.get(), buffer.data() + size, buffer.size() - size, static_cast<off_t>(size));
+    if (count < 0) return false;
+    if (count == 0) break;
+    size += static_cast<std::size_t>(count);
+  }
+  buffer.resize(size);
+  return true;
+}
+
 const Volume* VolumeTable::withMountID(int mountID) const {
   const auto found = std::lower_bound(
       byMountID.begin(), byMountID.end(), mountID,
@@ -130,7 +129,7 @@ std::shared_ptr<const VolumeTable> MountTable::current() {
   for (int attempt = 0; attempt < mostAttempts; ++attempt) {
     if (hasChanged()) isStale_ = true;
     if (!isStale_) break;
-    if (!readAll(file_.get(), buffer_)) break;
+    if (!readWhole(file_, buffer_)) break;
     table_ = makeTable(buffer_);
     isStale_ = false;
   }

@@ -61,4 +61,7 @@ class MountTable final {
 /// Opens the kernel's mount table, whose changes wake a poll for exceptional conditions.
 [[nodiscard]] POSIX::FileDescriptor openMountInfo();
 
+/// Reads a file of the kernel's from its beginning, over what the buffer held before.
+[[nodiscard]] bool readWhole(const POSIX::FileDescriptor& file, std::string& buffer);
+
 }  // namespace Varnel::Platform::Linux

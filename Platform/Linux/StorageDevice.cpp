@@ -38,7 +38,7 @@ bool isSmartCapable(const StorageDevice& device) {
 }
 
 std::string_view mediumType(const StorageDevice& device) {
-  return device.isRotational ? "Rotational" : "Solid State";
+  return device.isSolidState ? "Solid State" : "Rotational";
 }
 
 std::string identifyingSerial(const StorageDevice& device) {

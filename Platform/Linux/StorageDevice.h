@@ -17,7 +17,7 @@ struct StorageDevice {
   Bus bus = Bus::none;
   bool isRemovable = false;
   bool isHidden = false;
-  bool isRotational = false;
+  bool isSolidState = false;
   std::string serialNumber;    ///< As the device's driver tells it.
   std::string serialPage;      ///< The SCSI product data page 0x80, raw.
   std::string recordedSerial;  ///< What udev found out when the device was plugged in.

@@ -1,0 +1,161 @@
+// SPDX-License-Identifier: MIT
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <linux/loop.h>
+#include <sys/ioctl.h>
+
+#include <cstdlib>
+#include <fstream>
+#include <future>
+
+#include <Platform/Linux/Adapters.h>
+#include <Platform/Linux/MountTable.h>
+#include <Platform/POSIX/FileDescriptor.h>
+#include <Platform/Ports/DeviceRegistry.h>
+#include <Platform/Ports/DiskArbitration.h>
+#include <Platform/Ports/VolumeCatalog.h>
+#include <Tests/Support/MountNamespace.h>
+#include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/DiskAccess/OVDiskInfo.h>
+
+namespace Varnel {
+namespace {
+
+using Platform::URL;
+using Platform::VolumeChange;
+using testing::ElementsAre;
+using testing::UnorderedElementsAre;
+
+class MountedVolumes : public testing::Test {
+ protected:
+  void SetUp() override {
+    const std::string reason = Tests::enterMountNamespace();
+    if (!reason.empty()) GTEST_SKIP() << reason;
+    table = Platform::Linux::makeMountTable();
+    catalog = Platform::Linux::makeVolumeCatalog(table);
+    disks = Platform::Linux::makeDiskArbitration(table);
+  }
+
+  std::filesystem::path makeFolder(const std::string& name) {
+    std::filesystem::create_directories(folder.path() / name);
+    return folder.path() / name;
+  }
+  static URL volumeAt(const std::filesystem::path& path) {
+    return URL::fileURLWithPath(path.string() + "/");
+  }
+
+  Tests::TemporaryFolder folder;
+  std::shared_ptr<Platform::Linux::MountTable> table;
+  std::unique_ptr<Platform::VolumeCatalog> catalog;
+  std::unique_ptr<Platform::DiskArbitration> disks;
+};
+
+// A loop device over a file, detached when the last user has gone.
+class DiskImage {
+ public:
+  explicit DiskImage(const std::filesystem::path& file) {
+    const Platform::POSIX::FileDescriptor control(::open("/dev/loop-control", O_RDWR | O_CLOEXEC));
+    const Platform::POSIX::FileDescriptor image(::open(file.c_str(), O_RDWR | O_CLOEXEC));
+    const int number = ::ioctl(control.get(), LOOP_CTL_GET_FREE);
+    if (number < 0) return;
+    const std::string node = "/dev/loop" + std::to_string(number);
+    device_ = Platform::POSIX::FileDescriptor(::open(node.c_str(), O_RDWR | O_CLOEXEC));
+    loop_config config{};
+    config.fd = static_cast<unsigned>(image.get());
+    config.info.lo_flags = LO_FLAGS_AUTOCLEAR;
+    if (::ioctl(device_.get(), LOOP_CONFIGURE, &config) == 0) name_ = node.substr(5);
+  }
+
+  [[nodiscard]] const std::string& name() const { return name_; }
+
+ private:
+  Platform::POSIX::FileDescriptor device_;
+  std::string name_;
+};
+
+TEST_F(MountedVolumes, ADiskImageIsAnExternalDiskOfItsOwnWithAllItsPlaces) {
+  const auto file = folder.write("image", "");
+  std::filesystem::resize_file(file, 4 << 20);
+  if (std::system(("mkfs.ext4 -q -F '" + file.string() + "'").c_str()) != 0)
+    GTEST_SKIP() << "no mkfs.ext4";
+  const DiskImage image(file);
+  if (image.name().empty()) GTEST_SKIP() << "no loop devices";
+
+  std::promise<URL> appeared;
+  const auto subscription = catalog->subscribe([&](const VolumeChange& change) {
+    if (change.kind == VolumeChange::Kind::mounted) appeared.set_value(change.volumeURL);
+  });
+  const auto first = makeFolder("first place");
+  ASSERT_EQ(::mount(("/dev/" + image.name()).c_str(), first.c_str(), "ext4", 0, nullptr), 0);
+  EXPECT_EQ(appeared.get_future().get(), volumeAt(first));
+
+  const auto session = disks->openSession();
+  EXPECT_THAT(session->mountURLs(image.name()), ElementsAre(volumeAt(first)));
+  const auto devices = Platform::Linux::makeDeviceRegistry();
+  int found = 0;
+  for (const auto& disk :
+       OVDiskInfo::allDiskInfos({.devices = *devices, .disks = *disks, .volumes = *catalog})) {
+    if (!disk->volumeURLs() || !disk->volumeURLs()->contains(volumeAt(first))) continue;
+    ++found;
+    EXPECT_EQ(disk->kind(), OVDiskKindExternal);
+  }
+  EXPECT_EQ(found, 1);
+  ASSERT_EQ(::umount(first.c_str()), 0);
+}
+
+TEST_F(MountedVolumes, EveryPlaceOfADeviceCountsAndHiddenOnesDoNot) {
+  const auto base = makeFolder("base");
+  ASSERT_TRUE(Tests::mountMemory(base));
+  const auto inside = makeFolder("base/inside");
+  const auto elsewhere = makeFolder("elsewhere");
+  ASSERT_EQ(::mount(inside.c_str(), elsewhere.c_str(), nullptr, MS_BIND, nullptr), 0);
+  const auto file = makeFolder("elsewhere/sub");
+  EXPECT_EQ(catalog->volumeURL(volumeAt(file)).value(), volumeAt(elsewhere));
+  EXPECT_EQ(catalog->volumeURL(volumeAt(inside)).value(), volumeAt(base));
+
+  ASSERT_TRUE(Tests::mountMemory(inside));
+  ASSERT_TRUE(Tests::mountMemory(base));
+  EXPECT_EQ(catalog->volumeName(volumeAt(inside)), std::nullopt) << "hidden by the mount above";
+  EXPECT_EQ(catalog->volumeURL(volumeAt(base)).value(), volumeAt(base));
+}
+
+TEST_F(MountedVolumes, TellsFailedFromAbsent) {
+  EXPECT_FALSE(catalog->volumeURL(URL::fileURLWithPath("/no such file")));
+  EXPECT_FALSE(catalog->volumeURL(URL::fileURLWithPath("")));
+  EXPECT_FALSE(catalog->volumeURL(URL::fileURLWithPath(std::string("/\0/x", 4))));
+  EXPECT_EQ(catalog->volumeURL(URL::fileURLWithPath("/proc/self/status")).value(), std::nullopt);
+  std::filesystem::create_symlink("/no such file", folder.path() / "dangling");
+  EXPECT_TRUE(catalog->volumeURL(URL::fileURLWithPath((folder.path() / "dangling").string())));
+}
+
+TEST_F(MountedVolumes, LooksUpWhileMountsComeAndGo) {
+  const auto place = makeFolder("place");
+  const URL url = volumeAt(place);
+  const URL below = catalog->volumeURL(url).value().value();
+  std::atomic<bool> done = false;
+  std::atomic<int> wrong = 0;
+  std::vector<std::thread> readers;
+  for (int i = 0; i < 3; ++i)
+    readers.emplace_back([&] {
+      while (!done) {
+        const auto found = catalog->volumeURL(url);
+        // What was found may be unmounted before it is named, but nothing else is ever found.
+        if (!found || (*found && **found != url && **found != below)) ++wrong;
+        (void)catalog->mountedVolumes();
+      }
+    });
+  std::atomic<int> told = 0;
+  for (int i = 0; i < 100; ++i) {
+    const auto subscription = catalog->subscribe([&](const VolumeChange&) { ++told; });
+    ASSERT_TRUE(Tests::mountMemory(place));
+    ASSERT_EQ(catalog->volumeURL(url).value(), url);
+    ASSERT_EQ(::umount2(place.c_str(), MNT_DETACH), 0);
+    ASSERT_EQ(catalog->volumeURL(url).value(), below);
+  }
+  done = true;
+  for (auto& reader : readers) reader.join();
+  EXPECT_EQ(wrong, 0);
+}
+
+}  // namespace
+}  // namespace Varnel

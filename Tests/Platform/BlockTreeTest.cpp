@@ -1,0 +1,191 @@
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include <Platform/Linux/BlockDevices.h>
+#include <Platform/Linux/BlockTree.h>
+#include <Platform/Linux/UdevDatabase.h>
+#include <Platform/Linux/VirtioSerials.h>
+#include <Tests/Support/TemporaryFolder.h>
+
+namespace Varnel::Platform::Linux {
+namespace {
+
+namespace fs = std::filesystem;
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+// A machine's sysfs, made of folders and links as the kernel lays them out.
+class Machine {
+ public:
+  Machine() { fs::create_directories(root_.path() / "class/block"); }
+
+  // `place` is the device's folder below "devices/"; its last component is the device's name.
+  void add(const std::string& place, const std::map<std::string, std::string>& attributes = {}) {
+    const fs::path device = root_.path() / "devices" / place;
+    fs::create_directories(device);
+    for (const auto& [name, value] : attributes)
+      root_.write("devices/" + place + '/' + name, value);
+    fs::create_directory_symlink("../../devices/" + place,
+                                 root_.path() / "class/block" / device.filename());
+  }
+
+  void setSubsystem(const std::string& place, const std::string& subsystem) {
+    const fs::path device = root_.path() / "devices" / place;
+    fs::create_directories(device);
+    fs::create_directory_symlink("/bus/" + subsystem, device / "subsystem");
+  }
+
+  // Also the carrier of the disk "…/0:0:0:0", which its attributes are reached through.
+  void addSCSIDisk(const std::string& above, const std::string& name,
+                   std::map<std::string, std::string> attributes) {
+    setSubsystem(above + "/host0", "scsi");
+    setSubsystem(above + "/host0/0:0:0:0", "scsi");
+    const std::string place = above + "/host0/0:0:0:0/block/" + name;
+    add(place, attributes);
+    fs::create_directory_symlink("../..", root_.path() / "devices" / place / "device");
+    carrier_ = "devices/" + above + "/host0/0:0:0:0/";
+  }
+  void writeOnCarrier(const std::string& name, std::string_view bytes) {
+    root_.write(carrier_ + name, bytes);
+  }
+
+  void standOn(const std::string& name, const std::string& lower) {
+    root_.write("class/block/" + name + "/slaves/" + lower, "");
+  }
+
+  BlockDevices devices() const { return BlockDevices((root_.path() / "class/block").c_str()); }
+
+ private:
+  Tests::TemporaryFolder root_;
+  std::string carrier_;
+};
+
+// "capable(Solid State,S1)[sda[sda1]]": the tree below the nodes that have no parent.
+std::string drawn(const BlockTree& tree, std::size_t node) {
+  const auto& [properties, parent, children] = tree.nodes[node];
+  std::string text;
+  if (const auto* name = findAs<std::string>(properties, "BSD Name")) text = *name;
+  if (const bool* capable = findAs<bool>(properties, "SMART Capable")) text = *capable ? "+" : "-";
+  if (const auto* facts = findAs<PropertyDictionary>(properties, "Device Characteristics"))
+    text += '(' + *findAs<std::string>(*facts, "Medium Type") + ',' +
+            *findAs<std::string>(*facts, "Serial Number") + ')';
+  for (const std::size_t child : children) text += '[' + drawn(tree, child) + ']';
+  return text;
+}
+
+std::vector<std::string> drawn(const Machine& machine, VirtioSerials&& serials = {}) {
+  const BlockTree tree = readBlockTree(machine.devices(), serials);
+  std::vector<std::string> roots;
+  for (std::size_t node = 0; node < tree.nodes.size(); ++node)
+    if (!tree.nodes[node].parent) roots.push_back(drawn(tree, node));
+  return roots;
+}
+
+TEST(BlockTree, HangsPartitionsAndLogicalDevicesBelowTheirDisk) {
+  Machine machine;
+  machine.addSCSIDisk("pci0/ata1", "sda", {{"removable", "0\n"}, {"queue/rotational", "1\n"}});
+  machine.writeOnCarrier("vpd_pg80", std::string_view("\0\x80\0\x08  WD-12 \n", 12));
+  machine.add("pci0/ata1/host0/0:0:0:0/block/sda/sda1", {{"partition", "1\n"}});
+  machine.add("virtual/block/dm-0");
+  machine.standOn("dm-0", "sda1");
+  machine.add("virtual/block/dm-1");
+  machine.standOn("dm-1", "dm-0");
+  machine.add("virtual/block/loop0");
+  machine.standOn("loop0", "sda1");  // the kernel never says so
+  EXPECT_THAT(drawn(machine), ElementsAre("loop0", "+(Rotational,WD-12)[sda[sda1[dm-0[dm-1]]]]"));
+  EXPECT_EQ(machine.devices().areInternal({"dm-1"}), true);
+  EXPECT_EQ(machine.devices().areInternal({"dm-1", "loop0"}), false);
+  EXPECT_EQ(machine.devices().areInternal({"dm-1", "gone"}), std::nullopt);
+}
+
+TEST(BlockTree, ARaidStandsBelowEachOfItsDisksAndCirclesAreCut) {
+  Machine machine;
+  machine.setSubsystem("pci0/virtio1", "virtio");
+  machine.setSubsystem("pci0/virtio2", "virtio");
+  machine.add("pci0/virtio1/block/vda", {{"serial", "A"}, {"queue/rotational", "0\n"}});
+  machine.add("pci0/virtio2/block/vdb", {{"serial", "B"}, {"queue/rotational", "1\n"}});
+  for (const char* name : {"md0", "dm-0", "dm-1"})
+    machine.add(std::string("virtual/block/") + name);
+  machine.standOn("md0", "vda");
+  machine.standOn("md0", "vdb");
+  machine.standOn("dm-0", "dm-1");
+  machine.standOn("dm-1", "dm-0");
+  EXPECT_THAT(drawn(machine),
+              ElementsAre("dm-1[dm-0]", "+(Solid State,A)[vda[md0]]", "+(Rotational,B)[vdb[md0]]"));
+  EXPECT_EQ(machine.devices().areInternal({"dm-0"}), std::nullopt);
+}
+
+TEST(BlockTree, DisksOnUSBAndRemovableOnesAreNotCapable) {
+  Machine machine;
+  machine.setSubsystem("pci0", "pci");
+  machine.setSubsystem("pci0/usb1/1-1", "usb");
+  machine.addSCSIDisk("pci0/usb1/1-1", "sdb", {{"removable", "0\n"}});
+  machine.addSCSIDisk("pci0/ata2", "sr0", {{"removable", "1\n"}});
+  machine.setSubsystem("pci0/mmc0/mmc0:1", "mmc");
+  machine.add("pci0/mmc0/mmc0:1/block/mmcblk0");
+  machine.add("pci0/mmc0/mmc0:1/block/mmcblk0/mmcblk0p1", {{"partition", "1\n"}});
+  machine.add("pci0/odd/block/odd0");
+  EXPECT_THAT(drawn(machine), ElementsAre("-[mmcblk0[mmcblk0p1]]", "-[odd0]", "-[sdb]", "-[sr0]"));
+  EXPECT_EQ(machine.devices().areInternal({"sdb"}), false);
+  EXPECT_EQ(machine.devices().areInternal({"sr0"}), false);
+  EXPECT_EQ(machine.devices().areInternal({"mmcblk0p1"}), true);
+  EXPECT_EQ(machine.devices().areInternal({"odd0"}), std::nullopt);
+}
+
+TEST(BlockTree, ADiskWithoutASerialNumberIsKnownByItsNameOrItsPlace) {
+  Machine machine;
+  machine.setSubsystem("pci0/nvme/nvme0", "nvme");
+  machine.add("pci0/nvme/nvme0/nvme0n1", {{"wwid", "eui.0025\n"}, {"device/serial", " \n"}});
+  machine.add("pci0/nvme/nvme0/nvme0c0n1", {{"hidden", "1\n"}});
+  machine.setSubsystem("pci0/virtio3", "virtio");
+  machine.add("pci0/virtio3/block/vda", {{"serial", ""}});
+  EXPECT_THAT(drawn(machine), ElementsAre("-[nvme0c0n1]", "+(Rotational,eui.0025)[nvme0n1]",
+                                          "+(Rotational,devices/pci0/virtio3)[vda]"));
+}
+
+TEST(VirtioSerials, EachDiskIsAskedOnce) {
+  VirtioSerials serials;
+  int asked = 0;
+  const auto ask = [&] { return "S" + std::to_string(++asked); };
+  EXPECT_EQ(serials.of("7", ask), "S1");
+  EXPECT_EQ(serials.of("7", ask), "S1");
+  EXPECT_EQ(serials.of("8", ask), "S2") << "another disk in the same place";
+  EXPECT_EQ(serials.of("", ask), "S3");
+  EXPECT_EQ(serials.of("", ask), "S4");
+}
+
+TEST(BlockTree, AMissingTableIsNoTable) {
+  const BlockDevices none("/nowhere");
+  EXPECT_FALSE(none);
+  VirtioSerials serials;
+  EXPECT_THAT(readBlockTree(none, serials).nodes, IsEmpty());
+}
+
+TEST(StorageDevice, MalformedPagesHoldNoSerialNumber) {
+  using namespace std::string_view_literals;
+  EXPECT_EQ(serialInPage("\0\x80\0\x04"
+                         "ABCDEF"sv),
+            "ABCD");
+  EXPECT_EQ(serialInPage("\0\x80\xff\xff"
+                         "AB"sv),
+            "AB");
+  for (const std::string_view page : {""sv, "\0\x80\0"sv,
+                                      "\0\x83\0\x02"
+                                      "AB"sv,
+                                      "\0\x80\0\0"
+                                      "AB"sv})
+    EXPECT_EQ(serialInPage(page), "");
+}
+
+TEST(Udev, LinksTellTheUUIDsOfFileSystems) {
+  const Tests::TemporaryFolder folder;
+  fs::create_symlink("../../sda1", folder.path() / "6f1c-0e5a");
+  fs::create_symlink("../../dm-0", folder.path() / "a\\x2fb\\x");
+  folder.write("no-link", "");
+  EXPECT_THAT(fileSystemUUIDs(folder.path().c_str()),
+              ElementsAre(testing::Pair("dm-0", "a/b\\x"), testing::Pair("sda1", "6f1c-0e5a")));
+  EXPECT_THAT(fileSystemUUIDs("/nowhere"), IsEmpty());
+}
+
+}  // namespace
+}  // namespace Varnel::Platform::Linux

@@ -1,0 +1,40 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <sched.h>
+#include <sys/mount.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstring>
+#include <filesystem>
+#include <fstream>
+#include <string>
+
+namespace Varnel::Tests {
+
+/// Gives this process mounts of its own, which no other process sees and which go away with it. To
+/// be called before the process has further threads. Returns the reason why it cannot be done, or
+/// nothing.
+[[nodiscard]] inline std::string enterMountNamespace() {
+  const uid_t user = ::geteuid();
+  const gid_t group = ::getegid();
+  if (::unshare(CLONE_NEWNS) != 0) {
+    // Whoever is not root may still be the root of a user namespace of his own.
+    if (::unshare(CLONE_NEWUSER | CLONE_NEWNS) != 0)
+      return std::string("no mount namespace: ") + std::strerror(errno);
+    std::ofstream("/proc/self/setgroups") << "deny";
+    std::ofstream("/proc/self/uid_map") << "0 " << user << " 1";
+    std::ofstream("/proc/self/gid_map") << "0 " << group << " 1";
+  }
+  if (::mount("none", "/", nullptr, MS_REC | MS_PRIVATE, nullptr) != 0)
+    return std::string("mounts stay shared: ") + std::strerror(errno);
+  return {};
+}
+
+/// Mounts an empty file system in memory on a folder.
+[[nodiscard]] inline bool mountMemory(const std::filesystem::path& folder) {
+  return ::mount("varnel-test", folder.c_str(), "tmpfs", 0, "size=1m") == 0;
+}
+
+}  // namespace Varnel::Tests
