@@ -2,6 +2,7 @@
 #include <orvane/CommandLine.h>
 
 #include <CLI/CLI.hpp>
+#include <algorithm>
 #include <memory>
 #include <vector>
 
@@ -66,15 +67,20 @@ void addDisks(CLI::App& app, Invocation& invocation) {
   options->add_flag("--json", command->isJSON, "Print one JSON object");
 }
 
-/// The arguments in the order in which the parser wants a list of them. It takes "[a,b]" for two
-/// names and gives "++" a meaning of its own; folders of such names go by another.
-std::vector<std::string> reversed(int count, const char* const* arguments) {
-  std::vector<std::string> list;
-  for (int i = count - 1; i > 0; --i) {
-    const std::string argument = arguments[i];
-    list.push_back(argument == "++" || argument.starts_with('[') ? "./" + argument : argument);
+/// Gives the folders among the arguments of a scan such names that the parser takes them for what
+/// they are. It would split "[a,b]" in two, has a use of its own for "++", and looks for options
+/// behind a "--" that follows a folder.
+void protectFolders(std::vector<std::string>& arguments) {
+  const auto command = std::find_if(arguments.begin(), arguments.end(), [](const auto& argument) {
+    return !argument.starts_with('-');
+  });
+  if (command == arguments.end() || *command != "scan") return;
+  const auto mark = std::find(command, arguments.end(), "--");
+  for (auto argument = command; argument != arguments.end(); ++argument) {
+    const bool isBehindMark = mark < argument && argument->starts_with('-');
+    if (isBehindMark || *argument == "++" || argument->starts_with('[')) argument->insert(0, "./");
   }
-  return list;
+  if (mark != arguments.end()) arguments.erase(mark);
 }
 
 }  // namespace
@@ -88,8 +94,11 @@ std::variant<Invocation, Information, UsageError> parseCommandLine(int count,
   app.require_subcommand(0, 1);
   addScan(app, invocation);
   addDisks(app, invocation);
+  std::vector<std::string> words(arguments + std::min(count, 1), arguments + count);
+  protectFolders(words);
+  std::reverse(words.begin(), words.end());  // as the parser wants them
   try {
-    app.parse(reversed(count, arguments));
+    app.parse(std::move(words));
   } catch (const CLI::CallForHelp&) {
     return Information{app.help()};
   } catch (const CLI::CallForVersion&) {
