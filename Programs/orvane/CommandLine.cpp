@@ -2,8 +2,9 @@
 #include <orvane/CommandLine.h>
 
 #include <CLI/CLI.hpp>
-#include <map>
+#include <algorithm>
 #include <memory>
+#include <vector>
 
 #include <Varnel/Context/BuildSwitches.h>
 #include <orvane/DisksCommand.h>
@@ -14,6 +15,11 @@ namespace {
 
 using Varnel::Platform::QualityOfService;
 
+void addLogFlag(CLI::App& app, Invocation& invocation) {
+  app.add_flag("--log-to-stdout", invocation.logsToStandardOutput,
+               "Print the log to standard output rather than standard error");
+}
+
 /// Adds a subcommand; when the arguments name it, the invocation runs the returned command.
 template <typename Command>
 std::pair<CLI::App*, std::shared_ptr<Command>> addCommand(CLI::App& app, Invocation& invocation,
@@ -21,23 +27,26 @@ std::pair<CLI::App*, std::shared_ptr<Command>> addCommand(CLI::App& app, Invocat
                                                           const char* description) {
   auto command = std::make_shared<Command>();
   CLI::App* subcommand = app.add_subcommand(name, description);
+  addLogFlag(*subcommand, invocation);
   subcommand->callback([command, &invocation] {
     invocation.command = [command](Console& console) { return command->run(console); };
   });
   return {subcommand, command};
 }
 
+QualityOfService qualityNamed(const std::string& name) {
+  if (name == "background") return QualityOfService::background;
+  if (name == "utility") return QualityOfService::utility;
+  if (name == "user-initiated") return QualityOfService::userInitiated;
+  if (name == "user-interactive") return QualityOfService::userInteractive;
+  throw CLI::ValidationError("--qos", "there is no quality \"" + name + "\"");
+}
+
 void addScan(CLI::App& app, Invocation& invocation) {
-  static const std::map<std::string, QualityOfService> qualities = {
-      {"background", QualityOfService::background},
-      {"utility", QualityOfService::utility},
-      {"user-initiated", QualityOfService::userInitiated},
-      {"user-interactive", QualityOfService::userInteractive},
-  };
   auto [options, command] = addCommand<ScanCommand>(
       app, invocation, "scan", "Find the files of equal content in folders and below them");
-  options->add_option("folders", command->folders, "The folders")
-      ->type_name("FOLDER")
+  options->add_option("FOLDER", command->folders, "The folders")
+      ->type_name("")
       ->required()
       ->check([](const std::string& name) {
         return name.empty() ? std::string("the name of a folder is empty") : std::string();
@@ -46,16 +55,32 @@ void addScan(CLI::App& app, Invocation& invocation) {
   options->add_flag("--progress", command->showsProgress,
                     "Show on the terminal how far the scan is");
   options
-      ->add_option("--qos", command->qos,
-                   "How urgent reading is: background, utility, user-initiated, user-interactive")
-      ->type_name("QUALITY")
-      ->transform(CLI::CheckedTransformer(qualities).description(""));
+      ->add_option_function<std::string>(
+          "--qos", [scan = command](const std::string& name) { scan->qos = qualityNamed(name); },
+          "How urgent reading is: background, utility, user-initiated, user-interactive")
+      ->type_name("QUALITY");
 }
 
 void addDisks(CLI::App& app, Invocation& invocation) {
   auto [options, command] = addCommand<DisksCommand>(
       app, invocation, "disks", "List the disks, their kinds, limits and volumes");
   options->add_flag("--json", command->isJSON, "Print one JSON object");
+}
+
+/// Gives the folders among the arguments of a scan such names that the parser takes them for what
+/// they are. It would split "[a,b]" in two, has a use of its own for "++", and looks for options
+/// behind a "--" that follows a folder.
+void protectFolders(std::vector<std::string>& arguments) {
+  const auto command = std::find_if(arguments.begin(), arguments.end(), [](const auto& argument) {
+    return !argument.starts_with('-');
+  });
+  if (command == arguments.end() || *command != "scan") return;
+  const auto mark = std::find(command, arguments.end(), "--");
+  for (auto argument = command; argument != arguments.end(); ++argument) {
+    const bool isBehindMark = mark < argument && argument->starts_with('-');
+    if (isBehindMark || *argument == "++" || argument->starts_with('[')) argument->insert(0, "./");
+  }
+  if (mark != arguments.end()) arguments.erase(mark);
 }
 
 }  // namespace
@@ -65,13 +90,15 @@ std::variant<Invocation, Information, UsageError> parseCommandLine(int count,
   Invocation invocation;
   CLI::App app("Finds duplicate files", "orvane");
   app.set_version_flag("--version", std::string("orvane ") + QNAppDisplayVersion());
-  app.add_flag("--log-to-stdout", invocation.logsToStandardOutput,
-               "Print the log to standard output rather than standard error");
-  app.require_subcommand(1);
+  addLogFlag(app, invocation);
+  app.require_subcommand(0, 1);
   addScan(app, invocation);
   addDisks(app, invocation);
+  std::vector<std::string> words(arguments + std::min(count, 1), arguments + count);
+  protectFolders(words);
+  std::reverse(words.begin(), words.end());  // as the parser wants them
   try {
-    app.parse(count, arguments);
+    app.parse(std::move(words));
   } catch (const CLI::CallForHelp&) {
     return Information{app.help()};
   } catch (const CLI::CallForVersion&) {
@@ -79,6 +106,7 @@ std::variant<Invocation, Information, UsageError> parseCommandLine(int count,
   } catch (const CLI::ParseError& error) {
     return UsageError{error.what()};
   }
+  if (!invocation.command) return UsageError{"a command is missing"};
   return invocation;
 }
 

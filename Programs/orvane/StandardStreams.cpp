@@ -6,18 +6,16 @@
 
 #include <cerrno>
 #include <csignal>
+#include <cstdio>
 
 namespace Orvane {
 namespace {
 
-std::error_code writeAll(int descriptor, std::string_view text) {
-  while (!text.empty()) {
-    const ssize_t written = ::write(descriptor, text.data(), text.size());
-    if (written < 0 && errno == EINTR) continue;
-    if (written < 0) return {errno, std::generic_category()};
-    text.remove_prefix(static_cast<std::size_t>(written));
-  }
-  return {};
+std::error_code writeAll(std::FILE* stream, std::string_view text) {
+  errno = 0;
+  const bool isWritten = std::fwrite(text.data(), 1, text.size(), stream) == text.size();
+  if (std::fflush(stream) == 0 && isWritten) return {};
+  return {errno != 0 ? errno : EIO, std::generic_category()};
 }
 
 }  // namespace
@@ -36,11 +34,11 @@ void failOnClosedPipes() {
 }
 
 std::error_code writeStandardOutput(std::string_view text) {
-  return writeAll(STDOUT_FILENO, text);
+  return writeAll(stdout, text);
 }
 
 void writeStandardError(std::string_view text) {
-  (void)writeAll(STDERR_FILENO, text);
+  (void)writeAll(stderr, text);
 }
 
 bool isStandardErrorATerminal() {

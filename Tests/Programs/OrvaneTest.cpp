@@ -1,0 +1,207 @@
+// SPDX-License-Identifier: MIT
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <spawn.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <filesystem>
+#include <fstream>
+#include <nlohmann/json.hpp>
+#include <sstream>
+#include <string>
+#include <vector>
+
+#include <Tests/Programs/ScanFolder.h>
+
+namespace Orvane::Testing {
+namespace {
+
+using ::testing::AllOf;
+using ::testing::EndsWith;
+using ::testing::HasSubstr;
+using ::testing::IsEmpty;
+using ::testing::Not;
+using ::testing::StartsWith;
+
+struct Outcome {
+  int status = -1;  ///< As a shell tells it.
+  std::string output;
+  std::string errors;
+};
+
+/// Runs the program with a home folder and a working folder of its own.
+class Orvane : public ::testing::Test {
+ protected:
+  enum class Output { file, full, closed, brokenPipe };
+
+  Outcome run(std::vector<std::string> arguments, Output output = Output::file) {
+    const std::string outputPath = scratch_.path("output");
+    const std::string errorPath = scratch_.path("errors");
+    posix_spawn_file_actions_t actions;
+    posix_spawn_file_actions_init(&actions);
+    int pipe[2] = {-1, -1};
+    constexpr int flags = O_WRONLY | O_CREAT | O_TRUNC;
+    posix_spawn_file_actions_addopen(&actions, STDERR_FILENO, errorPath.c_str(), flags, 0600);
+    posix_spawn_file_actions_addopen(&actions, STDOUT_FILENO,
+                                     output == Output::full ? "/dev/full" : outputPath.c_str(),
+                                     flags, 0600);
+    if (output == Output::closed) posix_spawn_file_actions_addclose(&actions, STDOUT_FILENO);
+    if (output == Output::brokenPipe) {
+      EXPECT_EQ(::pipe2(pipe, O_CLOEXEC), 0);
+      ::close(pipe[0]);
+      posix_spawn_file_actions_adddup2(&actions, pipe[1], STDOUT_FILENO);
+    }
+
+    arguments.insert(arguments.begin(), ORVANE_PROGRAM);
+    std::vector<char*> pointers;
+    for (std::string& argument : arguments) pointers.push_back(argument.data());
+    pointers.push_back(nullptr);
+    std::string home = "HOME=" + scratch_.path();
+    char* environment[] = {home.data(), nullptr};
+    pid_t process = -1;
+    EXPECT_EQ(
+        ::posix_spawn(&process, ORVANE_PROGRAM, &actions, nullptr, pointers.data(), environment),
+        0);
+    posix_spawn_file_actions_destroy(&actions);
+    if (pipe[1] >= 0) ::close(pipe[1]);
+    int status = 0;
+    EXPECT_EQ(::waitpid(process, &status, 0), process);
+    return {WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status), read(outputPath),
+            read(errorPath)};
+  }
+
+  std::string logText() const {
+    std::string text;
+    for (const auto& entry : std::filesystem::recursive_directory_iterator(scratch_.path()))
+      if (entry.path().extension() == ".log") text += read(entry.path());
+    return text;
+  }
+
+  bool hasLog() const { return std::filesystem::exists(scratch_.path("Library")); }
+
+  ScanFolder folder;
+
+ private:
+  static std::string read(const std::string& path) {
+    std::ostringstream text;
+    text << std::ifstream(path, std::ios::binary).rdbuf();
+    return text.str();
+  }
+
+  ScanFolder scratch_;
+};
+
+TEST_F(Orvane, PrintsTheResultAloneAndLogsTheRun) {
+  folder.write("a", "same content");
+  folder.write("b", "same content");
+  folder.write("c", "other");
+  const Outcome text = run({"scan", folder.path()});
+  EXPECT_EQ(text.status, 0);
+  EXPECT_EQ(text.output, "2 files of 12 bytes, 12 bytes wasted\n  " + folder.path("a") + "\n  " +
+                             folder.path("b") +
+                             "\n\n3 files in 1 folder: 1 duplicate in 1 group, 12 bytes wasted\n");
+  EXPECT_THAT(text.errors, AllOf(HasSubstr("Will scan"), HasSubstr(folder.path())));
+  EXPECT_THAT(logText(), HasSubstr("Did find 1 groups"));
+
+  const Outcome json = run({"scan", "--json", "--qos", "background", folder.path()});
+  const auto result = nlohmann::json::parse(json.output);
+  EXPECT_EQ(result["groups"],
+            nlohmann::json::parse(R"([{"size": 12, "paths": [")" + folder.path("a") + R"(", ")" +
+                                  folder.path("b") + R"("]}])"));
+  EXPECT_EQ(result["wastedBytes"], 12);
+}
+
+TEST_F(Orvane, SendsTheLogWhereItIsTold) {
+  const Outcome outcome = run({"scan", "--log-to-stdout", folder.path()});
+  EXPECT_THAT(outcome.errors, IsEmpty());
+  EXPECT_THAT(outcome.output, AllOf(StartsWith("Will store log at "), EndsWith("no duplicates\n")));
+}
+
+TEST_F(Orvane, ShowsHostileNamesAsWhatTheyAre) {
+  folder.write("fake\n\n9 files of 1 byte\x1b[2J", "same");
+  folder.write(
+      "\xff"
+      "back\\slash",
+      "same");
+  const Outcome text = run({"scan", folder.path()});
+  EXPECT_THAT(text.output, HasSubstr("/fake\\n\\n9 files of 1 byte\\x1B[2J\n"));
+  EXPECT_THAT(text.output, HasSubstr("/\\xFFback\\\\slash\n"));
+
+  const Outcome json = run({"scan", "--json", folder.path()});
+  const auto group = nlohmann::json::parse(json.output)["groups"][0];
+  EXPECT_EQ(group["paths"][0], folder.path("fake\n\n9 files of 1 byte\x1b[2J"));
+  EXPECT_EQ(group["paths"][1], folder.path("\xEF\xBF\xBD"
+                                           "back\\slash"));
+  EXPECT_EQ(group["urls"][1], "file://" + folder.path("%FFback%5Cslash"));
+}
+
+TEST_F(Orvane, RefusesWrongArgumentsInOneLineAndDoesNothing) {
+  const std::string missing = folder.path("missing");
+  const std::string file = folder.write("file", "x");
+  const struct {
+    std::vector<std::string> arguments;
+    int status;
+    std::string naming;
+  } cases[] = {
+      {{}, 2, "command"},
+      {{"bogus"}, 2, "bogus"},
+      {{"scan"}, 2, "FOLDER"},
+      {{"scan", ""}, 2, "empty"},
+      {{"scan", "--nope", folder.path()}, 2, "--nope"},
+      {{"scan", "--qos", "fast\nest", folder.path()}, 2, "fast\\nest"},
+      {{"disks", "extra"}, 2, "extra"},
+      {{"scan", missing}, 1, missing},
+      {{"scan", folder.path(), missing}, 1, missing},
+      {{"scan", file}, 1, file},
+  };
+  for (const auto& [arguments, status, naming] : cases) {
+    const Outcome outcome = run(arguments);
+    EXPECT_EQ(outcome.status, status) << naming;
+    EXPECT_THAT(outcome.output, IsEmpty());
+    EXPECT_THAT(outcome.errors, AllOf(StartsWith("orvane: "), HasSubstr(naming), EndsWith("\n")));
+    EXPECT_EQ(outcome.errors.find('\n'), outcome.errors.size() - 1) << outcome.errors;
+  }
+  EXPECT_FALSE(hasLog());
+}
+
+TEST_F(Orvane, TakesFoldersOfEveryName) {
+  std::vector<std::string> arguments = {"scan"};
+  std::filesystem::current_path(folder.path());
+  for (const char* name : {"[a,b]", "++", "{}", "%%", "x,y", "a=b", "scan", "disks"}) {
+    folder.write(std::string(name) + "/file", "same");
+    arguments.push_back(name);
+  }
+  folder.write("--json/file", "same");
+  arguments.insert(arguments.end(), {"--", "--json"});
+  const Outcome outcome = run(arguments);
+  EXPECT_EQ(outcome.status, 0) << outcome.errors;
+  EXPECT_THAT(outcome.output, StartsWith("9 files of "));
+}
+
+TEST_F(Orvane, FailsWhenItsResultCannotBeWritten) {
+  for (const Output output : {Output::full, Output::closed, Output::brokenPipe}) {
+    for (const char* command : {"scan", "disks", "--version"}) {
+      std::vector<std::string> arguments = {command};
+      if (arguments[0] == "scan") arguments.push_back(folder.path());
+      const Outcome outcome = run(arguments, output);
+      EXPECT_EQ(outcome.status, 1) << command;
+      EXPECT_THAT(outcome.errors, HasSubstr("cannot write the result"));
+    }
+  }
+  EXPECT_THAT(logText(), Not(HasSubstr("no duplicates"))) << "the log took the output's place";
+}
+
+TEST_F(Orvane, ListsTheDiskOfItsFiles) {
+  const Outcome text = run({"disks"});
+  EXPECT_EQ(text.status, 0);
+  const auto disks = nlohmann::json::parse(run({"disks", "--json"}).output)["disks"];
+  ASSERT_FALSE(disks.empty());
+  for (const auto& disk : disks) {
+    EXPECT_GE(disk["maxTreads"], 1);
+    for (const auto& volume : disk["volumes"]) EXPECT_THAT(volume, StartsWith("file:///"));
+  }
+}
+
+}  // namespace
+}  // namespace Orvane::Testing
