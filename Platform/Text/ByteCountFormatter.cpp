@@ -39,8 +39,9 @@ Rounded divide(std::uint64_t bytes, std::uint64_t unit, int decimals) {
 }
 
 std::string decimalText(std::uint64_t fraction, int decimals) {
-  std::string text = std::to_string(fraction);
-  text.insert(0, static_cast<std::size_t>(decimals) - text.size(), '0');
+  const std::string digits = std::to_string(fraction);
+  std::string text(static_cast<std::size_t>(decimals) - digits.size(), '0');
+  text += digits;
   text.erase(text.find_last_not_of('0') + 1);
   return text;
 }
@@ -59,12 +60,16 @@ ByteCountFormatter::ByteCountFormatter(std::string_view localeIdentifier) {
 
 std::string ByteCountFormatter::string(std::int64_t count, ByteCountStyle style) const {
   if (count == 0) return "Zero KB";
-  const std::string sign = count < 0 ? "-" : "";
+  std::string text;
+  if (count < 0) text += '-';
   // Negated as unsigned, since the least count has no positive counterpart.
   const auto bits = static_cast<std::uint64_t>(count);
   const std::uint64_t bytes = count < 0 ? 0 - bits : bits;
   const std::uint64_t step = unitStep(style);
-  if (bytes < step) return sign + std::to_string(bytes) + (bytes == 1 ? " byte" : " bytes");
+  if (bytes < step) {
+    text += std::to_string(bytes);
+    return text += bytes == 1 ? " byte" : " bytes";
+  }
 
   std::uint64_t unitSize = step;
   auto unit = units.begin();
@@ -75,9 +80,9 @@ std::string ByteCountFormatter::string(std::int64_t count, ByteCountStyle style)
     ++unit;
     value = divide(bytes, unitSize, unit->maximumDecimals);
   }
-  std::string text = sign + std::to_string(value.whole);
+  text += std::to_string(value.whole);
   if (value.fraction != 0)
-    text += decimalSeparator_ + decimalText(value.fraction, unit->maximumDecimals);
+    text.append(decimalSeparator_).append(decimalText(value.fraction, unit->maximumDecimals));
   return text.append(" ").append(unit->name);
 }
 
