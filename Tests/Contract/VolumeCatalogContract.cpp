@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
-#include <atomic>
 #include <condition_variable>
 #include <mutex>
 #include <set>
