@@ -12,7 +12,8 @@
 namespace Varnel::Platform::Linux {
 
 /// A subscription to the changes of the mount table: a thread that waits for them in the kernel and
-/// ends with this object. The table shows a change before the handler hears of it.
+/// ends with this object. The table shows a change before the handler hears of it. What went and
+/// came back before the thread could look may go untold.
 class VolumeWatch final : public VolumeCatalog::Subscription {
  public:
   /// Changes that happen after the return are told. Null when the table cannot be watched.

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
+#include <map>
+
 #include <Platform/Linux/BlockDevices.h>
 #include <Platform/Linux/BlockTree.h>
 #include <Platform/Linux/UdevDatabase.h>
