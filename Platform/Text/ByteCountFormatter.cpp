@@ -54,18 +54,17 @@ ByteCountFormatter::ByteCountFormatter(std::string_view localeIdentifier) {
   if (U_SUCCESS(status))
     symbols.getConstSymbol(icu::DecimalFormatSymbols::kDecimalSeparatorSymbol)
         .toUTF8String(decimalSeparator_);
-  if (decimalSeparator_.empty()) decimalSeparator_ = ".";
+  if (decimalSeparator_.empty()) decimalSeparator_.push_back('.');
 }
 
 std::string ByteCountFormatter::string(std::int64_t count, ByteCountStyle style) const {
   if (count == 0) return "Zero KB";
-  std::string text = count < 0 ? "-" : "";
+  const std::string sign = count < 0 ? "-" : "";
   // Negated as unsigned, since the least count has no positive counterpart.
   const auto bits = static_cast<std::uint64_t>(count);
   const std::uint64_t bytes = count < 0 ? 0 - bits : bits;
   const std::uint64_t step = unitStep(style);
-  if (bytes < step)
-    return text.append(std::to_string(bytes)).append(bytes == 1 ? " byte" : " bytes");
+  if (bytes < step) return sign + std::to_string(bytes) + (bytes == 1 ? " byte" : " bytes");
 
   std::uint64_t unitSize = step;
   auto unit = units.begin();
@@ -76,7 +75,7 @@ std::string ByteCountFormatter::string(std::int64_t count, ByteCountStyle style)
     ++unit;
     value = divide(bytes, unitSize, unit->maximumDecimals);
   }
-  text += std::to_string(value.whole);
+  std::string text = sign + std::to_string(value.whole);
   if (value.fraction != 0)
     text += decimalSeparator_ + decimalText(value.fraction, unit->maximumDecimals);
   return text.append(" ").append(unit->name);
