@@ -55,7 +55,7 @@ ByteCountFormatter::ByteCountFormatter(std::string_view localeIdentifier) {
   if (U_SUCCESS(status))
     symbols.getConstSymbol(icu::DecimalFormatSymbols::kDecimalSeparatorSymbol)
         .toUTF8String(decimalSeparator_);
-  if (decimalSeparator_.empty()) decimalSeparator_ = ".";
+  if (decimalSeparator_.empty()) decimalSeparator_.push_back('.');
 }
 
 std::string ByteCountFormatter::string(std::int64_t count, ByteCountStyle style) const {

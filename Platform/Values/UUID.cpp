@@ -2,17 +2,23 @@
 #include <Platform/Values/UUID.h>
 
 #include <array>
-#include <cstdlib>
+#include <cstdint>
+#include <iterator>
+#include <random>
 
 #include <fmt/format.h>
-#include <openssl/rand.h>
 
 namespace Varnel::Platform {
 
 std::string randomUUIDString() {
+  // The system's randomness comes without a library whose state is gone once the process exits:
+  // an inventory may still be under way by then.
+  std::random_device random;
   std::array<unsigned char, 16> bytes{};
-  // A system without randomness cannot tell two disks apart; nothing sensible can follow.
-  if (RAND_bytes(bytes.data(), static_cast<int>(bytes.size())) != 1) std::abort();
+  for (std::size_t i = 0; i < bytes.size(); i += 4) {
+    const std::uint32_t word = random();
+    for (std::size_t j = 0; j < 4; ++j) bytes[i + j] = static_cast<unsigned char>(word >> (8 * j));
+  }
   bytes[6] = static_cast<unsigned char>((bytes[6] & 0x0F) | 0x40);
   bytes[8] = static_cast<unsigned char>((bytes[8] & 0x3F) | 0x80);
   std::string text;

@@ -29,7 +29,8 @@ struct RecordLookup {
 DiskAccessManager::Ports portsOfProcess() {
   const Platform::Ports& ports = Platform::processPorts();
   Basalt::NotificationCenter& center = Basalt::NotificationCenter::defaultCenter();
-  [[maybe_unused]] static const auto* const relay =
+  // Nobody reads the pointer; volatile keeps it, so that the relay is not taken for a leak.
+  [[maybe_unused]] static const VolumeChangeRelay* const volatile relay =
       new VolumeChangeRelay(ports.volumeCatalog, center);
   return {.devices = ports.deviceRegistry,
           .disks = ports.diskArbitration,
