@@ -6,7 +6,6 @@
 #include <cstdio>
 #include <cstdlib>
 #include <deque>
-#include <iterator>
 #include <mutex>
 #include <optional>
 #include <system_error>
@@ -28,6 +27,16 @@ constexpr std::size_t briefBlockLimit = 16;
 [[noreturn]] void stop(const char* reason, const std::string& label) {
   fmt::print(stderr, "{} (queue {})\n", reason, label);
   std::abort();
+}
+
+/// A block that runs both, either of which may be empty.
+Block inTurn(Block first, Block second) {
+  if (!second) return first;
+  if (!first) return second;
+  return [first = std::move(first), second = std::move(second)]() mutable {
+    first();
+    second();
+  };
 }
 
 /// Where a thread sleeps that waits for a queue. Shared, as the one that wakes it may still be
@@ -84,6 +93,8 @@ class SerialQueue::Core final {
   };
 
   bool tryTake();
+  bool giveUp();
+  Block releaseSlowly(Block afterRelease) noexcept;
   bool takeOrMark(Bits mark);
   void acquireSlowly();
   void pushBlock(Block block, Runner runner);
@@ -94,14 +105,15 @@ class SerialQueue::Core final {
   void work();
   [[nodiscard]] Bits bitsOfLine() const;
 
-  const std::string label_;
-  const QualityOfService quality_;
   std::atomic<Bits> word_ = 0;
   std::atomic<ThreadID> holder_ = ThreadID::none;  ///< Set only while a block runs.
 
   // Owned by the holder.
   std::vector<Block> briefBlocks_;
-  std::vector<Block> afterRelease_;
+  Block afterRelease_;
+
+  const std::string label_;
+  const QualityOfService quality_;
 
   std::mutex mutex_;  ///< Owns what follows.
   std::deque<Entry> line_;
@@ -153,27 +165,36 @@ void SerialQueue::Core::acquireSlowly() {
 }
 
 void SerialQueue::Core::release() noexcept {
-  std::vector<Block> afterRelease;
+  if (!briefBlocks_.empty()) runBriefBlocks();
+  Block afterRelease = std::move(afterRelease_);
+  if (!giveUp()) [[unlikely]]
+    afterRelease = releaseSlowly(std::move(afterRelease));
+  // From here on the queue may be gone.
+  if (afterRelease) afterRelease();
+}
+
+// Succeeds as long as nobody stands in line.
+bool SerialQueue::Core::giveUp() {
+  holder_.store(ThreadID::none, std::memory_order_relaxed);
+  Bits alone = held;
+  return word_.compare_exchange_strong(alone, 0, std::memory_order_release,
+                                       std::memory_order_relaxed);
+}
+
+// Runs the brief blocks that are next, and passes the queue on. Returns what to do then.
+Block SerialQueue::Core::releaseSlowly(Block afterRelease) noexcept {
   std::size_t mayRun = briefBlockLimit;
-  for (;;) {
-    if (!briefBlocks_.empty()) runBriefBlocks();
-    if (!afterRelease_.empty()) {
-      std::move(afterRelease_.begin(), afterRelease_.end(), std::back_inserter(afterRelease));
-      afterRelease_.clear();
-    }
-    holder_.store(ThreadID::none, std::memory_order_relaxed);
-    Bits alone = held;
-    if (word_.compare_exchange_strong(alone, 0, std::memory_order_release,
-                                      std::memory_order_relaxed)) [[likely]]
-      break;
+  do {
     std::optional<Block> block = passOn(mayRun);
     if (!block) break;
     --mayRun;
     holder_.store(currentThreadID(), std::memory_order_relaxed);
     (*block)();
-  }
-  // From here on the queue may be gone.
-  for (Block& block : afterRelease) block();
+    block.reset();
+    runBriefBlocks();
+    afterRelease = inTurn(std::move(afterRelease), std::move(afterRelease_));
+  } while (!giveUp());
+  return afterRelease;
 }
 
 void SerialQueue::Core::runBriefBlocks() noexcept {
@@ -269,7 +290,7 @@ void SerialQueue::Core::submit(Block block) {
 
 void SerialQueue::Core::afterRelease(Block block) {
   if (!isCurrent()) stop("Only a block of the queue may act after it", label_);
-  afterRelease_.push_back(std::move(block));
+  afterRelease_ = inTurn(std::move(afterRelease_), std::move(block));
 }
 
 void SerialQueue::Core::close() {

@@ -16,6 +16,9 @@ if(VARNEL_CCACHE AND NOT CMAKE_CXX_COMPILER_LAUNCHER)
   set(CMAKE_CXX_COMPILER_LAUNCHER "${VARNEL_CCACHE}")
 endif()
 
+# The library's own calls go to its own functions, and so may be inlined; see also its link options.
+add_compile_options(-fno-semantic-interposition)
+
 add_compile_options(-Wall -Wextra -Wpedantic -Wshadow -Wconversion)
 if(VARNEL_WARNINGS_AS_ERRORS)
   add_compile_options(-Werror)
