@@ -10,7 +10,6 @@
 #include <optional>
 #include <system_error>
 #include <thread>
-#include <vector>
 
 #include <fmt/format.h>
 
@@ -29,14 +28,16 @@ constexpr std::size_t briefBlockLimit = 16;
   std::abort();
 }
 
-/// A block that runs both, either of which may be empty.
-Block inTurn(Block first, Block second) {
-  if (!second) return first;
-  if (!first) return second;
-  return [first = std::move(first), second = std::move(second)]() mutable {
-    first();
-    second();
-  };
+/// Lets a block follow another, if there is one.
+void append(Block& first, Block&& second) {
+  if (!second) return;
+  if (first)
+    first = [first = std::move(first), second = std::move(second)]() mutable {
+      first();
+      second();
+    };
+  else
+    first = std::move(second);
 }
 
 /// Where a thread sleeps that waits for a queue. Shared, as the one that wakes it may still be
@@ -62,9 +63,7 @@ const std::shared_ptr<Waiter>& currentWaiter() {
 // orders.
 class SerialQueue::Core final {
  public:
-  Core(std::string label, QualityOfService quality) : label_(std::move(label)), quality_(quality) {
-    briefBlocks_.reserve(briefBlockLimit);
-  }
+  Core(std::string label, QualityOfService quality) : label_(std::move(label)), quality_(quality) {}
 
   [[nodiscard]] const std::string& label() const { return label_; }
   [[nodiscard]] bool isCurrent() const {
@@ -73,9 +72,9 @@ class SerialQueue::Core final {
 
   void acquire();
   void release() noexcept;
-  void enqueue(Block block);
-  void submit(Block block);
-  void afterRelease(Block block);
+  void enqueue(Block&& block);
+  void submit(Block&& block);
+  void afterRelease(Block&& block);
   void close();
 
  private:
@@ -94,10 +93,10 @@ class SerialQueue::Core final {
 
   bool tryTake();
   bool giveUp();
-  Block releaseSlowly(Block afterRelease) noexcept;
+  void releaseSlowly(Block& afterRelease) noexcept;
   bool takeOrMark(Bits mark);
   void acquireSlowly();
-  void pushBlock(Block block, Runner runner);
+  void pushBlock(Block&& block, Runner runner);
   Entry popFront();
   void runBriefBlocks() noexcept;
   std::optional<Block> passOn(std::size_t mayRun) noexcept;
@@ -109,7 +108,8 @@ class SerialQueue::Core final {
   std::atomic<ThreadID> holder_ = ThreadID::none;  ///< Set only while a block runs.
 
   // Owned by the holder.
-  std::vector<Block> briefBlocks_;
+  Block briefBlock_;  ///< What the block that runs has submitted, in turn.
+  std::size_t briefBlockCount_ = 0;
   Block afterRelease_;
 
   const std::string label_;
@@ -165,10 +165,10 @@ void SerialQueue::Core::acquireSlowly() {
 }
 
 void SerialQueue::Core::release() noexcept {
-  if (!briefBlocks_.empty()) runBriefBlocks();
+  if (briefBlock_) runBriefBlocks();
   Block afterRelease = std::move(afterRelease_);
   if (!giveUp()) [[unlikely]]
-    afterRelease = releaseSlowly(std::move(afterRelease));
+    releaseSlowly(afterRelease);
   // From here on the queue may be gone.
   if (afterRelease) afterRelease();
 }
@@ -181,29 +181,28 @@ bool SerialQueue::Core::giveUp() {
                                        std::memory_order_relaxed);
 }
 
-// Runs the brief blocks that are next, and passes the queue on. Returns what to do then.
-Block SerialQueue::Core::releaseSlowly(Block afterRelease) noexcept {
+// Runs the brief blocks that are next, and passes the queue on. They add to what is to be done
+// then.
+void SerialQueue::Core::releaseSlowly(Block& afterRelease) noexcept {
   std::size_t mayRun = briefBlockLimit;
   do {
     std::optional<Block> block = passOn(mayRun);
-    if (!block) break;
+    if (!block) return;
     --mayRun;
     holder_.store(currentThreadID(), std::memory_order_relaxed);
     (*block)();
     block.reset();
     runBriefBlocks();
-    afterRelease = inTurn(std::move(afterRelease), std::move(afterRelease_));
+    append(afterRelease, std::move(afterRelease_));
   } while (!giveUp());
-  return afterRelease;
 }
 
 void SerialQueue::Core::runBriefBlocks() noexcept {
-  // A block may append others, and so move the list.
-  for (std::size_t i = 0; i < briefBlocks_.size(); ++i) {
-    Block block = std::move(briefBlocks_[i]);
+  while (briefBlock_) {
+    Block block = std::move(briefBlock_);
     block();
   }
-  briefBlocks_.clear();
+  briefBlockCount_ = 0;
 }
 
 // Gives the queue to whoever is next. The exception is a block that the calling thread may run:
@@ -252,12 +251,12 @@ SerialQueue::Core::Bits SerialQueue::Core::bitsOfLine() const {
          (line_.size() > blocksInLine_ ? waiting : 0);
 }
 
-void SerialQueue::Core::pushBlock(Block block, Runner runner) {
+void SerialQueue::Core::pushBlock(Block&& block, Runner runner) {
   line_.push_back({.block = std::move(block), .runner = runner, .waiter = nullptr});
   ++blocksInLine_;
 }
 
-void SerialQueue::Core::enqueue(Block block) {
+void SerialQueue::Core::enqueue(Block&& block) {
   {
     const std::lock_guard lock(mutex_);
     if (!startWorker())
@@ -268,11 +267,12 @@ void SerialQueue::Core::enqueue(Block block) {
   passOn(0);
 }
 
-void SerialQueue::Core::submit(Block block) {
+void SerialQueue::Core::submit(Block&& block) {
   const bool isInBlock = isCurrent();
   const bool isQueued = word_.load(std::memory_order_acquire) & queued;
-  if (isInBlock && !isQueued && briefBlocks_.size() < briefBlockLimit) {
-    briefBlocks_.push_back(std::move(block));
+  if (isInBlock && !isQueued && briefBlockCount_ < briefBlockLimit) {
+    append(briefBlock_, std::move(block));
+    ++briefBlockCount_;
     return;
   }
   if (isInBlock || !tryTake()) {
@@ -288,9 +288,9 @@ void SerialQueue::Core::submit(Block block) {
   release();
 }
 
-void SerialQueue::Core::afterRelease(Block block) {
+void SerialQueue::Core::afterRelease(Block&& block) {
   if (!isCurrent()) stop("Only a block of the queue may act after it", label_);
-  afterRelease_ = inTurn(std::move(afterRelease_), std::move(block));
+  append(afterRelease_, std::move(block));
 }
 
 void SerialQueue::Core::close() {
@@ -347,15 +347,15 @@ const std::string& SerialQueue::label() const {
   return core_->label();
 }
 
-void SerialQueue::async(Block block) {
+void SerialQueue::async(Block&& block) {
   core_->enqueue(std::move(block));
 }
 
-void SerialQueue::submit(Block block) {
+void SerialQueue::submit(Block&& block) {
   core_->submit(std::move(block));
 }
 
-void SerialQueue::afterRelease(Block block) {
+void SerialQueue::afterRelease(Block&& block) {
   core_->afterRelease(std::move(block));
 }
 
