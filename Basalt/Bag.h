@@ -61,9 +61,9 @@ class Bag final {
     return index;
   }
 
+  std::size_t count_ = 0;
   std::array<Element, 8> few_{};
   std::vector<Element> more_;  ///< What does not fit into `few_`, in order.
-  std::size_t count_ = 0;
 };
 
 }  // namespace Basalt

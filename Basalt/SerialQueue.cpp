@@ -6,12 +6,10 @@
 #include <cstdio>
 #include <cstdlib>
 #include <deque>
-#include <iterator>
 #include <mutex>
 #include <optional>
 #include <system_error>
 #include <thread>
-#include <vector>
 
 #include <fmt/format.h>
 
@@ -28,6 +26,18 @@ constexpr std::size_t briefBlockLimit = 16;
 [[noreturn]] void stop(const char* reason, const std::string& label) {
   fmt::print(stderr, "{} (queue {})\n", reason, label);
   std::abort();
+}
+
+/// Lets a block follow another, if there is one.
+void append(Block& first, Block&& second) {
+  if (!second) return;
+  if (first)
+    first = [first = std::move(first), second = std::move(second)]() mutable {
+      first();
+      second();
+    };
+  else
+    first = std::move(second);
 }
 
 /// Where a thread sleeps that waits for a queue. Shared, as the one that wakes it may still be
@@ -53,9 +63,7 @@ const std::shared_ptr<Waiter>& currentWaiter() {
 // orders.
 class SerialQueue::Core final {
  public:
-  Core(std::string label, QualityOfService quality) : label_(std::move(label)), quality_(quality) {
-    briefBlocks_.reserve(briefBlockLimit);
-  }
+  Core(std::string label, QualityOfService quality) : label_(std::move(label)), quality_(quality) {}
 
   [[nodiscard]] const std::string& label() const { return label_; }
   [[nodiscard]] bool isCurrent() const {
@@ -64,9 +72,9 @@ class SerialQueue::Core final {
 
   void acquire();
   void release() noexcept;
-  void enqueue(Block block);
-  void submit(Block block);
-  void afterRelease(Block block);
+  void enqueue(Block&& block);
+  void submit(Block&& block);
+  void afterRelease(Block&& block);
   void close();
 
  private:
@@ -84,9 +92,11 @@ class SerialQueue::Core final {
   };
 
   bool tryTake();
+  bool giveUp();
+  void releaseSlowly(Block& afterRelease) noexcept;
   bool takeOrMark(Bits mark);
   void acquireSlowly();
-  void pushBlock(Block block, Runner runner);
+  void pushBlock(Block&& block, Runner runner);
   Entry popFront();
   void runBriefBlocks() noexcept;
   std::optional<Block> passOn(std::size_t mayRun) noexcept;
@@ -94,14 +104,16 @@ class SerialQueue::Core final {
   void work();
   [[nodiscard]] Bits bitsOfLine() const;
 
-  const std::string label_;
-  const QualityOfService quality_;
   std::atomic<Bits> word_ = 0;
   std::atomic<ThreadID> holder_ = ThreadID::none;  ///< Set only while a block runs.
 
   // Owned by the holder.
-  std::vector<Block> briefBlocks_;
-  std::vector<Block> afterRelease_;
+  Block briefBlock_;  ///< What the block that runs has submitted, in turn.
+  std::size_t briefBlockCount_ = 0;
+  Block afterRelease_;
+
+  const std::string label_;
+  const QualityOfService quality_;
 
   std::mutex mutex_;  ///< Owns what follows.
   std::deque<Entry> line_;
@@ -153,36 +165,44 @@ void SerialQueue::Core::acquireSlowly() {
 }
 
 void SerialQueue::Core::release() noexcept {
-  std::vector<Block> afterRelease;
+  if (briefBlock_) runBriefBlocks();
+  Block afterRelease = std::move(afterRelease_);
+  if (!giveUp()) [[unlikely]]
+    releaseSlowly(afterRelease);
+  // From here on the queue may be gone.
+  if (afterRelease) afterRelease();
+}
+
+// Succeeds as long as nobody stands in line.
+bool SerialQueue::Core::giveUp() {
+  holder_.store(ThreadID::none, std::memory_order_relaxed);
+  Bits alone = held;
+  return word_.compare_exchange_strong(alone, 0, std::memory_order_release,
+                                       std::memory_order_relaxed);
+}
+
+// Runs the brief blocks that are next, and passes the queue on. They add to what is to be done
+// then.
+void SerialQueue::Core::releaseSlowly(Block& afterRelease) noexcept {
   std::size_t mayRun = briefBlockLimit;
-  for (;;) {
-    if (!briefBlocks_.empty()) runBriefBlocks();
-    if (!afterRelease_.empty()) {
-      std::move(afterRelease_.begin(), afterRelease_.end(), std::back_inserter(afterRelease));
-      afterRelease_.clear();
-    }
-    holder_.store(ThreadID::none, std::memory_order_relaxed);
-    Bits alone = held;
-    if (word_.compare_exchange_strong(alone, 0, std::memory_order_release,
-                                      std::memory_order_relaxed)) [[likely]]
-      break;
+  do {
     std::optional<Block> block = passOn(mayRun);
-    if (!block) break;
+    if (!block) return;
     --mayRun;
     holder_.store(currentThreadID(), std::memory_order_relaxed);
     (*block)();
-  }
-  // From here on the queue may be gone.
-  for (Block& block : afterRelease) block();
+    block.reset();
+    runBriefBlocks();
+    append(afterRelease, std::move(afterRelease_));
+  } while (!giveUp());
 }
 
 void SerialQueue::Core::runBriefBlocks() noexcept {
-  // A block may append others, and so move the list.
-  for (std::size_t i = 0; i < briefBlocks_.size(); ++i) {
-    Block block = std::move(briefBlocks_[i]);
+  while (briefBlock_) {
+    Block block = std::move(briefBlock_);
     block();
   }
-  briefBlocks_.clear();
+  briefBlockCount_ = 0;
 }
 
 // Gives the queue to whoever is next. The exception is a block that the calling thread may run:
@@ -231,12 +251,12 @@ SerialQueue::Core::Bits SerialQueue::Core::bitsOfLine() const {
          (line_.size() > blocksInLine_ ? waiting : 0);
 }
 
-void SerialQueue::Core::pushBlock(Block block, Runner runner) {
+void SerialQueue::Core::pushBlock(Block&& block, Runner runner) {
   line_.push_back({.block = std::move(block), .runner = runner, .waiter = nullptr});
   ++blocksInLine_;
 }
 
-void SerialQueue::Core::enqueue(Block block) {
+void SerialQueue::Core::enqueue(Block&& block) {
   {
     const std::lock_guard lock(mutex_);
     if (!startWorker())
@@ -247,11 +267,12 @@ void SerialQueue::Core::enqueue(Block block) {
   passOn(0);
 }
 
-void SerialQueue::Core::submit(Block block) {
+void SerialQueue::Core::submit(Block&& block) {
   const bool isInBlock = isCurrent();
   const bool isQueued = word_.load(std::memory_order_acquire) & queued;
-  if (isInBlock && !isQueued && briefBlocks_.size() < briefBlockLimit) {
-    briefBlocks_.push_back(std::move(block));
+  if (isInBlock && !isQueued && briefBlockCount_ < briefBlockLimit) {
+    append(briefBlock_, std::move(block));
+    ++briefBlockCount_;
     return;
   }
   if (isInBlock || !tryTake()) {
@@ -267,9 +288,9 @@ void SerialQueue::Core::submit(Block block) {
   release();
 }
 
-void SerialQueue::Core::afterRelease(Block block) {
+void SerialQueue::Core::afterRelease(Block&& block) {
   if (!isCurrent()) stop("Only a block of the queue may act after it", label_);
-  afterRelease_.push_back(std::move(block));
+  append(afterRelease_, std::move(block));
 }
 
 void SerialQueue::Core::close() {
@@ -326,15 +347,15 @@ const std::string& SerialQueue::label() const {
   return core_->label();
 }
 
-void SerialQueue::async(Block block) {
+void SerialQueue::async(Block&& block) {
   core_->enqueue(std::move(block));
 }
 
-void SerialQueue::submit(Block block) {
+void SerialQueue::submit(Block&& block) {
   core_->submit(std::move(block));
 }
 
-void SerialQueue::afterRelease(Block block) {
+void SerialQueue::afterRelease(Block&& block) {
   core_->afterRelease(std::move(block));
 }
 

@@ -47,16 +47,16 @@ class VARNEL_API SerialQueue final {
 
   /// Runs the block later on the queue's own thread, which the first call starts. Throws
   /// `std::system_error`, having done nothing, when the system grants no thread.
-  void async(Block block);
+  void async(Block&& block);
 
   /// Runs a brief block that takes no lock: at once if the queue is idle, otherwise on the thread
   /// that gives the queue up. From a block of the queue: as soon as that block has ended, before
   /// the queue is given up.
-  void submit(Block block);
+  void submit(Block&& block);
 
   /// From a block of the queue alone: runs `block` on this thread once the queue has been given
   /// up. Here belongs what wakes other threads, which would otherwise run into the queue.
-  void afterRelease(Block block);
+  void afterRelease(Block&& block);
 
   /// Whether the calling code runs in a block of this queue.
   [[nodiscard]] bool isCurrent() const;

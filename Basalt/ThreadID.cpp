@@ -7,7 +7,8 @@ namespace Basalt {
 namespace {
 
 std::atomic<std::uint64_t> lastID = 0;
-constinit thread_local ThreadID currentID = ThreadID::none;
+// Every grant of a lock asks for it: with this model that is a plain load.
+[[gnu::tls_model("initial-exec")]] constinit thread_local ThreadID currentID = ThreadID::none;
 
 }  // namespace
 

@@ -16,6 +16,9 @@ if(VARNEL_CCACHE AND NOT CMAKE_CXX_COMPILER_LAUNCHER)
   set(CMAKE_CXX_COMPILER_LAUNCHER "${VARNEL_CCACHE}")
 endif()
 
+# The library's own calls go to its own functions, and so may be inlined; see also its link options.
+add_compile_options(-fno-semantic-interposition)
+
 add_compile_options(-Wall -Wextra -Wpedantic -Wshadow -Wconversion)
 if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU" AND CMAKE_CXX_COMPILER_VERSION VERSION_LESS 13)
   # GCC 12 sees overlapping copies in plain assignments to strings (its bug 105651).

@@ -179,14 +179,13 @@ std::unique_ptr<DiskAccessingSession> DiskAccessManager::beginAccessingURL(
     const Platform::URL& url, std::string propose, Platform::QualityOfService qos,
     bool enableSecureScopedAccess, std::optional<Platform::TimeInterval> accessWaitingTimeout,
     const std::optional<Platform::URL>& volumeURL) {
-  std::optional<Platform::URL> volume = volumeURL;
-  if (!volume) {
-    const auto found = state_->volumes().volumeURL(url);
-    if (!found || !*found) return nullptr;
-    volume = *found;
-  }
-  return beginAccessingVolume(*volume, std::move(propose), url, qos, enableSecureScopedAccess,
-                              accessWaitingTimeout);
+  const auto begin = [&](const Platform::URL& volume) {
+    return beginAccessingVolume(volume, std::move(propose), url, qos, enableSecureScopedAccess,
+                                accessWaitingTimeout);
+  };
+  if (volumeURL) return begin(*volumeURL);
+  const auto found = state_->volumes().volumeURL(url);
+  return found && *found ? begin(**found) : nullptr;
 }
 
 std::unique_ptr<DiskAccessingSession> DiskAccessManager::beginAccessingVolume(

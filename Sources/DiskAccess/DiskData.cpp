@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/DiskAccess/DiskData.h>
 
+#include <algorithm>
 #include <utility>
 
 #include <Basalt/SerialQueue.h>
@@ -9,7 +10,7 @@
 namespace Varnel {
 namespace {
 
-std::size_t urgencyClassOf(Platform::QualityOfService qos) {
+int urgencyClassOf(Platform::QualityOfService qos) {
   switch (qos) {
     case Platform::QualityOfService::userInteractive:
       return 0;
@@ -28,20 +29,10 @@ std::size_t urgencyClassOf(Platform::QualityOfService qos) {
 
 DiskData::DiskData(std::shared_ptr<const OVDiskInfo> diskInfo, bool isBackgroundMode,
                    std::shared_ptr<Basalt::SerialQueue> queue)
-    : diskInfo_(std::move(diskInfo)),
-      queue_(std::move(queue)),
+    : queue_(std::move(queue)),
+      diskInfo_(std::move(diskInfo)),
+      limit_(diskInfo_->maxTreads()),
       isBackgroundMode_(isBackgroundMode) {}
-
-bool DiskData::hasFreePlace() const {
-  const std::int64_t limit = isBackgroundMode_ ? 1 : diskInfo_->maxTreads();
-  return static_cast<std::int64_t>(accessingThreads_.count()) < limit;
-}
-
-std::size_t DiskData::requestCount() const {
-  std::size_t count = 0;
-  for (const Requests& requests : requests_) count += requests.size();
-  return count;
-}
 
 std::shared_ptr<DiskData::AccessRequest> DiskData::requestAccess(Basalt::ThreadID thread,
                                                                  Platform::QualityOfService qos) {
@@ -49,14 +40,20 @@ std::shared_ptr<DiskData::AccessRequest> DiskData::requestAccess(Basalt::ThreadI
     accessingThreads_.insert(thread);
     return nullptr;
   }
-  return requests_[urgencyClassOf(qos)].emplace_back(std::make_shared<AccessRequest>());
+  auto request = std::make_shared<AccessRequest>(urgencyClassOf(qos));
+  const auto place = std::upper_bound(requests_.begin(), requests_.end(), request,
+                                      [](const auto& one, const auto& other) {
+                                        return one->urgencyClass() < other->urgencyClass();
+                                      });
+  requests_.insert(place, request);
+  return request;
 }
 
 void DiskData::releaseAccess(Basalt::ThreadID thread) {
   accessingThreads_.remove(thread);
   // A request can only join a full disk, whose next release sees it: without any now, there is
   // nothing that a pass could find.
-  if (requestCount() > 0)
+  if (!requests_.empty())
     queue_->submit([self = shared_from_this()] { self->grantPendingRequests(); });
 }
 
@@ -71,12 +68,8 @@ void DiskData::grantPendingRequests() {
 }
 
 DiskData::Requests DiskData::claimPendingRequests() {
-  Requests granted;
-  for (Requests& requests : requests_) {
-    for (std::shared_ptr<AccessRequest>& request : requests)
-      if (request->claim()) granted.push_back(std::move(request));
-    requests.clear();
-  }
+  Requests granted = std::exchange(requests_, {});
+  std::erase_if(granted, [](const auto& request) { return !request->claim(); });
   return granted;
 }
 

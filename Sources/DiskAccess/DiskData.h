@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <array>
 #include <atomic>
 #include <cstddef>
-#include <deque>
+#include <cstdint>
 #include <memory>
+#include <vector>
 
 #include <Basalt/Bag.h>
 #include <Basalt/Semaphore.h>
@@ -31,12 +31,18 @@ class VARNEL_API DiskData final : public std::enable_shared_from_this<DiskData> 
   /// request first settles its outcome: the granter, or the thread when its time is up.
   class AccessRequest final {
    public:
+    explicit AccessRequest(int urgencyClass) : urgencyClass_(urgencyClass) {}
+
+    /// 0 for the class of requests that is granted first.
+    [[nodiscard]] int urgencyClass() const { return urgencyClass_; }
+
     /// True for the first caller alone. Any thread.
     [[nodiscard]] bool claim() { return !flag_.test_and_set(std::memory_order_acq_rel); }
 
     Basalt::Semaphore sema;
 
    private:
+    const int urgencyClass_;
     std::atomic_flag flag_;
   };
 
@@ -68,7 +74,7 @@ class VARNEL_API DiskData final : public std::enable_shared_from_this<DiskData> 
   /// costs less to admit a few too many than to let a place stand empty while threads wake up.
   void grantPendingRequests();
 
-  using Requests = std::deque<std::shared_ptr<AccessRequest>>;
+  using Requests = std::vector<std::shared_ptr<AccessRequest>>;
 
   /// Empties the line: the requests that a pass grants, in the order in which it wakes their
   /// threads. Those whose thread has given up are dropped.
@@ -78,16 +84,19 @@ class VARNEL_API DiskData final : public std::enable_shared_from_this<DiskData> 
   [[nodiscard]] std::size_t accessCount() const { return accessingThreads_.count(); }
 
   /// How many requests stand in line, those included whose thread has given up.
-  [[nodiscard]] std::size_t requestCount() const;
+  [[nodiscard]] std::size_t requestCount() const { return requests_.size(); }
 
  private:
-  [[nodiscard]] bool hasFreePlace() const;
+  [[nodiscard]] bool hasFreePlace() const {
+    return static_cast<std::int64_t>(accessingThreads_.count()) < (isBackgroundMode_ ? 1 : limit_);
+  }
 
-  const std::shared_ptr<const OVDiskInfo> diskInfo_;
   const std::shared_ptr<Basalt::SerialQueue> queue_;
+  const std::shared_ptr<const OVDiskInfo> diskInfo_;
+  const std::int64_t limit_;  ///< Outside background mode.
   bool isBackgroundMode_;
+  Requests requests_;  ///< The line, by class and within a class in the order of coming.
   Basalt::Bag<Basalt::ThreadID> accessingThreads_;
-  std::array<Requests, 4> requests_;  ///< One line a class, the most urgent class first.
 };
 
 }  // namespace Varnel
