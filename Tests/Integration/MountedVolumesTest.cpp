@@ -1,8 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <fcntl.h>
 #include <gmock/gmock.h>
-#include <linux/loop.h>
-#include <sys/ioctl.h>
 
 #include <atomic>
 #include <cstdlib>
@@ -11,10 +8,10 @@
 
 #include <Platform/Linux/Adapters.h>
 #include <Platform/Linux/MountTable.h>
-#include <Platform/POSIX/FileDescriptor.h>
 #include <Platform/Ports/DeviceRegistry.h>
 #include <Platform/Ports/DiskArbitration.h>
 #include <Platform/Ports/VolumeCatalog.h>
+#include <Tests/Support/DiskImage.h>
 #include <Tests/Support/MountNamespace.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
@@ -50,43 +47,16 @@ class MountedVolumes : public testing::Test {
   std::unique_ptr<Platform::DiskArbitration> disks;
 };
 
-// A loop device over a file, detached when the last user has gone.
-class DiskImage {
- public:
-  explicit DiskImage(const std::filesystem::path& file) {
-    const Platform::POSIX::FileDescriptor control(::open("/dev/loop-control", O_RDWR | O_CLOEXEC));
-    const Platform::POSIX::FileDescriptor image(::open(file.c_str(), O_RDWR | O_CLOEXEC));
-    const int number = ::ioctl(control.get(), LOOP_CTL_GET_FREE);
-    if (number < 0) return;
-    const std::string node = "/dev/loop" + std::to_string(number);
-    device_ = Platform::POSIX::FileDescriptor(::open(node.c_str(), O_RDWR | O_CLOEXEC));
-    loop_config config{};
-    config.fd = static_cast<unsigned>(image.get());
-    config.info.lo_flags = LO_FLAGS_AUTOCLEAR;
-    if (::ioctl(device_.get(), LOOP_CONFIGURE, &config) == 0) name_ = node.substr(5);
-  }
-
-  [[nodiscard]] const std::string& name() const { return name_; }
-
- private:
-  Platform::POSIX::FileDescriptor device_;
-  std::string name_;
-};
-
 TEST_F(MountedVolumes, ADiskImageIsAnExternalDiskOfItsOwnWithAllItsPlaces) {
-  const auto file = folder.write("image", "");
-  std::filesystem::resize_file(file, 4 << 20);
-  if (std::system(("mkfs.ext4 -q -F '" + file.string() + "'").c_str()) != 0)
-    GTEST_SKIP() << "no mkfs.ext4";
-  const DiskImage image(file);
-  if (image.name().empty()) GTEST_SKIP() << "no loop devices";
+  const Tests::DiskImage image(folder.path() / "image");
+  if (image.name().empty()) GTEST_SKIP() << "no mkfs.ext4 or no loop devices";
 
   std::promise<URL> appeared;
   const auto subscription = catalog->subscribe([&](const VolumeChange& change) {
     if (change.kind == VolumeChange::Kind::mounted) appeared.set_value(change.volumeURL);
   });
   const auto first = makeFolder("first place");
-  ASSERT_EQ(::mount(("/dev/" + image.name()).c_str(), first.c_str(), "ext4", 0, nullptr), 0);
+  ASSERT_TRUE(image.mount(first));
   EXPECT_EQ(appeared.get_future().get(), volumeAt(first));
 
   const auto session = disks->openSession();
