@@ -6,19 +6,17 @@
 #include <unistd.h>
 
 #include <deque>
+#include <functional>
 #include <mutex>
 #include <optional>
 #include <utility>
 #include <vector>
 
-#include <Platform/Generic/UniqueHandle.h>
 #include <Platform/Linux/Adapters.h>
 #include <Platform/Linux/ContextDescriptor.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
-
-using Loop = UniqueHandle<GMainLoop*, g_main_loop_unref>;
 
 // Posts to GLib's default main context, which GTK, Qt and plain hosts all run. Every block has a
 // source of its own, so that a loop that a block runs inside itself still gets at the rest.
@@ -45,19 +43,18 @@ class DefaultContextQueue final : public MainQueue {
   bool isCurrent() const override { return ::syscall(SYS_gettid) == ::getpid(); }
 
   void run() override {
-    const Loop loop(g_main_loop_new(nullptr, FALSE));
-    running_.push_back(loop.get());
-    if (!std::exchange(stopsNextRun_, false)) g_main_loop_run(loop.get());
+    bool stops = std::exchange(stopsNextRun_, false);
+    running_.push_back(&stops);
+    runWhile([&stops] { return !stops; });
     running_.pop_back();
   }
 
   void stop() override {
-    post([this] {
-      if (running_.empty())
-        stopsNextRun_ = true;
-      else
-        g_main_loop_quit(running_.back());
-    });
+    post([this] { (running_.empty() ? stopsNextRun_ : *running_.back()) = true; });
+  }
+
+  void runWhile(const std::function<bool()>& condition) override {
+    while (condition()) g_main_context_iteration(nullptr, TRUE);
   }
 
   bool drain() override {
@@ -88,7 +85,7 @@ class DefaultContextQueue final : public MainQueue {
   std::mutex mutex_;  // Owns blocks_, of which there are as many as sources.
   std::deque<Block> blocks_;
   // The rest belongs to the main thread.
-  std::vector<GMainLoop*> running_;
+  std::vector<bool*> running_;  // Whether each run is to end, the innermost last.
   bool stopsNextRun_ = false;
   std::optional<ContextDescriptor> descriptor_;
 };

@@ -35,6 +35,10 @@ class VARNEL_API MainQueue {
   /// way. Any thread.
   virtual void stop() = 0;
 
+  /// Runs what is posted, and waits for more, as long as the condition holds; it is asked at first
+  /// and whenever something ran. Main thread only.
+  virtual void runWhile(const std::function<bool()>& condition) = 0;
+
   /// Runs what is posted until nothing is left, without waiting. True if there was anything. Main
   /// thread only.
   virtual bool drain() = 0;

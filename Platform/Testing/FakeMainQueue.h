@@ -3,6 +3,7 @@
 
 #include <condition_variable>
 #include <deque>
+#include <functional>
 #include <mutex>
 #include <thread>
 #include <utility>
@@ -32,10 +33,15 @@ class FakeMainQueue final : public MainQueue {
   }
 
   void run() override {
-    while (!std::exchange(stopped_, false)) {
-      std::unique_lock lock(mutex_);
-      posted_.wait(lock, [this] { return !blocks_.empty(); });
-      lock.unlock();
+    runWhile([this] { return !std::exchange(stopped_, false); });
+  }
+
+  void runWhile(const std::function<bool()>& condition) override {
+    while (condition()) {
+      {
+        std::unique_lock lock(mutex_);
+        posted_.wait(lock, [this] { return !blocks_.empty(); });
+      }
       runNext();
     }
   }

@@ -73,6 +73,15 @@ TEST_P(MainQueueContract, StopEndsTheInnermostRunBehindWhatWasPostedBefore) {
   queue->run();
 }
 
+TEST_P(MainQueueContract, RunsWhileAConditionHolds) {
+  int left = 3;
+  for (int i = 0; i < 5; ++i) queue->post([&] { --left; });
+  queue->runWhile([&] { return left > 0; });
+  EXPECT_LE(left, 0);
+  queue->drain();
+  EXPECT_EQ(left, -2);
+}
+
 TEST_P(MainQueueContract, TakesBlocksOfManyThreadsEachInItsOrder) {
   constexpr int threadCount = 4;
   constexpr int blockCount = 2000;
