@@ -2,6 +2,7 @@
 #include <Varnel/Paths/QNURLResolver.h>
 
 #include <algorithm>
+#include <utility>
 
 #include <Basalt/FileURLs.h>
 #include <Platform/Ports/Ports.h>
@@ -11,7 +12,6 @@ namespace Varnel {
 namespace {
 
 using Platform::PathComponents;
-using Platform::PathReader;
 using Platform::URL;
 
 constexpr std::string_view homeSign = "~";
@@ -23,20 +23,29 @@ void dropTrailingSlash(PathComponents& components) {
   if (components.size() > 1 && components.back() == "/") components.pop_back();
 }
 
-void append(std::string& path, PathReader rest) {
-  while (!rest.atEnd()) Platform::appendPathComponent(path, rest.next());
+// Whether joining the components of the path would give the path itself.
+bool isTidy(std::string_view path) {
+  // Without an early end the compiler compares many bytes at once.
+  bool hasRun = false;
+  for (std::size_t i = 1; i < path.size(); ++i) hasRun |= path[i - 1] == '/' && path[i] == '/';
+  return !hasRun && (path.size() < 2 || path.back() != '/');
 }
 
-// Paths are abbreviated by the thousand, so a text is never taken apart: this is
-// abbreviateComponents and the joining of its result in one walk. False, and nothing appended,
-// when the path does not start with the base.
-bool appendAbbreviated(std::string& text, PathReader path, const PathComponents& baseComponents,
-                       std::string_view sign) {
-  for (const std::string& component : baseComponents)
-    if (path.atEnd() || path.next() != component) return false;
+// What abbreviateComponents and joining give for a tidy path and the tidy path of a base. Lists
+// abbreviate paths by the thousand, so no component is ever made.
+std::optional<std::string> abbreviatedBelow(std::string_view path, std::string_view basePath,
+                                            std::string_view sign) {
+  if (!path.starts_with(basePath)) return std::nullopt;
+  std::string_view rest = path.substr(basePath.size());
+  const bool endsAComponent = basePath.empty() || basePath == rootSign || rest.empty();
+  if (!endsAComponent && rest.front() != '/') return std::nullopt;
+  if (rest.starts_with('/')) rest.remove_prefix(1);
+  std::string text;
+  text.reserve(sign.size() + rest.size() + 2);
   text += sign;
-  append(text, path);
-  return true;
+  if (!rest.empty() && sign != rootSign) text += '/';
+  text += rest;
+  return text;
 }
 
 std::string markedAsFolder(std::string path, bool isDirectory) {
@@ -46,13 +55,18 @@ std::string markedAsFolder(std::string path, bool isDirectory) {
 
 }  // namespace
 
-QNURLResolver::QNURLResolver(const URL& homeURL, const URL& rootURL)
-    : bases_(std::make_shared<const Bases>(Bases{
-          .homeURL = homeURL,
-          .rootURL = rootURL,
-          .homeComponents = Platform::pathComponents(homeURL),
-          .rootComponents = Platform::pathComponents(rootURL),
-      })) {}
+QNURLResolver::QNURLResolver(const URL& homeURL, const URL& rootURL) {
+  PathComponents home = Platform::pathComponents(homeURL);
+  PathComponents root = Platform::pathComponents(rootURL);
+  std::string homePath = Platform::joinPathComponents(home);
+  std::string rootPath = Platform::joinPathComponents(root);
+  bases_ = std::make_shared<const Bases>(Bases{.homeURL = homeURL,
+                                               .rootURL = rootURL,
+                                               .homeComponents = std::move(home),
+                                               .rootComponents = std::move(root),
+                                               .homePath = std::move(homePath),
+                                               .rootPath = std::move(rootPath)});
+}
 
 const QNURLResolver& QNURLResolver::shared() {
   static const QNURLResolver& resolver = *new QNURLResolver(
@@ -113,13 +127,13 @@ std::optional<std::string> QNURLResolver::abbreviatedPathForComponents(
 
 std::string QNURLResolver::abbreviatedPath(std::string_view path, bool isDirectory) const {
   if (path.empty()) return {};
-  std::string text;
-  text.reserve(path.size() + 2);
-  const PathReader reader(path);
-  if (!appendAbbreviated(text, reader, homeURLPathComponents(), homeSign) &&
-      !appendAbbreviated(text, reader, rootURLPathComponents(), rootSign))
-    append(text, reader);
-  return markedAsFolder(std::move(text), isDirectory);
+  if (path.size() > 1 && path.ends_with('/')) path.remove_suffix(1);
+  if (!isTidy(path))
+    return abbreviatedPath(Platform::joinPathComponents(Platform::pathComponents(path)),
+                           isDirectory);
+  auto text = abbreviatedBelow(path, bases_->homePath, homeSign);
+  if (!text) text = abbreviatedBelow(path, bases_->rootPath, rootSign);
+  return markedAsFolder(text ? *std::move(text) : std::string(path), isDirectory);
 }
 
 std::string QNURLResolver::abbreviatedPath(std::string_view path) const {

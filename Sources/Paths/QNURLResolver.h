@@ -107,6 +107,8 @@ class VARNEL_API QNURLResolver final {
     URL rootURL;
     PathComponents homeComponents;
     PathComponents rootComponents;
+    std::string homePath;
+    std::string rootPath;
   };
 
   std::shared_ptr<const Bases> bases_;
