@@ -25,27 +25,28 @@ void dropTrailingSlash(PathComponents& components) {
 
 // Whether joining the components of the path would give the path itself.
 bool isTidy(std::string_view path) {
-  // Without an early end the compiler compares many bytes at once.
-  bool hasRun = false;
-  for (std::size_t i = 1; i < path.size(); ++i) hasRun |= path[i - 1] == '/' && path[i] == '/';
-  return !hasRun && (path.size() < 2 || path.back() != '/');
+  // Without an early end, and on bytes, the compiler looks at sixteen at once.
+  unsigned char hasRun = 0;
+  for (std::size_t i = 1; i < path.size(); ++i)
+    hasRun |= static_cast<unsigned char>((path[i - 1] == '/') & (path[i] == '/'));
+  return hasRun == 0 && (path.size() < 2 || path.back() != '/');
 }
 
-// What abbreviateComponents and joining give for a tidy path and the tidy path of a base. Lists
-// abbreviate paths by the thousand, so no component is ever made.
-std::optional<std::string> abbreviatedBelow(std::string_view path, std::string_view basePath,
-                                            std::string_view sign) {
+// What follows a base in a path, both tidy: empty, or text from the slash on.
+std::optional<std::string_view> tailBelow(std::string_view path, std::string_view basePath) {
   if (!path.starts_with(basePath)) return std::nullopt;
-  std::string_view rest = path.substr(basePath.size());
-  const bool endsAComponent = basePath.empty() || basePath == rootSign || rest.empty();
-  if (!endsAComponent && rest.front() != '/') return std::nullopt;
-  if (rest.starts_with('/')) rest.remove_prefix(1);
-  std::string text;
-  text.reserve(sign.size() + rest.size() + 2);
-  text += sign;
-  if (!rest.empty() && sign != rootSign) text += '/';
-  text += rest;
-  return text;
+  if (basePath == "/") return path == "/" ? std::string_view() : path;
+  const std::string_view tail = path.substr(basePath.size());
+  if (!tail.empty() && tail.front() != '/') return std::nullopt;
+  return tail;
+}
+
+std::string concatenated(std::string_view sign, std::string_view tail) {
+  std::string path;
+  path.reserve(sign.size() + tail.size() + 1);  // A folder gets a slash.
+  path += sign;
+  path += tail;
+  return path;
 }
 
 std::string markedAsFolder(std::string path, bool isDirectory) {
@@ -128,12 +129,15 @@ std::optional<std::string> QNURLResolver::abbreviatedPathForComponents(
 std::string QNURLResolver::abbreviatedPath(std::string_view path, bool isDirectory) const {
   if (path.empty()) return {};
   if (path.size() > 1 && path.ends_with('/')) path.remove_suffix(1);
-  if (!isTidy(path))
-    return abbreviatedPath(Platform::joinPathComponents(Platform::pathComponents(path)),
-                           isDirectory);
-  auto text = abbreviatedBelow(path, bases_->homePath, homeSign);
-  if (!text) text = abbreviatedBelow(path, bases_->rootPath, rootSign);
-  return markedAsFolder(text ? *std::move(text) : std::string(path), isDirectory);
+  // Lists abbreviate paths by the thousand: mostly no component needs to be made.
+  if (!isTidy(path) || bases_->homePath.empty() || bases_->rootPath.empty())
+    return *abbreviatedPathForComponents(Platform::pathComponents(path), isDirectory);
+  if (const auto tail = tailBelow(path, bases_->homePath))
+    return markedAsFolder(concatenated(homeSign, *tail), isDirectory);
+  const auto tail = tailBelow(path, bases_->rootPath);
+  return markedAsFolder(
+      tail && tail->empty() ? std::string(rootSign) : concatenated({}, tail.value_or(path)),
+      isDirectory);
 }
 
 std::string QNURLResolver::abbreviatedPath(std::string_view path) const {
