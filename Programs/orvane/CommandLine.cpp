@@ -4,6 +4,8 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <memory>
+#include <string_view>
+#include <utility>
 #include <vector>
 
 #include <Varnel/Context/BuildSwitches.h>
