@@ -28,7 +28,7 @@ bool isTidy(std::string_view path) {
   // Without an early end, and on bytes, the compiler looks at sixteen at once.
   unsigned char hasRun = 0;
   for (std::size_t i = 1; i < path.size(); ++i)
-    hasRun |= static_cast<unsigned char>((path[i - 1] == '/') & (path[i] == '/'));
+    hasRun |= static_cast<unsigned char>(((path[i - 1] ^ '/') | (path[i] ^ '/')) == 0);
   return hasRun == 0 && (path.size() < 2 || path.back() != '/');
 }
 
