@@ -23,6 +23,8 @@ class UniqueHandle final {
   }
 
   [[nodiscard]] Handle get() const { return handle_; }
+  /// Gives the object away.
+  [[nodiscard]] Handle release() { return std::exchange(handle_, Handle()); }
   explicit operator bool() const { return static_cast<bool>(handle_); }
 
  private:

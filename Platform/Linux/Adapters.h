@@ -7,7 +7,10 @@ namespace Varnel::Platform {
 
 class DeviceRegistry;
 class DiskArbitration;
+class MainQueue;
 class ProcessInfo;
+class SoundPlayer;
+class SystemLog;
 class VolumeCatalog;
 class Workspace;
 
@@ -24,7 +27,9 @@ class MountTable;
 [[nodiscard]] std::unique_ptr<DeviceRegistry> makeDeviceRegistry();
 [[nodiscard]] std::unique_ptr<DiskArbitration> makeDiskArbitration(
     std::shared_ptr<MountTable> table);
+[[nodiscard]] std::unique_ptr<MainQueue> makeMainQueue();
 [[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo();
+[[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog);
 [[nodiscard]] std::unique_ptr<VolumeCatalog> makeVolumeCatalog(std::shared_ptr<MountTable> table);
 [[nodiscard]] std::unique_ptr<Workspace> makeWorkspace();
 

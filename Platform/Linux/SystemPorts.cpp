@@ -3,9 +3,11 @@
 #include <Platform/Ports/Clock.h>
 #include <Platform/Ports/DeviceRegistry.h>
 #include <Platform/Ports/DiskArbitration.h>
+#include <Platform/Ports/MainQueue.h>
 #include <Platform/Ports/Ports.h>
 #include <Platform/Ports/ProcessInfo.h>
 #include <Platform/Ports/SecurityScope.h>
+#include <Platform/Ports/SoundPlayer.h>
 #include <Platform/Ports/StandardOutput.h>
 #include <Platform/Ports/SystemLog.h>
 #include <Platform/Ports/UserAccount.h>
@@ -30,15 +32,18 @@ Port& keep(std::unique_ptr<Port> adapter) {
 const Ports& systemPorts() {
   // The adapters own it together, and they are kept.
   static const auto mountTable = Linux::makeMountTable();
+  static SystemLog& systemLog = keep(POSIX::makeSystemLog());
   static const Ports& ports = *new Ports{
       .appendFiles = keep(POSIX::makeAppendFiles()),
       .clock = keep(POSIX::makeClock()),
       .deviceRegistry = keep(Linux::makeDeviceRegistry()),
       .diskArbitration = keep(Linux::makeDiskArbitration(mountTable)),
+      .mainQueue = keep(Linux::makeMainQueue()),
       .processInfo = keep(Linux::makeProcessInfo()),
       .securityScope = keep(POSIX::makeSecurityScope()),
+      .soundPlayer = keep(Linux::makeSoundPlayer(systemLog)),
       .standardOutput = keep(POSIX::makeStandardOutput()),
-      .systemLog = keep(POSIX::makeSystemLog()),
+      .systemLog = systemLog,
       .userAccount = keep(POSIX::makeUserAccount()),
       .userLocale = keep(POSIX::makeUserLocale()),
       .volumeCatalog = keep(Linux::makeVolumeCatalog(mountTable)),

@@ -6,6 +6,7 @@
 #include <map>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <variant>
 #include <vector>
 
@@ -43,6 +44,12 @@ class PropertyValue final {
   template <typename Type>
   [[nodiscard]] const Type* as() const {
     return std::get_if<Type>(&storage_);
+  }
+
+  /// What `visitor` answers for the value as its own type.
+  template <typename Visitor>
+  decltype(auto) visit(Visitor&& visitor) const {
+    return std::visit(std::forward<Visitor>(visitor), storage_);
   }
 
   bool operator==(const PropertyValue&) const = default;

@@ -76,6 +76,18 @@ URL URL::fileURLWithPath(std::string_view path) {
   return URL(std::move(text));
 }
 
+std::optional<URL> URL::fileURLWithAbsoluteString(std::string_view text) {
+  if (!text.starts_with(fileScheme)) return std::nullopt;
+  std::string_view rest = text.substr(fileScheme.size());
+  if (rest.starts_with("///")) rest.remove_prefix(emptyAuthority.size());
+  const std::string path = percentDecoded(rest);
+  // No system has paths with a zero byte.
+  if (path.find('\0') != std::string::npos) return std::nullopt;
+  URL url = fileURLWithPath(path);
+  if (url.absoluteString() != text) return std::nullopt;
+  return url;
+}
+
 std::string_view URL::encodedPath() const {
   std::string_view rest = text_;
   rest.remove_prefix(fileScheme.size());

@@ -6,6 +6,7 @@
 #include <functional>
 #include <map>
 #include <memory>
+#include <optional>
 #include <string>
 #include <string_view>
 
@@ -26,6 +27,9 @@ class VARNEL_API URL final {
  public:
   /// The URL of a file system path. A trailing "/" marks a folder. A relative path stays relative.
   [[nodiscard]] static URL fileURLWithPath(std::string_view path);
+
+  /// The file URL whose `absoluteString()` is `text`; absent for any text that no file URL has.
+  [[nodiscard]] static std::optional<URL> fileURLWithAbsoluteString(std::string_view text);
 
   /// The whole text, percent-encoded.
   [[nodiscard]] const std::string& absoluteString() const { return text_; }

@@ -4,11 +4,16 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <memory>
+#include <string_view>
+#include <utility>
 #include <vector>
 
 #include <Varnel/Context/BuildSwitches.h>
 #include <orvane/DisksCommand.h>
+#include <orvane/MenuCommand.h>
+#include <orvane/PathCommand.h>
 #include <orvane/ScanCommand.h>
+#include <orvane/SoundCommand.h>
 
 namespace Orvane {
 namespace {
@@ -54,6 +59,7 @@ void addScan(CLI::App& app, Invocation& invocation) {
   options->add_flag("--json", command->isJSON, "Print one JSON object");
   options->add_flag("--progress", command->showsProgress,
                     "Show on the terminal how far the scan is");
+  options->add_flag("--sound", command->playsSound, "Play a sound at the end");
   options
       ->add_option_function<std::string>(
           "--qos", [scan = command](const std::string& name) { scan->qos = qualityNamed(name); },
@@ -65,6 +71,46 @@ void addDisks(CLI::App& app, Invocation& invocation) {
   auto [options, command] = addCommand<DisksCommand>(
       app, invocation, "disks", "List the disks, their kinds, limits and volumes");
   options->add_flag("--json", command->isJSON, "Print one JSON object");
+}
+
+void addMenu(CLI::App& app, Invocation& invocation) {
+  addCommand<MenuCommand>(app, invocation, "menu", "List the identifiers of the main menu's items");
+}
+
+void addPath(CLI::App& app, Invocation& invocation) {
+  auto [options, command] =
+      addCommand<PathCommand>(app, invocation, "path", "Show paths in their short form");
+  options->add_option("paths", command->paths, "The paths; a folder's ends with a slash")
+      ->type_name("PATH")
+      ->required();
+  options->add_flag("--expand", command->expands, "Show short forms in full");
+}
+
+Varnel::Sound::Case soundNamed(std::string_view name) {
+  using Sound = Varnel::Sound::Case;
+  static constexpr std::pair<std::string_view, Sound> sounds[] = {
+      {"tutorial", Sound::tutorial},
+      {"start", Sound::start},
+      {"scan-complete", Sound::scanComplete},
+      {"clean-complete", Sound::cleanComplete},
+      {"achievement-notification", Sound::achievementNotification},
+      {"rank-increased", Sound::rankIncreased},
+      {"purchase", Sound::purchase},
+  };
+  for (const auto& [known, sound] : sounds)
+    if (known == name) return sound;
+  throw CLI::ValidationError("NAME", "there is no sound \"" + std::string(name) + "\"");
+}
+
+void addSound(CLI::App& app, Invocation& invocation) {
+  auto [options, command] = addCommand<SoundCommand>(app, invocation, "sound", "Play a sound");
+  options
+      ->add_option_function<std::string>(
+          "name", [played = command](const std::string& name) { played->sound = soundNamed(name); },
+          "tutorial, start, scan-complete, clean-complete, achievement-notification, "
+          "rank-increased or purchase")
+      ->type_name("NAME")
+      ->required();
 }
 
 /// Gives the folders among the arguments of a scan such names that the parser takes them for what
@@ -94,6 +140,9 @@ std::variant<Invocation, Information, UsageError> parseCommandLine(int count,
   app.require_subcommand(0, 1);
   addScan(app, invocation);
   addDisks(app, invocation);
+  addMenu(app, invocation);
+  addPath(app, invocation);
+  addSound(app, invocation);
   std::vector<std::string> words(arguments + std::min(count, 1), arguments + count);
   protectFolders(words);
   std::reverse(words.begin(), words.end());  // as the parser wants them

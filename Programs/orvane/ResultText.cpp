@@ -6,6 +6,7 @@
 
 #include <Platform/Text/ByteCountFormatter.h>
 #include <Platform/Values/URL.h>
+#include <Varnel/Paths/QNURLResolver.h>
 #include <orvane/Scan/ScanResult.h>
 #include <orvane/VisibleText.h>
 
@@ -51,7 +52,8 @@ nlohmann::ordered_json jsonOf(const DuplicateGroup& group) {
 
 }  // namespace
 
-std::string textOf(const ScanResult& result, const ByteCountFormatter& byteCounts) {
+std::string textOf(const ScanResult& result, const ByteCountFormatter& byteCounts,
+                   const Varnel::QNURLResolver& paths) {
   const auto size = [&](std::uint64_t bytes) {
     return byteCounts.string(static_cast<std::int64_t>(bytes), ByteCountStyle::file);
   };
@@ -59,7 +61,8 @@ std::string textOf(const ScanResult& result, const ByteCountFormatter& byteCount
   for (const DuplicateGroup& group : result.groups) {
     text += std::to_string(group.paths.size()) + " files of " + size(group.size) + ", " +
             size(group.wastedBytes()) + " wasted\n";
-    for (const std::string& path : group.paths) text += "  " + visibleText(path) + "\n";
+    for (const std::string& path : group.paths)
+      text += "  " + visibleText(paths.abbreviatedPath(path)) + "\n";
     text += "\n";
   }
   return text + summary(result.totals, result.groups.size(), size(result.totals.wastedBytes));

@@ -3,6 +3,10 @@
 
 #include <string>
 
+namespace Varnel {
+class QNURLResolver;
+}
+
 namespace Varnel::Platform {
 class ByteCountFormatter;
 }
@@ -11,10 +15,11 @@ namespace Orvane {
 
 struct ScanResult;
 
-/// The result for people: each group's files, one path a line as `visibleText` shows it, and a
-/// summary.
+/// The result for people: each group's files, one path a line, abbreviated and as `visibleText`
+/// shows it, and a summary.
 [[nodiscard]] std::string textOf(const ScanResult& result,
-                                 const Varnel::Platform::ByteCountFormatter& byteCounts);
+                                 const Varnel::Platform::ByteCountFormatter& byteCounts,
+                                 const Varnel::QNURLResolver& paths);
 
 /// The result for programs: one JSON object on one line. Each of its "groups" has the "size" of a
 /// file in bytes and the "paths"; the totals stand beside them. Where a path is not UTF-8, which

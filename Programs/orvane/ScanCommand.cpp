@@ -13,6 +13,7 @@
 #include <Varnel/DiskAccess/DiskAccessManager.h>
 #include <Varnel/Logging/Logger.h>
 #include <Varnel/Logging/LoggingObject.h>
+#include <Varnel/Paths/QNURLResolver.h>
 #include <orvane/Console.h>
 #include <orvane/Interruption.h>
 #include <orvane/ManagedContentAccess.h>
@@ -21,6 +22,7 @@
 #include <orvane/Scan/DuplicateFinder.h>
 #include <orvane/Scan/FileSystem.h>
 #include <orvane/Scan/ScanObserver.h>
+#include <orvane/SoundCommand.h>
 #include <orvane/StandardStreams.h>
 
 namespace Orvane {
@@ -113,7 +115,11 @@ int ScanCommand::run(Console& console) const {
   log.log("Did find " + std::to_string(result.groups.size()) + " groups of duplicates among " +
           std::to_string(result.totals.files) + " files");
   const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.identifier());
-  return console.writeResult(isJSON ? jsonOf(result) : textOf(result, byteCounts)) ? 0 : 1;
+  const bool written = console.writeResult(
+      isJSON ? jsonOf(result) : textOf(result, byteCounts, Varnel::QNURLResolver::shared()));
+  // A machine without sound has done its work all the same.
+  if (playsSound) playToTheEnd(Varnel::Sound::scanComplete);
+  return written ? 0 : 1;
 }
 
 }  // namespace Orvane

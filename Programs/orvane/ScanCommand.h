@@ -16,6 +16,7 @@ struct ScanCommand {
   Varnel::Platform::QualityOfService qos = Varnel::Platform::QualityOfService::utility;
   bool isJSON = false;
   bool showsProgress = false;
+  bool playsSound = false;
 
   /// Runs the command and returns the program's exit status.
   [[nodiscard]] int run(Console& console) const;

@@ -192,6 +192,22 @@ TEST_F(Orvane, FailsWhenItsResultCannotBeWritten) {
   EXPECT_THAT(logText(), Not(HasSubstr("no duplicates"))) << "the log took the output's place";
 }
 
+TEST_F(Orvane, ShowsPathsAndTheMenu) {
+  EXPECT_EQ(run({"path", "--expand", "/usr//lib/", "docs/a"}).output, "/usr/lib\ndocs/a\n");
+  const std::string home = run({"path", "--expand", "~"}).output;
+  EXPECT_EQ(run({"path", home.substr(0, home.size() - 1) + "/Music/", "x"}).output,
+            "~/Music/\nx\n");
+  EXPECT_THAT(run({"menu"}).output, AllOf(StartsWith("main-menu.orvane.about\n"),
+                                          HasSubstr("\nmain-menu.duplicates.putBackAll\n")));
+}
+
+TEST_F(Orvane, PlaysTheFrameworksSoundsToTheirEnd) {
+  EXPECT_EQ(run({"sound", "purchase"}).status, 0);
+  const Outcome unknown = run({"sound", "applause"});
+  EXPECT_EQ(unknown.status, 2);
+  EXPECT_THAT(unknown.errors, HasSubstr("there is no sound \"applause\""));
+}
+
 TEST_F(Orvane, ListsTheDiskOfItsFiles) {
   const Outcome text = run({"disks"});
   EXPECT_EQ(text.status, 0);

@@ -1,0 +1,22 @@
+// SPDX-License-Identifier: MIT
+#include <Basalt/FileURLs.h>
+
+#include <filesystem>
+
+#include <Platform/Ports/UserAccount.h>
+
+namespace Basalt {
+
+using Varnel::Platform::URL;
+
+URL realHome(const Varnel::Platform::UserAccount& userAccount) {
+  return URL::fileURLWithPath(userAccount.realHomeFolder() + "/");
+}
+
+bool isDirectory(const URL& url) {
+  if (url.hasDirectoryPath()) return true;
+  std::error_code absent;
+  return std::filesystem::is_directory(url.path(), absent);
+}
+
+}  // namespace Basalt

@@ -1,0 +1,11 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Linux/GStreamer/Module.h>
+
+#include <Platform/Api.h>
+#include <Platform/Linux/GStreamer/Player.h>
+
+// Without an audio device the automatic sink keeps time all the same, in silence.
+extern "C" VARNEL_API Varnel::Platform::SoundPlayer* varnelMakeSoundPlayer() {
+  return new Varnel::Platform::GStreamer::Player(
+      [] { return gst_element_factory_make("autoaudiosink", nullptr); });
+}

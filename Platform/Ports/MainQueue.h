@@ -1,0 +1,53 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <functional>
+#include <optional>
+
+#include <Platform/Api.h>
+
+namespace Varnel::Platform {
+
+/// The queue of the main thread. Whatever touches notifications or sounds runs here.
+///
+///     mainQueue.post([this] { reload(); });  // from any thread
+///
+/// A host with a toolkit lets the toolkit's main loop run the blocks. One without calls `run`, or
+/// waits in a loop of its own until the descriptor is readable and then calls `drain`. Blocks must
+/// not throw.
+class VARNEL_API MainQueue {
+ public:
+  using Block = std::function<void()>;
+
+  virtual ~MainQueue() = default;
+
+  /// Runs `block` on the main thread, later: never within this call, and behind every block that
+  /// was posted before. Any thread.
+  virtual void post(Block block) = 0;
+
+  /// Whether the caller is on the main thread. Any thread.
+  [[nodiscard]] virtual bool isCurrent() const = 0;
+
+  /// Runs what is posted, and waits for more, until a `stop`. Main thread only.
+  virtual void run() = 0;
+
+  /// Ends the innermost `run` behind what has been posted before; the next one, if none is under
+  /// way. Any thread.
+  virtual void stop() = 0;
+
+  /// Runs what is posted, and waits for more, as long as the condition holds; it is asked at first
+  /// and whenever something ran. Main thread only.
+  virtual void runWhile(const std::function<bool()>& condition) = 0;
+
+  /// Runs what is posted until nothing is left, without waiting. True if there was anything. Main
+  /// thread only.
+  virtual bool drain() = 0;
+
+  /// A file descriptor that can be polled for reading and is readable when `drain` has something to
+  /// do, and now and then when it has not. To be asked for again before each poll: it takes in then
+  /// what is to be waited for. Stays the queue's. Absent where the system has no such thing. Main
+  /// thread only.
+  [[nodiscard]] virtual std::optional<int> descriptor() = 0;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <string>
+
+#include <Platform/Api.h>
+
+namespace Varnel::Platform {
+
+class PlayableSound;
+
+/// Is told when a sound has come to its end.
+class VARNEL_API SoundDelegate {
+ public:
+  virtual ~SoundDelegate() = default;
+
+  /// Called on the main queue, once a `play`, unless the sound was stopped before. `finished` is
+  /// false when it broke off or could not be played at all.
+  virtual void sound(PlayableSound& sound, bool finished) = 0;
+};
+
+/// A sound that is in memory and can be played. Main thread only. Letting go of the last reference
+/// stops it.
+class VARNEL_API PlayableSound {
+ public:
+  virtual ~PlayableSound() = default;
+
+  /// Whom to tell about the end. The sound does not keep it alive.
+  virtual void setDelegate(std::weak_ptr<SoundDelegate> delegate) = 0;
+
+  /// Starts the sound from its beginning and returns at once; nothing while it plays. Always comes
+  /// to an end, even without an audio device.
+  virtual void play() = 0;
+
+  /// Silence. The delegate hears nothing more of this `play`, even if its end was on the way.
+  virtual void stop() = 0;
+
+  [[nodiscard]] virtual bool isPlaying() const = 0;
+};
+
+/// Makes sounds that can be played. Main thread only.
+class VARNEL_API SoundPlayer {
+ public:
+  virtual ~SoundPlayer() = default;
+
+  /// The sound that a file with these bytes holds. Null when they are no sound, or when the machine
+  /// lacks what it takes to play any. Bytes that only begin like a sound are found out by playing.
+  [[nodiscard]] virtual std::shared_ptr<PlayableSound> load(std::string bytes) = 0;
+};
+
+}  // namespace Varnel::Platform

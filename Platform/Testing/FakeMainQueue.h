@@ -1,0 +1,79 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <condition_variable>
+#include <deque>
+#include <functional>
+#include <mutex>
+#include <thread>
+#include <utility>
+
+#include <Platform/Ports/MainQueue.h>
+
+namespace Varnel::Platform::Testing {
+
+/// A main queue that runs its blocks when the test says so. The thread that made it counts as the
+/// main thread.
+///
+///     FakeMainQueue queue;
+///     queue.post([&] { done = true; });
+///     queue.drain();
+class FakeMainQueue final : public MainQueue {
+ public:
+  void post(Block block) override {
+    {
+      const std::lock_guard lock(mutex_);
+      blocks_.push_back(std::move(block));
+    }
+    posted_.notify_one();
+  }
+
+  [[nodiscard]] bool isCurrent() const override {
+    return std::this_thread::get_id() == mainThread_;
+  }
+
+  void run() override {
+    runWhile([this] { return !std::exchange(stopped_, false); });
+  }
+
+  void runWhile(const std::function<bool()>& condition) override {
+    while (condition()) {
+      {
+        std::unique_lock lock(mutex_);
+        posted_.wait(lock, [this] { return !blocks_.empty(); });
+      }
+      runNext();
+    }
+  }
+
+  void stop() override {
+    post([this] { stopped_ = true; });
+  }
+
+  bool drain() override {
+    bool any = false;
+    while (runNext()) any = true;
+    return any;
+  }
+
+  [[nodiscard]] std::optional<int> descriptor() override { return std::nullopt; }
+
+ private:
+  bool runNext() {
+    std::unique_lock lock(mutex_);
+    if (blocks_.empty()) return false;
+    const Block block = std::move(blocks_.front());
+    blocks_.pop_front();
+    lock.unlock();
+    block();
+    return true;
+  }
+
+  const std::thread::id mainThread_ = std::this_thread::get_id();
+  std::mutex mutex_;  ///< Owns `blocks_`.
+  std::condition_variable posted_;
+  std::deque<Block> blocks_;
+  bool stopped_ = false;  ///< Main thread only.
+};
+
+}  // namespace Varnel::Platform::Testing

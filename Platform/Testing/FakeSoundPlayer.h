@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include <Platform/Ports/SoundPlayer.h>
+
+namespace Varnel::Platform::Testing {
+
+/// A sound that makes no noise and ends when the test says so.
+class FakeSound final : public PlayableSound {
+ public:
+  explicit FakeSound(std::string content) : bytes(std::move(content)) {}
+
+  const std::string bytes;
+  int timesStopped = 0;
+
+  void setDelegate(std::weak_ptr<SoundDelegate> delegate) override {
+    delegate_ = std::move(delegate);
+  }
+  void play() override { isPlaying_ = true; }
+  void stop() override {
+    if (std::exchange(isPlaying_, false)) ++timesStopped;
+  }
+  [[nodiscard]] bool isPlaying() const override { return isPlaying_; }
+
+  /// The sound comes to its end by itself; nothing unless it plays.
+  void end(bool finished = true) {
+    if (!std::exchange(isPlaying_, false)) return;
+    if (const auto delegate = delegate_.lock()) delegate->sound(*this, finished);
+  }
+
+ private:
+  std::weak_ptr<SoundDelegate> delegate_;
+  bool isPlaying_ = false;
+};
+
+/// A sound player that remembers what it loaded. It refuses the bytes "broken".
+class FakeSoundPlayer final : public SoundPlayer {
+ public:
+  std::vector<std::shared_ptr<FakeSound>> sounds;  ///< Every sound loaded, in order.
+
+  [[nodiscard]] std::shared_ptr<PlayableSound> load(std::string bytes) override {
+    if (bytes == "broken") return nullptr;
+    return sounds.emplace_back(std::make_shared<FakeSound>(std::move(bytes)));
+  }
+};
+
+}  // namespace Varnel::Platform::Testing

@@ -1,0 +1,48 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include <Platform/Api.h>
+#include <Platform/Values/PropertyValue.h>
+#include <Platform/Values/URL.h>
+
+namespace Varnel::Platform {
+
+/// Puts the parts of an object into an archive, each under a key. The archive is an XML property
+/// list: a dictionary with those keys. One thread at a time.
+///
+///     KeyedArchiver archiver;
+///     archiver.encode("homeURL", home);
+///     const std::string bytes = archiver.bytes();
+class VARNEL_API KeyedArchiver final {
+ public:
+  /// Keys are ASCII names of the program's own.
+  void encode(std::string key, const URL& fileURL);
+
+  /// The archive of all that was encoded so far.
+  [[nodiscard]] std::string bytes() const;
+
+ private:
+  PropertyDictionary values_;
+};
+
+/// Takes the parts out of an archive again. What the archive holds under a key is given out only if
+/// it is of the kind that is asked for, so that foreign or damaged bytes do no harm. Any thread.
+class VARNEL_API KeyedUnarchiver final {
+ public:
+  /// Absent when the bytes are no archive.
+  [[nodiscard]] static std::optional<KeyedUnarchiver> open(std::string_view bytes);
+
+  /// The file URL under `key`; absent when there is none.
+  [[nodiscard]] std::optional<URL> decodeURL(std::string_view key) const;
+
+ private:
+  explicit KeyedUnarchiver(PropertyDictionary values) : values_(std::move(values)) {}
+
+  PropertyDictionary values_;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,21 @@
+// SPDX-License-Identifier: MIT
+#include <orvane/PathCommand.h>
+
+#include <Varnel/Paths/QNURLResolver.h>
+#include <orvane/Console.h>
+#include <orvane/VisibleText.h>
+
+namespace Orvane {
+
+int PathCommand::run(Console& console) const {
+  const auto& resolver = Varnel::QNURLResolver::shared();
+  std::string text;
+  for (const std::string& path : paths) {
+    const std::string shown = expands ? resolver.expandedPathForPath(path).value_or(path)
+                                      : resolver.abbreviatedPath(path);
+    text += visibleText(shown) + "\n";
+  }
+  return console.writeResult(text) ? 0 : 1;
+}
+
+}  // namespace Orvane

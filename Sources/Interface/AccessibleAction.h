@@ -1,0 +1,31 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <utility>
+
+#include <Platform/Api.h>
+
+namespace Varnel {
+
+/// An action that is offered both as a button and as a menu item, and what interface automation
+/// finds either by:
+///
+///     const AccessibleAction remove("remove");
+///     remove.buttonIdentifier();    // "remove.button"
+///     remove.menuItemIdentifier();  // "remove.menu-item"
+///
+/// An immutable value. Any thread.
+class VARNEL_API AccessibleAction final {
+ public:
+  explicit AccessibleAction(std::string identifier) : identifier_(std::move(identifier)) {}
+
+  [[nodiscard]] const std::string& identifier() const { return identifier_; }
+  [[nodiscard]] std::string buttonIdentifier() const;
+  [[nodiscard]] std::string menuItemIdentifier() const;
+
+ private:
+  std::string identifier_;
+};
+
+}  // namespace Varnel

@@ -1,0 +1,56 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+#include <Platform/Api.h>
+
+namespace Varnel {
+
+/// One menu of the main menu: a base identifier, and items whose identifiers extend it. A group is
+/// written down by deriving from it, one member an item:
+///
+///     struct Edit final : MenuItemGroup {
+///       using MenuItemGroup::MenuItemGroup;
+///       const Item undo{*this, "undo"};
+///     };
+///     Edit edit("main-menu.edit");
+///     edit.undo();  // "main-menu.edit.undo"
+///
+/// Any thread once made. Neither copied nor moved: items belong to their group.
+class VARNEL_API MenuItemGroup {
+ public:
+  /// An item of a menu. Called, it gives its identifier; empty if the group's base is.
+  class VARNEL_API Item final {
+   public:
+    /// Enters the item into its group, behind those made before it. The name must last.
+    Item(MenuItemGroup& group, std::string_view name);
+    Item(const Item&) = delete;
+    Item& operator=(const Item&) = delete;
+
+    [[nodiscard]] std::string operator()() const;
+    [[nodiscard]] std::string_view name() const { return name_; }
+
+   private:
+    const MenuItemGroup& group_;
+    std::string_view name_;
+  };
+
+  explicit MenuItemGroup(std::string baseIdentifier) : baseIdentifier_(std::move(baseIdentifier)) {}
+  MenuItemGroup(const MenuItemGroup&) = delete;
+  MenuItemGroup& operator=(const MenuItemGroup&) = delete;
+
+  [[nodiscard]] const std::string& baseIdentifier() const { return baseIdentifier_; }
+
+  /// Every item, in the order of the menu.
+  [[nodiscard]] const std::vector<const Item*>& items() const { return items_; }
+
+ private:
+  std::string baseIdentifier_;
+  std::vector<const Item*> items_;
+};
+
+}  // namespace Varnel

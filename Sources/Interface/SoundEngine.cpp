@@ -1,0 +1,55 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Interface/SoundEngine.h>
+
+#include <fstream>
+#include <sstream>
+
+#include <Platform/Ports/Ports.h>
+
+namespace Varnel {
+namespace {
+
+// A file that cannot be read has no bytes, and no bytes are no sound.
+std::string bytesOfFile(const std::string& path) {
+  std::ostringstream bytes;
+  bytes << std::ifstream(path, std::ios::binary).rdbuf();
+  return std::move(bytes).str();
+}
+
+}  // namespace
+
+SoundEngine::SoundEngine()
+    : SoundEngine({.player = Platform::processPorts().soundPlayer,
+                   .path = [](Sound sound) { return sound.path(); }}) {}
+
+SoundEngine::SoundEngine(Ports ports)
+    // Only the life of the reference is shared, not that of the engine.
+    : ports_(std::move(ports)), delegate_(std::make_shared<char>(), this) {}
+
+SoundEngine::~SoundEngine() {
+  stop();
+}
+
+void SoundEngine::play(Sound sound) {
+  if (!soundsEnabled_) return;
+  stop();
+  const auto path = ports_.path(sound);
+  if (!path) return;
+  const auto loaded = ports_.player.load(bytesOfFile(*path));
+  if (!loaded) return;
+  loaded->setDelegate(delegate_);
+  loaded->play();
+  currentSound_ = loaded;
+}
+
+void SoundEngine::stop() {
+  if (!currentSound_) return;
+  if (currentSound_->isPlaying()) currentSound_->stop();
+  currentSound_.reset();
+}
+
+void SoundEngine::sound(Platform::PlayableSound&, bool) {
+  stop();
+}
+
+}  // namespace Varnel

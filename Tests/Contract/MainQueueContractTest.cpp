@@ -1,0 +1,135 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Ports/MainQueue.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <array>
+#include <chrono>
+#include <memory>
+#include <thread>
+#include <vector>
+
+#include <Platform/Linux/Adapters.h>
+#include <Platform/Testing/FakeMainQueue.h>
+#include <Tests/Support/DrainUntil.h>
+
+namespace Varnel::Platform {
+namespace {
+
+using ::testing::ElementsAre;
+
+struct Adapter {
+  const char* name;
+  std::unique_ptr<MainQueue> (*make)();
+};
+
+class MainQueueContract : public ::testing::TestWithParam<Adapter> {
+ protected:
+  const std::unique_ptr<MainQueue> queue = GetParam().make();
+};
+
+TEST_P(MainQueueContract, RunsBlocksLaterAndInOrderAlsoThoseThatBlocksPost) {
+  std::vector<int> ran;
+  queue->post([&] {
+    ran.push_back(1);
+    queue->post([&] { ran.push_back(3); });
+    EXPECT_EQ(ran.size(), 1u) << "posting from the main thread must not run the block at once";
+  });
+  queue->post([&] { ran.push_back(2); });
+  EXPECT_TRUE(ran.empty());
+  EXPECT_TRUE(queue->drain());
+  EXPECT_THAT(ran, ElementsAre(1, 2, 3));
+  EXPECT_FALSE(queue->drain());
+}
+
+TEST_P(MainQueueContract, ABlockThatDrainsRunsWhatWasPostedBehindIt) {
+  std::vector<int> ran;
+  queue->post([&] {
+    queue->drain();
+    ran.push_back(1);
+  });
+  queue->post([&] { ran.push_back(2); });
+  queue->drain();
+  EXPECT_THAT(ran, ElementsAre(2, 1));
+}
+
+TEST_P(MainQueueContract, StopEndsTheInnermostRunBehindWhatWasPostedBefore) {
+  std::vector<int> ran;
+  queue->post([&] {
+    queue->stop();
+    queue->run();
+    ran.push_back(1);
+  });
+  queue->post([&] {
+    ran.push_back(2);
+    queue->stop();
+  });
+  queue->run();
+  EXPECT_THAT(ran, ElementsAre(2, 1));
+  queue->stop();
+  queue->drain();
+  queue->run();
+}
+
+TEST_P(MainQueueContract, RunsWhileAConditionHolds) {
+  int left = 3;
+  for (int i = 0; i < 5; ++i) queue->post([&] { --left; });
+  queue->runWhile([&] { return left > 0; });
+  EXPECT_LE(left, 0);
+  queue->drain();
+  EXPECT_EQ(left, -2);
+}
+
+TEST_P(MainQueueContract, TakesBlocksOfManyThreadsEachInItsOrder) {
+  constexpr int threadCount = 4;
+  constexpr int blockCount = 2000;
+  std::array<std::vector<int>, threadCount> ran;
+  int finished = 0;
+  const auto postAll = [&](std::vector<int>& mine) {
+    EXPECT_FALSE(queue->isCurrent());
+    for (int i = 0; i < blockCount; ++i) queue->post([&mine, i] { mine.push_back(i); });
+    queue->post([&] {
+      EXPECT_TRUE(queue->isCurrent());
+      if (++finished == threadCount) queue->stop();
+    });
+  };
+  std::vector<std::jthread> threads;
+  for (auto& mine : ran) threads.emplace_back([&] { postAll(mine); });
+  queue->run();
+  for (const auto& mine : ran) {
+    EXPECT_EQ(mine.size(), static_cast<std::size_t>(blockCount));
+    EXPECT_TRUE(std::is_sorted(mine.begin(), mine.end()));
+  }
+}
+
+TEST_P(MainQueueContract, ItsDescriptorWakesAHostThatPolls) {
+  if (!queue->descriptor()) GTEST_SKIP() << "This queue has no descriptor";
+  queue->drain();
+  EXPECT_FALSE(Tests::isReadable(*queue->descriptor(), std::chrono::seconds(0)));
+  bool ran = false;
+  queue->post([&] { ran = true; });
+  EXPECT_TRUE(Tests::isReadable(*queue->descriptor(), std::chrono::seconds(0)));
+  queue->drain();
+  EXPECT_TRUE(ran);
+  EXPECT_FALSE(Tests::isReadable(*queue->descriptor(), std::chrono::seconds(0)));
+
+  // Also when the post comes while the host is polling already.
+  const int descriptor = *queue->descriptor();
+  std::jthread poster([&] { queue->post([&] { ran = false; }); });
+  EXPECT_TRUE(Tests::isReadable(descriptor, std::chrono::seconds(30)));
+  EXPECT_TRUE(Tests::drainUntil(*queue, [&] { return !ran; }));
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    , MainQueueContract,
+    ::testing::Values(Adapter{"Fake",
+                              []() -> std::unique_ptr<MainQueue> {
+                                return std::make_unique<Testing::FakeMainQueue>();
+                              }},
+                      Adapter{"System", &Linux::makeMainQueue}),
+    [](const auto& instance) { return instance.param.name; });
+
+}  // namespace
+}  // namespace Varnel::Platform

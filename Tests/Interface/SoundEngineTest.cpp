@@ -1,0 +1,119 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Interface/SoundEngine.h>
+
+#include <gtest/gtest.h>
+
+#include <map>
+
+#include <Platform/Testing/FakeSoundPlayer.h>
+#include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Context/Bundle.h>
+
+namespace Varnel {
+namespace {
+
+// An engine over a bundle in which Purchase.aiff is missing and RankIncreased.m4a is damaged.
+class SoundEngineTest : public ::testing::Test {
+ protected:
+  SoundEngineTest() {
+    for (const Sound sound : Sound::allValues())
+      if (sound != Sound::purchase) folder.write(sound.fileName(), sound.fileName());
+    folder.write("RankIncreased.m4a", "broken");
+  }
+
+  Platform::Testing::FakeSound& lastSound() { return *player.sounds.back(); }
+
+  const Tests::TemporaryFolder folder;
+  const Bundle bundle{folder.path().string(), {}};
+  Platform::Testing::FakeSoundPlayer player;
+  SoundEngine engine{
+      {.player = player, .path = [this](Sound sound) { return sound.path(bundle); }}};
+};
+
+TEST(Sound, HasPublishedValuesAndFiles) {
+  const std::map<int, std::string> fileNames = {{0, "Tutorial.m4a"},
+                                                {1, "Start.m4a"},
+                                                {2, "ScanComplete.m4a"},
+                                                {3, "CleanComplete.m4a"},
+                                                {4, "AchievementNotification.m4a"},
+                                                {5, "RankIncreased.m4a"},
+                                                {6, "Purchase.aiff"}};
+  for (int value = -1; value <= 7; ++value) {
+    const auto sound = Sound::withRawValue(value);
+    ASSERT_EQ(sound.has_value(), fileNames.contains(value)) << value;
+    EXPECT_EQ(sound ? sound->fileName() : "", sound ? fileNames.at(value) : "");
+  }
+  EXPECT_EQ(Sound::achievementNotification.rawValue(), 4);
+  EXPECT_EQ(std::hash<Sound>()(Sound::purchase), 6u);
+}
+
+TEST_F(SoundEngineTest, ANewSoundCutsOffTheOneBefore) {
+  engine.play(Sound::start);
+  Platform::Testing::FakeSound& first = lastSound();
+  EXPECT_EQ(engine.currentSound().get(), &first);
+  EXPECT_EQ(first.bytes, "Start.m4a");
+  EXPECT_TRUE(first.isPlaying());
+
+  engine.play(Sound::tutorial);
+  EXPECT_EQ(first.timesStopped, 1);
+  EXPECT_EQ(engine.currentSound().get(), &lastSound());
+  EXPECT_EQ(lastSound().bytes, "Tutorial.m4a");
+  first.end();
+  EXPECT_TRUE(engine.currentSound()) << "the end of a sound that was cut off means nothing";
+}
+
+TEST_F(SoundEngineTest, IsIdleAfterTheEndOrAStop) {
+  for (const bool finished : {true, false}) {
+    engine.play(Sound::start);
+    lastSound().end(finished);
+    EXPECT_FALSE(engine.currentSound());
+    EXPECT_EQ(lastSound().timesStopped, 0);
+  }
+  engine.play(Sound::start);
+  engine.stop();
+  EXPECT_FALSE(engine.currentSound());
+  EXPECT_EQ(lastSound().timesStopped, 1);
+  engine.stop();
+}
+
+TEST_F(SoundEngineTest, ASoundThatCannotBeLoadedStillEndsTheOneBefore) {
+  for (const Sound unplayable : {Sound::purchase, Sound::rankIncreased}) {
+    engine.play(Sound::start);
+    engine.play(unplayable);
+    EXPECT_FALSE(engine.currentSound());
+    EXPECT_FALSE(lastSound().isPlaying());
+  }
+  EXPECT_EQ(player.sounds.size(), 2u);
+}
+
+TEST_F(SoundEngineTest, MutingLeavesWhatPlaysAlone) {
+  engine.play(Sound::start);
+  engine.setSoundsEnabled(false);
+  engine.play(Sound::tutorial);
+  engine.play(Sound::purchase);
+  EXPECT_EQ(player.sounds.size(), 1u);
+  EXPECT_EQ(engine.currentSound().get(), &lastSound());
+  EXPECT_TRUE(lastSound().isPlaying());
+}
+
+TEST_F(SoundEngineTest, AnySoundsEndStopsTheCurrentOne) {
+  engine.play(Sound::start);
+  const auto other = player.load("of the host");
+  engine.setCurrentSound(other);
+  lastSound().play();
+  player.sounds.front()->end();
+  EXPECT_FALSE(engine.currentSound());
+  EXPECT_EQ(lastSound().timesStopped, 1);
+}
+
+TEST_F(SoundEngineTest, ASoundMayOutliveItsEngine) {
+  auto brief = std::make_unique<SoundEngine>(SoundEngine::Ports{
+      .player = player, .path = [this](Sound sound) { return sound.path(bundle); }});
+  brief->play(Sound::start);
+  brief->setCurrentSound(nullptr);
+  brief.reset();
+  lastSound().end();
+}
+
+}  // namespace
+}  // namespace Varnel

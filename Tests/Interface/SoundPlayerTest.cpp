@@ -1,0 +1,201 @@
+// SPDX-License-Identifier: MIT
+#include <gst/app/gstappsink.h>
+#include <gtest/gtest.h>
+#include <stdlib.h>
+
+#include <algorithm>
+#include <chrono>
+#include <cmath>
+#include <fstream>
+#include <mutex>
+#include <semaphore>
+#include <sstream>
+#include <vector>
+
+#include <Platform/Linux/Adapters.h>
+#include <Platform/Linux/GStreamer/Player.h>
+#include <Platform/Testing/CapturedOutput.h>
+#include <Tests/Support/DrainUntil.h>
+#include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Interface/SoundEngine.h>
+
+namespace Varnel {
+namespace {
+
+constexpr double rate = 44100;
+
+// What a sound was decoded to: one channel of samples from -1 to 1.
+class Recording {
+ public:
+  Recording() = default;
+
+  // The sink is not paced by a clock, so that a sound is over as soon as it is decoded.
+  GstElement* makeSink() {
+    GstElement* sink = gst_element_factory_make("appsink", nullptr);
+    GstCaps* form =
+        gst_caps_from_string("audio/x-raw,format=F32LE,layout=interleaved,channels=1,rate=44100");
+    g_object_set(sink, "sync", FALSE, "caps", form, nullptr);
+    gst_caps_unref(form);
+    GstAppSinkCallbacks callbacks{};
+    callbacks.new_sample = &Recording::take;
+    callbacks.eos = [](GstAppSink*, void* self) { static_cast<Recording*>(self)->ended.release(); };
+    gst_app_sink_set_callbacks(GST_APP_SINK(sink), &callbacks, this, nullptr);
+    return sink;
+  }
+
+  double seconds() {
+    const std::lock_guard lock(mutex_);
+    return static_cast<double>(samples_.size()) / rate;
+  }
+
+  double peak() {
+    const std::lock_guard lock(mutex_);
+    float highest = 0;
+    for (const float sample : samples_) highest = std::max(highest, std::abs(sample));
+    return highest;
+  }
+
+  // The root mean square in decibels below full scale.
+  double loudness() {
+    const std::lock_guard lock(mutex_);
+    double sum = 0;
+    for (const float sample : samples_) sum += static_cast<double>(sample) * sample;
+    return 10 * std::log10(sum / static_cast<double>(samples_.size()));
+  }
+
+  std::binary_semaphore ended{0};
+
+ private:
+  static GstFlowReturn take(GstAppSink* sink, void* self) {
+    GstSample* sample = gst_app_sink_pull_sample(sink);
+    GstMapInfo content;
+    gst_buffer_map(gst_sample_get_buffer(sample), &content, GST_MAP_READ);
+    auto& recording = *static_cast<Recording*>(self);
+    {
+      const std::lock_guard lock(recording.mutex_);
+      const auto* first = reinterpret_cast<const float*>(content.data);
+      recording.samples_.insert(recording.samples_.end(), first,
+                                first + content.size / sizeof(float));
+    }
+    gst_buffer_unmap(gst_sample_get_buffer(sample), &content);
+    gst_sample_unref(sample);
+    return GST_FLOW_OK;
+  }
+
+  std::mutex mutex_;  // Owns samples_, which the pipeline's thread adds to.
+  std::vector<float> samples_;
+};
+
+std::string bytesOf(Sound sound) {
+  std::ostringstream bytes;
+  bytes << std::ifstream(VARNEL_SOUNDS "/" + sound.fileName(), std::ios::binary).rdbuf();
+  return std::move(bytes).str();
+}
+
+// An engine whose sounds are recorded, one recording a sound played.
+class SoundPlayerTest : public ::testing::Test {
+ protected:
+  SoundPlayerTest() {
+    ::setenv("GST_REGISTRY", VARNEL_GSTREAMER_REGISTRY, 1);
+    // Whatever this machine has to play sounds on stays silent.
+    ::setenv("PULSE_SERVER", "unix:/nonexistent", 1);
+    ::setenv("PULSE_CLIENTCONFIG", "/dev/null", 1);
+  }
+
+  bool drainUntilIdle() {
+    return Tests::drainUntil(*mainQueue, [this] { return !engine.currentSound(); });
+  }
+
+  // The engine finds these bytes for every sound.
+  void putInPlace(const std::string& bytes) { path = folder.write("sound", bytes); }
+
+  const Tests::TemporaryFolder folder;
+  const std::unique_ptr<Platform::MainQueue> mainQueue = Platform::Linux::makeMainQueue();
+  std::optional<std::string> path;
+  std::vector<std::unique_ptr<Recording>> recordings;
+  Platform::GStreamer::Player player{
+      [this] { return recordings.emplace_back(std::make_unique<Recording>())->makeSink(); }};
+  SoundEngine engine{{.player = player, .path = [this](Sound sound) {
+                        return path ? *path : VARNEL_SOUNDS "/" + sound.fileName();
+                      }}};
+};
+
+TEST_F(SoundPlayerTest, EverySoundIsShortSmallAndAsLoudAsTheOthers) {
+  const std::pair<Sound, double> durations[] = {
+      {Sound::tutorial, 0.8},
+      {Sound::start, 1.5},
+      {Sound::scanComplete, 1.2},
+      {Sound::cleanComplete, 1.6},
+      {Sound::achievementNotification, 1.1},
+      {Sound::rankIncreased, 1.9},
+      {Sound::purchase, 0.8},
+  };
+  for (const auto& [sound, seconds] : durations) {
+    SCOPED_TRACE(sound.fileName());
+    EXPECT_LT(bytesOf(sound).size(), 40'000u);
+    engine.play(sound);
+    ASSERT_TRUE(engine.currentSound());
+    ASSERT_TRUE(drainUntilIdle());
+    EXPECT_NEAR(recordings.back()->seconds(), seconds, 0.06);
+    EXPECT_NEAR(recordings.back()->loudness(), -19, 2);
+    EXPECT_LT(recordings.back()->peak(), 0.9);
+  }
+}
+
+TEST_F(SoundPlayerTest, TheEndOfASoundThatWasCutOffNeverArrives) {
+  engine.play(Sound::tutorial);
+  const auto first = engine.currentSound();
+  // Its end is on the way to the main queue, which does not run meanwhile.
+  ASSERT_TRUE(recordings.front()->ended.try_acquire_for(std::chrono::seconds(30)));
+  engine.play(Sound::start);
+  EXPECT_FALSE(first->isPlaying());
+  ASSERT_TRUE(drainUntilIdle());
+  EXPECT_NEAR(recordings.back()->seconds(), 1.5, 0.06);
+}
+
+TEST_F(SoundPlayerTest, DamagedFilesAreSilent) {
+  const std::string whole = bytesOf(Sound::start);
+  std::string mangled = whole;
+  for (std::size_t i = 200; i < mangled.size(); i += 3) mangled[i] = static_cast<char>(i);
+  for (const std::string& bytes : {std::string("no sound at all"), std::string(), mangled,
+                                   whole.substr(0, 40), whole.substr(0, 600)}) {
+    SCOPED_TRACE(bytes.size());
+    putInPlace(bytes);
+    engine.play(Sound::start);
+    EXPECT_TRUE(drainUntilIdle());
+  }
+}
+
+TEST_F(SoundPlayerTest, ATruncatedFileEndsEarly) {
+  const std::string whole = bytesOf(Sound::start);
+  putInPlace(whole.substr(0, whole.size() * 2 / 3));
+  engine.play(Sound::start);
+  ASSERT_TRUE(drainUntilIdle());
+  EXPECT_GT(recordings.back()->seconds(), 0.5);
+  EXPECT_LT(recordings.back()->seconds(), 1.3);
+}
+
+TEST_F(SoundPlayerTest, AMachineThatCannotPlayStillComesToTheEnd) {
+  Platform::GStreamer::Player silent([]() -> GstElement* { return nullptr; });
+  SoundEngine mute(
+      {.player = silent, .path = [](Sound sound) { return VARNEL_SOUNDS "/" + sound.fileName(); }});
+  mute.play(Sound::start);
+  EXPECT_TRUE(mute.currentSound());
+  EXPECT_TRUE(Tests::drainUntil(*mainQueue, [&] { return !mute.currentSound(); }));
+}
+
+TEST_F(SoundPlayerTest, TheModuleIsFoundAndPlaysToTheEndWithoutAnAudioDevice) {
+  Platform::Testing::CapturedSystemLog systemLog;
+  const auto system = Platform::Linux::makeSoundPlayer(systemLog);
+  EXPECT_EQ(system->load("no sound at all"), nullptr);
+  SoundEngine real({.player = *system,
+                    .path = [](Sound sound) { return VARNEL_SOUNDS "/" + sound.fileName(); }});
+  real.play(Sound::purchase);
+  ASSERT_TRUE(real.currentSound());
+  EXPECT_TRUE(real.currentSound()->isPlaying());
+  EXPECT_TRUE(Tests::drainUntil(*mainQueue, [&] { return !real.currentSound(); }));
+  EXPECT_EQ(systemLog.text(), "");
+}
+
+}  // namespace
+}  // namespace Varnel
