@@ -2,12 +2,17 @@
 #pragma once
 
 #include <memory>
+#include <string>
 
 namespace Varnel::Platform {
 
 class DeviceRegistry;
 class DiskArbitration;
+class ExtendedAttributes;
+class MachineIdentity;
 class ProcessInfo;
+class ProcessLauncher;
+class UserDefaults;
 class VolumeCatalog;
 class Workspace;
 
@@ -24,7 +29,12 @@ class MountTable;
 [[nodiscard]] std::unique_ptr<DeviceRegistry> makeDeviceRegistry();
 [[nodiscard]] std::unique_ptr<DiskArbitration> makeDiskArbitration(
     std::shared_ptr<MountTable> table);
+[[nodiscard]] std::unique_ptr<ExtendedAttributes> makeExtendedAttributes();
+/// `root` is the folder below which /etc, /proc and /sys lie.
+[[nodiscard]] std::unique_ptr<MachineIdentity> makeMachineIdentity(const std::string& root = "/");
 [[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo();
+[[nodiscard]] std::unique_ptr<ProcessLauncher> makeProcessLauncher();
+[[nodiscard]] std::unique_ptr<UserDefaults> makeUserDefaults();
 [[nodiscard]] std::unique_ptr<VolumeCatalog> makeVolumeCatalog(std::shared_ptr<MountTable> table);
 [[nodiscard]] std::unique_ptr<Workspace> makeWorkspace();
 

@@ -7,13 +7,18 @@ namespace Varnel::Platform {
 
 class AppendFiles;
 class Clock;
+class CookieStorage;
 class DeviceRegistry;
 class DiskArbitration;
+class ExtendedAttributes;
+class MachineIdentity;
 class ProcessInfo;
+class ProcessLauncher;
 class SecurityScope;
 class StandardOutput;
 class SystemLog;
 class UserAccount;
+class UserDefaults;
 class UserLocale;
 class VolumeCatalog;
 class Workspace;
@@ -22,13 +27,18 @@ class Workspace;
 struct Ports {
   AppendFiles& appendFiles;
   Clock& clock;
+  CookieStorage& cookieStorage;
   DeviceRegistry& deviceRegistry;
   DiskArbitration& diskArbitration;
+  ExtendedAttributes& extendedAttributes;
+  MachineIdentity& machineIdentity;
   ProcessInfo& processInfo;
+  ProcessLauncher& processLauncher;
   SecurityScope& securityScope;
   StandardOutput& standardOutput;
   SystemLog& systemLog;
   UserAccount& userAccount;
+  UserDefaults& userDefaults;
   UserLocale& userLocale;
   VolumeCatalog& volumeCatalog;
   Workspace& workspace;
