@@ -40,8 +40,8 @@ class VARNEL_API URL final {
   /// The same for a text that may be relative to `base`; the answer is the URL that the two make.
   [[nodiscard]] static std::optional<URL> parse(std::string_view text, const URL& base);
 
-  /// The URL of a page from its parts: the path decoded, the query encoded. Absent when they make
-  /// no URL; a path that is not empty begins with "/".
+  /// The URL of a page from its parts: the path decoded, the query encoded and left out when
+  /// empty. Absent when they make no URL; a path that is not empty begins with "/".
   [[nodiscard]] static std::optional<URL> withParts(std::string_view scheme, std::string_view host,
                                                     std::string_view path,
                                                     std::string_view encodedQuery);

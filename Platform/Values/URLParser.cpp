@@ -119,7 +119,7 @@ std::optional<URL> URL::withParts(std::string_view scheme, std::string_view host
   parts.scheme = scheme;
   parts.host = host;
   parts.path = encodedPath;
-  parts.query = encodedQuery;
+  if (!encodedQuery.empty()) parts.query = encodedQuery;
   if (!isWellFormed(parts)) return std::nullopt;
   return URL(repaired(parts, parts.host->size() + encodedPath.size() + encodedQuery.size()));
 }
