@@ -16,6 +16,8 @@ set(VARNEL_APP_DISPLAY_VERSION "${PROJECT_VERSION}" CACHE STRING
 set(VARNEL_APP_ARRANGE_VERSION "${VARNEL_APP_DISPLAY_VERSION}" CACHE STRING
     "The application's version as compared with others")
 
+set(VARNEL_COOKIE_DOMAIN ".quennel.example" CACHE STRING
+    "The domain of the vendor's web-analytics cookie, with its leading dot")
 set(VARNEL_REDIRECT_HOST "links.quennel.example" CACHE STRING
     "Host of the service that links go through")
 
