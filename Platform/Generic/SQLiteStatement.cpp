@@ -49,8 +49,7 @@ void SQLiteStatement::reset() {
 std::optional<std::string_view> SQLiteStatement::text(int index) {
   const unsigned char* text = ::sqlite3_column_text(statement_.get(), index);
   if (!text) return std::nullopt;
-  const int length = ::sqlite3_column_bytes(statement_.get(), index);
-  return std::string_view(reinterpret_cast<const char*>(text), static_cast<std::size_t>(length));
+  return reinterpret_cast<const char*>(text);
 }
 
 std::optional<std::int64_t> SQLiteStatement::integer(int index) {

@@ -40,7 +40,8 @@ class SQLiteStatement final {
   void reset();
 
   /// The column at `index`, counted from 0, of the row just fetched. Text is whatever bytes the
-  /// file holds, not always UTF-8. Absent for NULL and for a column that is not there.
+  /// file holds up to the first zero, not always UTF-8. Absent for NULL and for a column that is
+  /// not there.
   [[nodiscard]] std::optional<std::string_view> text(int index);
   [[nodiscard]] std::optional<std::int64_t> integer(int index);
 

@@ -24,13 +24,17 @@ using Varnel::KVQuarantine;
 using Varnel::KVQuarantineEntry;
 using Text = std::optional<std::string>;
 
+Text owned(KVQuarantineEntry::Text text) {
+  return text ? Text(*text) : std::nullopt;
+}
+
 FactList factsOfThisProgram() {
   const auto tracker = Varnel::KVDownloadSourceTracker::sharedTracker();
   const auto entry = tracker->installSourceEntry();
   FactList facts;
   facts.add("database", "database", tracker->quarantine()->path());
-  facts.add("eventIdentifier", "event", entry ? entry->eventIdentifier() : std::nullopt);
-  facts.add("dataURL", "downloaded from", entry ? entry->dataURLString() : std::nullopt);
+  facts.add("eventIdentifier", "event", entry ? owned(entry->eventIdentifier()) : std::nullopt);
+  facts.add("dataURL", "downloaded from", entry ? owned(entry->dataURLString()) : std::nullopt);
   return facts;
 }
 
@@ -49,7 +53,7 @@ Text dataURLOf(const Text& eventIdentifier) {
   const auto found = std::find_if(entries.begin(), entries.end(), [&](const auto& entry) {
     return entry.eventIdentifier() == eventIdentifier;
   });
-  return found == entries.end() ? std::nullopt : found->dataURLString();
+  return found == entries.end() ? std::nullopt : owned(found->dataURLString());
 }
 
 FactList factsOfFile(const std::string& file) {

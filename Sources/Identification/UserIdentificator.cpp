@@ -70,7 +70,8 @@ std::optional<std::string> UserIdentificator::downloadSourceURLString() const {
       KVQuarantine::systemQuarantinePathV2(ports_.userAccount), ports_.downloadSource.systemLog);
   const KVDownloadSourceTracker tracker(std::move(quarantine), {}, ports_.downloadSource);
   const auto entry = tracker.installSourceEntry();
-  return entry ? entry->dataURLString() : std::nullopt;
+  const auto url = entry ? entry->dataURLString() : std::nullopt;
+  return url ? Text(*url) : std::nullopt;
 }
 
 std::optional<std::string> UserIdentificator::downloadSourceURLCid() const {

@@ -10,6 +10,7 @@
 #include <Platform/Ports/SystemLog.h>
 #include <Platform/Ports/UserAccount.h>
 #include <Platform/Text/UTF8.h>
+#include <Varnel/Provenance/DownloadList.h>
 
 namespace Varnel {
 namespace {
@@ -34,14 +35,10 @@ std::vector<std::string> split(std::string_view text, char separator) {
   }
 }
 
-KVQuarantineEntry::Text textIn(SQLiteStatement& row, int column) {
+std::optional<std::string_view> textIn(SQLiteStatement& row, int column) {
   const auto bytes = row.text(column);
   if (!bytes || !Platform::isValidUTF8(*bytes)) return std::nullopt;
-  return std::string(*bytes);
-}
-
-KVQuarantineEntry::Text orEmpty(KVQuarantineEntry::Text text) {
-  return text ? std::move(text) : std::string();
+  return bytes;
 }
 
 }  // namespace
@@ -90,22 +87,19 @@ std::optional<std::vector<std::string>> KVQuarantine::quarantineXATTRsForPath(
 }
 
 std::vector<KVQuarantineEntry> KVQuarantine::entries() const {
-  std::vector<KVQuarantineEntry> entries;
   auto database = Platform::SQLiteDatabase::open(path_);
   if (!database) {
     systemLog_.write("Failed to open database!");
-    return entries;
+    return {};
   }
   auto rows = database->prepare("SELECT * FROM LSQuarantineEvent");
-  if (!rows) return entries;
+  if (!rows) return {};
+  DownloadList downloads;
   while (true) {
     const auto step = rows->step();
-    if (!step || *step == SQLiteStatement::Step::done) return entries;
-    auto dataURL = textIn(*rows, dataURLColumn);
-    if (!dataURL) continue;
-    entries.emplace_back(orEmpty(textIn(*rows, eventIdentifierColumn)), std::nullopt, std::nullopt,
-                         0.0, std::move(dataURL), std::nullopt, std::nullopt, 0, std::nullopt,
-                         std::nullopt, std::nullopt);
+    if (!step || *step == SQLiteStatement::Step::done) return downloads.take();
+    const auto dataURL = textIn(*rows, dataURLColumn);
+    if (dataURL) downloads.add(textIn(*rows, eventIdentifierColumn).value_or(""), *dataURL);
   }
 }
 

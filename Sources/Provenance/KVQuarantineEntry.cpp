@@ -1,46 +1,45 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Provenance/KVQuarantineEntry.h>
 
-#include <string_view>
-#include <utility>
-
 #include <Varnel/Provenance/LenientNumbers.h>
+#include <Varnel/Provenance/QuarantineRecord.h>
 
 namespace Varnel {
+namespace {
 
-using Platform::PropertyDictionary;
 using Platform::PropertyValue;
+using OwnText = std::optional<std::string>;
 
-struct KVQuarantineEntry::Details {
-  Text agentBundleIdentifier;
-  Text agentName;
-  Text senderAddress;
-  Text originTitle;
-  Text originURLString;
-  std::optional<PropertyValue> originAlias;
+OwnText copied(KVQuarantineEntry::Text text) {
+  return text ? OwnText(*text) : std::nullopt;
+}
 
-  [[nodiscard]] bool isEmpty() const {
-    return !agentBundleIdentifier && !agentName && !senderAddress && !originTitle &&
-           !originURLString && !originAlias;
-  }
-};
+}  // namespace
 
 KVQuarantineEntry::KVQuarantineEntry(Text eventIdentifier, Text agentBundleIdentifier,
                                      Text agentName, double timestamp, Text dataURLString,
                                      Text /*senderName*/, Text senderAddress, std::int64_t type,
                                      Text originTitle, Text originURLString,
-                                     std::optional<PropertyValue> originAlias)
-    : eventIdentifier_(std::move(eventIdentifier)),
-      dataURLString_(std::move(dataURLString)),
-      timestamp_(timestamp),
-      type_(type) {
-  Details details{std::move(agentBundleIdentifier), std::move(agentName),
-                  std::move(senderAddress),         std::move(originTitle),
-                  std::move(originURLString),       std::move(originAlias)};
-  if (!details.isEmpty()) details_ = std::make_shared<const Details>(std::move(details));
+                                     std::optional<PropertyValue> originAlias) {
+  struct OwningRecord : Record {
+    OwnText ownEventIdentifier;
+    OwnText ownDataURLString;
+  };
+  auto record = std::make_shared<OwningRecord>();
+  record->ownEventIdentifier = copied(eventIdentifier);
+  record->ownDataURLString = copied(dataURLString);
+  record->eventIdentifier = record->ownEventIdentifier;
+  record->dataURLString = record->ownDataURLString;
+  record->timestamp = timestamp;
+  record->type = type;
+  record->details = std::make_unique<const Details>(
+      Details{copied(agentBundleIdentifier), copied(agentName), copied(senderAddress),
+              copied(originTitle), copied(originURLString), std::move(originAlias)});
+  record_ = std::move(record);
 }
 
-KVQuarantineEntry KVQuarantineEntry::entryWithDictionary(const PropertyDictionary& dictionary) {
+KVQuarantineEntry KVQuarantineEntry::entryWithDictionary(
+    const Platform::PropertyDictionary& dictionary) {
   const auto text = [&](std::string_view key) -> Text {
     const auto* value = Platform::findAs<std::string>(dictionary, key);
     if (!value) return std::nullopt;
@@ -60,22 +59,34 @@ KVQuarantineEntry KVQuarantineEntry::entryWithDictionary(const PropertyDictionar
 
 const KVQuarantineEntry::Details& KVQuarantineEntry::details() const {
   static const Details none;
-  return details_ ? *details_ : none;
+  return record_->details ? *record_->details : none;
 }
 
-const KVQuarantineEntry::Text& KVQuarantineEntry::agentBundleIdentifier() const {
+KVQuarantineEntry::Text KVQuarantineEntry::eventIdentifier() const {
+  return record_->eventIdentifier;
+}
+KVQuarantineEntry::Text KVQuarantineEntry::agentBundleIdentifier() const {
   return details().agentBundleIdentifier;
 }
-const KVQuarantineEntry::Text& KVQuarantineEntry::agentName() const {
+KVQuarantineEntry::Text KVQuarantineEntry::agentName() const {
   return details().agentName;
 }
-const KVQuarantineEntry::Text& KVQuarantineEntry::senderAddress() const {
+double KVQuarantineEntry::timestamp() const {
+  return record_->timestamp;
+}
+KVQuarantineEntry::Text KVQuarantineEntry::dataURLString() const {
+  return record_->dataURLString;
+}
+KVQuarantineEntry::Text KVQuarantineEntry::senderAddress() const {
   return details().senderAddress;
 }
-const KVQuarantineEntry::Text& KVQuarantineEntry::originTitle() const {
+std::int64_t KVQuarantineEntry::type() const {
+  return record_->type;
+}
+KVQuarantineEntry::Text KVQuarantineEntry::originTitle() const {
   return details().originTitle;
 }
-const KVQuarantineEntry::Text& KVQuarantineEntry::originURLString() const {
+KVQuarantineEntry::Text KVQuarantineEntry::originURLString() const {
   return details().originURLString;
 }
 const std::optional<PropertyValue>& KVQuarantineEntry::originAlias() const {

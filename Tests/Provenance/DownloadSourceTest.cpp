@@ -80,7 +80,7 @@ class DownloadSource : public testing::Test {
         {Platform::processPorts().extendedAttributes, processInfo,
          Platform::processPorts().processLauncher, log, userDefaults, volumes});
     const auto entry = tracker.installSourceEntry();
-    return entry ? entry->eventIdentifier().value_or("?") : "none";
+    return entry ? std::string(entry->eventIdentifier().value_or("?")) : "none";
   }
 
   const Tests::TemporaryFolder folder;
@@ -243,7 +243,7 @@ TEST(DownloadSourceFilters, TheNewestIsTakenAndOfEquallyNewOnesTheFirst) {
   const std::vector entries = {entry("a", 1), entry("b", 3), entry("c", 3), entry("d", 2)};
   const auto all = [](const auto&) { return true; };
   EXPECT_EQ(filterEvent(entries, all)->eventIdentifier(), "b");
-  EXPECT_EQ(filterEvent(entries, [](const auto&) { return false; }), std::nullopt);
+  EXPECT_FALSE(filterEvent(entries, [](const auto&) { return false; }));
 }
 
 TEST(SharedTracker, IsOneAndHoldsWhatClientsNeed) {

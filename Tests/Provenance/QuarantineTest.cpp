@@ -30,8 +30,8 @@ using Fields = std::vector<std::string>;
 Fields summaryOf(const std::vector<KVQuarantineEntry>& entries) {
   Fields lines;
   for (const auto& entry : entries)
-    lines.push_back(entry.eventIdentifier().value_or("?") + " " +
-                    entry.dataURLString().value_or("?"));
+    lines.push_back(std::string(entry.eventIdentifier().value_or("?")) + " " +
+                    std::string(entry.dataURLString().value_or("?")));
   return lines;
 }
 
@@ -126,11 +126,19 @@ TEST_F(Quarantine, ReadsAHundredThousandRows) {
       Tests::createQuarantineTable() +
       "WITH RECURSIVE n(i) AS (SELECT 0 UNION ALL SELECT i + 1 FROM n WHERE i < 99999) "
       "INSERT INTO LSQuarantineEvent (LSQuarantineEventIdentifier, LSQuarantineDataURLString) "
-      "SELECT 'E' || i, 'https://example.org/' || i FROM n");
+      "SELECT 'E' || i, 'https://example.org/' || i FROM n;"
+      "UPDATE LSQuarantineEvent SET LSQuarantineDataURLString = printf('%.*c', 100000, 'x')"
+      " WHERE rowid % 10000 = 1");
   const Fields entries = read(file);
   ASSERT_EQ(entries.size(), 100'000U);
-  EXPECT_EQ(entries.front(), "E0 https://example.org/0");
-  EXPECT_EQ(entries.back(), "E99999 https://example.org/99999");
+  EXPECT_EQ(entries[20'000], "E20000 " + std::string(100'000, 'x'));
+  for (std::size_t i = 1; i < entries.size(); i += 7919) {
+    const std::string number = std::to_string(i);
+    EXPECT_EQ(entries[i], "E" + number + " https://example.org/" + number);
+  }
+  // An entry outlives the list that it came from.
+  const KVQuarantineEntry kept = KVQuarantine(file.string(), log).entries()[54'321];
+  EXPECT_EQ(kept.dataURLString(), "https://example.org/54321");
 }
 
 TEST(QuarantinePaths, TheCurrentDatabaseComesBeforeTheEarlierOne) {
