@@ -16,6 +16,11 @@ set(VARNEL_APP_DISPLAY_VERSION "${PROJECT_VERSION}" CACHE STRING
 set(VARNEL_APP_ARRANGE_VERSION "${VARNEL_APP_DISPLAY_VERSION}" CACHE STRING
     "The application's version as compared with others")
 
+set(VARNEL_COOKIE_DOMAIN ".quennel.example" CACHE STRING
+    "The domain of the vendor's web-analytics cookie, with its leading dot")
+set(VARNEL_REDIRECT_HOST "links.quennel.example" CACHE STRING
+    "Host of the service that links go through")
+
 set(VARNEL_BUILD_NUMBER "1" CACHE STRING "The framework's build number")
 set(VARNEL_SOURCE_VERSION "" CACHE STRING "The source revision that a release is built from")
 

@@ -2,7 +2,9 @@
 #include <Platform/Ports/ProcessInfo.h>
 
 #include <dlfcn.h>
+#include <sys/utsname.h>
 
+#include <charconv>
 #include <cstdlib>
 #include <filesystem>
 
@@ -29,12 +31,30 @@ std::string nameOfImage(const fs::path& image) {
   return name;
 }
 
+// "6.1.0-18-amd64" is 6.1.0, "6.8" is 6.8.0.
+OperatingSystemVersion versionFromRelease(std::string_view release) {
+  OperatingSystemVersion version;
+  const char* const end = release.data() + release.size();
+  const char* position = release.data();
+  for (long* number : {&version.major, &version.minor, &version.patch}) {
+    const auto [rest, failed] = std::from_chars(position, end, *number);
+    if (failed != std::errc() || rest == end || *rest != '.') break;
+    position = rest + 1;
+  }
+  return version;
+}
+
 class ProcProcessInfo final : public ProcessInfo {
  public:
   std::optional<std::string> environmentVariable(std::string_view name) const override {
     const char* value = std::getenv(std::string(name).c_str());
     if (!value) return std::nullopt;
     return value;
+  }
+
+  OperatingSystemVersion operatingSystemVersion() const override {
+    utsname names{};
+    return ::uname(&names) == 0 ? versionFromRelease(names.release) : OperatingSystemVersion();
   }
 
   std::string executablePath() const override {

@@ -9,6 +9,15 @@
 
 namespace Varnel::Platform {
 
+/// The version of the operating system.
+struct OperatingSystemVersion final {
+  long major = 0;
+  long minor = 0;
+  long patch = 0;
+
+  bool operator==(const OperatingSystemVersion&) const = default;
+};
+
 /// Facts of the running process that do not change while it runs. Any thread.
 class VARNEL_API ProcessInfo {
  public:
@@ -17,6 +26,9 @@ class VARNEL_API ProcessInfo {
   /// The value of an environment variable; absent when it is not set, empty when set to nothing.
   [[nodiscard]] virtual std::optional<std::string> environmentVariable(
       std::string_view name) const = 0;
+
+  /// The system's version; where it is numbered otherwise, its core's. Unknown numbers are 0.
+  [[nodiscard]] virtual OperatingSystemVersion operatingSystemVersion() const = 0;
 
   /// The absolute path of the running executable; empty when the system does not tell.
   [[nodiscard]] virtual std::string executablePath() const = 0;

@@ -14,6 +14,7 @@ namespace Varnel::Platform::Testing {
 class FakeProcessInfo final : public ProcessInfo {
  public:
   std::map<std::string, std::string, std::less<>> environment;
+  OperatingSystemVersion systemVersion = {6, 1, 0};
   std::string executable = "/usr/bin/host";
   std::optional<std::string> mainBundle;
   std::optional<std::string> codeBundle;
@@ -23,6 +24,9 @@ class FakeProcessInfo final : public ProcessInfo {
     const auto found = environment.find(name);
     if (found == environment.end()) return std::nullopt;
     return found->second;
+  }
+  [[nodiscard]] OperatingSystemVersion operatingSystemVersion() const override {
+    return systemVersion;
   }
   [[nodiscard]] std::string executablePath() const override { return executable; }
   [[nodiscard]] std::optional<std::string> mainBundleFolder() const override { return mainBundle; }

@@ -1,63 +1,13 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Values/URL.h>
 
-#include <array>
-#include <cstdint>
+#include <Platform/Values/PercentEncoding.h>
 
 namespace Varnel::Platform {
 namespace {
 
 constexpr std::string_view fileScheme = "file:";
 constexpr std::string_view emptyAuthority = "//";
-constexpr std::string_view hexDigits = "0123456789ABCDEF";
-
-// RFC 3986, section 3.3: what may stand in a path unencoded.
-constexpr auto pathBytes = [] {
-  std::array<bool, 256> table{};
-  for (const char c :
-       std::string_view("ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789"
-                        "-._~!$&'()*+,;=:@/"))
-    table[static_cast<unsigned char>(c)] = true;
-  return table;
-}();
-
-void appendPathEncoded(std::string& text, std::string_view path) {
-  for (const char c : path) {
-    const auto byte = static_cast<unsigned char>(c);
-    if (pathBytes[byte]) {
-      text += c;
-    } else {
-      text += '%';
-      text += hexDigits[byte >> 4];
-      text += hexDigits[byte & 0x0F];
-    }
-  }
-}
-
-int hexValue(char c) {
-  if (c >= '0' && c <= '9') return c - '0';
-  if (c >= 'A' && c <= 'F') return c - 'A' + 10;
-  if (c >= 'a' && c <= 'f') return c - 'a' + 10;
-  return -1;
-}
-
-std::string percentDecoded(std::string_view text) {
-  std::string decoded;
-  decoded.reserve(text.size());
-  for (std::size_t i = 0; i < text.size(); ++i) {
-    if (text[i] == '%' && i + 2 < text.size()) {
-      const int high = hexValue(text[i + 1]);
-      const int low = hexValue(text[i + 2]);
-      if (high >= 0 && low >= 0) {
-        decoded += static_cast<char>(high * 16 + low);
-        i += 2;
-        continue;
-      }
-    }
-    decoded += text[i];
-  }
-  return decoded;
-}
 
 std::string_view withoutTrailingSlash(std::string_view path) {
   while (path.size() > 1 && path.back() == '/') path.remove_suffix(1);
@@ -72,7 +22,7 @@ URL URL::fileURLWithPath(std::string_view path) {
   text += fileScheme;
   // A relative path has no authority before it: "file:a/b".
   if (path.starts_with('/')) text += emptyAuthority;
-  appendPathEncoded(text, path);
+  appendPercentEncoded(text, path, pathBytes);
   return URL(std::move(text));
 }
 
@@ -86,13 +36,6 @@ std::optional<URL> URL::fileURLWithAbsoluteString(std::string_view text) {
   URL url = fileURLWithPath(path);
   if (url.absoluteString() != text) return std::nullopt;
   return url;
-}
-
-std::string_view URL::encodedPath() const {
-  std::string_view rest = text_;
-  rest.remove_prefix(fileScheme.size());
-  if (rest.starts_with("///")) rest.remove_prefix(emptyAuthority.size());
-  return rest;
 }
 
 std::string URL::path() const {

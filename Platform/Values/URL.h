@@ -11,14 +11,18 @@
 #include <string_view>
 
 #include <Platform/Api.h>
+#include <Platform/Values/URLComponents.h>
 
 namespace Varnel::Platform {
 
-/// The location of a file or folder, in the form of RFC 3986 and RFC 8089 ("file:///home/u/a%20b").
+/// The location of a file, folder or page, in the form of RFC 3986 and RFC 8089
+/// ("file:///home/u/a%20b").
 ///
 ///     const URL folder = URL::fileURLWithPath("/home/u/Pictures/");
 ///     folder.path();              // "/home/u/Pictures"
 ///     folder.hasDirectoryPath();  // true
+///     const auto page = URL::parse("https://quennel.example/über uns?lang=de");
+///     page->absoluteString();     // "https://quennel.example/%C3%BCber%20uns?lang=de"
 ///
 /// A path is a run of bytes, as the system sees it: every byte comes back from `path()` as it went
 /// in, valid UTF-8 or not. Nothing here asks the file system. An immutable value but for its
@@ -30,6 +34,26 @@ class VARNEL_API URL final {
 
   /// The file URL whose `absoluteString()` is `text`; absent for any text that no file URL has.
   [[nodiscard]] static std::optional<URL> fileURLWithAbsoluteString(std::string_view text);
+
+  /// The URL that `text` means. Valid bytes and escapes stay as they are; a byte that may not stand
+  /// where it does is percent-encoded. Absent when the text is empty or its structure is no URL's:
+  /// a scheme, host or port that can be none, or a first path component that looks like a scheme.
+  [[nodiscard]] static std::optional<URL> parse(std::string_view text);
+
+  /// The same for a text that may be relative to `base`; the answer is the URL that the two make.
+  [[nodiscard]] static std::optional<URL> parse(std::string_view text, const URL& base);
+
+  /// The URL of a page from its parts: the path decoded, the query encoded and left out when
+  /// empty. Absent when they make no URL; a path that is not empty begins with "/".
+  [[nodiscard]] static std::optional<URL> withParts(std::string_view scheme, std::string_view host,
+                                                    std::string_view path,
+                                                    std::string_view encodedQuery);
+
+  /// This URL with another query. All else stays byte for byte.
+  [[nodiscard]] URL withQuery(std::string_view encodedQuery) const;
+
+  /// The parts of the text. They live as long as this object.
+  [[nodiscard]] URLComponents components() const { return URLComponents::split(text_); }
 
   /// The whole text, percent-encoded.
   [[nodiscard]] const std::string& absoluteString() const { return text_; }
@@ -61,7 +85,7 @@ class VARNEL_API URL final {
   using ResourceValues = std::map<std::string, std::any, std::less<>>;
 
   explicit URL(std::string text) : text_(std::move(text)) {}
-  [[nodiscard]] std::string_view encodedPath() const;
+  [[nodiscard]] std::string_view encodedPath() const { return components().path; }
 
   std::string text_;
   std::shared_ptr<const ResourceValues> temporaryValues_;

@@ -10,7 +10,9 @@
 
 #include <Varnel/Context/BuildSwitches.h>
 #include <orvane/DisksCommand.h>
+#include <orvane/IdentifyCommand.h>
 #include <orvane/MenuCommand.h>
+#include <orvane/OriginCommand.h>
 #include <orvane/PathCommand.h>
 #include <orvane/ScanCommand.h>
 #include <orvane/SoundCommand.h>
@@ -129,6 +131,20 @@ void protectFolders(std::vector<std::string>& arguments) {
   if (mark != arguments.end()) arguments.erase(mark);
 }
 
+void addOrigin(CLI::App& app, Invocation& invocation) {
+  auto [options, command] = addCommand<OriginCommand>(
+      app, invocation, "origin", "Tell where this program, or a file, was downloaded from");
+  options->add_option("file", command->file, "The file; this program when none is named")
+      ->type_name("FILE");
+  options->add_flag("--json", command->isJSON, "Print one JSON object");
+}
+
+void addIdentify(CLI::App& app, Invocation& invocation) {
+  auto [options, command] = addCommand<IdentifyCommand>(
+      app, invocation, "identify", "Print what this installation is recognised by");
+  options->add_flag("--json", command->isJSON, "Print one JSON object");
+}
+
 }  // namespace
 
 std::variant<Invocation, Information, UsageError> parseCommandLine(int count,
@@ -140,7 +156,9 @@ std::variant<Invocation, Information, UsageError> parseCommandLine(int count,
   app.require_subcommand(0, 1);
   addScan(app, invocation);
   addDisks(app, invocation);
+  addIdentify(app, invocation);
   addMenu(app, invocation);
+  addOrigin(app, invocation);
   addPath(app, invocation);
   addSound(app, invocation);
   std::vector<std::string> words(arguments + std::min(count, 1), arguments + count);

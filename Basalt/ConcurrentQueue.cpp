@@ -1,0 +1,68 @@
+// SPDX-License-Identifier: MIT
+#include <condition_variable>
+#include <cstddef>
+#include <deque>
+#include <mutex>
+#include <system_error>
+#include <thread>
+#include <utility>
+
+#include <Basalt/Executor.h>
+
+namespace Basalt {
+namespace {
+
+class ConcurrentQueue final : public Executor {
+ public:
+  void execute(Block block) override {
+    const std::lock_guard lock(mutex_);
+    waiting_.push_back(std::move(block));
+    if (idle_ >= waiting_.size() || threads_ == maximum) {
+      arrived_.notify_one();
+      return;
+    }
+    try {
+      std::thread(&ConcurrentQueue::work, this).detach();
+      ++threads_;
+    } catch (const std::system_error&) {
+      // The threads that there are will come to it.
+      if (threads_ > 0) return;
+      waiting_.pop_back();
+      throw;
+    }
+  }
+
+ private:
+  static constexpr std::size_t maximum = 64;
+
+  void work() {
+    std::unique_lock lock(mutex_);
+    while (true) {
+      ++idle_;
+      arrived_.wait(lock, [&] { return !waiting_.empty(); });
+      --idle_;
+      Block block = std::move(waiting_.front());
+      waiting_.pop_front();
+      lock.unlock();
+      block();
+      block = {};
+      lock.lock();
+    }
+  }
+
+  std::mutex mutex_;  // Owns everything below.
+  std::condition_variable arrived_;
+  std::deque<Block> waiting_;
+  std::size_t threads_ = 0;
+  std::size_t idle_ = 0;
+};
+
+}  // namespace
+
+// Its threads outlive main, and so does it.
+std::shared_ptr<Executor> globalConcurrentQueue() {
+  static const auto& queue = *new std::shared_ptr<Executor>(std::make_shared<ConcurrentQueue>());
+  return queue;
+}
+
+}  // namespace Basalt

@@ -1,0 +1,19 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include <Platform/Api.h>
+
+namespace Basalt {
+
+/// The SHA-256 digest of the bytes: 32 bytes. Absent when the cryptographic library refuses. Any
+/// thread.
+[[nodiscard]] VARNEL_API std::optional<std::string> sha256(std::string_view bytes);
+
+/// Two lower-case hexadecimal digits for each byte. Any thread.
+[[nodiscard]] VARNEL_API std::string hexadecimal(std::string_view bytes);
+
+}  // namespace Basalt

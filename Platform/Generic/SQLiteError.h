@@ -1,0 +1,14 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <Platform/Values/PlatformError.h>
+
+struct sqlite3;
+
+namespace Varnel::Platform {
+
+/// What the connection says of its last failure, whose result code was `status`. The connection may
+/// be null: then the library was out of memory.
+[[nodiscard]] PlatformError sqliteError(sqlite3* connection, int status);
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,60 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Generic/SQLiteStatement.h>
+
+#include <sqlite3.h>
+
+#include <cassert>
+
+#include <Platform/Generic/SQLiteError.h>
+
+namespace Varnel::Platform {
+namespace {
+
+void expectOK([[maybe_unused]] int status) {
+  assert(status == SQLITE_OK);
+}
+
+}  // namespace
+
+void SQLiteStatement::finalize(sqlite3_stmt* statement) {
+  ::sqlite3_finalize(statement);
+}
+
+void SQLiteStatement::bind(int index, std::int64_t value) {
+  expectOK(::sqlite3_bind_int64(statement_.get(), index, value));
+}
+
+// A null pointer would bind NULL, which an empty text is not.
+void SQLiteStatement::bind(int index, std::string_view text) {
+  expectOK(::sqlite3_bind_text64(statement_.get(), index, text.empty() ? "" : text.data(),
+                                 text.size(), SQLITE_TRANSIENT, SQLITE_UTF8));
+}
+
+void SQLiteStatement::bindNull(int index) {
+  expectOK(::sqlite3_bind_null(statement_.get(), index));
+}
+
+Result<SQLiteStatement::Step> SQLiteStatement::step() {
+  const int status = ::sqlite3_step(statement_.get());
+  if (status == SQLITE_ROW) return Step::row;
+  if (status == SQLITE_DONE) return Step::done;
+  return sqliteError(::sqlite3_db_handle(statement_.get()), status);
+}
+
+// The result repeats the failure that the last step has reported already.
+void SQLiteStatement::reset() {
+  ::sqlite3_reset(statement_.get());
+}
+
+std::optional<std::string_view> SQLiteStatement::text(int index) {
+  const unsigned char* text = ::sqlite3_column_text(statement_.get(), index);
+  if (!text) return std::nullopt;
+  return reinterpret_cast<const char*>(text);
+}
+
+std::optional<std::int64_t> SQLiteStatement::integer(int index) {
+  if (::sqlite3_column_type(statement_.get(), index) == SQLITE_NULL) return std::nullopt;
+  return ::sqlite3_column_int64(statement_.get(), index);
+}
+
+}  // namespace Varnel::Platform

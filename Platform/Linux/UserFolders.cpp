@@ -1,0 +1,36 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Linux/UserFolders.h>
+
+#include <cstdlib>
+
+#include <Platform/Linux/Adapters.h>
+#include <Platform/POSIX/Adapters.h>
+#include <Platform/Ports/ProcessInfo.h>
+#include <Platform/Ports/UserAccount.h>
+
+namespace Varnel::Platform::Linux {
+namespace {
+
+namespace fs = std::filesystem;
+
+fs::path folder(const char* variable, const char* belowHome) {
+  const char* value = std::getenv(variable);
+  if (value && *value == '/') return value;
+  return fs::path(POSIX::makeUserAccount()->homeFolder()) / belowHome;
+}
+
+}  // namespace
+
+fs::path userDataFolder() {
+  return folder("XDG_DATA_HOME", ".local/share");
+}
+
+fs::path userConfigurationFolder() {
+  return folder("XDG_CONFIG_HOME", ".config");
+}
+
+std::string applicationFolderName() {
+  return fs::path(makeProcessInfo()->executablePath()).filename().string();
+}
+
+}  // namespace Varnel::Platform::Linux

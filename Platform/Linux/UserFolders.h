@@ -1,0 +1,17 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <filesystem>
+#include <string>
+
+namespace Varnel::Platform::Linux {
+
+/// The folders of the desktop's base-directory convention. The environment may move them, by
+/// absolute paths alone; they need not exist.
+[[nodiscard]] std::filesystem::path userDataFolder();
+[[nodiscard]] std::filesystem::path userConfigurationFolder();
+
+/// The name of this application's own folder in them: that of its executable.
+[[nodiscard]] std::string applicationFolderName();
+
+}  // namespace Varnel::Platform::Linux

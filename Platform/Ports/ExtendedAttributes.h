@@ -1,0 +1,25 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+#include <system_error>
+
+#include <Platform/Api.h>
+#include <Platform/Values/Result.h>
+
+namespace Varnel::Platform {
+
+/// The named attributes that file systems keep beside a file's content. Any thread.
+class VARNEL_API ExtendedAttributes {
+ public:
+  virtual ~ExtendedAttributes() = default;
+
+  /// The bytes of the attribute `name` of the file or folder at `path`; symbolic links are
+  /// followed. Absent when the file has no such attribute. Failed (generic category) when there is
+  /// no such file, it may not be read, or its file system keeps no attributes.
+  [[nodiscard]] virtual Result<std::optional<std::string>, std::error_code> value(
+      const std::string& path, const std::string& name) = 0;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,30 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string_view>
+#include <vector>
+
+#include <Platform/Api.h>
+#include <Platform/Values/PropertyValue.h>
+
+namespace Varnel::Platform {
+
+/// What distinguishes this machine from others. Any thread; calls read kernel tables and small
+/// files. It stands beside `DeviceRegistry` rather than in it: half of it is no device anywhere but
+/// on the one system whose registry knows everything.
+class VARNEL_API MachineIdentity {
+ public:
+  virtual ~MachineIdentity() = default;
+
+  /// A property of the machine as a whole: "IOPlatformUUID" or "IOPlatformSerialNumber". Absent
+  /// when the machine has none or hides it.
+  [[nodiscard]] virtual std::optional<PropertyValue> platformProperty(
+      std::string_view name) const = 0;
+
+  /// The hardware address of each network interface that the system calls primary, in its order;
+  /// an interface without one is left out. Usually one, of six bytes.
+  [[nodiscard]] virtual std::vector<PropertyData> primaryInterfaceAddresses() const = 0;
+};
+
+}  // namespace Varnel::Platform

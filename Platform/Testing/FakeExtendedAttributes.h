@@ -1,0 +1,31 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <map>
+#include <optional>
+#include <string>
+#include <utility>
+
+#include <Platform/Ports/ExtendedAttributes.h>
+
+namespace Varnel::Platform::Testing {
+
+/// Attributes that the test hangs on paths; every other path is a file without any. Set them before
+/// other threads read.
+///
+///     attributes.values[{"/opt/orvane", "com.apple.quarantine"}] = "0083;5f;Browser;E1";
+class FakeExtendedAttributes final : public ExtendedAttributes {
+ public:
+  std::map<std::pair<std::string, std::string>, std::string> values;  ///< By path and name.
+  std::error_code error;  ///< What every reading fails with, if anything.
+
+  [[nodiscard]] Result<std::optional<std::string>, std::error_code> value(
+      const std::string& path, const std::string& name) override {
+    if (error) return error;
+    const auto found = values.find({path, name});
+    if (found == values.end()) return std::optional<std::string>();
+    return std::optional(found->second);
+  }
+};
+
+}  // namespace Varnel::Platform::Testing

@@ -1,0 +1,33 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <atomic>
+#include <optional>
+#include <string_view>
+#include <vector>
+
+#include <Platform/Ports/MachineIdentity.h>
+
+namespace Varnel::Platform::Testing {
+
+/// A machine whose identity the test sets. Set it before other threads read.
+class FakeMachineIdentity final : public MachineIdentity {
+ public:
+  PropertyDictionary properties = {{"IOPlatformUUID", "0f1e2d3c4b5a69788796a5b4c3d2e1f0"},
+                                   {"IOPlatformSerialNumber", "C02XL0FAKE"}};
+  std::vector<PropertyData> addresses;
+  mutable std::atomic<int> questions = 0;  ///< How often a property was asked for.
+
+  [[nodiscard]] std::optional<PropertyValue> platformProperty(
+      std::string_view name) const override {
+    ++questions;
+    const PropertyValue* value = find(properties, name);
+    if (!value) return std::nullopt;
+    return *value;
+  }
+  [[nodiscard]] std::vector<PropertyData> primaryInterfaceAddresses() const override {
+    return addresses;
+  }
+};
+
+}  // namespace Varnel::Platform::Testing

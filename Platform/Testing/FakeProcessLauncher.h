@@ -1,0 +1,67 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <string>
+#include <system_error>
+#include <vector>
+
+#include <Platform/Ports/ProcessLauncher.h>
+
+namespace Varnel::Platform::Testing {
+
+/// Pretends to launch programs. Each launch plays `script` as it is then. One thread at a time.
+///
+///     launcher.script.output = "<plist>…</plist>";
+///     launcher.script.questions = 3;  // runs until it has been asked three times
+class FakeProcessLauncher final : public ProcessLauncher {
+ public:
+  struct Script {
+    std::string output = {};
+    bool succeeds = true;
+    int questions = 0;  ///< How often `isRunning` answers yes; for ever when negative.
+    std::error_code launchError = {};  ///< Why it cannot be launched, if so.
+  };
+
+  Script script;
+  std::vector<std::vector<std::string>> launches;  ///< Path and arguments of each launch.
+  int terminations = 0;                            ///< How many were ended while they ran.
+
+  [[nodiscard]] Result<std::unique_ptr<LaunchedProcess>, std::error_code> launch(
+      const std::string& path, const std::vector<std::string>& arguments) override {
+    launches.push_back({path});
+    launches.back().insert(launches.back().end(), arguments.begin(), arguments.end());
+    if (script.launchError) return script.launchError;
+    return std::unique_ptr<LaunchedProcess>(std::make_unique<Process>(*this, script));
+  }
+
+ private:
+  class Process final : public LaunchedProcess {
+   public:
+    Process(FakeProcessLauncher& launcher, Script script)
+        : launcher_(launcher), script_(std::move(script)) {}
+    ~Process() override { terminate(); }
+
+    [[nodiscard]] bool isRunning() override {
+      if (script_.questions == 0) return false;
+      if (script_.questions > 0) --script_.questions;
+      return true;
+    }
+    void terminate() override {
+      if (script_.questions == 0) return;
+      script_.questions = 0;
+      script_.succeeds = false;
+      ++launcher_.terminations;
+    }
+    [[nodiscard]] bool hasSucceeded() override {
+      return script_.questions == 0 && script_.succeeds;
+    }
+    [[nodiscard]] std::string readOutput() override { return script_.output; }
+
+   private:
+    FakeProcessLauncher& launcher_;
+    Script script_;
+  };
+};
+
+}  // namespace Varnel::Platform::Testing

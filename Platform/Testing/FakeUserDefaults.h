@@ -1,0 +1,53 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <map>
+#include <mutex>
+#include <optional>
+#include <string>
+
+#include <Platform/Ports/UserDefaults.h>
+
+namespace Varnel::Platform::Testing {
+
+/// Settings that last as long as the object. A value reads as the type that it was set with, and
+/// as no other. Any thread.
+class FakeUserDefaults final : public UserDefaults {
+ public:
+  [[nodiscard]] std::optional<bool> truthValue(const std::string& key) const override {
+    return read<bool>(key);
+  }
+  [[nodiscard]] std::optional<std::int64_t> integer(const std::string& key) const override {
+    return read<std::int64_t>(key);
+  }
+  [[nodiscard]] std::optional<double> real(const std::string& key) const override {
+    return read<double>(key);
+  }
+  [[nodiscard]] std::optional<std::string> text(const std::string& key) const override {
+    return read<std::string>(key);
+  }
+  void set(const std::string& key, const Value& value) override {
+    const std::lock_guard lock(mutex_);
+    values_[key] = value;
+  }
+  void remove(const std::string& key) override {
+    const std::lock_guard lock(mutex_);
+    values_.erase(key);
+  }
+
+ private:
+  template <typename Type>
+  std::optional<Type> read(const std::string& key) const {
+    const std::lock_guard lock(mutex_);
+    const auto found = values_.find(key);
+    const auto* value = found == values_.end() ? nullptr : std::get_if<Type>(&found->second);
+    if (!value) return std::nullopt;
+    return *value;
+  }
+
+  mutable std::mutex mutex_;  ///< Owns `values_`.
+  std::map<std::string, Value> values_;
+};
+
+}  // namespace Varnel::Platform::Testing

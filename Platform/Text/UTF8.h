@@ -1,0 +1,11 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string_view>
+
+namespace Varnel::Platform {
+
+/// Whether the bytes are text in UTF-8, in its shortest form and without surrogates. Any thread.
+[[nodiscard]] bool isValidUTF8(std::string_view bytes);
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,26 @@
+// SPDX-License-Identifier: MIT
+#include <orvane/FactList.h>
+
+#include <nlohmann/json.hpp>
+#include <utility>
+
+#include <orvane/VisibleText.h>
+
+namespace Orvane {
+
+void FactList::add(std::string key, std::string label, std::optional<std::string> value) {
+  facts_.push_back({std::move(key), std::move(label), std::move(value)});
+}
+
+std::string FactList::text(Form form) const {
+  std::string lines;
+  nlohmann::ordered_json json = nlohmann::ordered_json::object();
+  for (const Fact& fact : facts_) {
+    lines += fact.label + ": " + (fact.value ? visibleText(*fact.value) : "none") + "\n";
+    json[fact.key] = fact.value ? nlohmann::ordered_json(*fact.value) : nullptr;
+  }
+  if (form == Form::lines) return lines;
+  return json.dump(-1, ' ', false, nlohmann::ordered_json::error_handler_t::replace) + "\n";
+}
+
+}  // namespace Orvane

@@ -1,0 +1,28 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include <Platform/Values/Date.h>
+#include <Platform/Values/PropertyValue.h>
+
+namespace Varnel::Platform {
+class ProcessLauncher;
+}
+
+namespace Varnel {
+
+/// What the system's disk-image tool tells of the images that are mounted: its answer to "info
+/// -plist". Absent when the tool is missing, fails, prints no property list, or still runs after
+/// `timeout`, whereupon it is ended. Blocks the caller while the tool runs.
+[[nodiscard]] std::optional<Platform::PropertyValue> mountedDrivesInfo(
+    Platform::ProcessLauncher& launcher, const std::string& toolPath,
+    Platform::TimeInterval timeout);
+
+/// The file of the first image with an entity that is mounted at exactly `volumePath`. What is
+/// missing or of the wrong type in `volumesInfo` counts as empty.
+[[nodiscard]] std::optional<std::string> findImagePath(const std::string& volumePath,
+                                                       const Platform::PropertyValue& volumesInfo);
+
+}  // namespace Varnel

@@ -1,0 +1,102 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include <Platform/Api.h>
+#include <Platform/Values/Date.h>
+#include <Varnel/Provenance/KVQuarantine.h>
+
+namespace Basalt {
+class Executor;
+}
+
+namespace Varnel::Platform {
+class ProcessInfo;
+class ProcessLauncher;
+class UserDefaults;
+class VolumeCatalog;
+}  // namespace Varnel::Platform
+
+namespace Varnel {
+
+/// Finds the download that the running application came from.
+///
+///     auto tracker = KVDownloadSourceTracker::sharedTracker();
+///     tracker->privateQueue()->execute([tracker] {
+///       if (const auto entry = tracker->installSourceEntry()) remember(entry->dataURLString());
+///     });
+///
+/// Of a copy that runs from a mounted disk image the image's attribute names the download, else
+/// that of the application itself; where neither names one, the first download with the product's
+/// name in its URL is taken.
+///
+/// `installSourceEntry()` may be called from any thread; the properties are to be set before.
+class VARNEL_API KVDownloadSourceTracker final {
+ public:
+  struct VARNEL_API Ports {
+    Platform::ExtendedAttributes& extendedAttributes;
+    Platform::ProcessInfo& processInfo;
+    Platform::ProcessLauncher& processLauncher;
+    Platform::SystemLog& systemLog;
+    Platform::UserDefaults& userDefaults;
+    Platform::VolumeCatalog& volumeCatalog;
+
+    /// Those of this process.
+    [[nodiscard]] static Ports ofProcess();
+  };
+
+  /// Where things are on the machine.
+  struct Places {
+    std::string diskImageTool = "/usr/bin/hdiutil";
+    std::string volumesRoot = "/Volumes";
+    std::optional<std::string> bundlePath = {};  ///< The running application's when absent.
+    Platform::TimeInterval toolTimeout = 30;     ///< After it the tool is ended.
+  };
+
+  explicit KVDownloadSourceTracker(std::shared_ptr<KVQuarantine> quarantine);
+  KVDownloadSourceTracker(std::shared_ptr<KVQuarantine> quarantine, Places places);
+  KVDownloadSourceTracker(std::shared_ptr<KVQuarantine> quarantine, Places places, Ports ports);
+  ~KVDownloadSourceTracker();
+  KVDownloadSourceTracker(const KVDownloadSourceTracker&) = delete;
+  KVDownloadSourceTracker& operator=(const KVDownloadSourceTracker&) = delete;
+
+  /// The process's own, over this user's current database.
+  [[nodiscard]] static std::shared_ptr<KVDownloadSourceTracker> sharedTracker();
+  [[nodiscard]] static std::shared_ptr<KVDownloadSourceTracker> trackerWithQuarantine(
+      std::shared_ptr<KVQuarantine> quarantine);
+
+  /// The download of the running application, absent when it is not known. Blocks while the
+  /// disk-image tool runs and the database is read: keep it off the main thread. Does all the work
+  /// anew each time.
+  [[nodiscard]] std::optional<KVQuarantineEntry> installSourceEntry() const;
+
+  /// The database that is searched.
+  [[nodiscard]] const std::shared_ptr<KVQuarantine>& quarantine() const { return quarantine_; }
+  void setQuarantine(std::shared_ptr<KVQuarantine> quarantine);
+
+  /// Held for clients; the tracker reads and writes no setting.
+  [[nodiscard]] const std::shared_ptr<Platform::UserDefaults>& userDefaults() const;
+  void setUserDefaults(std::shared_ptr<Platform::UserDefaults> userDefaults);
+
+  /// Held for clients; the tracker works on the caller's thread.
+  [[nodiscard]] const std::shared_ptr<Basalt::Executor>& privateQueue() const;
+  void setPrivateQueue(std::shared_ptr<Basalt::Executor> queue);
+
+ private:
+  [[nodiscard]] std::string bundlePath() const;
+  [[nodiscard]] std::optional<std::string> volumeName(const std::string& bundlePath) const;
+  [[nodiscard]] std::optional<std::string> identifierOfImage(const std::string& bundlePath) const;
+  [[nodiscard]] std::optional<std::string> identifierOfFile(const std::string& path) const;
+
+  const Ports ports_;
+  const Places places_;
+  std::shared_ptr<KVQuarantine> quarantine_;
+  std::shared_ptr<Platform::UserDefaults> userDefaults_;
+  std::shared_ptr<Basalt::Executor> privateQueue_;
+};
+
+}  // namespace Varnel

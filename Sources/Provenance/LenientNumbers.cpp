@@ -1,0 +1,70 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Provenance/LenientNumbers.h>
+
+#include <algorithm>
+#include <charconv>
+#include <limits>
+#include <string>
+#include <string_view>
+
+namespace Varnel {
+namespace {
+
+using Platform::PropertyValue;
+
+bool isNegative(std::string_view digits) {
+  return digits.starts_with('-');
+}
+
+// A number's text without what the parser refuses before it: blanks and a plus. Empty when neither
+// digit nor point follows, so that "inf" and "nan" stay texts.
+std::string_view numberIn(std::string_view text) {
+  text.remove_prefix(std::min(text.find_first_not_of(" \t\n\r\f\v"), text.size()));
+  if (text.starts_with('+')) text.remove_prefix(1);
+  const std::size_t first = isNegative(text) ? 1 : 0;
+  if (text.size() <= first || std::string_view("0123456789.").find(text[first]) == text.npos)
+    return {};
+  return text;
+}
+
+// What does not fit becomes the largest or the smallest.
+template <typename Number>
+Number parse(std::string_view text, Number largest, Number smallest) {
+  const std::string_view digits = numberIn(text);
+  Number number = 0;
+  const auto [end, status] = std::from_chars(digits.data(), digits.data() + digits.size(), number);
+  if (status == std::errc::result_out_of_range) return isNegative(digits) ? smallest : largest;
+  return status == std::errc() ? number : 0;
+}
+
+constexpr std::int64_t largestInteger = std::numeric_limits<std::int64_t>::max();
+constexpr std::int64_t smallestInteger = std::numeric_limits<std::int64_t>::min();
+
+std::int64_t truncated(double number) {
+  constexpr double limit = 9223372036854775808.0;
+  if (number >= limit) return largestInteger;
+  if (number < -limit) return smallestInteger;
+  return number == number ? static_cast<std::int64_t>(number) : 0;
+}
+
+}  // namespace
+
+double lenientReal(const PropertyValue& value) {
+  if (const auto* real = value.as<double>()) return *real;
+  if (const auto* integer = value.as<std::int64_t>()) return static_cast<double>(*integer);
+  if (const auto* truth = value.as<bool>()) return *truth ? 1 : 0;
+  constexpr double largest = std::numeric_limits<double>::max();
+  if (const auto* text = value.as<std::string>()) return parse(*text, largest, -largest);
+  return 0;
+}
+
+std::int64_t lenientInteger(const PropertyValue& value) {
+  if (const auto* integer = value.as<std::int64_t>()) return *integer;
+  if (const auto* real = value.as<double>()) return truncated(*real);
+  if (const auto* truth = value.as<bool>()) return *truth ? 1 : 0;
+  if (const auto* text = value.as<std::string>())
+    return parse(*text, largestInteger, smallestInteger);
+  return 0;
+}
+
+}  // namespace Varnel

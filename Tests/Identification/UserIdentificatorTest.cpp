@@ -1,0 +1,199 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Identification/UserIdentificator.h>
+
+#include <gtest/gtest.h>
+
+#include <Basalt/Digest.h>
+#include <Platform/Testing/CapturedOutput.h>
+#include <Platform/Testing/FakeCookieStorage.h>
+#include <Platform/Testing/FakeExtendedAttributes.h>
+#include <Platform/Testing/FakeMachineIdentity.h>
+#include <Platform/Testing/FakeProcessInfo.h>
+#include <Platform/Testing/FakeProcessLauncher.h>
+#include <Platform/Testing/FakeUser.h>
+#include <Platform/Testing/FakeUserDefaults.h>
+#include <Platform/Testing/FakeVolumeCatalog.h>
+#include <Tests/Support/QuarantineDatabase.h>
+#include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Identification/IdentifierRules.h>
+#include <Varnel/Identification/UserIdentificationInfo.h>
+
+namespace Varnel {
+namespace {
+
+using Platform::Cookie;
+using Platform::PropertyData;
+using Text = std::optional<std::string>;
+
+PropertyData bytes(std::initializer_list<int> values) {
+  PropertyData data;
+  for (const int value : values) data.push_back(static_cast<std::byte>(value));
+  return data;
+}
+
+Cookie analyticsCookie(std::string value, std::string domain = ".quennel.example") {
+  return {.domain = std::move(domain), .path = "/", .name = "_ga", .value = std::move(value)};
+}
+
+class UserIdentificatorTest : public testing::Test {
+ protected:
+  UserIdentificatorTest() {
+    account.home = folder.path().string();
+    processInfo.mainBundle = "/opt/orvane";
+  }
+
+  // The application comes from the last of these downloads.
+  void download(const std::string& url) {
+    Tests::runSQL(KVQuarantine::systemQuarantinePathV2(account),
+                  "DROP TABLE IF EXISTS LSQuarantineEvent;" + Tests::createQuarantineTable() +
+                      Tests::insertDownload("'E'", "'" + url + "'"));
+    attributes.values[{"/opt/orvane", "com.apple.quarantine"}] = "0083;5f3a;Browser;E";
+  }
+
+  const Tests::TemporaryFolder folder;
+  Platform::Testing::CapturedSystemLog log;
+  Platform::Testing::FakeCookieStorage cookies;
+  Platform::Testing::FakeExtendedAttributes attributes;
+  Platform::Testing::FakeMachineIdentity machine;
+  Platform::Testing::FakeProcessInfo processInfo;
+  Platform::Testing::FakeProcessLauncher launcher;
+  Platform::Testing::FakeUserAccount account;
+  Platform::Testing::FakeUserDefaults userDefaults;
+  Platform::Testing::FakeVolumeCatalog volumes;
+  UserIdentificator user{
+      {cookies, machine, account, {attributes, processInfo, launcher, log, userDefaults, volumes}}};
+};
+
+// Servers know users by these values: a change here is a mistake.
+TEST_F(UserIdentificatorTest, TheUserIdentifierNeverChanges) {
+  EXPECT_EQ(Basalt::hexadecimal(*Basalt::sha256("abc")),
+            "ba7816bf8f01cfea414140de5dae2223b00361a396177a9cb410ff61f20015ad");
+  EXPECT_EQ(user.userIdentifier(),
+            "3a8bc9fb6c605385e50e4f03118cd86b7f59529b27829673810b9854b1a2e6be");
+  EXPECT_EQ(userIdentifierOf(std::nullopt, "ada"),
+            "a90a92e0a503c5490d0ccf4cadbbd1efdd3c5925d08cc598db2606b8273c88b5");
+  EXPECT_EQ(userIdentifierOf("uuid", "\xFF"), "(null)");
+  account.accountName = "grace";
+  EXPECT_EQ(user.userIdentifier(),
+            "3a8bc9fb6c605385e50e4f03118cd86b7f59529b27829673810b9854b1a2e6be");  // kept
+  EXPECT_EQ(userIdentifierOf(user.machineUUID(), "grace").size(), 64U);
+  EXPECT_NE(userIdentifierOf(user.machineUUID(), "grace"), user.userIdentifier());
+}
+
+TEST_F(UserIdentificatorTest, StoredIdentifiersAreComputedOnceOrAssigned) {
+  EXPECT_EQ(user.machineUUID(), "0f1e2d3c4b5a69788796a5b4c3d2e1f0");
+  machine.properties.clear();
+  EXPECT_EQ(user.machineUUID(), "0f1e2d3c4b5a69788796a5b4c3d2e1f0");
+  EXPECT_EQ(user.serialNumber(), std::nullopt);
+  EXPECT_EQ(user.serialNumber(), std::nullopt);
+  EXPECT_EQ(machine.questions, 2);
+
+  user.setSerialNumber("S1");
+  user.setMachineUUID(std::nullopt);
+  EXPECT_EQ(user.serialNumber(), "S1");
+  EXPECT_EQ(user.machineUUID(), std::nullopt);
+  EXPECT_EQ(user.userIdentifier(), userIdentifierOf(std::nullopt, "ada"));
+  user.setUserIdentifier("U1");
+  EXPECT_EQ(user.userIdentifier(), "U1");
+  EXPECT_EQ(machine.questions, 2);
+}
+
+TEST_F(UserIdentificatorTest, APropertyThatIsNoTextIsAbsent) {
+  machine.properties = {{"IOPlatformUUID", bytes({1, 2})}, {"IOPlatformSerialNumber", 5.0}};
+  EXPECT_EQ(user.machineUUID(), std::nullopt);
+  EXPECT_EQ(user.serialNumber(), std::nullopt);
+}
+
+TEST_F(UserIdentificatorTest, TheLastPrimaryAddressIsWrittenInSixBytes) {
+  EXPECT_EQ(user.primaryMacAddress(), std::nullopt);
+  machine.addresses = {bytes({1, 2, 3, 4, 5, 6}), bytes({0x00, 0x1B, 0x63, 0x84, 0x45, 0xE6})};
+  EXPECT_EQ(user.primaryMacAddress(), "00:1b:63:84:45:e6");
+  machine.addresses.push_back(bytes({0xAB, 0xCD}));
+  EXPECT_EQ(user.primaryMacAddress(), "ab:cd:00:00:00:00");
+  machine.addresses.push_back(bytes({1, 2, 3, 4, 5, 6, 7, 8}));
+  EXPECT_EQ(user.primaryMacAddress(), "01:02:03:04:05:06");
+  machine.addresses.push_back({});
+  EXPECT_EQ(user.primaryMacAddress(), "00:00:00:00:00:00");
+}
+
+TEST_F(UserIdentificatorTest, TheDownloadNamesItsCampaign) {
+  EXPECT_EQ(user.downloadSourceURLString(), std::nullopt);
+  const struct {
+    const char* url;
+    Text cid;
+  } cases[] = {
+      {"https://example.org/a.dmg?lang=de&cid=12.34&cid=5", "12.34"},
+      {"https://example.org/a.dmg?cid=a%20b+c", "a b+c"},
+      {"https://example.org/a b.dmg?x=ä&cid=1#top", "1"},
+      {"https://example.org/a.dmg?CID=1&acid=2&cid1=3", std::nullopt},
+      {"https://example.org/a.dmg?cid&cid=2", std::nullopt},
+      {"https://example.org/a.dmg?cid=", ""},
+      {"https://example.org/a.dmg#?cid=2", std::nullopt},
+      {"https://example.org/a.dmg", std::nullopt},
+      {"http://[::1?cid=2", std::nullopt},
+      {"?cid=7", "7"},
+      {"", std::nullopt},
+  };
+  for (const auto& each : cases) {
+    download(each.url);
+    EXPECT_EQ(user.downloadSourceURLString(), each.url);
+    EXPECT_EQ(user.downloadSourceURLCid(), each.cid) << each.url;
+  }
+}
+
+TEST_F(UserIdentificatorTest, TheClientIdentifierIsCutFromTheFirstCookieOfTheDomain) {
+  const struct {
+    std::vector<Cookie> stored;
+    Text value;
+  } cases[] = {
+      {{}, std::nullopt},
+      {{analyticsCookie("GA1.2.111.222")}, "111.222"},
+      {{analyticsCookie("GA1.2.1"), analyticsCookie("GA1.2.2")}, "1"},
+      {{analyticsCookie("GA1.2."), analyticsCookie("GA1.2.2")}, std::nullopt},
+      {{analyticsCookie("1234567")}, "7"},
+      {{analyticsCookie("ääääää7")}, "7"},
+      {{analyticsCookie("ääääää")}, std::nullopt},
+      {{analyticsCookie("GA1.2.1", "quennel.example")}, std::nullopt},
+      {{analyticsCookie("GA1.2.1", "www.quennel.example")}, std::nullopt},
+      {{analyticsCookie("GA1.2.1", ".Quennel.example")}, std::nullopt},
+      {{analyticsCookie("GA1.2.1", ".quennel.example.org"), analyticsCookie("GA1.2.2")}, "2"},
+      {{{".quennel.example", "/", "_GA", "GA1.2.1"}, {".quennel.example", "/", "_gat", "GA1.2.1"}},
+       std::nullopt},
+  };
+  for (const auto& each : cases) {
+    cookies.ofGroup["Cookies"] = each.stored;
+    EXPECT_EQ(user.GACookieValue(), each.value);
+  }
+  cookies.own = {analyticsCookie("GA1.2.own")};
+  EXPECT_EQ(user.GACookieValue(), std::nullopt);
+  cookies.groups = false;
+  EXPECT_EQ(user.GACookieValue(), "own");
+}
+
+TEST_F(UserIdentificatorTest, OnlyTheSitesBuildPrefersCampaignAndCookie) {
+  // The objects of the test outlive the pointer.
+  const std::shared_ptr<UserIdentificationProvider> provider(std::shared_ptr<void>(), &user);
+  const UserIdentificationInfo site(provider, {.isSiteVersion = true});
+  const UserIdentificationInfo store(provider, {.isAppStoreVersion = true});
+  const UserIdentificationInfo marketta(provider, {.isMarkettaVersion = true});
+  const std::string identifier = user.userIdentifier();
+
+  EXPECT_EQ(site.uniqueClientIdentifier(), identifier);
+  cookies.ofGroup["Cookies"] = {analyticsCookie("GA1.2.111.222")};
+  download("https://example.org/a.dmg");
+  EXPECT_EQ(site.uniqueClientIdentifier(), "111.222");
+  download("https://example.org/a.dmg?cid=3");
+  EXPECT_EQ(site.uniqueClientIdentifier(), "3");
+  EXPECT_EQ(store.uniqueClientIdentifier(), identifier);
+  EXPECT_EQ(marketta.uniqueClientIdentifier(), identifier);
+  EXPECT_EQ(site.identificator(), provider);
+}
+
+TEST(ThisMachine, IsIdentifiedAlike) {
+  const UserIdentificator user;
+  EXPECT_EQ(user.userIdentifier(), UserIdentificator().userIdentifier());
+  EXPECT_EQ(user.userIdentifier().size(), 64U);
+}
+
+}  // namespace
+}  // namespace Varnel

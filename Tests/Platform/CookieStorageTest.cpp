@@ -1,0 +1,107 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Generic/SQLiteCookieStorage.h>
+
+#include <gmock/gmock.h>
+#include <sqlite3.h>
+
+#include <memory>
+
+#include <Platform/Generic/SQLiteDatabase.h>
+#include <Platform/Testing/SimulatedClock.h>
+#include <Tests/Support/OpenDescriptors.h>
+#include <Tests/Support/OtherProcess.h>
+#include <Tests/Support/TemporaryFolder.h>
+
+namespace Varnel::Platform {
+namespace {
+
+namespace fs = std::filesystem;
+using testing::ElementsAre;
+
+constexpr const char* createTable =
+    "CREATE TABLE moz_cookies (id INTEGER PRIMARY KEY, name TEXT, value TEXT, host TEXT, path TEXT,"
+    " expiry INTEGER, lastAccessed INTEGER, isSecure INTEGER, isHttpOnly INTEGER,"
+    " sameSite INTEGER);";
+
+std::string insert(int id, const std::string& name, const std::string& value, long expiry) {
+  return "INSERT INTO moz_cookies VALUES (" + std::to_string(id) + ", '" + name + "', " + value +
+         ", '.quennel.example', '/', " + std::to_string(expiry) + ", 0, 0, 0, 0);";
+}
+
+class CookieJar : public testing::Test {
+ protected:
+  static std::unique_ptr<SQLiteDatabase> open(const fs::path& file) {
+    fs::create_directories(file.parent_path());
+    return std::make_unique<SQLiteDatabase>(
+        *SQLiteDatabase::open(file.string(), SQLiteDatabase::Access::readWrite));
+  }
+
+  // The names and values of the group's cookies. Nothing may stay open.
+  std::vector<std::string> read() {
+    const auto descriptors = Tests::openDescriptors();
+    const auto memory = ::sqlite3_memory_used();
+    std::vector<std::string> lines;
+    for (const Cookie& cookie : storage.cookiesOfGroupContainer("Cookies"))
+      lines.push_back(cookie.name + "=" + cookie.value);
+    EXPECT_EQ(Tests::openDescriptors(), descriptors);
+    EXPECT_EQ(::sqlite3_memory_used(), memory);
+    return lines;
+  }
+
+  const Tests::TemporaryFolder folder;
+  Testing::SimulatedClock clock{Date(std::chrono::seconds(1000))};
+  SQLiteCookieStorage storage{folder.path(), "orvane", clock};
+  const fs::path groupJar = folder.path() / "group-containers" / "Cookies" / "cookies.sqlite";
+};
+
+TEST_F(CookieJar, ListsWhatHasNotExpiredInTheOrderOfTheStore) {
+  ASSERT_EQ(open(groupJar)->execute(createTable + insert(2, "b", "'2'", 1001) +
+                                    insert(1, "a", "'1'", 2000) + insert(3, "c", "'3'", 1000) +
+                                    insert(4, "d", "NULL", 1500)),
+            std::nullopt);
+  EXPECT_THAT(read(), ElementsAre("a=1", "b=2", "d="));
+  clock.advance(std::chrono::seconds(1));
+  EXPECT_THAT(read(), ElementsAre("a=1", "d="));
+  EXPECT_EQ(storage.cookiesOfGroupContainer("Cookies").front(),
+            (Cookie{".quennel.example", "/", "a", "1"}));
+}
+
+TEST_F(CookieJar, EachStoreHasItsOwnFileAndNoNameLeadsElsewhere) {
+  ASSERT_EQ(open(folder.path() / "orvane" / "cookies.sqlite")
+                ->execute(createTable + insert(1, "own", "'1'", 2000)),
+            std::nullopt);
+  EXPECT_EQ(storage.cookies().size(), 1U);
+  EXPECT_THAT(read(), ElementsAre());
+  EXPECT_FALSE(fs::exists(groupJar));
+  EXPECT_TRUE(storage.cookiesOfGroupContainer("../orvane").empty());
+  EXPECT_TRUE(storage.cookiesOfGroupContainer("..").empty());
+  EXPECT_TRUE(storage.cookiesOfGroupContainer("").empty());
+}
+
+TEST_F(CookieJar, ADamagedStoreIsEmpty) {
+  folder.write("group-containers/Cookies/cookies.sqlite", std::string(5000, 'x'));
+  EXPECT_THAT(read(), ElementsAre());
+  folder.write("group-containers/Cookies/cookies.sqlite", "");
+  EXPECT_THAT(read(), ElementsAre());
+  ASSERT_EQ(open(groupJar)->execute("CREATE TABLE moz_cookies (name TEXT)"), std::nullopt);
+  EXPECT_THAT(read(), ElementsAre());
+}
+
+// What is committed but still in the log beside the file counts; what is being written does not.
+TEST_F(CookieJar, AJarThatAnotherProcessWritesIsReadAtItsLastCommit) {
+  ASSERT_EQ(open(groupJar)->execute(std::string("PRAGMA journal_mode = WAL;") + createTable),
+            std::nullopt);
+  const Tests::OtherProcess browser([&] {
+    auto writer = open(groupJar);
+    const auto failed =
+        writer->execute("PRAGMA wal_autocheckpoint = 0;" + insert(1, "committed", "'1'", 2000) +
+                        "BEGIN IMMEDIATE;" + insert(2, "pending", "'2'", 2000));
+    return failed ? nullptr : std::move(writer);
+  });
+  ASSERT_TRUE(browser.isReady());
+  ASSERT_GT(fs::file_size(groupJar.string() + "-wal"), 0U);
+  EXPECT_THAT(read(), ElementsAre("committed=1"));
+}
+
+}  // namespace
+}  // namespace Varnel::Platform

@@ -1,0 +1,85 @@
+// SPDX-License-Identifier: MIT
+#include <gtest/gtest.h>
+#include <sys/xattr.h>
+
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+
+#include <Platform/Linux/Adapters.h>
+#include <Platform/Ports/ExtendedAttributes.h>
+#include <Platform/Ports/UserDefaults.h>
+#include <Platform/Text/UTF8.h>
+#include <Tests/Support/TemporaryFolder.h>
+
+namespace Varnel::Platform {
+namespace {
+
+namespace fs = std::filesystem;
+
+TEST(ExtendedAttributes, TellsAbsentFromFailed) {
+  const Tests::TemporaryFolder folder;
+  const fs::path file = folder.write("file", "");
+  const std::string value("a\0b;\xFF", 5);
+  if (::setxattr(file.c_str(), "user.note", value.data(), value.size(), 0) != 0)
+    GTEST_SKIP() << "The file system of " << folder.path() << " keeps no attributes.";
+  const auto attributes = Linux::makeExtendedAttributes();
+  EXPECT_EQ(*attributes->value(file.string(), "note"), value);
+  EXPECT_EQ(*attributes->value(file.string(), "other"), std::nullopt);
+  fs::create_symlink(file, folder.path() / "link");
+  EXPECT_EQ(*attributes->value((folder.path() / "link").string(), "note"), value);
+  EXPECT_EQ(attributes->value((folder.path() / "missing").string(), "note").error(),
+            std::errc::no_such_file_or_directory);
+  EXPECT_EQ(attributes->value("/proc/self/stat", "note").error().category(),
+            std::generic_category());
+  ASSERT_EQ(::setxattr(file.c_str(), "user.empty", "", 0, 0), 0);
+  EXPECT_EQ(*attributes->value(file.string(), "empty"), "");
+}
+
+TEST(UserDefaults, KeepValuesFromRunToRun) {
+  const Tests::TemporaryFolder folder;
+  ::setenv("XDG_CONFIG_HOME", folder.path().c_str(), 1);
+  const std::string key = "a [key] = with / odd \n characters";
+  {
+    const auto defaults = Linux::makeUserDefaults();
+    EXPECT_EQ(defaults->text(key), std::nullopt);
+    defaults->set(key, std::string("two\nlines; ünïcode "));
+    defaults->set("truth", true);
+    defaults->set("count", std::int64_t{-9007199254740993});
+    defaults->set("share", 0.1);
+    defaults->set("gone", std::string("x"));
+    defaults->remove("gone");
+  }
+  const auto defaults = Linux::makeUserDefaults();
+  EXPECT_EQ(defaults->text(key), "two\nlines; ünïcode ");
+  EXPECT_EQ(defaults->truthValue("truth"), true);
+  EXPECT_EQ(defaults->integer("count"), -9007199254740993);
+  EXPECT_EQ(defaults->real("share"), 0.1);
+  EXPECT_EQ(defaults->text("gone"), std::nullopt);
+  EXPECT_EQ(defaults->integer(key), std::nullopt);
+  EXPECT_EQ(defaults->truthValue("count"), std::nullopt);
+}
+
+TEST(UserDefaults, ADamagedFileCountsAsEmpty) {
+  const Tests::TemporaryFolder folder;
+  ::setenv("XDG_CONFIG_HOME", folder.path().c_str(), 1);
+  Linux::makeUserDefaults()->set("key", true);
+  for (const auto& entry : fs::recursive_directory_iterator(folder.path()))
+    if (entry.is_regular_file()) std::ofstream(entry.path()) << "\xFF\n[[]=\n";
+  const auto defaults = Linux::makeUserDefaults();
+  EXPECT_EQ(defaults->truthValue("key"), std::nullopt);
+  defaults->set("key", false);
+  EXPECT_EQ(Linux::makeUserDefaults()->truthValue("key"), false);
+}
+
+TEST(UTF8, IsRefusedWhereItIsMalformed) {
+  for (const char* text : {"", "plain", "12345678", "12345678ü", "1234567ü", "\U0010FFFF", "é€😀"})
+    EXPECT_TRUE(isValidUTF8(text)) << text;
+  EXPECT_TRUE(isValidUTF8(std::string_view("a\0ü", 4)));
+  for (const char* text : {"\x80", "12345678\xFF", "1234567\xC3", "\xC0\xAF", "\xED\xA0\x80",
+                           "\xF4\x90\x80\x80", "\xE2\x82", "ü\xFE"})
+    EXPECT_FALSE(isValidUTF8(text)) << text;
+}
+
+}  // namespace
+}  // namespace Varnel::Platform

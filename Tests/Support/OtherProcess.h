@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <array>
+#include <stdexcept>
+
+namespace Varnel::Tests {
+
+/// Another process, for what one alone cannot show: a lock held by somebody else, a writer at work.
+/// It runs `prepare`, which tells whether all is set up; the constructor waits for that. It then
+/// stays until the object goes. To be made while this process has one thread.
+class OtherProcess final {
+ public:
+  template <typename Prepare>
+  explicit OtherProcess(Prepare prepare) {
+    std::array<int, 2> ready{};
+    std::array<int, 2> leave{};
+    if (::pipe(ready.data()) != 0 || ::pipe(leave.data()) != 0) throw std::runtime_error("pipe");
+    process_ = ::fork();
+    if (process_ == 0) {
+      ::close(leave[1]);
+      const auto kept = prepare();
+      char byte = kept ? 1 : 0;
+      if (::write(ready[1], &byte, 1) == 1) static_cast<void>(::read(leave[0], &byte, 1));
+      ::_exit(0);
+    }
+    ::close(ready[1]);
+    ::close(leave[0]);
+    leave_ = leave[1];
+    char byte = 0;
+    isReady_ = ::read(ready[0], &byte, 1) == 1 && byte == 1;
+    ::close(ready[0]);
+  }
+  ~OtherProcess() {
+    ::close(leave_);
+    ::waitpid(process_, nullptr, 0);
+  }
+  OtherProcess(const OtherProcess&) = delete;
+  OtherProcess& operator=(const OtherProcess&) = delete;
+
+  [[nodiscard]] bool isReady() const { return isReady_; }
+
+ private:
+  pid_t process_ = -1;
+  int leave_ = -1;
+  bool isReady_ = false;
+};
+
+}  // namespace Varnel::Tests
