@@ -13,15 +13,21 @@ bool holdsInfoDictionary(const fs::path& folder) {
 
 }  // namespace
 
-std::optional<fs::path> findBundleFolder(const fs::path& image, std::string_view name) {
+std::optional<fs::path> findSharedFolder(const fs::path& image, std::string_view name) {
   if (!image.is_absolute()) return std::nullopt;
-  fs::path folder = image.parent_path();
-  if (holdsInfoDictionary(folder)) return folder;
-  for (; folder.has_relative_path(); folder = folder.parent_path()) {
+  for (fs::path folder = image.parent_path(); folder.has_relative_path();
+       folder = folder.parent_path()) {
     fs::path shared = folder / "share" / name;
     if (holdsInfoDictionary(shared)) return shared;
   }
   return std::nullopt;
+}
+
+std::optional<fs::path> findBundleFolder(const fs::path& image, std::string_view name) {
+  if (!image.is_absolute()) return std::nullopt;
+  fs::path folder = image.parent_path();
+  if (holdsInfoDictionary(folder)) return folder;
+  return findSharedFolder(image, name);
 }
 
 }  // namespace Varnel::Platform

@@ -9,9 +9,15 @@
 
 namespace Varnel::Platform {
 
-/// The folder of the Info.plist that belongs to an executable or library: the one it lies in, or
-/// else `share/NAME` of the nearest folder above it (its installation prefix, or the build folder).
-/// Absent when there is no such file. Any thread; reads folders.
+// Where the Info.plist of an executable or library is; absent when there is none. Any thread; reads
+// folders.
+
+/// The folder `share/NAME` of the nearest folder above the image that has one: of its installation
+/// prefix, or of the build folder.
+[[nodiscard]] VARNEL_API std::optional<std::filesystem::path> findSharedFolder(
+    const std::filesystem::path& image, std::string_view name);
+
+/// The folder that the image lies in or, when that has no Info.plist, the shared folder.
 [[nodiscard]] VARNEL_API std::optional<std::filesystem::path> findBundleFolder(
     const std::filesystem::path& image, std::string_view name);
 

@@ -24,10 +24,10 @@ std::optional<std::string> asText(const std::optional<fs::path>& path) {
 // "libvarnel.so.1.2" and an executable "orvane" go by "varnel" and "orvane".
 std::string nameOfImage(const fs::path& image) {
   std::string name = image.filename().string();
-  if (const std::size_t suffix = name.find(".so"); suffix != std::string::npos) {
-    name.resize(suffix);
-    if (name.starts_with("lib")) name.erase(0, 3);
-  }
+  const std::size_t suffix = name.ends_with(".so") ? name.size() - 3 : name.find(".so.");
+  if (suffix == std::string::npos) return name;
+  name.resize(suffix);
+  if (name.starts_with("lib")) name.erase(0, 3);
   return name;
 }
 
@@ -65,7 +65,7 @@ class ProcProcessInfo final : public ProcessInfo {
 
   std::optional<std::string> mainBundleFolder() const override {
     const fs::path executable = executablePath();
-    return asText(findBundleFolder(executable, nameOfImage(executable)));
+    return asText(findBundleFolder(executable, executable.filename().string()));
   }
 
   std::optional<std::string> bundleFolderOfCode(const void* address,
@@ -76,7 +76,10 @@ class ProcProcessInfo final : public ProcessInfo {
     fs::path path = fs::canonical(image.dli_fname, failed);
     // The loader names the executable itself as it was called, perhaps by a relative path.
     if (failed) path = executablePath();
-    return asText(findBundleFolder(path, name.empty() ? nameOfImage(path) : std::string(name)));
+    if (name.empty()) return asText(findBundleFolder(path, nameOfImage(path)));
+    // The Info.plist beside a library may be that of the application it is shipped with.
+    const auto shared = findSharedFolder(path, name);
+    return asText(shared ? shared : findBundleFolder(path, name));
   }
 };
 

@@ -17,7 +17,8 @@ class VARNEL_API AppendFile {
   virtual ~AppendFile() = default;
 
   /// Appends all the bytes at the end of the file, wherever that is by now: another process may
-  /// append to the same file. Returns the system's error (generic category), or none.
+  /// append to the same file. Returns the system's error (generic category), or none; after an
+  /// error some of the bytes may stand in the file.
   [[nodiscard]] virtual std::error_code append(std::string_view bytes) = 0;
 };
 

@@ -25,7 +25,12 @@ class UserLocale;
 class VolumeCatalog;
 class Workspace;
 
-/// One service of each kind. The objects behind the references outlive whoever uses them.
+/// One service of each kind. The objects behind the references outlive whoever uses them; those of
+/// the process are never destroyed.
+///
+///     static auto& clock = *new MyClock();  // a host's own service among the system's
+///     const Ports& system = systemPorts();
+///     if (!installProcessPorts({.appendFiles = system.appendFiles, .clock = clock, …})) return 1;
 struct Ports {
   AppendFiles& appendFiles;
   Clock& clock;
@@ -55,8 +60,9 @@ struct Ports {
 /// first use. Any thread; made on first use and never destroyed.
 [[nodiscard]] VARNEL_API const Ports& processPorts();
 
-/// Makes `ports` the process's services. It must be called before anything of the framework is used
-/// and at most once; returns false, and changes nothing, when it comes too late.
+/// Makes a copy of `ports` the process's services. It must be called before anything of the
+/// framework is used and at most once; returns false, and changes nothing, when it comes too late.
+/// Any thread.
 [[nodiscard]] VARNEL_API bool installProcessPorts(const Ports& ports);
 
 /// The services of the system that the library was built for. Whoever builds for another system

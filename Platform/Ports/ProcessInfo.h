@@ -36,9 +36,9 @@ class VARNEL_API ProcessInfo {
   /// The folder that holds the running application's Info.plist; absent when it has none.
   [[nodiscard]] virtual std::optional<std::string> mainBundleFolder() const = 0;
 
-  /// The folder with the Info.plist of the library or executable that contains `address`. `name` is
-  /// its folder's name below an installation's shared data; when empty, the image's own name
-  /// counts.
+  /// The folder with the Info.plist of the library or executable that contains `address`; absent
+  /// when there is none. `name` is its folder's name below an installation's shared data, which
+  /// counts before an Info.plist beside the library; when empty, the image's own name serves.
   [[nodiscard]] virtual std::optional<std::string> bundleFolderOfCode(
       const void* address, std::string_view name) const = 0;
 };

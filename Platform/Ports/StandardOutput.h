@@ -14,14 +14,16 @@ class VARNEL_API StandardOutput {
   virtual ~StandardOutput() = default;
 
   /// Prints the text as it is, with no terminator. Texts of different threads never mix. A stream
-  /// that is closed or full loses the text without a word.
+  /// that is closed or full loses the text without a word; one whose reader is slow may block.
   virtual void print(std::string_view text) = 0;
 };
 
 /// Prints on standard error instead, for hosts whose standard output is their result alone:
 ///
-///     static const auto errorOutput = makeStandardErrorOutput();
-///     installProcessPorts(systemPorts().withStandardOutput(*errorOutput));
+///     static StandardOutput& errorOutput = *makeStandardErrorOutput().release();
+///     if (!installProcessPorts(systemPorts().withStandardOutput(errorOutput))) return 1;
+///
+/// It is released from its pointer because destructors may log until the process has ended.
 [[nodiscard]] VARNEL_API std::unique_ptr<StandardOutput> makeStandardErrorOutput();
 
 }  // namespace Varnel::Platform

@@ -7,7 +7,8 @@
 
 namespace Varnel::Platform {
 
-/// The user that the process runs as. Any thread. Paths have no trailing "/".
+/// The user that the process runs as. Any thread. Paths have no trailing "/"
+/// (but the root is "/").
 class VARNEL_API UserAccount {
  public:
   virtual ~UserAccount() = default;

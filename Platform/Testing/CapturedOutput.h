@@ -11,6 +11,10 @@
 namespace Varnel::Platform::Testing {
 
 /// A standard output that keeps what is printed. Any thread.
+///
+///     CapturedOutput output;
+///     …
+///     EXPECT_EQ(output.text(), "Will NOT store log\n");
 class CapturedOutput final : public StandardOutput {
  public:
   void print(std::string_view text) override {

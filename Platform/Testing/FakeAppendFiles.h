@@ -31,7 +31,7 @@ class FakeAppendFiles final : public AppendFiles {
     return std::unique_ptr<AppendFile>(std::make_unique<File>(*this, path));
   }
 
-  /// From now on no file can be opened.
+  /// From now on no file can be opened; with `std::errc()` each one can again. Open files stay so.
   void failOpening(std::errc failure) {
     const std::lock_guard lock(mutex_);
     openFailure_ = failure;

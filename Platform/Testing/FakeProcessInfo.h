@@ -11,13 +11,16 @@
 namespace Varnel::Platform::Testing {
 
 /// A process whose facts the test sets. Set them before other threads read.
+///
+///     FakeProcessInfo process;
+///     process.environment["APP_SANDBOX_CONTAINER_ID"] = "";
 class FakeProcessInfo final : public ProcessInfo {
  public:
   std::map<std::string, std::string, std::less<>> environment;
   OperatingSystemVersion systemVersion = {6, 1, 0};
   std::string executable = "/usr/bin/host";
-  std::optional<std::string> mainBundle;
-  std::optional<std::string> codeBundle;
+  std::optional<std::string> mainBundle;  ///< The folder with the application's Info.plist.
+  std::optional<std::string> codeBundle;  ///< The same of any code, whatever address is asked.
 
   [[nodiscard]] std::optional<std::string> environmentVariable(
       std::string_view name) const override {

@@ -10,6 +10,9 @@
 namespace Varnel::Platform::Testing {
 
 /// A user account whose facts the test sets. Set them before other threads read.
+///
+///     FakeUserAccount user;
+///     user.home = temporaryFolder;  // what "~" stands for; `realHome` is the one on record
 class FakeUserAccount final : public UserAccount {
  public:
   std::string home = "/home/ada";

@@ -10,6 +10,9 @@
 namespace Varnel::Platform::Testing {
 
 /// A machine with the applications that the test installs. Set them before other threads read.
+///
+///     FakeWorkspace workspace;
+///     workspace.applications.emplace("com.quennel.Orvane2", URL::fileURLWithPath("/opt/app/"));
 class FakeWorkspace final : public Workspace {
  public:
   std::map<std::string, URL> applications;  ///< Location by bundle identifier.

@@ -13,12 +13,17 @@ namespace Varnel::Platform::Testing {
 ///     clock.advance(std::chrono::hours(24));
 class SimulatedClock final : public Clock {
  public:
+  /// The start is 1970-01-01 UTC unless given.
   explicit SimulatedClock(Date start = {}) : now_(start) {}
 
   [[nodiscard]] Date now() const override { return now_.load(); }
 
   void set(Date now) { now_.store(now); }
-  void advance(Date::duration step) { now_.store(now_.load() + step); }
+  void advance(Date::duration step) {
+    Date before = now_.load();
+    while (!now_.compare_exchange_weak(before, before + step)) {
+    }
+  }
 
  private:
   std::atomic<Date> now_;

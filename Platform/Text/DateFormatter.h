@@ -10,7 +10,8 @@
 
 namespace Varnel::Platform {
 
-/// Writes dates by a pattern of Unicode Technical Standard #35, in the process's time zone.
+/// Writes dates by a pattern of Unicode Technical Standard #35, in the time zone that the process
+/// had when the formatter was made.
 ///
 ///     DateFormatter("YYYY-MM-dd HH:mm:ss", "en_US").string(clock.now());
 ///
@@ -19,11 +20,14 @@ namespace Varnel::Platform {
 /// unit.
 class VARNEL_API DateFormatter final {
  public:
+  /// A pattern that cannot be written stands for "yyyy-MM-dd HH:mm:ss"; a locale (an ICU
+  /// identifier) that is unknown for the nearest known one.
   DateFormatter(std::string_view pattern, std::string_view localeIdentifier);
   ~DateFormatter();
   DateFormatter(const DateFormatter&) = delete;
   DateFormatter& operator=(const DateFormatter&) = delete;
 
+  /// The text of the date, in UTF-8.
   [[nodiscard]] std::string string(Date date) const;
 
  private:

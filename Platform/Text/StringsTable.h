@@ -16,8 +16,8 @@ using StringsTable = std::map<std::string, std::string, std::less<>>;
 /// The strings table that the bytes of a property list hold: a dictionary of texts. Values of any
 /// other type are left out; absent when the bytes are no property list or no dictionary.
 ///
-///     const auto table =
-///     parseStringsTable(R"(<dict><key>Quit</key><string>Ende</string></dict>)");
+///     if (const auto table = parseStringsTable(bytes))
+///       if (const auto text = table->find("Quit"); text != table->end()) use(text->second);
 ///
 /// Any thread.
 [[nodiscard]] VARNEL_API std::optional<StringsTable> parseStringsTable(std::string_view bytes);

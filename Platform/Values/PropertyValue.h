@@ -25,6 +25,8 @@ using PropertyDictionary = std::map<std::string, PropertyValue, std::less<>>;
 ///
 ///     const PropertyValue* serial = find(characteristics, "Serial Number");
 ///     if (const auto* text = serial ? serial->as<std::string>() : nullptr) use(*text);
+///
+/// A plain value; threads may share one as any other value. Pointers into it live as long as it.
 class PropertyValue final {
  public:
   using Storage = std::variant<bool, std::int64_t, double, std::string, PropertyData, Date,

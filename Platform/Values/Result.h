@@ -14,6 +14,8 @@ namespace Varnel::Platform {
 ///
 ///     if (auto volume = catalog.volumeURL(url)) use(*volume);
 ///     else report(volume.error());
+///
+/// A plain value; threads may share one as any other value.
 template <typename Value, typename Error = PlatformError>
 class [[nodiscard]] Result final {
  public:

@@ -24,7 +24,8 @@ namespace Varnel {
 ///     };
 ///     auto module = makeModule<ReportModule>();  // logs "Initalizing module 1.4 (210/undefined)"
 ///
-/// Any thread. `bundle` and `version` are found by their first reader unless they were set before.
+/// Any thread. `bundle` and `version` are found by their first reader unless they were set before;
+/// what finds the bundle must not ask for either.
 class VARNEL_API BaseModule {
  public:
   BaseModule();

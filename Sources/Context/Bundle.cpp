@@ -5,6 +5,7 @@
 #include <fstream>
 #include <map>
 #include <mutex>
+#include <sstream>
 #include <utility>
 
 #include <Platform/Ports/Ports.h>
@@ -22,10 +23,15 @@ using Platform::StringsTable;
 
 constexpr std::string_view developmentLanguage = "en";
 
-// Empty, and so no property list, when the file cannot be read.
+// Empty, and so no property list, when the file cannot be read. A folder or a device is not tried:
+// reading it could fail late or never end.
 std::string bytesOf(const fs::path& file) {
-  std::ifstream stream(file, std::ios::binary);
-  return std::string((std::istreambuf_iterator<char>(stream)), {});
+  std::error_code failed;
+  if (!fs::is_regular_file(file, failed)) return {};
+  std::ostringstream bytes;
+  // Unlike an iterator over the stream, this stops without an exception where the disk fails.
+  bytes << std::ifstream(file, std::ios::binary).rdbuf();
+  return std::move(bytes).str();
 }
 
 std::optional<PropertyDictionary> readDictionary(const fs::path& file) {

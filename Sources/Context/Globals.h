@@ -59,7 +59,7 @@ class VARNEL_API Globals final {
   [[nodiscard]] static bool isEndUserFeaturesEnabled();
 
   /// The folder that stands in for the trash, made on first use. It bears the temporary resource
-  /// value `OVURLIsBookmarkedKey`.
+  /// value `OVURLIsBookmarkedKey` (see ProcessFacts.h). That it could not be made is not told.
   [[nodiscard]] static const Platform::URL& fakeTrashURL();
 
   /// `baseIdentifier()` and the suffix joined. An empty suffix is a programming error and stops the

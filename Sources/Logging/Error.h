@@ -21,7 +21,7 @@ namespace Varnel {
 ///     };
 ///
 /// Every error bridges to the platform error of its domain and code. An error type that is thrown
-/// may derive from a standard exception as well.
+/// may derive from a standard exception as well. Errors are immutable values; any thread.
 class VARNEL_API Error {
  public:
   constexpr virtual ~Error() = default;

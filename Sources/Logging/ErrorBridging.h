@@ -12,6 +12,8 @@ namespace Varnel {
 
 // How the errors of C++ itself become platform errors. (A `std::error_code` is one by construction:
 // `PlatformError(code)`.) Any thread.
+//
+//     catch (const std::exception& caught) { presentAlert(platformError(caught)); }
 
 /// The name, without scope, of the most derived standard type that the exception is: "out_of_range"
 /// for a host's own class derived from it. Literal texts; nothing is demangled.

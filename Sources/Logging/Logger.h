@@ -55,7 +55,8 @@ class VARNEL_API Logger final {
   /// The process's logger, made on first use; it lives as long as the process.
   [[nodiscard]] static Logger& instance();
 
-  /// A logger of one's own; `baseIdentifier` names the folder of its files.
+  /// A logger of one's own; `baseIdentifier` names the folder of its files. The ports must outlive
+  /// it. Destruction, which nobody may be logging at, writes what has gathered.
   Logger(Ports ports, std::string_view baseIdentifier);
   ~Logger();
   Logger(const Logger&) = delete;

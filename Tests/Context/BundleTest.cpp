@@ -57,6 +57,13 @@ TEST_F(BundleTest, WhatIsMissingOrDamagedIsAbsent) {
   EXPECT_EQ(inLanguages({"en"}).infoDictionary(), nullptr);
 }
 
+TEST_F(BundleTest, FoldersInThePlaceOfItsFilesAreAbsentToo) {
+  folder_.write("Info.plist/file", "");
+  folder_.write("it.lproj/Localizable.strings/file", "");
+  EXPECT_EQ(inLanguages({"en"}).infoDictionary(), nullptr);
+  EXPECT_EQ(inLanguages({"it"}).localizedString("Only English"), "English text");
+}
+
 TEST_F(BundleTest, ReadsTheInformationDictionary) {
   folder_.write("Info.plist",
                 "<plist><dict><key>CFBundleIdentifier</key><string>com.quennel.site.X</string>"

@@ -125,6 +125,11 @@ TEST_F(LoggerProcessTest, GoesOnWhenTheDiskIsFull) {
   EXPECT_THAT(printed, HasSubstr(report + report + report));
 }
 
+TEST_F(LoggerProcessTest, KeepsItsFileApartFromAClosedStandardOutput) {
+  (void)run("exit A 3 0 >&-");
+  EXPECT_EQ(std::ranges::count(log(), '\n'), 3) << log();
+}
+
 TEST_F(LoggerProcessTest, LeavesStandardOutputToAHostThatAsksForIt) {
   EXPECT_EQ(run("standard-error A 3 0 2>/dev/null"), "");
   const std::string printed = entriesIn(run("standard-error B 3 0 2>&1 >/dev/null"));
