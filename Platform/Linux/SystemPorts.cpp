@@ -5,6 +5,7 @@
 #include <Platform/Ports/DeviceRegistry.h>
 #include <Platform/Ports/DiskArbitration.h>
 #include <Platform/Ports/ExtendedAttributes.h>
+#include <Platform/Ports/HTTPClient.h>
 #include <Platform/Ports/MachineIdentity.h>
 #include <Platform/Ports/Ports.h>
 #include <Platform/Ports/ProcessInfo.h>
@@ -50,6 +51,7 @@ const Ports& systemPorts() {
       .deviceRegistry = keep(Linux::makeDeviceRegistry()),
       .diskArbitration = keep(Linux::makeDiskArbitration(mountTable)),
       .extendedAttributes = keep(Linux::makeExtendedAttributes()),
+      .httpClient = keep(POSIX::makeHTTPClient()),
       .machineIdentity = keep(Linux::makeMachineIdentity()),
       .processInfo = keep(Linux::makeProcessInfo()),
       .processLauncher = keep(Linux::makeProcessLauncher()),

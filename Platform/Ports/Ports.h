@@ -11,6 +11,7 @@ class CookieStorage;
 class DeviceRegistry;
 class DiskArbitration;
 class ExtendedAttributes;
+class HTTPClient;
 class MachineIdentity;
 class ProcessInfo;
 class ProcessLauncher;
@@ -31,6 +32,7 @@ struct Ports {
   DeviceRegistry& deviceRegistry;
   DiskArbitration& diskArbitration;
   ExtendedAttributes& extendedAttributes;
+  HTTPClient& httpClient;
   MachineIdentity& machineIdentity;
   ProcessInfo& processInfo;
   ProcessLauncher& processLauncher;
