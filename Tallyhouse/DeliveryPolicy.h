@@ -36,7 +36,7 @@ struct VARNEL_API DeliveryPolicy final {
   Duration longestRetryAfter = std::chrono::hours(24);  ///< The most that a server may ask for.
   int triesOfRefused = 3;  ///< After as many refusals an event is set aside.
   std::size_t batchEvents = 20;
-  std::size_t batchBytes = 16'000;
+  std::size_t batchBytes = 15'000;
 
   /// What an HTTP status means; no status means that there was no answer.
   [[nodiscard]] static Verdict verdict(std::optional<int> status);
