@@ -9,6 +9,7 @@
 namespace Tallyhouse {
 namespace {
 
+constexpr std::size_t usualHit = 512;
 constexpr auto unreserved = Varnel::Platform::alphanumericAnd("-._~");
 
 void append(std::string& hit, std::string_view name, std::string_view value) {
@@ -19,7 +20,9 @@ void append(std::string& hit, std::string_view name, std::string_view value) {
 }  // namespace
 
 std::string encodedHit(const AnalyticsEvent& event, const AnalyticsIdentity& identity) {
-  std::string hit = "v=1&t=event";
+  std::string hit;
+  hit.reserve(usualHit);
+  hit += "v=1&t=event";
   append(hit, "tid", identity.trackingID);
   append(hit, "cid", identity.clientID);
   append(hit, "ec", event.category);
@@ -28,10 +31,10 @@ std::string encodedHit(const AnalyticsEvent& event, const AnalyticsIdentity& ide
   if (event.value) append(hit, "ev", std::to_string(*event.value));
   for (std::size_t i = 0; i < event.customDimensions.size(); ++i)
     if (const auto& dimension = event.customDimensions[i])
-      append(hit, fmt::format("cd{}", i + 1), *dimension);
+      append(hit, "cd" + std::to_string(i + 1), *dimension);
   for (std::size_t i = 0; i < event.customMetrics.size(); ++i)
     if (const auto& metric = event.customMetrics[i])
-      append(hit, fmt::format("cm{}", i + 1), std::to_string(*metric));
+      append(hit, "cm" + std::to_string(i + 1), std::to_string(*metric));
   if (event.isTest) append(hit, "ds", "test");
   return hit;
 }

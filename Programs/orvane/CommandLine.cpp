@@ -9,7 +9,9 @@
 #include <Varnel/Context/BuildSwitches.h>
 #include <orvane/DisksCommand.h>
 #include <orvane/IdentifyCommand.h>
+#include <orvane/LinkCommand.h>
 #include <orvane/OriginCommand.h>
+#include <orvane/ScanAnalytics.h>
 #include <orvane/ScanCommand.h>
 
 namespace Orvane {
@@ -61,6 +63,12 @@ void addScan(CLI::App& app, Invocation& invocation) {
           "--qos", [scan = command](const std::string& name) { scan->qos = qualityNamed(name); },
           "How urgent reading is: background, utility, user-initiated, user-interactive")
       ->type_name("QUALITY");
+  options->add_option("--analytics", command->analyticsEndpoint, "Send events of the scan there")
+      ->type_name("URL")
+      ->check([](const std::string& text) {
+        return ScanAnalytics::isEndpoint(text) ? std::string() : "\"" + text + "\" is no https URL";
+      });
+  options->add_flag("--print-events", command->printsEvents, "Show events in the log");
 }
 
 void addDisks(CLI::App& app, Invocation& invocation) {
@@ -99,6 +107,15 @@ void addIdentify(CLI::App& app, Invocation& invocation) {
   options->add_flag("--json", command->isJSON, "Print one JSON object");
 }
 
+void addLink(CLI::App& app, Invocation& invocation) {
+  auto [options, command] =
+      addCommand<LinkCommand>(app, invocation, "link", "Print a link through the redirect service");
+  options->add_option("--action", command->action, "What the service is asked for")
+      ->type_name("ACTION");
+  options->add_option("words", command->words, "A URL; with an action, parameters KEY=VALUE")
+      ->type_name("");
+}
+
 }  // namespace
 
 std::variant<Invocation, Information, UsageError> parseCommandLine(int count,
@@ -112,6 +129,7 @@ std::variant<Invocation, Information, UsageError> parseCommandLine(int count,
   addDisks(app, invocation);
   addOrigin(app, invocation);
   addIdentify(app, invocation);
+  addLink(app, invocation);
   std::vector<std::string> words(arguments + std::min(count, 1), arguments + count);
   protectFolders(words);
   std::reverse(words.begin(), words.end());  // as the parser wants them

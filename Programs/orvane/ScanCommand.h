@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -16,6 +17,8 @@ struct ScanCommand {
   Varnel::Platform::QualityOfService qos = Varnel::Platform::QualityOfService::utility;
   bool isJSON = false;
   bool showsProgress = false;
+  std::optional<std::string> analyticsEndpoint;  ///< Where events go; nowhere without one.
+  bool printsEvents = false;
 
   /// Runs the command and returns the program's exit status.
   [[nodiscard]] int run(Console& console) const;
