@@ -45,8 +45,7 @@ double median(std::vector<double> values) {
 
 std::size_t composeWithPeer(const UriQueryListA& items) {
   char* query = nullptr;
-  if (uriComposeQueryMallocExA(&query, &items, URI_FALSE, URI_FALSE) != URI_SUCCESS)
-    std::abort();
+  if (uriComposeQueryMallocExA(&query, &items, URI_FALSE, URI_FALSE) != URI_SUCCESS) std::abort();
   const std::size_t size = std::char_traits<char>::length(query);
   std::free(query);
   return size;
