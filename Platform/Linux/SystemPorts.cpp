@@ -5,6 +5,7 @@
 #include <Platform/Ports/DeviceRegistry.h>
 #include <Platform/Ports/DiskArbitration.h>
 #include <Platform/Ports/ExtendedAttributes.h>
+#include <Platform/Ports/HTTPClient.h>
 #include <Platform/Ports/MachineIdentity.h>
 #include <Platform/Ports/MainQueue.h>
 #include <Platform/Ports/Ports.h>
@@ -53,6 +54,7 @@ const Ports& systemPorts() {
       .deviceRegistry = keep(Linux::makeDeviceRegistry()),
       .diskArbitration = keep(Linux::makeDiskArbitration(mountTable)),
       .extendedAttributes = keep(Linux::makeExtendedAttributes()),
+      .httpClient = keep(POSIX::makeHTTPClient()),
       .machineIdentity = keep(Linux::makeMachineIdentity()),
       .mainQueue = keep(Linux::makeMainQueue()),
       .processInfo = keep(Linux::makeProcessInfo()),

@@ -7,6 +7,7 @@ namespace Varnel::Platform {
 
 class AppendFiles;
 class Clock;
+class HTTPClient;
 class SecurityScope;
 class StandardOutput;
 class SystemLog;
@@ -20,6 +21,8 @@ namespace Varnel::Platform::POSIX {
 
 [[nodiscard]] std::unique_ptr<AppendFiles> makeAppendFiles();
 [[nodiscard]] std::unique_ptr<Clock> makeClock();
+/// Without the module of libcurl every post fails.
+[[nodiscard]] std::unique_ptr<HTTPClient> makeHTTPClient();
 [[nodiscard]] std::unique_ptr<SecurityScope> makeSecurityScope();
 [[nodiscard]] std::unique_ptr<StandardOutput> makeStandardOutput();
 [[nodiscard]] std::unique_ptr<SystemLog> makeSystemLog();

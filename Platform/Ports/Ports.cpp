@@ -24,6 +24,7 @@ Ports Ports::withStandardOutput(StandardOutput& output) const {
       .deviceRegistry = deviceRegistry,
       .diskArbitration = diskArbitration,
       .extendedAttributes = extendedAttributes,
+      .httpClient = httpClient,
       .machineIdentity = machineIdentity,
       .mainQueue = mainQueue,
       .processInfo = processInfo,

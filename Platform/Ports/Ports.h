@@ -11,6 +11,7 @@ class CookieStorage;
 class DeviceRegistry;
 class DiskArbitration;
 class ExtendedAttributes;
+class HTTPClient;
 class MachineIdentity;
 class MainQueue;
 class ProcessInfo;
@@ -38,6 +39,7 @@ struct Ports {
   DeviceRegistry& deviceRegistry;
   DiskArbitration& diskArbitration;
   ExtendedAttributes& extendedAttributes;
+  HTTPClient& httpClient;
   MachineIdentity& machineIdentity;
   MainQueue& mainQueue;
   ProcessInfo& processInfo;

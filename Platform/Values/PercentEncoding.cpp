@@ -17,39 +17,45 @@ bool isEscape(std::string_view text) {
   return text.size() >= 3 && text[0] == '%' && hexValue(text[1]) >= 0 && hexValue(text[2]) >= 0;
 }
 
-void appendEscape(std::string& out, char c) {
+char* writeEscape(char* out, char c) {
   const auto byte = static_cast<unsigned char>(c);
-  const char escape[] = {'%', hexDigits[byte >> 4], hexDigits[byte & 0x0F]};
-  out.append(escape, sizeof escape);
-}
-
-// Appends runs of allowed bytes whole; `stays` may let further bytes pass.
-template <typename Stays>
-void appendEncoded(std::string& out, std::string_view text, const ByteSet& allowed, Stays stays) {
-  std::size_t run = 0;
-  for (std::size_t i = 0; i < text.size(); ++i) {
-    if (contains(allowed, text[i]) || stays(text.substr(i))) continue;
-    out.append(text, run, i - run);
-    appendEscape(out, text[i]);
-    run = i + 1;
-  }
-  out.append(text, run);
+  out[0] = '%';
+  out[1] = hexDigits[byte >> 4];
+  out[2] = hexDigits[byte & 0x0F];
+  return out + percentEncodedByteSize;
 }
 
 }  // namespace
 
-std::size_t percentEncodedSize(std::string_view text, const ByteSet& allowed) {
-  std::size_t size = text.size();
-  for (const char c : text) size += contains(allowed, c) ? 0 : 2;
-  return size;
+char* writePercentEncoded(char* out, std::string_view text, const ByteSet& allowed) {
+  for (const char c : text) {
+    if (contains(allowed, c))
+      *out++ = c;
+    else
+      out = writeEscape(out, c);
+  }
+  return out;
 }
 
 void appendPercentEncoded(std::string& out, std::string_view text, const ByteSet& allowed) {
-  appendEncoded(out, text, allowed, [](std::string_view) { return false; });
+  const std::size_t before = out.size();
+  out.resize(before + text.size() * percentEncodedByteSize);
+  const char* const end = writePercentEncoded(out.data() + before, text, allowed);
+  out.resize(static_cast<std::size_t>(end - out.data()));
 }
 
 void appendPercentRepaired(std::string& out, std::string_view text, const ByteSet& allowed) {
-  appendEncoded(out, text, allowed, isEscape);
+  // What is valid already, mostly everything, goes over in runs.
+  std::size_t run = 0;
+  for (std::size_t i = 0; i < text.size(); ++i) {
+    if (contains(allowed, text[i]) || isEscape(text.substr(i))) continue;
+    out.append(text, run, i - run);
+    char escape[percentEncodedByteSize];
+    writeEscape(escape, text[i]);
+    out.append(escape, sizeof escape);
+    run = i + 1;
+  }
+  out.append(text, run);
 }
 
 std::string percentDecoded(std::string_view text) {

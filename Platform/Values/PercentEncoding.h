@@ -28,8 +28,12 @@ constexpr ByteSet alphanumericAnd(std::string_view others) {
 /// What may stand in a path as it is (RFC 3986, section 3.3).
 inline constexpr ByteSet pathBytes = alphanumericAnd("-._~!$&'()*+,;=:@/");
 
-/// The length of `text` once encoded.
-[[nodiscard]] std::size_t percentEncodedSize(std::string_view text, const ByteSet& allowed);
+/// The most bytes that one byte encoded takes.
+inline constexpr std::size_t percentEncodedByteSize = 3;
+
+/// Writes `text` as `appendPercentEncoded` does, to where there is room for the worst case, and
+/// returns the end of what was written.
+[[nodiscard]] char* writePercentEncoded(char* out, std::string_view text, const ByteSet& allowed);
 
 /// Appends `text`, each byte outside `allowed` as "%" and two upper-case digits.
 void appendPercentEncoded(std::string& out, std::string_view text, const ByteSet& allowed);

@@ -64,10 +64,9 @@ std::string withoutDotSegments(std::string_view path) {
 }
 
 std::string mergedPath(const URLComponents& base, std::string_view reference) {
-  if (base.host && base.path.empty()) return "/" + std::string(reference);
-  const std::size_t slash = base.path.rfind('/');
-  std::string merged(slash == std::string_view::npos ? std::string_view()
-                                                     : base.path.substr(0, slash + 1));
+  const bool isBareHost = base.host && base.path.empty();
+  // Without a slash, the last position plus one is nothing at all.
+  std::string merged(isBareHost ? "/" : base.path.substr(0, base.path.rfind('/') + 1));
   return merged += reference;
 }
 

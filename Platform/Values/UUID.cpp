@@ -3,14 +3,13 @@
 
 #include <array>
 #include <cstdint>
-#include <iterator>
 #include <random>
-
-#include <fmt/format.h>
+#include <string_view>
 
 namespace Varnel::Platform {
 
 std::string randomUUIDString() {
+  constexpr std::string_view hexDigits = "0123456789ABCDEF";
   // The system's randomness comes without a library whose state is gone once the process exits:
   // an inventory may still be under way by then.
   std::random_device random;
@@ -25,7 +24,8 @@ std::string randomUUIDString() {
   text.reserve(36);
   for (std::size_t i = 0; i < bytes.size(); ++i) {
     if (i == 4 || i == 6 || i == 8 || i == 10) text += '-';
-    fmt::format_to(std::back_inserter(text), "{:02X}", bytes[i]);
+    text += hexDigits[bytes[i] >> 4];
+    text += hexDigits[bytes[i] & 0x0F];
   }
   return text;
 }

@@ -11,9 +11,11 @@
 #include <Varnel/Context/BuildSwitches.h>
 #include <orvane/DisksCommand.h>
 #include <orvane/IdentifyCommand.h>
+#include <orvane/LinkCommand.h>
 #include <orvane/MenuCommand.h>
 #include <orvane/OriginCommand.h>
 #include <orvane/PathCommand.h>
+#include <orvane/ScanAnalytics.h>
 #include <orvane/ScanCommand.h>
 #include <orvane/SoundCommand.h>
 
@@ -67,6 +69,12 @@ void addScan(CLI::App& app, Invocation& invocation) {
           "--qos", [scan = command](const std::string& name) { scan->qos = qualityNamed(name); },
           "How urgent reading is: background, utility, user-initiated, user-interactive")
       ->type_name("QUALITY");
+  options->add_option("--analytics", command->analyticsEndpoint, "Send events of the scan there")
+      ->type_name("URL")
+      ->check([](const std::string& text) {
+        return ScanAnalytics::isEndpoint(text) ? std::string() : "\"" + text + "\" is no https URL";
+      });
+  options->add_flag("--print-events", command->printsEvents, "Show events in the log");
 }
 
 void addDisks(CLI::App& app, Invocation& invocation) {
@@ -145,6 +153,15 @@ void addIdentify(CLI::App& app, Invocation& invocation) {
   options->add_flag("--json", command->isJSON, "Print one JSON object");
 }
 
+void addLink(CLI::App& app, Invocation& invocation) {
+  auto [options, command] =
+      addCommand<LinkCommand>(app, invocation, "link", "Print a link through the redirect service");
+  options->add_option("--action", command->action, "What the service is asked for")
+      ->type_name("ACTION");
+  options->add_option("words", command->words, "A URL; with an action, parameters KEY=VALUE")
+      ->type_name("");
+}
+
 }  // namespace
 
 std::variant<Invocation, Information, UsageError> parseCommandLine(int count,
@@ -157,6 +174,7 @@ std::variant<Invocation, Information, UsageError> parseCommandLine(int count,
   addScan(app, invocation);
   addDisks(app, invocation);
   addIdentify(app, invocation);
+  addLink(app, invocation);
   addMenu(app, invocation);
   addOrigin(app, invocation);
   addPath(app, invocation);

@@ -22,6 +22,7 @@
 #include <orvane/Scan/DuplicateFinder.h>
 #include <orvane/Scan/FileSystem.h>
 #include <orvane/Scan/ScanObserver.h>
+#include <orvane/ScanAnalytics.h>
 #include <orvane/SoundCommand.h>
 #include <orvane/StandardStreams.h>
 
@@ -90,6 +91,8 @@ int ScanCommand::run(Console& console) const {
   const auto paths = resolved(folders, console);
   if (!paths) return 1;
 
+  ScanAnalytics analytics(analyticsEndpoint, printsEvents);
+  analytics.scanStarted(paths->size());
   ScanLog log;
   for (const std::string& path : *paths) log.log("Will scan", URL::fileURLWithPath(path + "/"));
 
@@ -108,12 +111,14 @@ int ScanCommand::run(Console& console) const {
     progress.reset();
     if (interruption.signal() != 0) {
       log.log("Did cancel");
+      analytics.scanCancelled();
       console.complain("interrupted");
       return 128 + interruption.signal();
     }
   }
   log.log("Did find " + std::to_string(result.groups.size()) + " groups of duplicates among " +
           std::to_string(result.totals.files) + " files");
+  analytics.scanFinished(result.groups.size());
   const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.identifier());
   const bool written = console.writeResult(
       isJSON ? jsonOf(result) : textOf(result, byteCounts, Varnel::QNURLResolver::shared()));

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -17,6 +18,8 @@ struct ScanCommand {
   bool isJSON = false;
   bool showsProgress = false;
   bool playsSound = false;
+  std::optional<std::string> analyticsEndpoint;  ///< Where events go; nowhere without one.
+  bool printsEvents = false;
 
   /// Runs the command and returns the program's exit status.
   [[nodiscard]] int run(Console& console) const;

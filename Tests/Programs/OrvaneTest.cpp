@@ -136,6 +136,25 @@ TEST_F(Orvane, ShowsHostileNamesAsWhatTheyAre) {
   EXPECT_EQ(group["urls"][1], "file://" + folder.path("%FFback%5Cslash"));
 }
 
+TEST_F(Orvane, PrintsLinksAndRefusesWhatMakesNone) {
+  const Outcome page = run({"link", "https://shop.example/a b?x=1#top"});
+  EXPECT_EQ(page.status, 0);
+  EXPECT_THAT(page.output,
+              AllOf(StartsWith("https://shop.example/a%20b?x=1&orvane2&product=Orvane"),
+                    HasSubstr("&lang=en&qnc=&"), EndsWith("#top\n")));
+  EXPECT_THAT(run({"link", "--action", "buy", "b=2", "a=1=1"}).output,
+              EndsWith("&a=1%3D1&b=2&action=buy\n"));
+  for (const std::vector<std::string>& wrong : {std::vector<std::string>{"link"},
+                                                {"link", "a", "b"},
+                                                {"link", "http://a b/"},
+                                                {"link", "--action", "x", "y"},
+                                                {"link", "--action", "x", "y=1", "y=2"}}) {
+    const Outcome outcome = run(wrong);
+    EXPECT_EQ(outcome.status, 2);
+    EXPECT_THAT(outcome.output, IsEmpty());
+  }
+}
+
 TEST_F(Orvane, RefusesWrongArgumentsInOneLineAndDoesNothing) {
   const std::string missing = folder.path("missing");
   const std::string file = folder.write("file", "x");

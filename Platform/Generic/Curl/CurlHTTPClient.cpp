@@ -1,0 +1,146 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Ports/HTTPClient.h>
+
+#include <curl/curl.h>
+
+#include <atomic>
+#include <cstdlib>
+#include <mutex>
+#include <utility>
+
+#include <Platform/Generic/Curl/Module.h>
+#include <Platform/Generic/UniqueHandle.h>
+
+namespace Varnel::Platform {
+namespace {
+
+using Answer = Result<HTTPResponse, HTTPFailure>;
+
+constexpr long longestConnectingInSeconds = 10;
+constexpr long longestTransferInSeconds = 30;
+constexpr int pollingInMilliseconds = 1000;
+constexpr std::size_t mostContent = 64 * 1024;
+
+using Easy = UniqueHandle<CURL*, curl_easy_cleanup>;
+using Headers = UniqueHandle<curl_slist*, curl_slist_free_all>;
+
+// Content is read and forgotten; a server that never ends ends the transfer.
+std::size_t ignoreContent(char*, std::size_t size, std::size_t count, void* received) {
+  auto& total = *static_cast<std::size_t*>(received);
+  total += size * count;
+  return total <= mostContent ? size * count : 0;
+}
+
+HTTPFailure failure(CURLcode code) {
+  return {curl_easy_strerror(code)};
+}
+
+Answer answerOf(CURL* easy) {
+  long status = 0;
+  curl_off_t retryAfter = 0;
+  curl_easy_getinfo(easy, CURLINFO_RESPONSE_CODE, &status);
+  curl_easy_getinfo(easy, CURLINFO_RETRY_AFTER, &retryAfter);
+  HTTPResponse response{.status = static_cast<int>(status), .retryAfter = {}};
+  if (retryAfter > 0) response.retryAfter = std::chrono::seconds(retryAfter);
+  return response;
+}
+
+// Transfers run on the callers' threads, one after another over the same connections. At exit they
+// end before the libraries beneath are torn down.
+class CurlHTTPClient final : public HTTPClient {
+ public:
+  CurlHTTPClient() : multi_(curl_multi_init()) {}
+
+  [[nodiscard]] bool isUsable() const { return multi_ != nullptr; }
+
+  Answer post(const HTTPPost& request, std::stop_token stop) override {
+    const std::lock_guard lock(mutex_);
+    if (stop.stop_requested() || isClosing_) return HTTPFailure{"cancelled"};
+    const Easy easy(curl_easy_init());
+    const Headers headers = headersOf(request);
+    std::size_t received = 0;
+    if (!easy || !headers) return failure(CURLE_OUT_OF_MEMORY);
+    if (const CURLcode code = setUp(easy.get(), headers.get(), request, received); code != CURLE_OK)
+      return failure(code);
+    if (curl_multi_add_handle(multi_, easy.get()) != CURLM_OK) return failure(CURLE_FAILED_INIT);
+    const CURLcode code = transfer(stop);
+    curl_multi_remove_handle(multi_, easy.get());
+    if (code == CURLE_ABORTED_BY_CALLBACK) return HTTPFailure{"cancelled"};
+    if (code != CURLE_OK && received <= mostContent) return failure(code);
+    return answerOf(easy.get());
+  }
+
+  void close() {
+    isClosing_ = true;
+    curl_multi_wakeup(multi_);
+    const std::lock_guard lock(mutex_);
+    curl_multi_cleanup(std::exchange(multi_, nullptr));
+  }
+
+ private:
+  static Headers headersOf(const HTTPPost& request) {
+    curl_slist* list = curl_slist_append(nullptr, ("Content-Type: " + request.contentType).c_str());
+    // Servers that do not know the question would let every batch wait a second.
+    curl_slist* longer = list ? curl_slist_append(list, "Expect:") : nullptr;
+    return Headers(longer ? longer : list);
+  }
+
+  static CURLcode setUp(CURL* easy, curl_slist* headers, const HTTPPost& request,
+                        std::size_t& received) {
+    CURLcode result = CURLE_OK;
+    const auto set = [&](CURLoption option, auto value) {
+      if (result == CURLE_OK) result = curl_easy_setopt(easy, option, value);
+    };
+    set(CURLOPT_URL, request.url.c_str());
+    set(CURLOPT_PROTOCOLS_STR, request.allowsPlainHTTP ? "http,https" : "https");
+    set(CURLOPT_SSL_VERIFYPEER, 1L);
+    set(CURLOPT_SSL_VERIFYHOST, 2L);
+    set(CURLOPT_FOLLOWLOCATION, 0L);
+    set(CURLOPT_NOSIGNAL, 1L);
+    set(CURLOPT_CONNECTTIMEOUT, longestConnectingInSeconds);
+    set(CURLOPT_TIMEOUT, longestTransferInSeconds);
+    set(CURLOPT_POSTFIELDSIZE_LARGE, static_cast<curl_off_t>(request.body.size()));
+    set(CURLOPT_POSTFIELDS, request.body.data());
+    set(CURLOPT_HTTPHEADER, headers);
+    set(CURLOPT_USERAGENT, "Tallyhouse/1");
+    set(CURLOPT_WRITEFUNCTION, ignoreContent);
+    set(CURLOPT_WRITEDATA, &received);
+    return result;
+  }
+
+  CURLcode transfer(const std::stop_token& stop) {
+    const std::stop_callback wake(stop, [this] { curl_multi_wakeup(multi_); });
+    for (;;) {
+      int running = 0;
+      if (curl_multi_perform(multi_, &running) != CURLM_OK) return CURLE_FAILED_INIT;
+      int left = 0;
+      if (const CURLMsg* message = curl_multi_info_read(multi_, &left)) return message->data.result;
+      if (stop.stop_requested() || isClosing_) return CURLE_ABORTED_BY_CALLBACK;
+      curl_multi_poll(multi_, nullptr, 0, pollingInMilliseconds, nullptr);
+    }
+  }
+
+  std::mutex mutex_;  // Owns the transfers. Waking them is free for all.
+  std::atomic<bool> isClosing_ = false;
+  CURLM* multi_;
+};
+
+CurlHTTPClient* madeClient = nullptr;
+
+CurlHTTPClient* makeClient() {
+  if (curl_global_init(CURL_GLOBAL_DEFAULT) != CURLE_OK) return nullptr;
+  auto* client = new CurlHTTPClient();
+  if (!client->isUsable()) return nullptr;
+  madeClient = client;
+  // Registered after those of the TLS library, and so called before them.
+  std::atexit([] { madeClient->close(); });
+  return client;
+}
+
+}  // namespace
+}  // namespace Varnel::Platform
+
+Varnel::Platform::HTTPClient* varnelHTTPClient() {
+  static Varnel::Platform::HTTPClient* const client = Varnel::Platform::makeClient();
+  return client;
+}

@@ -1,0 +1,44 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <chrono>
+#include <optional>
+#include <stop_token>
+#include <string>
+
+#include <Platform/Api.h>
+#include <Platform/Values/Result.h>
+
+namespace Varnel::Platform {
+
+/// What is posted, and where to.
+struct HTTPPost final {
+  std::string url;  ///< Percent-encoded.
+  std::string contentType;
+  std::string body;
+  bool allowsPlainHTTP = false;  ///< Otherwise anything but https fails.
+};
+
+/// What the server answered. Its content is of no interest.
+struct HTTPResponse final {
+  int status = 0;
+  std::optional<std::chrono::seconds> retryAfter;  ///< From now, if the server asks for a pause.
+};
+
+/// Why there is no answer.
+struct HTTPFailure final {
+  std::string message;
+};
+
+/// Posts to web servers. Any thread; posts wait for each other.
+class VARNEL_API HTTPClient {
+ public:
+  virtual ~HTTPClient() = default;
+
+  /// Posts and waits for the answer: for some 30 seconds, or until `stop` is requested. The
+  /// server's certificate must be good. Redirections are not followed.
+  [[nodiscard]] virtual Result<HTTPResponse, HTTPFailure> post(const HTTPPost& request,
+                                                               std::stop_token stop) = 0;
+};
+
+}  // namespace Varnel::Platform

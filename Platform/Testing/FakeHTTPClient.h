@@ -1,0 +1,51 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <functional>
+#include <mutex>
+#include <utility>
+#include <vector>
+
+#include <Platform/Ports/HTTPClient.h>
+
+namespace Varnel::Platform::Testing {
+
+/// A client whose server is a function of the test. Any thread, if the function allows it.
+///
+///     FakeHTTPClient http;
+///     http.setServer([](const HTTPPost&) { return HTTPResponse{.status = 503}; });
+class FakeHTTPClient final : public HTTPClient {
+ public:
+  using Answer = Result<HTTPResponse, HTTPFailure>;
+  using Server = std::function<Answer(const HTTPPost&)>;
+
+  /// At first every post is answered with 200.
+  void setServer(Server server) {
+    const std::lock_guard lock(mutex_);
+    server_ = std::move(server);
+  }
+
+  [[nodiscard]] Answer post(const HTTPPost& request, std::stop_token stop) override {
+    if (stop.stop_requested()) return HTTPFailure{"cancelled"};
+    Server server;
+    {
+      const std::lock_guard lock(mutex_);
+      posts_.push_back(request);
+      server = server_;
+    }
+    return server(request);
+  }
+
+  /// Everything posted so far.
+  [[nodiscard]] std::vector<HTTPPost> posts() const {
+    const std::lock_guard lock(mutex_);
+    return posts_;
+  }
+
+ private:
+  mutable std::mutex mutex_;  ///< Owns both.
+  Server server_ = [](const HTTPPost&) { return HTTPResponse{.status = 200, .retryAfter = {}}; };
+  std::vector<HTTPPost> posts_;
+};
+
+}  // namespace Varnel::Platform::Testing

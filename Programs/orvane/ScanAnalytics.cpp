@@ -1,0 +1,80 @@
+// SPDX-License-Identifier: MIT
+#include <orvane/ScanAnalytics.h>
+
+#include <chrono>
+
+#include <Platform/Ports/Ports.h>
+#include <Platform/Ports/UserAccount.h>
+#include <Varnel/Context/Globals.h>
+#include <Varnel/Identification/CustomDimensionsHolder.h>
+
+namespace Orvane {
+namespace {
+
+using Tallyhouse::SpoolingTransport;
+using Varnel::Platform::URL;
+
+constexpr auto longestGoodbye = std::chrono::seconds(2);
+
+class ScanSender final : public Varnel::CommonAnalyticsSender {
+ public:
+  using CommonAnalyticsSender::CommonAnalyticsSender;
+  [[nodiscard]] std::string contextName() const override { return "Scan"; }
+};
+
+bool isOnThisMachine(const URL& url) {
+  const auto host = url.components().host;
+  return host == "127.0.0.1" || host == "localhost" || host == "[::1]";
+}
+
+std::shared_ptr<SpoolingTransport> transportTo(const URL& endpoint) {
+  const auto& ports = Varnel::Platform::processPorts();
+  return SpoolingTransport::make(
+      {.endpoint = endpoint,
+       .trackingID = "orvane",
+       .clientID = Varnel::CustomDimensionsHolder::clientIdentifier(),
+       .spoolPath = ports.userAccount.homeFolder() + "/Library/Application Support/" +
+                    Varnel::Globals::baseIdentifier() + "/Analytics.db",
+       .plainHTTP = isOnThisMachine(endpoint) ? SpoolingTransport::PlainHTTP::allowed
+                                              : SpoolingTransport::PlainHTTP::refused});
+}
+
+}  // namespace
+
+bool ScanAnalytics::isEndpoint(const std::string& text) {
+  const auto url = URL::parse(text);
+  if (!url) return false;
+  const auto parts = url->components();
+  return parts.host && !parts.host->empty() &&
+         (parts.scheme == "https" || (parts.scheme == "http" && isOnThisMachine(*url)));
+}
+
+ScanAnalytics::ScanAnalytics(const std::optional<std::string>& endpoint, bool printsEvents) {
+  if (!endpoint && !printsEvents) return;
+  if (endpoint) transport_ = transportTo(*URL::parse(*endpoint));
+  auto tracker = std::make_shared<Tallyhouse::AnalyticsTracker>(transport_);
+  tracker->setShouldPrintEvents(printsEvents);
+  sender_ = std::make_unique<ScanSender>(std::move(tracker));
+}
+
+ScanAnalytics::~ScanAnalytics() {
+  if (transport_ && !transport_->drain(longestGoodbye))
+    sender_->log("Events wait for the next run");
+}
+
+void ScanAnalytics::scanStarted(std::size_t folders) {
+  if (sender_)
+    sender_->trackEvent("Started", std::nullopt, static_cast<std::int64_t>(folders), {}, {});
+}
+
+void ScanAnalytics::scanCancelled() {
+  if (sender_) sender_->trackEvent("Cancelled", std::nullopt, std::nullopt, {}, {});
+}
+
+void ScanAnalytics::scanFinished(std::size_t groups) {
+  if (sender_)
+    sender_->trackEvent("Finished", groups > 0 ? "Duplicates" : "No Duplicates",
+                        static_cast<std::int64_t>(groups), {}, {});
+}
+
+}  // namespace Orvane

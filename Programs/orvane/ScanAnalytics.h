@@ -1,0 +1,36 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include <Tallyhouse/SpoolingTransport.h>
+#include <Varnel/Identification/CommonAnalyticsSender.h>
+
+namespace Orvane {
+
+/// The events of a scan. They count folders and groups and never name a file.
+class ScanAnalytics final {
+ public:
+  /// Whether events can be sent there: by https, or within this machine by http as well.
+  [[nodiscard]] static bool isEndpoint(const std::string& text);
+
+  /// Without an endpoint nothing is sent.
+  ScanAnalytics(const std::optional<std::string>& endpoint, bool printsEvents);
+  /// Gives events a moment to arrive; otherwise they wait for the next run.
+  ~ScanAnalytics();
+  ScanAnalytics(const ScanAnalytics&) = delete;
+  ScanAnalytics& operator=(const ScanAnalytics&) = delete;
+
+  void scanStarted(std::size_t folders);
+  void scanCancelled();
+  void scanFinished(std::size_t groups);
+
+ private:
+  std::shared_ptr<Tallyhouse::SpoolingTransport> transport_;
+  std::unique_ptr<Varnel::CommonAnalyticsSender> sender_;  ///< Absent when nobody listens.
+};
+
+}  // namespace Orvane

@@ -1,0 +1,121 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Identification/CustomDimensionsHolder.h>
+
+#include <memory>
+#include <mutex>
+#include <utility>
+
+#include <Varnel/Identification/CustomDimensionValues.h>
+#include <Varnel/Identification/UserIdentificationInfo.h>
+#include <Varnel/Identification/UserIdentificator.h>
+#include <Varnel/Provenance/OVFriendsLocator.h>
+
+namespace Varnel {
+namespace {
+
+struct Values {
+  std::mutex mutex;  // Owns all of them. It is held while a first reading finds its value.
+  std::optional<std::string> clientIdentifier;
+  std::optional<std::optional<std::string>> downloadSourceURL;
+  double achievementsFractionCompleted = 0;
+  std::int64_t scanCount = 0;
+  std::int64_t cleanCount = 0;
+  std::int64_t launchCount = 0;
+};
+
+Values& values() {
+  static Values& ofThisProcess = *new Values();
+  return ofThisProcess;
+}
+
+template <typename Value>
+auto read(Value Values::*member) {
+  const std::lock_guard lock(values().mutex);
+  return values().*member;
+}
+
+template <typename Value, typename New>
+void assign(Value Values::*member, New value) {
+  const std::lock_guard lock(values().mutex);
+  values().*member = std::move(value);
+}
+
+// The value, found by `find` where nothing was found or set before.
+template <typename Value>
+Value known(std::optional<Value> Values::*member, Value (*find)()) {
+  const std::lock_guard lock(values().mutex);
+  auto& value = values().*member;
+  if (!value) value = find();
+  return *value;
+}
+
+}  // namespace
+
+std::string CustomDimensionsHolder::clientIdentifier() {
+  return known<std::string>(&Values::clientIdentifier, [] {
+    return UserIdentificationInfo(std::make_shared<UserIdentificator>()).uniqueClientIdentifier();
+  });
+}
+void CustomDimensionsHolder::setClientIdentifier(std::string identifier) {
+  assign(&Values::clientIdentifier, std::move(identifier));
+}
+
+std::optional<std::string> CustomDimensionsHolder::downloadSourceURL() {
+  return known<std::optional<std::string>>(
+      &Values::downloadSourceURL, [] { return UserIdentificator().downloadSourceURLString(); });
+}
+void CustomDimensionsHolder::setDownloadSourceURL(std::optional<std::string> url) {
+  assign(&Values::downloadSourceURL, std::make_optional(std::move(url)));
+}
+
+double CustomDimensionsHolder::achievementsFractionCompleted() {
+  return read(&Values::achievementsFractionCompleted);
+}
+void CustomDimensionsHolder::setAchievementsFractionCompleted(double fraction) {
+  assign(&Values::achievementsFractionCompleted, fraction);
+}
+std::int64_t CustomDimensionsHolder::scanCount() {
+  return read(&Values::scanCount);
+}
+void CustomDimensionsHolder::setScanCount(std::int64_t count) {
+  assign(&Values::scanCount, count);
+}
+std::int64_t CustomDimensionsHolder::cleanCount() {
+  return read(&Values::cleanCount);
+}
+void CustomDimensionsHolder::setCleanCount(std::int64_t count) {
+  assign(&Values::cleanCount, count);
+}
+std::int64_t CustomDimensionsHolder::launchCount() {
+  return read(&Values::launchCount);
+}
+void CustomDimensionsHolder::setLaunchCount(std::int64_t count) {
+  assign(&Values::launchCount, count);
+}
+
+const std::string& CustomDimensionsHolder::otherAppsAvailabilityString() {
+  static const std::string& digits = *new std::string([] {
+    std::string found;
+    for (const bool isInstalled :
+         {OVFriendsLocator::isKelvane2Installed(), OVFriendsLocator::isKelvane3Installed(),
+          OVFriendsLocator::isOrvane1MASInstalled(), OVFriendsLocator::isOrvane1SiteInstalled(),
+          OVFriendsLocator::isDrumlinInstalled(), OVFriendsLocator::isVeltMASInstalled(),
+          OVFriendsLocator::isVeltSiteInstalled()})
+      found += isInstalled ? '1' : '0';
+    return found;
+  }());
+  return digits;
+}
+
+Tallyhouse::CustomDimensions CustomDimensionsHolder::customDimensions() {
+  return CustomDimensionValues{.clientIdentifier = clientIdentifier(),
+                               .downloadSourceURL = downloadSourceURL(),
+                               .achievementsFractionCompleted = achievementsFractionCompleted(),
+                               .scanCount = scanCount(),
+                               .cleanCount = cleanCount(),
+                               .launchCount = launchCount(),
+                               .otherAppsAvailabilityString = otherAppsAvailabilityString()}
+      .customDimensions();
+}
+
+}  // namespace Varnel

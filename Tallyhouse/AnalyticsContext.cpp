@@ -1,0 +1,63 @@
+// SPDX-License-Identifier: MIT
+#include <Tallyhouse/AnalyticsContext.h>
+
+#include <exception>
+#include <utility>
+
+#include <Platform/Ports/Clock.h>
+#include <Platform/Ports/Ports.h>
+#include <Platform/Values/UUID.h>
+#include <Tallyhouse/AnalyticsTransport.h>
+
+namespace Tallyhouse {
+
+AnalyticsContext::AnalyticsContext(Ports ports, std::shared_ptr<AnalyticsTransport> transport,
+                                   Consent consent)
+    : ports_(ports), transport_(std::move(transport)), consent_(consent) {
+  applyConsent();
+}
+
+AnalyticsContext::AnalyticsContext(std::shared_ptr<AnalyticsTransport> transport, Consent consent)
+    : AnalyticsContext({Varnel::Platform::processPorts().clock}, std::move(transport), consent) {}
+
+void AnalyticsContext::trackEvent(std::string_view category, std::string_view action,
+                                  const std::optional<std::string>& label,
+                                  std::optional<std::int64_t> value,
+                                  const CustomDimensions& customDimensions,
+                                  const CustomMetrics& customMetrics, bool isTest) noexcept try {
+  if (!transport_) return;
+  const AnalyticsEvent event{.uuid = Varnel::Platform::randomUUIDString(),
+                             .date = ports_.clock.now(),
+                             .category = std::string(category),
+                             .action = std::string(action),
+                             .label = label,
+                             .value = value,
+                             .customDimensions = customDimensions,
+                             .customMetrics = customMetrics,
+                             .isTest = isTest};
+  const std::lock_guard lock(mutex_);
+  if (consent_ == Consent::granted) transport_->accept(event);
+} catch (const std::exception&) {
+  // Out of memory: an event less, but an application that goes on.
+}
+
+Consent AnalyticsContext::consent() const noexcept {
+  const std::lock_guard lock(mutex_);
+  return consent_;
+}
+
+void AnalyticsContext::setConsent(Consent consent) noexcept {
+  const std::lock_guard lock(mutex_);
+  consent_ = consent;
+  applyConsent();
+}
+
+void AnalyticsContext::applyConsent() noexcept {
+  if (!transport_) return;
+  if (consent_ == Consent::granted)
+    transport_->start();
+  else
+    transport_->discardAll();
+}
+
+}  // namespace Tallyhouse

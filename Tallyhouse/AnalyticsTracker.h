@@ -1,0 +1,39 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <atomic>
+#include <memory>
+
+#include <Platform/Api.h>
+#include <Tallyhouse/AnalyticsContext.h>
+
+namespace Tallyhouse {
+
+/// What a host makes once and gives to every sender of events.
+///
+///     auto tracker = std::make_shared<AnalyticsTracker>(transport);
+///     tracker->setShouldPrintEvents(true);
+///     BaseAnalyticsSender(tracker).trackEvent("Opened", "window", std::nullopt, {}, {});
+///
+/// Without a transport nothing is collected. Any thread.
+class VARNEL_API AnalyticsTracker final {
+ public:
+  explicit AnalyticsTracker(std::shared_ptr<AnalyticsTransport> transport = nullptr,
+                            Consent consent = Consent::granted);
+  AnalyticsTracker(AnalyticsContext::Ports ports, std::shared_ptr<AnalyticsTransport> transport,
+                   Consent consent = Consent::granted);
+  AnalyticsTracker(const AnalyticsTracker&) = delete;
+  AnalyticsTracker& operator=(const AnalyticsTracker&) = delete;
+
+  [[nodiscard]] const std::shared_ptr<AnalyticsContext>& context() const { return context_; }
+
+  /// Whether senders echo each event into the log. False at first.
+  [[nodiscard]] bool shouldPrintEvents() const { return shouldPrintEvents_; }
+  void setShouldPrintEvents(bool shouldPrint) { shouldPrintEvents_ = shouldPrint; }
+
+ private:
+  std::shared_ptr<AnalyticsContext> context_;
+  std::atomic<bool> shouldPrintEvents_ = false;
+};
+
+}  // namespace Tallyhouse

@@ -1,0 +1,27 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <Platform/Api.h>
+#include <Tallyhouse/AnalyticsEvent.h>
+
+namespace Tallyhouse {
+
+/// The way that events take from the application to whoever counts them. `SpoolingTransport` posts
+/// them to a server, `Testing::MemoryTransport` keeps them for a test.
+///
+/// Called by one thread at a time. No operation waits for the network, and none throws.
+class VARNEL_API AnalyticsTransport {
+ public:
+  virtual ~AnalyticsTransport() = default;
+
+  /// Called when the user's consent is known to be given: what earlier runs left may go.
+  virtual void start() noexcept = 0;
+
+  /// Takes over one event.
+  virtual void accept(const AnalyticsEvent& event) noexcept = 0;
+
+  /// Forgets every event that has not arrived yet, those of earlier runs included.
+  virtual void discardAll() noexcept = 0;
+};
+
+}  // namespace Tallyhouse

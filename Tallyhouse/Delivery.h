@@ -1,0 +1,67 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <functional>
+#include <optional>
+#include <span>
+#include <stop_token>
+#include <string>
+
+#include <Platform/Values/Date.h>
+#include <Tallyhouse/DeliveryPolicy.h>
+
+namespace Varnel::Platform {
+class Clock;
+class HTTPClient;
+}  // namespace Varnel::Platform
+
+namespace Tallyhouse {
+
+class EventSpool;
+struct SpooledEvent;
+
+/// Where batches go.
+struct Endpoint final {
+  std::string url;
+  bool allowsPlainHTTP = false;
+};
+
+/// Carries events from the spool to the server, one batch a step. It has no thread of its own: who
+/// calls `step` again when it says so has it all delivered.
+///
+/// One thread at a time.
+class Delivery final {
+ public:
+  struct Ports {
+    Varnel::Platform::Clock& clock;
+    Varnel::Platform::HTTPClient& httpClient;
+  };
+  enum class Haste {
+    usual,  ///< Events wait a little for others.
+    none,   ///< What waits goes at once, unless the server wants to be left alone.
+  };
+
+  /// `random` gives numbers from 0 to 1.
+  Delivery(Ports ports, EventSpool& spool, Endpoint endpoint, DeliveryPolicy policy,
+           std::function<double()> random);
+
+  /// Sends a batch if one is due and waits for the answer. The return is when to call again; absent
+  /// while there is nothing to send. After `stop` nothing more is sent.
+  [[nodiscard]] std::optional<Varnel::Platform::Date> step(Haste haste, std::stop_token stop);
+
+  /// How many attempts in a row have failed.
+  [[nodiscard]] int failures() const { return failures_; }
+
+ private:
+  void send(std::span<const SpooledEvent> events, bool areRefused, std::stop_token stop);
+
+  const Ports ports_;
+  EventSpool& spool_;
+  const Endpoint endpoint_;
+  const DeliveryPolicy policy_;
+  const std::function<double()> random_;
+  int failures_ = 0;
+  std::optional<Varnel::Platform::Date> notBefore_;
+};
+
+}  // namespace Tallyhouse

@@ -1,0 +1,45 @@
+// SPDX-License-Identifier: MIT
+#include <Tallyhouse/DeliveryPolicy.h>
+
+#include <algorithm>
+
+namespace Tallyhouse {
+
+using Varnel::Platform::Date;
+
+Verdict DeliveryPolicy::verdict(std::optional<int> status) {
+  constexpr int requestTimeout = 408;
+  constexpr int tooEarly = 425;
+  constexpr int tooManyRequests = 429;
+  if (!status) return Verdict::later;
+  if (*status >= 200 && *status < 300) return Verdict::delivered;
+  if (*status == requestTimeout || *status == tooEarly || *status == tooManyRequests)
+    return Verdict::later;
+  return *status >= 400 && *status < 500 ? Verdict::refused : Verdict::later;
+}
+
+DeliveryPolicy::Duration DeliveryPolicy::retryDelay(int failures,
+                                                    std::optional<std::chrono::seconds> retryAfter,
+                                                    double random) const {
+  Duration delay = firstRetry;
+  for (int i = 1; i < failures && delay < longestRetry; ++i) delay *= 2;
+  delay = std::min(delay, longestRetry);
+  delay -= std::chrono::duration_cast<Duration>(delay * (std::clamp(random, 0.0, 1.0) / 2));
+  // Compared in the server's own unit, in which its figure cannot overflow.
+  const auto most = std::chrono::duration_cast<std::chrono::seconds>(longestRetryAfter);
+  return std::max<Duration>(delay, std::min(retryAfter.value_or(std::chrono::seconds(0)), most));
+}
+
+std::optional<Date> DeliveryPolicy::nextSending(const Backlog& backlog,
+                                                std::optional<Date> notBefore, Date now) const {
+  std::optional<Date> next;
+  if (backlog.hasRefused || backlog.waiting >= static_cast<std::int64_t>(batchEvents))
+    next = now;
+  else if (backlog.oldest)
+    next = std::min(*backlog.oldest, now) + linger;
+  if (!next || !notBefore) return next;
+  const Duration longest = std::max(longestRetry, longestRetryAfter);
+  return *notBefore > now + longest ? next : std::max(*next, *notBefore);
+}
+
+}  // namespace Tallyhouse

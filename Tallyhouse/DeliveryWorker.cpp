@@ -1,0 +1,102 @@
+// SPDX-License-Identifier: MIT
+#include <Tallyhouse/DeliveryWorker.h>
+
+#include <algorithm>
+#include <utility>
+
+#include <Platform/Ports/Clock.h>
+#include <Tallyhouse/EventSpool.h>
+
+namespace Tallyhouse {
+
+using Varnel::Platform::Date;
+
+DeliveryWorker::DeliveryWorker(Varnel::Platform::Clock& clock, EventSpool& spool, Delivery delivery)
+    : clock_(clock), spool_(spool), delivery_(std::move(delivery)) {}
+
+DeliveryWorker::~DeliveryWorker() {
+  {
+    const std::lock_guard lock(mutex_);
+    isEnding_ = true;
+    transfer_.request_stop();
+    changed_.notify_all();
+  }
+  if (thread_.joinable()) thread_.join();
+}
+
+void DeliveryWorker::resume() {
+  const std::lock_guard lock(mutex_);
+  if (!std::exchange(isPaused_, false)) return;
+  transfer_ = std::stop_source();
+  if (!thread_.joinable()) thread_ = std::thread([this] { run(); });
+  isWoken_ = true;
+  changed_.notify_all();
+}
+
+void DeliveryWorker::pause() {
+  const std::lock_guard lock(mutex_);
+  isPaused_ = true;
+  transfer_.request_stop();
+  changed_.notify_all();
+}
+
+void DeliveryWorker::wake() {
+  const std::lock_guard lock(mutex_);
+  isWoken_ = true;
+  changed_.notify_all();
+}
+
+bool DeliveryWorker::drain(std::chrono::milliseconds timeout) {
+  std::unique_lock lock(mutex_);
+  const std::int64_t asked = ++drainsAsked_;
+  const auto isAnswered = [&] { return drainsSeen_ >= asked && state_ != State::working; };
+  ++drainers_;
+  isWoken_ = true;
+  changed_.notify_all();
+  changed_.wait_for(lock, timeout, [&] { return isPaused_ || isAnswered(); });
+  --drainers_;
+  return isAnswered() && state_ == State::idle;
+}
+
+void DeliveryWorker::run() {
+  std::unique_lock lock(mutex_);
+  while (!isEnding_) {
+    isWoken_ = false;
+    std::optional<Date> next;
+    if (!isPaused_) next = step(lock);
+    waitForNext(lock, next);
+  }
+}
+
+std::optional<Date> DeliveryWorker::step(std::unique_lock<std::mutex>& lock) {
+  const std::stop_token transfer = transfer_.get_token();
+  const auto haste = drainers_ > 0 ? Delivery::Haste::none : Delivery::Haste::usual;
+  const std::int64_t drainsAsked = drainsAsked_;
+  lock.unlock();
+  const std::optional<Date> next = delivery_.step(haste, transfer);
+  const bool isDueLater = next && *next > clock_.now();
+  lock.lock();
+  drainsSeen_ = drainsAsked;
+  state_ = !next ? State::idle : isDueLater ? State::blocked : State::working;
+  changed_.notify_all();
+  return next;
+}
+
+void DeliveryWorker::waitForNext(std::unique_lock<std::mutex>& lock, std::optional<Date> next) {
+  // The wall clock may jump while the wait counts time that passes.
+  constexpr auto longestWait = std::chrono::minutes(10);
+  const auto wait =
+      next ? std::min<Date::duration>(*next - clock_.now(), longestWait) : Date::duration::max();
+  if (wait <= Date::duration::zero() || isWoken_ || isEnding_) return;
+  // Before a long wait, so that an idle spool is one small file.
+  lock.unlock();
+  spool_.checkpoint();
+  lock.lock();
+  const auto isDue = [this] { return isWoken_ || isEnding_; };
+  if (next)
+    changed_.wait_for(lock, wait, isDue);
+  else
+    changed_.wait(lock, isDue);
+}
+
+}  // namespace Tallyhouse

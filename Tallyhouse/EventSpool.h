@@ -1,0 +1,122 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <mutex>
+#include <optional>
+#include <span>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include <Platform/Generic/SQLiteDatabase.h>
+#include <Platform/Values/Date.h>
+#include <Tallyhouse/DeliveryPolicy.h>
+
+namespace Varnel::Platform {
+class AppendFiles;
+class SystemLog;
+}  // namespace Varnel::Platform
+
+namespace Tallyhouse {
+
+/// How much may wait. Whatever comes on top pushes out the oldest.
+struct SpoolLimits final {
+  std::int64_t events = 10'000;
+  std::int64_t bytes = 8 << 20;  ///< Of the events' texts.
+};
+
+/// An event in the spool.
+struct SpooledEvent final {
+  std::int64_t id = 0;
+  std::string uuid;
+  Varnel::Platform::Date date;
+  std::string hit;
+};
+
+/// Events on their way, in a file that only the user can read. What `append` has taken survives the
+/// end of the process, but not always a loss of power.
+///
+/// Fresh events wait in line. One that the server refuses leaves the line, so that it holds up no
+/// other, and is tried alone until it is set aside for good. All of them count towards the limits.
+///
+/// Any thread. Nothing throws: what goes wrong with the file is told to the system's log once, and
+/// the events that it would have held count as dropped. A damaged file is put beside (".damaged")
+/// and a new one begun. Two processes may share a file; an event may then be delivered by both.
+class EventSpool final {
+ public:
+  struct Ports {
+    Varnel::Platform::AppendFiles& appendFiles;
+    Varnel::Platform::SystemLog& systemLog;
+  };
+
+  EventSpool(Ports ports, std::string path, SpoolLimits limits);
+  EventSpool(const EventSpool&) = delete;
+  EventSpool& operator=(const EventSpool&) = delete;
+
+  /// Puts an event at the end of the line and returns how many now wait.
+  std::int64_t append(std::string_view uuid, Varnel::Platform::Date date, std::string_view hit);
+
+  /// What waits; an event refused `triesOfRefused` times does not.
+  [[nodiscard]] Backlog backlog(int triesOfRefused);
+
+  /// The head of the line: at most so many events, and bytes unless the first alone is larger.
+  [[nodiscard]] std::vector<SpooledEvent> waiting(std::size_t events, std::size_t bytes);
+  /// The oldest event refused less than `triesOfRefused` times.
+  [[nodiscard]] std::optional<SpooledEvent> refused(int triesOfRefused);
+
+  void removeWaiting(std::span<const SpooledEvent> events);
+  void removeRefused(const SpooledEvent& event);
+  /// Takes the events out of the line as refused once.
+  void moveToRefused(std::span<const SpooledEvent> events);
+  void countRefusal(const SpooledEvent& event);
+
+  /// Empties the spool.
+  void clear();
+
+  /// Moves what was appended into the file proper. Takes as long as the disk does; `append` does
+  /// not wait for it.
+  void checkpoint();
+
+  /// Counts an event that could not even be appended.
+  void countDropped();
+
+  /// Events pushed out by the limits, too large, or lost to a failing file, since the file was
+  /// begun.
+  [[nodiscard]] std::int64_t droppedCount();
+
+ private:
+  using Database = Varnel::Platform::SQLiteDatabase;
+  using Statement = Varnel::Platform::SQLiteStatement;
+
+  // All of these are called with the mutex held.
+  void open();
+  [[nodiscard]] std::optional<Varnel::Platform::PlatformError> tryToOpen();
+  [[nodiscard]] bool isSound();
+  void putAside();
+  void recount();
+  void makeRoom(std::int64_t bytes);
+  void drop(std::int64_t count);
+  [[nodiscard]] std::int64_t removeOldest(const char* table, std::int64_t count);
+  void failed(const Varnel::Platform::PlatformError& error);
+  [[nodiscard]] bool run(Statement& statement);
+  [[nodiscard]] bool run(const std::string& sql);
+  [[nodiscard]] std::optional<Statement> prepare(std::string_view sql);
+  [[nodiscard]] std::optional<std::int64_t> number(std::string_view sql);
+  [[nodiscard]] bool removeEach(std::string_view table, std::span<const SpooledEvent> events);
+
+  const Ports ports_;
+  const std::string path_;
+  const SpoolLimits limits_;
+
+  std::mutex mutex_;  ///< Owns all below.
+  std::optional<Database> database_;
+  std::optional<Statement> insert_;
+  std::int64_t waitingEvents_ = 0;
+  std::int64_t refusedEvents_ = 0;
+  std::int64_t bytes_ = 0;
+  std::int64_t unsavedDropped_ = 0;
+  bool hasReported_ = false;
+};
+
+}  // namespace Tallyhouse

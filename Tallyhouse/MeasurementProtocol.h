@@ -1,0 +1,31 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <chrono>
+#include <string>
+#include <string_view>
+
+#include <Tallyhouse/AnalyticsEvent.h>
+
+namespace Tallyhouse {
+
+/// Whose events they are.
+struct AnalyticsIdentity final {
+  std::string trackingID;  ///< The property that counts them.
+  std::string clientID;    ///< The installation that sends them.
+};
+
+/// The event as one line of the measurement protocol, version 1: "v=1&t=event&tid=…&ec=…&cd1=…".
+/// What is known only when it is sent is still missing.
+[[nodiscard]] std::string encodedHit(const AnalyticsEvent& event,
+                                     const AnalyticsIdentity& identity);
+
+/// Appends a line to a batch: the hit, its age, and the event's UUID in the parameter that the
+/// protocol reserves for telling hits apart.
+void appendToBatch(std::string& batch, std::string_view hit, std::chrono::milliseconds age,
+                   std::string_view uuid);
+
+/// The most bytes that servers take as one hit, and room for what `appendToBatch` adds.
+inline constexpr std::size_t longestHit = 8192 - 96;
+
+}  // namespace Tallyhouse

@@ -1,0 +1,114 @@
+// SPDX-License-Identifier: MIT
+#include <Tallyhouse/SpoolingTransport.h>
+
+#include <algorithm>
+#include <exception>
+#include <random>
+#include <string_view>
+#include <utility>
+
+#include <Platform/Ports/Ports.h>
+#include <Tallyhouse/Delivery.h>
+#include <Tallyhouse/DeliveryWorker.h>
+#include <Tallyhouse/EventSpool.h>
+#include <Tallyhouse/MeasurementProtocol.h>
+
+namespace Tallyhouse {
+namespace {
+
+std::string lowerCase(std::string_view text) {
+  std::string lower(text);
+  for (char& c : lower)
+    if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
+  return lower;
+}
+
+bool isAcceptable(const Varnel::Platform::URL& endpoint, SpoolingTransport::PlainHTTP plain) {
+  const auto parts = endpoint.components();
+  if (!parts.host || parts.host->empty()) return false;
+  const std::string scheme = lowerCase(parts.scheme.value_or(""));
+  return scheme == "https" || (scheme == "http" && plain == SpoolingTransport::PlainHTTP::allowed);
+}
+
+std::function<double()> randomNumbers() {
+  return [engine = std::minstd_rand(std::random_device()())]() mutable {
+    return std::uniform_real_distribution<double>()(engine);
+  };
+}
+
+// While the thread cannot deliver, it still moves what was appended into the file now and then.
+constexpr std::int64_t appendsUntilCheckpoint = 1000;
+
+}  // namespace
+
+struct SpoolingTransport::Parts {
+  Parts(Ports ports, Configuration configuration)
+      : identity{std::move(configuration.trackingID), std::move(configuration.clientID)},
+        batchEvents(static_cast<std::int64_t>(configuration.policy.batchEvents)),
+        spool({ports.appendFiles, ports.systemLog}, std::move(configuration.spoolPath),
+              {.events = configuration.mostEvents, .bytes = configuration.mostBytes}),
+        worker(ports.clock, spool,
+               Delivery({ports.clock, ports.httpClient}, spool,
+                        {.url = configuration.endpoint.absoluteString(),
+                         .allowsPlainHTTP = configuration.plainHTTP == PlainHTTP::allowed},
+                        configuration.policy, randomNumbers())) {}
+
+  const AnalyticsIdentity identity;
+  const std::int64_t batchEvents;
+  EventSpool spool;
+  DeliveryWorker worker;
+};
+
+std::unique_ptr<SpoolingTransport> SpoolingTransport::make(Ports ports,
+                                                           Configuration configuration) {
+  if (!isAcceptable(configuration.endpoint, configuration.plainHTTP)) return nullptr;
+  return std::unique_ptr<SpoolingTransport>(
+      new SpoolingTransport(std::make_unique<Parts>(ports, std::move(configuration))));
+}
+
+std::unique_ptr<SpoolingTransport> SpoolingTransport::make(Configuration configuration) {
+  const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
+  return make({ports.appendFiles, ports.clock, ports.httpClient, ports.systemLog},
+              std::move(configuration));
+}
+
+SpoolingTransport::SpoolingTransport(std::unique_ptr<Parts> parts) : parts_(std::move(parts)) {}
+
+SpoolingTransport::~SpoolingTransport() = default;
+
+void SpoolingTransport::start() noexcept try {
+  parts_->worker.resume();
+} catch (const std::exception&) {
+  // The system has no thread left for us. The events stay in the spool for a better time.
+}
+
+void SpoolingTransport::accept(const AnalyticsEvent& event) noexcept try {
+  const std::string hit = encodedHit(event, parts_->identity);
+  if (hit.size() > longestHit) {
+    parts_->spool.countDropped();
+    return;
+  }
+  const std::int64_t waiting = parts_->spool.append(event.uuid, event.date, hit);
+  // In between the thread sleeps on: it will send these with the others.
+  if (waiting == 1 || waiting == parts_->batchEvents || waiting % appendsUntilCheckpoint == 0)
+    parts_->worker.wake();
+} catch (const std::exception&) {
+  // Out of memory: an event less, but an application that goes on.
+}
+
+void SpoolingTransport::discardAll() noexcept try {
+  parts_->worker.pause();
+  parts_->spool.clear();
+} catch (const std::exception&) {
+  // Nothing is sent while the worker is paused; the next start of the process tries again.
+}
+
+bool SpoolingTransport::drain(std::chrono::milliseconds timeout) {
+  return parts_->worker.drain(timeout);
+}
+
+std::int64_t SpoolingTransport::droppedCount() const {
+  return parts_->spool.droppedCount();
+}
+
+}  // namespace Tallyhouse

@@ -1,0 +1,83 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <chrono>
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include <Platform/Api.h>
+#include <Platform/Values/URL.h>
+#include <Tallyhouse/AnalyticsTransport.h>
+#include <Tallyhouse/DeliveryPolicy.h>
+
+namespace Varnel::Platform {
+class AppendFiles;
+class Clock;
+class HTTPClient;
+class SystemLog;
+}  // namespace Varnel::Platform
+
+namespace Tallyhouse {
+
+/// Posts events to a server, by way of a file: an event that was accepted survives the end of the
+/// process and weeks without a network, though not always a loss of power. A thread of its own
+/// sends batches and deletes what the server has taken; what gets lost on the way is sent again
+/// under the same UUID.
+///
+///     auto transport = SpoolingTransport::make({
+///         .endpoint = *URL::parse("https://collect.quennel.example/batch"),
+///         .trackingID = "QN-1", .clientID = id, .spoolPath = support + "/Analytics.db"});
+///     auto tracker = std::make_shared<AnalyticsTracker>(std::move(transport));
+///
+/// `accept` costs the insertion of a row and never waits for the network. Destruction interrupts a
+/// transfer, which the next run repeats; call `drain` before it where a process is short-lived.
+class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
+ public:
+  struct Ports {
+    Varnel::Platform::AppendFiles& appendFiles;
+    Varnel::Platform::Clock& clock;
+    Varnel::Platform::HTTPClient& httpClient;
+    Varnel::Platform::SystemLog& systemLog;
+  };
+  enum class PlainHTTP { refused, allowed };
+
+  struct Configuration {
+    Varnel::Platform::URL endpoint;
+    std::string trackingID;  ///< The property that counts the events.
+    std::string clientID;    ///< The installation that sends them.
+    std::string spoolPath;   ///< Made readable by the user alone, its folder included.
+    PlainHTTP plainHTTP = PlainHTTP::refused;
+    std::int64_t mostEvents = 10'000;  ///< That may wait; then the oldest is dropped.
+    std::int64_t mostBytes = 8 << 20;
+    DeliveryPolicy policy = {};
+  };
+
+  /// None when the endpoint is no https URL (or http, where that is allowed).
+  [[nodiscard]] static std::unique_ptr<SpoolingTransport> make(Ports ports,
+                                                               Configuration configuration);
+  [[nodiscard]] static std::unique_ptr<SpoolingTransport> make(Configuration configuration);
+  ~SpoolingTransport() override;
+  SpoolingTransport(const SpoolingTransport&) = delete;
+  SpoolingTransport& operator=(const SpoolingTransport&) = delete;
+
+  void start() noexcept override;
+  void accept(const AnalyticsEvent& event) noexcept override;
+  void discardAll() noexcept override;
+
+  /// Sends what waits without lingering, and waits for it: until all is delivered, an attempt
+  /// fails, or the time is over. Returns whether all is delivered.
+  bool drain(std::chrono::milliseconds timeout);
+
+  /// Events that the spool could not hold, since its file was begun.
+  [[nodiscard]] std::int64_t droppedCount() const;
+
+ private:
+  struct Parts;
+  explicit SpoolingTransport(std::unique_ptr<Parts> parts);
+
+  const std::unique_ptr<Parts> parts_;
+};
+
+}  // namespace Tallyhouse

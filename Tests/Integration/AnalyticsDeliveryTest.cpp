@@ -1,0 +1,212 @@
+// SPDX-License-Identifier: MIT
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <chrono>
+#include <optional>
+#include <set>
+#include <thread>
+
+#include <Platform/Ports/HTTPClient.h>
+#include <Platform/Ports/Ports.h>
+#include <Platform/Values/URL.h>
+#include <Platform/Values/URLQuery.h>
+#include <Tallyhouse/AnalyticsTracker.h>
+#include <Tallyhouse/SpoolingTransport.h>
+#include <Tests/Support/ChildProcess.h>
+#include <Tests/Support/TemporaryFolder.h>
+
+namespace Tallyhouse {
+namespace {
+
+using namespace std::chrono_literals;
+using Varnel::Platform::HTTPPost;
+using Varnel::Platform::URL;
+
+// A server in a process of its own, and what it was sent.
+class Server {
+ public:
+  struct Request {
+    std::string behaviour;
+    std::vector<std::string> hits;
+  };
+
+  explicit Server(std::vector<std::string> behaviours) : process_(words(std::move(behaviours))) {
+    url_ = "http://127.0.0.1:" + process_.readLine() + "/batch";
+  }
+
+  const std::string& url() const { return url_; }
+
+  // Waits for the next request.
+  Request next() {
+    const std::string line = process_.readLine();
+    const std::size_t blank = line.find(' ');
+    Request request{.behaviour = line.substr(blank + 1), .hits = {}};
+    std::string body = process_.read(std::stoul("0" + line.substr(0, blank)));
+    for (std::size_t end; !body.empty(); body.erase(0, end)) {
+      end = std::min(body.find('\n'), body.size() - 1) + 1;
+      request.hits.push_back(body.substr(0, end - (body[end - 1] == '\n')));
+    }
+    return request;
+  }
+
+ private:
+  static std::vector<std::string> words(std::vector<std::string> behaviours) {
+    behaviours.insert(behaviours.begin(), VARNEL_ANALYTICS_SERVER);
+    return behaviours;
+  }
+
+  Varnel::Tests::ChildProcess process_;
+  std::string url_;
+};
+
+std::string parameter(const std::string& hit, std::string_view name) {
+  for (const auto& item : Varnel::Platform::decodedURLQuery(hit))
+    if (item.name == name) return item.value.value_or("");
+  return "(none)";
+}
+
+class AnalyticsDeliveryTest : public testing::Test {
+ protected:
+  std::string spoolPath() const { return (folder_.path() / "Analytics.db").string(); }
+
+  std::shared_ptr<SpoolingTransport> transport(const std::string& url) const {
+    DeliveryPolicy quick;
+    quick.linger = 1ms;
+    quick.firstRetry = 1ms;
+    quick.longestRetry = 20ms;
+    quick.longestRetryAfter = 1s;
+    return SpoolingTransport::make({.endpoint = *URL::parse(url),
+                                    .trackingID = "QN-1",
+                                    .clientID = "12.34",
+                                    .spoolPath = spoolPath(),
+                                    .plainHTTP = SpoolingTransport::PlainHTTP::allowed,
+                                    .policy = quick});
+  }
+
+  Varnel::Tests::TemporaryFolder folder_;
+};
+
+TEST_F(AnalyticsDeliveryTest, AnEventArrivesWithAllThatItCarries) {
+  Server server({"204"});
+  AnalyticsTracker tracker(transport(server.url()));
+  tracker.context()->trackEvent("Scan", "Finished", "100 % \xC3\xA4&=", -5,
+                                {"12.34", std::nullopt, "13.0", "3", "2", "1", "0000001", "null"},
+                                {std::nullopt, 7});
+  const auto request = server.next();
+  ASSERT_EQ(request.hits.size(), 1u);
+  const std::pair<const char*, const char*> expected[] = {{"v", "1"},
+                                                          {"t", "event"},
+                                                          {"tid", "QN-1"},
+                                                          {"cid", "12.34"},
+                                                          {"ec", "Scan"},
+                                                          {"ea", "Finished"},
+                                                          {"el", "100 % \xC3\xA4&="},
+                                                          {"ev", "-5"},
+                                                          {"cd1", "12.34"},
+                                                          {"cd2", "(none)"},
+                                                          {"cd3", "13.0"},
+                                                          {"cd4", "3"},
+                                                          {"cd5", "2"},
+                                                          {"cd6", "1"},
+                                                          {"cd7", "0000001"},
+                                                          {"cd8", "null"},
+                                                          {"cm1", "(none)"},
+                                                          {"cm2", "7"}};
+  for (const auto& [name, value] : expected)
+    EXPECT_EQ(parameter(request.hits[0], name), value) << name;
+  EXPECT_EQ(parameter(request.hits[0], "z").size(), 36u);
+}
+
+TEST_F(AnalyticsDeliveryTest, NoBehaviourOfAServerLosesOrRenamesAnEvent) {
+  Server server({"503/1", "cut", "garbage", "500", "429", "302", "200"});
+  AnalyticsTracker tracker(transport(server.url()));
+  const auto start = std::chrono::steady_clock::now();
+  tracker.context()->trackEvent("Scan", "Once", std::nullopt, std::nullopt, {}, {});
+  std::set<std::string> uuids;
+  std::string last;
+  for (int i = 0; last != "200"; ++i) {
+    const auto request = server.next();
+    ASSERT_EQ(request.hits.size(), 1u) << request.behaviour;
+    uuids.insert(parameter(request.hits[0], "z"));
+    last = request.behaviour;
+    if (i == 1) {
+      EXPECT_GE(std::chrono::steady_clock::now() - start, 1s) << "the pause asked for";
+    }
+  }
+  EXPECT_EQ(uuids.size(), 1u);
+}
+
+TEST_F(AnalyticsDeliveryTest, AServerThatHangsDelaysNeitherTheCallerNorTheEnd) {
+  Server server({"hang"});
+  const auto start = std::chrono::steady_clock::now();
+  {
+    AnalyticsTracker tracker(transport(server.url()));
+    tracker.context()->trackEvent("Scan", "First", std::nullopt, std::nullopt, {}, {});
+    EXPECT_EQ(server.next().hits.size(), 1u);
+    for (int i = 0; i < 100; ++i)
+      tracker.context()->trackEvent("Scan", "Next", std::nullopt, std::nullopt, {}, {});
+  }
+  EXPECT_LT(std::chrono::steady_clock::now() - start, 10s);
+  Server other({"200"});
+  const auto repeated = transport(other.url());
+  AnalyticsTracker tracker(repeated);
+  EXPECT_TRUE(repeated->drain(30s));
+  std::size_t arrived = 0;
+  while (arrived < 101) arrived += other.next().hits.size();
+  EXPECT_EQ(arrived, 101u);
+}
+
+TEST_F(AnalyticsDeliveryTest, AKilledProcessDeliversOnTheNextStart) {
+  constexpr std::size_t count = 250;
+  std::set<std::string> before;
+  {
+    Server server({"200", "hang"});
+    Varnel::Tests::ChildProcess process(
+        {VARNEL_ANALYTICS_PROCESS, server.url(), spoolPath(), std::to_string(count)});
+    EXPECT_EQ(process.readLine(), "tracked");
+    // Killed in the midst of it: some have arrived, some hang, some have never been sent.
+    for (const std::string& hit : server.next().hits) before.insert(parameter(hit, "z"));
+    server.next();
+    process.kill();
+  }
+  Server server({"200"});
+  const auto transport = this->transport(server.url());
+  AnalyticsTracker tracker(transport);
+  EXPECT_TRUE(transport->drain(60s));
+  std::set<std::string> actions;
+  std::set<std::string> uuids = before;
+  while (uuids.size() < count) {
+    const auto request = server.next();
+    ASSERT_FALSE(request.hits.empty());
+    for (const std::string& hit : request.hits) {
+      uuids.insert(parameter(hit, "z"));
+      actions.insert(parameter(hit, "ea"));
+    }
+  }
+  EXPECT_EQ(uuids.size(), count);
+  EXPECT_EQ(actions.size(), count - before.size());
+}
+
+TEST(HTTPClient, RefusesPlainHTTPUnlessAllowedAndStopsAtOnce) {
+  auto& http = Varnel::Platform::processPorts().httpClient;
+  Server server({"200", "hang"});
+  const HTTPPost post{.url = server.url(), .contentType = "text/plain", .body = "x"};
+  EXPECT_FALSE(http.post(post, {}));
+  HTTPPost plain = post;
+  plain.allowsPlainHTTP = true;
+  const auto answer = http.post(plain, {});
+  ASSERT_TRUE(answer) << answer.error().message;
+  EXPECT_EQ(answer->status, 200);
+  std::stop_source stop;
+  std::thread stopper([&] {
+    server.next();
+    server.next();
+    stop.request_stop();
+  });
+  EXPECT_FALSE(http.post(plain, stop.get_token()));
+  stopper.join();
+}
+
+}  // namespace
+}  // namespace Tallyhouse

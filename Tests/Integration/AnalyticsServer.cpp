@@ -1,0 +1,78 @@
+// SPDX-License-Identifier: MIT
+// A web server on a free port of the loopback interface. It answers the n-th request as its n-th
+// argument says, and all further ones as the last:
+//   a number (200, 503, …)   with this status
+//   503/SECONDS              the same, asking for a pause
+//   hang                     never
+//   cut                      by closing the connection once it has all of the request
+//   garbage                  with bytes that are no HTTP
+// It prints its port in one line, and for each request "BYTES BEHAVIOUR" in one line and the body.
+#include <libsoup/soup.h>
+
+#include <cstdio>
+#include <cstdlib>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace {
+
+struct Script {
+  std::vector<std::string> behaviours;
+  std::size_t next = 0;
+
+  const std::string& advance() {
+    const std::string& behaviour = behaviours[next];
+    if (next + 1 < behaviours.size()) ++next;
+    return behaviour;
+  }
+};
+
+void endConnection(SoupServerMessage* message, std::string_view lastWords) {
+  GIOStream* stream = soup_server_message_steal_connection(message);
+  GOutputStream* out = g_io_stream_get_output_stream(stream);
+  g_output_stream_write_all(out, lastWords.data(), lastWords.size(), nullptr, nullptr, nullptr);
+  g_io_stream_close(stream, nullptr, nullptr);
+  g_object_unref(stream);
+}
+
+void answer(SoupServer*, SoupServerMessage* message, const char*, GHashTable*, gpointer script) {
+  const std::string& behaviour = static_cast<Script*>(script)->advance();
+  GBytes* body = soup_message_body_flatten(soup_server_message_get_request_body(message));
+  gsize size = 0;
+  const auto* bytes = static_cast<const char*>(g_bytes_get_data(body, &size));
+  std::printf("%zu %s\n", static_cast<std::size_t>(size), behaviour.c_str());
+  std::fwrite(bytes, 1, size, stdout);
+  std::fflush(stdout);
+  g_bytes_unref(body);
+
+  if (behaviour == "hang") {
+    soup_server_message_pause(message);
+  } else if (behaviour == "cut") {
+    endConnection(message, "");
+  } else if (behaviour == "garbage") {
+    endConnection(message, "\x01\xFF 200 nothing like HTTP\r\n\r\n\r\n");
+  } else {
+    const std::size_t slash = behaviour.find('/');
+    soup_server_message_set_status(message, static_cast<guint>(std::atoi(behaviour.c_str())),
+                                   nullptr);
+    if (slash != std::string::npos)
+      soup_message_headers_append(soup_server_message_get_response_headers(message), "Retry-After",
+                                  behaviour.c_str() + slash + 1);
+  }
+}
+
+}  // namespace
+
+int main(int count, char** arguments) {
+  Script script{.behaviours = {arguments + 1, arguments + count}};
+  if (script.behaviours.empty()) return EXIT_FAILURE;
+  SoupServer* server = soup_server_new("server-header", "test", nullptr);
+  soup_server_add_handler(server, nullptr, answer, &script, nullptr);
+  if (!soup_server_listen_local(server, 0, SOUP_SERVER_LISTEN_IPV4_ONLY, nullptr))
+    return EXIT_FAILURE;
+  GSList* uris = soup_server_get_uris(server);
+  std::printf("%d\n", g_uri_get_port(static_cast<GUri*>(uris->data)));
+  std::fflush(stdout);
+  g_main_loop_run(g_main_loop_new(nullptr, FALSE));
+}

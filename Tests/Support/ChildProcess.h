@@ -1,0 +1,73 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <fcntl.h>
+#include <signal.h>
+#include <spawn.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+extern char** environ;
+
+namespace Varnel::Tests {
+
+/// A program whose standard output the test reads. Destruction kills it.
+class ChildProcess final {
+ public:
+  explicit ChildProcess(std::vector<std::string> words) {
+    int ends[2];
+    if (::pipe2(ends, O_CLOEXEC) != 0) throw std::runtime_error("no pipe");
+    posix_spawn_file_actions_t actions;
+    ::posix_spawn_file_actions_init(&actions);
+    ::posix_spawn_file_actions_adddup2(&actions, ends[1], STDOUT_FILENO);
+    std::vector<char*> arguments;
+    for (std::string& word : words) arguments.push_back(word.data());
+    arguments.push_back(nullptr);
+    const int failed =
+        ::posix_spawn(&process_, arguments[0], &actions, nullptr, arguments.data(), environ);
+    ::posix_spawn_file_actions_destroy(&actions);
+    ::close(ends[1]);
+    output_ = ::fdopen(ends[0], "r");
+    if (failed != 0) throw std::runtime_error("no such program: " + words[0]);
+  }
+  ChildProcess(const ChildProcess&) = delete;
+  ChildProcess& operator=(const ChildProcess&) = delete;
+  ~ChildProcess() {
+    kill();
+    std::fclose(output_);
+  }
+
+  /// The next line without its end, waited for; what there is when the output ends.
+  std::string readLine() {
+    std::string line;
+    for (int c = std::fgetc(output_); c != EOF && c != '\n'; c = std::fgetc(output_))
+      line += static_cast<char>(c);
+    return line;
+  }
+
+  /// The next bytes, waited for.
+  std::string read(std::size_t size) {
+    std::string bytes(size, '\0');
+    bytes.resize(std::fread(bytes.data(), 1, size, output_));
+    return bytes;
+  }
+
+  /// Ends the process as a crash would, if it runs.
+  void kill() {
+    if (process_ <= 0) return;
+    ::kill(process_, SIGKILL);
+    ::waitpid(process_, nullptr, 0);
+    process_ = 0;
+  }
+
+ private:
+  ::pid_t process_ = 0;
+  std::FILE* output_ = nullptr;
+};
+
+}  // namespace Varnel::Tests

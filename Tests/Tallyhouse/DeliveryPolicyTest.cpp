@@ -1,0 +1,78 @@
+// SPDX-License-Identifier: MIT
+#include <Tallyhouse/DeliveryPolicy.h>
+
+#include <gtest/gtest.h>
+
+namespace Tallyhouse {
+namespace {
+
+using namespace std::chrono_literals;
+using Varnel::Platform::Date;
+
+const Date noon{std::chrono::hours(1'000'000)};
+
+TEST(DeliveryPolicy, OnlyAnAnswerOfTheServerItselfSettlesABatch) {
+  const std::pair<std::optional<int>, Verdict> cases[] = {
+      {std::nullopt, Verdict::later}, {0, Verdict::later},       {100, Verdict::later},
+      {200, Verdict::delivered},      {204, Verdict::delivered}, {302, Verdict::later},
+      {400, Verdict::refused},        {404, Verdict::refused},   {408, Verdict::later},
+      {413, Verdict::refused},        {429, Verdict::later},     {500, Verdict::later},
+      {503, Verdict::later},          {999, Verdict::later},
+  };
+  for (const auto& [status, verdict] : cases)
+    EXPECT_EQ(DeliveryPolicy::verdict(status), verdict) << status.value_or(-1);
+}
+
+TEST(DeliveryPolicy, RetriesBackOffAndHeedTheServerWithinReason) {
+  const DeliveryPolicy policy;
+  struct Case {
+    int failures;
+    std::optional<std::chrono::seconds> retryAfter;
+    double random;
+    DeliveryPolicy::Duration delay;
+  };
+  const Case cases[] = {
+      {1, {}, 0, 5s},
+      {2, {}, 0, 10s},
+      {4, {}, 0, 40s},
+      {4, {}, 1, 20s},
+      {4, {}, 0.5, 30s},
+      {30, {}, 0, 1h},
+      {1'000'000, {}, 1, 30min},
+      {1, 120s, 0, 120s},
+      {10, 1s, 0, 2560s},
+      {1, std::chrono::seconds::max(), 0, 24h},
+      {1, -5s, 0, 5s},
+      {1, {}, 17, 2500ms},
+  };
+  for (const Case& c : cases)
+    EXPECT_EQ(policy.retryDelay(c.failures, c.retryAfter, c.random), c.delay) << c.failures;
+}
+
+TEST(DeliveryPolicy, EventsWaitForCompanyButNotForAClockThatWasSetBack) {
+  const DeliveryPolicy policy;
+  struct Case {
+    const char* what;
+    Backlog backlog;
+    std::optional<Date> notBefore;
+    std::optional<Date> next;
+  };
+  const Backlog one{.waiting = 1, .oldest = noon - 2s, .hasRefused = false};
+  const Backlog full{.waiting = 20, .oldest = noon, .hasRefused = false};
+  const Backlog refused{.waiting = 0, .oldest = {}, .hasRefused = true};
+  const Case cases[] = {
+      {"nothing", {}, noon + 1h, {}},
+      {"one event lingers", one, {}, noon + 3s},
+      {"an event of tomorrow", {1, noon + 24h, false}, {}, noon + 5s},
+      {"a full batch goes at once", full, {}, noon},
+      {"so does one that was refused", refused, {}, noon},
+      {"unless the server is left alone", full, noon + 10min, noon + 10min},
+      {"which may be over", one, noon - 1h, noon + 3s},
+      {"or lie in a future that was", full, noon + 25h, noon},
+  };
+  for (const Case& c : cases)
+    EXPECT_EQ(policy.nextSending(c.backlog, c.notBefore, noon), c.next) << c.what;
+}
+
+}  // namespace
+}  // namespace Tallyhouse

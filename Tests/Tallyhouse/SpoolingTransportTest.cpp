@@ -1,0 +1,121 @@
+// SPDX-License-Identifier: MIT
+#include <Tallyhouse/SpoolingTransport.h>
+
+#include <latch>
+#include <semaphore>
+#include <thread>
+
+#include <Platform/Testing/FakeHTTPClient.h>
+#include <Tallyhouse/AnalyticsTracker.h>
+#include <Tests/Tallyhouse/SpoolFixture.h>
+
+namespace Tallyhouse {
+namespace {
+
+using namespace std::chrono_literals;
+using Varnel::Platform::HTTPFailure;
+using Varnel::Platform::HTTPPost;
+using Varnel::Platform::HTTPResponse;
+using Varnel::Platform::URL;
+
+class SpoolingTransportTest : public Tests::SpoolFixture {
+ protected:
+  std::unique_ptr<SpoolingTransport> make(
+      const char* endpoint = "https://h.example/batch",
+      SpoolingTransport::PlainHTTP plain = SpoolingTransport::PlainHTTP::refused) {
+    return SpoolingTransport::make({*files, clock, http, log}, {.endpoint = *URL::parse(endpoint),
+                                                                .trackingID = "QN-1",
+                                                                .clientID = "12.34",
+                                                                .spoolPath = path(),
+                                                                .plainHTTP = plain});
+  }
+
+  static void track(AnalyticsTracker& tracker, std::string_view action) {
+    tracker.context()->trackEvent("Category", action, std::nullopt, std::nullopt, {}, {});
+  }
+
+  Varnel::Platform::Testing::FakeHTTPClient http;
+};
+
+TEST_F(SpoolingTransportTest, TakesHTTPSUnlessToldOtherwise) {
+  using enum SpoolingTransport::PlainHTTP;
+  EXPECT_TRUE(make("https://h.example/batch"));
+  EXPECT_TRUE(make("HTTPS://h.example"));
+  EXPECT_TRUE(make("http://h.example/batch", allowed));
+  for (const char* url :
+       {"http://h.example/batch", "file:///etc/passwd", "//h/batch", "https:///x"})
+    EXPECT_FALSE(make(url)) << url;
+  EXPECT_FALSE(make("ftp://h.example/batch", allowed));
+}
+
+TEST_F(SpoolingTransportTest, EventsOfManyThreadsAllArrive) {
+  const auto transport = std::shared_ptr(make());
+  AnalyticsTracker tracker({clock}, transport);
+  std::latch start(4);
+  std::vector<std::thread> threads;
+  for (int i = 0; i < 4; ++i)
+    threads.emplace_back([&] {
+      start.arrive_and_wait();
+      for (int n = 0; n < 100; ++n) track(tracker, "Go");
+    });
+  for (std::thread& thread : threads) thread.join();
+  EXPECT_TRUE(transport->drain(30s));
+  std::ptrdiff_t lines = 0;
+  for (const HTTPPost& post : http.posts())
+    lines += 1 + std::count(post.body.begin(), post.body.end(), '\n');
+  EXPECT_EQ(lines, 400);
+}
+
+TEST_F(SpoolingTransportTest, AWithdrawnConsentStopsTransfersAndForgets) {
+  std::binary_semaphore isPosting(0);
+  std::binary_semaphore mayAnswer(0);
+  http.setServer([&](const HTTPPost&) -> Varnel::Platform::Testing::FakeHTTPClient::Answer {
+    isPosting.release();
+    mayAnswer.acquire();
+    return HTTPFailure{"lost"};
+  });
+  const auto transport = std::shared_ptr(make());
+  AnalyticsTracker tracker({clock}, transport);
+  for (int i = 0; i < 40; ++i) track(tracker, "Before");
+  isPosting.acquire();
+  tracker.context()->setConsent(Consent::refused);
+  track(tracker, "Meanwhile");
+  mayAnswer.release();
+  EXPECT_FALSE(transport->drain(30s));
+
+  http.setServer([](const HTTPPost&) { return HTTPResponse{.status = 200, .retryAfter = {}}; });
+  tracker.context()->setConsent(Consent::granted);
+  track(tracker, "After");
+  EXPECT_TRUE(transport->drain(30s));
+  const auto posts = http.posts();
+  ASSERT_EQ(posts.size(), 2u);
+  EXPECT_NE(posts[1].body.find("ea=After"), std::string::npos);
+  EXPECT_EQ(posts[1].body.find('\n'), std::string::npos);
+}
+
+TEST_F(SpoolingTransportTest, WhatEarlierRunsLeftGoesWithConsentAlone) {
+  append(*openSpool(), {"a", "b"});
+  { AnalyticsTracker tracker({clock}, make(), Consent::refused); }
+  EXPECT_TRUE(http.posts().empty());
+  EXPECT_EQ(namesOf(*openSpool()), "");
+
+  append(*openSpool(), {"c"});
+  const auto transport = std::shared_ptr(make());
+  AnalyticsTracker tracker({clock}, transport);
+  EXPECT_TRUE(transport->drain(30s));
+  EXPECT_EQ(http.posts().size(), 1u);
+}
+
+TEST_F(SpoolingTransportTest, ADrainEndsWhenTheServerFails) {
+  http.setServer([](const HTTPPost&) { return HTTPResponse{.status = 503, .retryAfter = {}}; });
+  const auto transport = std::shared_ptr(make());
+  AnalyticsTracker tracker({clock}, transport);
+  track(tracker, "Go");
+  EXPECT_FALSE(transport->drain(1h));
+  EXPECT_FALSE(transport->drain(1h)) << "nor does it wait for the pause to end";
+  track(tracker, std::string(10'000, 'x'));
+  EXPECT_EQ(transport->droppedCount(), 1);
+}
+
+}  // namespace
+}  // namespace Tallyhouse
