@@ -7,9 +7,9 @@
 
 namespace Basalt {
 
-/// A multiset of small values: it holds a value as often as it was inserted. Up to eight
-/// occurrences cost no allocation. A plain value; it is searched from front to back, so keep it
-/// short.
+/// A multiset of small values that can be default-constructed and compared: it holds a value as
+/// often as it was inserted. Up to eight occurrences cost no allocation. A plain value; it is
+/// searched from front to back, so keep it short.
 ///
 ///     Bag<int> bag;
 ///     bag.insert(7);

@@ -26,7 +26,8 @@ NotificationCenter::Observer::Observer(std::shared_ptr<Subscription> subscriptio
 NotificationCenter::Observer::Observer(Observer&&) noexcept = default;
 
 NotificationCenter::Observer& NotificationCenter::Observer::operator=(Observer&& other) noexcept {
-  std::swap(subscription_, other.subscription_);
+  Observer former(std::move(other));
+  std::swap(subscription_, former.subscription_);
   return *this;
 }
 

@@ -25,7 +25,7 @@ namespace Basalt {
 ///     }
 ///
 /// Any thread. Ending what was not begun does nothing, so that no gate is closed under another's
-/// feet. Destruction leaves open what is open.
+/// feet. Destruction leaves open what is open. The scope outlives the object.
 class VARNEL_API SecurityScopeBookkeeping final {
  public:
   using URL = Varnel::Platform::URL;

@@ -47,9 +47,22 @@ struct Waiter {
   bool ownsQueue = false;  ///< Set before the wake-up; otherwise the thread has to try again.
 };
 
-const std::shared_ptr<Waiter>& currentWaiter() {
-  thread_local const auto waiter = std::make_shared<Waiter>();
-  return waiter;
+constinit thread_local bool hasLostItsWaiter = false;
+
+struct KeptWaiter {
+  const std::shared_ptr<Waiter> waiter = std::make_shared<Waiter>();
+  KeptWaiter() = default;
+  ~KeptWaiter() { hasLostItsWaiter = true; }
+  KeptWaiter(const KeptWaiter&) = delete;
+  KeptWaiter& operator=(const KeptWaiter&) = delete;
+};
+
+// The same for all waits of a thread, until the thread ends: objects that are destroyed later, the
+// static ones among them, may still wait for a queue.
+std::shared_ptr<Waiter> currentWaiter() {
+  if (hasLostItsWaiter) return std::make_shared<Waiter>();
+  thread_local const KeptWaiter kept;
+  return kept.waiter;
 }
 
 }  // namespace
@@ -150,7 +163,7 @@ bool SerialQueue::Core::takeOrMark(Bits mark) {
 
 void SerialQueue::Core::acquireSlowly() {
   if (isCurrent()) stop("A block waits for the queue that it runs on", label_);
-  const std::shared_ptr<Waiter>& waiter = currentWaiter();
+  const std::shared_ptr<Waiter> waiter = currentWaiter();
   for (bool isNew = true; !tryTake(); isNew = false) {
     {
       const std::lock_guard lock(mutex_);

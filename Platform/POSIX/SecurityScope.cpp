@@ -3,6 +3,8 @@
 
 #include <unistd.h>
 
+#include <string>
+
 #include <Platform/POSIX/Adapters.h>
 
 namespace Varnel::Platform::POSIX {
@@ -11,7 +13,11 @@ namespace {
 // Without a sandbox there is no gate to open: a file is readable or it is not.
 class FileRights final : public SecurityScope {
  public:
-  bool startAccessing(const URL& url) override { return ::access(url.path().c_str(), R_OK) == 0; }
+  bool startAccessing(const URL& url) override {
+    const std::string path = url.path();
+    // The system would look up what stands before the zero.
+    return path.find('\0') == std::string::npos && ::access(path.c_str(), R_OK) == 0;
+  }
   void stopAccessing(const URL&) override {}
 };
 

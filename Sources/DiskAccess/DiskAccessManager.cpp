@@ -106,9 +106,10 @@ void DiskAccessManager::State::updateDiskDataUnsafe() {
     for (const Platform::URL& volumeURL : *disk->volumeURLs())
       diskUniqueIDsByVolumeURL_[volumeURL] = *disk->uniqueID();
   }
-  // A disk that is gone is remembered while threads access it or wait to.
+  // A disk that is gone is remembered while threads access it or a session has to do with it: a
+  // thread that was woken a moment ago stands in no line and counts not yet.
   for (auto& [uniqueID, record] : diskDataByUniqueID_)
-    if (record->accessCount() + record->requestCount() > 0)
+    if (record->accessCount() > 0 || record.use_count() > 1)
       records.try_emplace(uniqueID, std::move(record));
   diskDataByUniqueID_ = std::move(records);
 }

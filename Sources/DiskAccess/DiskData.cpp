@@ -40,6 +40,9 @@ std::shared_ptr<DiskData::AccessRequest> DiskData::requestAccess(Basalt::ThreadI
     accessingThreads_.insert(thread);
     return nullptr;
   }
+  // Threads that come in vain again and again must not pile up in front of a disk that stays full.
+  if (requests_.size() == requests_.capacity())
+    std::erase_if(requests_, [](const auto& other) { return other->isClaimed(); });
   auto request = std::make_shared<AccessRequest>(urgencyClassOf(qos));
   const auto place = std::upper_bound(requests_.begin(), requests_.end(), request,
                                       [](const auto& one, const auto& other) {

@@ -36,8 +36,10 @@ class VARNEL_API DiskData final : public std::enable_shared_from_this<DiskData> 
     /// 0 for the class of requests that is granted first.
     [[nodiscard]] int urgencyClass() const { return urgencyClass_; }
 
-    /// True for the first caller alone. Any thread.
+    /// True for the first caller alone. Any thread, as the one below.
     [[nodiscard]] bool claim() { return !flag_.test_and_set(std::memory_order_acq_rel); }
+
+    [[nodiscard]] bool isClaimed() const { return flag_.test(std::memory_order_relaxed); }
 
     Basalt::Semaphore sema;
 
@@ -83,7 +85,7 @@ class VARNEL_API DiskData final : public std::enable_shared_from_this<DiskData> 
   /// How many places are taken, a thread counting once for each that it has.
   [[nodiscard]] std::size_t accessCount() const { return accessingThreads_.count(); }
 
-  /// How many requests stand in line, those included whose thread has given up.
+  /// How many requests stand in line. Those whose thread has given up may be among them.
   [[nodiscard]] std::size_t requestCount() const { return requests_.size(); }
 
  private:

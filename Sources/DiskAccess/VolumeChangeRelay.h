@@ -21,7 +21,13 @@ inline constexpr std::string_view didUnmountNotification = "NSWorkspaceDidUnmoun
 inline constexpr std::string_view volumeURLKey = "NSWorkspaceVolumeURLKey";
 
 /// Posts a notification for each volume that comes or goes, on the catalogue's thread, as long as
-/// the relay lives. Both sides must outlive it.
+/// the relay lives. Both sides must outlive it. The process has one for its default center, which
+/// starts with the first `DiskAccessManager()`; others make their own:
+///
+///     const VolumeChangeRelay relay(volumes, center);
+///     DiskAccessManager manager({devices, disks, volumes, securityScope, center});
+///
+/// Does nothing where the system offers no such events. Not to be destroyed by an observer.
 class VARNEL_API VolumeChangeRelay final {
  public:
   VolumeChangeRelay(Platform::VolumeCatalog& volumes, const Basalt::NotificationCenter& center);

@@ -18,9 +18,14 @@ TEST(NotificationCenter, TellsTheObserversOfANameInOrder) {
       center.addObserver("mounted", [&](const Notification&) { calls.push_back(1); });
   const auto other =
       center.addObserver("unmounted", [&](const Notification&) { calls.push_back(2); });
-  const auto last = center.addObserver("mounted", [&](const Notification&) { calls.push_back(3); });
+  auto last = center.addObserver("mounted", [&](const Notification&) { calls.push_back(3); });
   center.post({.name = "mounted", .userInfo = {}});
   EXPECT_EQ(calls, (std::vector{1, 3}));
+
+  auto heir = center.addObserver("mounted", [&](const Notification&) { calls.push_back(4); });
+  last = std::move(heir);
+  center.post({.name = "mounted", .userInfo = {}});
+  EXPECT_EQ(calls, (std::vector{1, 3, 1, 4})) << "the former one is gone at once";
 }
 
 TEST(NotificationCenter, LetsHandlersComeAndGoDuringAPost) {

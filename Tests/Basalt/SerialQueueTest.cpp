@@ -158,6 +158,29 @@ TEST(SerialQueue, IsDestroyedWithoutWaitingAndStillRunsWhatWasSubmitted) {
   done->wait();
 }
 
+TEST(SerialQueue, IsWaitedForByWhatAThreadDestroysLast) {
+  SerialQueue queue("last words");
+  struct LastWords {
+    SerialQueue* queue = nullptr;
+    ~LastWords() {
+      if (!queue) return;
+      queue->async([] {});
+      queue->sync([] {});
+    }
+  };
+  for (int round = 0; round < 20; ++round) {
+    std::thread([&] {
+      // Made before the thread first waits, it is destroyed after whatever it waited with.
+      thread_local LastWords lastWords;
+      lastWords.queue = &queue;
+      Occupation occupation(queue);
+      occupation.end();
+      queue.sync([] {});
+    }).join();
+  }
+  queue.sync([] {});
+}
+
 // Any mixture of calls from several threads: one block at a time, each thread's in their order, and
 // none lost.
 TEST(SerialQueue, KeepsItsPromisesUnderStress) {

@@ -112,6 +112,16 @@ TEST_F(DiskDataTest, OneFreePlaceWakesEveryWaiter) {
   EXPECT_TRUE(isSignalled(*late));
 }
 
+TEST_F(DiskDataTest, ThreadsThatGiveUpDoNotPileUp) {
+  const auto data = disk(OVDiskKindUnknown);
+  EXPECT_FALSE(request(*data, first));
+  const auto patient = request(*data, second, QoS::background);
+  for (int i = 0; i < 1000; ++i) EXPECT_TRUE(request(*data, third)->claim());
+  EXPECT_LT(data->requestCount(), 10u);
+  release(*data, first);
+  EXPECT_TRUE(isSignalled(*patient));
+}
+
 TEST_F(DiskDataTest, BackgroundModeLowersTheLimitAsThreadsLeave) {
   const auto data = disk(OVDiskKindSolidState);
   for (const ThreadID thread : {first, second, third}) EXPECT_FALSE(request(*data, thread));
