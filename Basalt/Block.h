@@ -55,9 +55,9 @@ class Block final {
   static constexpr std::size_t capacity = 4 * sizeof(void*);
 
   template <typename Function>
-  static constexpr bool fits = sizeof(Function) <= capacity &&
-                               alignof(Function) <= alignof(std::max_align_t) &&
-                               std::is_nothrow_move_constructible_v<Function>;
+  static constexpr bool fits =
+      sizeof(Function) <= capacity &&
+      alignof(Function) <= alignof(void*) && std::is_nothrow_move_constructible_v<Function>;
 
   template <typename Function>
   struct Boxed {
@@ -88,7 +88,7 @@ class Block final {
   };
 
   const Operations* operations_ = nullptr;
-  alignas(std::max_align_t) std::byte storage_[capacity];
+  alignas(void*) std::byte storage_[capacity];
 };
 
 }  // namespace Basalt

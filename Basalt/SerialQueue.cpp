@@ -23,6 +23,8 @@ namespace {
 /// How many brief blocks of others a thread runs when it gives a queue up.
 constexpr std::size_t briefBlockLimit = 16;
 
+constexpr std::size_t cacheLine = 64;
+
 [[noreturn]] void stop(const char* reason, const std::string& label) {
   fmt::print(stderr, "{} (queue {})\n", reason, label);
   std::abort();
@@ -117,13 +119,14 @@ class SerialQueue::Core final {
   void work();
   [[nodiscard]] Bits bitsOfLine() const;
 
-  std::atomic<Bits> word_ = 0;
+  // What every hold looks at, on one cache line up to whether there is anything to run after it.
+  alignas(cacheLine) std::atomic<Bits> word_ = 0;
   std::atomic<ThreadID> holder_ = ThreadID::none;  ///< Set only while a block runs.
 
   // Owned by the holder.
-  Block briefBlock_;  ///< What the block that runs has submitted, in turn.
+  Block briefBlock_;    ///< What the block that runs has submitted, in turn.
+  Block afterRelease_;  ///< What is to be done once the queue is given up.
   std::size_t briefBlockCount_ = 0;
-  Block afterRelease_;
 
   const std::string label_;
   const QualityOfService quality_;

@@ -26,17 +26,20 @@ struct RecordLookup {
   std::atomic<bool> isAnswered = false;
 };
 
-DiskAccessManager::Ports portsOfProcess() {
+/// The process's services, and the relay that tells the default center of its volumes.
+struct ProcessServices {
   const Platform::Ports& ports = Platform::processPorts();
   Basalt::NotificationCenter& center = Basalt::NotificationCenter::defaultCenter();
-  // Nobody reads the pointer; volatile keeps it, so that the relay is not taken for a leak.
-  [[maybe_unused]] static const VolumeChangeRelay* const volatile relay =
-      new VolumeChangeRelay(ports.volumeCatalog, center);
-  return {.devices = ports.deviceRegistry,
-          .disks = ports.diskArbitration,
-          .volumes = ports.volumeCatalog,
-          .securityScope = ports.securityScope,
-          .notificationCenter = center};
+  VolumeChangeRelay relay{ports.volumeCatalog, center};
+};
+
+DiskAccessManager::Ports portsOfProcess() {
+  static const ProcessServices& services = *new ProcessServices;
+  return {.devices = services.ports.deviceRegistry,
+          .disks = services.ports.diskArbitration,
+          .volumes = services.ports.volumeCatalog,
+          .securityScope = services.ports.securityScope,
+          .notificationCenter = services.center};
 }
 
 }  // namespace

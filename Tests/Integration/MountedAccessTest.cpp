@@ -25,7 +25,8 @@ using Platform::URL;
 
 // The system's own services from end to end: nobody tells the manager of the mount.
 TEST(MountedAccess, ADiskThatIsMountedWhileThreadsWaitIsKnownAtOnce) {
-  const std::string reason = Tests::enterMountNamespace();
+  // Once a process, as the process's services stay in the namespace in which they began.
+  static const std::string reason = Tests::enterMountNamespace();
   if (!reason.empty()) GTEST_SKIP() << reason;
   const Tests::TemporaryFolder folder;
   const Tests::DiskImage image(folder.path() / "image");
