@@ -6,7 +6,6 @@
 
 #include <Platform/Ports/Clock.h>
 #include <Platform/Ports/Ports.h>
-#include <Platform/Values/UUID.h>
 #include <Tallyhouse/AnalyticsTransport.h>
 
 namespace Tallyhouse {
@@ -26,17 +25,19 @@ void AnalyticsContext::trackEvent(std::string_view category, std::string_view ac
                                   const CustomDimensions& customDimensions,
                                   const CustomMetrics& customMetrics, bool isTest) noexcept try {
   if (!transport_) return;
-  const AnalyticsEvent event{.uuid = Varnel::Platform::randomUUIDString(),
-                             .date = ports_.clock.now(),
-                             .category = std::string(category),
-                             .action = std::string(action),
-                             .label = label,
-                             .value = value,
-                             .customDimensions = customDimensions,
-                             .customMetrics = customMetrics,
-                             .isTest = isTest};
+  AnalyticsEvent event{.uuid = {},
+                       .date = ports_.clock.now(),
+                       .category = std::string(category),
+                       .action = std::string(action),
+                       .label = label,
+                       .value = value,
+                       .customDimensions = customDimensions,
+                       .customMetrics = customMetrics,
+                       .isTest = isTest};
   const std::lock_guard lock(mutex_);
-  if (consent_ == Consent::granted) transport_->accept(event);
+  if (consent_ != Consent::granted) return;
+  event.uuid = uuids_.next();
+  transport_->accept(event);
 } catch (const std::exception&) {
   // Out of memory: an event less, but an application that goes on.
 }

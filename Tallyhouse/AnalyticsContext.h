@@ -8,6 +8,7 @@
 #include <string_view>
 
 #include <Platform/Api.h>
+#include <Platform/Values/UUID.h>
 #include <Tallyhouse/AnalyticsEvent.h>
 
 namespace Varnel::Platform {
@@ -51,8 +52,9 @@ class VARNEL_API AnalyticsContext final {
 
   const Ports ports_;
   const std::shared_ptr<AnalyticsTransport> transport_;
-  mutable std::mutex mutex_;  ///< Owns `consent_`, and the transport's calls.
+  mutable std::mutex mutex_;  ///< Owns all below, and the transport's calls.
   Consent consent_;
+  Varnel::Platform::UUIDGenerator uuids_;
 };
 
 }  // namespace Tallyhouse

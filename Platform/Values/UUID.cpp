@@ -1,23 +1,22 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Values/UUID.h>
 
+#include <algorithm>
 #include <array>
 #include <cstdint>
-#include <random>
+#include <functional>
 #include <string_view>
 
 namespace Varnel::Platform {
+namespace {
 
-std::string randomUUIDString() {
+using Words = std::array<std::uint32_t, 4>;
+
+std::string textOf(const Words& words) {
   constexpr std::string_view hexDigits = "0123456789ABCDEF";
-  // The system's randomness comes without a library whose state is gone once the process exits:
-  // an inventory may still be under way by then.
-  std::random_device random;
   std::array<unsigned char, 16> bytes{};
-  for (std::size_t i = 0; i < bytes.size(); i += 4) {
-    const std::uint32_t word = random();
-    for (std::size_t j = 0; j < 4; ++j) bytes[i + j] = static_cast<unsigned char>(word >> (8 * j));
-  }
+  for (std::size_t i = 0; i < bytes.size(); ++i)
+    bytes[i] = static_cast<unsigned char>(words[i / 4] >> (8 * (i % 4)));
   bytes[6] = static_cast<unsigned char>((bytes[6] & 0x0F) | 0x40);
   bytes[8] = static_cast<unsigned char>((bytes[8] & 0x3F) | 0x80);
   std::string text;
@@ -28,6 +27,37 @@ std::string randomUUIDString() {
     text += hexDigits[bytes[i] & 0x0F];
   }
   return text;
+}
+
+std::mt19937_64 seededEngine() {
+  std::random_device random;
+  std::array<std::uint32_t, 8> seed{};
+  std::generate(seed.begin(), seed.end(), std::ref(random));
+  std::seed_seq sequence(seed.begin(), seed.end());
+  return std::mt19937_64(sequence);
+}
+
+}  // namespace
+
+std::string randomUUIDString() {
+  // The system's randomness comes without a library whose state is gone once the process exits:
+  // an inventory may still be under way by then.
+  std::random_device random;
+  Words words{};
+  std::generate(words.begin(), words.end(), std::ref(random));
+  return textOf(words);
+}
+
+UUIDGenerator::UUIDGenerator() : engine_(seededEngine()) {}
+
+std::string UUIDGenerator::next() {
+  Words words{};
+  for (std::size_t i = 0; i < words.size(); i += 2) {
+    const std::uint64_t number = engine_();
+    words[i] = static_cast<std::uint32_t>(number);
+    words[i + 1] = static_cast<std::uint32_t>(number >> 32);
+  }
+  return textOf(words);
 }
 
 }  // namespace Varnel::Platform
