@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <numeric>
+#include <optional>
 #include <utility>
 
 #include <Platform/Linux/Adapters.h>
@@ -56,11 +57,34 @@ class DeviceNames final {
   const KernelFolder byNumber_{"/sys/dev/block"};
 };
 
+// The mount that the root folder lies on, as far as the folder itself tells.
+std::optional<Mount> mountOfRootFolder() {
+  struct statx facts {};
+  if (::statx(AT_FDCWD, "/", AT_STATX_DONT_SYNC, STATX_MNT_ID, &facts) != 0 ||
+      (facts.stx_mask & STATX_MNT_ID) == 0)
+    return std::nullopt;
+  Mount mount;
+  mount.id = static_cast<int>(facts.stx_mnt_id);
+  mount.device = std::to_string(facts.stx_dev_major) + ':' + std::to_string(facts.stx_dev_minor);
+  mount.target = "/";
+  return mount;
+}
+
+std::vector<Mount> visibleMounts(std::string_view mountInfo) {
+  std::vector<Mount> mounts = reachableMounts(parseMountInfo(mountInfo));
+  const bool hasRoot =
+      std::any_of(mounts.begin(), mounts.end(), [](const Mount& m) { return m.target == "/"; });
+  // A process whose root folder was changed is not told of the mount that the folder lies on.
+  if (!hasRoot)
+    if (auto root = mountOfRootFolder()) mounts.insert(mounts.begin(), *std::move(root));
+  return mounts;
+}
+
 std::shared_ptr<const VolumeTable> makeTable(std::string_view mountInfo) {
   auto table = std::make_shared<VolumeTable>();
   const BlockDevices devices;
   DeviceNames deviceNames;
-  for (Mount& mount : reachableMounts(parseMountInfo(mountInfo))) {
+  for (Mount& mount : visibleMounts(mountInfo)) {
     if (isPseudoFileSystem(mount.type)) continue;
     auto names = deviceNames.of(mount);
     const auto internal = devices.areInternal(names);

@@ -89,6 +89,19 @@ TEST_F(MountedVolumes, EveryPlaceOfADeviceCountsAndHiddenOnesDoNot) {
   EXPECT_EQ(catalog->volumeURL(volumeAt(base)).value(), volumeAt(base));
 }
 
+TEST_F(MountedVolumes, AChangedRootFolderIsAVolumeAlthoughNoMountStandsThere) {
+  const auto root = makeFolder("root");
+  const auto proc = makeFolder("root/proc");
+  folder.write("root/file", "content");
+  ASSERT_EQ(::mount("/proc", proc.c_str(), nullptr, MS_BIND | MS_REC, nullptr), 0);
+  const auto findVolume = [&] {
+    if (::chroot(root.c_str()) != 0) ::_exit(2);
+    const auto found = catalog->volumeURL(URL::fileURLWithPath("/file"));
+    ::_exit(found && *found == URL::fileURLWithPath("/") ? 0 : 1);
+  };
+  EXPECT_EXIT(findVolume(), testing::ExitedWithCode(0), "");
+}
+
 TEST_F(MountedVolumes, TellsFailedFromAbsent) {
   EXPECT_FALSE(catalog->volumeURL(URL::fileURLWithPath("/no such file")));
   EXPECT_FALSE(catalog->volumeURL(URL::fileURLWithPath("")));
