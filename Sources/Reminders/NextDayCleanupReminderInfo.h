@@ -21,11 +21,11 @@ class BaseModule;
 ///     const NextDayCleanupReminderInfo info(selected, found);
 ///     router.userNotificationCenter().scheduleNotification(info.makeUserNotification());
 ///
-/// The host schedules the notification and withdraws an earlier one. An immutable value; any thread.
+/// The host schedules the notification and withdraws an earlier one. An immutable value; any
+/// thread.
 class VARNEL_API NextDayCleanupReminderInfo final {
  public:
-  /// What the notification is made with; `NextDayCleanupReminderInfo` without it takes the
-  /// process's own.
+  /// What the notification is made with: by default the process's own.
   struct Ports {
     Platform::Clock& clock;
     Platform::UserLocale& userLocale;
