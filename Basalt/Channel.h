@@ -1,11 +1,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <algorithm>
 #include <functional>
 #include <memory>
 #include <mutex>
-#include <optional>
 #include <utility>
 #include <vector>
 
@@ -30,27 +28,32 @@ class Channel {
 
   /// Subscribes until the context is gone.
   void onUpdate(const ExecutionContext& context, Handler handler) const {
-    add({context.executor(), std::make_shared<const Handler>(std::move(handler)),
-         context.lifetime()});
+    add({context.executor(), std::move(handler), Lasts::asItsContext, context.lifetime()});
   }
 
   /// Subscribes for as long as there is a producer.
-  void onUpdate(const Executor& executor, Handler handler) const {
-    add({executor, std::make_shared<const Handler>(std::move(handler)), std::nullopt});
+  void onUpdate(std::shared_ptr<Executor> executor, Handler handler) const {
+    add({std::move(executor), std::move(handler), Lasts::forEver, {}});
   }
 
   bool operator==(const Channel&) const = default;
 
  protected:
+  enum class Lasts { forEver, asItsContext };
+
   struct Subscription {
-    Executor executor;
-    std::shared_ptr<const Handler> handler;
-    std::optional<std::weak_ptr<const void>> lifetime;  ///< Absent: for ever.
+    std::shared_ptr<Executor> executor;
+    Handler handler;
+    Lasts lasts;
+    std::weak_ptr<const void> lifetime;
 
-    [[nodiscard]] bool hasEnded() const { return lifetime && lifetime->expired(); }
+    [[nodiscard]] bool hasEnded() const {
+      return lasts == Lasts::asItsContext && lifetime.expired();
+    }
   };
+  using Subscriptions = std::vector<std::shared_ptr<const Subscription>>;
 
-  [[nodiscard]] std::vector<Subscription> subscriptions() const {
+  [[nodiscard]] Subscriptions subscriptions() const {
     const std::lock_guard lock(state_->mutex);
     return state_->subscriptions;
   }
@@ -58,18 +61,17 @@ class Channel {
  private:
   struct State {
     std::mutex mutex;  ///< Owns the list; not held while handlers run.
-    std::vector<Subscription> subscriptions;
+    Subscriptions subscriptions;
   };
 
   void add(Subscription subscription) const {
-    std::vector<Subscription> ended;  // Let go after the lock: handlers may own anything.
+    auto shared = std::make_shared<const Subscription>(std::move(subscription));
+    Subscriptions kept;  // The ended ones go after the lock: their handlers may own anything.
     const std::lock_guard lock(state_->mutex);
-    auto& all = state_->subscriptions;
-    const auto firstEnded = std::stable_partition(
-        all.begin(), all.end(), [](const Subscription& each) { return !each.hasEnded(); });
-    std::move(firstEnded, all.end(), std::back_inserter(ended));
-    all.erase(firstEnded, all.end());
-    all.push_back(std::move(subscription));
+    for (const auto& each : state_->subscriptions)
+      if (!each->hasEnded()) kept.push_back(each);
+    kept.push_back(std::move(shared));
+    std::swap(kept, state_->subscriptions);
   }
 
   std::shared_ptr<State> state_;
@@ -78,7 +80,7 @@ class Channel {
 /// The sending end of a channel. A cheap value; any thread.
 ///
 ///     Producer<Event> producer;
-///     producer.channel().onUpdate(Executor(mainQueue), handle);
+///     producer.channel().onUpdate(mainQueueExecutor, handle);
 ///     producer.update(event);
 template <typename Update>
 class Producer final : private Channel<Update> {
@@ -89,9 +91,9 @@ class Producer final : private Channel<Update> {
   void update(Update update) const {
     const auto shared = std::make_shared<const Update>(std::move(update));
     for (const auto& subscription : this->subscriptions()) {
-      if (subscription.hasEnded()) continue;
-      subscription.executor.execute([subscription, shared] {
-        if (!subscription.hasEnded()) (*subscription.handler)(*shared);
+      if (subscription->hasEnded()) continue;
+      subscription->executor->execute([subscription, shared] {
+        if (!subscription->hasEnded()) subscription->handler(*shared);
       });
     }
   }

@@ -13,7 +13,7 @@ namespace Basalt {
 ///
 ///     class Badge final : public ExecutionContext {
 ///      public:
-///       Badge(MainQueue& queue, const Channel<int>& counts) : ExecutionContext(Executor(queue)) {
+///       explicit Badge(const Channel<int>& counts) : ExecutionContext(mainQueueExecutor) {
 ///         counts.onUpdate(*this, [this](int count) { draw(count); });
 ///       }
 ///     };
@@ -24,16 +24,16 @@ class ExecutionContext {
   ExecutionContext(const ExecutionContext&) = delete;
   ExecutionContext& operator=(const ExecutionContext&) = delete;
 
-  [[nodiscard]] const Executor& executor() const { return executor_; }
+  [[nodiscard]] const std::shared_ptr<Executor>& executor() const { return executor_; }
   /// Expires with the object.
   [[nodiscard]] std::weak_ptr<const void> lifetime() const { return lifetime_; }
 
  protected:
-  explicit ExecutionContext(Executor executor) : executor_(std::move(executor)) {}
+  explicit ExecutionContext(std::shared_ptr<Executor> executor) : executor_(std::move(executor)) {}
   ~ExecutionContext() = default;
 
  private:
-  const Executor executor_;
+  const std::shared_ptr<Executor> executor_;
   const std::shared_ptr<const void> lifetime_ = std::make_shared<char>();
 };
 

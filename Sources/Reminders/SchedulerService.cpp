@@ -4,6 +4,7 @@
 #include <utility>
 #include <vector>
 
+#include <Basalt/MainQueueExecutor.h>
 #include <Platform/Ports/Clock.h>
 #include <Platform/Ports/Ports.h>
 #include <Platform/Ports/UserLocale.h>
@@ -46,7 +47,7 @@ SchedulerService::Ports portsOfProcess() {
 SchedulerService::SchedulerService(Ports ports,
                                    std::shared_ptr<Tallyhouse::AnalyticsTracker> analyticsTracker,
                                    UserNotificationRouter& userNotificationRouter)
-    : ExecutionContext(Basalt::Executor(ports.mainQueue)),
+    : ExecutionContext(std::make_shared<Basalt::MainQueueExecutor>(ports.mainQueue)),
       ports_(std::move(ports)),
       analyticsSender_({ports_.clock, ports_.userLocale}, std::move(analyticsTracker)),
       userNotificationRouter_(userNotificationRouter) {

@@ -5,6 +5,7 @@
 #include <mutex>
 #include <utility>
 
+#include <Basalt/MainQueueExecutor.h>
 #include <Platform/Ports/Application.h>
 #include <Platform/Ports/MainQueue.h>
 #include <Platform/Ports/Ports.h>
@@ -89,9 +90,11 @@ UserNotificationCenter& UserNotificationRouter::userNotificationCenter() const {
 }
 
 void UserNotificationRouter::register_(const std::string& identifier, Handler handler) {
-  channel(identifier).onUpdate(
-      Basalt::Executor(ports_.mainQueue),
-      [handler = std::move(handler)](const Event& event) { handler(event.notification, event.kind); });
+  channel(identifier)
+      .onUpdate(std::make_shared<Basalt::MainQueueExecutor>(ports_.mainQueue),
+                [handler = std::move(handler)](const Event& event) {
+                  handler(event.notification, event.kind);
+                });
 }
 
 Basalt::Channel<UserNotificationRouter::Event> UserNotificationRouter::channel(

@@ -26,8 +26,8 @@ namespace Varnel {
 ///     router.register_("com.example.daily", [](const auto& notification, auto kind) { … });
 ///
 /// `register_` and `channel` may be called on any thread, all else on the main thread. Handlers run
-/// on the main queue, whose `Executor` the router hands to them, and never within the call that
-/// caused the event. An event that nobody asked for is lost. Nothing fails.
+/// on the main queue, never within the call that caused the event. An event that nobody asked for
+/// is lost. Nothing fails.
 class VARNEL_API UserNotificationRouter final {
  public:
   enum class EventKind : std::int64_t {
@@ -85,7 +85,8 @@ class VARNEL_API UserNotificationRouter final {
   void removeNotifications(const std::string& identifier, Removal removal);
 
   const Ports ports_;
-  const std::shared_ptr<Routes> routes_;  ///< What the center listens to, as long as the router lives.
+  const std::shared_ptr<Routes>
+      routes_;  ///< What the center listens to, as long as the router lives.
 };
 
 }  // namespace Varnel
