@@ -8,6 +8,9 @@
 namespace Varnel::Platform {
 namespace {
 
+// Processes in different time zones see one date this far apart at the most.
+constexpr std::chrono::days sameMoment(2);
+
 // The dates of one schedule by number, from the original one, 0. They ascend; a date beyond the
 // calendar comes after all others.
 class Dates final {
@@ -71,7 +74,8 @@ ScheduleDecision decide(const NotificationSchedule& schedule, Date now, const Ca
     return {.isDue = true, .deliveryCount = dates.at(next) ? std::optional(next) : std::nullopt};
   }
   const auto beforeLast = count > 0 && dates.repeats() ? dates.at(count - 2) : std::nullopt;
-  if (beforeLast && *beforeLast > now) return {.deliveryCount = dates.firstAfter(now, 0)};
+  if (beforeLast && *beforeLast - sameMoment > now)
+    return {.deliveryCount = dates.firstAfter(now, 0)};
   return {.deliveryCount = count};
 }
 

@@ -41,7 +41,7 @@ struct ScheduleDecision final {
 /// Whether the schedule is due, and how it goes on. Periods that passed unseen count as one.
 ///
 /// A clock that is set back repeats nothing that has been delivered. Only when it is set back by
-/// more than a period was it wrong before, and the schedule goes on from the present.
+/// more than a period and some days was it wrong before, and the schedule goes on from the present.
 [[nodiscard]] ScheduleDecision decide(const NotificationSchedule& schedule, Date now,
                                       const Calendar& calendar);
 

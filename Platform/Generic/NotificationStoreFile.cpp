@@ -40,16 +40,19 @@ std::optional<PlatformError> check(SQLiteDatabase& database, const std::string& 
     return PlatformError("SQLite", SQLITE_CORRUPT,
                          {{std::string(localizedDescriptionKey), message}});
   };
+  // Besides damage proper, the library's plain error says that it does not understand the file.
+  const auto judged = [&](const PlatformError& error) {
+    return error.code() == SQLITE_ERROR ? damaged(error.localizedDescription()) : error;
+  };
   auto verdict = database.prepare("PRAGMA quick_check(1)");
-  if (!verdict) return verdict.error();
+  if (!verdict) return judged(verdict.error());
   const auto step = verdict->step();
-  if (!step) return step.error();
+  if (!step) return judged(step.error());
   if (verdict->text(0) != "ok")
     return damaged(std::string(verdict->text(0).value_or("no verdict")));
   verdict->reset();
-  auto error = database.execute(schema);
-  if (error && error->code() == SQLITE_ERROR) return damaged(error->localizedDescription());
-  return error;
+  if (const auto error = database.execute(schema)) return judged(*error);
+  return std::nullopt;
 }
 
 std::optional<PlatformError> transaction(SQLiteDatabase& database,

@@ -25,9 +25,9 @@ using ::testing::SizeIs;
 class UserNotificationRouterTest : public ::testing::Test {
  protected:
   Router::Handler note(std::string name) {
-    return [this, name = std::move(name)](const UserNotification& notification, Kind kind) {
+    return [this, name = std::move(name)](const UserNotification& received, Kind kind) {
       EXPECT_TRUE(queue.isCurrent());
-      events.push_back(name + " " + notification.title.value_or("") + " " +
+      events.push_back(name + " " + received.title.value_or("") + " " +
                        std::to_string(static_cast<int>(kind)));
     };
   }
