@@ -1,35 +1,28 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <functional>
 #include <memory>
-#include <utility>
 
-#include <Basalt/SerialQueue.h>
-#include <Platform/Ports/MainQueue.h>
+#include <Basalt/Block.h>
+#include <Platform/Api.h>
 
 namespace Basalt {
 
-/// Where a piece of work is to run: the main queue, or a serial queue.
+/// Runs blocks, somewhere and at some time. Any thread.
 ///
-///     channel.onUpdate(Executor(mainQueue), [](const Event& event) { show(event); });
-///
-/// A cheap value. Any thread. What it hands on runs later, in the order in which a thread handed it
-/// on, and must not throw.
-class Executor final {
+///     globalConcurrentQueue()->execute([tracker] { show(tracker->installSourceEntry()); });
+class VARNEL_API Executor {
  public:
-  using Work = std::function<void()>;
+  virtual ~Executor() = default;
 
-  /// The queue must outlive the executor.
-  explicit Executor(Varnel::Platform::MainQueue& queue)
-      : execute_([&queue](Work work) { queue.post(std::move(work)); }) {}
-  explicit Executor(std::shared_ptr<SerialQueue> queue)
-      : execute_([queue = std::move(queue)](Work work) { queue->async(std::move(work)); }) {}
-
-  void execute(Work work) const { execute_(std::move(work)); }
-
- private:
-  std::function<void(Work)> execute_;
+  /// Runs the block once, never within this call. It must not throw.
+  virtual void execute(Block block) = 0;
 };
+
+/// The process's queue of default priority for work that may wait: blocks run side by side on
+/// threads that are started as needed, 64 at the most, and begin in the order of submission. What
+/// still runs or waits when the process ends is dropped. `execute` throws `std::system_error` when
+/// the system grants not even one thread. Any thread.
+[[nodiscard]] VARNEL_API std::shared_ptr<Executor> globalConcurrentQueue();
 
 }  // namespace Basalt

@@ -2,8 +2,11 @@
 #include <Platform/Generic/ScheduledNotificationCenter.h>
 
 #include <algorithm>
+#include <map>
+#include <string>
 #include <utility>
 
+#include <Platform/Generic/NotificationStore.h>
 #include <Platform/Ports/Clock.h>
 #include <Platform/Ports/MainQueue.h>
 #include <Platform/Ports/NotificationServer.h>
@@ -32,7 +35,7 @@ class ScheduledNotificationCenter::Banners final : public NotificationServer::Ob
   explicit Banners(ScheduledNotificationCenter& center) : center_(center) {}
 
   void bannerShown(const std::string& key, const std::string& reference) override {
-    center_.store_.setBannerReference(key, reference);
+    center_.store_->setBannerReference(key, reference);
   }
   void bannerActivated(const std::string& key) override {
     const auto shown = shown_.extract(key);
@@ -41,7 +44,7 @@ class ScheduledNotificationCenter::Banners final : public NotificationServer::Ob
   }
   void bannerDismissed(const std::string& key) override {
     shown_.erase(key);
-    center_.store_.removeDelivered(key);
+    center_.store_->removeDelivered(key);
   }
 
   void show(const DeliveredNotification& delivered) {
@@ -64,7 +67,7 @@ class ScheduledNotificationCenter::Banners final : public NotificationServer::Ob
 ScheduledNotificationCenter::ScheduledNotificationCenter(Ports ports,
                                                          std::filesystem::path storeFile)
     : ports_(ports),
-      store_(std::move(storeFile), ports.systemLog),
+      store_(std::make_unique<NotificationStore>(std::move(storeFile), ports.systemLog)),
       banners_(std::make_shared<Banners>(*this)) {
   ports_.notificationServer.setObserver(banners_);
   ports_.timer.setHandler([this] { recheck(); });
@@ -82,7 +85,7 @@ void ScheduledNotificationCenter::setDelegate(
 }
 
 void ScheduledNotificationCenter::scheduleNotification(const UserNotification& notification) {
-  store_.schedule(notification, ports_.clock.now(), Calendar(ports_.userLocale));
+  store_->schedule(notification, ports_.clock.now(), Calendar(ports_.userLocale));
   if (notification.identifier) removeDeliveredNotification(notification);
   recheck();
 }
@@ -90,7 +93,7 @@ void ScheduledNotificationCenter::scheduleNotification(const UserNotification& n
 std::vector<UserNotification> ScheduledNotificationCenter::scheduledNotifications() {
   const Calendar calendar(ports_.userLocale);
   std::vector<UserNotification> notifications;
-  for (NotificationSchedule& schedule : store_.schedules()) {
+  for (NotificationSchedule& schedule : store_->schedules()) {
     schedule.notification.deliveryDate = nextDate(schedule, calendar);
     notifications.push_back(std::move(schedule.notification));
   }
@@ -105,37 +108,37 @@ std::vector<UserNotification> ScheduledNotificationCenter::scheduledNotification
 void ScheduledNotificationCenter::removeScheduledNotification(
     const UserNotification& notification) {
   const Calendar calendar(ports_.userLocale);
-  for (NotificationSchedule& schedule : store_.schedules()) {
+  for (NotificationSchedule& schedule : store_->schedules()) {
     schedule.notification.deliveryDate = nextDate(schedule, calendar);
     if (isSameNotification(schedule.notification, notification))
-      store_.removeSchedule(schedule.key);
+      store_->removeSchedule(schedule.key);
   }
   awaitNext();
 }
 
 void ScheduledNotificationCenter::deliverNotification(const UserNotification& notification) {
-  deliver(store_.addDelivered(notification, ports_.clock.now()));
+  deliver(store_->addDelivered(notification, ports_.clock.now()));
 }
 
 std::vector<UserNotification> ScheduledNotificationCenter::deliveredNotifications() {
   std::vector<UserNotification> notifications;
-  for (DeliveredNotification& delivered : store_.delivered())
+  for (DeliveredNotification& delivered : store_->delivered())
     notifications.push_back(std::move(delivered.notification));
   return notifications;
 }
 
 void ScheduledNotificationCenter::removeDeliveredNotification(
     const UserNotification& notification) {
-  for (const DeliveredNotification& delivered : store_.delivered()) {
+  for (const DeliveredNotification& delivered : store_->delivered()) {
     if (!isSameNotification(delivered.notification, notification)) continue;
-    store_.removeDelivered(delivered.key);
+    store_->removeDelivered(delivered.key);
     banners_->close(delivered);
   }
 }
 
 void ScheduledNotificationCenter::recheck() {
   if (!delegate_.expired())
-    for (const auto& delivered : store_.claimDue(ports_.clock.now(), Calendar(ports_.userLocale)))
+    for (const auto& delivered : store_->claimDue(ports_.clock.now(), Calendar(ports_.userLocale)))
       deliver(delivered);
   awaitNext();
 }
@@ -160,7 +163,7 @@ void ScheduledNotificationCenter::awaitNext() {
   std::optional<Date> next;
   if (!delegate_.expired()) {
     const Calendar calendar(ports_.userLocale);
-    for (const NotificationSchedule& schedule : store_.schedules())
+    for (const NotificationSchedule& schedule : store_->schedules())
       if (const auto date = nextDate(schedule, calendar); date && (!next || *date < *next))
         next = date;
   }

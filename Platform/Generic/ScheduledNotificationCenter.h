@@ -2,13 +2,10 @@
 #pragma once
 
 #include <filesystem>
-#include <map>
 #include <memory>
-#include <string>
 #include <vector>
 
 #include <Platform/Api.h>
-#include <Platform/Generic/NotificationStore.h>
 #include <Platform/Ports/UserNotificationCenter.h>
 
 namespace Varnel::Platform {
@@ -16,10 +13,11 @@ namespace Varnel::Platform {
 class Clock;
 class MainQueue;
 class NotificationServer;
+class NotificationStore;
 class SystemLog;
 class UserLocale;
 class WallClockTimer;
-struct Banner;
+struct DeliveredNotification;
 
 /// A notification center for systems that can show banners but keep no schedules.
 ///
@@ -59,11 +57,10 @@ class VARNEL_API ScheduledNotificationCenter final : public UserNotificationCent
   class Banners;
 
   void deliver(const DeliveredNotification& delivered);
-  void removeDelivered(const DeliveredNotification& delivered);
   void awaitNext();
 
   const Ports ports_;
-  NotificationStore store_;
+  const std::unique_ptr<NotificationStore> store_;
   const std::shared_ptr<Banners> banners_;
   std::weak_ptr<UserNotificationCenterDelegate> delegate_;
 };

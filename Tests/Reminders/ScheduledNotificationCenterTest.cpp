@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: MIT
+#include <Platform/Generic/NotificationStore.h>
 #include <Platform/Generic/ScheduledNotificationCenter.h>
 
 #include <gmock/gmock.h>
