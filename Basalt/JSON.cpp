@@ -32,8 +32,7 @@ std::string importString(const JSON& json, std::string_view key, std::string_vie
   if (!json.is_object()) throw JSONError::typeMismatch(std::string(typeName), "root");
   const auto value = json.find(key);
   if (value == json.end()) throw JSONError::missingValue(std::string(typeName), std::string(key));
-  if (!value->is_string())
-    throw JSONError::typeMismatch(std::string(typeName), std::string(key));
+  if (!value->is_string()) throw JSONError::typeMismatch(std::string(typeName), std::string(key));
   return value->get<std::string>();
 }
 

@@ -69,8 +69,8 @@ concept JSONObjectExportable = JSONExportable<Type> && requires(const Type& valu
 
 /// A type that goes both ways as a JSON object.
 template <typename Type>
-concept JSONObjectConvertable = JSONObjectImportable<Type> && JSONObjectExportable<Type> &&
-    JSONConvertable<Type>;
+concept JSONObjectConvertable =
+    JSONObjectImportable<Type> && JSONObjectExportable<Type> && JSONConvertable<Type>;
 
 /// The string under a key of a JSON object. Throws the type mismatch, naming `typeName`, when
 /// `json` is no object (at "root") or the value is no string (at the key), and the missing value

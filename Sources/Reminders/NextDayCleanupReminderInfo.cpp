@@ -33,8 +33,7 @@ Platform::UserNotification NextDayCleanupReminderInfo::makeUserNotification(Port
           Platform::formatted(localized("Varnel_NextDayCleanupReminder_Subtitle"), {size}),
       .actionButtonTitle = localized("Varnel_NextDayCleanupReminder_ActionButton"),
       .otherButtonTitle = localized("Varnel_NextDayCleanupReminder_OtherButton"),
-      .deliveryDate =
-          Platform::Calendar(ports.userLocale).adding({.day = 1}, ports.clock.now()),
+      .deliveryDate = Platform::Calendar(ports.userLocale).adding({.day = 1}, ports.clock.now()),
   };
 }
 

@@ -62,8 +62,8 @@ std::optional<SchedulePeriodOption> SchedulePeriodOption::withRawValue(std::int6
 }
 
 SchedulePeriodOption::SchedulePeriodOption(const nlohmann::json& jsonObject)
-    : SchedulePeriodOption(optionOfKind(
-          Basalt::importString(jsonObject, kindKey, "SchedulePeriodOption"))) {}
+    : SchedulePeriodOption(
+          optionOfKind(Basalt::importString(jsonObject, kindKey, "SchedulePeriodOption"))) {}
 
 SchedulePeriodOption SchedulePeriodOption::default_() {
   return Globals::isMarkettaVersion() ? never : onceInTwoWeeks;

@@ -23,8 +23,8 @@ namespace Varnel {
 ///     const auto period = SchedulePeriodOption(json.at("remind"));
 ///     switch (period.case_()) { case SchedulePeriodOption::Case::weekly: … }
 ///
-/// The analytics identifiers say "Once in …", the keys of the texts "Once In …": both are published.
-/// As JSON it is an object such as {"kind": "monthly"}. A value; any thread.
+/// The analytics identifiers say "Once in …", the keys of the texts "Once In …": both are
+/// published. As JSON it is an object such as {"kind": "monthly"}. A value; any thread.
 class VARNEL_API SchedulePeriodOption final {
  public:
   static constexpr bool canImportJSON = true;

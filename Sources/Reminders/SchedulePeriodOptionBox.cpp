@@ -21,8 +21,8 @@ SchedulePeriodOption leniently(const nlohmann::json& json) {
 
 template <Case option>
 const Pointer& sharedBox() {
-  static const Pointer& box = *new Pointer(
-      SchedulePeriodOptionBox::make(SchedulePeriodOption(option)));
+  static const Pointer& box =
+      *new Pointer(SchedulePeriodOptionBox::make(SchedulePeriodOption(option)));
   return box;
 }
 

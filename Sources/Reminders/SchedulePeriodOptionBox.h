@@ -51,7 +51,8 @@ class VARNEL_API SchedulePeriodOptionBox
   [[nodiscard]] static const Pointer& onceInSixMonthsBox();
   [[nodiscard]] static const Pointer& annuallyBox();
 
-  /// A box for each of `SchedulePeriodOption::optionsAvailableToUser()`, other than the shared ones.
+  /// A box for each of `SchedulePeriodOption::optionsAvailableToUser()`, other than the shared
+  /// ones.
   [[nodiscard]] static const std::vector<Pointer>& optionsAvailableToUser();
 
   [[nodiscard]] nlohmann::json exportJSON() const;

@@ -48,7 +48,7 @@ class VARNEL_API SchedulerService final : public Basalt::ExecutionContext {
     Platform::Clock& clock;
     Platform::UserLocale& userLocale;
     Platform::MainQueue& mainQueue;
-    const ProcessFacts& facts;                ///< For the application's name.
+    const ProcessFacts& facts;                 ///< For the application's name.
     std::shared_ptr<const BaseModule> module;  ///< For the texts.
   };
 
