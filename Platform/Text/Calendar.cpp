@@ -18,6 +18,11 @@ using LocalTime = std::chrono::local_time<milliseconds>;
 // The furthest that a calculation may lead; `Date` reaches 292,000 years.
 constexpr double farthestMillisecond = 9.0e15;
 
+bool isWithinReach(Date date) {
+  constexpr Date::duration farthest = milliseconds(static_cast<std::int64_t>(farthestMillisecond));
+  return date.time_since_epoch() <= farthest && date.time_since_epoch() >= -farthest;
+}
+
 UDate icuDate(milliseconds time) {
   return static_cast<UDate>(time.count());
 }
@@ -108,6 +113,7 @@ const std::string& Calendar::timeZoneIdentifier() const {
 
 std::optional<Date> Calendar::adding(const DateComponents& components, Date date,
                                      std::int64_t count) const {
+  if (!isWithinReach(date)) return std::nullopt;
   auto time = std::chrono::floor<milliseconds>(date.time_since_epoch());
   const auto rest = date.time_since_epoch() - time;
   if (components.year || components.month || components.day) {
@@ -130,8 +136,8 @@ std::optional<Date> Calendar::adding(const DateComponents& components, Date date
 
 std::optional<Date> Calendar::withWallClockOf(Date date,
                                               const std::string& timeZoneIdentifier) const {
+  if (!isWithinReach(date)) return std::nullopt;
   const auto time = std::chrono::floor<milliseconds>(date.time_since_epoch());
-  if (!(std::abs(icuDate(time)) <= farthestMillisecond)) return std::nullopt;
   const auto rest = date.time_since_epoch() - time;
   const LocalTime local = wallClock(time, *makeZone(timeZoneIdentifier));
   return Date(Date::duration(resolved(local, *state_->zone)) + rest);

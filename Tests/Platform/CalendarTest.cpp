@@ -82,7 +82,10 @@ TEST(Calendar, AnswersNothingBeyondWhatItCanCount) {
   EXPECT_EQ(calendar.adding({.year = 2'000'000'000}, now), std::nullopt);
   EXPECT_TRUE(calendar.adding({.year = 280'000}, now));
   EXPECT_EQ(calendar.adding({.year = 1}, Date::max()), std::nullopt);
-  EXPECT_EQ(calendar.withWallClockOf(Date::max(), "UTC"), std::nullopt);
+  for (const Date edge : {Date::min(), Date::max()}) {
+    EXPECT_EQ(calendar.withWallClockOf(edge, "UTC"), std::nullopt);
+    EXPECT_EQ(calendar.adding({}, edge), std::nullopt);
+  }
   EXPECT_EQ(calendar.adding({}, now), now);
 }
 

@@ -4,7 +4,6 @@
 #include <filesystem>
 #include <fstream>
 #include <map>
-#include <regex>
 #include <set>
 
 #include <Platform/Text/StringsTable.h>
@@ -23,6 +22,17 @@ std::string bytesOf(const fs::path& file) {
   return {std::istreambuf_iterator<char>(stream), {}};
 }
 
+// Every prefixed literal is a key; one looked up as an argument of `formatted(` is a format.
+void addKeys(const std::string& code, std::map<std::string, int>& keys) {
+  constexpr std::string_view opening = "\"Varnel_";
+  constexpr std::string_view format = "formatted(localized(";
+  for (auto at = code.find(opening); at != std::string::npos; at = code.find(opening, at + 1)) {
+    const std::string key = code.substr(at + 1, code.find('"', at + 1) - at - 1);
+    const bool isFormat = std::string_view(code).substr(0, at).ends_with(format);
+    keys[key] = isFormat ? 1 : 0;
+  }
+}
+
 // The keys that the code looks up, with the number of texts that each puts into its format.
 std::map<std::string, int> keysOfTheCode() {
   std::map<std::string, int> keys = {{"Never", 0},
@@ -32,13 +42,8 @@ std::map<std::string, int> keysOfTheCode() {
                                      {"Once In Three Months", 0},
                                      {"Once In Six Months", 0},
                                      {"Annually", 0}};
-  const std::regex literal("(formatted\\()?localized(?:String)?\\(\\s*\"(Varnel_\\w+)\"");
-  for (const auto& entry : fs::recursive_directory_iterator(VARNEL_TEST_SOURCES)) {
-    if (entry.path().extension() != ".cpp") continue;
-    const std::string code = bytesOf(entry.path());
-    for (std::sregex_iterator match(code.begin(), code.end(), literal), end; match != end; ++match)
-      keys[(*match)[2]] = (*match)[1].matched ? 1 : 0;
-  }
+  for (const auto& entry : fs::recursive_directory_iterator(VARNEL_TEST_SOURCES))
+    if (entry.path().extension() == ".cpp") addKeys(bytesOf(entry.path()), keys);
   return keys;
 }
 
