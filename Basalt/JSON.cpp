@@ -28,6 +28,14 @@ JSONError JSONError::withMessage(const std::string& message) {
   return {Kind::message, message, {}, {}};
 }
 
+std::string importString(const JSON& json, std::string_view key, std::string_view typeName) {
+  if (!json.is_object()) throw JSONError::typeMismatch(std::string(typeName), "root");
+  const auto value = json.find(key);
+  if (value == json.end()) throw JSONError::missingValue(std::string(typeName), std::string(key));
+  if (!value->is_string()) throw JSONError::typeMismatch(std::string(typeName), std::string(key));
+  return value->get<std::string>();
+}
+
 std::vector<std::string> importStrings(const JSON& json, std::string_view typeName) {
   const auto mismatch = [&] { return JSONError::typeMismatch(std::string(typeName), "root"); };
   if (!json.is_array()) throw mismatch();

@@ -56,6 +56,28 @@ concept JSONExportable = Type::canExportJSON && requires(const Type& value) {
 template <typename Type>
 concept JSONConvertable = JSONImportable<Type> && JSONExportable<Type> && Type::canConvertJSON;
 
+/// A type that can be made from a JSON object: a dictionary from strings to values. Its constructor
+/// throws `JSONError`.
+template <typename Type>
+concept JSONObjectImportable = JSONImportable<Type> && Type::canImportJSONObject;
+
+/// A type that can be written as a JSON object.
+template <typename Type>
+concept JSONObjectExportable = JSONExportable<Type> && requires(const Type& value) {
+  { value.exportJSONObject() } -> std::same_as<JSON>;
+};
+
+/// A type that goes both ways as a JSON object.
+template <typename Type>
+concept JSONObjectConvertable =
+    JSONObjectImportable<Type> && JSONObjectExportable<Type> && JSONConvertable<Type>;
+
+/// The string under a key of a JSON object. Throws the type mismatch, naming `typeName`, when
+/// `json` is no object (at "root") or the value is no string (at the key), and the missing value
+/// when there is nothing under the key.
+[[nodiscard]] VARNEL_API std::string importString(const JSON& json, std::string_view key,
+                                                  std::string_view typeName);
+
 /// The strings of a JSON list. Throws the type mismatch, naming `typeName` and "root", when `json`
 /// is anything but a list of strings.
 [[nodiscard]] VARNEL_API std::vector<std::string> importStrings(const JSON& json,

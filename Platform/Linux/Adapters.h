@@ -6,17 +6,22 @@
 
 namespace Varnel::Platform {
 
+class Clock;
 class DeviceRegistry;
 class DiskArbitration;
 class ExtendedAttributes;
 class MachineIdentity;
 class MainQueue;
+class NotificationServer;
 class ProcessInfo;
 class ProcessLauncher;
 class SoundPlayer;
 class SystemLog;
 class UserDefaults;
+class UserLocale;
+class UserNotificationCenters;
 class VolumeCatalog;
+class WallClockTimer;
 class Workspace;
 
 }  // namespace Varnel::Platform
@@ -40,6 +45,19 @@ class MountTable;
 [[nodiscard]] std::unique_ptr<UserDefaults> makeUserDefaults();
 [[nodiscard]] std::unique_ptr<MainQueue> makeMainQueue();
 [[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog);
+[[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(SystemLog& systemLog);
+[[nodiscard]] std::unique_ptr<WallClockTimer> makeWallClockTimer(SystemLog& systemLog);
+
+/// What notification centers are made with, beyond a server and a timer each.
+struct NotificationPorts {
+  Clock& clock;
+  UserLocale& userLocale;
+  MainQueue& mainQueue;
+  SystemLog& systemLog;
+};
+[[nodiscard]] std::unique_ptr<UserNotificationCenters> makeUserNotificationCenters(
+    const NotificationPorts& ports);
+
 [[nodiscard]] std::unique_ptr<VolumeCatalog> makeVolumeCatalog(std::shared_ptr<MountTable> table);
 [[nodiscard]] std::unique_ptr<Workspace> makeWorkspace();
 

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Ports/AppendFiles.h>
+#include <Platform/Ports/Application.h>
 #include <Platform/Ports/Clock.h>
 #include <Platform/Ports/CookieStorage.h>
 #include <Platform/Ports/DeviceRegistry.h>
@@ -18,9 +19,11 @@
 #include <Platform/Ports/UserAccount.h>
 #include <Platform/Ports/UserDefaults.h>
 #include <Platform/Ports/UserLocale.h>
+#include <Platform/Ports/UserNotificationCenter.h>
 #include <Platform/Ports/VolumeCatalog.h>
 #include <Platform/Ports/Workspace.h>
 
+#include <Platform/Generic/HostedApplication.h>
 #include <Platform/Generic/SQLiteCookieStorage.h>
 #include <Platform/Linux/Adapters.h>
 #include <Platform/Linux/UserFolders.h>
@@ -47,8 +50,11 @@ const Ports& systemPorts() {
   static const auto mountTable = Linux::makeMountTable();
   static Clock& clock = keep(POSIX::makeClock());
   static SystemLog& systemLog = keep(POSIX::makeSystemLog());
+  static MainQueue& mainQueue = keep(Linux::makeMainQueue());
+  static UserLocale& userLocale = keep(POSIX::makeUserLocale());
   static const Ports& ports = *new Ports{
       .appendFiles = keep(POSIX::makeAppendFiles()),
+      .application = *new HostedApplication,
       .clock = clock,
       .cookieStorage = keep(makeCookieStorage(clock)),
       .deviceRegistry = keep(Linux::makeDeviceRegistry()),
@@ -56,7 +62,7 @@ const Ports& systemPorts() {
       .extendedAttributes = keep(Linux::makeExtendedAttributes()),
       .httpClient = keep(POSIX::makeHTTPClient()),
       .machineIdentity = keep(Linux::makeMachineIdentity()),
-      .mainQueue = keep(Linux::makeMainQueue()),
+      .mainQueue = mainQueue,
       .processInfo = keep(Linux::makeProcessInfo()),
       .processLauncher = keep(Linux::makeProcessLauncher()),
       .securityScope = keep(POSIX::makeSecurityScope()),
@@ -65,7 +71,9 @@ const Ports& systemPorts() {
       .systemLog = systemLog,
       .userAccount = keep(POSIX::makeUserAccount()),
       .userDefaults = keep(Linux::makeUserDefaults()),
-      .userLocale = keep(POSIX::makeUserLocale()),
+      .userLocale = userLocale,
+      .userNotificationCenters =
+          keep(Linux::makeUserNotificationCenters({clock, userLocale, mainQueue, systemLog})),
       .volumeCatalog = keep(Linux::makeVolumeCatalog(mountTable)),
       .workspace = keep(Linux::makeWorkspace()),
   };

@@ -29,6 +29,10 @@ fs::path userConfigurationFolder() {
   return folder("XDG_CONFIG_HOME", ".config");
 }
 
+fs::path userStateFolder() {
+  return folder("XDG_STATE_HOME", ".local/state");
+}
+
 std::string applicationFolderName() {
   return fs::path(makeProcessInfo()->executablePath()).filename().string();
 }

@@ -10,6 +10,7 @@ namespace Varnel::Platform::Linux {
 /// absolute paths alone; they need not exist.
 [[nodiscard]] std::filesystem::path userDataFolder();
 [[nodiscard]] std::filesystem::path userConfigurationFolder();
+[[nodiscard]] std::filesystem::path userStateFolder();
 
 /// The name of this application's own folder in them: that of its executable.
 [[nodiscard]] std::string applicationFolderName();

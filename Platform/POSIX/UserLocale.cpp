@@ -1,7 +1,10 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Ports/UserLocale.h>
 
+#include <unicode/timezone.h>
+
 #include <cstdlib>
+#include <memory>
 #include <string_view>
 
 #include <Platform/POSIX/Adapters.h>
@@ -59,6 +62,14 @@ class EnvironmentLocale final : public UserLocale {
   std::string identifier() const override {
     std::string identifier = firstIdentifier({"LC_ALL", "LC_TIME", "LANG"});
     return identifier.empty() ? std::string(fallbackIdentifier) : identifier;
+  }
+
+  std::string timeZoneIdentifier() const override {
+    const std::unique_ptr<icu::TimeZone> zone(icu::TimeZone::detectHostTimeZone());
+    icu::UnicodeString name;
+    std::string identifier;
+    zone->getID(name);
+    return name.toUTF8String(identifier);
   }
 };
 

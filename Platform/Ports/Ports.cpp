@@ -19,6 +19,7 @@ const Ports* choose(const Ports* ports) {
 Ports Ports::withStandardOutput(StandardOutput& output) const {
   return {
       .appendFiles = appendFiles,
+      .application = application,
       .clock = clock,
       .cookieStorage = cookieStorage,
       .deviceRegistry = deviceRegistry,
@@ -36,6 +37,7 @@ Ports Ports::withStandardOutput(StandardOutput& output) const {
       .userAccount = userAccount,
       .userDefaults = userDefaults,
       .userLocale = userLocale,
+      .userNotificationCenters = userNotificationCenters,
       .volumeCatalog = volumeCatalog,
       .workspace = workspace,
   };

@@ -6,6 +6,7 @@
 namespace Varnel::Platform {
 
 class AppendFiles;
+class Application;
 class Clock;
 class CookieStorage;
 class DeviceRegistry;
@@ -23,6 +24,7 @@ class SystemLog;
 class UserAccount;
 class UserDefaults;
 class UserLocale;
+class UserNotificationCenters;
 class VolumeCatalog;
 class Workspace;
 
@@ -34,6 +36,7 @@ class Workspace;
 ///     if (!installProcessPorts({.appendFiles = system.appendFiles, .clock = clock, …})) return 1;
 struct Ports {
   AppendFiles& appendFiles;
+  Application& application;
   Clock& clock;
   CookieStorage& cookieStorage;
   DeviceRegistry& deviceRegistry;
@@ -51,6 +54,7 @@ struct Ports {
   UserAccount& userAccount;
   UserDefaults& userDefaults;
   UserLocale& userLocale;
+  UserNotificationCenters& userNotificationCenters;
   VolumeCatalog& volumeCatalog;
   Workspace& workspace;
 

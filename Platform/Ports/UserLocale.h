@@ -18,6 +18,9 @@ class VARNEL_API UserLocale {
 
   /// The locale of dates and numbers, as an ICU identifier ("de_AT").
   [[nodiscard]] virtual std::string identifier() const = 0;
+
+  /// The time zone where the user is now, by its name in the time zone database ("Europe/Vienna").
+  [[nodiscard]] virtual std::string timeZoneIdentifier() const = 0;
 };
 
 }  // namespace Varnel::Platform

@@ -15,6 +15,7 @@
 #include <orvane/MenuCommand.h>
 #include <orvane/OriginCommand.h>
 #include <orvane/PathCommand.h>
+#include <orvane/RemindCommands.h>
 #include <orvane/ScanAnalytics.h>
 #include <orvane/ScanCommand.h>
 #include <orvane/SoundCommand.h>
@@ -139,6 +140,39 @@ void protectFolders(std::vector<std::string>& arguments) {
   if (mark != arguments.end()) arguments.erase(mark);
 }
 
+Varnel::SchedulePeriodOption periodNamed(const std::string& name) {
+  for (const auto period : Varnel::SchedulePeriodOption::optionsAvailableToUser())
+    if (period.accessibilityIdentifier() == name) return period;
+  throw CLI::ValidationError("PERIOD", "there is no period \"" + name + "\"");
+}
+
+void addRemind(CLI::App& app, Invocation& invocation) {
+  CLI::App& remind = *app.add_subcommand("remind", "Remind the user to clean up");
+  remind.require_subcommand(1);
+  auto [everyOptions, every] = addCommand<RemindEveryCommand>(
+      remind, invocation, "every", "Choose how often to remind the user");
+  everyOptions
+      ->add_option_function<std::string>(
+          "period",
+          [chosen = every](const std::string& name) { chosen->period = periodNamed(name); },
+          "never, weekly, onceInTwoWeeks, monthly, onceInThreeMonths, onceInSixMonths or annually")
+      ->type_name("PERIOD")
+      ->required();
+  addCommand<RemindStatusCommand>(remind, invocation, "status",
+                                  "Tell the period and list the notifications");
+  auto [tomorrowOptions, tomorrow] = addCommand<RemindTomorrowCommand>(
+      remind, invocation, "tomorrow", "Remind the user tomorrow of what a scan has found");
+  tomorrowOptions->add_option("--found", tomorrow->foundSize, "What the scan found, in bytes")
+      ->type_name("BYTES")
+      ->required();
+  tomorrowOptions
+      ->add_option("--selected", tomorrow->selectedSize, "What the user had selected, in bytes")
+      ->type_name("BYTES")
+      ->required();
+  addCommand<RemindListenCommand>(remind, invocation, "listen",
+                                  "Deliver reminders and show what happens to them");
+}
+
 void addOrigin(CLI::App& app, Invocation& invocation) {
   auto [options, command] = addCommand<OriginCommand>(
       app, invocation, "origin", "Tell where this program, or a file, was downloaded from");
@@ -178,6 +212,7 @@ std::variant<Invocation, Information, UsageError> parseCommandLine(int count,
   addMenu(app, invocation);
   addOrigin(app, invocation);
   addPath(app, invocation);
+  addRemind(app, invocation);
   addSound(app, invocation);
   std::vector<std::string> words(arguments + std::min(count, 1), arguments + count);
   protectFolders(words);

@@ -77,8 +77,8 @@ class VARNEL_API Globals final {
   /// The bundle identifiers of the other channels' builds on this machine. Reads files.
   [[nodiscard]] static std::vector<std::string> findOtherInstalledTargetBundleIDs();
 
- private:
-  static const ProcessFacts& facts();
+  /// The facts themselves, for code that is given its facts.
+  [[nodiscard]] static const ProcessFacts& facts();
 };
 
 }  // namespace Varnel

@@ -1,0 +1,20 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <atomic>
+
+#include <Platform/Ports/Application.h>
+
+namespace Varnel::Platform {
+
+/// An application of which only its host knows whether it is in front. Any thread.
+class HostedApplication final : public Application {
+ public:
+  [[nodiscard]] bool isActive() const override { return isActive_; }
+  void setActive(bool isActive) override { isActive_ = isActive; }
+
+ private:
+  std::atomic<bool> isActive_ = false;
+};
+
+}  // namespace Varnel::Platform

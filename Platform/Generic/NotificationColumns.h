@@ -1,0 +1,22 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <Platform/Generic/SQLiteStatement.h>
+#include <Platform/Values/UserNotification.h>
+
+namespace Varnel::Platform {
+
+/// How many columns hold the content of a notification, whatever the table.
+inline constexpr int notificationColumnCount = 12;
+
+/// Their names, for statements: from the identifier to the seconds of the interval.
+inline constexpr const char* notificationColumns =
+    "identifier, title, text, action, other, date, years, months, days, hours, minutes, seconds";
+
+/// Gives the parameters from `first` on the content.
+void bindNotification(SQLiteStatement& statement, int first, const UserNotification& notification);
+
+/// The content in the columns from `first` on. Whatever they hold, it is some notification.
+[[nodiscard]] UserNotification readNotification(SQLiteStatement& row, int first);
+
+}  // namespace Varnel::Platform

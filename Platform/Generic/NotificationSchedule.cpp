@@ -1,0 +1,82 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Generic/NotificationSchedule.h>
+
+#include <limits>
+
+#include <Platform/Text/Calendar.h>
+
+namespace Varnel::Platform {
+namespace {
+
+// Processes in different time zones see one date this far apart at the most.
+constexpr std::chrono::days sameMoment(2);
+
+// The dates of one schedule by number, from the original one, 0. They ascend; a date beyond the
+// calendar comes after all others.
+class Dates final {
+ public:
+  Dates(const NotificationSchedule& schedule, const Calendar& calendar)
+      : calendar_(calendar), interval_(schedule.notification.deliveryRepeatInterval) {
+    origin_ = schedule.notification.deliveryDate.value_or(Date());
+    if (schedule.timeZone != calendar.timeZoneIdentifier())
+      origin_ = calendar.withWallClockOf(origin_, schedule.timeZone).value_or(origin_);
+    const auto second = interval_ ? calendar.adding(*interval_, origin_) : std::nullopt;
+    repeats_ = second && *second > origin_;
+  }
+
+  bool repeats() const { return repeats_; }
+
+  std::optional<Date> at(std::int64_t number) const {
+    if (number == 0) return origin_;
+    return repeats_ ? calendar_.adding(*interval_, origin_, number) : std::nullopt;
+  }
+
+  bool isAfter(std::int64_t number, Date now) const {
+    const auto date = at(number);
+    return !date || *date > now;
+  }
+
+  // The first number from `start` whose date is after `now`.
+  std::int64_t firstAfter(Date now, std::int64_t start) const {
+    constexpr auto farthest = std::numeric_limits<std::int64_t>::max() / 4;
+    std::int64_t step = 1;
+    while (start + step < farthest && !isAfter(start + step, now)) step *= 2;
+    std::int64_t low = start;
+    for (std::int64_t high = start + step; low < high;) {
+      const std::int64_t middle = low + (high - low) / 2;
+      if (isAfter(middle, now))
+        high = middle;
+      else
+        low = middle + 1;
+    }
+    return low;
+  }
+
+ private:
+  const Calendar& calendar_;
+  const std::optional<DateComponents> interval_;
+  Date origin_;
+  bool repeats_ = false;
+};
+
+}  // namespace
+
+std::optional<Date> nextDate(const NotificationSchedule& schedule, const Calendar& calendar) {
+  return Dates(schedule, calendar).at(schedule.deliveryCount);
+}
+
+ScheduleDecision decide(const NotificationSchedule& schedule, Date now, const Calendar& calendar) {
+  const Dates dates(schedule, calendar);
+  const std::int64_t count = schedule.deliveryCount;
+  if (!dates.isAfter(count, now)) {
+    if (!dates.repeats()) return {.isDue = true, .deliveryCount = std::nullopt};
+    const std::int64_t next = dates.firstAfter(now, count + 1);
+    return {.isDue = true, .deliveryCount = dates.at(next) ? std::optional(next) : std::nullopt};
+  }
+  const auto beforeLast = count > 0 && dates.repeats() ? dates.at(count - 2) : std::nullopt;
+  if (beforeLast && *beforeLast - sameMoment > now)
+    return {.deliveryCount = dates.firstAfter(now, 0)};
+  return {.deliveryCount = count};
+}
+
+}  // namespace Varnel::Platform

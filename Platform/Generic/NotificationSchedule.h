@@ -1,0 +1,48 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+
+#include <Platform/Values/UserNotification.h>
+
+namespace Varnel::Platform {
+
+class Calendar;
+
+/// A scheduled notification and how many of its deliveries have been made. Its `deliveryDate` is
+/// the original one, from which every repetition is counted. A plain value.
+struct NotificationSchedule final {
+  std::string key;  ///< Names it in the store.
+  UserNotification notification;
+  /// Where the user was when it was scheduled: wherever the user goes, it comes at the same time
+  /// by the clocks there.
+  std::string timeZone;
+  std::int64_t deliveryCount = 0;
+
+  bool operator==(const NotificationSchedule&) const = default;
+};
+
+/// What is to be done about a schedule now.
+struct ScheduleDecision final {
+  bool isDue = false;
+  /// The schedule's `deliveryCount` from now on; absent when no delivery is left.
+  std::optional<std::int64_t> deliveryCount;
+
+  bool operator==(const ScheduleDecision&) const = default;
+};
+
+/// The date of the next delivery, by the user's present calendar; absent when the calendar does not
+/// reach it: then it never comes.
+[[nodiscard]] std::optional<Date> nextDate(const NotificationSchedule& schedule,
+                                           const Calendar& calendar);
+
+/// Whether the schedule is due, and how it goes on. Periods that passed unseen count as one.
+///
+/// A clock that is set back repeats nothing that has been delivered. Only when it is set back by
+/// more than a period and some days was it wrong before, and the schedule goes on from the present.
+[[nodiscard]] ScheduleDecision decide(const NotificationSchedule& schedule, Date now,
+                                      const Calendar& calendar);
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,142 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Generic/NotificationStoreFile.h>
+
+#include <sqlite3.h>
+
+#include <chrono>
+#include <fstream>
+#include <utility>
+
+#include <Platform/Ports/SystemLog.h>
+
+namespace Varnel::Platform {
+namespace {
+
+namespace fs = std::filesystem;
+
+constexpr std::chrono::milliseconds patience{2000};
+constexpr int resultCodeMask = 0xff;
+
+bool isDamage(const PlatformError& error) {
+  const long code = error.code() & resultCodeMask;
+  return code == SQLITE_CORRUPT || code == SQLITE_NOTADB;
+}
+
+// Nobody else may read what the user is told, nor files that stand beside it for a while.
+void makeForUserAlone(const fs::path& file) {
+  std::error_code ignored;
+  if (!fs::exists(file.parent_path(), ignored)) {
+    fs::create_directories(file.parent_path(), ignored);
+    fs::permissions(file.parent_path(), fs::perms::owner_all, ignored);
+  }
+  if (!fs::exists(file, ignored)) std::ofstream(file, std::ios::app).flush();
+  fs::permissions(file, fs::perms::owner_read | fs::perms::owner_write, ignored);
+}
+
+// What is wrong with a file: it is no database, has pages that do not fit or tables that are not
+// those of the schema.
+std::optional<PlatformError> check(SQLiteDatabase& database, const std::string& schema) {
+  const auto damaged = [](const std::string& message) {
+    return PlatformError("SQLite", SQLITE_CORRUPT,
+                         {{std::string(localizedDescriptionKey), message}});
+  };
+  // Besides damage proper, the library's plain error says that it does not understand the file.
+  const auto judged = [&](const PlatformError& error) {
+    return error.code() == SQLITE_ERROR ? damaged(error.localizedDescription()) : error;
+  };
+  auto verdict = database.prepare("PRAGMA quick_check(1)");
+  if (!verdict) return judged(verdict.error());
+  const auto step = verdict->step();
+  if (!step) return judged(step.error());
+  if (verdict->text(0) != "ok")
+    return damaged(std::string(verdict->text(0).value_or("no verdict")));
+  verdict->reset();
+  if (const auto error = database.execute(schema)) return judged(*error);
+  return std::nullopt;
+}
+
+std::optional<PlatformError> transaction(SQLiteDatabase& database,
+                                         const NotificationStoreFile::Work& work) {
+  if (auto error = database.execute("BEGIN IMMEDIATE")) return error;
+  auto error = work(database);
+  if (!error) error = database.execute("COMMIT");
+  // It fails where the failure has ended the transaction already.
+  if (error) static_cast<void>(database.execute("ROLLBACK"));
+  return error;
+}
+
+}  // namespace
+
+NotificationStoreFile::NotificationStoreFile(fs::path file, std::string schema,
+                                             SystemLog& systemLog)
+    : file_(std::move(file)), schema_(std::move(schema)), systemLog_(systemLog) {}
+
+bool NotificationStoreFile::read(const Work& work) {
+  ensureOpen();
+  auto error = work(*database_);
+  if (error && isDamage(*error)) {
+    setAside();
+    error = work(*database_);
+  }
+  if (error) report("Cannot read notifications", *error);
+  return !error;
+}
+
+bool NotificationStoreFile::change(const Work& work) {
+  ensureOpen();
+  auto error = transaction(*database_, work);
+  if (error && isDamage(*error)) {
+    setAside();
+    error = transaction(*database_, work);
+  }
+  if (error) report("Cannot keep notifications", *error);
+  return !error;
+}
+
+std::optional<PlatformError> NotificationStoreFile::open() {
+  database_.reset();
+  makeForUserAlone(file_);
+  auto opened = SQLiteDatabase::open(file_.string(), SQLiteDatabase::Access::readWrite);
+  if (!opened) return opened.error();
+  opened->setBusyTimeout(patience);
+  if (auto error = check(*opened, schema_)) return error;
+  database_ = std::move(*opened);
+  return std::nullopt;
+}
+
+void NotificationStoreFile::ensureOpen() {
+  if (database_) return;
+  const auto error = open();
+  if (!error) return;
+  if (isDamage(*error))
+    setAside();
+  else
+    useMemory(*error);
+}
+
+void NotificationStoreFile::setAside() {
+  // Another process may have done so meanwhile: then the file is sound again.
+  auto error = open();
+  if (!error) return;
+  fs::path aside = file_;
+  aside += ".damaged";
+  report("Set aside the damaged store of notifications as " + aside.string(), *error);
+  std::error_code ignored;
+  fs::rename(file_, aside, ignored);
+  fs::path journal = file_;
+  fs::remove(journal += "-journal", ignored);
+  error = open();
+  if (error) useMemory(*error);
+}
+
+void NotificationStoreFile::useMemory(const PlatformError& reason) {
+  report("Notifications are kept in memory alone", reason);
+  database_ = std::move(*SQLiteDatabase::open(":memory:"));
+  static_cast<void>(database_->execute(schema_));
+}
+
+void NotificationStoreFile::report(const std::string& what, const PlatformError& error) const {
+  systemLog_.write(what + ": " + error.localizedDescription());
+}
+
+}  // namespace Varnel::Platform

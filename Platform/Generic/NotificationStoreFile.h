@@ -1,0 +1,45 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <filesystem>
+#include <functional>
+#include <optional>
+#include <string>
+
+#include <Platform/Generic/SQLiteDatabase.h>
+
+namespace Varnel::Platform {
+
+class SystemLog;
+
+/// The database file of a notification store, for its user alone, opened on first use.
+///
+/// A damaged file is set aside (with ".damaged" behind its name) and a fresh one made; where no
+/// file can be had at all, memory serves as long as the object lives. Both are told to the system's
+/// log. One thread at a time; several processes may share the file.
+class NotificationStoreFile final {
+ public:
+  using Work = std::function<std::optional<PlatformError>(SQLiteDatabase&)>;
+
+  /// The schema makes the tables that are missing and fails where they are not as they must be.
+  NotificationStoreFile(std::filesystem::path file, std::string schema, SystemLog& systemLog);
+
+  /// Does the work; true if it succeeded.
+  bool read(const Work& work);
+  /// Does the work as a whole or not at all, and alone among all processes.
+  bool change(const Work& work);
+
+ private:
+  [[nodiscard]] std::optional<PlatformError> open();
+  void ensureOpen();
+  void setAside();
+  void useMemory(const PlatformError& reason);
+  void report(const std::string& what, const PlatformError& error) const;
+
+  const std::filesystem::path file_;
+  const std::string schema_;
+  SystemLog& systemLog_;
+  std::optional<SQLiteDatabase> database_;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,68 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <filesystem>
+#include <memory>
+#include <vector>
+
+#include <Platform/Api.h>
+#include <Platform/Ports/UserNotificationCenter.h>
+
+namespace Varnel::Platform {
+
+class Clock;
+class MainQueue;
+class NotificationServer;
+class NotificationStore;
+class SystemLog;
+class UserLocale;
+class WallClockTimer;
+struct DeliveredNotification;
+
+/// A notification center for systems that can show banners but keep no schedules.
+///
+/// Schedules and the delivered list live in a store that outlasts the process and that all
+/// processes of the product share. Main thread only.
+class VARNEL_API ScheduledNotificationCenter final : public UserNotificationCenter {
+ public:
+  /// All outlive the center, which is the only user of server and timer.
+  struct Ports {
+    Clock& clock;
+    UserLocale& userLocale;
+    MainQueue& mainQueue;
+    SystemLog& systemLog;
+    NotificationServer& notificationServer;
+    WallClockTimer& timer;
+  };
+
+  /// The store's file is made, with its folder, on first use.
+  ScheduledNotificationCenter(Ports ports, std::filesystem::path storeFile);
+  ~ScheduledNotificationCenter() override;
+  ScheduledNotificationCenter(const ScheduledNotificationCenter&) = delete;
+  ScheduledNotificationCenter& operator=(const ScheduledNotificationCenter&) = delete;
+
+  void setDelegate(std::weak_ptr<UserNotificationCenterDelegate> delegate) override;
+  void scheduleNotification(const UserNotification& notification) override;
+  [[nodiscard]] std::vector<UserNotification> scheduledNotifications() override;
+  void removeScheduledNotification(const UserNotification& notification) override;
+  void deliverNotification(const UserNotification& notification) override;
+  [[nodiscard]] std::vector<UserNotification> deliveredNotifications() override;
+  void removeDeliveredNotification(const UserNotification& notification) override;
+
+  /// To be called when something else than this center may have changed what is due and when: the
+  /// user's time zone, or another process the store.
+  void recheck();
+
+ private:
+  class Banners;
+
+  void deliver(const DeliveredNotification& delivered);
+  void awaitNext();
+
+  const Ports ports_;
+  const std::unique_ptr<NotificationStore> store_;
+  const std::shared_ptr<Banners> banners_;
+  std::weak_ptr<UserNotificationCenterDelegate> delegate_;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,22 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <Platform/Api.h>
+
+namespace Varnel::Platform {
+
+/// The running application as the user sees it. Any thread.
+class VARNEL_API Application {
+ public:
+  virtual ~Application() = default;
+
+  /// Whether the application is in front. Where the system does not tell, it is not until the host
+  /// says so.
+  [[nodiscard]] virtual bool isActive() const = 0;
+
+  /// What a host calls when its windows come to the front or leave it. Has no effect where the
+  /// system tells.
+  virtual void setActive(bool isActive) = 0;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,54 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <optional>
+#include <string>
+
+#include <Platform/Api.h>
+
+namespace Varnel::Platform {
+
+/// What a banner shows: plain UTF-8 texts. A button without a title is left out.
+struct Banner final {
+  std::string title;
+  std::string text;
+  std::string actionTitle;
+  std::string dismissTitle;
+
+  bool operator==(const Banner&) const = default;
+};
+
+/// The desktop's service that shows banners. A banner is known by the token that its owner gave it,
+/// and by the server's reference, under which later runs of the application know it too.
+///
+/// Main thread only; no operation waits for the server. A server that is missing, comes late or
+/// restarts costs the banners and nothing else.
+class VARNEL_API NotificationServer {
+ public:
+  /// Told on the main thread, and never from within an operation, what becomes of banners.
+  class Observer {
+   public:
+    virtual ~Observer() = default;
+
+    /// The banner is shown and has this reference.
+    virtual void bannerShown(const std::string& token, const std::string& reference) = 0;
+    /// The user clicked the banner or its action button; the banner is gone. Comes once a banner.
+    virtual void bannerActivated(const std::string& token) = 0;
+    /// The user closed the banner. One that only expires is not told.
+    virtual void bannerDismissed(const std::string& token) = 0;
+  };
+
+  virtual ~NotificationServer() = default;
+
+  virtual void setObserver(std::weak_ptr<Observer> observer) = 0;
+
+  /// Shows a banner, in the place of the one with the same token or of the one with this reference.
+  virtual void show(const std::string& token, const Banner& banner,
+                    const std::optional<std::string>& replacedReference) = 0;
+
+  /// Takes the banner away that has this token or, if that is of an earlier run, this reference.
+  virtual void close(const std::string& token, const std::optional<std::string>& reference) = 0;
+};
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,27 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <functional>
+
+#include <Platform/Api.h>
+#include <Platform/Values/Date.h>
+
+namespace Varnel::Platform {
+
+/// Calls back when the wall clock reaches a date, also after the machine has slept.
+///
+/// Main thread only. The handler must not throw.
+class VARNEL_API WallClockTimer {
+ public:
+  virtual ~WallClockTimer() = default;
+
+  /// What to call, on the main thread and never within `arm`: at the date or soon after it, and
+  /// whenever the clock was set while the timer was armed. The timer is disarmed then.
+  virtual void setHandler(std::function<void()> handler) = 0;
+
+  /// Waits for this date instead of any other. One that is past has been reached.
+  virtual void arm(Date date) = 0;
+  virtual void disarm() = 0;
+};
+
+}  // namespace Varnel::Platform

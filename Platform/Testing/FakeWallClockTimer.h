@@ -1,0 +1,56 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <algorithm>
+#include <functional>
+#include <optional>
+#include <utility>
+
+#include <Platform/Ports/WallClockTimer.h>
+#include <Platform/Testing/SimulatedClock.h>
+
+namespace Varnel::Platform::Testing {
+
+/// A timer on a simulated clock. The test moves the clock through it.
+///
+///     timer.advanceTo(midnight);    // calls back at each date on the way, as if nobody slept
+///     timer.setClock(later);        // sets the clock: calls back once, when it has jumped
+///
+/// One thread.
+class FakeWallClockTimer final : public WallClockTimer {
+ public:
+  explicit FakeWallClockTimer(SimulatedClock& clock) : clock_(clock) {}
+
+  void setHandler(std::function<void()> handler) override { handler_ = std::move(handler); }
+  void arm(Date date) override { armed_ = date; }
+  void disarm() override { armed_.reset(); }
+
+  /// The date that the timer waits for.
+  [[nodiscard]] const std::optional<Date>& armedDate() const { return armed_; }
+
+  void advanceTo(Date date) {
+    while (armed_ && *armed_ <= date) {
+      clock_.set(std::max(clock_.now(), *armed_));
+      fire();
+    }
+    clock_.set(date);
+  }
+
+  /// What setting the clock does, and sleep.
+  void setClock(Date date) {
+    clock_.set(date);
+    if (armed_) fire();
+  }
+
+ private:
+  void fire() {
+    armed_.reset();
+    if (handler_) handler_();
+  }
+
+  SimulatedClock& clock_;
+  std::function<void()> handler_;
+  std::optional<Date> armed_;
+};
+
+}  // namespace Varnel::Platform::Testing

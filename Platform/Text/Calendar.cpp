@@ -1,0 +1,153 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Text/Calendar.h>
+
+#include <unicode/basictz.h>
+#include <unicode/calendar.h>
+
+#include <cmath>
+#include <limits>
+
+#include <Platform/Ports/UserLocale.h>
+
+namespace Varnel::Platform {
+namespace {
+
+using std::chrono::milliseconds;
+using LocalTime = std::chrono::local_time<milliseconds>;
+
+// The furthest that a calculation may lead; `Date` reaches 292,000 years.
+constexpr double farthestMillisecond = 9.0e15;
+
+bool isWithinReach(Date date) {
+  constexpr Date::duration farthest = milliseconds(static_cast<std::int64_t>(farthestMillisecond));
+  return date.time_since_epoch() <= farthest && date.time_since_epoch() >= -farthest;
+}
+
+UDate icuDate(milliseconds time) {
+  return static_cast<UDate>(time.count());
+}
+
+std::unique_ptr<icu::BasicTimeZone> makeZone(const std::string& identifier) {
+  // Zones by name are always basic ones.
+  return std::unique_ptr<icu::BasicTimeZone>(static_cast<icu::BasicTimeZone*>(
+      icu::TimeZone::createTimeZone(icu::UnicodeString::fromUTF8(identifier))));
+}
+
+LocalTime wallClock(milliseconds time, const icu::BasicTimeZone& zone) {
+  std::int32_t raw = 0;
+  std::int32_t saving = 0;
+  UErrorCode status = U_ZERO_ERROR;
+  zone.getOffset(icuDate(time), false, raw, saving, status);
+  return LocalTime(time + milliseconds(raw) + milliseconds(saving));
+}
+
+milliseconds resolved(LocalTime local, const icu::BasicTimeZone& zone) {
+  std::int32_t raw = 0;
+  std::int32_t saving = 0;
+  UErrorCode status = U_ZERO_ERROR;
+  // The offset before the change: it leads forward out of a gap and to the first of two hours.
+  zone.getOffsetFromLocal(icuDate(local.time_since_epoch()), UCAL_TZ_LOCAL_FORMER,
+                          UCAL_TZ_LOCAL_FORMER, raw, saving, status);
+  return local.time_since_epoch() - milliseconds(raw) - milliseconds(saving);
+}
+
+// A product that does not overflow and that the calendar can count with.
+std::optional<std::int32_t> product(std::int64_t amount, std::int64_t count) {
+  std::int64_t result = 0;
+  if (__builtin_mul_overflow(amount, count, &result)) return std::nullopt;
+  if (result > std::numeric_limits<std::int32_t>::max() ||
+      result < std::numeric_limits<std::int32_t>::min())
+    return std::nullopt;
+  return static_cast<std::int32_t>(result);
+}
+
+}  // namespace
+
+struct Calendar::State {
+  std::string zoneIdentifier;
+  std::unique_ptr<icu::BasicTimeZone> zone;
+  // Counts on wall clocks, and so in a zone without changes. Cloned for each calculation.
+  std::unique_ptr<icu::Calendar> prototype;
+
+  std::optional<LocalTime> addingDays(const DateComponents& components, LocalTime local,
+                                      std::int64_t count) const {
+    const std::unique_ptr<icu::Calendar> calendar(prototype ? prototype->clone() : nullptr);
+    if (!calendar) return std::nullopt;
+    UErrorCode status = U_ZERO_ERROR;
+    calendar->setTime(icuDate(local.time_since_epoch()), status);
+    const auto add = [&](UCalendarDateFields field, const std::optional<std::int64_t>& amount) {
+      if (!amount) return true;
+      const auto total = product(*amount, count);
+      if (total) calendar->add(field, *total, status);
+      return total.has_value();
+    };
+    if (!add(UCAL_YEAR, components.year) || !add(UCAL_MONTH, components.month) ||
+        !add(UCAL_DATE, components.day))
+      return std::nullopt;
+    const UDate sum = calendar->getTime(status);
+    if (U_FAILURE(status) || !(std::abs(sum) <= farthestMillisecond)) return std::nullopt;
+    return LocalTime(milliseconds(static_cast<std::int64_t>(sum)));
+  }
+};
+
+Calendar::Calendar(const std::string& localeIdentifier, const std::string& timeZoneIdentifier)
+    : state_(std::make_unique<State>()) {
+  state_->zoneIdentifier = timeZoneIdentifier;
+  state_->zone = makeZone(timeZoneIdentifier);
+  UErrorCode status = U_ZERO_ERROR;
+  state_->prototype.reset(icu::Calendar::createInstance(
+      *icu::TimeZone::getGMT(), icu::Locale(localeIdentifier.c_str()), status));
+  if (U_FAILURE(status)) state_->prototype.reset();
+}
+
+Calendar::Calendar(const UserLocale& userLocale)
+    : Calendar(userLocale.identifier(), userLocale.timeZoneIdentifier()) {}
+
+Calendar::~Calendar() = default;
+Calendar::Calendar(Calendar&&) noexcept = default;
+Calendar& Calendar::operator=(Calendar&&) noexcept = default;
+
+const std::string& Calendar::timeZoneIdentifier() const {
+  return state_->zoneIdentifier;
+}
+
+std::optional<Date> Calendar::adding(const DateComponents& components, Date date,
+                                     std::int64_t count) const {
+  if (!isWithinReach(date)) return std::nullopt;
+  auto time = std::chrono::floor<milliseconds>(date.time_since_epoch());
+  const auto rest = date.time_since_epoch() - time;
+  if (components.year || components.month || components.day) {
+    const auto sum = state_->addingDays(components, wallClock(time, *state_->zone), count);
+    if (!sum) return std::nullopt;
+    time = resolved(*sum, *state_->zone);
+  }
+  const auto add = [&](const std::optional<std::int64_t>& amount, auto unit) {
+    const auto total = product(amount.value_or(0), count);
+    if (total) time += *total * milliseconds(unit);
+    return total.has_value();
+  };
+  if (!add(components.hour, std::chrono::hours(1)) ||
+      !add(components.minute, std::chrono::minutes(1)) ||
+      !add(components.second, std::chrono::seconds(1)))
+    return std::nullopt;
+  if (!(std::abs(icuDate(time)) <= farthestMillisecond)) return std::nullopt;
+  return Date(Date::duration(time) + rest);
+}
+
+std::optional<Date> Calendar::withWallClockOf(Date date,
+                                              const std::string& timeZoneIdentifier) const {
+  if (!isWithinReach(date)) return std::nullopt;
+  const auto time = std::chrono::floor<milliseconds>(date.time_since_epoch());
+  const auto rest = date.time_since_epoch() - time;
+  const LocalTime local = wallClock(time, *makeZone(timeZoneIdentifier));
+  return Date(Date::duration(resolved(local, *state_->zone)) + rest);
+}
+
+std::optional<int> Calendar::weekdayCount() const {
+  if (!state_->prototype) return std::nullopt;
+  const int count = state_->prototype->getMaximum(UCAL_DAY_OF_WEEK) -
+                    state_->prototype->getMinimum(UCAL_DAY_OF_WEEK) + 1;
+  return count > 0 ? std::optional(count) : std::nullopt;
+}
+
+}  // namespace Varnel::Platform

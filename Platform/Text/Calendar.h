@@ -1,0 +1,57 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include <Platform/Api.h>
+#include <Platform/Values/Date.h>
+#include <Platform/Values/DateComponents.h>
+
+namespace Varnel::Platform {
+
+class UserLocale;
+
+/// A calendar as people of one region use it, in one time zone.
+///
+///     const Calendar calendar("de_AT", "Europe/Vienna");
+///     calendar.adding({.month = 1}, date);     // the same wall-clock time a month later
+///     calendar.adding({.month = 1}, date, 3);  // three months: the end of January gives that of
+///     April
+///
+/// Years, months and days keep the wall-clock time: one that the zone skips moves forward by what
+/// was skipped, and of one that comes twice the first is meant. Hours and smaller are lengths of
+/// time. A month that is too short gives its last day. Immutable; any thread.
+class VARNEL_API Calendar final {
+ public:
+  /// The locale is an ICU identifier; it names a calendar ("@calendar=hebrew") or has its region's.
+  /// An unknown time zone counts as UTC.
+  Calendar(const std::string& localeIdentifier, const std::string& timeZoneIdentifier);
+  /// The user's calendar as of now.
+  explicit Calendar(const UserLocale& userLocale);
+  ~Calendar();
+  Calendar(Calendar&&) noexcept;
+  Calendar& operator=(Calendar&&) noexcept;
+
+  [[nodiscard]] const std::string& timeZoneIdentifier() const;
+
+  /// The date plus `count` times the components, taken in one step. Absent when the calendar or
+  /// `Date` does not reach that far.
+  [[nodiscard]] std::optional<Date> adding(const DateComponents& components, Date date,
+                                           std::int64_t count = 1) const;
+
+  /// The moment at which this calendar's clocks show what those of another zone show at `date`.
+  [[nodiscard]] std::optional<Date> withWallClockOf(Date date,
+                                                    const std::string& timeZoneIdentifier) const;
+
+  /// How many days a week has; absent when the calendar knows no weeks.
+  [[nodiscard]] std::optional<int> weekdayCount() const;
+
+ private:
+  struct State;
+  std::unique_ptr<State> state_;
+};
+
+}  // namespace Varnel::Platform

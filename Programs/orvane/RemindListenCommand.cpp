@@ -1,0 +1,57 @@
+// SPDX-License-Identifier: MIT
+#include <memory>
+
+#include <Platform/Ports/MainQueue.h>
+#include <Platform/Ports/Ports.h>
+#include <Platform/Ports/UserNotificationCenter.h>
+#include <Tallyhouse/AnalyticsTracker.h>
+#include <Varnel/Reminders/NextDayCleanupReminderInfo.h>
+#include <Varnel/Reminders/SchedulerService.h>
+#include <Varnel/Reminders/UserNotificationRouter.h>
+#include <orvane/Console.h>
+#include <orvane/RemindCommands.h>
+#include <orvane/Reminders.h>
+
+namespace Orvane {
+namespace {
+
+using Router = Varnel::UserNotificationRouter;
+
+const char* nameOf(Router::EventKind kind) {
+  switch (kind) {
+    case Router::EventKind::didLaunchWith:
+      return "launched with";
+    case Router::EventKind::didDeliver:
+      return "delivered";
+    case Router::EventKind::didActivate:
+      return "clicked";
+  }
+  return "?";
+}
+
+}  // namespace
+
+int RemindListenCommand::run(Console& console) const {
+  Router router;
+  // It only listens: assigning it the stored period would plan the reminder anew.
+  const Varnel::SchedulerService service(std::make_shared<Tallyhouse::AnalyticsTracker>(), router);
+  const auto& nextDay = Varnel::NextDayCleanupReminderInfo::userNotificationIdentifier();
+  bool isWritten = true;
+  auto& mainQueue = Varnel::Platform::processPorts().mainQueue;
+  const auto tell = [&](const Varnel::Platform::UserNotification& notification,
+                        Router::EventKind kind) {
+    isWritten = isWritten &&
+                console.writeResult(nameOf(kind) + std::string("  ") + lineOf(notification) + "\n");
+    if (!isWritten) mainQueue.stop();
+  };
+  router.register_("SchedulerNotification", tell);
+  router.register_(nextDay, tell);
+  router.register_(nextDay, [&](const auto& notification, Router::EventKind kind) {
+    if (kind != Router::EventKind::didDeliver)
+      router.userNotificationCenter().removeDeliveredNotification(notification);
+  });
+  mainQueue.run();
+  return isWritten ? 0 : 1;
+}
+
+}  // namespace Orvane

@@ -1,0 +1,56 @@
+// SPDX-License-Identifier: MIT
+#include <orvane/Reminders.h>
+
+#include <nlohmann/json.hpp>
+#include <optional>
+
+#include <Platform/Ports/Ports.h>
+#include <Platform/Ports/UserDefaults.h>
+#include <Platform/Ports/UserNotificationCenter.h>
+#include <Platform/Text/DateFormatter.h>
+#include <Varnel/Reminders/SchedulePeriodOptionBox.h>
+#include <orvane/VisibleText.h>
+
+namespace Orvane {
+namespace {
+
+using Varnel::SchedulePeriodOption;
+using Varnel::Platform::UserNotification;
+
+constexpr const char* periodKey = "schedulePeriod";
+
+std::string textOf(const std::optional<Varnel::Platform::Date>& date) {
+  static const Varnel::Platform::DateFormatter formatter("yyyy-MM-dd HH:mm", "en_US");
+  return date ? formatter.string(*date) : "no date";
+}
+
+}  // namespace
+
+SchedulePeriodOption storedPeriod() {
+  const auto text = Varnel::Platform::processPorts().userDefaults.text(periodKey);
+  const auto json = nlohmann::json::parse(text.value_or(""), nullptr, false);
+  // The box takes whatever it cannot read for never.
+  return Varnel::SchedulePeriodOptionBox(json).boxed();
+}
+
+void storePeriod(SchedulePeriodOption period) {
+  Varnel::Platform::processPorts().userDefaults.set(periodKey, period.exportJSON().dump());
+}
+
+std::string lineOf(const UserNotification& notification) {
+  return visibleText(notification.identifier.value_or("(no identifier)") + ": " +
+                     notification.title.value_or("") + " - " +
+                     notification.informativeText.value_or(""));
+}
+
+std::string statusText(Varnel::Platform::UserNotificationCenter& center) {
+  std::string text = "period: " + storedPeriod().description() + "\n";
+  for (const UserNotification& notification : center.scheduledNotifications())
+    text += "scheduled " + textOf(notification.deliveryDate) + "  " + lineOf(notification) + "\n";
+  for (const UserNotification& notification : center.deliveredNotifications())
+    text +=
+        "delivered " + textOf(notification.actualDeliveryDate) + "  " + lineOf(notification) + "\n";
+  return text;
+}
+
+}  // namespace Orvane

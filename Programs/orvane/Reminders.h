@@ -1,0 +1,26 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+
+#include <Platform/Values/UserNotification.h>
+#include <Varnel/Reminders/SchedulePeriodOption.h>
+
+namespace Varnel::Platform {
+class UserNotificationCenter;
+}
+
+namespace Orvane {
+
+/// The period that the user chose, kept in this program's settings; never until then, and where the
+/// setting is damaged.
+[[nodiscard]] Varnel::SchedulePeriodOption storedPeriod();
+void storePeriod(Varnel::SchedulePeriodOption period);
+
+/// The stored period and the notifications of a center, a line each.
+[[nodiscard]] std::string statusText(Varnel::Platform::UserNotificationCenter& center);
+
+/// A notification in a line: its identifier, title and text.
+[[nodiscard]] std::string lineOf(const Varnel::Platform::UserNotification& notification);
+
+}  // namespace Orvane

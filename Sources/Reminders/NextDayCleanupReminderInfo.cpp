@@ -1,0 +1,40 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Reminders/NextDayCleanupReminderInfo.h>
+
+#include <Platform/Ports/Clock.h>
+#include <Platform/Ports/Ports.h>
+#include <Platform/Ports/UserLocale.h>
+#include <Platform/Text/ByteCountFormatter.h>
+#include <Platform/Text/Calendar.h>
+#include <Platform/Text/TextFormat.h>
+#include <Varnel/Context/VarnelModule.h>
+
+namespace Varnel {
+
+const std::string& NextDayCleanupReminderInfo::userNotificationIdentifier() {
+  static const std::string& identifier =
+      *new std::string("com.quennel.Orvane2.daily-cleanup-reminder");
+  return identifier;
+}
+
+Platform::UserNotification NextDayCleanupReminderInfo::makeUserNotification() const {
+  const Platform::Ports& ports = Platform::processPorts();
+  return makeUserNotification({ports.clock, ports.userLocale, *VarnelModule::instance()});
+}
+
+Platform::UserNotification NextDayCleanupReminderInfo::makeUserNotification(Ports ports) const {
+  const auto localized = [&](const char* key) { return ports.module.localizedString(key); };
+  const std::string size = Platform::ByteCountFormatter(ports.userLocale.identifier())
+                               .string(foundSize_, Platform::ByteCountStyle::file);
+  return {
+      .identifier = userNotificationIdentifier(),
+      .title = localized("Varnel_NextDayCleanupReminder_Title"),
+      .informativeText =
+          Platform::formatted(localized("Varnel_NextDayCleanupReminder_Subtitle"), {size}),
+      .actionButtonTitle = localized("Varnel_NextDayCleanupReminder_ActionButton"),
+      .otherButtonTitle = localized("Varnel_NextDayCleanupReminder_OtherButton"),
+      .deliveryDate = Platform::Calendar(ports.userLocale).adding({.day = 1}, ports.clock.now()),
+  };
+}
+
+}  // namespace Varnel

@@ -1,0 +1,34 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Reminders/SchedulerAnalyticsSender.h>
+
+#include <utility>
+
+#include <Platform/Ports/Clock.h>
+#include <Platform/Ports/Ports.h>
+#include <Platform/Ports/UserLocale.h>
+#include <Platform/Text/DateFormatter.h>
+
+namespace Varnel {
+namespace {
+
+SchedulerAnalyticsSender::Ports portsOfProcess() {
+  const Platform::Ports& ports = Platform::processPorts();
+  return {ports.clock, ports.userLocale};
+}
+
+}  // namespace
+
+SchedulerAnalyticsSender::SchedulerAnalyticsSender(
+    Ports ports, std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker)
+    : CommonAnalyticsSender(std::move(tracker)), ports_(ports) {}
+
+SchedulerAnalyticsSender::SchedulerAnalyticsSender(
+    std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker)
+    : SchedulerAnalyticsSender(portsOfProcess(), std::move(tracker)) {}
+
+void SchedulerAnalyticsSender::trackNotification(const Platform::UserNotification&) {
+  const Platform::DateFormatter formatter("HH:mm", ports_.userLocale.identifier());
+  trackEvent("Notification Clicked", formatter.string(ports_.clock.now()), std::nullopt, {}, {});
+}
+
+}  // namespace Varnel

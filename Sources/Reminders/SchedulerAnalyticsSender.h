@@ -1,0 +1,43 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <string>
+
+#include <Platform/Api.h>
+#include <Varnel/Identification/CommonAnalyticsSender.h>
+
+namespace Varnel::Platform {
+class Clock;
+class UserLocale;
+struct UserNotification;
+}  // namespace Varnel::Platform
+
+namespace Varnel {
+
+/// Reports what users do with reminders, in the category "Scheduler".
+///
+///     SchedulerAnalyticsSender(tracker).trackNotification(notification);
+///
+/// Any thread.
+class VARNEL_API SchedulerAnalyticsSender final : public CommonAnalyticsSender {
+ public:
+  struct Ports {
+    Platform::Clock& clock;
+    Platform::UserLocale& userLocale;
+  };
+
+  SchedulerAnalyticsSender(Ports ports, std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker);
+  explicit SchedulerAnalyticsSender(std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker);
+
+  [[nodiscard]] std::string contextName() const override { return "Scheduler"; }
+  [[nodiscard]] std::string categoryName() const override { return contextName(); }
+
+  /// Reports that a notification was clicked, and at what time of day; not which one.
+  void trackNotification(const Platform::UserNotification& notification);
+
+ private:
+  const Ports ports_;
+};
+
+}  // namespace Varnel

@@ -1,0 +1,89 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <memory>
+#include <string>
+
+#include <Basalt/ExecutionContext.h>
+#include <Platform/Api.h>
+#include <Platform/Values/Date.h>
+#include <Platform/Values/DateComponents.h>
+#include <Varnel/Reminders/SchedulePeriodOption.h>
+#include <Varnel/Reminders/SchedulerAnalyticsSender.h>
+
+namespace Tallyhouse {
+class AnalyticsTracker;
+}
+
+namespace Varnel::Platform {
+class Clock;
+class MainQueue;
+class UserLocale;
+class UserNotificationCenter;
+}  // namespace Varnel::Platform
+
+namespace Varnel {
+
+class BaseModule;
+class ProcessFacts;
+class UserNotificationRouter;
+
+/// Keeps one repeating reminder to clean up in the notification center, in step with the period
+/// that the user chose.
+///
+///     SchedulerService service(tracker, router);
+///     service.setSchedulePeriod(SchedulePeriodOption::monthly);  // when the user chooses it
+///     service.scheduleCleanReminder(bytesLeft);                  // after a scan
+///
+/// A reminder comes one full period after it was scheduled, and again after each. When the user
+/// clicks it, the service reports that and takes the banner away. The period is the host's to keep;
+/// a new service has `never` and touches nothing until told.
+///
+/// Every repeating notification of the application counts as this service's and is swept away with
+/// its reminder: the host schedules none. Main thread only; nothing fails.
+class VARNEL_API SchedulerService final : public Basalt::ExecutionContext {
+ public:
+  struct Ports {
+    Platform::Clock& clock;
+    Platform::UserLocale& userLocale;
+    Platform::MainQueue& mainQueue;
+    const ProcessFacts& facts;                 ///< For the application's name.
+    std::shared_ptr<const BaseModule> module;  ///< For the texts.
+  };
+
+  /// The router must outlive the service.
+  SchedulerService(Ports ports, std::shared_ptr<Tallyhouse::AnalyticsTracker> analyticsTracker,
+                   UserNotificationRouter& userNotificationRouter);
+  SchedulerService(std::shared_ptr<Tallyhouse::AnalyticsTracker> analyticsTracker,
+                   UserNotificationRouter& userNotificationRouter);
+
+  [[nodiscard]] SchedulePeriodOption schedulePeriod() const { return schedulePeriod_; }
+  /// Plans the reminder anew, also for the same period again; with `never`, removes it.
+  void setSchedulePeriod(SchedulePeriodOption period);
+
+  /// Schedules the reminder without a size.
+  void scheduleCleanReminder();
+  /// Schedules it for a number of bytes, which it names from 2,000,000,000 on.
+  void scheduleCleanReminder(std::int64_t sizeLeftToClean);
+  /// Plans the reminder anew with its texts; where there is none, one without a size.
+  void rescheduleExistingReminder();
+
+  [[nodiscard]] Platform::UserNotificationCenter& userNotificationCenter() const;
+
+ private:
+  [[nodiscard]] std::string localized(const char* key) const;
+  [[nodiscard]] std::string simpleAlertTile() const;
+  [[nodiscard]] std::string simpleAlertSubtitle() const;
+  void scheduleNotification(const std::string& title, const std::string& subtitle);
+  void removePreviouslyScheduledNotifications();
+  [[nodiscard]] Platform::Date calculateDeliveryDate(
+      const Platform::DateComponents& repeatInterval) const;
+
+  const Ports ports_;
+  SchedulePeriodOption schedulePeriod_ = SchedulePeriodOption::never;
+  SchedulerAnalyticsSender analyticsSender_;
+  UserNotificationRouter& userNotificationRouter_;
+};
+
+}  // namespace Varnel

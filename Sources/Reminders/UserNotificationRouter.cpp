@@ -1,0 +1,124 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Reminders/UserNotificationRouter.h>
+
+#include <map>
+#include <mutex>
+#include <utility>
+
+#include <Basalt/MainQueueExecutor.h>
+#include <Platform/Ports/Application.h>
+#include <Platform/Ports/MainQueue.h>
+#include <Platform/Ports/Ports.h>
+#include <Platform/Ports/UserNotificationCenter.h>
+#include <Varnel/Context/Globals.h>
+
+namespace Varnel {
+
+using Platform::UserNotification;
+using Platform::UserNotificationCenter;
+
+class UserNotificationRouter::Routes final : public Platform::UserNotificationCenterDelegate {
+ public:
+  explicit Routes(const Platform::Application& application) : application_(application) {}
+
+  Basalt::Producer<Event> producer(const std::string& identifier) {
+    const std::lock_guard lock(mutex_);
+    return producers_[identifier];
+  }
+
+  void route(const UserNotification& notification, EventKind kind) const {
+    if (!notification.identifier) return;
+    if (const auto producer = existingProducer(*notification.identifier))
+      producer->update({notification, kind});
+  }
+
+  void didDeliver(UserNotificationCenter&, const UserNotification& notification) override {
+    route(notification, EventKind::didDeliver);
+  }
+  void didActivate(UserNotificationCenter&, const UserNotification& notification) override {
+    route(notification, EventKind::didActivate);
+  }
+  bool shouldPresent(UserNotificationCenter&, const UserNotification&) override {
+    return !application_.isActive();
+  }
+
+ private:
+  std::optional<Basalt::Producer<Event>> existingProducer(const std::string& identifier) const {
+    const std::lock_guard lock(mutex_);
+    const auto found = producers_.find(identifier);
+    if (found == producers_.end()) return std::nullopt;
+    return found->second;
+  }
+
+  const Platform::Application& application_;
+  mutable std::mutex mutex_;  ///< Owns `producers_`.
+  std::map<std::string, Basalt::Producer<Event>> producers_;
+};
+
+namespace {
+
+UserNotificationRouter::Ports portsOfProcess() {
+  const Platform::Ports& ports = Platform::processPorts();
+  return {UserNotificationRouter::defaultUserNotificationCenter(), ports.application,
+          ports.mainQueue};
+}
+
+}  // namespace
+
+std::optional<UserNotificationRouter::EventKind> UserNotificationRouter::eventKindWithRawValue(
+    std::int64_t rawValue) {
+  for (const auto kind : {EventKind::didLaunchWith, EventKind::didDeliver, EventKind::didActivate})
+    if (static_cast<std::int64_t>(kind) == rawValue) return kind;
+  return std::nullopt;
+}
+
+UserNotificationRouter::UserNotificationRouter(Ports ports)
+    : ports_(ports), routes_(std::make_shared<Routes>(ports.application)) {
+  ports_.userNotificationCenter.setDelegate(routes_);
+}
+
+UserNotificationRouter::UserNotificationRouter() : UserNotificationRouter(portsOfProcess()) {}
+
+UserNotificationRouter::~UserNotificationRouter() = default;
+
+UserNotificationCenter& UserNotificationRouter::defaultUserNotificationCenter() {
+  return Platform::processPorts().userNotificationCenters.center(Globals::baseIdentifier());
+}
+
+UserNotificationCenter& UserNotificationRouter::userNotificationCenter() const {
+  return ports_.userNotificationCenter;
+}
+
+void UserNotificationRouter::register_(const std::string& identifier, Handler handler) {
+  channel(identifier)
+      .onUpdate(std::make_shared<Basalt::MainQueueExecutor>(ports_.mainQueue),
+                [handler = std::move(handler)](const Event& event) {
+                  handler(event.notification, event.kind);
+                });
+}
+
+Basalt::Channel<UserNotificationRouter::Event> UserNotificationRouter::channel(
+    const std::string& identifier) {
+  return routes_->producer(identifier).channel();
+}
+
+void UserNotificationRouter::handleLaunch(const UserNotification& notification) {
+  routes_->route(notification, EventKind::didLaunchWith);
+}
+
+void UserNotificationRouter::removeScheduledNotifications(const std::string& identifier) {
+  removeNotifications(identifier, &UserNotificationCenter::removeScheduledNotification);
+}
+
+void UserNotificationRouter::removeDeliveredNotifications(const std::string& identifier) {
+  removeNotifications(identifier, &UserNotificationCenter::removeDeliveredNotification);
+}
+
+void UserNotificationRouter::removeNotifications(const std::string& identifier, Removal removal) {
+  UserNotificationCenter& center = ports_.userNotificationCenter;
+  // Both removals look for their candidates here: part of the published behaviour.
+  for (const UserNotification& notification : center.deliveredNotifications())
+    if (notification.identifier == identifier) (center.*removal)(notification);
+}
+
+}  // namespace Varnel

@@ -1,0 +1,92 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include <Basalt/Channel.h>
+#include <Platform/Api.h>
+#include <Platform/Values/UserNotification.h>
+
+namespace Varnel::Platform {
+class Application;
+class MainQueue;
+class UserNotificationCenter;
+}  // namespace Varnel::Platform
+
+namespace Varnel {
+
+/// The one delegate of the notification center: passes its events on to whoever asked for a
+/// notification's identifier.
+///
+///     UserNotificationRouter router;  // at launch, before any notification can arrive
+///     router.register_("com.example.daily", [](const auto& notification, auto kind) { … });
+///
+/// `register_` and `channel` may be called on any thread, all else on the main thread. Handlers run
+/// on the main queue, never within the call that caused the event. An event that nobody asked for
+/// is lost. Nothing fails.
+class VARNEL_API UserNotificationRouter final {
+ public:
+  enum class EventKind : std::int64_t {
+    didLaunchWith,  ///< The user launched the application through the notification.
+    didDeliver,
+    didActivate,  ///< The user clicked the notification or its action button.
+  };
+  /// The kind of a raw value from 0 to 2.
+  [[nodiscard]] static std::optional<EventKind> eventKindWithRawValue(std::int64_t rawValue);
+
+  struct Event {
+    Platform::UserNotification notification;
+    EventKind kind;
+  };
+  using Handler = std::function<void(const Platform::UserNotification&, EventKind)>;
+
+  struct Ports {
+    Platform::UserNotificationCenter& userNotificationCenter;
+    Platform::Application& application;
+    Platform::MainQueue& mainQueue;
+  };
+
+  /// Becomes the delegate of the center, which thereupon delivers what came due.
+  explicit UserNotificationRouter(Ports ports);
+  /// The router of the running application's own center.
+  UserNotificationRouter();
+  ~UserNotificationRouter();
+  UserNotificationRouter(const UserNotificationRouter&) = delete;
+  UserNotificationRouter& operator=(const UserNotificationRouter&) = delete;
+
+  /// The center that `UserNotificationRouter()` serves, for reading it without listening.
+  [[nodiscard]] static Platform::UserNotificationCenter& defaultUserNotificationCenter();
+
+  [[nodiscard]] Platform::UserNotificationCenter& userNotificationCenter() const;
+
+  /// Subscribes to all events of notifications with this identifier, for the router's life.
+  void register_(const std::string& identifier, Handler handler);
+
+  /// The events of notifications with this identifier.
+  [[nodiscard]] Basalt::Channel<Event> channel(const std::string& identifier);
+
+  /// What a host calls that was launched through a notification.
+  void handleLaunch(const Platform::UserNotification& notification);
+
+  /// Cancels what is scheduled under this identifier, if it has been delivered before and is still
+  /// in the delivered list: published behaviour. What was never delivered stays scheduled.
+  void removeScheduledNotifications(const std::string& identifier);
+  /// Removes what has been delivered under this identifier.
+  void removeDeliveredNotifications(const std::string& identifier);
+
+ private:
+  class Routes;
+  using Removal =
+      void (Platform::UserNotificationCenter::*)(const Platform::UserNotification& notification);
+  void removeNotifications(const std::string& identifier, Removal removal);
+
+  const Ports ports_;
+  const std::shared_ptr<Routes>
+      routes_;  ///< What the center listens to, as long as the router lives.
+};
+
+}  // namespace Varnel

@@ -1,0 +1,217 @@
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <signal.h>
+#include <spawn.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <array>
+#include <cstdio>
+#include <cstdlib>
+#include <memory>
+
+#include <Platform/Generic/NotificationStore.h>
+#include <Platform/Linux/Adapters.h>
+#include <Platform/POSIX/Adapters.h>
+#include <Platform/Ports/Clock.h>
+#include <Platform/Ports/UserNotificationCenter.h>
+#include <Platform/Testing/CapturedOutput.h>
+#include <Platform/Testing/FakeApplication.h>
+#include <Platform/Testing/FakeProcessInfo.h>
+#include <Platform/Testing/FakeUser.h>
+#include <Platform/Testing/FakeWorkspace.h>
+#include <Tallyhouse/AnalyticsTracker.h>
+#include <Tallyhouse/Testing/MemoryTransport.h>
+#include <Tests/Support/DrainUntil.h>
+#include <Varnel/Context/ProcessFacts.h>
+#include <Varnel/Context/VarnelModule.h>
+#include <Varnel/Identification/CustomDimensionsHolder.h>
+#include <Varnel/Reminders/SchedulerService.h>
+#include <Varnel/Reminders/UserNotificationRouter.h>
+
+// What runs here has a session bus and a screen of its own: see with-desktop.
+namespace Varnel {
+namespace {
+
+using namespace std::chrono_literals;
+using Platform::UserNotification;
+using ::testing::HasSubstr;
+using ::testing::IsEmpty;
+using ::testing::SizeIs;
+
+std::string outputOf(const std::string& command) {
+  std::string text;
+  FILE* pipe = ::popen(command.c_str(), "r");
+  std::array<char, 256> buffer{};
+  while (std::fgets(buffer.data(), buffer.size(), pipe)) text += buffer.data();
+  ::pclose(pipe);
+  return text;
+}
+
+class Server final {
+ public:
+  Server() {
+    const std::string configuration = std::string(getenv("VARNEL_DESKTOP")) + "/dunstrc";
+    const char* arguments[] = {"dunst", "-conf", configuration.c_str(), nullptr};
+    EXPECT_EQ(::posix_spawnp(&process_, "dunst", nullptr, nullptr,
+                             const_cast<char* const*>(arguments), environ),
+              0);
+    outputOf("gdbus wait --session --timeout 30 org.freedesktop.Notifications");
+  }
+  ~Server() {
+    ::kill(process_, SIGKILL);
+    ::waitpid(process_, nullptr, 0);
+  }
+  Server(const Server&) = delete;
+  Server& operator=(const Server&) = delete;
+
+  [[nodiscard]] static std::string displayedCount() { return outputOf("dunstctl count displayed"); }
+
+ private:
+  pid_t process_ = 0;
+};
+
+// One run of the host.
+class Host final {
+ public:
+  explicit Host(const std::string& product)
+      : productName(product),
+        center(centers->center(product)),
+        router({center, application, *queue}) {
+    module->setBundle(Bundle(VARNEL_TEST_RESOURCES, {"en"}));
+    CustomDimensionsHolder::setClientIdentifier("client");
+    CustomDimensionsHolder::setDownloadSourceURL(std::nullopt);
+  }
+
+  [[nodiscard]] UserNotification reminderIn(std::chrono::milliseconds delay) const {
+    return {.identifier = "SchedulerNotification",
+            .title = "Time to <clean> & go",
+            .informativeText = "2 < 3 & \"<b>plain</b>\"\xff",
+            .actionButtonTitle = "Scan",
+            .otherButtonTitle = "Later",
+            .deliveryDate = clock->now() + delay,
+            .deliveryRepeatInterval = {{.day = 7}}};
+  }
+
+  // Until the server has said that it shows what was delivered.
+  void awaitBanner() {
+    EXPECT_TRUE(Tests::drainUntil(*queue, [&] { return Server::displayedCount() == "1\n"; }));
+  }
+
+  // Until the store knows the server's names for the banners of all that was delivered.
+  void awaitReferences() {
+    const std::string file =
+        std::string(getenv("XDG_STATE_HOME")) + "/" + productName + "/notifications.sqlite";
+    EXPECT_TRUE(Tests::drainUntil(*queue, [&] {
+      const auto delivered = Platform::NotificationStore(file, log).delivered();
+      return std::all_of(delivered.begin(), delivered.end(),
+                         [](const auto& each) { return each.bannerReference.has_value(); });
+    }));
+  }
+
+  const std::string productName;
+  const std::unique_ptr<Platform::Clock> clock = Platform::POSIX::makeClock();
+  const std::unique_ptr<Platform::MainQueue> queue = Platform::Linux::makeMainQueue();
+  Platform::Testing::FakeUserLocale locale;
+  Platform::Testing::CapturedSystemLog log;
+  Platform::Testing::FakeApplication application;
+  Platform::Testing::FakeProcessInfo processInfo;
+  Platform::Testing::FakeUserAccount account;
+  Platform::Testing::FakeWorkspace workspace;
+  const ProcessFacts facts{{*clock, processInfo, account, workspace}, {.isSiteVersion = true}};
+  const std::shared_ptr<VarnelModule> module = std::make_shared<VarnelModule>();
+  const std::shared_ptr<Tallyhouse::Testing::MemoryTransport> sent =
+      std::make_shared<Tallyhouse::Testing::MemoryTransport>();
+  const std::unique_ptr<Platform::UserNotificationCenters> centers =
+      Platform::Linux::makeUserNotificationCenters({*clock, locale, *queue, log});
+  Platform::UserNotificationCenter& center;
+  UserNotificationRouter router;
+  SchedulerService service{{*clock, locale, *queue, facts, module},
+                           std::make_shared<Tallyhouse::AnalyticsTracker>(sent),
+                           router};
+};
+
+TEST(NotificationServer, AReminderAppearsAndItsClicksComeBackOnce) {
+  Server server;
+  Host host("clicks");
+  for (const char* click : {"dunstctl action 0", "dunstctl context"}) {
+    const std::size_t before = host.sent->events().size();
+    host.center.scheduleNotification(host.reminderIn(300ms));
+    host.awaitBanner();
+    outputOf(click);
+    EXPECT_TRUE(
+        Tests::drainUntil(*host.queue, [&] { return host.sent->events().size() > before; }));
+    EXPECT_TRUE(Tests::drainUntil(*host.queue, [&] { return Server::displayedCount() == "0\n"; }));
+    host.queue->drain();
+    EXPECT_EQ(host.sent->events().size(), before + 1) << click;
+    EXPECT_EQ(host.sent->events().back().action, "Notification Clicked");
+    EXPECT_THAT(host.center.deliveredNotifications(), IsEmpty());
+    EXPECT_THAT(host.center.scheduledNotifications(), SizeIs(1));
+  }
+  const std::string history = outputOf("dunstctl history");
+  EXPECT_THAT(history, HasSubstr("Time to <clean> & go"));
+  EXPECT_THAT(history, HasSubstr("2 &lt; 3 &amp; &quot;&lt;b&gt;plain&lt;/b&gt;&quot;"));
+  EXPECT_EQ(host.log.text(), "");
+}
+
+TEST(NotificationServer, ADismissedBannerLeavesTheDeliveredList) {
+  Server server;
+  Host host("dismissal");
+  host.center.deliverNotification(host.reminderIn(0s));
+  host.awaitBanner();
+  EXPECT_THAT(host.center.deliveredNotifications(), SizeIs(1));
+  outputOf("dunstctl close");
+  EXPECT_TRUE(
+      Tests::drainUntil(*host.queue, [&] { return host.center.deliveredNotifications().empty(); }));
+  EXPECT_THAT(host.sent->events(), IsEmpty());
+}
+
+TEST(NotificationServer, ALostServerCostsTheBannerAlone) {
+  auto server = std::make_unique<Server>();
+  Host host("restart");
+  host.center.deliverNotification(host.reminderIn(0s));
+  host.awaitBanner();
+  server.reset();
+  host.center.scheduleNotification(host.reminderIn(0s));
+  EXPECT_TRUE(Tests::drainUntil(*host.queue, [&] { return !host.log.text().empty(); }));
+  EXPECT_THAT(host.log.text(), HasSubstr("Cannot show a notification"));
+  EXPECT_THAT(host.center.deliveredNotifications(), SizeIs(1));
+  EXPECT_THAT(host.center.scheduledNotifications(), SizeIs(1));
+  server = std::make_unique<Server>();
+  host.center.scheduleNotification(host.reminderIn(100ms));
+  host.awaitBanner();
+}
+
+TEST(NotificationServer, ANextRunDeliversWhatTheLastOneCouldNotAndTakesItsBannersAway) {
+  Server server;
+  {
+    Host host("runs");
+    host.center.deliverNotification({.identifier = "left", .title = "Left behind"});
+    host.awaitReferences();
+    // Due only when the process has gone.
+    host.center.setDelegate({});
+    host.center.scheduleNotification(host.reminderIn(0s));
+  }
+  Host next("runs");
+  next.awaitReferences();
+  EXPECT_EQ(Server::displayedCount(), "2\n");
+  next.router.removeDeliveredNotifications("left");
+  EXPECT_EQ(Server::displayedCount(), "1\n");
+  next.service.setSchedulePeriod(SchedulePeriodOption::never);
+  EXPECT_EQ(Server::displayedCount(), "0\n");
+}
+
+TEST(NotificationServer, OneProcessLearnsAtOnceWhatAnotherSchedules) {
+  Server server;
+  Host host("watch");
+  Host other("watch");
+  other.center.setDelegate({});
+  other.center.scheduleNotification(other.reminderIn(100ms));
+  host.awaitBanner();
+  EXPECT_THAT(other.center.deliveredNotifications(), SizeIs(1));
+}
+
+}  // namespace
+}  // namespace Varnel

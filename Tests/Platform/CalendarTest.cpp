@@ -1,0 +1,102 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Text/Calendar.h>
+
+#include <gtest/gtest.h>
+
+#include <limits>
+
+#include <Platform/Text/TextFormat.h>
+
+namespace Varnel::Platform {
+namespace {
+
+using namespace std::chrono;
+using namespace std::chrono_literals;
+
+constexpr auto month = DateComponents{.month = 1};
+constexpr auto day = DateComponents{.day = 1};
+
+Date utc(year_month_day date, minutes time = 0min) {
+  return sys_days(date) + time;
+}
+
+TEST(Calendar, EachRepetitionIsCountedFromTheOriginalDate) {
+  const Calendar calendar("en_US", "UTC");
+  const Date last = utc(2026y / January / 31, 9h + 5min) + 123456us;
+  const auto nth = [&](int n) { return *calendar.adding(month, last, n) - 123456us; };
+  EXPECT_EQ(nth(0), utc(2026y / January / 31, 9h + 5min));
+  EXPECT_EQ(nth(1), utc(2026y / February / 28, 9h + 5min));
+  EXPECT_EQ(nth(2), utc(2026y / March / 31, 9h + 5min));
+  EXPECT_EQ(nth(25), utc(2028y / February / 29, 9h + 5min));
+  EXPECT_EQ(calendar.adding({.year = 1}, utc(2024y / February / 29)), utc(2025y / February / 28));
+}
+
+TEST(Calendar, KeepsTheWallClockOverBothChangesOfTheClocks) {
+  const Calendar berlin("de_DE", "Europe/Berlin");
+  // 18:30 stays 18:30, in winter at 17:30 UTC, in summer at 16:30.
+  EXPECT_EQ(berlin.adding(day, utc(2026y / March / 28, 17h + 30min)),
+            utc(2026y / March / 29, 16h + 30min));
+  EXPECT_EQ(berlin.adding(day, utc(2026y / October / 24, 16h + 30min)),
+            utc(2026y / October / 25, 17h + 30min));
+  // 02:30 is skipped on 29 March: 03:30 stands in, but only that day.
+  const Date winterNight = utc(2026y / March / 28, 1h + 30min);
+  EXPECT_EQ(berlin.adding(day, winterNight), utc(2026y / March / 29, 1h + 30min));
+  EXPECT_EQ(berlin.adding(day, winterNight, 2), utc(2026y / March / 30, 30min));
+  // 02:30 comes twice on 25 October: the first counts, from either side of the change.
+  const Date firstOfTwo = utc(2026y / October / 25, 30min);
+  EXPECT_EQ(berlin.adding(day, utc(2026y / October / 24, 30min)), firstOfTwo);
+  EXPECT_EQ(berlin.adding(day, utc(2026y / October / 26, 1h + 30min), -1), firstOfTwo);
+  EXPECT_EQ(berlin.adding({.month = 9}, utc(2026y / January / 25, 1h + 30min)), firstOfTwo);
+  // Hours are lengths of time and may well lead to the second.
+  EXPECT_EQ(berlin.adding({.hour = 1}, firstOfTwo), firstOfTwo + 1h);
+}
+
+TEST(Calendar, CountsInTheCalendarOfTheLocale) {
+  // In the Hebrew year 5784 Adar comes twice; a year later there is but one.
+  const Calendar hebrew("he_IL@calendar=hebrew", "UTC");
+  EXPECT_EQ(hebrew.adding({.year = 1}, utc(2024y / October / 3)), utc(2025y / September / 23));
+  // The first month of the Persian year has 31 days.
+  EXPECT_EQ(Calendar("fa_IR", "UTC").adding(month, utc(2026y / March / 21)),
+            utc(2026y / April / 21));
+  EXPECT_EQ(Calendar("th_TH", "UTC").adding({.year = 1000}, utc(2026y / March / 21)),
+            utc(3026y / March / 21));
+  for (const char* locale : {"en_US", "he_IL@calendar=hebrew", "fa_IR", "", "nonsense"})
+    EXPECT_EQ(Calendar(locale, "UTC").weekdayCount(), 7) << locale;
+}
+
+TEST(Calendar, MovesAWallClockTimeIntoAnotherZone) {
+  const Calendar newYork("en_US", "America/New_York");
+  EXPECT_EQ(newYork.withWallClockOf(utc(2026y / July / 1, 7h), "Europe/Berlin"),
+            utc(2026y / July / 1, 13h));
+  EXPECT_EQ(newYork.withWallClockOf(utc(2026y / July / 1, 7h), "No/Such_Zone"),
+            utc(2026y / July / 1, 11h));
+}
+
+TEST(Calendar, AnswersNothingBeyondWhatItCanCount) {
+  const Calendar calendar("en_US", "Europe/Berlin");
+  const Date now = utc(2026y / March / 1);
+  constexpr auto huge = std::numeric_limits<std::int64_t>::max();
+  EXPECT_EQ(calendar.adding({.year = huge}, now), std::nullopt);
+  EXPECT_EQ(calendar.adding({.day = 2}, now, huge), std::nullopt);
+  EXPECT_EQ(calendar.adding({.hour = huge}, now), std::nullopt);
+  EXPECT_EQ(calendar.adding({.year = 2'000'000'000}, now), std::nullopt);
+  EXPECT_TRUE(calendar.adding({.year = 280'000}, now));
+  EXPECT_EQ(calendar.adding({.year = 1}, Date::max()), std::nullopt);
+  for (const Date edge : {Date::min(), Date::max()}) {
+    EXPECT_EQ(calendar.withWallClockOf(edge, "UTC"), std::nullopt);
+    EXPECT_EQ(calendar.adding({}, edge), std::nullopt);
+  }
+  EXPECT_EQ(calendar.adding({}, now), now);
+}
+
+TEST(TextFormat, TakesTextsInOrderOrByPosition) {
+  EXPECT_EQ(formatted("%@ of %@", {"a", "b"}), "a of b");
+  EXPECT_EQ(formatted("%2$@ of %1$@, 100 %%", {"a", "b"}), "b of a, 100 %");
+  EXPECT_EQ(formatted("%@ %@ %9$@", {"%@"}), "%@ (null) (null)");
+  EXPECT_EQ(formatted("5 % of %d %0$@ %99999999999999999999$@ %1$d %", {"a"}),
+            "5 % of %d %0$@ %99999999999999999999$@ %1$d %");
+  EXPECT_EQ(formatted("", {"a"}), "");
+}
+
+}  // namespace
+}  // namespace Varnel::Platform

@@ -1,0 +1,180 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Reminders/SchedulerService.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <Platform/Testing/FakeApplication.h>
+#include <Platform/Testing/FakeMainQueue.h>
+#include <Platform/Testing/FakeProcessInfo.h>
+#include <Platform/Testing/FakeUser.h>
+#include <Platform/Testing/FakeUserNotificationCenter.h>
+#include <Platform/Testing/FakeWorkspace.h>
+#include <Platform/Testing/SimulatedClock.h>
+#include <Tallyhouse/AnalyticsTracker.h>
+#include <Tallyhouse/Testing/MemoryTransport.h>
+#include <Varnel/Context/ProcessFacts.h>
+#include <Varnel/Context/VarnelModule.h>
+#include <Varnel/Identification/CustomDimensionsHolder.h>
+#include <Varnel/Reminders/NextDayCleanupReminderInfo.h>
+#include <Varnel/Reminders/UserNotificationRouter.h>
+
+namespace Varnel {
+namespace {
+
+using namespace std::chrono;
+using namespace std::chrono_literals;
+using Platform::UserNotification;
+using ::testing::HasSubstr;
+using ::testing::IsEmpty;
+using ::testing::SizeIs;
+
+constexpr Platform::Date now = sys_days(2026y / March / 20) + 9h + 41min;
+
+class SchedulerServiceTest : public ::testing::Test {
+ protected:
+  SchedulerServiceTest() { module->setBundle(Bundle(VARNEL_TEST_RESOURCES, {"en"})); }
+
+  [[nodiscard]] UserNotification onlyScheduled() {
+    const auto scheduled = center.scheduledNotifications();
+    EXPECT_THAT(scheduled, SizeIs(1));
+    return scheduled.empty() ? UserNotification() : scheduled.front();
+  }
+
+  Platform::Testing::SimulatedClock clock{now};
+  Platform::Testing::FakeUserLocale locale;
+  Platform::Testing::FakeMainQueue queue;
+  Platform::Testing::FakeApplication application;
+  Platform::Testing::FakeUserNotificationCenter center;
+  Platform::Testing::FakeProcessInfo processInfo;
+  Platform::Testing::FakeUserAccount account;
+  Platform::Testing::FakeWorkspace workspace;
+  const ProcessFacts facts{{clock, processInfo, account, workspace},
+                           {.isSiteVersion = true, .appName = "Another 3"}};
+  const std::shared_ptr<VarnelModule> module = std::make_shared<VarnelModule>();
+  const std::shared_ptr<Tallyhouse::Testing::MemoryTransport> sent =
+      std::make_shared<Tallyhouse::Testing::MemoryTransport>();
+  UserNotificationRouter router{{center, application, queue}};
+  SchedulerService service{{clock, locale, queue, facts, module},
+                           std::make_shared<Tallyhouse::AnalyticsTracker>(sent),
+                           router};
+};
+
+TEST_F(SchedulerServiceTest, StartsWithNeverAndTouchesNothing) {
+  center.scheduleNotification({.identifier = "old", .deliveryRepeatInterval = {{.day = 7}}});
+  EXPECT_EQ(service.schedulePeriod(), SchedulePeriodOption::never);
+  EXPECT_THAT(center.scheduledNotifications(), SizeIs(1));
+  service.scheduleCleanReminder();
+  EXPECT_THAT(center.scheduledNotifications(), IsEmpty());
+}
+
+TEST_F(SchedulerServiceTest, ASettingPlansTheReminderAFullPeriodAhead) {
+  service.setSchedulePeriod(SchedulePeriodOption::monthly);
+  EXPECT_EQ(
+      onlyScheduled(),
+      (UserNotification{.identifier = "SchedulerNotification",
+                        .title = "Time to clean up",
+                        .informativeText = "Let Another 3 look for duplicate files on your disks.",
+                        .actionButtonTitle = "Scan",
+                        .otherButtonTitle = "Later",
+                        .deliveryDate = sys_days(2026y / April / 20) + 9h + 41min,
+                        .deliveryRepeatInterval = {{.month = 1}}}));
+  // The same setting again plans again.
+  clock.advance(days(1));
+  service.setSchedulePeriod(SchedulePeriodOption::monthly);
+  EXPECT_EQ(onlyScheduled().deliveryDate, sys_days(2026y / April / 21) + 9h + 41min);
+  service.setSchedulePeriod(SchedulePeriodOption::never);
+  EXPECT_THAT(center.scheduledNotifications(), IsEmpty());
+}
+
+TEST_F(SchedulerServiceTest, NamesSizesFromTwoBillionBytesOn) {
+  service.setSchedulePeriod(SchedulePeriodOption::onceInTwoWeeks);
+  for (const std::int64_t size : {std::int64_t{-1}, std::int64_t{1'999'999'999}}) {
+    service.scheduleCleanReminder(size);
+    EXPECT_EQ(onlyScheduled().title, "Time to clean up");
+  }
+  service.scheduleCleanReminder(2'500'000'000);
+  EXPECT_EQ(onlyScheduled().title, "Another 3 has more to clean up");
+  EXPECT_EQ(onlyScheduled().informativeText, "Duplicate files still take up 2.5 GB of your disks.");
+  service.scheduleCleanReminder(2'000'000'000);
+  EXPECT_THAT(*onlyScheduled().informativeText, HasSubstr(" 2 GB "));
+}
+
+TEST_F(SchedulerServiceTest, AnotherPeriodKeepsTheTextsOfTheFirstRepeatingNotification) {
+  service.setSchedulePeriod(SchedulePeriodOption::annually);
+  service.scheduleCleanReminder(2'500'000'000);
+  const UserNotification before = onlyScheduled();
+  service.setSchedulePeriod(SchedulePeriodOption::weekly);
+  auto expected = before;
+  expected.deliveryDate = now + days(7);
+  expected.deliveryRepeatInterval = {{.day = 7}};
+  EXPECT_EQ(onlyScheduled(), expected);
+
+  // Texts that are missing are made up for; the default name is replaced wherever it stands.
+  service.setSchedulePeriod(SchedulePeriodOption::never);
+  center.scheduleNotification(
+      {.title = "Orvane 2, Orvane 2!", .deliveryRepeatInterval = {{.day = 1}}});
+  service.setSchedulePeriod(SchedulePeriodOption::weekly);
+  EXPECT_EQ(onlyScheduled().title, "Another 3, Another 3!");
+  EXPECT_EQ(onlyScheduled().informativeText,
+            "Let Another 3 look for duplicate files on your disks.");
+}
+
+TEST_F(SchedulerServiceTest, SweepsEveryRepeatingNotificationAndNoOther) {
+  const UserNotification once{.identifier = "once"};
+  const UserNotification host{.identifier = "host", .deliveryRepeatInterval = {{.hour = 1}}};
+  for (const auto& each : {once, host}) {
+    center.scheduleNotification(each);
+    center.deliverNotification(each);
+  }
+  service.setSchedulePeriod(SchedulePeriodOption::weekly);
+  EXPECT_THAT(center.deliveredNotifications(), testing::ElementsAre(once));
+  EXPECT_THAT(center.scheduledNotifications(), SizeIs(2));
+}
+
+TEST_F(SchedulerServiceTest, AClickIsReportedOnceAndTakesTheBannerAwayNotTheRepetition) {
+  CustomDimensionsHolder::setClientIdentifier("client");
+  CustomDimensionsHolder::setDownloadSourceURL(std::nullopt);
+  setenv("TZ", "UTC", 1);
+  service.setSchedulePeriod(SchedulePeriodOption::weekly);
+  const UserNotification reminder = onlyScheduled();
+  center.deliverNotification(reminder);
+  queue.drain();
+  EXPECT_THAT(sent->events(), IsEmpty());
+
+  center.activate(reminder);
+  queue.drain();
+  ASSERT_THAT(sent->events(), SizeIs(1));
+  const auto event = sent->events().front();
+  EXPECT_EQ(event.category, "Scheduler");
+  EXPECT_EQ(event.action, "Notification Clicked");
+  EXPECT_EQ(event.label, "09:41");
+  EXPECT_EQ(event.value, std::nullopt);
+  EXPECT_THAT(center.deliveredNotifications(), IsEmpty());
+  EXPECT_EQ(onlyScheduled(), reminder);
+
+  router.handleLaunch(reminder);
+  queue.drain();
+  EXPECT_THAT(sent->events(), SizeIs(2));
+}
+
+TEST_F(SchedulerServiceTest, TheNextDaysReminderComesADayLaterAtTheSameTime) {
+  locale.timeZone = "Europe/Berlin";
+  clock.set(sys_days(2026y / March / 28) + 17h + 30min);  // 18:30 before the clocks change
+  const NextDayCleanupReminderInfo info(1, 3'200'000'000);
+  EXPECT_EQ(info, NextDayCleanupReminderInfo(1, 3'200'000'000));
+  EXPECT_NE(info, NextDayCleanupReminderInfo(2, 3'200'000'000));
+  EXPECT_NE(info, NextDayCleanupReminderInfo(1, 3));
+  EXPECT_EQ(info.makeUserNotification({clock, locale, *module}),
+            (UserNotification{.identifier = "com.quennel.Orvane2.daily-cleanup-reminder",
+                              .title = "Your duplicates are waiting",
+                              .informativeText = "You can still free up to 3.2 GB of disk space.",
+                              .actionButtonTitle = "Clean Up",
+                              .otherButtonTitle = "Not Now",
+                              .deliveryDate = sys_days(2026y / March / 29) + 16h + 30min}));
+  clock.set(Platform::Date::max());
+  EXPECT_EQ(info.makeUserNotification({clock, locale, *module}).deliveryDate, std::nullopt);
+}
+
+}  // namespace
+}  // namespace Varnel

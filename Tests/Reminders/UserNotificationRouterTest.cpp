@@ -1,0 +1,173 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Reminders/UserNotificationRouter.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <latch>
+#include <thread>
+
+#include <Basalt/MainQueueExecutor.h>
+#include <Platform/Testing/FakeApplication.h>
+#include <Platform/Testing/FakeMainQueue.h>
+#include <Platform/Testing/FakeUserNotificationCenter.h>
+
+namespace Varnel {
+namespace {
+
+using Platform::UserNotification;
+using Router = UserNotificationRouter;
+using Kind = Router::EventKind;
+using ::testing::ElementsAre;
+using ::testing::IsEmpty;
+using ::testing::SizeIs;
+
+class UserNotificationRouterTest : public ::testing::Test {
+ protected:
+  Router::Handler note(std::string name) {
+    return [this, name = std::move(name)](const UserNotification& received, Kind kind) {
+      EXPECT_TRUE(queue.isCurrent());
+      events.push_back(name + " " + received.title.value_or("") + " " +
+                       std::to_string(static_cast<int>(kind)));
+    };
+  }
+
+  Platform::Testing::FakeUserNotificationCenter center;
+  Platform::Testing::FakeApplication application;
+  Platform::Testing::FakeMainQueue queue;
+  Router router{{center, application, queue}};
+  const UserNotification notification{.identifier = "a", .title = "A"};
+  std::vector<std::string> events;
+};
+
+TEST_F(UserNotificationRouterTest, ReachesAllHandlersOfTheIdentifierInTheirOrder) {
+  router.register_("a", note("first"));
+  router.register_("b", note("other"));
+  router.register_("a", note("second"));
+  EXPECT_EQ(router.channel("a"), router.channel("a"));
+  center.deliverNotification(notification);
+  center.activate(notification);
+  router.handleLaunch(notification);
+  EXPECT_THAT(events, IsEmpty());
+  queue.drain();
+  EXPECT_THAT(events, ElementsAre("first A 1", "second A 1", "first A 2", "second A 2", "first A 0",
+                                  "second A 0"));
+}
+
+TEST_F(UserNotificationRouterTest, DropsWhatNobodyAskedForAndReplaysNothing) {
+  center.activate(notification);
+  router.register_("a", note("late"));
+  center.activate({.title = "Nameless"});
+  router.handleLaunch({.identifier = "A"});
+  queue.drain();
+  EXPECT_THAT(events, IsEmpty());
+}
+
+TEST_F(UserNotificationRouterTest, HandlersMaySubscribeWhileAnEventIsDelivered) {
+  router.register_("a", [&](const UserNotification&, Kind) {
+    router.register_("a", note("new"));
+    router.handleLaunch({.identifier = "b"});
+  });
+  router.register_("b", note("nested"));
+  center.activate(notification);
+  queue.drain();
+  EXPECT_THAT(events, ElementsAre("nested  0"));
+  center.activate(notification);
+  queue.drain();
+  EXPECT_THAT(events, ElementsAre("nested  0", "new A 2", "nested  0"));
+}
+
+TEST_F(UserNotificationRouterTest, ASubscriptionEndsWithItsContextAlsoForEventsOnTheirWay) {
+  class Context final : public Basalt::ExecutionContext {
+   public:
+    explicit Context(Platform::MainQueue& queue)
+        : ExecutionContext(std::make_shared<Basalt::MainQueueExecutor>(queue)) {}
+  };
+  auto first = std::make_unique<Context>(queue);
+  auto second = std::make_unique<Context>(queue);
+  int count = 0;
+  router.channel("a").onUpdate(*first, [&](const Router::Event&) {
+    ++count;
+    second.reset();
+  });
+  router.channel("a").onUpdate(*second, [&](const Router::Event&) { ADD_FAILURE(); });
+  center.activate(notification);
+  queue.drain();
+  center.activate(notification);
+  first.reset();
+  queue.drain();
+  EXPECT_EQ(count, 1);
+}
+
+TEST_F(UserNotificationRouterTest, ShowsBannersOnlyWhileTheUserIsElsewhere) {
+  center.deliverNotification(notification);
+  application.setActive(true);
+  center.deliverNotification(notification);
+  EXPECT_THAT(center.presented, SizeIs(1));
+  application.setActive(false);
+  center.deliverNotification(notification);
+  EXPECT_THAT(center.presented, SizeIs(2));
+}
+
+TEST_F(UserNotificationRouterTest, BothRemovalsTakeTheirCandidatesFromTheDeliveredList) {
+  const UserNotification other{.identifier = "b"};
+  for (const auto& each : {notification, other}) center.scheduleNotification(each);
+  router.removeScheduledNotifications("a");
+  EXPECT_THAT(center.scheduledNotifications(), SizeIs(2));
+  for (const auto& each : {notification, other}) center.deliverNotification(each);
+  router.removeScheduledNotifications("a");
+  EXPECT_THAT(center.scheduledNotifications(), ElementsAre(other));
+  EXPECT_THAT(center.deliveredNotifications(), SizeIs(2));
+  router.removeDeliveredNotifications("a");
+  EXPECT_THAT(center.deliveredNotifications(), ElementsAre(other));
+  EXPECT_THAT(center.scheduledNotifications(), ElementsAre(other));
+}
+
+TEST_F(UserNotificationRouterTest, IsHeldWeakly) {
+  {
+    const Router shortLived({center, application, queue});
+    EXPECT_TRUE(center.delegate());
+  }
+  EXPECT_FALSE(center.delegate());
+  center.deliverNotification(notification);
+  EXPECT_THAT(center.presented, IsEmpty());
+}
+
+TEST_F(UserNotificationRouterTest, AnyThreadMayRegisterWhileEventsCome) {
+  constexpr int threadCount = 4;
+  constexpr int eventCount = 200;
+  std::vector<int> counts(threadCount, 0);
+  std::latch start(threadCount + 1);
+  {
+    std::vector<std::jthread> threads;
+    for (int i = 0; i < threadCount; ++i)
+      threads.emplace_back([&, i] {
+        start.arrive_and_wait();
+        for (int n = 0; n < eventCount; ++n)
+          static_cast<void>(router.channel("x" + std::to_string(n)));
+        router.register_("a", [&counts, i](const UserNotification&, Kind) {
+          ++counts[static_cast<std::size_t>(i)];
+        });
+      });
+    start.arrive_and_wait();
+    for (int n = 0; n < eventCount; ++n) {
+      router.handleLaunch(notification);
+      queue.drain();
+    }
+  }
+  const auto before = counts;
+  router.handleLaunch(notification);
+  queue.drain();
+  for (std::size_t i = 0; i < counts.size(); ++i) EXPECT_EQ(counts[i], before[i] + 1);
+}
+
+TEST(UserNotificationRouter, EventKindsHaveTheirRawValues) {
+  EXPECT_EQ(Router::eventKindWithRawValue(0), Kind::didLaunchWith);
+  EXPECT_EQ(Router::eventKindWithRawValue(1), Kind::didDeliver);
+  EXPECT_EQ(Router::eventKindWithRawValue(2), Kind::didActivate);
+  for (const std::int64_t raw : {-1, 3})
+    EXPECT_EQ(Router::eventKindWithRawValue(raw), std::nullopt);
+}
+
+}  // namespace
+}  // namespace Varnel
