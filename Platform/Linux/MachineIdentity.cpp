@@ -4,7 +4,8 @@
 #include <algorithm>
 #include <array>
 #include <fstream>
-#include <iterator>
+#include <sstream>
+#include <utility>
 
 #include <Platform/Linux/Adapters.h>
 #include <Platform/Linux/DefaultRoutes.h>
@@ -14,10 +15,11 @@
 namespace Varnel::Platform::Linux {
 namespace {
 
-// The tables of routes have no bound on their size.
+// The tables of routes have no bound on their size. What cannot be read is empty.
 std::string readAll(const std::string& path) {
-  std::ifstream stream(path, std::ios::binary);
-  return std::string((std::istreambuf_iterator<char>(stream)), {});
+  std::ostringstream bytes;
+  bytes << std::ifstream(path, std::ios::binary).rdbuf();
+  return std::move(bytes).str();
 }
 
 std::string lowerCased(std::string text) {

@@ -124,6 +124,7 @@ class SpawnedProcess final : public LaunchedProcess {
     // Until its end is collected, the number cannot become another process's.
     if (hasEnded_) return;
     ::kill(-process_, SIGKILL);
+    ::kill(process_, SIGKILL);  // It may have left its group.
     collect(0);
   }
 

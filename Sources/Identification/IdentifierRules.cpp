@@ -55,7 +55,9 @@ std::optional<std::string> campaignOf(std::string_view text) {
   const auto items = Platform::decodedURLQuery(*query);
   const auto found =
       std::find_if(items.begin(), items.end(), [](const auto& item) { return item.name == "cid"; });
-  return found == items.end() ? std::nullopt : found->value;
+  if (found == items.end() || !found->value || !Platform::isValidUTF8(*found->value))
+    return std::nullopt;
+  return found->value;
 }
 
 std::optional<std::string> clientIdentifierIn(const std::vector<Platform::Cookie>& cookies,
@@ -64,7 +66,7 @@ std::optional<std::string> clientIdentifierIn(const std::vector<Platform::Cookie
   const auto found = std::find_if(cookies.begin(), cookies.end(), [&](const auto& cookie) {
     return cookie.domain == domain && cookie.name == "_ga";
   });
-  if (found == cookies.end()) return std::nullopt;
+  if (found == cookies.end() || !Platform::isValidUTF8(found->value)) return std::nullopt;
   const std::string_view rest = withoutFirstCharacters(found->value, lengthOfPrefix);
   if (rest.empty()) return std::nullopt;
   return std::string(rest);

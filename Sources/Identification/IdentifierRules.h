@@ -21,11 +21,11 @@ namespace Varnel {
     const std::vector<Platform::PropertyData>& addresses);
 
 /// The value of the first query item named "cid". Absent when the text is no URL, has no such item,
-/// or the item has no value.
+/// or the item has no value or one that is not UTF-8.
 [[nodiscard]] std::optional<std::string> campaignOf(std::string_view url);
 
 /// The client id in the first "_ga" cookie of exactly this domain: what follows the six characters
-/// of version and depth ("GA1.2."). Absent when nothing does.
+/// of version and depth ("GA1.2."). Absent when nothing does, or the value is not UTF-8.
 [[nodiscard]] std::optional<std::string> clientIdentifierIn(
     const std::vector<Platform::Cookie>& cookies, std::string_view domain);
 

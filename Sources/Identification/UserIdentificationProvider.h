@@ -9,7 +9,7 @@
 namespace Varnel {
 
 /// Where the facts come from that tell one installation from another. A fact that the machine does
-/// not give is absent; `userIdentifier()` alone always has a text.
+/// not give is absent; `userIdentifier()` alone always has a text. Threads as the implementation's.
 class VARNEL_API UserIdentificationProvider {
  public:
   virtual ~UserIdentificationProvider() = default;

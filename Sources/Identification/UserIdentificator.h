@@ -28,6 +28,7 @@ namespace Varnel {
 /// One thread at a time. Nothing fails or is logged: what cannot be found is absent.
 class VARNEL_API UserIdentificator final : public UserIdentificationProvider {
  public:
+  /// What the object asks of the system; outlives it.
   struct Ports {
     Platform::CookieStorage& cookieStorage;
     Platform::MachineIdentity& machineIdentity;

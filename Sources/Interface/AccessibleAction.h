@@ -15,7 +15,7 @@ namespace Varnel {
 ///     remove.buttonIdentifier();    // "remove.button"
 ///     remove.menuItemIdentifier();  // "remove.menu-item"
 ///
-/// An immutable value. Any thread.
+/// An immutable value; all are empty if the identifier is. Any thread.
 class VARNEL_API AccessibleAction final {
  public:
   explicit AccessibleAction(std::string identifier) : identifier_(std::move(identifier)) {}

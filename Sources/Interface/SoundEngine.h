@@ -28,6 +28,7 @@ class VARNEL_API SoundEngine final : private Platform::SoundDelegate {
   /// Where the resource of a sound is; absent when there is none.
   using PathOfSound = std::function<std::optional<std::string>(Sound)>;
 
+  /// The player outlives the engine.
   struct Ports {
     Platform::SoundPlayer& player;
     PathOfSound path;
@@ -50,7 +51,8 @@ class VARNEL_API SoundEngine final : private Platform::SoundDelegate {
   /// A sound has come to its end. Calls `stop`, whichever sound it was.
   void sound(Platform::PlayableSound& sound, bool didFinishPlaying) override;
 
-  /// What is being played; null for nothing.
+  /// What is being played; null for nothing. Assigning starts and stops nothing by itself, but a
+  /// sound that nobody holds any more falls silent.
   [[nodiscard]] const std::shared_ptr<Platform::PlayableSound>& currentSound() const {
     return currentSound_;
   }

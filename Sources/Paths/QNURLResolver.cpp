@@ -107,7 +107,7 @@ std::optional<std::string> QNURLResolver::expandedPathForPath(std::string_view p
 
 std::optional<URL> QNURLResolver::fileURLWithPath(std::string_view path) const {
   if (path == homeSign) return homeURL();
-  if (path == rootSign) return rootURL();
+  if (!path.empty() && path.find_first_not_of('/') == path.npos) return rootURL();
   const auto components = expandedPathComponentsForPath(path);
   if (!components) return std::nullopt;
   return URL::fileURLWithPath(Platform::joinPathComponents(*components));

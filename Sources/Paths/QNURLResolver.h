@@ -27,8 +27,8 @@ namespace Varnel {
 ///
 /// Two bases are known: what lies below the home URL starts with "~", what lies below the root URL
 /// with "/". Components are compared byte for byte. An immutable value: copies share one state,
-/// and two are equal when the components of their bases are. Any thread. Only the calls that take
-/// a URL and no hint may look into the file system.
+/// and two are equal when the components of their bases are. Any thread. Only
+/// `abbreviatedPathForURL` may look into the file system.
 class VARNEL_API QNURLResolver final {
  public:
   using PathComponents = Platform::PathComponents;

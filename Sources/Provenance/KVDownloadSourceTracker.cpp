@@ -77,6 +77,7 @@ std::optional<KVQuarantineEntry> KVDownloadSourceTracker::installSourceEntry() c
       bundle.starts_with(places_.volumesRoot) ? identifierOfImage(bundle) : std::nullopt;
   if (!identifier) identifier = identifierOfFile(bundle);
 
+  if (!quarantine_) return std::nullopt;
   const auto entries = quarantine_->entries();
   if (entries.empty()) return std::nullopt;
   if (identifier)

@@ -37,6 +37,7 @@ namespace Varnel {
 /// `installSourceEntry()` may be called from any thread; the properties are to be set before.
 class VARNEL_API KVDownloadSourceTracker final {
  public:
+  /// What the tracker asks of the system; outlives it.
   struct VARNEL_API Ports {
     Platform::ExtendedAttributes& extendedAttributes;
     Platform::ProcessInfo& processInfo;
@@ -74,7 +75,7 @@ class VARNEL_API KVDownloadSourceTracker final {
   /// anew each time.
   [[nodiscard]] std::optional<KVQuarantineEntry> installSourceEntry() const;
 
-  /// The database that is searched.
+  /// The database that is searched; without one nothing is found.
   [[nodiscard]] const std::shared_ptr<KVQuarantine>& quarantine() const { return quarantine_; }
   void setQuarantine(std::shared_ptr<KVQuarantine> quarantine);
 

@@ -26,7 +26,7 @@ namespace Varnel {
 /// Each call opens the database, reads and closes it. Any thread; calls read files.
 class VARNEL_API KVQuarantine final {
  public:
-  /// The database at `path`; the log defaults to the system's.
+  /// The database at `path`. The log, by default the system's, outlives the reader.
   explicit KVQuarantine(std::string path);
   KVQuarantine(std::string path, Platform::SystemLog& systemLog);
 

@@ -27,14 +27,20 @@ std::string_view numberIn(std::string_view text) {
   return text;
 }
 
+// The parser reports what is too close to zero as it does what is too large.
+bool isTiny(std::string_view number) {
+  return number.find("e-") != number.npos || number.find("E-") != number.npos;
+}
+
 // What does not fit becomes the largest or the smallest.
 template <typename Number>
 Number parse(std::string_view text, Number largest, Number smallest) {
   const std::string_view digits = numberIn(text);
   Number number = 0;
   const auto [end, status] = std::from_chars(digits.data(), digits.data() + digits.size(), number);
-  if (status == std::errc::result_out_of_range) return isNegative(digits) ? smallest : largest;
-  return status == std::errc() ? number : 0;
+  if (status == std::errc()) return number;
+  if (status != std::errc::result_out_of_range || isTiny({digits.data(), end})) return 0;
+  return isNegative(digits) ? smallest : largest;
 }
 
 constexpr std::int64_t largestInteger = std::numeric_limits<std::int64_t>::max();

@@ -67,6 +67,8 @@ TEST(QNURLResolver, GivesTheBasesThemselvesForTheirSigns) {
   const QNURLResolver backup = resolver("/Users/ann/", "/Volumes/Backup/");
   EXPECT_EQ(backup.fileURLWithPath("~"), backup.homeURL());
   EXPECT_EQ(backup.fileURLWithPath("/"), backup.rootURL());
+  EXPECT_EQ(backup.fileURLWithPath("//"), backup.rootURL());
+  EXPECT_EQ(backup.fileURLWithPath("~/"), URL::fileURLWithPath("/Users/ann"));
   EXPECT_EQ(backup.fileURLWithPath("~/Music/"), URL::fileURLWithPath("/Users/ann/Music"));
   EXPECT_EQ(backup.fileURLWithPath("/x"), URL::fileURLWithPath("/Volumes/Backup/x"));
   EXPECT_EQ(backup.fileURLWithPath("docs/a b"), URL::fileURLWithPath("docs/a b"));

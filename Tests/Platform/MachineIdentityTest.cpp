@@ -110,6 +110,10 @@ TEST_F(MockedMachine, ThePrimaryInterfaceHasTheBestDefaultRoute) {
   EXPECT_EQ(primary(), 2);
   setRoutes({}, {{"eth0", "00000400"}});
   EXPECT_EQ(primary(), 1);
+  // A table that opens but cannot be read leaves the other.
+  fs::remove(folder.path() / "proc/net/route");
+  fs::create_directory(folder.path() / "proc/net/route");
+  EXPECT_EQ(primary(), 1);
 }
 
 TEST_F(MockedMachine, AVirtualInterfaceGivesThePhysicalOneBelowOrNext) {

@@ -3,6 +3,7 @@
 #include <gmock/gmock.h>
 #include <spawn.h>
 #include <sys/wait.h>
+#include <sys/xattr.h>
 #include <unistd.h>
 
 #include <filesystem>
@@ -225,6 +226,28 @@ TEST_F(Orvane, PlaysTheFrameworksSoundsToTheirEnd) {
   const Outcome unknown = run({"sound", "applause"});
   EXPECT_EQ(unknown.status, 2);
   EXPECT_THAT(unknown.errors, HasSubstr("there is no sound \"applause\""));
+}
+
+TEST_F(Orvane, ExplainsAFilesAttributeAndIdentifiesTheInstallation) {
+  const std::string file = folder.path("download");
+  std::ofstream(file) << "x";
+  EXPECT_THAT(run({"origin", file}).output, HasSubstr("\nevent: none\n"));
+  constexpr std::string_view attribute = "0083;60000000;Bro\nwser;E1";
+  if (::setxattr(file.c_str(), "user.com.apple.quarantine", attribute.data(), attribute.size(), 0))
+    GTEST_SKIP() << "The file system of " << file << " keeps no attributes.";
+  const nlohmann::json facts = {{"file", file},
+                                {"flags", "0083"},
+                                {"date", "2021-01-14 08:25:36 UTC"},
+                                {"agentName", "Bro\nwser"},
+                                {"eventIdentifier", "E1"},
+                                {"dataURL", nullptr}};
+  EXPECT_EQ(nlohmann::json::parse(run({"origin", "--json", file}).output), facts);
+  EXPECT_THAT(run({"origin", file}).output, HasSubstr("\ndownloaded by: Bro\\nwser\n"));
+  EXPECT_EQ(run({"origin", folder.path("missing")}).status, 1);
+
+  const auto user = nlohmann::json::parse(run({"identify", "--json"}).output);
+  EXPECT_EQ(user["userIdentifier"].get<std::string>().size(), 64u);
+  EXPECT_EQ(user["uniqueClientIdentifier"], user["userIdentifier"]);
 }
 
 TEST_F(Orvane, ListsTheDiskOfItsFiles) {

@@ -117,6 +117,9 @@ TEST_F(DownloadSource, WithoutDownloadsThereIsNoSource) {
   ASSERT_TRUE(Tests::setQuarantineAttribute(application, "0083;5f3a;Browser;bundle"));
   Tests::runSQL(database, "DELETE FROM LSQuarantineEvent");
   EXPECT_EQ(trace(application), "none");
+  KVDownloadSourceTracker tracker(std::make_shared<KVQuarantine>(database.string(), log));
+  tracker.setQuarantine(nullptr);
+  EXPECT_FALSE(tracker.installSourceEntry());
 }
 
 TEST_F(DownloadSource, OnAMountedImageTheImagesAttributeDecides) {
@@ -163,7 +166,7 @@ TEST_F(DownloadSource, AToolThatGivesNoAnswerLeavesTheApplicationToDecide) {
     const char* event;
   } cases[] = {
       {"slow", "sleep 0.2\n" + answer, 20, "image"},
-      {"complaining", "echo trouble >/dev/null\n" + answer, 20, "image"},
+      {"complaining", "echo trouble >&2\n" + answer, 20, "image"},
       {"failing", answer + "exit 1\n", 20, "bundle"},
       {"killed", answer + "kill -9 $$\n", 20, "bundle"},
       {"garbage", "head -c 70000 /dev/urandom\n", 20, "bundle"},
@@ -176,9 +179,12 @@ TEST_F(DownloadSource, AToolThatGivesNoAnswerLeavesTheApplicationToDecide) {
       {"asleep", "sleep 1000\n", 0.3, "bundle"},
       {"reading", "cat\n", 0.3, "bundle"},
       {"deaf", "trap '' TERM INT HUP\nwhile :; do :; done\n", 0.3, "bundle"},
+      {"gone elsewhere", "exec perl -e 'setpgrp(0, getpgrp(getppid())); sleep 1000'\n", 0.3,
+       "bundle"},
       // What it leaves behind keeps the pipe open, and is not waited for.
       {"with a child", "sleep 2 2>/dev/null &\n" + answer, 20, "image"},
   };
+  testing::internal::CaptureStderr();
   const auto descriptors = Tests::openDescriptors();
   for (const auto& each : cases) {
     writeTool(each.script);
@@ -193,6 +199,7 @@ TEST_F(DownloadSource, AToolThatGivesNoAnswerLeavesTheApplicationToDecide) {
   folder.write("tool", "not a program");
   EXPECT_EQ(trace(mounted), "bundle");
   EXPECT_EQ(Tests::openDescriptors(), descriptors);
+  EXPECT_THAT(testing::internal::GetCapturedStderr(), testing::HasSubstr("trouble\n"));
 }
 
 TEST_F(DownloadSource, AToolIsAskedUntilItHasEnded) {
