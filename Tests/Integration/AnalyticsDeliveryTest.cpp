@@ -1,10 +1,17 @@
 // SPDX-License-Identifier: MIT
 #include <gtest/gtest.h>
 
+#include <dlfcn.h>
+#include <netdb.h>
+
 #include <algorithm>
 #include <chrono>
+#include <cstdlib>
+#include <future>
 #include <optional>
+#include <semaphore>
 #include <set>
+#include <string_view>
 #include <thread>
 
 #include <Platform/Ports/HTTPClient.h>
@@ -15,6 +22,30 @@
 #include <Tallyhouse/SpoolingTransport.h>
 #include <Tests/Support/ChildProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
+
+namespace {
+
+// A name server that is silent for as long as a test wants.
+constexpr std::string_view silentHost = "silent.example";
+std::binary_semaphore isAskedForSilentHost(0);
+std::binary_semaphore mayAnswer(0);
+
+}  // namespace
+
+// Stands before the system's: the module's library finds names here.
+extern "C" __attribute__((visibility("default"))) int getaddrinfo(const char* node,
+                                                                  const char* service,
+                                                                  const addrinfo* hints,
+                                                                  addrinfo** found) {
+  if (node && node == silentHost) {
+    isAskedForSilentHost.release();
+    mayAnswer.acquire();
+    return EAI_FAIL;
+  }
+  static const auto real =
+      reinterpret_cast<decltype(&getaddrinfo)>(::dlsym(RTLD_NEXT, "getaddrinfo"));
+  return real(node, service, hints, found);
+}
 
 namespace Tallyhouse {
 namespace {
@@ -119,7 +150,7 @@ TEST_F(AnalyticsDeliveryTest, AnEventArrivesWithAllThatItCarries) {
 }
 
 TEST_F(AnalyticsDeliveryTest, NoBehaviourOfAServerLosesOrRenamesAnEvent) {
-  Server server({"503/1", "cut", "garbage", "500", "429", "302", "200"});
+  Server server({"503/1", "cut", "garbage", "500/99999999999999999999", "429/soon", "302", "200"});
   AnalyticsTracker tracker(transport(server.url()));
   const auto start = std::chrono::steady_clock::now();
   tracker.context()->trackEvent("Scan", "Once", std::nullopt, std::nullopt, {}, {});
@@ -202,10 +233,52 @@ TEST(HTTPClient, RefusesPlainHTTPUnlessAllowedAndStopsAtOnce) {
   std::thread stopper([&] {
     server.next();
     server.next();
+    // Another post is not held up by the one that hangs.
+    std::stop_source other;
+    other.request_stop();
+    EXPECT_FALSE(http.post(plain, other.get_token()));
     stop.request_stop();
   });
   EXPECT_FALSE(http.post(plain, stop.get_token()));
   stopper.join();
+}
+
+TEST(HTTPClient, ReadsNoContentWithoutEnd) {
+  Server server({"endless"});
+  const HTTPPost post{
+      .url = server.url(), .contentType = "text/plain", .body = "x", .allowsPlainHTTP = true};
+  const auto start = std::chrono::steady_clock::now();
+  const auto answer = Varnel::Platform::processPorts().httpClient.post(post, {});
+  ASSERT_TRUE(answer) << answer.error().message;
+  EXPECT_EQ(answer->status, 200);
+  EXPECT_LT(std::chrono::steady_clock::now() - start, 10s);
+}
+
+TEST(HTTPClient, RefusesACertificateThatNobodySigned) {
+  ::setenv("CERTIFICATE", VARNEL_CERTIFICATE, 1);
+  Server server({"200"});
+  ::unsetenv("CERTIFICATE");
+  const std::string url = "https" + server.url().substr(4);
+  const auto answer = Varnel::Platform::processPorts().httpClient.post(
+      {.url = url, .contentType = "text/plain", .body = "x"}, {});
+  ASSERT_FALSE(answer);
+  EXPECT_NE(answer.error().message.find("certificate"), std::string::npos)
+      << answer.error().message;
+}
+
+TEST(HTTPClient, StopsWhileANameServerIsSilent) {
+  std::stop_source stop;
+  auto answer = std::async(std::launch::async, [&] {
+    const HTTPPost post{.url = "https://" + std::string(silentHost) + "/",
+                        .contentType = "text/plain",
+                        .body = "x"};
+    return Varnel::Platform::processPorts().httpClient.post(post, stop.get_token()).hasValue();
+  });
+  isAskedForSilentHost.acquire();
+  stop.request_stop();
+  EXPECT_EQ(answer.wait_for(10s), std::future_status::ready);
+  mayAnswer.release();
+  EXPECT_FALSE(answer.get());
 }
 
 }  // namespace

@@ -6,6 +6,8 @@
 //   hang                     never
 //   cut                      by closing the connection once it has all of the request
 //   garbage                  with bytes that are no HTTP
+//   endless                  200, and content without end
+// The environment variable CERTIFICATE names a file that makes it speak https.
 // It prints its port in one line, and for each request "BYTES BEHAVIOUR" in one line and the body.
 #include <libsoup/soup.h>
 
@@ -36,6 +38,12 @@ void endConnection(SoupServerMessage* message, std::string_view lastWords) {
   g_object_unref(stream);
 }
 
+void appendContent(SoupServerMessage* message, gpointer) {
+  static const char content[16384] = {};
+  soup_message_body_append(soup_server_message_get_response_body(message), SOUP_MEMORY_STATIC,
+                           content, sizeof content);
+}
+
 void answer(SoupServer*, SoupServerMessage* message, const char*, GHashTable*, gpointer script) {
   const std::string& behaviour = static_cast<Script*>(script)->advance();
   GBytes* body = soup_message_body_flatten(soup_server_message_get_request_body(message));
@@ -50,6 +58,12 @@ void answer(SoupServer*, SoupServerMessage* message, const char*, GHashTable*, g
     soup_server_message_pause(message);
   } else if (behaviour == "cut") {
     endConnection(message, "");
+  } else if (behaviour == "endless") {
+    soup_server_message_set_status(message, SOUP_STATUS_OK, nullptr);
+    soup_message_headers_set_encoding(soup_server_message_get_response_headers(message),
+                                      SOUP_ENCODING_CHUNKED);
+    appendContent(message, nullptr);
+    g_signal_connect(message, "wrote-chunk", G_CALLBACK(appendContent), nullptr);
   } else if (behaviour == "garbage") {
     endConnection(message, "\x01\xFF 200 nothing like HTTP\r\n\r\n\r\n");
   } else {
@@ -69,7 +83,12 @@ int main(int count, char** arguments) {
   if (script.behaviours.empty()) return EXIT_FAILURE;
   SoupServer* server = soup_server_new("server-header", "test", nullptr);
   soup_server_add_handler(server, nullptr, answer, &script, nullptr);
-  if (!soup_server_listen_local(server, 0, SOUP_SERVER_LISTEN_IPV4_ONLY, nullptr))
+  int options = SOUP_SERVER_LISTEN_IPV4_ONLY;
+  if (const char* file = std::getenv("CERTIFICATE")) {
+    soup_server_set_tls_certificate(server, g_tls_certificate_new_from_file(file, nullptr));
+    options |= SOUP_SERVER_LISTEN_HTTPS;
+  }
+  if (!soup_server_listen_local(server, 0, static_cast<SoupServerListenOptions>(options), nullptr))
     return EXIT_FAILURE;
   GSList* uris = soup_server_get_uris(server);
   std::printf("%d\n", g_uri_get_port(static_cast<GUri*>(uris->data)));

@@ -4,6 +4,7 @@
 #include <curl/curl.h>
 
 #include <atomic>
+#include <condition_variable>
 #include <cstdlib>
 #include <mutex>
 #include <utility>
@@ -54,7 +55,7 @@ class CurlHTTPClient final : public HTTPClient {
   [[nodiscard]] bool isUsable() const { return multi_ != nullptr; }
 
   Answer post(const HTTPPost& request, std::stop_token stop) override {
-    const std::lock_guard lock(mutex_);
+    const Turn turn(*this, stop);
     if (stop.stop_requested() || isClosing_) return HTTPFailure{"cancelled"};
     const Easy easy(curl_easy_init());
     const Headers headers = headersOf(request);
@@ -73,11 +74,33 @@ class CurlHTTPClient final : public HTTPClient {
   void close() {
     isClosing_ = true;
     curl_multi_wakeup(multi_);
-    const std::lock_guard lock(mutex_);
+    const Turn turn(*this, {});
     curl_multi_cleanup(std::exchange(multi_, nullptr));
   }
 
  private:
+  // The right to use what the transfers share, unless `stop` came first.
+  class Turn final {
+   public:
+    Turn(CurlHTTPClient& client, const std::stop_token& stop) : client_(client) {
+      std::unique_lock lock(client_.mutex_);
+      isTaken_ = client_.free_.wait(lock, stop, [&] { return !client_.isBusy_; });
+      if (isTaken_) client_.isBusy_ = true;
+    }
+    ~Turn() {
+      if (!isTaken_) return;
+      const std::lock_guard lock(client_.mutex_);
+      client_.isBusy_ = false;
+      client_.free_.notify_one();
+    }
+    Turn(const Turn&) = delete;
+    Turn& operator=(const Turn&) = delete;
+
+   private:
+    CurlHTTPClient& client_;
+    bool isTaken_ = false;
+  };
+
   static Headers headersOf(const HTTPPost& request) {
     curl_slist* list = curl_slist_append(nullptr, ("Content-Type: " + request.contentType).c_str());
     // Servers that do not know the question would let every batch wait a second.
@@ -97,6 +120,8 @@ class CurlHTTPClient final : public HTTPClient {
     set(CURLOPT_SSL_VERIFYHOST, 2L);
     set(CURLOPT_FOLLOWLOCATION, 0L);
     set(CURLOPT_NOSIGNAL, 1L);
+    // A name server that is silent would hold up the end of an interrupted transfer.
+    set(CURLOPT_QUICK_EXIT, 1L);
     set(CURLOPT_CONNECTTIMEOUT, longestConnectingInSeconds);
     set(CURLOPT_TIMEOUT, longestTransferInSeconds);
     set(CURLOPT_POSTFIELDSIZE_LARGE, static_cast<curl_off_t>(request.body.size()));
@@ -120,9 +145,11 @@ class CurlHTTPClient final : public HTTPClient {
     }
   }
 
-  std::mutex mutex_;  // Owns the transfers. Waking them is free for all.
+  std::mutex mutex_;  // Owns `isBusy_`.
+  std::condition_variable_any free_;
+  bool isBusy_ = false;
   std::atomic<bool> isClosing_ = false;
-  CURLM* multi_;
+  CURLM* multi_;  // Belongs to who is busy. Waking it is free for all.
 };
 
 CurlHTTPClient* madeClient = nullptr;
