@@ -8,12 +8,14 @@ namespace Tallyhouse {
 using Varnel::Platform::Date;
 
 Verdict DeliveryPolicy::verdict(std::optional<int> status) {
+  constexpr int proxyAuthentication = 407;
   constexpr int requestTimeout = 408;
   constexpr int tooEarly = 425;
   constexpr int tooManyRequests = 429;
   if (!status) return Verdict::later;
   if (*status >= 200 && *status < 300) return Verdict::delivered;
-  if (*status == requestTimeout || *status == tooEarly || *status == tooManyRequests)
+  if (*status == proxyAuthentication || *status == requestTimeout || *status == tooEarly ||
+      *status == tooManyRequests)
     return Verdict::later;
   return *status >= 400 && *status < 500 ? Verdict::refused : Verdict::later;
 }
@@ -36,7 +38,8 @@ std::optional<Date> DeliveryPolicy::nextSending(const Backlog& backlog,
   if (backlog.hasRefused || backlog.waiting >= static_cast<std::int64_t>(batchEvents))
     next = now;
   else if (backlog.oldest)
-    next = std::min(*backlog.oldest, now) + linger;
+    // An event of the future was dated before the clock was set back: it has lingered.
+    next = *backlog.oldest > now ? now : *backlog.oldest + linger;
   if (!next || !notBefore) return next;
   const Duration longest = std::max(longestRetry, longestRetryAfter);
   return *notBefore > now + longest ? next : std::max(*next, *notBefore);
