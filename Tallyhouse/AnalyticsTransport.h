@@ -14,13 +14,15 @@ class VARNEL_API AnalyticsTransport {
  public:
   virtual ~AnalyticsTransport() = default;
 
-  /// Called when the user's consent is known to be given: what earlier runs left may go.
+  /// Called when the user's consent is known to be given, maybe more than once: what earlier runs
+  /// left may go.
   virtual void start() noexcept = 0;
 
   /// Takes over one event.
   virtual void accept(const AnalyticsEvent& event) noexcept = 0;
 
-  /// Forgets every event that has not arrived yet, those of earlier runs included.
+  /// Forgets every event that has not arrived yet, those of earlier runs included, and sends none
+  /// until `start`.
   virtual void discardAll() noexcept = 0;
 };
 

@@ -49,6 +49,8 @@ std::optional<Date> Delivery::step(Haste haste, std::stop_token stop) {
     send(waiting, false, stop);
   else if (const auto refused = spool_.refused(policy_.triesOfRefused))
     send({&*refused, 1}, true, stop);
+  else if (nextSending())
+    backOff({});  // What is there cannot be read.
   return nextSending();
 }
 
@@ -64,12 +66,11 @@ void Delivery::send(std::span<const SpooledEvent> events, bool areRefused, std::
   const Verdict verdict =
       DeliveryPolicy::verdict(answer ? std::optional(answer->status) : std::nullopt);
   if (verdict == Verdict::delivered) {
+    // What cannot be removed is sent again: not at once, or a full disk would make it a flood.
+    if (!(areRefused ? spool_.removeRefused(events.front()) : spool_.removeWaiting(events)))
+      return backOff({});
     failures_ = 0;
     notBefore_.reset();
-    if (areRefused)
-      spool_.removeRefused(events.front());
-    else
-      spool_.removeWaiting(events);
     return;
   }
   if (verdict == Verdict::refused) {
@@ -78,9 +79,12 @@ void Delivery::send(std::span<const SpooledEvent> events, bool areRefused, std::
     else
       spool_.moveToRefused(events);
   }
+  backOff(answer ? answer->retryAfter : std::nullopt);
+}
+
+void Delivery::backOff(std::optional<std::chrono::seconds> retryAfter) {
   ++failures_;
-  notBefore_ = ports_.clock.now() +
-               policy_.retryDelay(failures_, answer ? answer->retryAfter : std::nullopt, random_());
+  notBefore_ = ports_.clock.now() + policy_.retryDelay(failures_, retryAfter, random_());
 }
 
 }  // namespace Tallyhouse

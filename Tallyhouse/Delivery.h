@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <functional>
 #include <optional>
 #include <span>
@@ -54,6 +55,7 @@ class Delivery final {
 
  private:
   void send(std::span<const SpooledEvent> events, bool areRefused, std::stop_token stop);
+  void backOff(std::optional<std::chrono::seconds> retryAfter);
 
   const Ports ports_;
   EventSpool& spool_;

@@ -26,9 +26,10 @@ DeliveryWorker::~DeliveryWorker() {
 
 void DeliveryWorker::resume() {
   const std::lock_guard lock(mutex_);
-  if (!std::exchange(isPaused_, false)) return;
+  if (!isPaused_) return;
   transfer_ = std::stop_source();
   if (!thread_.joinable()) thread_ = std::thread([this] { run(); });
+  isPaused_ = false;
   isWoken_ = true;
   changed_.notify_all();
 }
@@ -83,20 +84,16 @@ std::optional<Date> DeliveryWorker::step(std::unique_lock<std::mutex>& lock) {
 }
 
 void DeliveryWorker::waitForNext(std::unique_lock<std::mutex>& lock, std::optional<Date> next) {
-  // The wall clock may jump while the wait counts time that passes.
-  constexpr auto longestWait = std::chrono::minutes(10);
-  const auto wait =
-      next ? std::min<Date::duration>(*next - clock_.now(), longestWait) : Date::duration::max();
+  // The wall clock may jump while the wait counts time that passes, and another process may leave
+  // something behind.
+  constexpr Date::duration longestWait = std::chrono::minutes(10);
+  const auto wait = next ? std::min(*next - clock_.now(), longestWait) : longestWait;
   if (wait <= Date::duration::zero() || isWoken_ || isEnding_) return;
   // Before a long wait, so that an idle spool is one small file.
   lock.unlock();
   spool_.checkpoint();
   lock.lock();
-  const auto isDue = [this] { return isWoken_ || isEnding_; };
-  if (next)
-    changed_.wait_for(lock, wait, isDue);
-  else
-    changed_.wait(lock, isDue);
+  changed_.wait_for(lock, wait, [this] { return isWoken_ || isEnding_; });
 }
 
 }  // namespace Tallyhouse

@@ -2,6 +2,7 @@
 #include <Tallyhouse/EventSpool.h>
 
 #include <algorithm>
+#include <bit>
 #include <filesystem>
 #include <utility>
 
@@ -55,6 +56,7 @@ bool isDamage(const PlatformError& error) {
   return primary == corrupt || primary == noDatabase;
 }
 
+constexpr const char* besideSuffix = ".damaged";
 constexpr std::string_view ownDomain = "Tallyhouse.EventSpool";
 
 PlatformError unusable(const char* why) {
@@ -83,18 +85,24 @@ void EventSpool::open() {
 std::optional<PlatformError> EventSpool::tryToOpen() {
   std::error_code ignored;
   fs::create_directories(fs::path(path_).parent_path(), ignored);
-  // The library would let others read; its further files take over the rights of this one.
-  if (auto file = ports_.appendFiles.open(path_); !file) return PlatformError(file.error());
+  // The library would let others read; its further files take over the rights of this one. A file
+  // that is there is not opened: closing it would give up the locks that this process has on it.
+  if (!fs::exists(path_, ignored)) {
+    if (auto file = ports_.appendFiles.open(path_); !file) return PlatformError(file.error());
+  }
+  fs::permissions(path_, fs::perms::owner_read | fs::perms::owner_write, ignored);
 
   auto database = Database::open(path_, Database::Access::readWrite);
   if (!database) return database.error();
   database_.emplace(std::move(database).value());
   database_->setBusyTimeout(longestWaitForLock);
   auto error = database_->execute(setUp);
-  if (!error && !isSound()) error = unusable("the file is damaged");
+  if (!error) error = damage();
   if (!error) {
     const auto version = number("PRAGMA user_version");
-    if (version == 0)
+    if (!version)
+      error = PlatformError(std::make_error_code(std::errc::io_error));
+    else if (version == 0)
       error = database_->execute(schema);
     else if (version != schemaVersion)
       error = unusable("the file is of another version");
@@ -113,29 +121,36 @@ std::optional<PlatformError> EventSpool::tryToOpen() {
   return error;
 }
 
-bool EventSpool::isSound() {
-  auto check = prepare("PRAGMA quick_check(1)");
-  if (!check) return false;
+// A check that fails says nothing about the file: it may be locked.
+std::optional<PlatformError> EventSpool::damage() {
+  auto check = database_->prepare("PRAGMA quick_check(1)");
+  if (!check) return check.error();
   const auto step = check->step();
-  return step && *step == Step::row && check->text(0) == "ok";
+  if (!step) return step.error();
+  if (*step == Step::row && check->text(0) == "ok") return std::nullopt;
+  return unusable("the file is damaged");
 }
 
 void EventSpool::putAside() {
   insert_.reset();
   database_.reset();
   std::error_code ignored;
-  fs::rename(path_, path_ + ".damaged", ignored);
-  for (const char* suffix : {"-wal", "-shm"}) fs::remove(path_ + suffix, ignored);
+  fs::rename(path_, path_ + besideSuffix, ignored);
+  // The log may hold most of the events.
+  fs::rename(path_ + "-wal", path_ + besideSuffix + "-wal", ignored);
+  fs::remove(path_ + "-shm", ignored);
 }
 
 std::int64_t EventSpool::append(std::string_view uuid, Date date, std::string_view hit) {
   const std::lock_guard lock(mutex_);
   const auto size = static_cast<std::int64_t>(hit.size());
-  makeRoom(size);
-  if (!insert_) {
+  // It may have been locked. Ever more rarely, as opening takes its time.
+  if (!insert_ && std::has_single_bit(static_cast<std::uint64_t>(unsavedDropped_) + 1)) open();
+  if (!insert_ || !isCleared()) {
     drop(1);
     return waitingEvents_;
   }
+  makeRoom(size);
   insert_->bind(1, uuid);
   insert_->bind(2, date.time_since_epoch().count());
   insert_->bind(3, hit);
@@ -151,12 +166,11 @@ std::int64_t EventSpool::append(std::string_view uuid, Date date, std::string_vi
 Backlog EventSpool::backlog(int triesOfRefused) {
   const std::lock_guard lock(mutex_);
   Backlog backlog;
+  if (!isCleared()) return backlog;
+  recountIfShared();
   if (const auto oldest = number("SELECT date FROM waiting ORDER BY id LIMIT 1")) {
     backlog.oldest = Date(Date::duration(*oldest));
     backlog.waiting = std::max<std::int64_t>(waitingEvents_, 1);
-  } else if (waitingEvents_ > 0) {
-    // Another process has delivered them.
-    recount();
   }
   backlog.hasRefused =
       number(fmt::format("SELECT 1 FROM refused WHERE times < {} LIMIT 1", triesOfRefused))
@@ -193,31 +207,40 @@ std::optional<SpooledEvent> EventSpool::refused(int triesOfRefused) {
   return currentEvent(*rows);
 }
 
-void EventSpool::removeWaiting(std::span<const SpooledEvent> events) {
+bool EventSpool::removeWaiting(std::span<const SpooledEvent> events) {
   const std::lock_guard lock(mutex_);
-  if (!run("BEGIN IMMEDIATE") || !removeEach("waiting", events) || !run("COMMIT")) recount();
+  const bool isDone = run("BEGIN IMMEDIATE") && removeEach("waiting", events) && run("COMMIT");
+  if (!isDone) recount();
+  return isDone;
 }
 
-void EventSpool::removeRefused(const SpooledEvent& event) {
+bool EventSpool::removeRefused(const SpooledEvent& event) {
   const std::lock_guard lock(mutex_);
-  if (!removeEach("refused", {&event, 1})) recount();
+  const bool isDone = removeEach("refused", {&event, 1});
+  if (!isDone) recount();
+  return isDone;
 }
 
 void EventSpool::moveToRefused(std::span<const SpooledEvent> events) {
   const std::lock_guard lock(mutex_);
-  if (!run("BEGIN IMMEDIATE")) return;
+  // A failure ends the transaction: nothing may be removed that was not copied.
+  static_cast<void>(run("BEGIN IMMEDIATE") && copyToRefused(events) &&
+                    removeEach("waiting", events) && run("COMMIT"));
+  recount();
+}
+
+bool EventSpool::copyToRefused(std::span<const SpooledEvent> events) {
+  // Copied from the line: what has been cleared meanwhile must not come back.
+  auto copy = prepare(
+      "INSERT INTO refused(uuid, date, hit, times)"
+      " SELECT uuid, date, hit, 1 FROM waiting WHERE id = ? AND uuid = ?");
+  if (!copy) return false;
   for (const SpooledEvent& event : events) {
-    // Copied from the line: what has been cleared meanwhile must not come back.
-    auto copy = prepare(
-        "INSERT INTO refused(uuid, date, hit, times)"
-        " SELECT uuid, date, hit, 1 FROM waiting WHERE id = ? AND uuid = ?");
-    if (!copy) break;
     copy->bind(1, event.id);
     copy->bind(2, event.uuid);
-    if (!run(*copy)) break;
+    if (!run(*copy)) return false;
   }
-  static_cast<void>(removeEach("waiting", events) && run("COMMIT"));
-  recount();
+  return true;
 }
 
 void EventSpool::countRefusal(const SpooledEvent& event) {
@@ -231,14 +254,28 @@ void EventSpool::countRefusal(const SpooledEvent& event) {
 
 void EventSpool::clear() {
   const std::lock_guard lock(mutex_);
-  static_cast<void>(
-      run("PRAGMA secure_delete = ON; BEGIN IMMEDIATE; DELETE FROM waiting; DELETE FROM refused;"
-          "COMMIT; PRAGMA secure_delete = OFF; PRAGMA wal_checkpoint(TRUNCATE)"));
+  std::error_code ignored;
+  for (const char* suffix : {"", "-wal"}) fs::remove(path_ + besideSuffix + suffix, ignored);
+  mustClear_ = true;
+  static_cast<void>(isCleared());
+}
+
+// Whether a `clear` has been obeyed, which is tried again here.
+bool EventSpool::isCleared() {
+  if (!mustClear_) return true;
+  if (!insert_) open();
+  mustClear_ = !run(
+      "PRAGMA secure_delete = ON; BEGIN IMMEDIATE; DELETE FROM waiting; DELETE FROM refused;"
+      "COMMIT; PRAGMA secure_delete = OFF");
+  if (!mustClear_) static_cast<void>(run("PRAGMA wal_checkpoint(TRUNCATE)"));
   recount();
+  return !mustClear_;
 }
 
 void EventSpool::checkpoint() {
-  // A connection of its own, so that nobody waits for the disk behind the mutex.
+  // A connection of its own, so that nobody waits for the disk behind the mutex. It must not make a
+  // file that others can read.
+  if (std::error_code ignored; !fs::exists(path_, ignored)) return;
   auto database = Database::open(path_, Database::Access::readWrite);
   if (database) static_cast<void>(database->execute("PRAGMA wal_checkpoint(PASSIVE)"));
 }
@@ -260,6 +297,13 @@ void EventSpool::recount() {
                "SELECT total(length(hit)) FROM"
                " (SELECT hit FROM waiting UNION ALL SELECT hit FROM refused)")
                .value_or(0);
+}
+
+// Another process may have added events, or delivered ours.
+void EventSpool::recountIfShared() {
+  const auto changes = number("PRAGMA data_version");
+  if (!changes || std::exchange(foreignChanges_, *changes) == *changes) return;
+  recount();
 }
 
 // A full spool loses a hundredth at a time, so that most events find room without a search.

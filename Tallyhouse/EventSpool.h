@@ -41,8 +41,9 @@ struct SpooledEvent final {
 /// other, and is tried alone until it is set aside for good. All of them count towards the limits.
 ///
 /// Any thread. Nothing throws: what goes wrong with the file is told to the system's log once, and
-/// the events that it would have held count as dropped. A damaged file is put beside (".damaged")
-/// and a new one begun. Two processes may share a file; an event may then be delivered by both.
+/// the events that it would have held count as dropped; a file that cannot be opened is tried again
+/// now and then. A damaged file is put beside (".damaged") and a new one begun. Two processes may
+/// share a file; an event may then be delivered by both.
 class EventSpool final {
  public:
   struct Ports {
@@ -65,13 +66,15 @@ class EventSpool final {
   /// The oldest event refused less than `triesOfRefused` times.
   [[nodiscard]] std::optional<SpooledEvent> refused(int triesOfRefused);
 
-  void removeWaiting(std::span<const SpooledEvent> events);
-  void removeRefused(const SpooledEvent& event);
+  /// Whether they are gone.
+  [[nodiscard]] bool removeWaiting(std::span<const SpooledEvent> events);
+  [[nodiscard]] bool removeRefused(const SpooledEvent& event);
   /// Takes the events out of the line as refused once.
   void moveToRefused(std::span<const SpooledEvent> events);
   void countRefusal(const SpooledEvent& event);
 
-  /// Empties the spool.
+  /// Empties the spool, and removes what was put beside. While the file does not allow it, nothing
+  /// that it holds is given out and nothing is taken.
   void clear();
 
   /// Moves what was appended into the file proper. Takes as long as the disk does; `append` does
@@ -92,9 +95,12 @@ class EventSpool final {
   // All of these are called with the mutex held.
   void open();
   [[nodiscard]] std::optional<Varnel::Platform::PlatformError> tryToOpen();
-  [[nodiscard]] bool isSound();
+  [[nodiscard]] std::optional<Varnel::Platform::PlatformError> damage();
   void putAside();
+  [[nodiscard]] bool isCleared();
   void recount();
+  void recountIfShared();
+  [[nodiscard]] bool copyToRefused(std::span<const SpooledEvent> events);
   void makeRoom(std::int64_t bytes);
   void drop(std::int64_t count);
   [[nodiscard]] std::int64_t removeOldest(const char* table, std::int64_t count);
@@ -115,7 +121,9 @@ class EventSpool final {
   std::int64_t waitingEvents_ = 0;
   std::int64_t refusedEvents_ = 0;
   std::int64_t bytes_ = 0;
+  std::int64_t foreignChanges_ = 0;  ///< A number that the other connections' changes change.
   std::int64_t unsavedDropped_ = 0;
+  bool mustClear_ = false;
   bool hasReported_ = false;
 };
 

@@ -47,7 +47,7 @@ class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
     Varnel::Platform::URL endpoint;
     std::string trackingID;  ///< The property that counts the events.
     std::string clientID;    ///< The installation that sends them.
-    std::string spoolPath;   ///< Made readable by the user alone, its folder included.
+    std::string spoolPath;   ///< The user's alone. Missing folders are made.
     PlainHTTP plainHTTP = PlainHTTP::refused;
     std::int64_t mostEvents = 10'000;  ///< That may wait; then the oldest is dropped.
     std::int64_t mostBytes = 8 << 20;
@@ -67,7 +67,7 @@ class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
   void discardAll() noexcept override;
 
   /// Sends what waits without lingering, and waits for it: until all is delivered, an attempt
-  /// fails, or the time is over. Returns whether all is delivered.
+  /// fails, or the time is over. Returns whether all is delivered; false without consent.
   bool drain(std::chrono::milliseconds timeout);
 
   /// Events that the spool could not hold, since its file was begun.

@@ -114,6 +114,18 @@ TEST_F(DeliveryTest, AServerThatRefusesEverythingIsNotHammered) {
   EXPECT_LT(http.posts().size(), 60u);
 }
 
+TEST_F(DeliveryTest, WhatArrivedButCannotBeRemovedIsNotRepeatedAtOnce) {
+  append(20);
+  using Database = Varnel::Platform::SQLiteDatabase;
+  auto other = Database::open(path(), Database::Access::readWrite);
+  ASSERT_FALSE(other->execute("BEGIN IMMEDIATE"));
+  EXPECT_GT(delivery.step(Delivery::Haste::none, {}), clock.now());
+  ASSERT_FALSE(other->execute("ROLLBACK"));
+  run(1h);
+  EXPECT_EQ(http.posts().size(), 2u);
+  EXPECT_EQ(namesOf(*spool), "");
+}
+
 TEST_F(DeliveryTest, AfterAStopNothingIsSent) {
   append(20);
   std::stop_source stop;

@@ -18,6 +18,22 @@ using EventSpoolTest = Tests::SpoolFixture;
 
 constexpr std::size_t many = 1000;
 
+// What another process does with the file, until its end.
+class Lock final {
+ public:
+  using Database = Varnel::Platform::SQLiteDatabase;
+
+  Lock(const std::string& path, const std::string& sql)
+      : database_(Database::open(path, Database::Access::readWrite).value()) {
+    const auto error = database_->execute(sql);
+    EXPECT_FALSE(error) << error->localizedDescription();
+  }
+  void end() { database_.reset(); }
+
+ private:
+  std::optional<Database> database_;
+};
+
 TEST_F(EventSpoolTest, KeepsWhatItTookInOrderAndForItsOwnerAlone) {
   {
     const auto spool = openSpool();
@@ -48,7 +64,7 @@ TEST_F(EventSpoolTest, WhatIsRefusedLeavesTheLineAndIsSetAsideAtLast) {
   ASSERT_EQ(spool->refused(3)->uuid, "a");
   spool->countRefusal(*spool->refused(3));
   EXPECT_EQ(spool->refused(3)->uuid, "b") << "each gets its next try in turn";
-  spool->removeRefused(*spool->refused(3));
+  EXPECT_TRUE(spool->removeRefused(*spool->refused(3)));
   spool->countRefusal(*spool->refused(3));
   EXPECT_FALSE(spool->refused(3));
   EXPECT_FALSE(spool->backlog(3).hasRefused);
@@ -79,7 +95,7 @@ TEST_F(EventSpoolTest, ABatchThatWasClearedMeanwhileTakesNoNewEventWithIt) {
   const auto batch = spool->waiting(many, many);
   spool->clear();
   append(*spool, {"c", "d"});
-  spool->removeWaiting(batch);
+  EXPECT_TRUE(spool->removeWaiting(batch));
   spool->moveToRefused(batch);
   EXPECT_EQ(namesOf(*spool), "c d ");
   EXPECT_FALSE(spool->refused(3));
@@ -93,6 +109,8 @@ TEST_F(EventSpoolTest, ADamagedFileIsPutBesideAndAnUnusableFolderOnlyCounts) {
     append(*spool, {"a"});
     EXPECT_EQ(namesOf(*spool), "a ");
     EXPECT_TRUE(fs::exists(path() + ".damaged"));
+    spool->clear();
+    EXPECT_FALSE(fs::exists(path() + ".damaged"));
   }
   std::ofstream(folder.path() / "file") << "no folder";
   EventSpool lost({*files, log}, (folder.path() / "file/Analytics.db").string(), {});
@@ -101,6 +119,47 @@ TEST_F(EventSpoolTest, ADamagedFileIsPutBesideAndAnUnusableFolderOnlyCounts) {
   EXPECT_EQ(namesOf(lost), "");
   const std::string text = log.text();
   EXPECT_EQ(std::count(text.begin(), text.end(), '\n'), 1) << text;
+}
+
+TEST_F(EventSpoolTest, AFileThatIsLockedOnlyDelays) {
+  append(*openSpool(), {"a", "b"});
+  Lock lock(path(), "PRAGMA locking_mode = EXCLUSIVE; BEGIN EXCLUSIVE");
+  const auto late = openSpool();
+  EXPECT_EQ(namesOf(*late), "");
+  lock.end();
+  append(*late, {"c"});
+  EXPECT_EQ(namesOf(*late), "a b c ") << "the file was not taken for damaged";
+  EXPECT_EQ(late->droppedCount(), 0);
+
+  Lock writing(path(), "BEGIN IMMEDIATE");
+  EXPECT_FALSE(late->removeWaiting(late->waiting(1, many)));
+  late->moveToRefused(late->waiting(1, many));
+  EXPECT_EQ(namesOf(*late), "a b c ");
+  late->clear();
+  EXPECT_FALSE(late->backlog(3).oldest) << "what is to be forgotten is not sent";
+  writing.end();
+  append(*late, {"d"});
+  EXPECT_EQ(namesOf(*late), "d ");
+}
+
+TEST_F(EventSpoolTest, WhatIsRefusedIsNotLostWhenItCannotBeMoved) {
+  const auto spool = openSpool();
+  append(*spool, {"a", "b"});
+  Lock other(path(),
+             "CREATE TRIGGER full BEFORE INSERT ON refused WHEN NEW.uuid = 'b'"
+             " BEGIN SELECT RAISE(ABORT, 'full'); END");
+  spool->moveToRefused(spool->waiting(many, many));
+  EXPECT_EQ(namesOf(*spool), "a b ");
+  EXPECT_FALSE(spool->refused(3));
+}
+
+TEST_F(EventSpoolTest, TheLimitsHoldForAllThatShareAFile) {
+  const auto one = openSpool({.events = 4, .bytes = 1000});
+  const auto other = openSpool({.events = 4, .bytes = 1000});
+  append(*one, {"a", "b", "c"});
+  EXPECT_EQ(other->backlog(3).waiting, 3);
+  append(*other, {"d", "e"});
+  EXPECT_EQ(namesOf(*other), "b c d e ");
 }
 
 TEST_F(EventSpoolTest, ThreadsAndProcessesMayShareAFile) {
@@ -117,7 +176,7 @@ TEST_F(EventSpoolTest, ThreadsAndProcessesMayShareAFile) {
   std::size_t removed = 0;
   while (removed < 2 * each) {
     const auto batch = one->waiting(20, many);
-    one->removeWaiting(batch);
+    EXPECT_TRUE(one->removeWaiting(batch));
     removed += batch.size();
     one->checkpoint();
   }
