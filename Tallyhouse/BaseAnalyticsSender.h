@@ -22,7 +22,8 @@ namespace Tallyhouse {
 ///     };
 ///     WindowSender(tracker).trackEvent("Close", RouterActionSenderKind::menuItem);
 ///
-/// Any thread, if what a class overrides allows it. Nothing waits for the network.
+/// Any thread, if what a class overrides allows it. Nothing waits for the network. The tracker is
+/// not null.
 class VARNEL_API BaseAnalyticsSender {
  public:
   explicit BaseAnalyticsSender(std::shared_ptr<AnalyticsTracker> tracker);
