@@ -6,6 +6,7 @@
 #include <sys/xattr.h>
 #include <unistd.h>
 
+#include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <nlohmann/json.hpp>
@@ -58,12 +59,18 @@ class Orvane : public ::testing::Test {
     std::vector<char*> pointers;
     for (std::string& argument : arguments) pointers.push_back(argument.data());
     pointers.push_back(nullptr);
-    std::string home = "HOME=" + scratch_.path();
-    char* environment[] = {home.data(), nullptr};
+    std::vector<std::string> environment = {"HOME=" + scratch_.path()};
+    // A sanitizer keeps to the settings of the test in the program too.
+    for (const char* name : {"TSAN_OPTIONS", "ASAN_OPTIONS", "LSAN_OPTIONS"})
+      if (const char* value = std::getenv(name))
+        environment.push_back(std::string(name) + "=" + value);
+    std::vector<char*> variables;
+    for (std::string& variable : environment) variables.push_back(variable.data());
+    variables.push_back(nullptr);
     pid_t process = -1;
-    EXPECT_EQ(
-        ::posix_spawn(&process, ORVANE_PROGRAM, &actions, nullptr, pointers.data(), environment),
-        0);
+    EXPECT_EQ(::posix_spawn(&process, ORVANE_PROGRAM, &actions, nullptr, pointers.data(),
+                            variables.data()),
+              0);
     posix_spawn_file_actions_destroy(&actions);
     if (pipe[1] >= 0) ::close(pipe[1]);
     int status = 0;
