@@ -145,7 +145,8 @@ void NotificationStore::schedule(const UserNotification& notification, Date now,
 
 std::vector<NotificationSchedule> NotificationStore::schedules() {
   std::vector<NotificationSchedule> schedules;
-  file_.read([&](SQLiteDatabase& database) { return readSchedules(database, schedules); });
+  isOutOfOrder_ =
+      !file_.read([&](SQLiteDatabase& database) { return readSchedules(database, schedules); });
   return schedules;
 }
 

@@ -39,6 +39,8 @@ class NotificationStore final {
   /// Keeps a schedule in the place of one with the same identifier.
   void schedule(const UserNotification& notification, Date now, const Calendar& calendar);
   [[nodiscard]] std::vector<NotificationSchedule> schedules();
+  /// Whether the schedules could not be read the last time, so that there may be some.
+  [[nodiscard]] bool isOutOfOrder() const { return isOutOfOrder_; }
   void removeSchedule(const std::string& key);
 
   /// Moves what is due to the delivered list, the earliest first. Each delivery is claimed by one
@@ -54,6 +56,7 @@ class NotificationStore final {
 
  private:
   NotificationStoreFile file_;
+  bool isOutOfOrder_ = false;
 };
 
 }  // namespace Varnel::Platform

@@ -22,6 +22,11 @@ bool isDamage(const PlatformError& error) {
   return code == SQLITE_CORRUPT || code == SQLITE_NOTADB;
 }
 
+// Another process is at work in the file, longer than anybody waits.
+bool isBusy(const PlatformError& error) {
+  return (error.code() & resultCodeMask) == SQLITE_BUSY;
+}
+
 // Nobody else may read what the user is told, nor files that stand beside it for a while.
 void makeForUserAlone(const fs::path& file) {
   std::error_code ignored;
@@ -72,25 +77,23 @@ NotificationStoreFile::NotificationStoreFile(fs::path file, std::string schema,
     : file_(std::move(file)), schema_(std::move(schema)), systemLog_(systemLog) {}
 
 bool NotificationStoreFile::read(const Work& work) {
-  ensureOpen();
-  auto error = work(*database_);
-  if (error && isDamage(*error)) {
-    setAside();
-    error = work(*database_);
-  }
+  const auto error = attempt(work);
   if (error) report("Cannot read notifications", *error);
   return !error;
 }
 
 bool NotificationStoreFile::change(const Work& work) {
-  ensureOpen();
-  auto error = transaction(*database_, work);
-  if (error && isDamage(*error)) {
-    setAside();
-    error = transaction(*database_, work);
-  }
+  const auto error = attempt([&](SQLiteDatabase& database) { return transaction(database, work); });
   if (error) report("Cannot keep notifications", *error);
   return !error;
+}
+
+std::optional<PlatformError> NotificationStoreFile::attempt(const Work& work) {
+  if (auto error = ensureOpen()) return error;
+  auto error = work(*database_);
+  if (!error || !isDamage(*error)) return error;
+  if (auto failure = setAside()) return failure;
+  return work(*database_);
 }
 
 std::optional<PlatformError> NotificationStoreFile::open() {
@@ -104,20 +107,19 @@ std::optional<PlatformError> NotificationStoreFile::open() {
   return std::nullopt;
 }
 
-void NotificationStoreFile::ensureOpen() {
-  if (database_) return;
+std::optional<PlatformError> NotificationStoreFile::ensureOpen() {
+  // Another process may have set the file aside, or the user removed it.
+  if (database_ && !database_->hasMoved()) return std::nullopt;
   const auto error = open();
-  if (!error) return;
-  if (isDamage(*error))
-    setAside();
-  else
-    useMemory(*error);
+  if (!error) return std::nullopt;
+  return isDamage(*error) ? setAside() : doWithout(*error);
 }
 
-void NotificationStoreFile::setAside() {
+std::optional<PlatformError> NotificationStoreFile::setAside() {
   // Another process may have done so meanwhile: then the file is sound again.
   auto error = open();
-  if (!error) return;
+  if (!error) return std::nullopt;
+  if (!isDamage(*error)) return doWithout(*error);
   fs::path aside = file_;
   aside += ".damaged";
   report("Set aside the damaged store of notifications as " + aside.string(), *error);
@@ -126,13 +128,15 @@ void NotificationStoreFile::setAside() {
   fs::path journal = file_;
   fs::remove(journal += "-journal", ignored);
   error = open();
-  if (error) useMemory(*error);
+  return error ? doWithout(*error) : std::nullopt;
 }
 
-void NotificationStoreFile::useMemory(const PlatformError& reason) {
+std::optional<PlatformError> NotificationStoreFile::doWithout(const PlatformError& reason) {
+  // The next attempt may find the file free.
+  if (isBusy(reason)) return reason;
   report("Notifications are kept in memory alone", reason);
   database_ = std::move(*SQLiteDatabase::open(":memory:"));
-  static_cast<void>(database_->execute(schema_));
+  return database_->execute(schema_);
 }
 
 void NotificationStoreFile::report(const std::string& what, const PlatformError& error) const {

@@ -16,7 +16,9 @@ class SystemLog;
 ///
 /// A damaged file is set aside (with ".damaged" behind its name) and a fresh one made; where no
 /// file can be had at all, memory serves as long as the object lives. Both are told to the system's
-/// log. One thread at a time; several processes may share the file.
+/// log. A file that somebody else renamed or removed is made anew; one that another process keeps
+/// locked makes the work fail, to be tried again. One thread at a time; several processes may share
+/// the file.
 class NotificationStoreFile final {
  public:
   using Work = std::function<std::optional<PlatformError>(SQLiteDatabase&)>;
@@ -30,10 +32,13 @@ class NotificationStoreFile final {
   bool change(const Work& work);
 
  private:
-  [[nodiscard]] std::optional<PlatformError> open();
-  void ensureOpen();
-  void setAside();
-  void useMemory(const PlatformError& reason);
+  using Failure = std::optional<PlatformError>;  ///< None when there is a database to work with.
+
+  [[nodiscard]] std::optional<PlatformError> attempt(const Work& work);
+  [[nodiscard]] Failure open();
+  [[nodiscard]] Failure ensureOpen();
+  [[nodiscard]] Failure setAside();
+  [[nodiscard]] Failure doWithout(const PlatformError& reason);
   void report(const std::string& what, const PlatformError& error) const;
 
   const std::filesystem::path file_;

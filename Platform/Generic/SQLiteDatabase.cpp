@@ -61,4 +61,10 @@ std::int64_t SQLiteDatabase::changedRows() const {
   return ::sqlite3_changes64(connection_.get());
 }
 
+bool SQLiteDatabase::hasMoved() const {
+  int moved = 0;
+  ::sqlite3_file_control(connection_.get(), "main", SQLITE_FCNTL_HAS_MOVED, &moved);
+  return moved != 0;
+}
+
 }  // namespace Varnel::Platform

@@ -50,6 +50,9 @@ class SQLiteDatabase final {
   /// The number of rows that the last INSERT, UPDATE or DELETE touched.
   [[nodiscard]] std::int64_t changedRows() const;
 
+  /// Whether the file has been renamed, replaced or removed since it was opened.
+  [[nodiscard]] bool hasMoved() const;
+
  private:
   static void close(sqlite3* connection);
   static Result<SQLiteDatabase> opened(sqlite3* connection, int status);

@@ -168,7 +168,9 @@ void ScheduledNotificationCenter::awaitNext() {
         next = date;
   }
   // What is due and still there could not be claimed: the store is out of order for now.
-  if (next && *next <= ports_.clock.now()) next = ports_.clock.now() + retryDelay;
+  const Date now = ports_.clock.now();
+  const bool isOutOfOrder = !delegate_.expired() && store_->isOutOfOrder();
+  if (isOutOfOrder || (next && *next <= now)) next = now + retryDelay;
   if (next)
     ports_.timer.arm(*next);
   else

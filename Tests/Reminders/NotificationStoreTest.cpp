@@ -127,6 +127,34 @@ TEST_F(NotificationStoreTest, SetsADamagedFileAsideAndGoesOn) {
   EXPECT_THAT(NotificationStore(file, log).schedules(), SizeIs(1));
 }
 
+TEST_F(NotificationStoreTest, FollowsAFileThatIsReplacedWhileItIsOpen) {
+  NotificationStore store(file, log);
+  store.schedule(weekly(), start, calendar);
+  fs::rename(file, file.string() + ".damaged");  // As another process sets it aside.
+  NotificationStore other(file, log);
+  other.schedule(weekly("other"), start, calendar);
+  ASSERT_THAT(store.schedules(), SizeIs(1));
+  EXPECT_EQ(store.schedules().front().notification.identifier, "other");
+  EXPECT_EQ(store.claimDue(start, calendar).size() + other.claimDue(start, calendar).size(), 1u);
+  fs::remove(file);
+  store.schedule(weekly(), start, calendar);
+  EXPECT_THAT(other.schedules(), SizeIs(1));
+  EXPECT_EQ(log.text(), "");
+}
+
+TEST_F(NotificationStoreTest, AFileThatIsLockedForLongIsTriedAgain) {
+  NotificationStore(file, log).schedule(weekly(), start, calendar);
+  NotificationStore store(file, log);
+  auto holder = SQLiteDatabase::open(file.string());
+  ASSERT_FALSE(holder->execute("BEGIN EXCLUSIVE"));
+  EXPECT_THAT(store.schedules(), IsEmpty());
+  EXPECT_TRUE(store.isOutOfOrder());
+  ASSERT_FALSE(holder->execute("COMMIT"));
+  EXPECT_THAT(store.schedules(), SizeIs(1));
+  EXPECT_FALSE(store.isOutOfOrder());
+  EXPECT_FALSE(fs::exists(file.string() + ".damaged"));
+}
+
 TEST_F(NotificationStoreTest, ServesFromMemoryWhereNoFileCanBe) {
   std::ofstream(folder.path() / "made") << "a file where the folder should be";
   NotificationStore store(file, log);

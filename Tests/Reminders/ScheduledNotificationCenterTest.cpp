@@ -211,6 +211,19 @@ TEST_F(ScheduledNotificationCenterTest, AMissingServerOrAGoneDelegateLosesNoSche
   EXPECT_THAT(process.server.history(), SizeIs(2));
 }
 
+TEST_F(ScheduledNotificationCenterTest, AStoreThatIsLockedWhenTheTimeComesDelaysTheDelivery) {
+  process.listen();
+  process.center.scheduleNotification(weekly());
+  auto holder = SQLiteDatabase::open(file.string());
+  ASSERT_FALSE(holder->execute("BEGIN EXCLUSIVE"));
+  process.timer.advanceTo(start + week);
+  EXPECT_THAT(process.server.history(), IsEmpty());
+  ASSERT_FALSE(holder->execute("COMMIT"));
+  process.timer.advanceTo(start + week + 1min);
+  EXPECT_THAT(process.server.history(), SizeIs(1));
+  EXPECT_EQ(process.timer.armedDate(), start + 2 * week);
+}
+
 TEST_F(ScheduledNotificationCenterTest, AnIdentifierStandsForOneNotificationOfEachList) {
   process.listen();
   process.center.scheduleNotification(weekly());
