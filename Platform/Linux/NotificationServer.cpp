@@ -88,9 +88,15 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
   }
 
   void hasShown(const Key& key, const BannerAddress& address) {
-    // It was closed or shown anew before the server had answered.
-    if (!isCurrent(key)) return bus_.send(closeRequest(address));
-    shown_[key.token].address = address;
+    const auto shown = shown_.find(key.token);
+    // It was closed before the server had answered.
+    if (shown == shown_.end()) return bus_.send(closeRequest(address));
+    const auto earlier = std::exchange(shown->second.address, address);
+    if (earlier && earlier->bus == address.bus && earlier->server == address.server &&
+        earlier->number != address.number)
+      bus_.send(closeRequest(*earlier));
+    // It is being shown anew, in the place of this one.
+    if (!isCurrent(key)) return;
     if (const auto told = observer.lock()) told->bannerShown(key.token, address.reference());
   }
 
