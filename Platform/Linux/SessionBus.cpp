@@ -42,6 +42,10 @@ void release(gpointer signal) noexcept {
 SessionBus::SessionBus(Signal signal) : signal_(std::move(signal)) {}
 
 SessionBus::~SessionBus() {
+  unsubscribe();
+}
+
+void SessionBus::unsubscribe() {
   if (connection_) g_dbus_connection_signal_unsubscribe(connection_.get(), subscription_);
 }
 
@@ -61,6 +65,8 @@ std::string SessionBus::connect() {
   UniqueHandle<GDBusConnection*, disconnect> connection(
       g_dbus_connection_new_for_address_sync(address.get(), flags, nullptr, nullptr, &error));
   if (!connection) return take(error);
+  // A signal of the lost connection may still be on its way to us.
+  unsubscribe();
   connection_ = std::move(connection);
   subscription_ = g_dbus_connection_signal_subscribe(
       connection_.get(), notificationService, notificationService, nullptr, notificationPath,

@@ -39,6 +39,7 @@ class SessionBus final {
 
  private:
   static void disconnect(GDBusConnection* connection);
+  void unsubscribe();
 
   const Signal signal_;
   UniqueHandle<GDBusConnection*, disconnect> connection_;
