@@ -18,8 +18,7 @@ class UserLocale;
 ///
 ///     const Calendar calendar("de_AT", "Europe/Vienna");
 ///     calendar.adding({.month = 1}, date);     // the same wall-clock time a month later
-///     calendar.adding({.month = 1}, date, 3);  // three months: the end of January gives that of
-///     April
+///     calendar.adding({.month = 1}, date, 3);  // three months: 31 January gives 30 April
 ///
 /// Years, months and days keep the wall-clock time: one that the zone skips moves forward by what
 /// was skipped, and of one that comes twice the first is meant. Hours and smaller are lengths of
