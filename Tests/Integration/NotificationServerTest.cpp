@@ -168,23 +168,21 @@ TEST(NotificationServer, ADismissedBannerLeavesTheDeliveredList) {
   EXPECT_THAT(host.sent->events(), IsEmpty());
 }
 
-TEST(NotificationServer, ManyDeliveriesInARowLeaveTheLatestBanner) {
+TEST(NotificationServer, ADeliveryWhileTheLastIsOnItsWayKeepsTheBanner) {
   Server server;
   Host host("rapid");
   host.center.deliverNotification(host.reminderIn(0s));
   host.awaitReferences();
-  for (int i = 0; i < 30; ++i) {
-    auto notification = host.reminderIn(0s);
-    notification.title = "Number " + std::to_string(i);
-    host.center.deliverNotification(notification);
-    if (i % 3 != 0 && Tests::isReadable(*host.queue->descriptor(), 50ms)) host.queue->drain();
+  // Each time a step later on the way of the messages.
+  for (int steps = 0; steps < 10; ++steps) {
+    host.center.deliverNotification(host.reminderIn(0s));
+    for (int step = 0; step < steps; ++step)
+      if (Tests::isReadable(*host.queue->descriptor(), 20ms)) host.queue->drain();
+    host.center.deliverNotification(host.reminderIn(0s));
+    host.awaitReferences();
+    ASSERT_EQ(Server::displayedCount(), "1\n") << steps;
+    ASSERT_FALSE(testing::Test::HasFailure()) << steps;
   }
-  host.awaitReferences();
-  EXPECT_EQ(Server::displayedCount(), "1\n");
-  outputOf("dunstctl close");
-  EXPECT_TRUE(
-      Tests::drainUntil(*host.queue, [&] { return host.center.deliveredNotifications().empty(); }));
-  EXPECT_THAT(outputOf("dunstctl history"), HasSubstr("Number 29"));
 }
 
 TEST(NotificationServer, ALostServerCostsTheBannerAlone) {
