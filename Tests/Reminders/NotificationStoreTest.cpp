@@ -3,6 +3,9 @@
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <signal.h>
+#include <sys/wait.h>
+#include <unistd.h>
 
 #include <array>
 #include <atomic>
@@ -153,6 +156,22 @@ TEST_F(NotificationStoreTest, AFileThatIsLockedForLongIsTriedAgain) {
   EXPECT_THAT(store.schedules(), SizeIs(1));
   EXPECT_FALSE(store.isOutOfOrder());
   EXPECT_FALSE(fs::exists(file.string() + ".damaged"));
+}
+
+TEST_F(NotificationStoreTest, AKilledProcessLosesNothingAndLocksNobodyOut) {
+  const pid_t process = ::fork();
+  ASSERT_GE(process, 0);
+  if (process == 0) {
+    NotificationStore(file, log).schedule(weekly(), start, calendar);
+    auto database = SQLiteDatabase::open(file.string());
+    static_cast<void>(database->execute("BEGIN EXCLUSIVE; DELETE FROM scheduled"));
+    ::kill(::getpid(), SIGKILL);
+  }
+  int status = 0;
+  ASSERT_EQ(::waitpid(process, &status, 0), process);
+  ASSERT_TRUE(WIFSIGNALED(status));
+  EXPECT_THAT(NotificationStore(file, log).claimDue(start, calendar), SizeIs(1));
+  EXPECT_EQ(log.text(), "");
 }
 
 TEST_F(NotificationStoreTest, ServesFromMemoryWhereNoFileCanBe) {
