@@ -3,9 +3,11 @@
 
 #include <string_view>
 
+#include <Platform/Api.h>
+
 namespace Varnel::Platform {
 
 /// Whether the bytes are text in UTF-8, in its shortest form and without surrogates. Any thread.
-[[nodiscard]] bool isValidUTF8(std::string_view bytes);
+[[nodiscard]] VARNEL_API bool isValidUTF8(std::string_view bytes);
 
 }  // namespace Varnel::Platform

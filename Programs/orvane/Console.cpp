@@ -3,11 +3,13 @@
 
 #include <utility>
 
+#include <Platform/Text/VisibleText.h>
 #include <orvane/StandardStreams.h>
-#include <orvane/VisibleText.h>
 
 namespace Orvane {
 namespace {
+
+using Varnel::Platform::visibleText;
 
 constexpr std::string_view eraseLine = "\r\x1b[K";
 
@@ -20,7 +22,7 @@ void Console::print(std::string_view text) {
 }
 
 void Console::complain(std::string_view message) {
-  print("orvane: " + visibleText(message) + "\n");
+  print("orvane: " + visibleText(std::string(message)) + "\n");
 }
 
 bool Console::writeResult(std::string_view text) {

@@ -4,15 +4,16 @@
 #include <nlohmann/json.hpp>
 #include <string>
 
+#include <Platform/Text/VisibleText.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
 #include <orvane/Console.h>
-#include <orvane/VisibleText.h>
 
 namespace Orvane {
 namespace {
 
 using Varnel::OVDiskInfo;
 using Varnel::OVDiskKind;
+using Varnel::Platform::visibleText;
 
 std::string nameOf(OVDiskKind kind) {
   switch (kind) {

@@ -4,9 +4,11 @@
 #include <nlohmann/json.hpp>
 #include <utility>
 
-#include <orvane/VisibleText.h>
+#include <Platform/Text/VisibleText.h>
 
 namespace Orvane {
+
+using Varnel::Platform::visibleText;
 
 void FactList::add(std::string key, std::string label, std::optional<std::string> value) {
   facts_.push_back({std::move(key), std::move(label), std::move(value)});

@@ -15,7 +15,6 @@
 #include <Varnel/Provenance/KVQuarantine.h>
 #include <orvane/Console.h>
 #include <orvane/FactList.h>
-#include <orvane/VisibleText.h>
 
 namespace Orvane {
 namespace {
@@ -80,7 +79,7 @@ int OriginCommand::run(Console& console) const {
   std::error_code failed;
   if (!file.empty() && !std::filesystem::exists(file, failed)) {
     console.complain(
-        visibleText(file) + ": " +
+        file + ": " +
         (failed ? failed : std::make_error_code(std::errc::no_such_file_or_directory)).message());
     return 1;
   }

@@ -1,11 +1,13 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/PathCommand.h>
 
+#include <Platform/Text/VisibleText.h>
 #include <Varnel/Paths/QNURLResolver.h>
 #include <orvane/Console.h>
-#include <orvane/VisibleText.h>
 
 namespace Orvane {
+
+using Varnel::Platform::visibleText;
 
 int PathCommand::run(Console& console) const {
   const auto& resolver = Varnel::QNURLResolver::shared();

@@ -8,14 +8,15 @@
 #include <Platform/Ports/UserDefaults.h>
 #include <Platform/Ports/UserNotificationCenter.h>
 #include <Platform/Text/DateFormatter.h>
+#include <Platform/Text/VisibleText.h>
 #include <Varnel/Reminders/SchedulePeriodOptionBox.h>
-#include <orvane/VisibleText.h>
 
 namespace Orvane {
 namespace {
 
 using Varnel::SchedulePeriodOption;
 using Varnel::Platform::UserNotification;
+using Varnel::Platform::visibleText;
 
 constexpr const char* periodKey = "schedulePeriod";
 

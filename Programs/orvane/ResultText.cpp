@@ -5,10 +5,11 @@
 #include <nlohmann/json.hpp>
 
 #include <Platform/Text/ByteCountFormatter.h>
+#include <Platform/Text/UTF8.h>
+#include <Platform/Text/VisibleText.h>
 #include <Platform/Values/URL.h>
 #include <Varnel/Paths/QNURLResolver.h>
 #include <orvane/Scan/ScanResult.h>
-#include <orvane/VisibleText.h>
 
 namespace Orvane {
 namespace {
@@ -16,6 +17,7 @@ namespace {
 using Varnel::Platform::ByteCountFormatter;
 using Varnel::Platform::ByteCountStyle;
 using Varnel::Platform::URL;
+using Varnel::Platform::visibleText;
 
 std::string counted(std::uint64_t count, const char* singular, const char* plural) {
   return std::to_string(count) + " " + (count == 1 ? singular : plural);
@@ -42,7 +44,7 @@ std::string summary(const ScanTotals& totals, std::size_t groups, const std::str
 
 nlohmann::ordered_json jsonOf(const DuplicateGroup& group) {
   nlohmann::ordered_json json = {{"size", group.size}, {"paths", group.paths}};
-  if (!std::all_of(group.paths.begin(), group.paths.end(), isUTF8)) {
+  if (!std::all_of(group.paths.begin(), group.paths.end(), Varnel::Platform::isValidUTF8)) {
     nlohmann::ordered_json& urls = json["urls"] = nlohmann::ordered_json::array();
     for (const std::string& path : group.paths)
       urls.push_back(URL::fileURLWithPath(path).absoluteString());

@@ -1,18 +1,24 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Logging/LoggedError.h>
 
+#include <Platform/Text/VisibleText.h>
 #include <Varnel/Logging/CustomLogStringConvertible.h>
 #include <Varnel/Logging/ErrorBridging.h>
 
 namespace Varnel {
 namespace {
 
+// Descriptions often quote file names, which nobody has looked at.
+std::string visibleLogDescription(const Platform::PlatformError& error) {
+  return Platform::visibleText(logDescription(error), Platform::Backslashes::kept);
+}
+
 // The text of the error itself where it has one, else that of its platform error.
 template <typename Polymorphic, typename Bridge>
 std::string logDescriptionOf(const Polymorphic& error, Bridge bridge) {
   if (const auto* own = dynamic_cast<const CustomLogStringConvertible*>(&error))
     return own->logDescription();
-  return logDescription(bridge(error));
+  return visibleLogDescription(bridge(error));
 }
 
 }  // namespace
@@ -25,7 +31,7 @@ LoggedError::LoggedError(const Error& error)
 
 LoggedError::LoggedError(const Platform::PlatformError& error)
     : typeName_("PlatformError"),
-      logDescription_(Varnel::logDescription(error)),
+      logDescription_(visibleLogDescription(error)),
       description_(error.description()) {}
 
 LoggedError::LoggedError(const std::exception& exception) {

@@ -37,7 +37,8 @@ class VARNEL_API LoggedError final {
   /// standard type.
   [[nodiscard]] const std::string& typeName() const { return typeName_; }
 
-  /// The error's own text for the log, or "NSError: " and the description of its platform error.
+  /// The error's own text for the log, or "NSError: " and the description of its platform error, in
+  /// which control characters show escaped.
   [[nodiscard]] const std::string& logDescription() const { return logDescription_; }
 
   /// The error's plain text: its `description()`, or an exception's `what()`.

@@ -13,6 +13,7 @@
 #include <Platform/Ports/StandardOutput.h>
 #include <Platform/Ports/UserAccount.h>
 #include <Platform/Ports/UserLocale.h>
+#include <Platform/Text/VisibleText.h>
 #include <Varnel/Context/Globals.h>
 #include <Varnel/Logging/LogEntry.h>
 #include <Varnel/Logging/LogFileChannel.h>
@@ -91,7 +92,9 @@ void Logger::log(std::string_view message, std::string_view author, const Loggin
                  SourcePosition) {
   std::vector<std::string> items;
   for (const LoggingContextTag& tag : tags)
-    if (auto item = tag.text(*this)) items.push_back(*std::move(item));
+    if (auto item = tag.text(*this))
+      // A file's name must neither drive the terminal nor pass for an entry of its own.
+      items.push_back(Platform::visibleText(*std::move(item), Platform::Backslashes::kept));
   const LogEntry::Buffer buffer =
       LogEntry::text(entryDates_.string(ports_.clock.now()), author, message, items);
   const std::string_view entry(buffer.data(), buffer.size());

@@ -19,6 +19,8 @@ class Logger;
 ///     logger.log("Did finish", "Scanner", {LoggingContextTag::jobDescription("scan"),
 ///                                          LoggingContextTag::location(folder)});
 ///
+/// In the entry control characters show escaped ("\n", "\x1B"): no file name breaks the line.
+///
 /// An immutable value. Errors are kept as the texts they had when the tag was made.
 class VARNEL_API LoggingContextTag final {
  public:

@@ -53,6 +53,14 @@ TEST_F(LoggerTest, WritesTagsOnOneLineBelowTheMessage) {
        "m",
        {Tag::location(URL::fileURLWithPath("/x"))},
        "A:  m" + nextLine + "location: /x\n"},
+      {"A",
+       "my own\n\x1b[1mline",
+       {Tag::location(URL::fileURLWithPath("/a\n[2026-03-14 09:26:39] B:  forged\x1b[2J")),
+        Tag::jobDescription("\t\xc2\x9b\\"),
+        Tag::underlyingError(std::runtime_error("\xe2\x80\xae\xff"))},
+       "A:  my own\n\x1b[1mline" + nextLine +
+           "location: /a\\n[2026-03-14 09:26:39] B:  forged\\x1B[2J, job: \\t\\xC2\\x9B\\, "
+           "underlying error: \\xE2\\x80\\xAE\\xFF\n"},
   };
   for (const Row& row : rows)
     EXPECT_EQ(entryOf([&](Logger& l) { l.log(row.message, row.author, row.tags); }),

@@ -136,6 +136,10 @@ TEST_F(Orvane, ShowsHostileNamesAsWhatTheyAre) {
   EXPECT_THAT(text.output, HasSubstr("/fake\\n\\n9 files of 1 byte\\x1B[2J\n"));
   EXPECT_THAT(text.output, HasSubstr("/\\xFFback\\\\slash\n"));
 
+  folder.write("clear\x1b[2J\n[/file", "");
+  const Outcome log = run({"scan", folder.path("clear\x1b[2J\n[")});
+  EXPECT_THAT(log.errors, AllOf(HasSubstr("/clear\\x1B[2J\\n[\n"), Not(HasSubstr("\x1b"))));
+
   const Outcome json = run({"scan", "--json", folder.path()});
   const auto group = nlohmann::json::parse(json.output)["groups"][0];
   EXPECT_EQ(group["paths"][0], folder.path("fake\n\n9 files of 1 byte\x1b[2J"));
@@ -181,6 +185,7 @@ TEST_F(Orvane, RefusesWrongArgumentsInOneLineAndDoesNothing) {
       {{"scan", missing}, 1, missing},
       {{"scan", folder.path(), missing}, 1, missing},
       {{"scan", file}, 1, file},
+      {{"origin", "back\\slash\n"}, 1, "back\\\\slash\\n: No such"},
   };
   for (const auto& [arguments, status, naming] : cases) {
     const Outcome outcome = run(arguments);

@@ -1,0 +1,74 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Text/VisibleText.h>
+
+#include <unicode/uchar.h>
+#include <unicode/utf8.h>
+
+#include <algorithm>
+#include <cstddef>
+#include <cstdint>
+#include <string_view>
+
+namespace Varnel::Platform {
+namespace {
+
+// An object rather than a function, so that the search has it inline.
+constexpr auto isPlain = [](char c) { return c >= 0x20 && c < 0x7F && c != '\\'; };
+
+/// Whether the character must not reach a terminal as it is; negative ones stand for wrong bytes.
+bool isDeceptive(UChar32 character) {
+  if (character < 0x7F) return character < 0x20;
+  switch (::u_charType(character)) {
+    case U_CONTROL_CHAR:
+    case U_LINE_SEPARATOR:
+    case U_PARAGRAPH_SEPARATOR:
+      return true;
+    default:
+      return ::u_hasBinaryProperty(character, UCHAR_BIDI_CONTROL) || character == 0xFEFF;
+  }
+}
+
+void appendEscaped(std::string& text, std::string_view bytes) {
+  constexpr std::string_view letters = "abtnvfr";  // from 0x07 on
+  constexpr char digits[] = "0123456789ABCDEF";
+  for (const char c : bytes) {
+    const auto byte = static_cast<unsigned char>(c);
+    text += '\\';
+    if (byte >= 0x07 && byte < 0x07 + letters.size()) {
+      text += letters[byte - 0x07u];
+    } else {
+      text += 'x';
+      text += digits[byte >> 4];
+      text += digits[byte & 0xF];
+    }
+  }
+}
+
+}  // namespace
+
+std::string visibleText(std::string text, Backslashes backslashes) {
+  const auto* bytes = reinterpret_cast<const std::uint8_t*>(text.data());
+  const std::string_view whole = text;
+  // Nearly all text is plain, and this stands in the way of whoever logs.
+  const auto special = std::find_if_not(whole.begin(), whole.end(), isPlain);
+  if (special == whole.end()) return text;
+  std::string shown;
+  std::size_t done = 0;  // what `shown` holds of the text
+  auto start = static_cast<std::size_t>(special - whole.begin());
+  for (std::size_t end = start; end < whole.size(); start = end) {
+    UChar32 character = 0;
+    U8_NEXT(bytes, end, whole.size(), character);
+    const bool isDoubled = character == '\\' && backslashes == Backslashes::doubled;
+    if (!isDoubled && !isDeceptive(character)) continue;
+    shown += whole.substr(done, start - done);
+    if (isDoubled)
+      shown += "\\\\";
+    else
+      appendEscaped(shown, whole.substr(start, end - start));
+    done = end;
+  }
+  if (done == 0) return text;
+  return shown += whole.substr(done);
+}
+
+}  // namespace Varnel::Platform

@@ -1,0 +1,26 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+
+#include <Platform/Api.h>
+
+namespace Varnel::Platform {
+
+/// What becomes of the backslashes in a text whose other characters are escaped with them.
+enum class Backslashes {
+  doubled,  ///< So that no two texts show alike.
+  kept,     ///< So that a text without anything to escape stays as it is.
+};
+
+/// The text in a form that shows on a terminal as what it is and keeps to one line: control
+/// characters, characters that turn the direction of writing or break lines, and bytes that are not
+/// UTF-8 become "\n", "\t" and so on or "\xNN" for each byte.
+///
+///     visibleText("a\nb\xff");  // a\nb\xFF
+///
+/// Any thread.
+[[nodiscard]] VARNEL_API std::string visibleText(std::string text,
+                                                 Backslashes backslashes = Backslashes::doubled);
+
+}  // namespace Varnel::Platform
