@@ -22,7 +22,13 @@ std::string PlatformError::localizedDescription() const {
 }
 
 std::string PlatformError::description() const {
-  return fmt::format("Error Domain={} Code={} \"{}\"", domain_, code_, localizedDescription());
+  std::string text =
+      fmt::format("Error Domain={} Code={} \"{}\"", domain_, code_, localizedDescription());
+  if (const auto found = userInfo_.find(underlyingErrorKey); found != userInfo_.end()) {
+    if (const auto* underlying = std::any_cast<PlatformError>(&found->second))
+      text += fmt::format(" UserInfo={{{}={{{}}}}}", underlyingErrorKey, underlying->description());
+  }
+  return text;
 }
 
 }  // namespace Varnel::Platform

@@ -20,6 +20,8 @@ inline constexpr std::string_view localizedDescriptionKey = "NSLocalizedDescript
 inline constexpr std::string_view localizedRecoverySuggestionKey = "NSLocalizedRecoverySuggestion";
 /// Key of the titles of an alert's buttons, in order (a `std::vector<std::string>`).
 inline constexpr std::string_view localizedRecoveryOptionsKey = "NSLocalizedRecoveryOptions";
+/// Key of the error that led to this one (a `PlatformError`).
+inline constexpr std::string_view underlyingErrorKey = "NSUnderlyingError";
 
 /// The error that every other kind of error bridges to: a domain, a code within it, and further
 /// facts by key. What a system calls its common error object.
@@ -42,7 +44,8 @@ class VARNEL_API PlatformError final {
   /// The text under `localizedDescriptionKey`, or a sentence made of domain and code.
   [[nodiscard]] std::string localizedDescription() const;
 
-  /// `Error Domain=D Code=C "text"`, the text being `localizedDescription()`.
+  /// `Error Domain=D Code=C "text"`, the text being `localizedDescription()`; with an underlying
+  /// error, ` UserInfo={NSUnderlyingError={…}}` and that one's description follow.
   [[nodiscard]] std::string description() const;
 
  private:

@@ -3,7 +3,6 @@
 
 #include <exception>
 #include <string>
-#include <string_view>
 
 #include <Platform/Api.h>
 #include <Platform/Values/PlatformError.h>
@@ -15,13 +14,15 @@ namespace Varnel {
 //
 //     catch (const std::exception& caught) { presentAlert(platformError(caught)); }
 
-/// The name, without scope, of the most derived standard type that the exception is: "out_of_range"
-/// for a host's own class derived from it. Literal texts; nothing is demangled.
-[[nodiscard]] VARNEL_API std::string_view standardTypeName(const std::exception& exception);
+/// The name, without scope, of the exception's own type: "ImportFailure". One that was thrown with
+/// another nested in it has the name of what was thrown.
+[[nodiscard]] VARNEL_API std::string typeName(const std::exception& exception);
 
 /// An exception with an error code (`std::system_error` and its kin, `std::future_error`) keeps the
-/// category's name as domain and the code's value; any other has the domain "std.", the standard
-/// type's name, and code 0. The description is `what()`.
+/// category's name as domain and the code's value; `Basalt::JSONError` has its kind as code. Any
+/// other has code 0, and as domain the outermost namespace of its type, or the application's name
+/// where there is none, a dot and the type's name: "Host.ImportFailure". The description is
+/// `what()`; a nested exception becomes the underlying error.
 [[nodiscard]] VARNEL_API Platform::PlatformError platformError(const std::exception& exception);
 
 /// What the log says of a platform error: "NSError: " and its description.

@@ -39,7 +39,7 @@ LoggedError::LoggedError(const std::exception& exception) {
     *this = LoggedError(*error);
     return;
   }
-  typeName_ = standardTypeName(exception);
+  typeName_ = Varnel::typeName(exception);
   logDescription_ = logDescriptionOf(exception, platformError);
   description_ = exception.what();
 }

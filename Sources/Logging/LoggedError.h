@@ -33,8 +33,7 @@ class VARNEL_API LoggedError final {
   requires std::derived_from<Thrown, Error> && std::derived_from<Thrown, std::exception>
   LoggedError(const Thrown& error) : LoggedError(static_cast<const Error&>(error)) {}
 
-  /// The name of the error's own type as far as it is known: that of an exception is its nearest
-  /// standard type.
+  /// The name of the error's own type, without scope.
   [[nodiscard]] const std::string& typeName() const { return typeName_; }
 
   /// The error's own text for the log, or "NSError: " and the description of its platform error, in

@@ -1,18 +1,35 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Logging/Error.h>
 
+#include <exception>
 #include <filesystem>
+#include <fstream>
 #include <future>
 #include <ios>
 #include <stdexcept>
 
 #include <gtest/gtest.h>
 
+#include <Basalt/JSON.h>
+#include <Varnel/Context/Globals.h>
 #include <Varnel/Logging/CustomLogStringConvertible.h>
 #include <Varnel/Logging/ErrorBridging.h>
 #include <Varnel/Logging/GenericError.h>
 #include <Varnel/Logging/LoggedError.h>
 #include <Varnel/Logging/UserErrorType.h>
+
+namespace Host {
+struct ImportFailure : std::runtime_error {
+  using std::runtime_error::runtime_error;
+};
+struct NestsNothing : std::runtime_error, std::nested_exception {
+  using std::runtime_error::runtime_error;
+};
+}  // namespace Host
+
+struct BareFailure : std::runtime_error {
+  using std::runtime_error::runtime_error;
+};
 
 namespace Varnel {
 namespace {
@@ -41,9 +58,29 @@ class ThrownError final : public Error,
   std::string description() const override { return "described"; }
 };
 
-class HostException final : public std::length_error {
-  using std::length_error::length_error;
-};
+/// What is caught when the second error is thrown while the first is handled.
+LoggedError nested(const auto& first, const auto& second) {
+  try {
+    try {
+      throw first;
+    } catch (...) {
+      std::throw_with_nested(second);
+    }
+  } catch (const std::exception& exception) {
+    return exception;
+  }
+}
+
+LoggedError streamFailure() {
+  try {
+    std::ifstream stream;
+    stream.exceptions(std::ios::failbit);
+    stream.open("/nowhere");
+  } catch (const std::exception& exception) {
+    return exception;
+  }
+  return std::exception();
+}
 
 TEST(LoggedError, DescribesWhateverWasCaught) {
   struct Row {
@@ -53,6 +90,7 @@ TEST(LoggedError, DescribesWhateverWasCaught) {
     std::string description;
   };
   const ThrownError thrown;
+  const std::string& application = Globals::applicationName();
   const std::string scanText =
       "Error Domain=Host.ScanError Code=3 \"The operation couldn’t be completed. "
       "(Host.ScanError error 3.)\"";
@@ -63,8 +101,34 @@ TEST(LoggedError, DescribesWhateverWasCaught) {
       {ScanError(), "ScanError", "NSError: " + scanText, scanText},
       {thrown, "ThrownError", "described", "described"},
       {asException(thrown), "ThrownError", "described", "described"},
-      {HostException("long"), "length_error",
+      {Host::ImportFailure("no header\n"), "ImportFailure",
+       "NSError: Error Domain=Host.ImportFailure Code=0 \"no header\\n\"", "no header\n"},
+      {BareFailure("x"), "BareFailure",
+       "NSError: Error Domain=" + application + ".BareFailure Code=0 \"x\"", "x"},
+      {std::length_error("long"), "length_error",
        "NSError: Error Domain=std.length_error Code=0 \"long\"", "long"},
+      {Basalt::JSONError::missingValue("Period", "kind"), "JSONError",
+       "NSError: Error Domain=Basalt.JSONError Code=1 \"Unable to import Period at kind: no "
+       "value\"",
+       "Unable to import Period at kind: no value"},
+      {streamFailure(), "failure",
+       "NSError: Error Domain=iostream Code=1 \"basic_ios::clear: iostream error\"",
+       "basic_ios::clear: iostream error"},
+      {nested(BareFailure("disk full"), Host::ImportFailure("no import")), "ImportFailure",
+       "NSError: Error Domain=Host.ImportFailure Code=0 \"no import\" "
+       "UserInfo={NSUnderlyingError={Error Domain=" +
+           application + ".BareFailure Code=0 \"disk full\"}}",
+       "no import"},
+      {nested(GenericError::fallback, std::system_error(std::make_error_code(std::errc::io_error))),
+       "system_error",
+       "NSError: Error Domain=generic Code=5 \"Input/output error\" "
+       "UserInfo={NSUnderlyingError={Error Domain=Varnel.GenericError Code=0 "
+       "\"The operation couldn’t be completed. (Varnel.GenericError error 0.)\"}}",
+       "Input/output error"},
+      {nested(7, BareFailure("x")), "BareFailure",
+       "NSError: Error Domain=" + application + ".BareFailure Code=0 \"x\"", "x"},
+      {Host::NestsNothing("x"), "NestsNothing",
+       "NSError: Error Domain=Host.NestsNothing Code=0 \"x\"", "x"},
       {std::exception(), "exception",
        "NSError: Error Domain=std.exception Code=0 \"std::exception\"", "std::exception"},
       {std::make_error_code(std::errc::no_space_on_device), "error_code",
@@ -89,6 +153,8 @@ TEST(ErrorBridging, KeepsTheCodeOfAnExceptionThatHasOne) {
             static_cast<long>(std::future_errc::no_state));
   EXPECT_EQ(LoggedError(std::filesystem::filesystem_error("open", denied)).typeName(),
             "filesystem_error");
+  EXPECT_EQ(platformError(static_cast<const std::exception&>(ThrownError())).domain(),
+            "Varnel.ThrownError");
 }
 
 TEST(GenericError, BridgesToItsDomain) {
