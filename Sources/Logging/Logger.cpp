@@ -107,6 +107,11 @@ void Logger::log(std::string_view message, std::string_view author,
   log(message, author, locationTags(location), where);
 }
 
+void Logger::log(std::string_view message, const std::optional<Platform::URL>& location,
+                 SourcePosition where) {
+  log(message, {}, location, where);
+}
+
 void Logger::logError(const LoggedError& error, std::string_view author,
                       const LoggingContextTags& tags, SourcePosition where) {
   log(LogEntry::errorMessage(error, where), author, tags, where);

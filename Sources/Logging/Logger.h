@@ -68,6 +68,8 @@ class VARNEL_API Logger final {
   void log(std::string_view message, std::string_view author,
            const std::optional<Platform::URL>& location,
            SourcePosition where = SourcePosition::current());
+  void log(std::string_view message, const std::optional<Platform::URL>& location,
+           SourcePosition where = SourcePosition::current());
 
   /// Writes an entry of an error: its type, its description, and on a line below the caller's place
   /// in the source code.

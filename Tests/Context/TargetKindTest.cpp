@@ -12,6 +12,30 @@ namespace {
 
 using Platform::URL;
 
+TEST(TargetKind, HasThePublishedValues) {
+  const struct {
+    TargetKind kind;
+    int rawValue;
+    std::string bundleID;
+    const char* availability;
+    bool hasUpdater;
+    std::int64_t features;
+  } rows[] = {
+      {TargetKind::appstore, 0, "com.quennel.Orvane2", "isAvailableInAppStore", false, 0},
+      {TargetKind::marketta, 1, "com.quennel.Orvane-marketta", "isAvailableInMarketta", false, 15},
+      {TargetKind::site, 2, "com.quennel.site.Orvane2", "isAvailableInSite", true, 15},
+  };
+  std::size_t index = 0;
+  for (const auto& row : rows) {
+    EXPECT_EQ(TargetKind::allValues().at(index++), row.kind);
+    EXPECT_EQ(row.kind.rawValue(), row.rawValue);
+    EXPECT_EQ(row.kind.bundleID(), row.bundleID);
+    EXPECT_EQ(row.kind.hasUpdater(), row.hasUpdater);
+    EXPECT_EQ(row.kind.extractIsAvailable({{row.availability, true}}), true) << row.availability;
+    EXPECT_EQ(row.kind.defaultUserFeatures().rawValue(), row.features);
+  }
+}
+
 TEST(TargetKind, FirstSwitchOfTheFixedOrderDecides) {
   EXPECT_EQ(TargetKind::of({.isAppStoreVersion = true, .isSiteVersion = true}),
             TargetKind::appstore);
@@ -53,8 +77,7 @@ TEST(TargetKind, AvailabilityIsATruthValueOrAbsent) {
 }
 
 TEST(TargetKind, SuggestionsReplaceDefaultsOnlyInTheAppStore) {
-  const UserFeatures defaults = {UserFeatures::sharing, UserFeatures::crossPromo,
-                                 UserFeatures::achievements, UserFeatures::irate};
+  const UserFeatures defaults(std::int64_t{15});
   const UserFeatures promo = UserFeatures::cleanResultsPromo;
   EXPECT_EQ(TargetKind::appstore.userFeatures(std::nullopt), UserFeatures());
   EXPECT_EQ(TargetKind::appstore.userFeatures(promo), promo);

@@ -4,6 +4,8 @@
 #include <thread>
 #include <vector>
 
+#include <gmock/gmock.h>
+
 #include <Tests/Logging/LoggerFixture.h>
 #include <Varnel/Logging/GenericError.h>
 #include <Varnel/Logging/LogEntry.h>
@@ -68,6 +70,8 @@ TEST_F(LoggerTest, WritesTagsOnOneLineBelowTheMessage) {
   EXPECT_EQ(entryOf([&](Logger& l) { l.log("m", "A", music); }),
             stamp + "A:  m" + nextLine + "location: /home/ada/Music\n");
   EXPECT_EQ(entryOf([&](Logger& l) { l.log("m", "A", std::optional<URL>()); }), stamp + "A:  m\n");
+  EXPECT_EQ(entryOf([&](Logger& l) { l.log("m", music); }),
+            stamp + ":  m" + nextLine + "location: /home/ada/Music\n");
 
   destroyLogger();
   EXPECT_EQ(files.text(logPath()), printed());
@@ -99,7 +103,8 @@ TEST_F(LoggerTest, HidesPathsAndSizesInAnonymousMode) {
   };
   EXPECT_EQ(location("/a/b.tar.gz"), "/a/b.tar.gz");
   EXPECT_EQ(logger().stringForFileSize(3'456'789), "3.5 MB");
-  EXPECT_EQ(logger().stringForMemorySize(2048), "2 KB");
+  EXPECT_EQ(logger().stringForFileSize(1500), "2 KB");
+  EXPECT_EQ(logger().stringForMemorySize(1500), "1 KB");
 
   logger().setIsAnonymousMode(true);
   EXPECT_EQ(location("/a/b.tar.gz"), "[*.gz]");
@@ -129,6 +134,16 @@ TEST_F(LoggerTest, KeepsTheFileOfTheDayItWasMadeOn) {
   logger().log("next day");
   logger().flush();
   EXPECT_EQ(files.text(logPath()), "[2026-03-15 09:26:39] :  next day\n");
+}
+
+TEST_F(LoggerTest, CountsTheYearByItsWeeks) {
+  clock.advance(std::chrono::hours(24 * 288));  // to Sunday, the 27th of December
+  logger().log("m", "A");
+  EXPECT_EQ(printed(), "[2027-12-27 09:26:39] A:  m\n");
+  EXPECT_THAT(logger().logFileURL()->path(), testing::EndsWith("/2027-12-27.log"));
+  ::setenv("LC_ALL", "en_US.UTF-8", 1);
+  EXPECT_EQ(Logger::logMessageDateFormatter().string(clock.now()), "2027-12-27 09:26:39");
+  EXPECT_EQ(Logger::fileNameDateFormatter().string(clock.now()), "2027-12-27");
 }
 
 TEST_F(LoggerTest, GoesOnWithoutAFolder) {
@@ -201,6 +216,39 @@ class Caller final : public LoggingObject {
  private:
   Logger& logger_;
 };
+
+TEST_F(LoggerTest, WritesTheEntriesOfAnObjectUnderItsName) {
+  const Caller object(logger());
+  const URL folder = URL::fileURLWithPath("/f");
+  const SourcePosition where{"/src/Scanner.cpp", "run", 12};
+  const std::string error =
+      "Caller:  [GenericError] " + GenericError::fallback.logDescription() + nextLine;
+  const std::string place = error + "Scanner.cpp:12 -- run()";
+  struct Row {
+    std::function<void()> write;
+    std::string entry;
+  };
+  const Row rows[] = {
+      {[&] { object.log("m"); }, "Caller:  m"},
+      {[&] {
+         object.log("m", {Tag::jobDescription("scan"), Tag::location(folder)});
+       },
+       "Caller:  m" + nextLine + "job: scan, location: /f"},
+      {[&] { object.log("m", folder); }, "Caller:  m" + nextLine + "location: /f"},
+      {[&] { object.logError(GenericError::fallback, LoggingContextTags(), where); }, place},
+      {[&] { object.logError(GenericError::fallback, {Tag::jobDescription("scan")}, where); },
+       place + nextLine + "job: scan"},
+      {[&] { object.logError(GenericError::fallback, "scan", folder, where); },
+       place + nextLine + "job: scan, location: /f"},
+      {[&] { object.logError(GenericError::fallback, std::nullopt, folder, where); },
+       place + nextLine + "location: /f"},
+      {[&] { object.logError(GenericError::fallback, "scan"); },
+       error + "LoggerTest.cpp:" + std::to_string(__LINE__ - 1) + " -- operator()()" + nextLine +
+           "job: scan"},
+  };
+  for (const Row& row : rows)
+    EXPECT_EQ(entryOf([&](Logger&) { row.write(); }), stamp + row.entry + "\n");
+}
 
 TEST_F(LoggerTest, NamesTheCallingFunctionAlone) {
   const auto locationOf = [this](const auto& call) {
