@@ -189,6 +189,22 @@ TEST_F(Scan, StopsWhenAskedTo) {
   EXPECT_LE(opened, 4) << "one a thread";
 }
 
+TEST_F(Scan, StopsWithinAFileWhenAskedTo) {
+  for (const int files : {2, 3}) {  // Two are compared, three are digested.
+    const ScanFolder large;
+    for (int i = 0; i < files; ++i)
+      fs::resize_file(large.write(std::to_string(i), ""), 1'000'000'000);
+    control.isCancelled = false;
+    std::atomic<int> blocks{0};
+    fileSystem.beforeRead = [&](const std::string&) {
+      // Each file's beginning is read for itself first.
+      if (++blocks > 2 * files) control.isCancelled = true;
+    };
+    (void)scan({large.path()});
+    EXPECT_LE(blocks, 20) << files << " files";
+  }
+}
+
 TEST_F(Scan, PassesOnWhatAWorkerThrows) {
   folder.write("1", "same");
   folder.write("2", "same");

@@ -7,6 +7,7 @@
 #include <cstring>
 
 #include <orvane/Scan/FileTree.h>
+#include <orvane/Scan/ScanObserver.h>
 
 namespace Orvane {
 namespace {
@@ -21,8 +22,8 @@ Digest digestFrom(const XXH128_hash_t& hash) {
 
 }  // namespace
 
-ContentReader::ContentReader(ContentStream::Ports ports)
-    : ports_(ports), firstBuffer_(blockSize), secondBuffer_(blockSize) {}
+ContentReader::ContentReader(ContentStream::Ports ports, ScanControl& control)
+    : ports_(ports), control_(control), firstBuffer_(blockSize), secondBuffer_(blockSize) {}
 
 ContentReader::DigestResult ContentReader::digest(const FileRecord& file, std::uint64_t length) {
   ContentStream stream(file, length, ports_);
@@ -33,7 +34,7 @@ ContentReader::DigestResult ContentReader::digest(const FileRecord& file, std::u
   XXH3_state_t state;
   XXH3_128bits_reset(&state);
   XXH3_128bits_update(&state, block->data(), block->size());
-  while (!stream.isFinished()) {
+  while (!stream.isFinished() && !control_.isCancelled) {
     block = readBlock(stream, firstBuffer_);
     if (!block) return block.error();
     XXH3_128bits_update(&state, block->data(), block->size());
@@ -44,20 +45,20 @@ ContentReader::DigestResult ContentReader::digest(const FileRecord& file, std::u
 Comparison ContentReader::compare(const FileRecord& first, const FileRecord& second) {
   ContentStream firstStream(first, first.status.size, ports_);
   ContentStream secondStream(second, second.status.size, ports_);
-  while (!firstStream.isFinished()) {
+  while (!firstStream.isFinished() && !control_.isCancelled) {
     const auto firstBlock = readBlock(firstStream, firstBuffer_);
     if (!firstBlock) return {.firstLoss = firstBlock.error()};
     const auto secondBlock = readBlock(secondStream, secondBuffer_);
     if (!secondBlock) return {.secondLoss = secondBlock.error()};
     if (std::memcmp(firstBlock->data(), secondBlock->data(), firstBlock->size()) != 0) return {};
   }
-  return {.isEqual = true};
+  return {.isEqual = firstStream.isFinished()};
 }
 
 ContentStream::Block ContentReader::readBlock(ContentStream& stream,
                                               std::vector<std::byte>& buffer) {
   ContentStream::Block block = stream.next(buffer);
-  if (block) bytesRead_ += block->size();
+  if (block) control_.bytesRead.fetch_add(block->size(), std::memory_order_relaxed);
   return block;
 }
 

@@ -243,13 +243,10 @@ class Scan final {
     control_.filesToRead.fetch_add(laneEnds.back(), std::memory_order_relaxed);
     WorkLanes lanes(laneEnds);
     runOnThreads(threads_, [&](unsigned worker) {
-      ContentReader reader({ports_.fileSystem, ports_.access});
-      std::uint64_t counted = 0;
+      ContentReader reader({ports_.fileSystem, ports_.access}, control_);
       for (std::size_t index = 0; !control_.isCancelled && lanes.next(worker, index);) {
         read(reader, index);
         control_.filesRead.fetch_add(1, std::memory_order_relaxed);
-        control_.bytesRead.fetch_add(reader.bytesRead() - counted, std::memory_order_relaxed);
-        counted = reader.bytesRead();
       }
     });
   }
