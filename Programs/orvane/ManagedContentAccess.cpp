@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/ManagedContentAccess.h>
 
+#include <climits>
+
 #include <Platform/Ports/VolumeCatalog.h>
 #include <Varnel/DiskAccess/DiskAccessGuard.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
@@ -10,6 +12,11 @@ namespace {
 
 using Varnel::Platform::URL;
 
+/// What the system can be asked about: the path or, of one that is too long, a folder on the way.
+std::string askablePath(const std::string& path) {
+  return path.size() < PATH_MAX ? path : path.substr(0, path.rfind('/', PATH_MAX - 1));
+}
+
 }  // namespace
 
 ManagedContentAccess::ManagedContentAccess(Ports ports, Varnel::Platform::QualityOfService qos)
@@ -17,7 +24,7 @@ ManagedContentAccess::ManagedContentAccess(Ports ports, Varnel::Platform::Qualit
 
 bool ManagedContentAccess::whileAccessing(const std::string& path, std::uint64_t device,
                                           const std::function<void()>& read) {
-  const URL url = URL::fileURLWithPath(path);
+  const URL url = URL::fileURLWithPath(askablePath(path));
   // No scope to open: the user named the folders, and what cannot be read shows when it is opened.
   const Varnel::DiskAccessGuard access(ports_.manager.beginAccessingURL(
       url, "Search for duplicates", qos_, false, std::nullopt, volumeOf(url, device)));

@@ -34,6 +34,20 @@ using Varnel::Globals;
 using Varnel::LoggingContextTag;
 using Varnel::Platform::URL;
 
+std::string reasonOf(const Loss& loss) {
+  switch (loss.kind) {
+    case Loss::Kind::vanished:
+      return "it vanished";
+    case Loss::Kind::changed:
+      return "it changed meanwhile";
+    case Loss::Kind::incomplete:
+      return "the rest of it cannot be read: " + loss.error.message();
+    case Loss::Kind::unreadable:
+      break;
+  }
+  return "it cannot be read: " + loss.error.message();
+}
+
 /// Names in the log what the scan leaves out.
 class ScanLog final : public ScanObserver, public Varnel::LoggingObject {
  public:
@@ -46,21 +60,14 @@ class ScanLog final : public ScanObserver, public Varnel::LoggingObject {
 
  private:
   void leftOut(const std::string& path, const Loss& loss) const {
-    log(message(loss), URL::fileURLWithPath(path));
-  }
-
-  static std::string message(const Loss& loss) {
-    switch (loss.kind) {
-      case Loss::Kind::vanished:
-        return "Left out: it vanished";
-      case Loss::Kind::changed:
-        return "Left out: it changed meanwhile";
-      case Loss::Kind::unreadable:
-        break;
-    }
-    return "Left out: it cannot be read: " + loss.error.message();
+    log("Left out: " + reasonOf(loss), URL::fileURLWithPath(path));
   }
 };
+
+void complainThatItCannotScan(const std::string& folder, const std::string& reason,
+                              Console& console) {
+  console.complain("cannot scan \"" + folder + "\": " + reason);
+}
 
 /// The folders as the engine wants them, or none after a complaint about one that is not there.
 std::optional<std::vector<std::string>> resolved(const std::vector<std::string>& folders,
@@ -72,7 +79,7 @@ std::optional<std::vector<std::string>> resolved(const std::vector<std::string>&
     if (!error && !fs::is_directory(path, error) && !error)
       error = std::make_error_code(std::errc::not_a_directory);
     if (error) {
-      console.complain("cannot scan \"" + folder + "\": " + error.message());
+      complainThatItCannotScan(folder, error.message(), console);
       return std::nullopt;
     }
     paths.push_back(path.string());
@@ -115,6 +122,11 @@ int ScanCommand::run(Console& console) const {
       console.complain("interrupted");
       return 128 + interruption.signal();
     }
+  }
+  if (!result.lostFolders.empty()) {
+    for (const LostPath& lost : result.lostFolders)
+      complainThatItCannotScan(lost.path, reasonOf(lost.loss), console);
+    return 1;
   }
   log.log("Did find " + std::to_string(result.groups.size()) + " groups of duplicates among " +
           std::to_string(result.totals.files) + " files");

@@ -49,15 +49,19 @@ class LossRecorder final : public ScanObserver {
   std::vector<std::pair<std::string, Loss::Kind>> folders;
 };
 
-/// The real file system with faults: paths that cannot be listed or opened, files that fail while
-/// they are read, and an action before a file is read. Set up before the scan. Counts content that
-/// is touched outside an access.
+/// The real file system with faults: paths that cannot be listed, not to the end, or opened, files
+/// that fail while they are read, and an action before each of these. Set up before the scan.
+/// Counts content that is touched outside an access.
 class FaultyFileSystem final : public FileSystem {
  public:
   FileResult<FolderListing> list(const std::string& folder) override {
     if (const auto fault = listFaults.find(folder); fault != listFaults.end())
       return std::make_error_code(fault->second);
-    return systemFileSystem().list(folder);
+    if (beforeList) beforeList(folder);
+    auto listing = systemFileSystem().list(folder);
+    if (const auto fault = interruptions.find(folder); listing && fault != interruptions.end())
+      listing->interruption = std::make_error_code(fault->second);
+    return listing;
   }
 
   FileResult<std::unique_ptr<OpenFile>> open(const std::string& path, ReadingPlan plan) override {
@@ -72,8 +76,10 @@ class FaultyFileSystem final : public FileSystem {
   }
 
   std::map<std::string, std::errc> listFaults;
+  std::map<std::string, std::errc> interruptions;  ///< Of listings.
   std::map<std::string, std::errc> openFaults;
   std::map<std::string, std::errc> readFaults;
+  std::function<void(const std::string& path)> beforeList;
   std::function<void(const std::string& path)> beforeOpen;
   std::function<void(const std::string& path)> beforeRead;
   std::atomic<int> faults{0};

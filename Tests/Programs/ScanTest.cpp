@@ -1,5 +1,9 @@
 // SPDX-License-Identifier: MIT
+#include <fcntl.h>
 #include <gmock/gmock.h>
+#include <sys/stat.h>
+#include <sys/syscall.h>
+#include <unistd.h>
 
 #include <chrono>
 #include <filesystem>
@@ -7,7 +11,9 @@
 #include <random>
 #include <set>
 #include <sstream>
+#include <thread>
 
+#include <Tests/Programs/ForbiddenCall.h>
 #include <Tests/Programs/ScanFakes.h>
 #include <Tests/Programs/ScanFolder.h>
 #include <orvane/Scan/DuplicateFinder.h>
@@ -116,17 +122,26 @@ TEST_F(Scan, LeavesOutWhatCannotBeRead) {
   const std::string closed = folder.write("closed", "same");
   const std::string broken = folder.write("broken", "same");
   folder.write("locked/file", "same");
+  const std::string kept = folder.write("torn/kept", "same");
+  fileSystem.interruptions[folder.path("torn")] = std::errc::io_error;
   fileSystem.openFaults[closed] = std::errc::permission_denied;
   fileSystem.readFaults[broken] = std::errc::io_error;
   fileSystem.listFaults[folder.path("locked")] = std::errc::permission_denied;
 
   const ScanResult result = scan();
-  EXPECT_THAT(paths(result), ElementsAre(ElementsAre(first, second)));
+  EXPECT_THAT(paths(result), ElementsAre(ElementsAre(first, second, kept)));
   EXPECT_EQ(result.totals.unreadableFiles, 2u);
-  EXPECT_EQ(result.totals.unreadableFolders, 1u);
+  EXPECT_EQ(result.totals.unreadableFolders, 2u);
   EXPECT_THAT(losses.files, ElementsAre(Pair(broken, Loss::Kind::unreadable),
                                         Pair(closed, Loss::Kind::unreadable)));
-  EXPECT_THAT(losses.folders, ElementsAre(Pair(folder.path("locked"), Loss::Kind::unreadable)));
+  EXPECT_THAT(losses.folders, ElementsAre(Pair(folder.path("locked"), Loss::Kind::unreadable),
+                                          Pair(folder.path("torn"), Loss::Kind::incomplete)));
+
+  // A folder to scan is another matter.
+  const ScanResult nothing = scan({folder.path("torn"), folder.path("locked")});
+  ASSERT_EQ(nothing.lostFolders.size(), 1u);
+  EXPECT_EQ(nothing.lostFolders[0].path, folder.path("locked"));
+  EXPECT_EQ(nothing.totals, ScanTotals());
 }
 
 TEST_F(Scan, ReportsARefusedDiskAsUnreadable) {
@@ -144,14 +159,20 @@ TEST_F(Scan, LeavesOutFilesThatVanishOrChangeMeanwhile) {
   const std::string shrinks = folder.write("shrinks", bytes(10'000, 'a'));
   const std::string touched = folder.write("touched", bytes(10'000, 'a'));
   const std::string replaced = folder.write("replaced", bytes(10'000, 'a'));
+  const std::string piped = folder.write("piped", bytes(10'000, 'a'));
   fileSystem.beforeOpen = [&](const std::string& path) {
     if (path == gone) fs::remove(path);
     if (path == replaced) {
       fs::remove(path);
       fs::create_symlink(first, path);
     }
+    if (path == piped) {
+      fs::remove(path);
+      ASSERT_EQ(::mkfifo(path.c_str(), 0600), 0);
+    }
   };
   fileSystem.beforeRead = [&](const std::string& path) {
+    EXPECT_NE(path, piped) << "took from a pipe";
     if (path == grows) std::ofstream(path, std::ios::app) << "more";
     if (path == shrinks) fs::resize_file(path, 100);
     if (path == touched)
@@ -160,8 +181,69 @@ TEST_F(Scan, LeavesOutFilesThatVanishOrChangeMeanwhile) {
   const ScanResult result = scan();
   EXPECT_THAT(paths(result), ElementsAre(ElementsAre(first, second)));
   EXPECT_EQ(result.totals.vanishedFiles, 1u);
-  EXPECT_EQ(result.totals.changedFiles, 4u);
-  EXPECT_EQ(losses.files.size(), 5u);
+  EXPECT_EQ(result.totals.changedFiles, 5u);
+  EXPECT_EQ(losses.files.size(), 6u);
+}
+
+/// Runs the work with every means of the system and without the call that opens a path of many
+/// names at once.
+void withAndWithoutOpenat2(const std::function<void()>& work) {
+  work();
+  std::thread([&] {
+    forbid(SYS_openat2);
+    work();
+  }).join();
+}
+
+TEST_F(Scan, IsNotLedOutOfTheTreeByALinkInTheMiddle) {
+  withAndWithoutOpenat2([&] {
+    const ScanFolder base;
+    const std::string here = base.write("tree/mid/deep/1", "same");
+    base.write("tree/mid/deep/2", "same");
+    const std::string alone = base.write("tree/3", "same");
+    // The same files outside: nothing but the way tells them apart.
+    fs::create_directories(base.path("outside/deep"));
+    for (const char* name : {"1", "2"})
+      fs::create_hard_link(base.path("tree/mid/deep/") + name, base.path("outside/deep/") + name);
+    const auto swap = [&](const std::string& path) {
+      if (path != here && path != base.path("tree/mid/deep")) return;
+      std::error_code ignored;
+      fs::rename(base.path("tree/mid"), base.path("away"), ignored);
+      fs::create_directory_symlink(base.path("outside"), base.path("tree/mid"), ignored);
+    };
+    fileSystem.beforeOpen = swap;
+    const ScanResult opened = scan({base.path("tree")});
+    EXPECT_THAT(opened.groups, IsEmpty());
+    EXPECT_EQ(opened.totals.changedFiles, 2u);
+
+    fs::remove(base.path("tree/mid"));
+    fs::rename(base.path("away"), base.path("tree/mid"));
+    fileSystem.beforeList = swap;
+    const ScanResult listed = scan({base.path("tree")});
+    EXPECT_EQ(listed.totals.files, 1u) << "all but " << alone << " lie outside";
+    EXPECT_EQ(listed.totals.unreadableFolders, 1u);
+    fileSystem.beforeList = nullptr;
+    fileSystem.beforeOpen = nullptr;
+  });
+}
+
+TEST_F(Scan, FindsFilesHoweverLongTheirPathIs) {
+  const std::string name(200, 'n');
+  std::string bottom = folder.path();
+  int below = ::open(bottom.c_str(), O_RDONLY | O_CLOEXEC);
+  for (int depth = 0; depth < 60; ++depth, bottom += "/" + name) {
+    ASSERT_EQ(::mkdirat(below, name.c_str(), 0700), 0);
+    const int next = ::openat(below, name.c_str(), O_RDONLY | O_CLOEXEC);
+    ::close(std::exchange(below, next));
+  }
+  for (const char* file : {"1", "2"}) {
+    const int written = ::openat(below, file, O_CREAT | O_WRONLY | O_CLOEXEC, 0600);
+    ASSERT_EQ(::write(written, "same", 4), 4);
+    ::close(written);
+  }
+  ::close(below);
+  withAndWithoutOpenat2(
+      [&] { EXPECT_THAT(paths(scan()), ElementsAre(ElementsAre(bottom + "/1", bottom + "/2"))); });
 }
 
 TEST_F(Scan, LosingTheFileThatOthersAreComparedWithLosesNoOther) {

@@ -46,6 +46,7 @@ class Scan final {
 
   ScanResult run(const std::vector<std::string>& folders) {
     tree_ = walkFolders(folders, ports_.fileSystem, threads_, control_);
+    if (!tree_.lostRoots.empty()) return {.lostFolders = std::move(tree_.lostRoots)};
     reportWalk();
     Candidates candidates = filesOfSharedSize(distinctFiles());
     takeDigests(candidates, headLength);
@@ -73,15 +74,15 @@ class Scan final {
     totals_.folders = tree_.folders.size();
     totals_.unreadableFolders = tree_.unreadableFolders.size();
     totals_.files = tree_.files.size() + tree_.unreadableFiles.size();
-    for (const FileTree::Failure& failure : tree_.unreadableFolders)
-      ports_.observer.folderLeftOut(failure.path, failure.loss);
-    for (const FileTree::Failure& failure : tree_.unreadableFiles)
-      leaveOut(failure.path, failure.loss);
+    for (const LostPath& lost : tree_.unreadableFolders)
+      ports_.observer.folderLeftOut(lost.path, lost.loss);
+    for (const LostPath& lost : tree_.unreadableFiles) leaveOut(lost.path, lost.loss);
   }
 
   void leaveOut(const std::string& path, const Loss& loss) {
     switch (loss.kind) {
       case Loss::Kind::unreadable:
+      case Loss::Kind::incomplete:
         ++totals_.unreadableFiles;
         break;
       case Loss::Kind::vanished:
@@ -260,7 +261,7 @@ class Scan final {
       totals_.duplicateFiles += group.paths.size() - 1;
       totals_.wastedBytes += group.wastedBytes();
     }
-    return {std::move(groups_), totals_};
+    return {.groups = std::move(groups_), .totals = totals_};
   }
 
   DuplicateFinder::Ports ports_;

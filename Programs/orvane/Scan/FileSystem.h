@@ -49,6 +49,7 @@ struct FolderListing {
   std::vector<std::string> folders;
   std::vector<File> files;
   std::vector<Failure> failures;  ///< Entries whose status could not be had.
+  std::error_code interruption;   ///< Why there may be more in the folder; none when this is all.
 };
 
 /// A regular file that is open for reading. One thread at a time; closed when destroyed.
@@ -66,16 +67,17 @@ class OpenFile {
 /// How the reader of a file is going to read.
 enum class ReadingPlan { beginningOnly, everything };
 
-/// What the scan asks of the file system. Any thread. Paths are absolute runs of bytes. No call
-/// follows a symbolic link in the last component of a path.
+/// What the scan asks of the file system. Any thread. Paths are absolute runs of bytes, of any
+/// length. No call follows a symbolic link in any part of a path.
 class FileSystem {
  public:
   virtual ~FileSystem() = default;
 
-  /// Lists a folder.
+  /// Lists a folder, as far as it can be read.
   [[nodiscard]] virtual FileResult<FolderListing> list(const std::string& folder) = 0;
 
-  /// Opens a file; never waits for the other end of a pipe that took the file's place.
+  /// Opens a file; never waits for the other end of a pipe that took the file's place. Whether it
+  /// is still a file, and which, its status tells.
   [[nodiscard]] virtual FileResult<std::unique_ptr<OpenFile>> open(const std::string& path,
                                                                    ReadingPlan plan) = 0;
 };

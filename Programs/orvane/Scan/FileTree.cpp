@@ -3,10 +3,10 @@
 
 #include <algorithm>
 #include <condition_variable>
-#include <memory>
+#include <iterator>
 #include <mutex>
+#include <set>
 #include <string_view>
-#include <unordered_set>
 #include <utility>
 
 #include <orvane/Scan/ScanObserver.h>
@@ -15,44 +15,45 @@
 namespace Orvane {
 namespace {
 
-std::string joined(std::string_view folder, std::string_view name) {
-  std::string path;
-  path.reserve(folder.size() + 1 + name.size());
-  path = folder;
-  if (!path.ends_with('/')) path += '/';
-  return path += name;
+/// The path of what goes by the name in the folder. Takes no recursion, however deep it lies.
+std::string pathBelow(const Folder* folder, std::string_view name) {
+  std::size_t size = name.size();
+  for (const Folder* each = folder; each != nullptr; each = each->parent)
+    size += each->name.size() + 1;
+  std::string path(size, '/');
+  auto begin = std::copy_backward(name.begin(), name.end(), path.end());
+  for (; folder != nullptr; folder = folder->parent)
+    begin = std::copy_backward(folder->name.begin(), folder->name.end(), begin - 1);
+  return path;
 }
 
-/// The folders on the way from a given folder down to one that is being walked.
-struct Ancestry {
-  FileIdentity identity;
-  std::shared_ptr<const Ancestry> parent;
-};
-
-bool holds(const Ancestry* ancestry, const FileIdentity& identity) {
-  for (; ancestry != nullptr; ancestry = ancestry->parent.get())
-    if (ancestry->identity == identity) return true;
+/// Whether the folder is one of those from `folder` up to the one that was given.
+bool isOnTheWay(const FileIdentity& identity, const Folder* folder) {
+  for (; folder != nullptr; folder = folder->parent)
+    if (folder->identity == identity) return true;
   return false;
 }
-
-struct Task {
-  std::string folder;
-  std::shared_ptr<const Ancestry> ancestry;
-};
 
 /// The walk in progress. The stack of folders still to be listed, and with it the end of the walk,
 /// is guarded by the mutex; so is the tree, which takes in one folder's files at a time.
 class Walk final {
  public:
   Walk(const std::vector<std::string>& folders, FileSystem& fileSystem, ScanControl& control)
-      : fileSystem_(fileSystem), control_(control) {
-    for (const std::string& folder : folders) push({folder, nullptr});
+      : fileSystem_(fileSystem), control_(control), given_(folders.begin(), folders.end()) {}
+
+  /// Lists the folders given, so that a scan of what is not there ends before it begins.
+  [[nodiscard]] bool start() {
+    for (const std::string& path : given_) {
+      ++running_;
+      finish(visit({nullptr, path == "/" ? "" : path}));
+    }
+    return tree_.lostRoots.empty();
   }
 
   void work() {
     try {
-      Task task;
-      while (take(task)) finish(visit(task));
+      Folder folder;
+      while (take(folder)) finish(visit(std::move(folder)));
     } catch (...) {
       stop();
       throw;
@@ -60,56 +61,56 @@ class Walk final {
   }
 
   FileTree takeTree() {
-    const auto byPath = [](const FileTree::Failure& a, const FileTree::Failure& b) {
-      return a.path < b.path;
-    };
+    const auto byPath = [](const LostPath& a, const LostPath& b) { return a.path < b.path; };
     std::sort(tree_.unreadableFiles.begin(), tree_.unreadableFiles.end(), byPath);
     std::sort(tree_.unreadableFolders.begin(), tree_.unreadableFolders.end(), byPath);
     return std::move(tree_);
   }
 
  private:
-  void push(Task task) {
-    if (seen_.insert(task.folder).second) tasks_.push_back(std::move(task));
-  }
-
-  bool take(Task& task) {
+  bool take(Folder& folder) {
     std::unique_lock lock(mutex_);
-    changed_.wait(lock, [&] { return isStopped_ || !tasks_.empty() || running_ == 0; });
-    if (isStopped_ || tasks_.empty()) return false;
-    task = std::move(tasks_.back());
-    tasks_.pop_back();
+    changed_.wait(lock, [&] { return isStopped_ || !pending_.empty() || running_ == 0; });
+    if (isStopped_ || pending_.empty()) return false;
+    folder = std::move(pending_.back());
+    pending_.pop_back();
     ++running_;
     return true;
   }
 
   /// Lists the folder, files its content and returns the folders in it.
-  std::vector<Task> visit(const Task& task) {
-    FileResult<FolderListing> listing = fileSystem_.list(task.folder);
+  std::vector<Folder> visit(Folder folder) {
+    const std::string path = folder.path();
+    // A folder given that lies in another one is walked by itself.
+    if (folder.parent != nullptr && given_.contains(path)) return {};
+    FileResult<FolderListing> listing = fileSystem_.list(path);
     const std::lock_guard lock(mutex_);
     if (!listing) {
-      tree_.unreadableFolders.push_back({task.folder, Loss::because(listing.error())});
+      (folder.parent != nullptr ? tree_.unreadableFolders : tree_.lostRoots)
+          .push_back({path, Loss::because(listing.error())});
       return {};
     }
-    if (holds(task.ancestry.get(), listing->identity)) return {};
-    const std::string& folder = tree_.folders.emplace_back(task.folder);
+    if (isOnTheWay(listing->identity, folder.parent)) return {};
+    folder.identity = listing->identity;
+    const Folder& kept = tree_.folders.emplace_back(std::move(folder));
+    if (listing->interruption)
+      tree_.unreadableFolders.push_back({path, {Loss::Kind::incomplete, listing->interruption}});
     for (FolderListing::File& file : listing->files)
-      tree_.files.push_back({&folder, std::move(file.name), file.status});
+      tree_.files.push_back({&kept, std::move(file.name), file.status});
     for (const FolderListing::Failure& failure : listing->failures)
-      tree_.unreadableFiles.push_back({joined(folder, failure.name), Loss::because(failure.error)});
+      tree_.unreadableFiles.push_back(
+          {pathBelow(&kept, failure.name), Loss::because(failure.error)});
     control_.filesFound.store(tree_.files.size(), std::memory_order_relaxed);
 
-    const auto ancestry = std::make_shared<Ancestry>(Ancestry{listing->identity, task.ancestry});
-    std::vector<Task> tasks;
-    for (const std::string& name : listing->folders)
-      tasks.push_back({joined(folder, name), ancestry});
-    return tasks;
+    std::vector<Folder> folders;
+    for (std::string& name : listing->folders) folders.push_back({&kept, std::move(name)});
+    return folders;
   }
 
-  void finish(std::vector<Task> tasks) {
+  void finish(std::vector<Folder> folders) {
     {
       const std::lock_guard lock(mutex_);
-      for (Task& task : tasks) push(std::move(task));
+      std::move(folders.begin(), folders.end(), std::back_inserter(pending_));
       --running_;
       if (control_.isCancelled) isStopped_ = true;
     }
@@ -128,8 +129,8 @@ class Walk final {
   ScanControl& control_;
   std::mutex mutex_;
   std::condition_variable changed_;
-  std::vector<Task> tasks_;
-  std::unordered_set<std::string> seen_;
+  const std::set<std::string> given_;
+  std::vector<Folder> pending_;
   std::size_t running_ = 0;
   bool isStopped_ = false;
   FileTree tree_;
@@ -137,8 +138,12 @@ class Walk final {
 
 }  // namespace
 
+std::string Folder::path() const {
+  return parent == nullptr && name.empty() ? "/" : pathBelow(parent, name);
+}
+
 std::string FileRecord::path() const {
-  return joined(*folder, name);
+  return pathBelow(folder, name);
 }
 
 bool pathPrecedes(const FileRecord& first, const FileRecord& second) {
@@ -148,7 +153,7 @@ bool pathPrecedes(const FileRecord& first, const FileRecord& second) {
 FileTree walkFolders(const std::vector<std::string>& folders, FileSystem& fileSystem,
                      unsigned threads, ScanControl& control) {
   Walk walk(folders, fileSystem, control);
-  runOnThreads(threads, [&](unsigned) { walk.work(); });
+  if (walk.start()) runOnThreads(threads, [&](unsigned) { walk.work(); });
   return walk.takeTree();
 }
 

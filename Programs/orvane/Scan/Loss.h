@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <string>
 #include <system_error>
 
 namespace Orvane {
@@ -11,6 +12,7 @@ struct Loss {
     unreadable,  ///< The system refused or failed to read it.
     vanished,    ///< It was gone when its turn came.
     changed,     ///< It is not, or no longer, what the walk saw.
+    incomplete,  ///< A part of the folder was read before the system failed.
   };
 
   Kind kind;
@@ -19,11 +21,18 @@ struct Loss {
   /// The loss that an error of the file system stands for.
   [[nodiscard]] static Loss because(std::error_code error) {
     if (error == std::errc::no_such_file_or_directory) return {Kind::vanished, error};
-    // A symbolic link or another thing took the place of what the walk saw.
-    if (error == std::errc::too_many_symbolic_link_levels || error == std::errc::not_a_directory)
+    // A symbolic link, a socket or another thing took the place of what the walk saw.
+    if (error == std::errc::too_many_symbolic_link_levels || error == std::errc::not_a_directory ||
+        error == std::errc::no_such_device_or_address)
       return {Kind::changed, {}};
     return {Kind::unreadable, error};
   }
+};
+
+/// A file or folder that had no part in the result.
+struct LostPath {
+  std::string path;
+  Loss loss;
 };
 
 }  // namespace Orvane

@@ -1,11 +1,16 @@
 // SPDX-License-Identifier: MIT
 #include <dirent.h>
 #include <fcntl.h>
+#include <linux/openat2.h>
 #include <sys/stat.h>
+#include <sys/syscall.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
+#include <climits>
 #include <string_view>
+#include <utility>
 
 #include <orvane/Scan/FileSystem.h>
 
@@ -19,8 +24,11 @@ std::error_code lastError() {
 class Descriptor final {
  public:
   explicit Descriptor(int number) : number_(number) {}
-  Descriptor(const Descriptor&) = delete;
-  Descriptor& operator=(const Descriptor&) = delete;
+  Descriptor(Descriptor&& other) noexcept : number_(other.release()) {}
+  Descriptor& operator=(Descriptor&& other) noexcept {
+    std::swap(number_, other.number_);
+    return *this;
+  }
   ~Descriptor() {
     if (number_ >= 0) ::close(number_);
   }
@@ -31,6 +39,44 @@ class Descriptor final {
  private:
   int number_;
 };
+
+/// How far one step of `openWithoutLinks` goes.
+enum class Stride { longest, oneName };
+
+std::size_t endOfStep(std::string_view path, Stride stride) {
+  if (stride == Stride::oneName) return std::min(path.find('/', 1), path.size());
+  return path.size() < PATH_MAX ? path.size()
+                                : std::min(path.rfind('/', PATH_MAX - 1), path.size());
+}
+
+int openStep(int folder, const std::string& path, int flags, Stride stride) {
+  // In a path of one name, O_NOFOLLOW leaves nothing to follow.
+  if (stride == Stride::oneName) return ::openat(folder, path.c_str(), flags | O_NOFOLLOW);
+  open_how how{};
+  how.flags = static_cast<unsigned>(flags);
+  how.resolve = RESOLVE_NO_SYMLINKS;
+  return static_cast<int>(::syscall(SYS_openat2, folder, path.c_str(), &how, sizeof how));
+}
+
+/// Opens an absolute path of any length and follows no symbolic link in any part of it, so that a
+/// folder that was swapped for one leads nowhere. Goes down by descriptors and holds two at most.
+Descriptor openWithoutLinks(std::string_view path, int flags) {
+  Descriptor reached(AT_FDCWD);
+  for (Stride stride = Stride::longest;;) {
+    const std::size_t end = endOfStep(path, stride);
+    const bool isLast = end == path.size();
+    Descriptor next(openStep(reached.get(), std::string(path.substr(0, end)),
+                             (isLast ? flags : O_PATH | O_DIRECTORY) | O_CLOEXEC, stride));
+    // Kernels before 5.6 do not have the call for more than one name, some sandboxes forbid it.
+    if (next.get() < 0 && stride == Stride::longest && (errno == ENOSYS || errno == EPERM)) {
+      stride = Stride::oneName;
+      continue;
+    }
+    if (next.get() < 0 || isLast) return next;
+    reached = std::move(next);
+    path.remove_prefix(end + 1);
+  }
+}
 
 struct CloseFolder {
   void operator()(DIR* folder) const { ::closedir(folder); }
@@ -44,7 +90,7 @@ FileStatus statusFrom(const struct stat& facts) {
 
 class DescriptorFile final : public OpenFile {
  public:
-  explicit DescriptorFile(int descriptor) : descriptor_(descriptor) {}
+  explicit DescriptorFile(Descriptor descriptor) : descriptor_(std::move(descriptor)) {}
 
   FileResult<std::size_t> read(std::span<std::byte> buffer) override {
     for (;;) {
@@ -87,7 +133,7 @@ void addEntry(FolderListing& listing, int folder, const dirent& entry) {
 class POSIXFileSystem final : public FileSystem {
  public:
   FileResult<FolderListing> list(const std::string& folder) override {
-    Descriptor descriptor(::open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_NOFOLLOW | O_CLOEXEC));
+    Descriptor descriptor = openWithoutLinks(folder, O_RDONLY | O_DIRECTORY);
     if (descriptor.get() < 0) return lastError();
     struct stat facts;
     if (::fstat(descriptor.get(), &facts) != 0) return lastError();
@@ -103,17 +149,17 @@ class POSIXFileSystem final : public FileSystem {
       if (entry == nullptr) break;
       addEntry(listing, number, *entry);
     }
-    if (errno != 0) return lastError();
+    if (errno != 0) listing.interruption = lastError();
     return listing;
   }
 
   FileResult<std::unique_ptr<OpenFile>> open(const std::string& path, ReadingPlan plan) override {
-    const int descriptor =
-        ::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC);
-    if (descriptor < 0) return lastError();
-    std::unique_ptr<OpenFile> file = std::make_unique<DescriptorFile>(descriptor);
+    Descriptor descriptor = openWithoutLinks(path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
+    if (descriptor.get() < 0) return lastError();
     // Without read-ahead a cold disk is asked for the beginning alone.
-    if (plan == ReadingPlan::beginningOnly) ::posix_fadvise(descriptor, 0, 0, POSIX_FADV_RANDOM);
+    if (plan == ReadingPlan::beginningOnly)
+      ::posix_fadvise(descriptor.get(), 0, 0, POSIX_FADV_RANDOM);
+    std::unique_ptr<OpenFile> file = std::make_unique<DescriptorFile>(std::move(descriptor));
     return file;
   }
 };

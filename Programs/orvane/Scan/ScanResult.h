@@ -5,6 +5,8 @@
 #include <string>
 #include <vector>
 
+#include <orvane/Scan/Loss.h>
+
 namespace Orvane {
 
 /// Files of the same content, at least two, by one path each.
@@ -36,10 +38,12 @@ struct ScanTotals {
   bool operator==(const ScanTotals&) const = default;
 };
 
-/// The groups, most wasted bytes first and then by their first path, and the totals.
+/// The groups, most wasted bytes first and then by their first path, and the totals. When a folder
+/// to scan could not be read there are neither: nothing was scanned.
 struct ScanResult {
-  std::vector<DuplicateGroup> groups;
-  ScanTotals totals;
+  std::vector<LostPath> lostFolders{};  ///< Of those to scan.
+  std::vector<DuplicateGroup> groups{};
+  ScanTotals totals{};
 };
 
 }  // namespace Orvane
