@@ -31,8 +31,6 @@ ContentStream::Block ContentStream::readBlock(std::span<std::byte> buffer) {
         path_, isPart ? ReadingPlan::beginningOnly : ReadingPlan::everything);
     if (!opened) return Loss::because(opened.error());
     open_ = std::move(*opened);
-    // Nothing is taken from a pipe or a device that stands where the file was.
-    if (const auto loss = lossSinceTheWalk()) return *loss;
   }
   for (std::size_t filled = 0; filled < buffer.size();) {
     const auto count = open_->read(buffer.subspan(filled));
@@ -42,17 +40,12 @@ ContentStream::Block ContentStream::readBlock(std::span<std::byte> buffer) {
   }
   remaining_ -= buffer.size();
   if (remaining_ == 0) {
-    if (const auto loss = lossSinceTheWalk()) return *loss;
+    const auto status = open_->status();
+    if (!status) return Loss::because(status.error());
+    if (*status != file_.status) return Loss{Loss::Kind::changed, {}};
     open_.reset();
   }
   return std::span<const std::byte>(buffer);
-}
-
-std::optional<Loss> ContentStream::lossSinceTheWalk() {
-  const auto status = open_->status();
-  if (!status) return Loss::because(status.error());
-  if (*status != file_.status) return Loss{Loss::Kind::changed, {}};
-  return std::nullopt;
 }
 
 }  // namespace Orvane

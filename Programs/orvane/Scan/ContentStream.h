@@ -4,7 +4,6 @@
 #include <cstddef>
 #include <cstdint>
 #include <memory>
-#include <optional>
 #include <span>
 #include <string>
 
@@ -17,8 +16,8 @@ class ContentAccess;
 struct FileRecord;
 
 /// Reads a file's content from its beginning, each block inside an access of its own, so that a
-/// more urgent reader of the disk waits for one block at most. Before the first block, and with the
-/// last, it makes sure that the file is still the one, and in the state, that the walk saw.
+/// more urgent reader of the disk waits for one block at most. With the last block it makes sure
+/// that the file is still the one, and in the state, that the walk saw.
 ///
 ///     ContentStream stream(file, file.status.size, {fileSystem, access});
 ///     do {
@@ -50,7 +49,6 @@ class ContentStream final {
 
  private:
   Block readBlock(std::span<std::byte> buffer);
-  std::optional<Loss> lossSinceTheWalk();
 
   Ports ports_;
   const FileRecord& file_;

@@ -94,8 +94,12 @@ class DescriptorFile final : public OpenFile {
 
   FileResult<std::size_t> read(std::span<std::byte> buffer) override {
     for (;;) {
-      const ssize_t count = ::read(descriptor_.get(), buffer.data(), buffer.size());
-      if (count >= 0) return static_cast<std::size_t>(count);
+      // Unlike a plain read it takes nothing from a pipe that stands where the file was.
+      const ssize_t count = ::pread(descriptor_.get(), buffer.data(), buffer.size(), offset_);
+      if (count >= 0) {
+        offset_ += count;
+        return static_cast<std::size_t>(count);
+      }
       if (errno != EINTR) return lastError();
     }
   }
@@ -108,6 +112,7 @@ class DescriptorFile final : public OpenFile {
 
  private:
   Descriptor descriptor_;
+  off_t offset_ = 0;
 };
 
 /// Adds the entry to the listing. The kind that comes with the name saves asking for the status of
