@@ -40,7 +40,8 @@ class MountTable;
 [[nodiscard]] std::unique_ptr<ExtendedAttributes> makeExtendedAttributes();
 /// `root` is the folder below which /etc, /proc and /sys lie.
 [[nodiscard]] std::unique_ptr<MachineIdentity> makeMachineIdentity(const std::string& root = "/");
-[[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo();
+/// `root` is the folder below which /proc lies.
+[[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo(const std::string& root = "/");
 [[nodiscard]] std::unique_ptr<ProcessLauncher> makeProcessLauncher();
 [[nodiscard]] std::unique_ptr<UserDefaults> makeUserDefaults();
 [[nodiscard]] std::unique_ptr<MainQueue> makeMainQueue();
