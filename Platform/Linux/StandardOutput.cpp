@@ -70,18 +70,22 @@ void write(std::FILE* stream, std::string_view text, bool flushes) {
 
 std::atomic<bool> isProcessEnding = false;
 
-void flushBeforeTheEnd() {
-  isProcessEnding = true;
-  const LockedStream lock(stdout);
-  write(stdout, {}, true);
-}
-
-// A child would write the same text again. Where another thread sleeps in a write, the child has
-// to.
-void flushBeforeFork() {
+// Does not wait for a thread that writes to a slow reader.
+void flush() {
   if (::ftrylockfile(stdout) != 0) return;
   write(stdout, {}, true);
   ::funlockfile(stdout);
+}
+
+// What the C library writes after this could end the process by a signal.
+void flushBeforeTheEnd() {
+  isProcessEnding = true;
+  flush();
+}
+
+// A child would write the same text again.
+void flushBeforeFork() {
+  flush();
 }
 
 class StandardStream : public StandardOutput {
