@@ -24,10 +24,10 @@ int lastPriority = 0;
 }  // namespace
 
 // In place of the C library's.
-extern "C" void openlog(const char*, int, int) noexcept {
+extern "C" void openlog(const char*, int, int) {
   ++openedLogs;
 }
-extern "C" void syslog(int priority, const char*, ...) noexcept {
+extern "C" void syslog(int priority, const char*, ...) {
   lastPriority = priority;
 }
 
