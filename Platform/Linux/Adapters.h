@@ -16,6 +16,7 @@ class NotificationServer;
 class ProcessInfo;
 class ProcessLauncher;
 class SoundPlayer;
+class StandardOutput;
 class SystemLog;
 class UserDefaults;
 class UserLocale;
@@ -40,10 +41,12 @@ class MountTable;
 [[nodiscard]] std::unique_ptr<ExtendedAttributes> makeExtendedAttributes();
 /// `root` is the folder below which /etc, /proc and /sys lie.
 [[nodiscard]] std::unique_ptr<MachineIdentity> makeMachineIdentity(const std::string& root = "/");
-[[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo();
+/// `root` is the folder below which /proc lies.
+[[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo(const std::string& root = "/");
 [[nodiscard]] std::unique_ptr<ProcessLauncher> makeProcessLauncher();
 [[nodiscard]] std::unique_ptr<UserDefaults> makeUserDefaults();
 [[nodiscard]] std::unique_ptr<MainQueue> makeMainQueue();
+[[nodiscard]] std::unique_ptr<StandardOutput> makeStandardOutput();
 [[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog);
 [[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(SystemLog& systemLog);
 [[nodiscard]] std::unique_ptr<WallClockTimer> makeWallClockTimer(SystemLog& systemLog);

@@ -2,6 +2,7 @@
 #include <Platform/Ports/ProcessInfo.h>
 
 #include <dlfcn.h>
+#include <sys/auxv.h>
 #include <sys/utsname.h>
 
 #include <charconv>
@@ -44,8 +45,39 @@ OperatingSystemVersion versionFromRelease(std::string_view release) {
   return version;
 }
 
+// The kernel marks the name of a file that was removed or replaced, as an update does, since the
+// process began.
+fs::path withoutMarkOfDeletion(const fs::path& path, const fs::path& link) {
+  constexpr std::string_view mark = " (deleted)";
+  std::string text = path.string();
+  std::error_code failed;
+  if (!text.ends_with(mark) || fs::equivalent(path, link, failed)) return path;
+  text.resize(text.size() - mark.size());
+  return text;
+}
+
+// Without /proc, in a bare sandbox or early in a machine's start, the kernel has left what the
+// program was called by. A name that leads nowhere from here still tells the last component.
+fs::path pathThatWasCalled() {
+  const auto* name = reinterpret_cast<const char*>(::getauxval(AT_EXECFN));
+  if (!name) return {};
+  std::error_code failed;
+  const fs::path path = fs::canonical(name, failed);
+  return failed ? fs::absolute(name, failed) : path;
+}
+
+fs::path findExecutable(const fs::path& root) {
+  const fs::path link = root / "proc/self/exe";
+  std::error_code failed;
+  const fs::path path = fs::read_symlink(link, failed);
+  return failed ? pathThatWasCalled() : withoutMarkOfDeletion(path, link);
+}
+
+// The executable is looked up once: an update may give the running file another name.
 class ProcProcessInfo final : public ProcessInfo {
  public:
+  explicit ProcProcessInfo(const fs::path& root) : executable_(findExecutable(root)) {}
+
   std::optional<std::string> environmentVariable(std::string_view name) const override {
     const char* value = std::getenv(std::string(name).c_str());
     if (!value) return std::nullopt;
@@ -57,15 +89,10 @@ class ProcProcessInfo final : public ProcessInfo {
     return ::uname(&names) == 0 ? versionFromRelease(names.release) : OperatingSystemVersion();
   }
 
-  std::string executablePath() const override {
-    std::error_code failed;
-    const fs::path path = fs::read_symlink("/proc/self/exe", failed);
-    return failed ? std::string() : path.string();
-  }
+  std::string executablePath() const override { return executable_.string(); }
 
   std::optional<std::string> mainBundleFolder() const override {
-    const fs::path executable = executablePath();
-    return asText(findBundleFolder(executable, executable.filename().string()));
+    return asText(findBundleFolder(executable_, executable_.filename().string()));
   }
 
   std::optional<std::string> bundleFolderOfCode(const void* address,
@@ -75,18 +102,21 @@ class ProcProcessInfo final : public ProcessInfo {
     std::error_code failed;
     fs::path path = fs::canonical(image.dli_fname, failed);
     // The loader names the executable itself as it was called, perhaps by a relative path.
-    if (failed) path = executablePath();
+    if (failed) path = executable_;
     if (name.empty()) return asText(findBundleFolder(path, nameOfImage(path)));
     // The Info.plist beside a library may be that of the application it is shipped with.
     const auto shared = findSharedFolder(path, name);
     return asText(shared ? shared : findBundleFolder(path, name));
   }
+
+ private:
+  const fs::path executable_;
 };
 
 }  // namespace
 
-std::unique_ptr<ProcessInfo> makeProcessInfo() {
-  return std::make_unique<ProcProcessInfo>();
+std::unique_ptr<ProcessInfo> makeProcessInfo(const std::string& root) {
+  return std::make_unique<ProcProcessInfo>(root);
 }
 
 }  // namespace Varnel::Platform::Linux

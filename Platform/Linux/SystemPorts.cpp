@@ -67,7 +67,7 @@ const Ports& systemPorts() {
       .processLauncher = keep(Linux::makeProcessLauncher()),
       .securityScope = keep(POSIX::makeSecurityScope()),
       .soundPlayer = keep(Linux::makeSoundPlayer(systemLog)),
-      .standardOutput = keep(POSIX::makeStandardOutput()),
+      .standardOutput = keep(Linux::makeStandardOutput()),
       .systemLog = systemLog,
       .userAccount = keep(POSIX::makeUserAccount()),
       .userDefaults = keep(Linux::makeUserDefaults()),

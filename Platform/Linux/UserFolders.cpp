@@ -34,7 +34,8 @@ fs::path userStateFolder() {
 }
 
 std::string applicationFolderName() {
-  return fs::path(makeProcessInfo()->executablePath()).filename().string();
+  static const auto& executable = *new fs::path(makeProcessInfo()->executablePath());
+  return executable.filename().string();
 }
 
 }  // namespace Varnel::Platform::Linux

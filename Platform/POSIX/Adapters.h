@@ -9,7 +9,6 @@ class AppendFiles;
 class Clock;
 class HTTPClient;
 class SecurityScope;
-class StandardOutput;
 class SystemLog;
 class UserAccount;
 class UserLocale;
@@ -24,7 +23,6 @@ namespace Varnel::Platform::POSIX {
 /// Without the module of libcurl every post fails.
 [[nodiscard]] std::unique_ptr<HTTPClient> makeHTTPClient();
 [[nodiscard]] std::unique_ptr<SecurityScope> makeSecurityScope();
-[[nodiscard]] std::unique_ptr<StandardOutput> makeStandardOutput();
 [[nodiscard]] std::unique_ptr<SystemLog> makeSystemLog();
 [[nodiscard]] std::unique_ptr<UserAccount> makeUserAccount();
 [[nodiscard]] std::unique_ptr<UserLocale> makeUserLocale();

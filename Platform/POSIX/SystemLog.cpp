@@ -6,23 +6,24 @@
 #include <string>
 
 #include <Platform/POSIX/Adapters.h>
+#include <Platform/Ports/StandardOutput.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {
 
 // Where someone debugs, the lines show on standard error too.
 #ifdef NDEBUG
-constexpr int alsoOnStandardError = 0;
+constexpr bool alsoOnStandardError = false;
 #else
-constexpr int alsoOnStandardError = LOG_PERROR;
+constexpr bool alsoOnStandardError = true;
 #endif
 
+// The process has one connection to the log, and its name and options are the host's to choose.
 class Syslog final : public SystemLog {
  public:
-  Syslog() { ::openlog(nullptr, LOG_PID | alsoOnStandardError, LOG_USER); }
-
   void write(std::string_view line) override {
-    ::syslog(LOG_NOTICE, "%.*s", static_cast<int>(line.size()), line.data());
+    ::syslog(LOG_USER | LOG_NOTICE, "%.*s", static_cast<int>(line.size()), line.data());
+    if (alsoOnStandardError) makeStandardErrorOutput()->print(std::string(line) + "\n");
   }
 };
 

@@ -30,27 +30,34 @@ std::optional<Record> recordOfUser() {
   passwd* found = nullptr;
   if (::getpwuid_r(::getuid(), &entry, buffer.data(), buffer.size(), &found) != 0 || !found)
     return std::nullopt;
-  return Record{found->pw_name, withoutTrailingSlashes(found->pw_dir)};
+  return Record{found->pw_name, found->pw_dir};
 }
 
-std::string environmentOr(const char* name, std::string fallback) {
+std::optional<std::string> environmentVariable(const char* name) {
   const char* value = std::getenv(name);
-  return value && *value ? withoutTrailingSlashes(value) : std::move(fallback);
+  return value && *value ? std::optional<std::string>(value) : std::nullopt;
+}
+
+// A relative home would be another folder wherever the process goes.
+std::string homeOr(const std::optional<std::string>& path, std::string_view fallback) {
+  return withoutTrailingSlashes(path && path->front() == '/' ? *path : fallback);
 }
 
 // A user without a record (a bare container) still has the environment; the root folder comes last.
 class PasswdAccount final : public UserAccount {
  public:
-  std::string homeFolder() const override { return environmentOr("HOME", realHomeFolder()); }
+  std::string homeFolder() const override {
+    return homeOr(environmentVariable("HOME"), realHomeFolder());
+  }
 
   std::string realHomeFolder() const override {
-    if (auto record = recordOfUser()) return record->homeFolder;
-    return environmentOr("HOME", "/");
+    const auto record = recordOfUser();
+    return homeOr(record ? record->homeFolder : environmentVariable("HOME"), "/");
   }
 
   std::string name() const override {
     if (auto record = recordOfUser()) return record->name;
-    return environmentOr("USER", std::to_string(::getuid()));
+    return environmentVariable("USER").value_or(std::to_string(::getuid()));
   }
 };
 

@@ -30,7 +30,8 @@ class VARNEL_API ProcessInfo {
   /// The system's version; where it is numbered otherwise, its core's. Unknown numbers are 0.
   [[nodiscard]] virtual OperatingSystemVersion operatingSystemVersion() const = 0;
 
-  /// The absolute path of the running executable; empty when the system does not tell.
+  /// The absolute path of the running executable, which may have been removed or replaced since;
+  /// empty when the system does not tell.
   [[nodiscard]] virtual std::string executablePath() const = 0;
 
   /// The folder that holds the running application's Info.plist; absent when it has none.

@@ -14,7 +14,8 @@ class VARNEL_API StandardOutput {
   virtual ~StandardOutput() = default;
 
   /// Prints the text as it is, with no terminator. Texts of different threads never mix. A stream
-  /// that is closed or full loses the text without a word; one whose reader is slow may block.
+  /// that is closed or full, or whose reader has gone, loses the text without a word or a signal;
+  /// one whose reader is slow may block.
   virtual void print(std::string_view text) = 0;
 };
 

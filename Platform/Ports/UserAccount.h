@@ -7,13 +7,14 @@
 
 namespace Varnel::Platform {
 
-/// The user that the process runs as. Any thread. Paths have no trailing "/"
-/// (but the root is "/").
+/// The user that the process runs as. Any thread. Paths are absolute and have no trailing "/" (but
+/// the root is "/").
 class VARNEL_API UserAccount {
  public:
   virtual ~UserAccount() = default;
 
-  /// What "~" stands for. A sandbox may have moved it away from the real home.
+  /// What "~" stands for. The environment or a sandbox may have moved it away from the real home,
+  /// though never to a relative path.
   [[nodiscard]] virtual std::string homeFolder() const = 0;
 
   /// The home folder in the system's own records of users.

@@ -86,7 +86,9 @@ void BaseModule::setVersion(std::string version) {
 }
 
 void BaseModule::logInitialization() const {
-  Logger::instance().log("Initalizing module " + fetchVersion().value_or(undefined), typeName());
+  std::call_once(initializationLogged_, [&] {
+    Logger::instance().log("Initalizing module " + fetchVersion().value_or(undefined), typeName());
+  });
 }
 
 }  // namespace Varnel

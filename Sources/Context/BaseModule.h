@@ -18,11 +18,14 @@ namespace Varnel {
 ///
 ///     class ReportModule final : public BaseModule {
 ///      public:
+///       ReportModule() { logInitialization(); }  // "Initalizing module 1.4 (210/undefined)"
 ///       std::string identifier() const override { return "report-module"; }
 ///       std::string typeName() const override { return "ReportModule"; }
 ///       using BaseModule::identifier;
 ///     };
-///     auto module = makeModule<ReportModule>();  // logs "Initalizing module 1.4 (210/undefined)"
+///
+/// The last step of making a module is to log that it is there. A base's constructor could not
+/// reach what its subclass overrides, so the final class's constructor or `makeModule` does it.
 ///
 /// Any thread. `bundle` and `version` are found by their first reader unless they were set before;
 /// what finds the bundle must not ask for either.
@@ -63,17 +66,17 @@ class VARNEL_API BaseModule {
   [[nodiscard]] std::string version() const;
   void setVersion(std::string version);
 
-  /// Logs that the module is there. `makeModule` calls it, for a constructor could not yet reach
-  /// what a subclass overrides.
+  /// Logs the module's version, under the name of its type: once, later calls do nothing.
   void logInitialization() const;
 
  private:
+  mutable std::once_flag initializationLogged_;
   mutable std::mutex mutex_;  ///< Owns the two below.
   mutable std::optional<Bundle> bundle_;
   mutable std::optional<std::string> version_;
 };
 
-/// Makes a module and logs its version.
+/// Makes a module and logs its version, unless its constructor did.
 template <std::derived_from<BaseModule> Module, typename... Arguments>
 [[nodiscard]] std::shared_ptr<Module> makeModule(Arguments&&... arguments) {
   auto module = std::make_shared<Module>(std::forward<Arguments>(arguments)...);

@@ -23,10 +23,14 @@ SharedModule& sharedModule() {
 
 }  // namespace
 
+VarnelModule::VarnelModule() {
+  logInitialization();
+}
+
 std::shared_ptr<VarnelModule> VarnelModule::instance() {
   SharedModule& shared = sharedModule();
   const std::lock_guard lock(shared.mutex);
-  if (!shared.module) shared.module = makeModule<VarnelModule>();
+  if (!shared.module) shared.module = std::make_shared<VarnelModule>();
   return shared.module;
 }
 

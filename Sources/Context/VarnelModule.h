@@ -18,6 +18,9 @@ namespace Varnel {
 /// Any thread.
 class VARNEL_API VarnelModule final : public BaseModule {
  public:
+  /// Logs the framework's version.
+  VarnelModule();
+
   using BaseModule::identifier;
 
   /// The shared module, made, and logged, on first use.

@@ -6,6 +6,7 @@
 #include <utility>
 
 #include <Varnel/Identification/CustomDimensionValues.h>
+#include <Varnel/Identification/FoundValue.h>
 #include <Varnel/Identification/UserIdentificationInfo.h>
 #include <Varnel/Identification/UserIdentificator.h>
 #include <Varnel/Provenance/OVFriendsLocator.h>
@@ -14,9 +15,10 @@ namespace Varnel {
 namespace {
 
 struct Values {
-  std::mutex mutex;  // Owns all of them. It is held while a first reading finds its value.
-  std::optional<std::string> clientIdentifier;
-  std::optional<std::optional<std::string>> downloadSourceURL;
+  FoundValue<std::string> clientIdentifier;
+  FoundValue<std::optional<std::string>> downloadSourceURL;
+
+  std::mutex mutex;  // Owns what follows.
   double achievementsFractionCompleted = 0;
   std::int64_t scanCount = 0;
   std::int64_t cleanCount = 0;
@@ -34,38 +36,29 @@ auto read(Value Values::*member) {
   return values().*member;
 }
 
-template <typename Value, typename New>
-void assign(Value Values::*member, New value) {
-  const std::lock_guard lock(values().mutex);
-  values().*member = std::move(value);
-}
-
-// The value, found by `find` where nothing was found or set before.
 template <typename Value>
-Value known(std::optional<Value> Values::*member, Value (*find)()) {
+void assign(Value Values::*member, Value value) {
   const std::lock_guard lock(values().mutex);
-  auto& value = values().*member;
-  if (!value) value = find();
-  return *value;
+  values().*member = value;
 }
 
 }  // namespace
 
 std::string CustomDimensionsHolder::clientIdentifier() {
-  return known<std::string>(&Values::clientIdentifier, [] {
+  return values().clientIdentifier.get([] {
     return UserIdentificationInfo(std::make_shared<UserIdentificator>()).uniqueClientIdentifier();
   });
 }
 void CustomDimensionsHolder::setClientIdentifier(std::string identifier) {
-  assign(&Values::clientIdentifier, std::move(identifier));
+  values().clientIdentifier.set(std::move(identifier));
 }
 
 std::optional<std::string> CustomDimensionsHolder::downloadSourceURL() {
-  return known<std::optional<std::string>>(
-      &Values::downloadSourceURL, [] { return UserIdentificator().downloadSourceURLString(); });
+  return values().downloadSourceURL.get(
+      [] { return UserIdentificator().downloadSourceURLString(); });
 }
 void CustomDimensionsHolder::setDownloadSourceURL(std::optional<std::string> url) {
-  assign(&Values::downloadSourceURL, std::make_optional(std::move(url)));
+  values().downloadSourceURL.set(std::move(url));
 }
 
 double CustomDimensionsHolder::achievementsFractionCompleted() {

@@ -16,7 +16,8 @@ namespace Varnel {
 ///     CustomDimensionsHolder::setLaunchCount(settings.launches());
 ///
 /// Identifier and download source are found at their first reading unless set before, which reads
-/// files and may wait for a program. Any thread.
+/// files and may wait for a program. Meanwhile the other values can be read, and all of them set.
+/// Any thread.
 class VARNEL_API CustomDimensionsHolder final {
  public:
   CustomDimensionsHolder() = delete;

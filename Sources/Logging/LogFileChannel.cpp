@@ -8,6 +8,7 @@
 #include <fmt/format.h>
 
 #include <Platform/Concurrency/CurrentThread.h>
+#include <Platform/Concurrency/StartThread.h>
 
 namespace Varnel {
 namespace {
@@ -20,9 +21,14 @@ constexpr std::size_t keptCapacity = std::size_t{1} << 20;
 }  // namespace
 
 LogFileChannel::LogFileChannel(Platform::AppendFiles& files, Platform::StandardOutput& output,
-                               std::string path, LogWritePolicy policy)
-    : files_(files), output_(output), path_(std::move(path)), policy_(policy), wakeMark_(never) {
-  startWriter();
+                               std::string path, LogWritePolicy policy, Start start)
+    : files_(files),
+      output_(output),
+      path_(std::move(path)),
+      policy_(policy),
+      wakeMark_(never),
+      isStarted_(start == Start::atOnce) {
+  if (isStarted_) startWriter();
 }
 
 LogFileChannel::~LogFileChannel() {
@@ -37,7 +43,7 @@ LogFileChannel::~LogFileChannel() {
 
 void LogFileChannel::startWriter() {
   try {
-    writer_ = std::thread(&LogFileChannel::runWriter, this);
+    writer_ = Platform::startThread("Logging Queue", [this] { runWriter(); });
   } catch (const std::system_error&) {
     // A process that may have no more threads still gets its log, in its own time.
     writeThrough();
@@ -45,11 +51,13 @@ void LogFileChannel::startWriter() {
 }
 
 void LogFileChannel::append(std::string_view entry) {
+  bool starts = false;
   bool wakes = false;
   bool writesNow = false;
   {
     const std::lock_guard lock(gatherMutex_);
     if (isEnded_) return;
+    starts = !std::exchange(isStarted_, true);
     if (gathered_.bytes.empty()) since_ = Clock::now();
     gathered_.bytes += entry;
     ++gathered_.entries;
@@ -57,18 +65,20 @@ void LogFileChannel::append(std::string_view entry) {
     wakes = gathered_.bytes.size() >= wakeMark_;
     if (wakes) wakeMark_ = never;
   }
+  if (starts) startWriter();
   if (wakes) wakeUp_.notify_one();
   if (writesNow) flush();
 }
 
 void LogFileChannel::flush() {
   const std::lock_guard file(fileMutex_);
-  if (!std::exchange(isOpened_, true)) openFile();
   {
     const std::lock_guard lock(gatherMutex_);
+    if (!isStarted_) return;
     std::swap(gathered_, written_);
     since_ = Clock::now();
   }
+  if (!std::exchange(isOpened_, true)) openFile();
   if (file_ && written_.entries > 0) write(written_);
   if (written_.bytes.capacity() > keptCapacity) written_.bytes = {};
   written_.bytes.clear();
@@ -84,7 +94,6 @@ void LogFileChannel::writeThrough() {
 }
 
 void LogFileChannel::runWriter() {
-  Platform::nameCurrentThread("Logging Queue");
   Platform::setCurrentThreadQuality(Platform::QualityOfService::background);
   flush();
   std::unique_lock lock(gatherMutex_);

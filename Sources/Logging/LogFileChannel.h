@@ -28,8 +28,13 @@ namespace Varnel {
 /// Any thread. Destruction writes what has gathered.
 class LogFileChannel final {
  public:
+  enum class Start {
+    atOnce,
+    withTheFirstEntry,  ///< Until then there is neither a file nor a thread.
+  };
+
   LogFileChannel(Platform::AppendFiles& files, Platform::StandardOutput& output, std::string path,
-                 LogWritePolicy policy = {});
+                 LogWritePolicy policy = {}, Start start = Start::atOnce);
   ~LogFileChannel();
   LogFileChannel(const LogFileChannel&) = delete;
   LogFileChannel& operator=(const LogFileChannel&) = delete;
@@ -77,6 +82,7 @@ class LogFileChannel final {
   Clock::time_point since_ = Clock::now();  ///< Of the first waiting byte, or of the last write.
   std::size_t
       wakeMark_;  ///< So many bytes wake the writer; more than there can be while it is awake.
+  bool isStarted_;
   bool isEnded_ = false;  ///< The file could not be opened.
   bool writesThrough_ = false;
   bool isClosing_ = false;

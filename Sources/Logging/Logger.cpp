@@ -4,9 +4,11 @@
 #include <cstdlib>
 #include <filesystem>
 #include <system_error>
+#include <vector>
 
 #include <fmt/format.h>
 
+#include <Platform/Concurrency/ForkedChild.h>
 #include <Platform/Ports/AppendFiles.h>
 #include <Platform/Ports/Clock.h>
 #include <Platform/Ports/Ports.h>
@@ -53,6 +55,7 @@ Logger& Logger::instance() {
     };
     std::atexit(endGathering);
     std::at_quick_exit(endGathering);
+    Platform::callInForkedChildren([] { logger.beginAnewInForkedChild(); });
     return logger;
   }();
   return shared;
@@ -86,6 +89,16 @@ void Logger::openFile(std::string_view baseIdentifier) {
   fileChannel_ = std::make_unique<LogFileChannel>(ports_.appendFiles, ports_.standardOutput, path);
   filePath_ = path;
   ports_.standardOutput.print(fmt::format("Will store log at {}\n", path));
+}
+
+// The parent writes what has gathered; its thread, and locks that it held, are not in the child.
+void Logger::beginAnewInForkedChild() {
+  static auto& ofTheParents = *new std::vector<std::unique_ptr<LogFileChannel>>;
+  if (!fileChannel_) return;
+  ofTheParents.push_back(std::move(fileChannel_));
+  fileChannel_ =
+      std::make_unique<LogFileChannel>(ports_.appendFiles, ports_.standardOutput, *filePath_,
+                                       LogWritePolicy(), LogFileChannel::Start::withTheFirstEntry);
 }
 
 void Logger::log(std::string_view message, std::string_view author, const LoggingContextTags& tags,

@@ -120,6 +120,7 @@ class VARNEL_API Logger final {
 
  private:
   void openFile(std::string_view baseIdentifier);
+  void beginAnewInForkedChild();
 
   Ports ports_;
   std::atomic<bool> isAnonymousMode_ = false;

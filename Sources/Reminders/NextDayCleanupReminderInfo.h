@@ -53,4 +53,7 @@ class VARNEL_API NextDayCleanupReminderInfo final {
   std::int64_t foundSize_;
 };
 
+/// The name under which the interface layer knows the class.
+using OVNextDayCleanupReminderInfo = NextDayCleanupReminderInfo;
+
 }  // namespace Varnel

@@ -89,4 +89,7 @@ class VARNEL_API UserNotificationRouter final {
       routes_;  ///< What the center listens to, as long as the router lives.
 };
 
+/// The name under which the interface layer knows the class.
+using OVUserNotificationRouter = UserNotificationRouter;
+
 }  // namespace Varnel

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <fstream>
-#include <iterator>
+#include <vector>
 
 #include <gtest/gtest.h>
 
@@ -37,13 +37,27 @@ TEST(Module, VersionNamesEachNumberThatIsMissing) {
   EXPECT_EQ(withoutBundle.version(), "3");
 }
 
-TEST(Module, FactoryLogsWhatTheFinishedObjectSays) {
-  const auto module = makeModule<ReportModule>(Bundle(std::nullopt, {}));
-  EXPECT_EQ(module->identifier("window"), "report-module.window");
+// The modules that the last `count` entries of the log speak of.
+std::vector<std::string> lastEntries(std::size_t count) {
   Logger::instance().flush();
   std::ifstream log(Logger::instance().logFileURL()->path());
-  const std::string entries((std::istreambuf_iterator<char>(log)), {});
-  EXPECT_NE(entries.find("ReportModule:  Initalizing module undefined\n"), std::string::npos);
+  std::vector<std::string> entries;
+  for (std::string line; std::getline(log, line);)
+    entries.push_back(line.substr(line.find(']') + 2));
+  entries.erase(entries.begin(), entries.end() - static_cast<std::ptrdiff_t>(count));
+  return entries;
+}
+
+TEST(Module, LogsOnceThatItIsThereHoweverItIsMade) {
+  Logger::instance().log("begin", "Test");
+  const auto report = makeModule<ReportModule>(Bundle(std::nullopt, {}));
+  const VarnelModule direct;
+  const auto made = makeModule<VarnelModule>();
+  EXPECT_EQ(report->identifier("window"), "report-module.window");
+  const std::string framework = "VarnelModule:  Initalizing module " + direct.version();
+  EXPECT_EQ(lastEntries(4),
+            (std::vector<std::string>{"Test:  begin", "ReportModule:  Initalizing module undefined",
+                                      framework, framework}));
 }
 
 TEST(Module, FrameworkFindsItsOwnBundle) {

@@ -2,7 +2,9 @@
 #include <Varnel/Identification/CommonAnalyticsSender.h>
 
 #include <cmath>
+#include <latch>
 #include <limits>
+#include <thread>
 
 #include <Platform/Testing/CapturedOutput.h>
 #include <Platform/Testing/FakeAppendFiles.h>
@@ -12,6 +14,7 @@
 #include <Tallyhouse/Testing/MemoryTransport.h>
 #include <Varnel/Identification/CustomDimensionValues.h>
 #include <Varnel/Identification/CustomDimensionsHolder.h>
+#include <Varnel/Identification/FoundValue.h>
 #include <Varnel/Logging/Logger.h>
 #include <Varnel/Provenance/OVFriendsLocator.h>
 #include <gtest/gtest.h>
@@ -63,6 +66,25 @@ class CommonAnalyticsSenderTest : public testing::Test {
       std::make_shared<Tallyhouse::AnalyticsTracker>(sent_);
   ScannerSender sender_{tracker_, logger_};
 };
+
+TEST(FoundValue, MakesNobodyWaitThatHasAnother) {
+  FoundValue<int> value;
+  std::latch looks(1);
+  std::latch finds(1);
+  std::thread first([&] {
+    const int found = value.get([&] {
+      looks.count_down();
+      finds.wait();
+      return 1;
+    });
+    EXPECT_EQ(found, 2);
+  });
+  looks.wait();
+  value.set(2);
+  EXPECT_EQ(value.get([] { return 3; }), 2);
+  finds.count_down();
+  first.join();
+}
 
 TEST_F(CommonAnalyticsSenderTest, EmptyDimensionsStandForTheHoldersAndOthersForThemselves) {
   const CustomDimensions eight = {"12.34", std::nullopt, "0.0", "3", "0", "0", "1000001", "null"};

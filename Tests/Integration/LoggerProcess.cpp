@@ -1,4 +1,7 @@
 // SPDX-License-Identifier: MIT
+#include <sys/wait.h>
+#include <unistd.h>
+
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
@@ -29,22 +32,40 @@ void printOnStandardError() {
     std::abort();
 }
 
+void printForNobody() {
+  int ends[2];
+  if (::pipe(ends) != 0 || ::dup2(ends[1], STDOUT_FILENO) < 0) std::abort();
+  ::close(ends[0]);
+}
+
+// The child logs as well, and ends in full order.
+void logInChild(const std::string& author) {
+  const pid_t child = ::fork();
+  if (child == 0) {
+    Varnel::Logger::instance().log("child", author);
+    std::exit(EXIT_SUCCESS);
+  }
+  ::waitpid(child, nullptr, 0);
+}
+
 }  // namespace
 
 int main(int argc, char** argv) {
   if (argc != 5) return EXIT_FAILURE;
   const std::string_view ending = argv[1];
-  const std::string_view author = argv[2];
+  const std::string author = argv[2];
   const int count = std::atoi(argv[3]);
   const std::chrono::milliseconds pause(std::atoi(argv[4]));
 
   if (ending == "standard-error") printOnStandardError();
+  if (ending == "without-reader") printForNobody();
   // What has been printed is seen by the reader whatever happens next.
   if (ending == "killed") std::setvbuf(stdout, nullptr, _IOLBF, 0);
   for (int i = 0; i < count; ++i) {
     Varnel::Logger::instance().log(std::to_string(i), author);
     if (pause.count() > 0) std::this_thread::sleep_for(pause);
   }
+  if (ending == "forked") logInChild(author);
   if (ending == "killed") std::raise(SIGKILL);
   if (ending == "quick-exit") std::quick_exit(EXIT_SUCCESS);
   if (ending == "late-entry") logsAtTheVeryEnd.author = author;

@@ -31,8 +31,9 @@ using Process = std::unique_ptr<std::FILE, ClosePipe>;
 class LoggerProcessTest : public testing::Test {
  protected:
   [[nodiscard]] Process start(const std::string& arguments) const {
-    const std::string command =
-        "HOME='" + home.path().string() + "' exec '" + VARNEL_LOGGER_PROCESS "' " + arguments;
+    const std::string command = "HOME='" + home.path().string() +
+                                "' TSAN_OPTIONS=\"$TSAN_OPTIONS die_after_fork=0\" exec '" +
+                                VARNEL_LOGGER_PROCESS "' " + arguments;
     return Process(::popen(command.c_str(), "r"));
   }
 
@@ -128,6 +129,23 @@ TEST_F(LoggerProcessTest, GoesOnWhenTheDiskIsFull) {
 TEST_F(LoggerProcessTest, KeepsItsFileApartFromAClosedStandardOutput) {
   (void)run("exit A 3 0 >&-");
   EXPECT_EQ(std::ranges::count(log(), '\n'), 3) << log();
+}
+
+TEST_F(LoggerProcessTest, OutlivesTheReaderOfItsStandardOutput) {
+  // A few entries meet the closed pipe only when the process ends.
+  for (const std::string count : {"3", "2000"}) {
+    EXPECT_EQ(::pclose(start("without-reader A " + count + " 0").release()), 0);
+    EXPECT_THAT(log(), EndsWith("A:  " + std::to_string(std::stoi(count) - 1) + "\n"));
+  }
+}
+
+TEST_F(LoggerProcessTest, WritesEachEntryOnceThoughTheProcessForks) {
+  const std::string printed = entriesIn(run("forked A 3 0"));
+  EXPECT_EQ(std::ranges::count(printed, '\n'), 4) << printed;
+  EXPECT_THAT(printed, EndsWith("A:  child\n"));
+  // Parent and child write theirs when they end.
+  EXPECT_EQ(std::ranges::count(log(), '\n'), 4) << log();
+  EXPECT_THAT(log(), HasSubstr("A:  child\n"));
 }
 
 TEST_F(LoggerProcessTest, LeavesStandardOutputToAHostThatAsksForIt) {

@@ -1,0 +1,123 @@
+// SPDX-License-Identifier: MIT
+#include <gtest/gtest.h>
+#include <pthread.h>
+#include <signal.h>
+#include <stdlib.h>
+#include <syslog.h>
+
+#include <future>
+
+#include <Basalt/Executor.h>
+#include <Basalt/SerialQueue.h>
+#include <Platform/Concurrency/StartThread.h>
+#include <Platform/Linux/Adapters.h>
+#include <Platform/Linux/UserFolders.h>
+#include <Platform/POSIX/Adapters.h>
+#include <Platform/Ports/ProcessInfo.h>
+#include <Platform/Ports/SystemLog.h>
+#include <Platform/Ports/UserAccount.h>
+#include <Tests/Support/TemporaryFolder.h>
+
+namespace {
+int openedLogs = 0;
+int lastPriority = 0;
+}  // namespace
+
+// In place of the C library's.
+extern "C" void openlog(const char*, int, int) {
+  ++openedLogs;
+}
+extern "C" void syslog(int priority, const char*, ...) {
+  lastPriority = priority;
+}
+
+namespace Varnel::Platform {
+namespace {
+
+namespace fs = std::filesystem;
+
+struct Facts {
+  std::string name;
+  bool takesSignals = false;
+  bool takesFaults = false;
+};
+
+Facts currentFacts() {
+  char name[16] = "";
+  ::pthread_getname_np(::pthread_self(), name, sizeof name);
+  sigset_t blocked;
+  ::pthread_sigmask(SIG_BLOCK, nullptr, &blocked);
+  Facts facts{.name = name};
+  for (const int signal : {SIGTERM, SIGINT, SIGCHLD, SIGPIPE, SIGUSR1, SIGRTMIN})
+    facts.takesSignals |= ::sigismember(&blocked, signal) == 0;
+  facts.takesFaults = ::sigismember(&blocked, SIGSEGV) == 0;
+  return facts;
+}
+
+using Start = void (*)(std::function<void()> body);
+
+Facts factsIn(const Start& start) {
+  std::promise<Facts> facts;
+  start([&] { facts.set_value(currentFacts()); });
+  return facts.get_future().get();
+}
+
+TEST(StartThread, LeavesTheSignalsOfTheProcessToTheHost) {
+  const struct {
+    const char* name;
+    Start start;
+  } cases[] = {
+      {"a-name-of-more", [](auto body) { startThread("a-name-of-more", body).join(); }},
+      {"cut-at-fifteen-", [](auto body) { startThread("cut-at-fifteen-bytes", body).join(); }},
+      {"serial", [](auto body) { Basalt::SerialQueue("serial").async(body); }},
+      {"concurrent", [](auto body) { Basalt::globalConcurrentQueue()->execute(body); }},
+  };
+  for (const auto& [name, start] : cases) {
+    const Facts facts = factsIn(start);
+    EXPECT_EQ(facts.name, name);
+    EXPECT_FALSE(facts.takesSignals) << name;
+    EXPECT_TRUE(facts.takesFaults) << name;
+  }
+  EXPECT_TRUE(currentFacts().takesSignals) << "the caller goes on as before";
+}
+
+TEST(SystemLog, LeavesTheProcessesLogToTheHost) {
+  POSIX::makeSystemLog()->write("line");
+  EXPECT_EQ(openedLogs, 0);
+  EXPECT_EQ(lastPriority, LOG_USER | LOG_NOTICE);
+}
+
+TEST(ProcessInfo, KnowsItsExecutable) {
+  const Tests::TemporaryFolder root;
+  const fs::path link = root.path() / "proc/self/exe";
+  const std::string real = root.write("orvane (deleted)", "").string();
+  fs::create_directories(link.parent_path());
+  const std::pair<std::string, std::string> cases[] = {
+      {"/opt/orvane", "/opt/orvane"},
+      {"/opt/orvane (deleted)", "/opt/orvane"},
+      {real, real},
+  };
+  for (const auto& [target, executable] : cases) {
+    fs::remove(link);
+    fs::create_symlink(target, link);
+    EXPECT_EQ(Linux::makeProcessInfo(root.path().string())->executablePath(), executable);
+  }
+  EXPECT_EQ(Linux::makeProcessInfo("/without-proc")->executablePath(),
+            fs::read_symlink("/proc/self/exe"));
+}
+
+TEST(UserAccount, RefusesRelativeFolders) {
+  const auto account = POSIX::makeUserAccount();
+  const std::string real = account->realHomeFolder();
+  const std::pair<const char*, std::string> cases[] = {
+      {"/moved//", "/moved"}, {"/", "/"}, {"", real}, {"relative", real}, {"./home", real}};
+  for (const auto& [home, folder] : cases) {
+    ::setenv("HOME", home, 1);
+    EXPECT_EQ(account->homeFolder(), folder) << home;
+    ::setenv("XDG_DATA_HOME", "relative", 1);
+    EXPECT_EQ(Linux::userDataFolder(), fs::path(folder) / ".local/share");
+  }
+}
+
+}  // namespace
+}  // namespace Varnel::Platform
