@@ -23,8 +23,7 @@ class ScanSender final : public Varnel::CommonAnalyticsSender {
 };
 
 bool isOnThisMachine(const URL& url) {
-  const auto host = url.components().host;
-  return host == "127.0.0.1" || host == "localhost" || host == "[::1]";
+  return url.hasHost("127.0.0.1") || url.hasHost("localhost") || url.hasHost("[::1]");
 }
 
 std::shared_ptr<SpoolingTransport> transportTo(const URL& endpoint) {
@@ -43,10 +42,8 @@ std::shared_ptr<SpoolingTransport> transportTo(const URL& endpoint) {
 
 bool ScanAnalytics::isEndpoint(const std::string& text) {
   const auto url = URL::parse(text);
-  if (!url) return false;
-  const auto parts = url->components();
-  return parts.host && !parts.host->empty() &&
-         (parts.scheme == "https" || (parts.scheme == "http" && isOnThisMachine(*url)));
+  if (!url || url->components().host.value_or("").empty()) return false;
+  return url->hasScheme("https") || (url->hasScheme("http") && isOnThisMachine(*url));
 }
 
 ScanAnalytics::ScanAnalytics(const std::optional<std::string>& endpoint, bool printsEvents) {
