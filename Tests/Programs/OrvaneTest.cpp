@@ -257,6 +257,16 @@ TEST_F(Orvane, ExplainsAFilesAttributeAndIdentifiesTheInstallation) {
   EXPECT_EQ(user["uniqueClientIdentifier"], user["userIdentifier"]);
 }
 
+// The database is none here, which the system's log is told at each opening.
+TEST_F(Orvane, LooksOnceForWhatItWasDownloadedFrom) {
+  for (const auto& command :
+       {std::vector<std::string>{"identify"}, {"scan", "--print-events", folder.path()}}) {
+    const std::string errors = run(command).errors;
+    constexpr std::string_view opening = "Failed to open database!";
+    EXPECT_EQ(errors.find(opening), errors.rfind(opening)) << errors;
+  }
+}
+
 TEST_F(Orvane, ListsTheDiskOfItsFiles) {
   const Outcome text = run({"disks"});
   EXPECT_EQ(text.status, 0);
