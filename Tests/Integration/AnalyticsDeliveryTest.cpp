@@ -56,6 +56,23 @@ using namespace std::chrono_literals;
 using Varnel::Platform::HTTPPost;
 using Varnel::Platform::URL;
 
+// The proxies that the environment names while this object lives.
+class Proxies final {
+ public:
+  explicit Proxies(const std::string& address) {
+    for (const char* name : names) ::setenv(name, address.c_str(), 1);
+    for (const char* name : {"no_proxy", "NO_PROXY"}) ::unsetenv(name);
+  }
+  ~Proxies() {
+    for (const char* name : names) ::unsetenv(name);
+  }
+  Proxies(const Proxies&) = delete;
+  Proxies& operator=(const Proxies&) = delete;
+
+ private:
+  static constexpr const char* names[] = {"http_proxy", "https_proxy", "all_proxy"};
+};
+
 // A server in a process of its own, and what it was sent.
 class Server {
  public:
@@ -223,7 +240,7 @@ TEST_F(AnalyticsDeliveryTest, AKilledProcessDeliversOnTheNextStart) {
 
 TEST_F(AnalyticsDeliveryTest, AScanSendsItsEventsOnceWhateverItsEnvironment) {
   ::setenv("HOME", (folder_.path() / "home").c_str(), 1);
-  ::setenv("http_proxy", "http://127.0.0.1:1", 1);
+  const Proxies proxies("http://127.0.0.1:1");
   folder_.write("scanned/file", "content");
   Server server({"short"});
   for (int run = 0; run < 2; ++run) {
@@ -323,10 +340,7 @@ TEST(HTTPClient, GoesThroughAProxyButNotToThisMachine) {
   if (const std::string reason = trustCertificate(); !reason.empty()) GTEST_SKIP() << reason;
   Server server({"200"});
   Server proxy({"tunnel", "201", "tunnel", "403", "blind tunnel", "202"});
-  const std::string address = "http://127.0.0.1:" + portOf(proxy);
-  for (const char* name : {"http_proxy", "https_proxy", "all_proxy"})
-    ::setenv(name, address.c_str(), 1);
-  for (const char* name : {"no_proxy", "NO_PROXY"}) ::unsetenv(name);
+  const Proxies proxies("http://127.0.0.1:" + portOf(proxy));
 
   for (const char* host : {"127.0.0.1", "LOCALHOST", "a.localhost", "127.1", "0x7F000001"})
     EXPECT_EQ(statusOf("http://" + std::string(host) + ":" + portOf(server)), 200) << host;
