@@ -4,7 +4,6 @@
 #include <algorithm>
 #include <exception>
 #include <random>
-#include <string_view>
 #include <utility>
 
 #include <Platform/Ports/Ports.h>
@@ -16,18 +15,10 @@
 namespace Tallyhouse {
 namespace {
 
-std::string lowerCase(std::string_view text) {
-  std::string lower(text);
-  for (char& c : lower)
-    if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
-  return lower;
-}
-
 bool isAcceptable(const Varnel::Platform::URL& endpoint, SpoolingTransport::PlainHTTP plain) {
-  const auto parts = endpoint.components();
-  if (!parts.host || parts.host->empty()) return false;
-  const std::string scheme = lowerCase(parts.scheme.value_or(""));
-  return scheme == "https" || (scheme == "http" && plain == SpoolingTransport::PlainHTTP::allowed);
+  if (endpoint.components().host.value_or("").empty()) return false;
+  return endpoint.hasScheme("https") ||
+         (endpoint.hasScheme("http") && plain == SpoolingTransport::PlainHTTP::allowed);
 }
 
 std::function<double()> randomNumbers() {

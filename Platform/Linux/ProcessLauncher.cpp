@@ -128,8 +128,6 @@ class SpawnedProcess final : public LaunchedProcess {
     collect(0);
   }
 
-  bool hasSucceeded() override { return !isRunning() && succeeded_; }
-
   // What the program left behind may still be writing; more than a pipeful is not its output.
   std::string readOutput() override {
     const int capacity = std::max(::fcntl(output_.get(), F_GETPIPE_SZ), 0);
@@ -147,15 +145,12 @@ class SpawnedProcess final : public LaunchedProcess {
 
  private:
   void collect(int options) {
-    int status = 0;
     pid_t collected = 0;
     do {
-      collected = ::waitpid(process_, &status, options);
+      collected = ::waitpid(process_, nullptr, options);
     } while (collected < 0 && errno == EINTR);
-    if (collected == 0) return;
-    hasEnded_ = true;
     // A host that ignores the ends of its children leaves nothing to collect.
-    succeeded_ = collected < 0 || (WIFEXITED(status) && WEXITSTATUS(status) == 0);
+    hasEnded_ = collected != 0;
   }
 
   const pid_t process_;
@@ -163,7 +158,6 @@ class SpawnedProcess final : public LaunchedProcess {
   FileDescriptor output_;
   FileDescriptor descriptor_;  ///< Of the process; none on old kernels.
   bool hasEnded_ = false;
-  bool succeeded_ = false;
 };
 
 class Spawner final : public ProcessLauncher {

@@ -36,7 +36,9 @@ class VARNEL_API HTTPClient {
   virtual ~HTTPClient() = default;
 
   /// Posts and waits for the answer: for some 30 seconds, or until `stop` is requested. The
-  /// server's certificate must be good. Redirections are not followed.
+  /// server's certificate must be good. Redirections are not followed. Once a final status has come
+  /// that is the answer, whatever becomes of the content. What is for this machine itself never
+  /// goes through a proxy.
   [[nodiscard]] virtual Result<HTTPResponse, HTTPFailure> post(const HTTPPost& request,
                                                                std::stop_token stop) = 0;
 };

@@ -23,9 +23,6 @@ class VARNEL_API LaunchedProcess {
   /// Ends it, and what it has started, at once; waits for its end. Does nothing once it has ended.
   virtual void terminate() = 0;
 
-  /// Whether it has ended by itself with exit status 0. False while it runs.
-  [[nodiscard]] virtual bool hasSucceeded() = 0;
-
   /// What its output pipe holds, to the end. Never waits: to be called after it has ended.
   [[nodiscard]] virtual std::string readOutput() = 0;
 };

@@ -18,7 +18,6 @@ class FakeProcessLauncher final : public ProcessLauncher {
  public:
   struct Script {
     std::string output = {};
-    bool succeeds = true;
     int questions = 0;  ///< How often `isRunning` answers yes; for ever when negative.
     std::error_code launchError = {};  ///< Why it cannot be launched, if so.
   };
@@ -50,11 +49,7 @@ class FakeProcessLauncher final : public ProcessLauncher {
     void terminate() override {
       if (script_.questions == 0) return;
       script_.questions = 0;
-      script_.succeeds = false;
       ++launcher_.terminations;
-    }
-    [[nodiscard]] bool hasSucceeded() override {
-      return script_.questions == 0 && script_.succeeds;
     }
     [[nodiscard]] std::string readOutput() override { return script_.output; }
 

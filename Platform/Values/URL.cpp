@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Values/URL.h>
 
+#include <algorithm>
+
 #include <Platform/Values/PercentEncoding.h>
 
 namespace Varnel::Platform {
@@ -12,6 +14,15 @@ constexpr std::string_view emptyAuthority = "//";
 std::string_view withoutTrailingSlash(std::string_view path) {
   while (path.size() > 1 && path.back() == '/') path.remove_suffix(1);
   return path;
+}
+
+char lowerCase(char c) {
+  return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
+}
+
+bool areEqualInAnyCase(std::string_view left, std::string_view right) {
+  return std::equal(left.begin(), left.end(), right.begin(), right.end(),
+                    [](char a, char b) { return lowerCase(a) == lowerCase(b); });
 }
 
 }  // namespace
@@ -36,6 +47,16 @@ std::optional<URL> URL::fileURLWithAbsoluteString(std::string_view text) {
   URL url = fileURLWithPath(path);
   if (url.absoluteString() != text) return std::nullopt;
   return url;
+}
+
+bool URL::hasScheme(std::string_view scheme) const {
+  const auto own = components().scheme;
+  return own && areEqualInAnyCase(*own, scheme);
+}
+
+bool URL::hasHost(std::string_view host) const {
+  const auto own = components().host;
+  return own && areEqualInAnyCase(*own, host);
 }
 
 std::string URL::path() const {

@@ -55,6 +55,10 @@ class VARNEL_API URL final {
   /// The parts of the text. They live as long as this object.
   [[nodiscard]] URLComponents components() const { return URLComponents::split(text_); }
 
+  /// Whether the URL has this scheme, or host, in whichever case its letters are.
+  [[nodiscard]] bool hasScheme(std::string_view scheme) const;
+  [[nodiscard]] bool hasHost(std::string_view host) const;
+
   /// The whole text, percent-encoded.
   [[nodiscard]] const std::string& absoluteString() const { return text_; }
 

@@ -3,6 +3,7 @@
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
+#include <charconv>
 #include <memory>
 #include <string_view>
 #include <utility>
@@ -146,6 +147,28 @@ Varnel::SchedulePeriodOption periodNamed(const std::string& name) {
   throw CLI::ValidationError("PERIOD", "there is no period \"" + name + "\"");
 }
 
+// Digits and nothing else; the parser would wrap, cut, or take a leading zero for another base.
+std::int64_t bytesIn(const char* option, const std::string& text) {
+  std::int64_t count = 0;
+  const char* const end = text.data() + text.size();
+  const auto [stop, status] = std::from_chars(text.data(), end, count);
+  if (status == std::errc::invalid_argument || stop != end || text.starts_with('-'))
+    throw CLI::ValidationError(option, "\"" + text + "\" is no count of bytes");
+  if (status == std::errc::result_out_of_range)
+    throw CLI::ValidationError(option, "\"" + text + "\" is more than there can be");
+  return count;
+}
+
+void addByteCount(CLI::App& options, const char* name, std::int64_t& count,
+                  const char* description) {
+  options
+      .add_option_function<std::string>(
+          name, [name, &count](const std::string& text) { count = bytesIn(name, text); },
+          description)
+      ->type_name("BYTES")
+      ->required();
+}
+
 void addRemind(CLI::App& app, Invocation& invocation) {
   CLI::App& remind = *app.add_subcommand("remind", "Remind the user to clean up");
   remind.require_subcommand(1);
@@ -162,13 +185,9 @@ void addRemind(CLI::App& app, Invocation& invocation) {
                                   "Tell the period and list the notifications");
   auto [tomorrowOptions, tomorrow] = addCommand<RemindTomorrowCommand>(
       remind, invocation, "tomorrow", "Remind the user tomorrow of what a scan has found");
-  tomorrowOptions->add_option("--found", tomorrow->foundSize, "What the scan found, in bytes")
-      ->type_name("BYTES")
-      ->required();
-  tomorrowOptions
-      ->add_option("--selected", tomorrow->selectedSize, "What the user had selected, in bytes")
-      ->type_name("BYTES")
-      ->required();
+  addByteCount(*tomorrowOptions, "--found", tomorrow->foundSize, "What the scan found, in bytes");
+  addByteCount(*tomorrowOptions, "--selected", tomorrow->selectedSize,
+               "What the user had selected, in bytes");
   addCommand<RemindListenCommand>(remind, invocation, "listen",
                                   "Deliver reminders and show what happens to them");
 }

@@ -3,6 +3,7 @@
 
 #include <memory>
 
+#include <Varnel/Identification/KeptDownloadSource.h>
 #include <Varnel/Identification/UserIdentificationInfo.h>
 #include <Varnel/Identification/UserIdentificator.h>
 #include <orvane/Console.h>
@@ -11,7 +12,8 @@
 namespace Orvane {
 
 int IdentifyCommand::run(Console& console) const {
-  const auto user = std::make_shared<Varnel::UserIdentificator>();
+  const auto user =
+      std::make_shared<Varnel::KeptDownloadSource>(std::make_shared<Varnel::UserIdentificator>());
   FactList facts;
   facts.add("machineUUID", "machine UUID", user->machineUUID());
   facts.add("serialNumber", "serial number", user->serialNumber());

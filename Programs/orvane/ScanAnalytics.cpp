@@ -7,6 +7,9 @@
 #include <Platform/Ports/UserAccount.h>
 #include <Varnel/Context/Globals.h>
 #include <Varnel/Identification/CustomDimensionsHolder.h>
+#include <Varnel/Identification/KeptDownloadSource.h>
+#include <Varnel/Identification/UserIdentificationInfo.h>
+#include <Varnel/Identification/UserIdentificator.h>
 
 namespace Orvane {
 namespace {
@@ -23,8 +26,16 @@ class ScanSender final : public Varnel::CommonAnalyticsSender {
 };
 
 bool isOnThisMachine(const URL& url) {
-  const auto host = url.components().host;
-  return host == "127.0.0.1" || host == "localhost" || host == "[::1]";
+  return url.hasHost("127.0.0.1") || url.hasHost("localhost") || url.hasHost("[::1]");
+}
+
+// The holder would find each of them for itself, and the download twice.
+void identifyUser() {
+  using Holder = Varnel::CustomDimensionsHolder;
+  const auto user =
+      std::make_shared<Varnel::KeptDownloadSource>(std::make_shared<Varnel::UserIdentificator>());
+  Holder::setClientIdentifier(Varnel::UserIdentificationInfo(user).uniqueClientIdentifier());
+  Holder::setDownloadSourceURL(user->downloadSourceURLString());
 }
 
 std::shared_ptr<SpoolingTransport> transportTo(const URL& endpoint) {
@@ -43,14 +54,13 @@ std::shared_ptr<SpoolingTransport> transportTo(const URL& endpoint) {
 
 bool ScanAnalytics::isEndpoint(const std::string& text) {
   const auto url = URL::parse(text);
-  if (!url) return false;
-  const auto parts = url->components();
-  return parts.host && !parts.host->empty() &&
-         (parts.scheme == "https" || (parts.scheme == "http" && isOnThisMachine(*url)));
+  if (!url || url->components().host.value_or("").empty()) return false;
+  return url->hasScheme("https") || (url->hasScheme("http") && isOnThisMachine(*url));
 }
 
 ScanAnalytics::ScanAnalytics(const std::optional<std::string>& endpoint, bool printsEvents) {
   if (!endpoint && !printsEvents) return;
+  identifyUser();
   if (endpoint) transport_ = transportTo(*URL::parse(*endpoint));
   auto tracker = std::make_shared<Tallyhouse::AnalyticsTracker>(transport_);
   tracker->setShouldPrintEvents(printsEvents);

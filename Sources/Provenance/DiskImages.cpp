@@ -33,11 +33,11 @@ bool isMountedAt(const PropertyValue& entity, const std::string& volumePath) {
 }
 
 // False when it had to be ended.
-bool waitForEnd(Platform::LaunchedProcess& process, Platform::TimeInterval timeout) {
+bool waitForEnd(Platform::LaunchedProcess& process, std::optional<Platform::TimeInterval> timeout) {
   using Clock = std::chrono::steady_clock;
   const auto start = Clock::now();
   while (process.isRunning()) {
-    if (std::chrono::duration<double>(Clock::now() - start).count() >= timeout) {
+    if (timeout && std::chrono::duration<double>(Clock::now() - start).count() >= *timeout) {
       process.terminate();
       return false;
     }
@@ -50,12 +50,12 @@ bool waitForEnd(Platform::LaunchedProcess& process, Platform::TimeInterval timeo
 
 std::optional<PropertyValue> mountedDrivesInfo(Platform::ProcessLauncher& launcher,
                                                const std::string& toolPath,
-                                               Platform::TimeInterval timeout) {
+                                               std::optional<Platform::TimeInterval> timeout) {
   const auto launched = launcher.launch(toolPath, {"info", "-plist"});
   if (!launched) return std::nullopt;
   Platform::LaunchedProcess& tool = **launched;
-  // The output is read only after the end: what the pipe cannot hold is not an answer.
-  if (!waitForEnd(tool, timeout) || !tool.hasSucceeded()) return std::nullopt;
+  // Only what has ended has told all. A failure may come after the answer, and does not change it.
+  if (!waitForEnd(tool, timeout)) return std::nullopt;
   return Platform::parsePropertyList(tool.readOutput());
 }
 

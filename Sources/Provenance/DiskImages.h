@@ -14,11 +14,12 @@ class ProcessLauncher;
 namespace Varnel {
 
 /// What the system's disk-image tool tells of the images that are mounted: its answer to "info
-/// -plist". Absent when the tool is missing, fails, prints no property list, or still runs after
-/// `timeout`, whereupon it is ended. Blocks the caller while the tool runs.
+/// -plist", with whichever status it ends. Absent when the tool is missing or prints no property
+/// list. Blocks the caller while the tool runs; with a `timeout` the tool is ended after it, and
+/// has told nothing.
 [[nodiscard]] std::optional<Platform::PropertyValue> mountedDrivesInfo(
     Platform::ProcessLauncher& launcher, const std::string& toolPath,
-    Platform::TimeInterval timeout);
+    std::optional<Platform::TimeInterval> timeout);
 
 /// The file of the first image with an entity that is mounted at exactly `volumePath`. What is
 /// missing or of the wrong type in `volumesInfo` counts as empty.

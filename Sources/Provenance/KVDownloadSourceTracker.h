@@ -55,7 +55,8 @@ class VARNEL_API KVDownloadSourceTracker final {
     std::string diskImageTool = "/usr/bin/hdiutil";
     std::string volumesRoot = "/Volumes";
     std::optional<std::string> bundlePath = {};  ///< The running application's when absent.
-    Platform::TimeInterval toolTimeout = 30;     ///< After it the tool is ended.
+    /// After it the tool is ended. Absent, the tool has all the time that it takes.
+    std::optional<Platform::TimeInterval> toolTimeout = {};
   };
 
   explicit KVDownloadSourceTracker(std::shared_ptr<KVQuarantine> quarantine);

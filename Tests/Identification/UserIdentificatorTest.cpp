@@ -16,6 +16,7 @@
 #include <Tests/Support/QuarantineDatabase.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Identification/IdentifierRules.h>
+#include <Varnel/Identification/KeptDownloadSource.h>
 #include <Varnel/Identification/UserIdentificationInfo.h>
 
 namespace Varnel {
@@ -190,6 +191,23 @@ TEST_F(UserIdentificatorTest, OnlyTheSitesBuildPrefersCampaignAndCookie) {
   EXPECT_EQ(store.uniqueClientIdentifier(), identifier);
   EXPECT_EQ(marketta.uniqueClientIdentifier(), identifier);
   EXPECT_EQ(site.identificator(), provider);
+}
+
+TEST_F(UserIdentificatorTest, AKeptDownloadIsLookedForOnce) {
+  const std::shared_ptr<UserIdentificationProvider> provider(std::shared_ptr<void>(), &user);
+  for (const char* url : {"", "https://example.org/a.dmg?cid=3"}) {
+    if (*url) download(url);
+    const auto kept = std::make_shared<KeptDownloadSource>(provider);
+    const Text campaign = kept->downloadSourceURLCid();
+    download("https://example.org/a.dmg?cid=4");
+    EXPECT_EQ(campaign, *url ? Text("3") : std::nullopt);
+    EXPECT_EQ(kept->downloadSourceURLCid(), campaign);
+    EXPECT_EQ(kept->downloadSourceURLString(), *url ? Text(url) : std::nullopt);
+    EXPECT_EQ(UserIdentificationInfo(kept, {.isSiteVersion = true}).uniqueClientIdentifier(),
+              campaign.value_or(user.userIdentifier()));
+    EXPECT_EQ(kept->machineUUID(), user.machineUUID());
+  }
+  EXPECT_EQ(log.text(), "Failed to open database!\n");
 }
 
 TEST(ThisMachine, IsIdentifiedAlike) {

@@ -3,6 +3,7 @@
 
 #include <dlfcn.h>
 #include <netdb.h>
+#include <sys/mount.h>
 
 #include <algorithm>
 #include <chrono>
@@ -21,6 +22,7 @@
 #include <Tallyhouse/AnalyticsTracker.h>
 #include <Tallyhouse/SpoolingTransport.h>
 #include <Tests/Support/ChildProcess.h>
+#include <Tests/Support/MountNamespace.h>
 #include <Tests/Support/TemporaryFolder.h>
 
 namespace {
@@ -54,6 +56,23 @@ using namespace std::chrono_literals;
 using Varnel::Platform::HTTPPost;
 using Varnel::Platform::URL;
 
+// The proxies that the environment names while this object lives.
+class Proxies final {
+ public:
+  explicit Proxies(const std::string& address) {
+    for (const char* name : names) ::setenv(name, address.c_str(), 1);
+    for (const char* name : {"no_proxy", "NO_PROXY"}) ::unsetenv(name);
+  }
+  ~Proxies() {
+    for (const char* name : names) ::unsetenv(name);
+  }
+  Proxies(const Proxies&) = delete;
+  Proxies& operator=(const Proxies&) = delete;
+
+ private:
+  static constexpr const char* names[] = {"http_proxy", "https_proxy", "all_proxy"};
+};
+
 // A server in a process of its own, and what it was sent.
 class Server {
  public:
@@ -83,7 +102,7 @@ class Server {
 
  private:
   static std::vector<std::string> words(std::vector<std::string> behaviours) {
-    behaviours.insert(behaviours.begin(), VARNEL_ANALYTICS_SERVER);
+    behaviours.insert(behaviours.begin(), {VARNEL_ANALYTICS_SERVER, VARNEL_CERTIFICATE});
     return behaviours;
   }
 
@@ -219,8 +238,61 @@ TEST_F(AnalyticsDeliveryTest, AKilledProcessDeliversOnTheNextStart) {
   EXPECT_EQ(actions.size(), count - before.size());
 }
 
+TEST_F(AnalyticsDeliveryTest, AScanSendsItsEventsOnceWhateverItsEnvironment) {
+  ::setenv("HOME", (folder_.path() / "home").c_str(), 1);
+  const Proxies proxies("http://127.0.0.1:1");
+  folder_.write("scanned/file", "content");
+  Server server({"short"});
+  for (int run = 0; run < 2; ++run) {
+    Varnel::Tests::ChildProcess orvane({ORVANE_PROGRAM, "scan", "--analytics",
+                                        "HTTP" + server.url().substr(4),
+                                        (folder_.path() / "scanned").string()});
+    EXPECT_EQ(orvane.readLine(), "1 file in 1 folder: no duplicates");
+    std::vector<std::string> events;
+    while (events.size() < 2)
+      for (const std::string& hit : server.next().hits)
+        events.push_back(parameter(hit, "ec") + " " + parameter(hit, "ea"));
+    EXPECT_EQ(events, (std::vector<std::string>{"Scan Started", "Scan Finished"}));
+    EXPECT_EQ(orvane.wait(), 0);
+  }
+  for (const char* refused : {"http://collect.example/", "HTTPS:///batch", "ftp://127.0.0.1/"})
+    EXPECT_EQ(
+        Varnel::Tests::ChildProcess({ORVANE_PROGRAM, "scan", "--analytics", refused, "/"}).wait(),
+        2)
+        << refused;
+}
+
+Varnel::Platform::HTTPClient& http() {
+  return Varnel::Platform::processPorts().httpClient;
+}
+
+HTTPPost postTo(const std::string& url) {
+  return {.url = url, .contentType = "text/plain", .body = "x", .allowsPlainHTTP = true};
+}
+
+// The status that comes from there; 0 without one.
+int statusOf(const std::string& url) {
+  const auto answer = http().post(postTo(url), {});
+  return answer ? answer->status : 0;
+}
+
+std::string portOf(const Server& server) {
+  return std::string(URL::parse(server.url())->components().port.value_or(""));
+}
+
+// Makes this process trust the certificate of the tests, which is for 127.0.0.1 and
+// collect.example, and no other. Returns why not, if so.
+std::string trustCertificate() {
+  constexpr const char* trusted = "/etc/ssl/certs/ca-certificates.crt";
+  if (const std::string reason = Varnel::Tests::enterMountNamespace(); !reason.empty())
+    return reason;
+  if (::mount(VARNEL_CERTIFICATE, trusted, nullptr, MS_BIND, nullptr) != 0)
+    return std::string("no other ") + trusted;
+  return {};
+}
+
 TEST(HTTPClient, RefusesPlainHTTPUnlessAllowedAndStopsAtOnce) {
-  auto& http = Varnel::Platform::processPorts().httpClient;
+  auto& http = Tallyhouse::http();
   Server server({"200", "hang"});
   const HTTPPost post{.url = server.url(), .contentType = "text/plain", .body = "x"};
   EXPECT_FALSE(http.post(post, {}));
@@ -243,36 +315,53 @@ TEST(HTTPClient, RefusesPlainHTTPUnlessAllowedAndStopsAtOnce) {
   stopper.join();
 }
 
-TEST(HTTPClient, ReadsNoContentWithoutEnd) {
-  Server server({"endless"});
-  const HTTPPost post{
-      .url = server.url(), .contentType = "text/plain", .body = "x", .allowsPlainHTTP = true};
-  const auto start = std::chrono::steady_clock::now();
-  const auto answer = Varnel::Platform::processPorts().httpClient.post(post, {});
-  ASSERT_TRUE(answer) << answer.error().message;
-  EXPECT_EQ(answer->status, 200);
-  EXPECT_LT(std::chrono::steady_clock::now() - start, 10s);
+TEST(HTTPClient, TakesAFinalStatusForTheAnswerWhateverFollows) {
+  Server server({"endless", "short", "stuck", "302>/elsewhere", "201"});
+  for (const int status : {200, 200, 200, 302, 201}) {
+    const auto start = std::chrono::steady_clock::now();
+    EXPECT_EQ(statusOf(server.url()), status);
+    EXPECT_LT(std::chrono::steady_clock::now() - start, 10s) << server.next().behaviour;
+  }
 }
 
-TEST(HTTPClient, RefusesACertificateThatNobodySigned) {
-  ::setenv("CERTIFICATE", VARNEL_CERTIFICATE, 1);
+TEST(HTTPClient, RefusesACertificateThatNobodySignedOrThatIsForAnotherHost) {
+  Server server({"secure", "200"});
+  const auto refusal = [&](const std::string& host) {
+    const auto answer = http().post(postTo("https://" + host + ":" + portOf(server)), {});
+    return answer ? std::to_string(answer->status) : answer.error().message;
+  };
+  EXPECT_NE(refusal("127.0.0.1").find("certificate"), std::string::npos) << refusal("127.0.0.1");
+  if (const std::string reason = trustCertificate(); !reason.empty()) GTEST_SKIP() << reason;
+  EXPECT_EQ(refusal("127.0.0.1"), "200");
+  EXPECT_NE(refusal("localhost").find("certificate"), std::string::npos) << refusal("localhost");
+}
+
+TEST(HTTPClient, GoesThroughAProxyButNotToThisMachine) {
+  if (const std::string reason = trustCertificate(); !reason.empty()) GTEST_SKIP() << reason;
   Server server({"200"});
-  ::unsetenv("CERTIFICATE");
-  const std::string url = "https" + server.url().substr(4);
-  const auto answer = Varnel::Platform::processPorts().httpClient.post(
-      {.url = url, .contentType = "text/plain", .body = "x"}, {});
-  ASSERT_FALSE(answer);
-  EXPECT_NE(answer.error().message.find("certificate"), std::string::npos)
-      << answer.error().message;
+  Server proxy({"tunnel", "201", "tunnel", "403", "blind tunnel", "202"});
+  const Proxies proxies("http://127.0.0.1:" + portOf(proxy));
+
+  for (const char* host : {"127.0.0.1", "LOCALHOST", "a.localhost", "127.1", "0x7F000001"})
+    EXPECT_EQ(statusOf("http://" + std::string(host) + ":" + portOf(server)), 200) << host;
+  for (const char* url : {"http://localhost.:1", "http://[::1]:1", "https://[0:0::1]:1",
+                          "http://[::ffff:127.0.0.1]:1", "HTTPS://127.0.0.2:1"})
+    EXPECT_EQ(statusOf(url), 0) << url;
+
+  // A tunnel's inside is the server's alone, and the proxy's words are not the server's.
+  EXPECT_EQ(statusOf("https://collect.example"), 201);
+  EXPECT_EQ(statusOf("https://other.example"), 0) << "a certificate for another host";
+  EXPECT_EQ(statusOf("https://collect.example:444"), 0) << "refused";
+  EXPECT_EQ(statusOf("https://collect.example:445"), 0) << "led nowhere";
+  EXPECT_EQ(statusOf("http://127.0.0.1.example"), 202);
+  for (const char* behaviour : {"tunnel", "201", "tunnel", "403", "blind tunnel", "202"})
+    EXPECT_EQ(proxy.next().behaviour, behaviour);
 }
 
 TEST(HTTPClient, StopsWhileANameServerIsSilent) {
   std::stop_source stop;
   auto answer = std::async(std::launch::async, [&] {
-    const HTTPPost post{.url = "https://" + std::string(silentHost) + "/",
-                        .contentType = "text/plain",
-                        .body = "x"};
-    return Varnel::Platform::processPorts().httpClient.post(post, stop.get_token()).hasValue();
+    return http().post(postTo("https://" + std::string(silentHost)), stop.get_token()).hasValue();
   });
   isAskedForSilentHost.acquire();
   stop.request_stop();

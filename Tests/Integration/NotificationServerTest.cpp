@@ -24,6 +24,7 @@
 #include <Platform/Testing/FakeWorkspace.h>
 #include <Tallyhouse/AnalyticsTracker.h>
 #include <Tallyhouse/Testing/MemoryTransport.h>
+#include <Tests/Support/ChildProcess.h>
 #include <Tests/Support/DrainUntil.h>
 #include <Varnel/Context/ProcessFacts.h>
 #include <Varnel/Context/VarnelModule.h>
@@ -37,9 +38,12 @@ namespace {
 
 using namespace std::chrono_literals;
 using Platform::UserNotification;
+using ::testing::AllOf;
 using ::testing::HasSubstr;
 using ::testing::IsEmpty;
+using ::testing::Not;
 using ::testing::SizeIs;
+using ::testing::StartsWith;
 
 std::string outputOf(const std::string& command) {
   std::string text;
@@ -228,6 +232,22 @@ TEST(NotificationServer, OneProcessLearnsAtOnceWhatAnotherSchedules) {
   other.center.scheduleNotification(other.reminderIn(100ms));
   host.awaitBanner();
   EXPECT_THAT(other.center.deliveredNotifications(), SizeIs(1));
+}
+
+TEST(NotificationServer, AProgramThatListensTellsOfDeliveriesAndClicks) {
+  Server server;
+  ::setenv("HOME", getenv("VARNEL_DESKTOP"), 1);
+  Host host("com.quennel.Orvane2");
+  host.center.setDelegate({});
+  host.center.scheduleNotification(host.reminderIn(0s));
+  Tests::ChildProcess listener({ORVANE_PROGRAM, "remind", "listen"});
+  EXPECT_THAT(listener.readLine(),
+              StartsWith("delivered  SchedulerNotification: Time to <clean> & go"));
+  while (Server::displayedCount() != "1\n") continue;
+  outputOf("dunstctl action 0");
+  EXPECT_THAT(listener.readLine(), StartsWith("clicked  SchedulerNotification"));
+  EXPECT_THAT(outputOf(std::string(ORVANE_PROGRAM) + " remind status"),
+              AllOf(HasSubstr("\nscheduled "), Not(HasSubstr("\ndelivered "))));
 }
 
 }  // namespace

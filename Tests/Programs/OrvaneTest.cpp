@@ -182,6 +182,15 @@ TEST_F(Orvane, RefusesWrongArgumentsInOneLineAndDoesNothing) {
       {{"scan", "--nope", folder.path()}, 2, "--nope"},
       {{"scan", "--qos", "fast\nest", folder.path()}, 2, "fast\\nest"},
       {{"disks", "extra"}, 2, "extra"},
+      {{"remind"}, 2, "subcommand"},
+      {{"remind", "every", "sometimes"}, 2, "sometimes"},
+      {{"remind", "tomorrow", "--found", "-5", "--selected", "1"}, 2, "--found: \"-5\" is no"},
+      {{"remind", "tomorrow", "--found", "1", "--selected", "0x10"},
+       2,
+       "--selected: \"0x10\" is no"},
+      {{"remind", "tomorrow", "--found", "9223372036854775808", "--selected", "1"},
+       2,
+       "is more than"},
       {{"scan", missing}, 1, missing},
       {{"scan", folder.path(), missing}, 1, missing},
       {{"scan", file}, 1, file},
@@ -233,6 +242,23 @@ TEST_F(Orvane, ShowsPathsAndTheMenu) {
                                           HasSubstr("\nmain-menu.duplicates.putBackAll\n")));
 }
 
+// Without a session bus: planning needs none.
+TEST_F(Orvane, PlansReminders) {
+  const auto period = [](const char* name) { return StartsWith(std::string("period: ") + name); };
+  const auto regular = HasSubstr("  SchedulerNotification: Time to clean up");
+  const auto found = [](const char* size) { return HasSubstr(std::string("free up to ") + size); };
+  EXPECT_EQ(run({"remind", "status"}).output, "period: Never\n");
+  EXPECT_THAT(run({"remind", "every", "weekly"}).output, AllOf(period("Every Week"), regular));
+  run({"remind", "tomorrow", "--found", "1500000", "--selected", "0"});
+  EXPECT_THAT(
+      run({"remind", "tomorrow", "--found", "9223372036854775807", "--selected", "010"}).output,
+      AllOf(period("Every Week"), regular, found("9.22 EB"), Not(found("1.5 MB"))));
+  EXPECT_THAT(run({"remind", "every", "never"}).output, AllOf(period("Never"), Not(regular)));
+  const Outcome status = run({"remind", "status"});
+  EXPECT_THAT(status.output, AllOf(period("Never"), found("9.22 EB"), Not(regular)));
+  EXPECT_EQ(status.status, 0);
+}
+
 TEST_F(Orvane, PlaysTheFrameworksSoundsToTheirEnd) {
   EXPECT_EQ(run({"sound", "purchase"}).status, 0);
   const Outcome unknown = run({"sound", "applause"});
@@ -260,6 +286,16 @@ TEST_F(Orvane, ExplainsAFilesAttributeAndIdentifiesTheInstallation) {
   const auto user = nlohmann::json::parse(run({"identify", "--json"}).output);
   EXPECT_EQ(user["userIdentifier"].get<std::string>().size(), 64u);
   EXPECT_EQ(user["uniqueClientIdentifier"], user["userIdentifier"]);
+}
+
+// The database is none here, which the system's log is told at each opening.
+TEST_F(Orvane, LooksOnceForWhatItWasDownloadedFrom) {
+  for (const auto& command :
+       {std::vector<std::string>{"identify"}, {"scan", "--print-events", folder.path()}}) {
+    const std::string errors = run(command).errors;
+    constexpr std::string_view opening = "Failed to open database!";
+    EXPECT_EQ(errors.find(opening), errors.rfind(opening)) << errors;
+  }
 }
 
 TEST_F(Orvane, ListsTheDiskOfItsFiles) {

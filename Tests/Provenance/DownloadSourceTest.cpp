@@ -70,7 +70,8 @@ class DownloadSource : public testing::Test {
   }
 
   // The event that the application at `bundle` is traced to.
-  std::string trace(const fs::path& bundle, double toolTimeout = 20) {
+  std::string trace(const fs::path& bundle,
+                    std::optional<Platform::TimeInterval> toolTimeout = {}) {
     const KVDownloadSourceTracker tracker(
         std::make_shared<KVQuarantine>(database.string(), log),
         {.diskImageTool = (folder.path() / "tool").string(),
@@ -162,16 +163,22 @@ TEST_F(DownloadSource, AToolThatGivesNoAnswerLeavesTheApplicationToDecide) {
   const struct {
     const char* name;
     std::string script;
-    double timeout;
+    std::optional<double> timeout;
     const char* event;
   } cases[] = {
-      {"slow", "sleep 0.2\n" + answer, 20, "image"},
-      {"complaining", "echo trouble >&2\n" + answer, 20, "image"},
-      {"failing", answer + "exit 1\n", 20, "bundle"},
-      {"killed", answer + "kill -9 $$\n", 20, "bundle"},
-      {"garbage", "head -c 70000 /dev/urandom\n", 20, "bundle"},
-      {"silent", "", 20, "bundle"},
-      {"another list", printing("<plist><array><string>images</string></array></plist>"), 20,
+      {"slow", "sleep 0.2\n" + answer, {}, "image"},
+      {"complaining", "echo trouble >&2\n" + answer, {}, "image"},
+      {"failing", answer + "exit 1\n", {}, "image"},
+      {"killed", answer + "kill -9 $$\n", {}, "image"},
+      {"failing in the midst",
+       answer.substr(0, answer.find("<key>system")) + "\nEND\nexit 1\n",
+       {},
+       "bundle"},
+      {"garbage", "head -c 70000 /dev/urandom\n", {}, "bundle"},
+      {"silent", "", {}, "bundle"},
+      {"another list",
+       printing("<plist><array><string>images</string></array></plist>"),
+       {},
        "bundle"},
       // Larger than any pipe: it waits for a reader that never comes.
       {"verbose", answer + "head -c 9000000 /dev/zero\n", 0.3, "bundle"},
@@ -182,7 +189,7 @@ TEST_F(DownloadSource, AToolThatGivesNoAnswerLeavesTheApplicationToDecide) {
       {"gone elsewhere", "exec perl -e 'setpgrp(0, getpgrp(getppid())); sleep 1000'\n", 0.3,
        "bundle"},
       // What it leaves behind keeps the pipe open, and is not waited for.
-      {"with a child", "sleep 2 2>/dev/null &\n" + answer, 20, "image"},
+      {"with a child", "sleep 2 2>/dev/null &\n" + answer, {}, "image"},
   };
   testing::internal::CaptureStderr();
   const auto descriptors = Tests::openDescriptors();

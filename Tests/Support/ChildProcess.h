@@ -57,6 +57,14 @@ class ChildProcess final {
     return bytes;
   }
 
+  /// Waits for its end; its exit status, or as a shell tells a signal.
+  int wait() {
+    int status = 0;
+    ::waitpid(process_, &status, 0);
+    process_ = 0;
+    return WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
+  }
+
   /// Ends the process as a crash would, if it runs.
   void kill() {
     if (process_ <= 0) return;

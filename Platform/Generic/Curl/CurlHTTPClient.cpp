@@ -4,12 +4,15 @@
 #include <curl/curl.h>
 
 #include <atomic>
+#include <chrono>
 #include <condition_variable>
 #include <cstdlib>
 #include <mutex>
+#include <optional>
 #include <utility>
 
 #include <Platform/Generic/Curl/Module.h>
+#include <Platform/Generic/Curl/ThisMachine.h>
 #include <Platform/Generic/UniqueHandle.h>
 
 namespace Varnel::Platform {
@@ -20,10 +23,14 @@ using Answer = Result<HTTPResponse, HTTPFailure>;
 constexpr long longestConnectingInSeconds = 10;
 constexpr long longestTransferInSeconds = 30;
 constexpr int pollingInMilliseconds = 1000;
+// Content is waited for so that the connection can serve again, and no longer than it is worth.
+constexpr auto longestContent = std::chrono::seconds(1);
 constexpr std::size_t mostContent = 64 * 1024;
+constexpr int firstFinalStatus = 200;
 
 using Easy = UniqueHandle<CURL*, curl_easy_cleanup>;
 using Headers = UniqueHandle<curl_slist*, curl_slist_free_all>;
+using URLParts = UniqueHandle<CURLU*, curl_url_cleanup>;
 
 // Content is read and forgotten; a server that never ends ends the transfer.
 std::size_t ignoreContent(char*, std::size_t size, std::size_t count, void* received) {
@@ -36,14 +43,23 @@ HTTPFailure failure(CURLcode code) {
   return {curl_easy_strerror(code)};
 }
 
-Answer answerOf(CURL* easy) {
+// What the server has said so far; absent until its final status has come. A proxy's answer to the
+// wish for a tunnel is no status.
+std::optional<HTTPResponse> responseOf(CURL* easy) {
   long status = 0;
   curl_off_t retryAfter = 0;
   curl_easy_getinfo(easy, CURLINFO_RESPONSE_CODE, &status);
+  if (status < firstFinalStatus) return std::nullopt;
   curl_easy_getinfo(easy, CURLINFO_RETRY_AFTER, &retryAfter);
   HTTPResponse response{.status = static_cast<int>(status), .retryAfter = {}};
   if (retryAfter > 0) response.retryAfter = std::chrono::seconds(retryAfter);
   return response;
+}
+
+URLParts parse(const std::string& url) {
+  URLParts parts(curl_url());
+  if (!parts || curl_url_set(parts.get(), CURLUPART_URL, url.c_str(), 0) != CURLUE_OK) return {};
+  return parts;
 }
 
 // Transfers run on the callers' threads, one after another over the same connections. At exit they
@@ -59,16 +75,20 @@ class CurlHTTPClient final : public HTTPClient {
     if (stop.stop_requested() || isClosing_) return HTTPFailure{"cancelled"};
     const Easy easy(curl_easy_init());
     const Headers headers = headersOf(request);
-    std::size_t received = 0;
     if (!easy || !headers) return failure(CURLE_OUT_OF_MEMORY);
-    if (const CURLcode code = setUp(easy.get(), headers.get(), request, received); code != CURLE_OK)
+    const URLParts url = parse(request.url);
+    if (!url) return failure(CURLE_URL_MALFORMAT);
+    std::size_t received = 0;
+    if (const CURLcode code = setUp(easy.get(), url.get(), headers.get(), request, received);
+        code != CURLE_OK)
       return failure(code);
     if (curl_multi_add_handle(multi_, easy.get()) != CURLM_OK) return failure(CURLE_FAILED_INIT);
-    const CURLcode code = transfer(stop);
+    const CURLcode code = transfer(easy.get(), stop);
     curl_multi_remove_handle(multi_, easy.get());
+    // The server has decided, whatever became of its content.
+    if (const auto response = responseOf(easy.get())) return *response;
     if (code == CURLE_ABORTED_BY_CALLBACK) return HTTPFailure{"cancelled"};
-    if (code != CURLE_OK && received <= mostContent) return failure(code);
-    return answerOf(easy.get());
+    return failure(code == CURLE_OK ? CURLE_GOT_NOTHING : code);
   }
 
   void close() {
@@ -108,17 +128,19 @@ class CurlHTTPClient final : public HTTPClient {
     return Headers(longer ? longer : list);
   }
 
-  static CURLcode setUp(CURL* easy, curl_slist* headers, const HTTPPost& request,
+  static CURLcode setUp(CURL* easy, CURLU* url, curl_slist* headers, const HTTPPost& request,
                         std::size_t& received) {
     CURLcode result = CURLE_OK;
     const auto set = [&](CURLoption option, auto value) {
       if (result == CURLE_OK) result = curl_easy_setopt(easy, option, value);
     };
-    set(CURLOPT_URL, request.url.c_str());
+    set(CURLOPT_CURLU, url);
     set(CURLOPT_PROTOCOLS_STR, request.allowsPlainHTTP ? "http,https" : "https");
     set(CURLOPT_SSL_VERIFYPEER, 1L);
     set(CURLOPT_SSL_VERIFYHOST, 2L);
     set(CURLOPT_FOLLOWLOCATION, 0L);
+    // Otherwise the proxies that the environment names would see what is for this machine alone.
+    if (isOnThisMachine(url)) set(CURLOPT_PROXY, "");
     set(CURLOPT_NOSIGNAL, 1L);
     // A name server that is silent would hold up the end of an interrupted transfer.
     set(CURLOPT_QUICK_EXIT, 1L);
@@ -133,7 +155,9 @@ class CurlHTTPClient final : public HTTPClient {
     return result;
   }
 
-  CURLcode transfer(const std::stop_token& stop) {
+  CURLcode transfer(CURL* easy, const std::stop_token& stop) {
+    using Clock = std::chrono::steady_clock;
+    std::optional<Clock::time_point> endOfContent;
     const std::stop_callback wake(stop, [this] { curl_multi_wakeup(multi_); });
     for (;;) {
       int running = 0;
@@ -141,6 +165,8 @@ class CurlHTTPClient final : public HTTPClient {
       int left = 0;
       if (const CURLMsg* message = curl_multi_info_read(multi_, &left)) return message->data.result;
       if (stop.stop_requested() || isClosing_) return CURLE_ABORTED_BY_CALLBACK;
+      if (!endOfContent && responseOf(easy)) endOfContent = Clock::now() + longestContent;
+      if (endOfContent && Clock::now() >= *endOfContent) return CURLE_OPERATION_TIMEDOUT;
       curl_multi_poll(multi_, nullptr, 0, pollingInMilliseconds, nullptr);
     }
   }

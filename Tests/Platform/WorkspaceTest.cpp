@@ -1,0 +1,114 @@
+// SPDX-License-Identifier: MIT
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+
+#include <Platform/Linux/Adapters.h>
+#include <Platform/Linux/CommandLine.h>
+#include <Platform/Ports/Workspace.h>
+#include <Tests/Support/TemporaryFolder.h>
+
+namespace Varnel::Platform::Linux {
+namespace {
+
+namespace fs = std::filesystem;
+using Text = std::optional<std::string>;
+
+TEST(Workspace, FindsTheProgramOfACommandLine) {
+  const struct {
+    const char* line;
+    Text program;
+  } cases[] = {
+      {"app", "app"},
+      {"/opt/app/app --new %U", "/opt/app/app"},
+      {R"("/opt/My App/app" "a b" %f)", "/opt/My App/app"},
+      {R"("/opt/\"a\`\$\\b/app")", R"(/opt/"a`$\b/app)"},
+      {R"("/opt/100%% sure/app" %u)", "/opt/100% sure/app"},
+      {"/opt/%%U/app", "/opt/%U/app"},
+      {"%i app %c", "app"},
+      {"env app", "app"},
+      {R"(/usr/bin/env A=1 "B=2 3" "/opt/My App/app" C=4)", "/opt/My App/app"},
+      {"env -i - -0v -u HOME -uLANG -iu A -C /tmp --unset B --chdir=/ --unset=C app -u x", "app"},
+      {"env --block-signal=INT --debug -a zero --argv0 one -- D=1 app", "app"},
+      {R"(env -S "-u A B=1 'My App'" x)", "My App"},
+      {R"(env --split-string="env -i A=%%" app)", "app"},
+      {"env A=1 env B=2 app", "app"},
+      {"environment", "environment"},
+      {"", {}},
+      {"   ", {}},
+      {"%U", {}},
+      {R"("")", {}},
+      {R"("/opt/app)", {}},
+      {"app %x", {}},
+      {"app 100%", {}},
+      {"env", {}},
+      {"env -i A=1", {}},
+      {"env -u", {}},
+      {R"(env -S "'a")", {}},
+  };
+  for (const auto& each : cases) EXPECT_EQ(programOf(each.line), each.program) << each.line;
+}
+
+// The folders of desktop entries are read once a process.
+TEST(Workspace, AnApplicationIsWhereItsDesktopEntryLeads) {
+  const Tests::TemporaryFolder folder;
+  const auto program = [&](const char* name) {
+    const fs::path file = folder.write(name, "");
+    fs::permissions(file, fs::perms::owner_all);
+    return file.string();
+  };
+  const auto entry = [&](const std::string& name, const std::string& keys) {
+    folder.write(name + ".desktop", "[Desktop Entry]\nType=Application\nName=Velt\n" + keys);
+  };
+  const std::string quoted = program("My \"$Apps/50% off/velt");
+  const std::string onPath = program("bin/velt");
+  const std::string bundled = program("Velt.app/velt");
+  folder.write("Velt.app/Info.plist", "");
+  ::setenv("XDG_DATA_HOME", (folder.path() / "user").c_str(), 1);
+  ::setenv("XDG_DATA_DIRS", (folder.path() / "system").c_str(), 1);
+  ::setenv("PATH", (folder.path() / "bin").c_str(), 1);
+
+  const std::string apps = "system/applications/";
+  const std::string root = folder.path().string();
+  // One backslash of a path takes four: the text's escape, and the quotation's.
+  entry(apps + "quoted", "Exec=\"" + root + R"(/My \\"\\$Apps/50%% off/velt" --open %U)" + "\n");
+  entry(apps + "env", "Exec=env LANG=C \"" + bundled + "\" %F\n");
+  entry(apps + "name", "Exec=velt\nTryExec=" + onPath + "\n");
+  entry(apps + "com.quennel.Velt/dash", "Exec=velt\n");
+  entry(apps + "hidden", "Exec=velt\n");
+  entry("user/applications/hidden", "Exec=velt\nHidden=true\n");
+  entry(apps + "untried", "Exec=velt\nTryExec=" + root + "/missing\n");
+  entry(apps + "gone", "Exec=env LANG=C \"" + root + "/missing\"\n");
+  entry(apps + "relative", "Exec=../bin/velt\n");
+  entry(apps + "none", "DBusActivatable=true\n");
+  folder.write(apps + "link.desktop", "[Desktop Entry]\nType=Link\nExec=velt\n");
+  folder.write(apps + "broken.desktop", "Exec=velt\n");
+
+  const struct {
+    const char* identifier;
+    Text path;
+  } cases[] = {{"quoted", quoted},
+               {"env", root + "/Velt.app"},
+               {"name", onPath},
+               {"com.quennel.Velt-dash", onPath},
+               {"hidden", {}},
+               {"untried", {}},
+               {"gone", {}},
+               {"relative", {}},
+               {"none", {}},
+               {"link", {}},
+               {"broken", {}},
+               {"Name", {}},
+               {"../applications/name", {}},
+               {"", {}}};
+  const auto workspace = makeWorkspace();
+  for (const auto& each : cases) {
+    const auto url = workspace->applicationURL(each.identifier);
+    EXPECT_EQ(url ? Text(url->path()) : std::nullopt, each.path) << each.identifier;
+  }
+  entry(apps + "late", "Exec=velt\n");
+  EXPECT_TRUE(workspace->applicationURL("late"));
+}
+
+}  // namespace
+}  // namespace Varnel::Platform::Linux
