@@ -70,9 +70,9 @@ class VARNEL_API DiskAccessManager final {
   /// Begins access to a file or folder and waits for a place on its disk, at most
   /// `accessWaitingTimeout` seconds of the wall clock: without a value, or with one that is not a
   /// number or too large for a date, for ever; a negative one not at all. A thread that has a place
-  /// on the disk gets another at once, unless one of the two counts against the record for unknown
-  /// disks: whoever nests accesses gives the inner one a time-out. `volumeURL` spares the search
-  /// for the file's volume; it is written as the inventory writes it, with a "/" at the end.
+  /// on the disk gets another at once, and one that came to the volume through the record for
+  /// unknown disks gets another there. `volumeURL` spares the search for the file's volume; it is
+  /// written as the inventory writes it, with a "/" at the end.
   ///
   /// Null when the volume cannot be told, the security scope cannot be opened, or the time is up.
   /// In the last case a security scope that was opened stays open.

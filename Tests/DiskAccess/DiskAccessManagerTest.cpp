@@ -10,6 +10,7 @@
 #include <thread>
 #include <vector>
 
+#include <Basalt/Semaphore.h>
 #include <Basalt/SerialQueue.h>
 #include <Platform/Testing/FakeDeviceRegistry.h>
 #include <Platform/Testing/FakeDiskArbitration.h>
@@ -72,6 +73,25 @@ class DiskAccessManagerTest : public ::testing::Test {
       session->endAccessing();
       session = begin(file, timeout);
     }
+    return session;
+  }
+
+  /// The same for a volume while the planning queue is too busy to say which disk it lies on.
+  Session beginOnBusyQueue(const URL& volume, std::optional<double> timeout = {}) {
+    Basalt::SerialQueue& queue = DiskAccessGuard(begin(homeFile))->diskData()->queue();
+    const int before = scope_.startCount();
+    std::latch isBusy(1);
+    std::thread keeper([&] {
+      queue.sync([&] {
+        isBusy.count_down();
+        // A scope is opened between the look-up and the admission.
+        while (scope_.startCount() == before) std::this_thread::yield();
+      });
+    });
+    isBusy.wait();
+    Session session =
+        manager_->beginAccessingURL(volume, "test", QoS::utility, true, timeout, volume);
+    keeper.join();
     return session;
   }
 
@@ -149,16 +169,40 @@ TEST_F(DiskAccessManagerTest, SessionsOfOneThreadNestAndCountEach) {
   std::thread([&] { EXPECT_TRUE(begin(stickFile)); }).join();
 }
 
-TEST_F(DiskAccessManagerTest, AMountThatAppearsWhileThreadsWaitGetsItsOwnDisk) {
-  const auto useUnknownDisk = [&] {
-    return manager_->beginAccessingURL(stickFile, "test", QoS::utility, false, {}, stickVolume);
+TEST_F(DiskAccessManagerTest, AThreadThatHoldsADiskUsesItWhateverTheLookUpFinds) {
+  manager_->setIsBackgroundMode(true);
+  disks_.setMountURLs("nvme0n1", {homeVolume, archiveVolume});
+  volumes_.mount({.url = archiveVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  awaitInventory();
+  const auto diskOf = [](const Session& session) {
+    return session ? session->diskInfo()->uniqueID().value() : "none";
   };
-  const Session holder = useUnknownDisk();
+  EXPECT_EQ(diskOf(beginOnBusyQueue(homeVolume)), "unknown")
+      << "it held nothing, and holds this now";
+  std::thread([&] {
+    begin(homeFile)->endAccessing();
+    const Session outer = begin(homeFile);
+    const Session inner = beginOnBusyQueue(homeVolume, 0);
+    ASSERT_EQ(diskOf(inner), "SSD-1");
+    EXPECT_EQ(diskOf(beginOnBusyQueue(archiveVolume, 0)), "SSD-1") << "a volume of the same disk";
+    volumes_.unmount(archiveVolume);
+    outer->endAccessing();
+    inner->endAccessing();
+    EXPECT_EQ(diskOf(beginOnBusyQueue(archiveVolume, 0)), "SSD-1") << "the dropped one is left";
+  }).join();
+  EXPECT_EQ(diskOf(begin(homeFile, 0)), "unknown") << "this disk is full, but that place is held";
+}
+
+TEST_F(DiskAccessManagerTest, AMountThatAppearsWhileThreadsWaitGetsItsOwnDisk) {
+  const auto useUnknownDisk = [&](const URL& volume) {
+    return manager_->beginAccessingURL(stickFile, "test", QoS::utility, false, {}, volume);
+  };
+  const Session holder = useUnknownDisk(archiveVolume);
   std::atomic<int> admitted = 0;
   std::vector<std::thread> waiting;
   for (int i = 0; i < 3; ++i) {
     waiting.emplace_back([&] {
-      const DiskAccessGuard access(useUnknownDisk());
+      const DiskAccessGuard access(useUnknownDisk(stickVolume));
       EXPECT_EQ(access->diskInfo()->uniqueID(), "unknown");
       ++admitted;
     });
@@ -312,6 +356,63 @@ TEST_F(DiskAccessManagerTest, LosesNoPlaceUnderStress) {
   ASSERT_EQ(last->diskInfo()->uniqueID(), "SSD-1");
   EXPECT_EQ(accessCount(*last->diskData()), 1u);
   last->endAccessing();
+}
+
+// Threads that nest sessions without a time-out while the planning queue is busy: all come through.
+TEST_F(DiskAccessManagerTest, NestedSessionsNeverWaitForOneAnother) {
+  plugDisk("HDD-1", "sda1", "Rotational", stickVolume);
+  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  manager_->setIsBackgroundMode(true);
+  awaitInventory();
+  const auto unknown = beginOnBusyQueue(homeVolume);
+  unknown->endAccessing();
+  const struct {
+    const URL& file;
+    bool isBackgroundMode;
+    int threads;
+  } cases[] = {{homeFile, true, 2}, {stickFile, false, 4}};
+  for (const auto& [file, isBackgroundMode, threadCount] : cases) {
+    manager_->setIsBackgroundMode(isBackgroundMode);
+    awaitInventory();
+    const std::shared_ptr<DiskData> disk = DiskAccessGuard(begin(file))->diskData();
+    ASSERT_NE(disk, unknown->diskData()) << "an access that is over binds nobody";
+    std::atomic<int> left = threadCount;
+    Basalt::Semaphore passes;
+    std::latch start(threadCount);
+    std::vector<std::thread> threads;
+    for (int thread = 0; thread < threadCount; ++thread) {
+      threads.emplace_back([&, &file = file] {
+        start.arrive_and_wait();
+        for (int i = 0; i < 5000; ++i) {
+          const DiskAccessGuard outer(begin(file));
+          std::this_thread::yield();
+          const DiskAccessGuard inner(begin(file));
+          passes.signal();
+        }
+        --left;
+        passes.signal();
+      });
+    }
+    std::thread busy([&] {
+      while (left > 0) disk->queue().sync([] { std::this_thread::yield(); });
+    });
+    bool hang = false;
+    while (left > 0) {
+      const auto now =
+          std::chrono::floor<Platform::Date::duration>(std::chrono::system_clock::now());
+      hang |= !passes.waitUntil(now + std::chrono::seconds(hang ? 0 : 20));
+      // Lets everybody in, so that the test comes to an end.
+      for (DiskData* record : {disk.get(), unknown->diskData().get()})
+        if (hang)
+          for (const auto& request :
+               disk->queue().sync([&] { return record->claimPendingRequests(); }))
+            request->sema.signal();
+    }
+    for (std::thread& thread : threads) thread.join();
+    busy.join();
+    EXPECT_FALSE(hang) << threadCount << " threads stood still";
+    EXPECT_EQ(accessCount(*disk) + accessCount(*unknown->diskData()), 0u);
+  }
 }
 
 TEST_F(DiskAccessManagerTest, MayGoWhileSessionsAreLeft) {
