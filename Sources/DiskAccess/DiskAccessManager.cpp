@@ -75,13 +75,19 @@ class DiskAccessManager::State final : public std::enable_shared_from_this<State
   const std::shared_ptr<Basalt::SerialQueue> planningQueue_;
   const std::shared_ptr<DiskData> unknownDiskData_;
   std::atomic<bool> isBackgroundMode_ = false;
+  std::atomic<bool> isUpdateQueued_ = false;  ///< As long as it has not begun.
 
   const std::shared_ptr<DiskRecords> records_;
   bool isDetached_ = false;
 };
 
 void DiskAccessManager::State::scheduleUpdate() {
-  planningQueue_->async([self = shared_from_this()] { self->updateDiskDataUnsafe(); });
+  // An inventory that has not begun sees this change too.
+  if (isUpdateQueued_.exchange(true)) return;
+  planningQueue_->async([self = shared_from_this()] {
+    self->isUpdateQueued_.exchange(false);
+    self->updateDiskDataUnsafe();
+  });
 }
 
 void DiskAccessManager::State::detachFromPorts() {

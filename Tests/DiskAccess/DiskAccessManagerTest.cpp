@@ -34,13 +34,31 @@ const URL stickVolume = URL::fileURLWithPath("/stick/");
 const URL homeFile = URL::fileURLWithPath("/home/file");
 const URL stickFile = URL::fileURLWithPath("/stick/file");
 
+/// A registry that does something in the middle of an inventory, once.
+class InterruptedRegistry final : public Platform::DeviceRegistry {
+ public:
+  explicit InterruptedRegistry(Platform::DeviceRegistry& devices) : devices_(devices) {}
+
+  std::function<void()> interruption;  ///< To be set on the queue that takes the inventory.
+
+  std::optional<Entries> entriesMatchingProperty(std::string_view name,
+                                                 const Platform::PropertyValue& value) override {
+    auto entries = devices_.entriesMatchingProperty(name, value);
+    if (auto interrupt = std::exchange(interruption, {})) interrupt();
+    return entries;
+  }
+
+ private:
+  Platform::DeviceRegistry& devices_;
+};
+
 /// A machine with a solid-state disk under /home/, and a manager that knows it.
 class DiskAccessManagerTest : public ::testing::Test {
  protected:
   DiskAccessManagerTest() {
     plugDisk("SSD-1", "nvme0n1", "Solid State", homeVolume);
     volumes_.setVolumes({{.url = homeVolume, .isLocal = {}, .isInternal = {}, .uuid = {}}});
-    manager_.emplace(DiskAccessManager::Ports{.devices = devices_,
+    manager_.emplace(DiskAccessManager::Ports{.devices = registry_,
                                               .disks = disks_,
                                               .volumes = volumes_,
                                               .securityScope = scope_,
@@ -105,6 +123,7 @@ class DiskAccessManagerTest : public ::testing::Test {
   }
 
   Platform::Testing::FakeDeviceRegistry devices_;
+  InterruptedRegistry registry_{devices_};
   Platform::Testing::FakeDiskArbitration disks_;
   Platform::Testing::FakeVolumeCatalog volumes_;
   Platform::Testing::FakeSecurityScope scope_;
@@ -257,6 +276,24 @@ TEST_F(DiskAccessManagerTest, ADiskThatGoesIsRememberedForAThreadThatIsBeingWoke
   awaitInventory();
   EXPECT_EQ(accessCount(*woken->diskData()), 1u);
   EXPECT_FALSE(begin(stickFile, 0)) << "its only place is taken";
+}
+
+TEST_F(DiskAccessManagerTest, AStormOfMountsCostsOneInventoryAndLosesNone) {
+  Basalt::SerialQueue& queue = DiskAccessGuard(begin(homeFile))->diskData()->queue();
+  int inventories = 0;
+  queue.sync([&] {
+    inventories = disks_.openedSessions();
+    for (int i = 0; i < 500; ++i)
+      center_.post({.name = std::string(didMountNotification), .userInfo = {}});
+    registry_.interruption = [&] {
+      plugDisk("HDD-1", "sda1", "Rotational", stickVolume);
+      volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+    };
+  });
+  awaitInventory();
+  EXPECT_LE(disks_.openedSessions(), inventories + 3) << "one of one disk, and one of two";
+  awaitInventory();
+  EXPECT_EQ(DiskAccessGuard(begin(stickFile))->diskInfo()->uniqueID(), "HDD-1");
 }
 
 TEST_F(DiskAccessManagerTest, AVolumeOverTwoDisksBelongsToTheLast) {
