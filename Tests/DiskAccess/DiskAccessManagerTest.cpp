@@ -18,6 +18,7 @@
 #include <Platform/Testing/FakeVolumeCatalog.h>
 #include <Varnel/DiskAccess/DiskAccessGuard.h>
 #include <Varnel/DiskAccess/DiskData.h>
+#include <Varnel/DiskAccess/ManagedAccess.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
 #include <Varnel/DiskAccess/VolumeChangeRelay.h>
 
@@ -122,6 +123,16 @@ class DiskAccessManagerTest : public ::testing::Test {
       std::this_thread::yield();
   }
 
+  /// The class in which a thread waits that begins an access to this full disk.
+  static int classOfWaiter(DiskData& disk, const std::function<Session()>& begin) {
+    std::thread waiting([&] { DiskAccessGuard access(begin()); });
+    awaitRequests(disk, 1);
+    const auto waiters = disk.queue().sync([&] { return disk.claimPendingRequests(); });
+    for (const auto& request : waiters) request->sema.signal();
+    waiting.join();
+    return waiters.at(0)->urgencyClass();
+  }
+
   Platform::Testing::FakeDeviceRegistry devices_;
   InterruptedRegistry registry_{devices_};
   Platform::Testing::FakeDiskArbitration disks_;
@@ -151,11 +162,12 @@ TEST_F(DiskAccessManagerTest, OpensASecurityScopeOnlyWhenAskedAndOnAVolume) {
   EXPECT_FALSE(begin(homeFile));
   volumes_.setLookupError({});
   const int before = scope_.startCount();
-  manager_->beginAccessingURL(homeFile, "test", QoS::utility, false)->endAccessing();
-  EXPECT_EQ(scope_.startCount(), before);
-
-  begin(homeFile)->endAccessing();
+  const Session scoped = begin(homeFile);
   EXPECT_EQ(scope_.startCount(), before + 1);
+  manager_->beginAccessingURL(homeFile, "test", QoS::utility, false)->endAccessing();
+  EXPECT_EQ(scope_.startCount(), before + 1);
+  EXPECT_EQ(scope_.openAccesses(homeFile), 1) << "the other one is not its to close";
+  scoped->endAccessing();
   EXPECT_EQ(scope_.openAccesses(homeFile), 0);
 
   const URL secret = URL::fileURLWithPath("/home/secret");
@@ -174,6 +186,16 @@ TEST_F(DiskAccessManagerTest, ASessionThatIsDroppedKeepsItsPlaceAndItsScope) {
   EXPECT_EQ(scope_.openAccesses(stickFile), 1);
   for (const double timeout : {0.0, -1.0, 0.001}) EXPECT_FALSE(begin(stickFile, timeout));
   EXPECT_EQ(scope_.openAccesses(stickFile), 4) << "a time-out leaves its scope open";
+
+  volumes_.unmount(stickVolume);
+  awaitInventory();
+  const Session gone =
+      manager_->beginAccessingURL(stickFile, "test", QoS::utility, false, {}, stickVolume);
+  EXPECT_EQ(gone->diskInfo()->uniqueID(), "unknown");
+  gone->endAccessing();
+  volumes_.mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
+  awaitInventory();
+  EXPECT_FALSE(begin(stickFile, 0)) << "the place is still taken when the disk returns";
 }
 
 TEST_F(DiskAccessManagerTest, SessionsOfOneThreadNestAndCountEach) {
@@ -185,7 +207,60 @@ TEST_F(DiskAccessManagerTest, SessionsOfOneThreadNestAndCountEach) {
   EXPECT_EQ(accessCount(*inner->diskData()), 1u);
   std::thread([&] { EXPECT_FALSE(begin(stickFile, 0)); }).join();
   inner->endAccessing();
+
+  const Session one = begin(stickFile);
+  const Session other = begin(stickFile);
+  one->endAccessing();
+  one->endAccessing();
+  EXPECT_FALSE(one->isAccessing());
+  EXPECT_EQ(accessCount(*other->diskData()), 0u) << "each end takes a place of the thread back";
   std::thread([&] { EXPECT_TRUE(begin(stickFile)); }).join();
+}
+
+TEST_F(DiskAccessManagerTest, PassesOnWhatACallerAsksFor) {
+  const auto beginAs = [&](QoS qos) {
+    return manager_->beginAccessingURL(homeFile, "test", qos, false, {}, archiveVolume);
+  };
+  const DiskAccessGuard holder(beginAs(QoS::utility));
+  EXPECT_EQ(classOfWaiter(*holder->diskData(), [&] { return beginAs(QoS::userInteractive); }), 0);
+  EXPECT_EQ(classOfWaiter(*holder->diskData(), [&] { return beginAs(QoS::background); }), 3);
+
+  const URL folder = URL::fileURLWithPath("/");
+  const URL noVolume = URL::fileURLWithPath("/no volume/");
+  const DiskAccessGuard managed(beginManagedAccessing(folder, "purpose", true, {}, noVolume));
+  ASSERT_TRUE(managed);
+  EXPECT_EQ(managed->url(), folder);
+  EXPECT_EQ(managed->propose(), "purpose");
+  EXPECT_TRUE(managed->secureScope());
+  EXPECT_EQ(managed->diskInfo()->uniqueID(), "unknown");
+  EXPECT_EQ(DiskAccessGuard(DiskAccessManager::shared().beginAccessingURL(folder, "", QoS::utility,
+                                                                          false, {}, noVolume))
+                ->diskData(),
+            managed->diskData());
+  EXPECT_EQ(classOfWaiter(*managed->diskData(),
+                          [&] {
+                            Session session =
+                                beginManagedAccessing(folder, "", false, {}, noVolume);
+                            EXPECT_FALSE(session->secureScope());
+                            return session;
+                          }),
+            2);
+  std::thread([&] { EXPECT_FALSE(beginManagedAccessing(folder, "", false, 0, noVolume)); }).join();
+}
+
+TEST_F(DiskAccessManagerTest, TheRelayTellsWhichVolumeCameOrWent) {
+  std::vector<std::string> told;
+  std::vector<Basalt::NotificationCenter::Observer> observers;
+  for (const char* name : {"NSWorkspaceDidMountNotification", "NSWorkspaceDidUnmountNotification"})
+    observers.push_back(center_.addObserver(name, [&](const Basalt::Notification& notification) {
+      told.push_back(
+          notification.name + ' ' +
+          *Platform::findAs<std::string>(notification.userInfo, "NSWorkspaceVolumeURLKey"));
+    }));
+  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  volumes_.unmount(stickVolume);
+  EXPECT_EQ(told, (std::vector<std::string>{"NSWorkspaceDidMountNotification file:///stick/",
+                                            "NSWorkspaceDidUnmountNotification file:///stick/"}));
 }
 
 TEST_F(DiskAccessManagerTest, AThreadThatHoldsADiskUsesItWhateverTheLookUpFinds) {
