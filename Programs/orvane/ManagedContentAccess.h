@@ -21,7 +21,7 @@ class VolumeCatalog;
 
 namespace Orvane {
 
-/// Reads under the rationing of the process's disk access manager: a session for each read.
+/// Reads as the process's disk access manager admits: a session for each read.
 class ManagedContentAccess final : public ContentAccess {
  public:
   struct Ports {

@@ -22,8 +22,9 @@ class VolumeCatalog;
 
 namespace Varnel {
 
-/// Rations the reading of each physical disk among the threads of the process: a disk admits as
-/// many threads at a time as suits its kind, the others wait and come in by quality of service.
+/// Admits the threads of the process to each physical disk: as many as suit its kind come in at
+/// once, the others wait and come in by quality of service. A place that comes free lets in all
+/// that wait, so under a steady rush there are more readers than that.
 ///
 ///     auto session = DiskAccessManager::shared().beginAccessingURL(file, "compare");
 ///     if (!session) return;  // no access: do not touch the disk
