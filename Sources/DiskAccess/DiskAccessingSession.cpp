@@ -63,7 +63,7 @@ void DiskAccessingSession::endAccessing() {
   const Basalt::ThreadID thread = Basalt::currentThreadID();
   diskData_->queue().sync([&] {
     diskData_->releaseAccess(thread);
-    records_->remove({thread, diskData_, volumeURL_});
+    records_->remove(thread, diskData_, volumeURL_);
   });
   if (secureScope_) scopes_->endAccessingSecurityScopedResource(url_, propose_);
 }

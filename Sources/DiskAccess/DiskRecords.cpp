@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/DiskAccess/DiskRecords.h>
 
-#include <algorithm>
 #include <utility>
 
 #include <Basalt/SerialQueue.h>
@@ -60,12 +59,14 @@ std::shared_ptr<DiskData> DiskRecords::usedBy(Basalt::ThreadID thread,
   return nullptr;
 }
 
-void DiskRecords::remove(const Use& use) {
-  auto found = std::find(uses_.begin(), uses_.end(), use);
-  if (found == uses_.end())
-    found = std::find_if(uses_.begin(), uses_.end(), [&](const Use& other) {
-      return other.thread == use.thread && other.record == use.record;
-    });
+void DiskRecords::remove(Basalt::ThreadID thread, const std::shared_ptr<DiskData>& record,
+                         const Platform::URL& volumeURL) {
+  auto found = uses_.end();
+  for (auto use = uses_.begin(); use != uses_.end(); ++use) {
+    if (use->thread != thread || use->record != record) continue;
+    found = use;
+    if (use->volumeURL == volumeURL) break;
+  }
   if (found != uses_.end()) uses_.erase(found);
 }
 

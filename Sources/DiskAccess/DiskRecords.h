@@ -46,15 +46,14 @@ class DiskRecords final {
     Basalt::ThreadID thread;
     std::shared_ptr<DiskData> record;
     Platform::URL volumeURL;
-
-    bool operator==(const Use&) const = default;
   };
 
   void add(Use use) { uses_.push_back(std::move(use)); }
 
   /// Takes one such use out, and without one any other of the thread's uses of the record: as often
   /// as the record counts the thread, so often it stands here.
-  void remove(const Use& use);
+  void remove(Basalt::ThreadID thread, const std::shared_ptr<DiskData>& record,
+              const Platform::URL& volumeURL);
 
  private:
   const std::shared_ptr<Basalt::SerialQueue> queue_;

@@ -190,7 +190,8 @@ TEST_F(DiskAccessManagerTest, ASessionThatIsDroppedKeepsItsPlaceAndItsScope) {
   volumes_.unmount(stickVolume);
   awaitInventory();
   const Session gone =
-      manager_->beginAccessingURL(stickFile, "test", QoS::utility, false, {}, stickVolume);
+      manager_->beginAccessingURL(stickFile, "test", QoS::utility, false, 0, stickVolume);
+  ASSERT_TRUE(gone);
   EXPECT_EQ(gone->diskInfo()->uniqueID(), "unknown");
   gone->endAccessing();
   volumes_.mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
