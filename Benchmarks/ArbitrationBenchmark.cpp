@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
 
-// The rationing of disk access against what a program would otherwise do by hand. Each stand-in is
+// The admission to disks against what a program would otherwise do by hand. Each stand-in is
 // measured in turns with ours; only the ratios of one run mean anything.
 
 #include <semaphore.h>

@@ -39,14 +39,14 @@ bool isVirtual(std::string_view place) {
 }
 
 std::string BlockDevices::place(const std::string& name) const {
-  return devices_.link(name).value_or(std::string());
+  return devices_->link(name).value_or(std::string());
 }
 
 std::vector<std::string> BlockDevices::lowerDevices(const std::string& name) const {
   // The kinds of which there are many, and which stand on nothing.
   for (const std::string_view alone : {"loop", "ram", "zram"})
     if (name.starts_with(alone)) return {};
-  return devices_.names(name + "/slaves");
+  return devices_->names(name + "/slaves");
 }
 
 bool BlockDevices::flag(const std::string& path) const {
@@ -54,7 +54,7 @@ bool BlockDevices::flag(const std::string& path) const {
 }
 
 std::string BlockDevices::text(const std::string& path) const {
-  return trimmed(devices_.bytes(path).value_or(std::string()));
+  return trimmed(devices_->bytes(path).value_or(std::string()));
 }
 
 Bus BlockDevices::bus(std::string_view place) const {
@@ -62,7 +62,7 @@ Bus BlockDevices::bus(std::string_view place) const {
   std::vector<std::string> subsystems;
   for (std::string_view device = carrierOf(place);
        !device.empty() && lastComponent(device) != "devices"; device = folderOf(device)) {
-    const auto link = devices_.link(std::string(device) + "/subsystem");
+    const auto link = devices_->link(std::string(device) + "/subsystem");
     if (!link) continue;
     subsystems.emplace_back(lastComponent(*link));
     if (decidesBus(subsystems.back())) break;
@@ -82,17 +82,28 @@ StorageDevice BlockDevices::storageDevice(const std::string& name, std::string_v
   device.isSolidState = text(name + "/queue/rotational") == "0";
   device.place = withoutClimbing(carrierOf(place));
   if (device.bus == Bus::scsi)
-    device.serialPage = devices_.bytes(name + "/device/vpd_pg80").value_or(std::string());
+    device.serialPage = devices_->bytes(name + "/device/vpd_pg80").value_or(std::string());
   else if (device.bus == Bus::nvme)
     device.serialNumber = text(name + "/device/serial");
+  else if (auto recorded = udevProperty(name, "ID_SERIAL"))
+    device.serialNumber = *std::move(recorded);
   else
-    device.serialNumber =
-        virtioSerials.of(text(name + "/diskseq"), [&] { return text(name + "/serial"); });
+    device.serialNumber = virtioSerial(name, place, virtioSerials);
   if (!device.serialNumber.empty() || !serialInPage(device.serialPage).empty()) return device;
 
   device.recordedSerial = udevProperty(name, "ID_SERIAL_SHORT").value_or(std::string());
   device.worldWideName = text(name + (device.bus == Bus::nvme ? "/wwid" : "/device/wwid"));
   return device;
+}
+
+std::string BlockDevices::virtioSerial(const std::string& name, std::string_view place,
+                                       VirtioSerials& virtioSerials) const {
+  // No other disk has this number until the system is started anew. Older kernels count none.
+  const std::string sequence = text(name + "/diskseq");
+  return virtioSerials.of(sequence.empty() ? std::string(place) : sequence,
+                          [devices = devices_, path = name + "/serial"] {
+                            return trimmed(devices->bytes(path).value_or(std::string()));
+                          });
 }
 
 std::optional<bool> BlockDevices::areInternal(const std::vector<std::string>& names) const {
@@ -114,7 +125,7 @@ std::optional<bool> BlockDevices::isInternal(const std::string& name, int depth)
   if (own.empty() || depth == 0) return std::nullopt;
   if (name.starts_with("loop")) return false;
   if (isVirtual(own)) return areInternal(lowerDevices(name), depth - 1);
-  if (devices_.contains(name + "/partition"))
+  if (devices_->contains(name + "/partition"))
     return isInternal(std::string(lastComponent(folderOf(own))), depth - 1);
   const Bus ownBus = bus(own);
   return Linux::isInternal(ownBus, flag(name + "/removable"),

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -13,15 +14,17 @@ namespace Varnel::Platform::Linux {
 
 class VirtioSerials;
 
-/// The kernel's table of block devices. Reads tables alone, never a device. Any thread.
+/// The kernel's table of block devices. Reads tables alone, never a device but for what
+/// `VirtioSerials` says. Any thread.
 class BlockDevices final {
  public:
   /// `folder` is where the devices are listed.
-  explicit BlockDevices(const char* folder = "/sys/class/block") : devices_(folder) {}
+  explicit BlockDevices(const char* folder = "/sys/class/block")
+      : devices_(std::make_shared<const KernelFolder>(folder)) {}
 
-  explicit operator bool() const { return static_cast<bool>(devices_); }
+  explicit operator bool() const { return static_cast<bool>(*devices_); }
 
-  [[nodiscard]] std::vector<std::string> names() const { return devices_.names(); }
+  [[nodiscard]] std::vector<std::string> names() const { return devices_->names(); }
 
   /// Where the device stands in the kernel's tree: "../../devices/…/block/sda/sda1". Empty when
   /// there is no such device.
@@ -42,11 +45,13 @@ class BlockDevices final {
   [[nodiscard]] Bus bus(std::string_view place) const;
   [[nodiscard]] bool flag(const std::string& path) const;
   [[nodiscard]] std::string text(const std::string& path) const;
+  [[nodiscard]] std::string virtioSerial(const std::string& name, std::string_view place,
+                                         VirtioSerials& virtioSerials) const;
   [[nodiscard]] std::optional<bool> areInternal(const std::vector<std::string>& names,
                                                 int depth) const;
   [[nodiscard]] std::optional<bool> isInternal(const std::string& name, int depth) const;
 
-  KernelFolder devices_;
+  std::shared_ptr<const KernelFolder> devices_;
 };
 
 /// Whether a place is that of a device that the kernel makes up: a disk image, a RAID, a RAM disk.

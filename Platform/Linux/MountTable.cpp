@@ -15,6 +15,7 @@
 #include <Platform/Linux/Adapters.h>
 #include <Platform/Linux/BlockDevices.h>
 #include <Platform/Linux/FileSystemTypes.h>
+#include <Platform/Linux/MountID.h>
 #include <Platform/Linux/MountInfo.h>
 
 namespace Varnel::Platform::Linux {
@@ -59,13 +60,12 @@ class DeviceNames final {
 
 // The mount that the root folder lies on, as far as the folder itself tells.
 std::optional<Mount> mountOfRootFolder() {
-  struct statx facts {};
-  if (::statx(AT_FDCWD, "/", AT_STATX_DONT_SYNC, STATX_MNT_ID, &facts) != 0 ||
-      (facts.stx_mask & STATX_MNT_ID) == 0)
-    return std::nullopt;
+  const auto id = mountIDOf("/");
+  struct stat facts {};
+  if (!id || ::stat("/", &facts) != 0) return std::nullopt;
   Mount mount;
-  mount.id = static_cast<int>(facts.stx_mnt_id);
-  mount.device = std::to_string(facts.stx_dev_major) + ':' + std::to_string(facts.stx_dev_minor);
+  mount.id = *id;
+  mount.device = std::to_string(major(facts.st_dev)) + ':' + std::to_string(minor(facts.st_dev));
   mount.target = "/";
   return mount;
 }

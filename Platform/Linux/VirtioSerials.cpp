@@ -1,21 +1,37 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Linux/VirtioSerials.h>
 
+#include <future>
+#include <memory>
+#include <system_error>
 #include <utility>
 
-namespace Varnel::Platform::Linux {
+#include <Platform/Concurrency/StartThread.h>
 
-std::string VirtioSerials::of(const std::string& sequence,
-                              const std::function<std::string()>& ask) {
-  if (sequence.empty()) return ask();
+namespace Varnel::Platform::Linux {
+namespace {
+
+std::string answerWithin(std::chrono::milliseconds patience, std::function<std::string()> ask) {
+  const auto task = std::make_shared<std::packaged_task<std::string()>>(std::move(ask));
+  auto answer = task->get_future();
+  try {
+    startThread("virtio-serial", [task] { (*task)(); }).detach();
+  } catch (const std::system_error&) {
+    return {};
+  }
+  return answer.wait_for(patience) == std::future_status::ready ? answer.get() : std::string();
+}
+
+}  // namespace
+
+std::string VirtioSerials::of(const std::string& disk, std::function<std::string()> ask) {
   {
     const std::lock_guard lock(mutex_);
-    if (const auto known = bySequence_.find(sequence); known != bySequence_.end())
-      return known->second;
+    if (const auto known = byDisk_.find(disk); known != byDisk_.end()) return known->second;
   }
-  std::string serial = ask();
+  std::string serial = answerWithin(patience_, std::move(ask));
   const std::lock_guard lock(mutex_);
-  return bySequence_.emplace(sequence, std::move(serial)).first->second;
+  return byDisk_.emplace(disk, std::move(serial)).first->second;
 }
 
 }  // namespace Varnel::Platform::Linux

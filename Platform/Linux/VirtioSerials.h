@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <functional>
 #include <map>
 #include <mutex>
@@ -9,17 +10,22 @@
 namespace Varnel::Platform::Linux {
 
 /// The serial numbers of virtio disks. To read one is to send the disk a request, which takes its
-/// turn behind all others, so each disk is asked once. Any thread.
+/// turn behind all others: so each disk is asked once, on a thread of its own, and nobody waits
+/// long for the answer. A disk that does not answer in time has no number from then on, as a disk
+/// that changed its name would count as two. Any thread.
 class VirtioSerials final {
  public:
-  /// The number of the disk with this sequence number, which no other disk has until the system is
-  /// started anew. A disk without one is asked every time.
-  [[nodiscard]] std::string of(const std::string& sequence,
-                               const std::function<std::string()>& ask);
+  explicit VirtioSerials(std::chrono::milliseconds patience = std::chrono::milliseconds(100))
+      : patience_(patience) {}
+
+  /// The number of the disk that this key tells from all others; empty when it has none. `ask` owns
+  /// what it uses: it may run for long after this.
+  [[nodiscard]] std::string of(const std::string& disk, std::function<std::string()> ask);
 
  private:
+  const std::chrono::milliseconds patience_;
   std::mutex mutex_;  ///< Owns what follows; never held while a disk is asked.
-  std::map<std::string, std::string> bySequence_;
+  std::map<std::string, std::string> byDisk_;
 };
 
 }  // namespace Varnel::Platform::Linux

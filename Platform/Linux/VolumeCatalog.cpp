@@ -1,37 +1,18 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Ports/VolumeCatalog.h>
 
-#include <fcntl.h>
-#include <sys/stat.h>
-
-#include <cerrno>
 #include <system_error>
 #include <utility>
 
 #include <Platform/Linux/Adapters.h>
 #include <Platform/Linux/FileSystemTypes.h>
+#include <Platform/Linux/MountID.h>
 #include <Platform/Linux/MountTable.h>
 #include <Platform/Linux/UdevDatabase.h>
 #include <Platform/Linux/VolumeWatch.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
-
-PlatformError systemError(int number) {
-  return PlatformError(std::error_code(number, std::generic_category()));
-}
-
-// The mount that a file lies on. A symbolic link lies where it is, not where it points.
-Result<int> mountIDOf(const URL& url) {
-  const std::string path = url.path();
-  // The system would look up what stands before the zero.
-  if (path.find('\0') != std::string::npos) return systemError(EINVAL);
-  struct statx facts {};
-  constexpr int flags = AT_SYMLINK_NOFOLLOW | AT_NO_AUTOMOUNT | AT_STATX_DONT_SYNC;
-  if (::statx(AT_FDCWD, path.c_str(), flags, STATX_MNT_ID, &facts) != 0) return systemError(errno);
-  if ((facts.stx_mask & STATX_MNT_ID) == 0) return systemError(ENOTSUP);
-  return static_cast<int>(facts.stx_mnt_id);
-}
 
 class MountTableCatalog final : public VolumeCatalog {
  public:
@@ -57,11 +38,11 @@ class MountTableCatalog final : public VolumeCatalog {
   }
 
   Result<std::optional<URL>> volumeURL(const URL& url) override {
-    const auto mountID = mountIDOf(url);
+    const auto mountID = mountIDOf(url.path());
     if (!mountID) return mountID.error();
     // Asked after the file, the table knows the mount that the file was found on.
     const auto table = table_->current();
-    if (!table) return systemError(ENOENT);
+    if (!table) return PlatformError(std::make_error_code(std::errc::no_such_file_or_directory));
     const Volume* volume = table->withMountID(*mountID);
     return volume ? std::optional(volume->url) : std::nullopt;
   }

@@ -36,13 +36,15 @@ bool ManagedContentAccess::whileAccessing(const std::string& path, std::uint64_t
 std::optional<URL> ManagedContentAccess::volumeOf(const URL& url, std::uint64_t device) {
   // A device's volumes all lie on one disk, so the first that is met stands for them; asking once
   // saves a look-up for every file.
-  const std::lock_guard lock(mutex_);
-  const auto known = volumesByDevice_.find(device);
-  if (known != volumesByDevice_.end()) return known->second;
+  {
+    const std::lock_guard lock(mutex_);
+    const auto known = volumesByDevice_.find(device);
+    if (known != volumesByDevice_.end()) return known->second;
+  }
   const auto volume = ports_.volumes.volumeURL(url);
   if (!volume || !*volume) return std::nullopt;
-  volumesByDevice_.emplace(device, **volume);
-  return **volume;
+  const std::lock_guard lock(mutex_);
+  return volumesByDevice_.emplace(device, **volume).first->second;
 }
 
 }  // namespace Orvane

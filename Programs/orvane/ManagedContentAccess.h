@@ -21,7 +21,7 @@ class VolumeCatalog;
 
 namespace Orvane {
 
-/// Reads under the rationing of the process's disk access manager: a session for each read.
+/// Reads as the process's disk access manager admits: a session for each read.
 class ManagedContentAccess final : public ContentAccess {
  public:
   struct Ports {
@@ -40,7 +40,9 @@ class ManagedContentAccess final : public ContentAccess {
 
   Ports ports_;
   Varnel::Platform::QualityOfService qos_;
-  std::mutex mutex_;  ///< Guards the volumes that are known already.
+  /// Guards the volumes that are known already. Never held while a volume is looked up, as a file
+  /// on a dead network share can keep its reader for ever.
+  std::mutex mutex_;
   std::map<std::uint64_t, Varnel::Platform::URL> volumesByDevice_;
 };
 

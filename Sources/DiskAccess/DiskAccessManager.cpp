@@ -2,7 +2,6 @@
 #include <Varnel/DiskAccess/DiskAccessManager.h>
 
 #include <atomic>
-#include <unordered_map>
 #include <utility>
 
 #include <Basalt/SecurityScopeBookkeeping.h>
@@ -10,6 +9,7 @@
 #include <Platform/Ports/Ports.h>
 #include <Platform/Ports/VolumeCatalog.h>
 #include <Varnel/DiskAccess/DiskData.h>
+#include <Varnel/DiskAccess/DiskRecords.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
 #include <Varnel/DiskAccess/VolumeChangeRelay.h>
 
@@ -54,11 +54,13 @@ class DiskAccessManager::State final : public std::enable_shared_from_this<State
         planningQueue_(Basalt::QNBuildInternalDispatchQueue("disk-access-manager.planning-queue")),
         unknownDiskData_(std::make_shared<DiskData>(
             std::make_shared<OVDiskInfo>("unknown", OVDiskInfo::VolumeURLs(), OVDiskKindUnknown),
-            false, planningQueue_)) {}
+            false, planningQueue_)),
+        records_(std::make_shared<DiskRecords>(planningQueue_)) {}
 
   // Any thread.
   [[nodiscard]] Platform::VolumeCatalog& volumes() const { return ports_.volumes; }
   [[nodiscard]] const auto& scopes() const { return scopes_; }
+  [[nodiscard]] const auto& records() const { return records_; }
   [[nodiscard]] bool isBackgroundMode() const { return isBackgroundMode_; }
   void setIsBackgroundMode(bool isBackgroundMode);
   void scheduleUpdate();
@@ -67,22 +69,25 @@ class DiskAccessManager::State final : public std::enable_shared_from_this<State
 
  private:
   void updateDiskDataUnsafe();
-  void applyBackgroundMode(bool isBackgroundMode);
-  [[nodiscard]] std::shared_ptr<DiskData> knownRecord(const Platform::URL& volumeURL) const;
 
   const Ports ports_;
   const std::shared_ptr<Basalt::SecurityScopeBookkeeping> scopes_;
   const std::shared_ptr<Basalt::SerialQueue> planningQueue_;
   const std::shared_ptr<DiskData> unknownDiskData_;
   std::atomic<bool> isBackgroundMode_ = false;
+  std::atomic<bool> isUpdateQueued_ = false;  ///< As long as it has not begun.
 
+  const std::shared_ptr<DiskRecords> records_;
   bool isDetached_ = false;
-  std::unordered_map<Platform::URL, std::string> diskUniqueIDsByVolumeURL_;
-  std::unordered_map<std::string, std::shared_ptr<DiskData>> diskDataByUniqueID_;
 };
 
 void DiskAccessManager::State::scheduleUpdate() {
-  planningQueue_->async([self = shared_from_this()] { self->updateDiskDataUnsafe(); });
+  // An inventory that has not begun sees this change too.
+  if (isUpdateQueued_.exchange(true)) return;
+  planningQueue_->async([self = shared_from_this()] {
+    self->isUpdateQueued_.exchange(false);
+    self->updateDiskDataUnsafe();
+  });
 }
 
 void DiskAccessManager::State::detachFromPorts() {
@@ -95,54 +100,23 @@ void DiskAccessManager::State::detachFromPorts() {
 void DiskAccessManager::State::updateDiskDataUnsafe() {
   Basalt::QNAssertOnQueue(*planningQueue_);
   if (isDetached_) return;
-  diskUniqueIDsByVolumeURL_.clear();
-  std::unordered_map<std::string, std::shared_ptr<DiskData>> records;
-  for (const auto& disk : OVDiskInfo::allDiskInfos(
-           {.devices = ports_.devices, .disks = ports_.disks, .volumes = ports_.volumes})) {
-    if (!disk->uniqueID() || !disk->volumeURLs() || disk->volumeURLs()->empty()) continue;
-    std::shared_ptr<DiskData>& record = records[*disk->uniqueID()];
-    if (const auto known = diskDataByUniqueID_.find(*disk->uniqueID());
-        known != diskDataByUniqueID_.end())
-      record = known->second;
-    else if (!record)
-      record = std::make_shared<DiskData>(disk, isBackgroundMode_, planningQueue_);
-    for (const Platform::URL& volumeURL : *disk->volumeURLs())
-      diskUniqueIDsByVolumeURL_[volumeURL] = *disk->uniqueID();
-  }
-  // A disk that is gone is remembered while threads access it or a session has to do with it: a
-  // thread that was woken a moment ago stands in no line and counts not yet.
-  for (auto& [uniqueID, record] : diskDataByUniqueID_)
-    if (record->accessCount() > 0 || record.use_count() > 1)
-      records.try_emplace(uniqueID, std::move(record));
-  diskDataByUniqueID_ = std::move(records);
+  records_->update(
+      OVDiskInfo::allDiskInfos(
+          {.devices = ports_.devices, .disks = ports_.disks, .volumes = ports_.volumes}),
+      isBackgroundMode_);
 }
 
 void DiskAccessManager::State::setIsBackgroundMode(bool isBackgroundMode) {
   isBackgroundMode_ = isBackgroundMode;
   planningQueue_->async([self = shared_from_this(), isBackgroundMode] {
-    self->applyBackgroundMode(isBackgroundMode);
+    self->records_->setIsBackgroundMode(isBackgroundMode);
   });
-}
-
-void DiskAccessManager::State::applyBackgroundMode(bool isBackgroundMode) {
-  for (const auto& [uniqueID, record] : diskDataByUniqueID_) {
-    record->setIsBackgroundMode(isBackgroundMode);
-    if (!isBackgroundMode) record->grantPendingRequests();
-  }
-}
-
-std::shared_ptr<DiskData> DiskAccessManager::State::knownRecord(
-    const Platform::URL& volumeURL) const {
-  const auto uniqueID = diskUniqueIDsByVolumeURL_.find(volumeURL);
-  if (uniqueID == diskUniqueIDsByVolumeURL_.end()) return nullptr;
-  const auto record = diskDataByUniqueID_.find(uniqueID->second);
-  return record == diskDataByUniqueID_.end() ? nullptr : record->second;
 }
 
 std::shared_ptr<DiskData> DiskAccessManager::State::recordOfVolume(const Platform::URL& volumeURL) {
   const auto lookup = std::make_shared<RecordLookup>(volumeURL);
   planningQueue_->submit([self = shared_from_this(), lookup] {
-    lookup->record = self->knownRecord(lookup->volumeURL);
+    lookup->record = self->records_->ofVolume(lookup->volumeURL);
     lookup->isAnswered.store(true, std::memory_order_release);
   });
   const bool isKnown = lookup->isAnswered.load(std::memory_order_acquire) && lookup->record;
@@ -196,9 +170,9 @@ std::unique_ptr<DiskAccessingSession> DiskAccessManager::beginAccessingVolume(
     const Platform::URL& volumeURL, std::string propose, const Platform::URL& url,
     Platform::QualityOfService qos, bool enableSecureScopedAccess,
     std::optional<Platform::TimeInterval> accessWaitingTimeout) {
-  auto session =
-      std::make_unique<DiskAccessingSession>(url, std::move(propose), enableSecureScopedAccess,
-                                             state_->recordOfVolume(volumeURL), state_->scopes());
+  auto session = std::make_unique<DiskAccessingSession>(
+      url, std::move(propose), enableSecureScopedAccess, state_->recordOfVolume(volumeURL),
+      volumeURL, state_->records(), state_->scopes());
   if (!session->beginAccessing(qos, accessWaitingTimeout)) return nullptr;
   return session;
 }

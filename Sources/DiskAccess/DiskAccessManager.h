@@ -22,8 +22,9 @@ class VolumeCatalog;
 
 namespace Varnel {
 
-/// Rations the reading of each physical disk among the threads of the process: a disk admits as
-/// many threads at a time as suits its kind, the others wait and come in by quality of service.
+/// Admits the threads of the process to each physical disk: as many as suit its kind come in at
+/// once, the others wait and come in by quality of service. A place that comes free lets in all
+/// that wait, so under a steady rush there are more readers than that.
 ///
 ///     auto session = DiskAccessManager::shared().beginAccessingURL(file, "compare");
 ///     if (!session) return;  // no access: do not touch the disk
@@ -70,9 +71,9 @@ class VARNEL_API DiskAccessManager final {
   /// Begins access to a file or folder and waits for a place on its disk, at most
   /// `accessWaitingTimeout` seconds of the wall clock: without a value, or with one that is not a
   /// number or too large for a date, for ever; a negative one not at all. A thread that has a place
-  /// on the disk gets another at once, unless one of the two counts against the record for unknown
-  /// disks: whoever nests accesses gives the inner one a time-out. `volumeURL` spares the search
-  /// for the file's volume; it is written as the inventory writes it, with a "/" at the end.
+  /// on the disk gets another at once, and one that came to the volume through the record for
+  /// unknown disks gets another there. `volumeURL` spares the search for the file's volume; it is
+  /// written as the inventory writes it, with a "/" at the end.
   ///
   /// Null when the volume cannot be told, the security scope cannot be opened, or the time is up.
   /// In the last case a security scope that was opened stays open.

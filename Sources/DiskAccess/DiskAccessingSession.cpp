@@ -6,17 +6,22 @@
 #include <Basalt/SecurityScopeBookkeeping.h>
 #include <Basalt/SerialQueue.h>
 #include <Varnel/DiskAccess/DiskData.h>
+#include <Varnel/DiskAccess/DiskRecords.h>
 #include <Varnel/DiskAccess/WaitingDeadline.h>
 
 namespace Varnel {
 
 DiskAccessingSession::DiskAccessingSession(Platform::URL url, std::string propose, bool secureScope,
                                            std::shared_ptr<DiskData> diskData,
+                                           Platform::URL volumeURL,
+                                           std::shared_ptr<DiskRecords> records,
                                            std::shared_ptr<SecurityScopes> scopes)
     : url_(std::move(url)),
       propose_(std::move(propose)),
       secureScope_(secureScope),
       diskData_(std::move(diskData)),
+      volumeURL_(std::move(volumeURL)),
+      records_(std::move(records)),
       scopes_(std::move(scopes)) {}
 
 const std::shared_ptr<const OVDiskInfo>& DiskAccessingSession::diskInfo() const {
@@ -35,20 +40,31 @@ bool DiskAccessingSession::waitForAdmission(Platform::QualityOfService qos,
   const Basalt::ThreadID thread = Basalt::currentThreadID();
   Basalt::SerialQueue& queue = diskData_->queue();
   // The granter shares the request: it may still be signalling when this thread goes on.
-  const auto request = queue.sync([&] { return diskData_->requestAccess(thread, qos); });
+  const auto request = queue.sync([&] {
+    if (auto used = records_->usedBy(thread, volumeURL_)) diskData_ = std::move(used);
+    auto pending = diskData_->requestAccess(thread, qos);
+    if (!pending) records_->add({thread, diskData_, volumeURL_});
+    return pending;
+  });
   if (!request) return true;
   const Platform::Date now =
       std::chrono::floor<Platform::Date::duration>(std::chrono::system_clock::now());
   const bool isSignalled = request->sema.waitUntil(waitingDeadline(now, waitingTimeout));
   if (!isSignalled && request->claim()) return false;
-  queue.sync([&] { diskData_->confirmAccess(thread); });
+  queue.sync([&] {
+    diskData_->confirmAccess(thread);
+    records_->add({thread, diskData_, volumeURL_});
+  });
   return true;
 }
 
 void DiskAccessingSession::endAccessing() {
   isAccessing_ = false;
   const Basalt::ThreadID thread = Basalt::currentThreadID();
-  diskData_->queue().sync([&] { diskData_->releaseAccess(thread); });
+  diskData_->queue().sync([&] {
+    diskData_->releaseAccess(thread);
+    records_->remove(thread, diskData_, volumeURL_);
+  });
   if (secureScope_) scopes_->endAccessingSecurityScopedResource(url_, propose_);
 }
 

@@ -17,6 +17,7 @@ class SecurityScopeBookkeeping;
 namespace Varnel {
 
 class DiskData;
+class DiskRecords;
 class OVDiskInfo;
 
 /// What a thread holds while it reads files of one disk; `DiskAccessManager` hands it out.
@@ -34,7 +35,9 @@ class VARNEL_API DiskAccessingSession final {
   using SecurityScopes = Basalt::SecurityScopeBookkeeping;
 
   DiskAccessingSession(Platform::URL url, std::string propose, bool secureScope,
-                       std::shared_ptr<DiskData> diskData, std::shared_ptr<SecurityScopes> scopes);
+                       std::shared_ptr<DiskData> diskData, Platform::URL volumeURL,
+                       std::shared_ptr<DiskRecords> records,
+                       std::shared_ptr<SecurityScopes> scopes);
   DiskAccessingSession(const DiskAccessingSession&) = delete;
   DiskAccessingSession& operator=(const DiskAccessingSession&) = delete;
 
@@ -64,7 +67,9 @@ class VARNEL_API DiskAccessingSession final {
   const Platform::URL url_;
   const std::string propose_;
   const bool secureScope_;
-  const std::shared_ptr<DiskData> diskData_;
+  std::shared_ptr<DiskData> diskData_;  ///< Settled once the session is accessing.
+  const Platform::URL volumeURL_;
+  const std::shared_ptr<DiskRecords> records_;
   const std::shared_ptr<SecurityScopes> scopes_;
   bool isAccessing_ = false;
 };

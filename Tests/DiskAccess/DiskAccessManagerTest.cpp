@@ -10,6 +10,7 @@
 #include <thread>
 #include <vector>
 
+#include <Basalt/Semaphore.h>
 #include <Basalt/SerialQueue.h>
 #include <Platform/Testing/FakeDeviceRegistry.h>
 #include <Platform/Testing/FakeDiskArbitration.h>
@@ -17,6 +18,7 @@
 #include <Platform/Testing/FakeVolumeCatalog.h>
 #include <Varnel/DiskAccess/DiskAccessGuard.h>
 #include <Varnel/DiskAccess/DiskData.h>
+#include <Varnel/DiskAccess/ManagedAccess.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
 #include <Varnel/DiskAccess/VolumeChangeRelay.h>
 
@@ -33,13 +35,31 @@ const URL stickVolume = URL::fileURLWithPath("/stick/");
 const URL homeFile = URL::fileURLWithPath("/home/file");
 const URL stickFile = URL::fileURLWithPath("/stick/file");
 
+/// A registry that does something in the middle of an inventory, once.
+class InterruptedRegistry final : public Platform::DeviceRegistry {
+ public:
+  explicit InterruptedRegistry(Platform::DeviceRegistry& devices) : devices_(devices) {}
+
+  std::function<void()> interruption;  ///< To be set on the queue that takes the inventory.
+
+  std::optional<Entries> entriesMatchingProperty(std::string_view name,
+                                                 const Platform::PropertyValue& value) override {
+    auto entries = devices_.entriesMatchingProperty(name, value);
+    if (auto interrupt = std::exchange(interruption, {})) interrupt();
+    return entries;
+  }
+
+ private:
+  Platform::DeviceRegistry& devices_;
+};
+
 /// A machine with a solid-state disk under /home/, and a manager that knows it.
 class DiskAccessManagerTest : public ::testing::Test {
  protected:
   DiskAccessManagerTest() {
     plugDisk("SSD-1", "nvme0n1", "Solid State", homeVolume);
     volumes_.setVolumes({{.url = homeVolume, .isLocal = {}, .isInternal = {}, .uuid = {}}});
-    manager_.emplace(DiskAccessManager::Ports{.devices = devices_,
+    manager_.emplace(DiskAccessManager::Ports{.devices = registry_,
                                               .disks = disks_,
                                               .volumes = volumes_,
                                               .securityScope = scope_,
@@ -75,6 +95,25 @@ class DiskAccessManagerTest : public ::testing::Test {
     return session;
   }
 
+  /// The same for a volume while the planning queue is too busy to say which disk it lies on.
+  Session beginOnBusyQueue(const URL& volume, std::optional<double> timeout = {}) {
+    Basalt::SerialQueue& queue = DiskAccessGuard(begin(homeFile))->diskData()->queue();
+    const int before = scope_.startCount();
+    std::latch isBusy(1);
+    std::thread keeper([&] {
+      queue.sync([&] {
+        isBusy.count_down();
+        // A scope is opened between the look-up and the admission.
+        while (scope_.startCount() == before) std::this_thread::yield();
+      });
+    });
+    isBusy.wait();
+    Session session =
+        manager_->beginAccessingURL(volume, "test", QoS::utility, true, timeout, volume);
+    keeper.join();
+    return session;
+  }
+
   static std::size_t accessCount(DiskData& disk) {
     return disk.queue().sync([&] { return disk.accessCount(); });
   }
@@ -84,7 +123,18 @@ class DiskAccessManagerTest : public ::testing::Test {
       std::this_thread::yield();
   }
 
+  /// The class in which a thread waits that begins an access to this full disk.
+  static int classOfWaiter(DiskData& disk, const std::function<Session()>& begin) {
+    std::thread waiting([&] { DiskAccessGuard access(begin()); });
+    awaitRequests(disk, 1);
+    const auto waiters = disk.queue().sync([&] { return disk.claimPendingRequests(); });
+    for (const auto& request : waiters) request->sema.signal();
+    waiting.join();
+    return waiters.at(0)->urgencyClass();
+  }
+
   Platform::Testing::FakeDeviceRegistry devices_;
+  InterruptedRegistry registry_{devices_};
   Platform::Testing::FakeDiskArbitration disks_;
   Platform::Testing::FakeVolumeCatalog volumes_;
   Platform::Testing::FakeSecurityScope scope_;
@@ -112,11 +162,12 @@ TEST_F(DiskAccessManagerTest, OpensASecurityScopeOnlyWhenAskedAndOnAVolume) {
   EXPECT_FALSE(begin(homeFile));
   volumes_.setLookupError({});
   const int before = scope_.startCount();
-  manager_->beginAccessingURL(homeFile, "test", QoS::utility, false)->endAccessing();
-  EXPECT_EQ(scope_.startCount(), before);
-
-  begin(homeFile)->endAccessing();
+  const Session scoped = begin(homeFile);
   EXPECT_EQ(scope_.startCount(), before + 1);
+  manager_->beginAccessingURL(homeFile, "test", QoS::utility, false)->endAccessing();
+  EXPECT_EQ(scope_.startCount(), before + 1);
+  EXPECT_EQ(scope_.openAccesses(homeFile), 1) << "the other one is not its to close";
+  scoped->endAccessing();
   EXPECT_EQ(scope_.openAccesses(homeFile), 0);
 
   const URL secret = URL::fileURLWithPath("/home/secret");
@@ -135,6 +186,17 @@ TEST_F(DiskAccessManagerTest, ASessionThatIsDroppedKeepsItsPlaceAndItsScope) {
   EXPECT_EQ(scope_.openAccesses(stickFile), 1);
   for (const double timeout : {0.0, -1.0, 0.001}) EXPECT_FALSE(begin(stickFile, timeout));
   EXPECT_EQ(scope_.openAccesses(stickFile), 4) << "a time-out leaves its scope open";
+
+  volumes_.unmount(stickVolume);
+  awaitInventory();
+  const Session gone =
+      manager_->beginAccessingURL(stickFile, "test", QoS::utility, false, 0, stickVolume);
+  ASSERT_TRUE(gone);
+  EXPECT_EQ(gone->diskInfo()->uniqueID(), "unknown");
+  gone->endAccessing();
+  volumes_.mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
+  awaitInventory();
+  EXPECT_FALSE(begin(stickFile, 0)) << "the place is still taken when the disk returns";
 }
 
 TEST_F(DiskAccessManagerTest, SessionsOfOneThreadNestAndCountEach) {
@@ -146,19 +208,96 @@ TEST_F(DiskAccessManagerTest, SessionsOfOneThreadNestAndCountEach) {
   EXPECT_EQ(accessCount(*inner->diskData()), 1u);
   std::thread([&] { EXPECT_FALSE(begin(stickFile, 0)); }).join();
   inner->endAccessing();
+
+  const Session one = begin(stickFile);
+  const Session other = begin(stickFile);
+  one->endAccessing();
+  one->endAccessing();
+  EXPECT_FALSE(one->isAccessing());
+  EXPECT_EQ(accessCount(*other->diskData()), 0u) << "each end takes a place of the thread back";
   std::thread([&] { EXPECT_TRUE(begin(stickFile)); }).join();
 }
 
-TEST_F(DiskAccessManagerTest, AMountThatAppearsWhileThreadsWaitGetsItsOwnDisk) {
-  const auto useUnknownDisk = [&] {
-    return manager_->beginAccessingURL(stickFile, "test", QoS::utility, false, {}, stickVolume);
+TEST_F(DiskAccessManagerTest, PassesOnWhatACallerAsksFor) {
+  const auto beginAs = [&](QoS qos) {
+    return manager_->beginAccessingURL(homeFile, "test", qos, false, {}, archiveVolume);
   };
-  const Session holder = useUnknownDisk();
+  const DiskAccessGuard holder(beginAs(QoS::utility));
+  EXPECT_EQ(classOfWaiter(*holder->diskData(), [&] { return beginAs(QoS::userInteractive); }), 0);
+  EXPECT_EQ(classOfWaiter(*holder->diskData(), [&] { return beginAs(QoS::background); }), 3);
+
+  const URL folder = URL::fileURLWithPath("/");
+  const URL noVolume = URL::fileURLWithPath("/no volume/");
+  const DiskAccessGuard managed(beginManagedAccessing(folder, "purpose", true, {}, noVolume));
+  ASSERT_TRUE(managed);
+  EXPECT_EQ(managed->url(), folder);
+  EXPECT_EQ(managed->propose(), "purpose");
+  EXPECT_TRUE(managed->secureScope());
+  EXPECT_EQ(managed->diskInfo()->uniqueID(), "unknown");
+  EXPECT_EQ(DiskAccessGuard(DiskAccessManager::shared().beginAccessingURL(folder, "", QoS::utility,
+                                                                          false, {}, noVolume))
+                ->diskData(),
+            managed->diskData());
+  EXPECT_EQ(classOfWaiter(*managed->diskData(),
+                          [&] {
+                            Session session =
+                                beginManagedAccessing(folder, "", false, {}, noVolume);
+                            EXPECT_FALSE(session->secureScope());
+                            return session;
+                          }),
+            2);
+  std::thread([&] { EXPECT_FALSE(beginManagedAccessing(folder, "", false, 0, noVolume)); }).join();
+}
+
+TEST_F(DiskAccessManagerTest, TheRelayTellsWhichVolumeCameOrWent) {
+  std::vector<std::string> told;
+  std::vector<Basalt::NotificationCenter::Observer> observers;
+  for (const char* name : {"NSWorkspaceDidMountNotification", "NSWorkspaceDidUnmountNotification"})
+    observers.push_back(center_.addObserver(name, [&](const Basalt::Notification& notification) {
+      told.push_back(
+          notification.name + ' ' +
+          *Platform::findAs<std::string>(notification.userInfo, "NSWorkspaceVolumeURLKey"));
+    }));
+  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  volumes_.unmount(stickVolume);
+  EXPECT_EQ(told, (std::vector<std::string>{"NSWorkspaceDidMountNotification file:///stick/",
+                                            "NSWorkspaceDidUnmountNotification file:///stick/"}));
+}
+
+TEST_F(DiskAccessManagerTest, AThreadThatHoldsADiskUsesItWhateverTheLookUpFinds) {
+  manager_->setIsBackgroundMode(true);
+  disks_.setMountURLs("nvme0n1", {homeVolume, archiveVolume});
+  volumes_.mount({.url = archiveVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  awaitInventory();
+  const auto diskOf = [](const Session& session) {
+    return session ? session->diskInfo()->uniqueID().value() : "none";
+  };
+  EXPECT_EQ(diskOf(beginOnBusyQueue(homeVolume)), "unknown")
+      << "it held nothing, and holds this now";
+  std::thread([&] {
+    begin(homeFile)->endAccessing();
+    const Session outer = begin(homeFile);
+    const Session inner = beginOnBusyQueue(homeVolume, 0);
+    ASSERT_EQ(diskOf(inner), "SSD-1");
+    EXPECT_EQ(diskOf(beginOnBusyQueue(archiveVolume, 0)), "SSD-1") << "a volume of the same disk";
+    volumes_.unmount(archiveVolume);
+    outer->endAccessing();
+    inner->endAccessing();
+    EXPECT_EQ(diskOf(beginOnBusyQueue(archiveVolume, 0)), "SSD-1") << "the dropped one is left";
+  }).join();
+  EXPECT_EQ(diskOf(begin(homeFile, 0)), "unknown") << "this disk is full, but that place is held";
+}
+
+TEST_F(DiskAccessManagerTest, AMountThatAppearsWhileThreadsWaitGetsItsOwnDisk) {
+  const auto useUnknownDisk = [&](const URL& volume) {
+    return manager_->beginAccessingURL(stickFile, "test", QoS::utility, false, {}, volume);
+  };
+  const Session holder = useUnknownDisk(archiveVolume);
   std::atomic<int> admitted = 0;
   std::vector<std::thread> waiting;
   for (int i = 0; i < 3; ++i) {
     waiting.emplace_back([&] {
-      const DiskAccessGuard access(useUnknownDisk());
+      const DiskAccessGuard access(useUnknownDisk(stickVolume));
       EXPECT_EQ(access->diskInfo()->uniqueID(), "unknown");
       ++admitted;
     });
@@ -213,6 +352,24 @@ TEST_F(DiskAccessManagerTest, ADiskThatGoesIsRememberedForAThreadThatIsBeingWoke
   awaitInventory();
   EXPECT_EQ(accessCount(*woken->diskData()), 1u);
   EXPECT_FALSE(begin(stickFile, 0)) << "its only place is taken";
+}
+
+TEST_F(DiskAccessManagerTest, AStormOfMountsCostsOneInventoryAndLosesNone) {
+  Basalt::SerialQueue& queue = DiskAccessGuard(begin(homeFile))->diskData()->queue();
+  int inventories = 0;
+  queue.sync([&] {
+    inventories = disks_.openedSessions();
+    for (int i = 0; i < 500; ++i)
+      center_.post({.name = std::string(didMountNotification), .userInfo = {}});
+    registry_.interruption = [&] {
+      plugDisk("HDD-1", "sda1", "Rotational", stickVolume);
+      volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+    };
+  });
+  awaitInventory();
+  EXPECT_LE(disks_.openedSessions(), inventories + 3) << "one of one disk, and one of two";
+  awaitInventory();
+  EXPECT_EQ(DiskAccessGuard(begin(stickFile))->diskInfo()->uniqueID(), "HDD-1");
 }
 
 TEST_F(DiskAccessManagerTest, AVolumeOverTwoDisksBelongsToTheLast) {
@@ -312,6 +469,63 @@ TEST_F(DiskAccessManagerTest, LosesNoPlaceUnderStress) {
   ASSERT_EQ(last->diskInfo()->uniqueID(), "SSD-1");
   EXPECT_EQ(accessCount(*last->diskData()), 1u);
   last->endAccessing();
+}
+
+// Threads that nest sessions without a time-out while the planning queue is busy: all come through.
+TEST_F(DiskAccessManagerTest, NestedSessionsNeverWaitForOneAnother) {
+  plugDisk("HDD-1", "sda1", "Rotational", stickVolume);
+  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  manager_->setIsBackgroundMode(true);
+  awaitInventory();
+  const auto unknown = beginOnBusyQueue(homeVolume);
+  unknown->endAccessing();
+  const struct {
+    const URL& file;
+    bool isBackgroundMode;
+    int threads;
+  } cases[] = {{homeFile, true, 2}, {stickFile, false, 4}};
+  for (const auto& [file, isBackgroundMode, threadCount] : cases) {
+    manager_->setIsBackgroundMode(isBackgroundMode);
+    awaitInventory();
+    const std::shared_ptr<DiskData> disk = DiskAccessGuard(begin(file))->diskData();
+    ASSERT_NE(disk, unknown->diskData()) << "an access that is over binds nobody";
+    std::atomic<int> left = threadCount;
+    Basalt::Semaphore passes;
+    std::latch start(threadCount);
+    std::vector<std::thread> threads;
+    for (int thread = 0; thread < threadCount; ++thread) {
+      threads.emplace_back([&, &file = file] {
+        start.arrive_and_wait();
+        for (int i = 0; i < 5000; ++i) {
+          const DiskAccessGuard outer(begin(file));
+          std::this_thread::yield();
+          const DiskAccessGuard inner(begin(file));
+          passes.signal();
+        }
+        --left;
+        passes.signal();
+      });
+    }
+    std::thread busy([&] {
+      while (left > 0) disk->queue().sync([] { std::this_thread::yield(); });
+    });
+    bool hang = false;
+    while (left > 0) {
+      const auto now =
+          std::chrono::floor<Platform::Date::duration>(std::chrono::system_clock::now());
+      hang |= !passes.waitUntil(now + std::chrono::seconds(hang ? 0 : 20));
+      // Lets everybody in, so that the test comes to an end.
+      for (DiskData* record : {disk.get(), unknown->diskData().get()})
+        if (hang)
+          for (const auto& request :
+               disk->queue().sync([&] { return record->claimPendingRequests(); }))
+            request->sema.signal();
+    }
+    for (std::thread& thread : threads) thread.join();
+    busy.join();
+    EXPECT_FALSE(hang) << threadCount << " threads stood still";
+    EXPECT_EQ(accessCount(*disk) + accessCount(*unknown->diskData()), 0u);
+  }
 }
 
 TEST_F(DiskAccessManagerTest, MayGoWhileSessionsAreLeft) {

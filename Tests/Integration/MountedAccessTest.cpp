@@ -37,21 +37,21 @@ TEST(MountedAccess, ADiskThatIsMountedWhileThreadsWaitIsKnownAtOnce) {
 
   DiskAccessManager manager;
   const auto begin = [&] { return manager.beginAccessingURL(volume, "test"); };
-  const auto beginOnVolume = [&] {
+  const auto beginOn = [&](const URL& told) {
     return manager.beginAccessingURL(volume, "test", Platform::QualityOfService::utility, false, {},
-                                     volume);
+                                     told);
   };
   Basalt::Semaphore mounted;
   const auto observer = Basalt::NotificationCenter::defaultCenter().addObserver(
       std::string(didMountNotification), [&](const Basalt::Notification&) { mounted.signal(); });
 
-  const auto holder = beginOnVolume();
+  const auto holder = beginOn(URL::fileURLWithPath("/no volume/"));
   ASSERT_EQ(holder->diskInfo()->uniqueID(), "unknown");
   std::atomic<int> admitted = 0;
   std::vector<std::thread> waiting;
   for (int i = 0; i < 3; ++i) {
     waiting.emplace_back([&] {
-      const DiskAccessGuard access(beginOnVolume());
+      const DiskAccessGuard access(beginOn(volume));
       ++admitted;
     });
   }

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
+#include <chrono>
+#include <future>
 #include <map>
 
 #include <Platform/Linux/BlockDevices.h>
@@ -75,7 +77,8 @@ std::string drawn(const BlockTree& tree, std::size_t node) {
   return text;
 }
 
-std::vector<std::string> drawn(const Machine& machine, VirtioSerials&& serials = {}) {
+std::vector<std::string> drawn(const Machine& machine) {
+  VirtioSerials serials(std::chrono::minutes(1));
   const BlockTree tree = readBlockTree(machine.devices(), serials);
   std::vector<std::string> roots;
   for (std::size_t node = 0; node < tree.nodes.size(); ++node)
@@ -104,16 +107,16 @@ TEST(BlockTree, ARaidStandsBelowEachOfItsDisksAndCirclesAreCut) {
   Machine machine;
   machine.setSubsystem("pci0/virtio1", "virtio");
   machine.setSubsystem("pci0/virtio2", "virtio");
-  machine.add("pci0/virtio1/block/vda", {{"serial", "A"}, {"queue/rotational", "0\n"}});
-  machine.add("pci0/virtio2/block/vdb", {{"serial", "B"}, {"queue/rotational", "1\n"}});
+  machine.add("pci0/virtio1/block/vdya", {{"serial", "A"}, {"queue/rotational", "0\n"}});
+  machine.add("pci0/virtio2/block/vdyb", {{"serial", "B"}, {"queue/rotational", "1\n"}});
   for (const char* name : {"md0", "dm-0", "dm-1"})
     machine.add(std::string("virtual/block/") + name);
-  machine.standOn("md0", "vda");
-  machine.standOn("md0", "vdb");
+  machine.standOn("md0", "vdya");
+  machine.standOn("md0", "vdyb");
   machine.standOn("dm-0", "dm-1");
   machine.standOn("dm-1", "dm-0");
-  EXPECT_THAT(drawn(machine),
-              ElementsAre("dm-1[dm-0]", "+(Solid State,A)[vda[md0]]", "+(Rotational,B)[vdb[md0]]"));
+  EXPECT_THAT(drawn(machine), ElementsAre("dm-1[dm-0]", "+(Solid State,A)[vdya[md0]]",
+                                          "+(Rotational,B)[vdyb[md0]]"));
   EXPECT_EQ(machine.devices().areInternal({"dm-0"}), std::nullopt);
 }
 
@@ -140,20 +143,24 @@ TEST(BlockTree, ADiskWithoutASerialNumberIsKnownByItsNameOrItsPlace) {
   machine.add("pci0/nvme/nvme0/nvme0n1", {{"wwid", "eui.0025\n"}, {"device/serial", " \n"}});
   machine.add("pci0/nvme/nvme0/nvme0c0n1", {{"hidden", "1\n"}});
   machine.setSubsystem("pci0/virtio3", "virtio");
-  machine.add("pci0/virtio3/block/vda", {{"serial", ""}});
+  machine.add("pci0/virtio3/block/vdya", {{"serial", ""}});
   EXPECT_THAT(drawn(machine), ElementsAre("-[nvme0c0n1]", "+(Rotational,eui.0025)[nvme0n1]",
-                                          "+(Rotational,devices/pci0/virtio3)[vda]"));
+                                          "+(Rotational,devices/pci0/virtio3)[vdya]"));
 }
 
-TEST(VirtioSerials, EachDiskIsAskedOnce) {
-  VirtioSerials serials;
+TEST(VirtioSerials, EachDiskIsAskedOnceAndNobodyWaitsForOneThatDoesNotAnswer) {
+  VirtioSerials serials(std::chrono::minutes(1));
   int asked = 0;
   const auto ask = [&] { return "S" + std::to_string(++asked); };
   EXPECT_EQ(serials.of("7", ask), "S1");
   EXPECT_EQ(serials.of("7", ask), "S1");
   EXPECT_EQ(serials.of("8", ask), "S2") << "another disk in the same place";
-  EXPECT_EQ(serials.of("", ask), "S3");
-  EXPECT_EQ(serials.of("", ask), "S4");
+
+  VirtioSerials impatient(std::chrono::milliseconds(1));
+  std::promise<std::string> answer;
+  EXPECT_EQ(impatient.of("9", [later = answer.get_future().share()] { return later.get(); }), "");
+  answer.set_value("S9");
+  EXPECT_EQ(impatient.of("9", ask), "") << "it is known by its place now";
 }
 
 TEST(BlockTree, AMissingTableIsNoTable) {

@@ -1,0 +1,65 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <memory>
+#include <string>
+#include <unordered_map>
+#include <utility>
+#include <vector>
+
+#include <Basalt/ThreadID.h>
+#include <Platform/Values/URL.h>
+#include <Varnel/DiskAccess/OVDiskInfo.h>
+
+namespace Basalt {
+class SerialQueue;
+}
+
+namespace Varnel {
+
+class DiskData;
+
+/// The records of a manager's disks, and which thread uses which of them for which volume.
+///
+/// The queue owns it: all operations run there.
+class DiskRecords final {
+ public:
+  explicit DiskRecords(std::shared_ptr<Basalt::SerialQueue> queue) : queue_(std::move(queue)) {}
+
+  /// Follows an inventory. A disk that stays keeps its record; one that is gone is remembered while
+  /// anybody has to do with it.
+  void update(const OVDiskInfo::Array& disks, bool isBackgroundMode);
+
+  void setIsBackgroundMode(bool isBackgroundMode);
+
+  /// The record of the disk that holds the volume; null when it is not known.
+  [[nodiscard]] std::shared_ptr<DiskData> ofVolume(const Platform::URL& volumeURL) const;
+
+  /// A record on which the thread has a place, and which gave it one for this volume or whose disk
+  /// holds it; null when there is none. A thread that nests accesses to a volume uses this one, as
+  /// it could wait for ever for another: for a thread that waits for the place on this one.
+  [[nodiscard]] std::shared_ptr<DiskData> usedBy(Basalt::ThreadID thread,
+                                                 const Platform::URL& volumeURL) const;
+
+  /// A place that a record has given to a thread, and what for.
+  struct Use {
+    Basalt::ThreadID thread;
+    std::shared_ptr<DiskData> record;
+    Platform::URL volumeURL;
+  };
+
+  void add(Use use) { uses_.push_back(std::move(use)); }
+
+  /// Takes one such use out, and without one any other of the thread's uses of the record: as often
+  /// as the record counts the thread, so often it stands here.
+  void remove(Basalt::ThreadID thread, const std::shared_ptr<DiskData>& record,
+              const Platform::URL& volumeURL);
+
+ private:
+  const std::shared_ptr<Basalt::SerialQueue> queue_;
+  std::unordered_map<Platform::URL, std::string> diskUniqueIDsByVolumeURL_;
+  std::unordered_map<std::string, std::shared_ptr<DiskData>> diskDataByUniqueID_;
+  std::vector<Use> uses_;
+};
+
+}  // namespace Varnel
