@@ -86,7 +86,6 @@ void ScheduledNotificationCenter::setDelegate(
 
 void ScheduledNotificationCenter::scheduleNotification(const UserNotification& notification) {
   store_->schedule(notification, ports_.clock.now(), Calendar(ports_.userLocale));
-  if (notification.identifier) removeDeliveredNotification(notification);
   recheck();
 }
 

@@ -178,7 +178,14 @@ TEST_F(ScheduledNotificationCenterTest, ALaterRunTakesTheBannerOfAnEarlierOneAwa
   ASSERT_THAT(process.server.banners(), SizeIs(1));
   NotificationStore store(file, process.log);
   ASSERT_EQ(store.delivered().at(0).bannerReference, "1");
+  // Its successor takes the place only when it comes.
   process.center.scheduleNotification(weekly(start + 3 * week));
+  EXPECT_THAT(process.center.deliveredNotifications(), SizeIs(1));
+  EXPECT_THAT(process.server.banners(), SizeIs(1));
+  process.timer.advanceTo(start + 3 * week);
+  EXPECT_THAT(process.center.deliveredNotifications(), SizeIs(1));
+  EXPECT_THAT(process.server.history(), SizeIs(2));
+  process.center.removeDeliveredNotification(weekly());
   EXPECT_THAT(process.server.banners(), IsEmpty());
 }
 
