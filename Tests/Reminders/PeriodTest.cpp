@@ -5,6 +5,7 @@
 #include <nlohmann/json.hpp>
 
 #include <Basalt/JSON.h>
+#include <Platform/Testing/FakeTimeZones.h>
 #include <Platform/Text/Calendar.h>
 #include <Varnel/Context/BuildSwitches.h>
 #include <Varnel/Context/VarnelModule.h>
@@ -57,7 +58,8 @@ TEST(SchedulePeriodOption, HasItsPublishedIdentities) {
        {.month = 6}},
       {Option::annually, "annually", "Annually", "Annually", "Jedes Jahr", {.year = 1}},
   };
-  const Platform::Calendar gregorian("en_US", "UTC");
+  const Platform::Testing::FakeTimeZones zones;
+  const Platform::Calendar gregorian("en_US", "UTC", zones);
   const auto module = std::make_shared<VarnelModule>();
   VarnelModule::setInstance(module);
   std::int64_t raw = 0;
