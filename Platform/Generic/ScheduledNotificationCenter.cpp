@@ -10,6 +10,7 @@
 #include <Platform/Ports/Clock.h>
 #include <Platform/Ports/MainQueue.h>
 #include <Platform/Ports/NotificationServer.h>
+#include <Platform/Ports/TimeZones.h>
 #include <Platform/Ports/UserLocale.h>
 #include <Platform/Ports/WallClockTimer.h>
 #include <Platform/Text/Calendar.h>
@@ -85,16 +86,15 @@ void ScheduledNotificationCenter::setDelegate(
 }
 
 void ScheduledNotificationCenter::scheduleNotification(const UserNotification& notification) {
-  store_->schedule(notification, ports_.clock.now(), Calendar(ports_.userLocale));
-  if (notification.identifier) removeDeliveredNotification(notification);
+  store_->schedule(notification, ports_.clock.now(), calendar());
   recheck();
 }
 
 std::vector<UserNotification> ScheduledNotificationCenter::scheduledNotifications() {
-  const Calendar calendar(ports_.userLocale);
+  const Calendar present = calendar();
   std::vector<UserNotification> notifications;
   for (NotificationSchedule& schedule : store_->schedules()) {
-    schedule.notification.deliveryDate = nextDate(schedule, calendar);
+    schedule.notification.deliveryDate = nextDate(schedule, present);
     notifications.push_back(std::move(schedule.notification));
   }
   std::stable_sort(notifications.begin(), notifications.end(),
@@ -107,9 +107,9 @@ std::vector<UserNotification> ScheduledNotificationCenter::scheduledNotification
 
 void ScheduledNotificationCenter::removeScheduledNotification(
     const UserNotification& notification) {
-  const Calendar calendar(ports_.userLocale);
+  const Calendar present = calendar();
   for (NotificationSchedule& schedule : store_->schedules()) {
-    schedule.notification.deliveryDate = nextDate(schedule, calendar);
+    schedule.notification.deliveryDate = nextDate(schedule, present);
     if (isSameNotification(schedule.notification, notification))
       store_->removeSchedule(schedule.key);
   }
@@ -138,7 +138,7 @@ void ScheduledNotificationCenter::removeDeliveredNotification(
 
 void ScheduledNotificationCenter::recheck() {
   if (!delegate_.expired())
-    for (const auto& delivered : store_->claimDue(ports_.clock.now(), Calendar(ports_.userLocale)))
+    for (const auto& delivered : store_->claimDue(ports_.clock.now(), calendar()))
       deliver(delivered);
   awaitNext();
 }
@@ -159,12 +159,17 @@ void ScheduledNotificationCenter::deliver(const DeliveredNotification& delivered
   });
 }
 
+// The user's, wherever that is by now.
+Calendar ScheduledNotificationCenter::calendar() const {
+  return {ports_.userLocale, ports_.timeZones};
+}
+
 void ScheduledNotificationCenter::awaitNext() {
   std::optional<Date> next;
   if (!delegate_.expired()) {
-    const Calendar calendar(ports_.userLocale);
+    const Calendar present = calendar();
     for (const NotificationSchedule& schedule : store_->schedules())
-      if (const auto date = nextDate(schedule, calendar); date && (!next || *date < *next))
+      if (const auto date = nextDate(schedule, present); date && (!next || *date < *next))
         next = date;
   }
   // What is due and still there could not be claimed: the store is out of order for now.

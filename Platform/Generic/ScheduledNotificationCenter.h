@@ -10,11 +10,13 @@
 
 namespace Varnel::Platform {
 
+class Calendar;
 class Clock;
 class MainQueue;
 class NotificationServer;
 class NotificationStore;
 class SystemLog;
+class TimeZones;
 class UserLocale;
 class WallClockTimer;
 struct DeliveredNotification;
@@ -29,6 +31,7 @@ class VARNEL_API ScheduledNotificationCenter final : public UserNotificationCent
   struct Ports {
     Clock& clock;
     UserLocale& userLocale;
+    TimeZones& timeZones;
     MainQueue& mainQueue;
     SystemLog& systemLog;
     NotificationServer& notificationServer;
@@ -58,6 +61,7 @@ class VARNEL_API ScheduledNotificationCenter final : public UserNotificationCent
 
   void deliver(const DeliveredNotification& delivered);
   void awaitNext();
+  [[nodiscard]] Calendar calendar() const;
 
   const Ports ports_;
   const std::unique_ptr<NotificationStore> store_;

@@ -18,6 +18,7 @@ class ProcessLauncher;
 class SoundPlayer;
 class StandardOutput;
 class SystemLog;
+class TimeZones;
 class UserDefaults;
 class UserLocale;
 class UserNotificationCenters;
@@ -44,6 +45,7 @@ class MountTable;
 /// `root` is the folder below which /proc lies.
 [[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo(const std::string& root = "/");
 [[nodiscard]] std::unique_ptr<ProcessLauncher> makeProcessLauncher();
+[[nodiscard]] std::unique_ptr<TimeZones> makeTimeZones();
 [[nodiscard]] std::unique_ptr<UserDefaults> makeUserDefaults();
 [[nodiscard]] std::unique_ptr<MainQueue> makeMainQueue();
 [[nodiscard]] std::unique_ptr<StandardOutput> makeStandardOutput();
@@ -55,6 +57,7 @@ class MountTable;
 struct NotificationPorts {
   Clock& clock;
   UserLocale& userLocale;
+  TimeZones& timeZones;
   MainQueue& mainQueue;
   SystemLog& systemLog;
 };

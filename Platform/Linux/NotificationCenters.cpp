@@ -9,6 +9,7 @@
 #include <Platform/Ports/MainQueue.h>
 #include <Platform/Ports/NotificationServer.h>
 #include <Platform/Ports/SystemLog.h>
+#include <Platform/Ports/TimeZones.h>
 #include <Platform/Ports/UserLocale.h>
 #include <Platform/Ports/WallClockTimer.h>
 
@@ -26,9 +27,9 @@ class Center final {
   Center(const NotificationPorts& ports, const fs::path& folder)
       : server_(makeNotificationServer(ports.systemLog)),
         timer_(makeWallClockTimer(ports.systemLog)),
-        center_(
-            {ports.clock, ports.userLocale, ports.mainQueue, ports.systemLog, *server_, *timer_},
-            folder / storeName),
+        center_({ports.clock, ports.userLocale, ports.timeZones, ports.mainQueue, ports.systemLog,
+                 *server_, *timer_},
+                folder / storeName),
         storeWatch_(folder, storeName, [this] { center_.recheck(); }),
         zoneWatch_("/etc", "localtime", [this] { center_.recheck(); }) {}
 

@@ -16,6 +16,7 @@
 #include <Platform/Ports/SoundPlayer.h>
 #include <Platform/Ports/StandardOutput.h>
 #include <Platform/Ports/SystemLog.h>
+#include <Platform/Ports/TimeZones.h>
 #include <Platform/Ports/UserAccount.h>
 #include <Platform/Ports/UserDefaults.h>
 #include <Platform/Ports/UserLocale.h>
@@ -51,6 +52,7 @@ const Ports& systemPorts() {
   static Clock& clock = keep(POSIX::makeClock());
   static SystemLog& systemLog = keep(POSIX::makeSystemLog());
   static MainQueue& mainQueue = keep(Linux::makeMainQueue());
+  static TimeZones& timeZones = keep(Linux::makeTimeZones());
   static UserLocale& userLocale = keep(POSIX::makeUserLocale());
   static const Ports& ports = *new Ports{
       .appendFiles = keep(POSIX::makeAppendFiles()),
@@ -69,11 +71,12 @@ const Ports& systemPorts() {
       .soundPlayer = keep(Linux::makeSoundPlayer(systemLog)),
       .standardOutput = keep(Linux::makeStandardOutput()),
       .systemLog = systemLog,
+      .timeZones = timeZones,
       .userAccount = keep(POSIX::makeUserAccount()),
       .userDefaults = keep(Linux::makeUserDefaults()),
       .userLocale = userLocale,
-      .userNotificationCenters =
-          keep(Linux::makeUserNotificationCenters({clock, userLocale, mainQueue, systemLog})),
+      .userNotificationCenters = keep(
+          Linux::makeUserNotificationCenters({clock, userLocale, timeZones, mainQueue, systemLog})),
       .volumeCatalog = keep(Linux::makeVolumeCatalog(mountTable)),
       .workspace = keep(Linux::makeWorkspace()),
   };

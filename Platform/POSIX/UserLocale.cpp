@@ -1,9 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Ports/UserLocale.h>
 
-#include <unicode/timezone.h>
-
 #include <cstdlib>
+#include <initializer_list>
 #include <memory>
 #include <string_view>
 
@@ -35,6 +34,11 @@ std::string firstIdentifier(std::initializer_list<const char*> variables) {
   return {};
 }
 
+std::string formatIdentifier(const char* category) {
+  std::string identifier = firstIdentifier({"LC_ALL", category, "LANG"});
+  return identifier.empty() ? std::string(fallbackIdentifier) : identifier;
+}
+
 std::string languageTag(std::string identifier) {
   for (char& c : identifier)
     if (c == '_') c = '-';
@@ -59,18 +63,8 @@ class EnvironmentLocale final : public UserLocale {
     return tags;
   }
 
-  std::string identifier() const override {
-    std::string identifier = firstIdentifier({"LC_ALL", "LC_TIME", "LANG"});
-    return identifier.empty() ? std::string(fallbackIdentifier) : identifier;
-  }
-
-  std::string timeZoneIdentifier() const override {
-    const std::unique_ptr<icu::TimeZone> zone(icu::TimeZone::detectHostTimeZone());
-    icu::UnicodeString name;
-    std::string identifier;
-    zone->getID(name);
-    return name.toUTF8String(identifier);
-  }
+  std::string identifier() const override { return formatIdentifier("LC_TIME"); }
+  std::string numberIdentifier() const override { return formatIdentifier("LC_NUMERIC"); }
 };
 
 }  // namespace

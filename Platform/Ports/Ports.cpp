@@ -34,6 +34,7 @@ Ports Ports::withStandardOutput(StandardOutput& output) const {
       .soundPlayer = soundPlayer,
       .standardOutput = output,
       .systemLog = systemLog,
+      .timeZones = timeZones,
       .userAccount = userAccount,
       .userDefaults = userDefaults,
       .userLocale = userLocale,

@@ -21,6 +21,7 @@ class SecurityScope;
 class SoundPlayer;
 class StandardOutput;
 class SystemLog;
+class TimeZones;
 class UserAccount;
 class UserDefaults;
 class UserLocale;
@@ -51,6 +52,7 @@ struct Ports {
   SoundPlayer& soundPlayer;
   StandardOutput& standardOutput;
   SystemLog& systemLog;
+  TimeZones& timeZones;
   UserAccount& userAccount;
   UserDefaults& userDefaults;
   UserLocale& userLocale;

@@ -16,11 +16,11 @@ class VARNEL_API UserLocale {
   /// The languages the user prefers, best first, as BCP 47 tags ("en-US"); never empty.
   [[nodiscard]] virtual std::vector<std::string> languages() const = 0;
 
-  /// The locale of dates and numbers, as an ICU identifier ("de_AT").
+  /// The locale of dates and the calendar, as an ICU identifier ("de_AT").
   [[nodiscard]] virtual std::string identifier() const = 0;
 
-  /// The time zone where the user is now, by its name in the time zone database ("Europe/Vienna").
-  [[nodiscard]] virtual std::string timeZoneIdentifier() const = 0;
+  /// The locale of numbers, as an ICU identifier; often the same.
+  [[nodiscard]] virtual std::string numberIdentifier() const = 0;
 };
 
 }  // namespace Varnel::Platform

@@ -29,11 +29,11 @@ class FakeUserLocale final : public UserLocale {
  public:
   std::vector<std::string> languageTags = {"en-US"};
   std::string localeIdentifier = "en_US";
-  std::string timeZone = "UTC";
+  std::string numberLocaleIdentifier = "en_US";
 
   [[nodiscard]] std::vector<std::string> languages() const override { return languageTags; }
   [[nodiscard]] std::string identifier() const override { return localeIdentifier; }
-  [[nodiscard]] std::string timeZoneIdentifier() const override { return timeZone; }
+  [[nodiscard]] std::string numberIdentifier() const override { return numberLocaleIdentifier; }
 };
 
 }  // namespace Varnel::Platform::Testing

@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Text/ByteCountFormatter.h>
 
-#include <unicode/dcfmtsym.h>
+#include <unicode/numberformatter.h>
+#include <unicode/uchar.h>
 
 #include <array>
 
@@ -49,13 +50,33 @@ std::string decimalText(std::uint64_t fraction, int decimals) {
 }  // namespace
 
 ByteCountFormatter::ByteCountFormatter(std::string_view localeIdentifier) {
-  UErrorCode status = U_ZERO_ERROR;
   const icu::Locale locale(std::string(localeIdentifier).c_str());
-  const icu::DecimalFormatSymbols symbols(locale, status);
-  if (U_SUCCESS(status))
-    symbols.getConstSymbol(icu::DecimalFormatSymbols::kDecimalSeparatorSymbol)
-        .toUTF8String(decimalSeparator_);
+  UErrorCode status = U_ZERO_ERROR;
+  const icu::UnicodeString sample = icu::number::NumberFormatter::withLocale(locale)
+                                        .formatDouble(1000.5, status)
+                                        .toString(status);
+  icu::UnicodeString grouping;
+  icu::UnicodeString decimal;
+  int digits = 0;
+  for (std::int32_t at = 0; at < sample.length(); at = sample.moveIndex32(at, 1)) {
+    const UChar32 character = sample.char32At(at);
+    if (u_isdigit(character))
+      ++digits;
+    else if (digits == 1)
+      grouping.append(character);
+    else if (digits == 4)
+      decimal.append(character);
+  }
+  grouping.toUTF8String(groupingSeparator_);
+  decimal.toUTF8String(decimalSeparator_);
   if (decimalSeparator_.empty()) decimalSeparator_.push_back('.');
+}
+
+// Counts of one unit stay below 1024, so that there is one group at the most.
+std::string ByteCountFormatter::wholeText(std::uint64_t number) const {
+  std::string text = std::to_string(number);
+  if (text.size() > 3) text.insert(text.size() - 3, groupingSeparator_);
+  return text;
 }
 
 std::string ByteCountFormatter::string(std::int64_t count, ByteCountStyle style) const {
@@ -67,7 +88,7 @@ std::string ByteCountFormatter::string(std::int64_t count, ByteCountStyle style)
   const std::uint64_t bytes = count < 0 ? 0 - bits : bits;
   const std::uint64_t step = unitStep(style);
   if (bytes < step) {
-    text += std::to_string(bytes);
+    text += wholeText(bytes);
     return text += bytes == 1 ? " byte" : " bytes";
   }
 
@@ -80,7 +101,7 @@ std::string ByteCountFormatter::string(std::int64_t count, ByteCountStyle style)
     ++unit;
     value = divide(bytes, unitSize, unit->maximumDecimals);
   }
-  text += std::to_string(value.whole);
+  text += wholeText(value.whole);
   if (value.fraction != 0)
     text.append(decimalSeparator_).append(decimalText(value.fraction, unit->maximumDecimals));
   return text.append(" ").append(unit->name);

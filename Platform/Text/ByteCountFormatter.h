@@ -17,7 +17,7 @@ enum class ByteCountStyle { file, memory, decimal, binary };
   return style == ByteCountStyle::memory || style == ByteCountStyle::binary ? 1024 : 1000;
 }
 
-/// Writes byte counts for people: "Zero KB", "999 bytes", "12 KB", "1.5 MB", "2.25 GB".
+/// Writes byte counts for people: "Zero KB", "999 bytes", "1,016 KB", "1.5 MB", "2.25 GB".
 ///
 ///     ByteCountFormatter("en_US").string(1'500'000, ByteCountStyle::file);  // "1.5 MB"
 ///
@@ -25,13 +25,16 @@ enum class ByteCountStyle { file, memory, decimal, binary };
 /// zeros dropped. Immutable; any thread.
 class VARNEL_API ByteCountFormatter final {
  public:
-  /// The locale, an ICU identifier, gives the decimal separator.
+  /// The locale, an ICU identifier, gives the separators; digits and units are the same in all.
   explicit ByteCountFormatter(std::string_view localeIdentifier);
 
   /// The text of `count` bytes; a negative count has a leading minus.
   [[nodiscard]] std::string string(std::int64_t count, ByteCountStyle style) const;
 
  private:
+  [[nodiscard]] std::string wholeText(std::uint64_t number) const;
+
+  std::string groupingSeparator_;
   std::string decimalSeparator_;
 };
 

@@ -1,18 +1,19 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Text/Calendar.h>
 
-#include <unicode/basictz.h>
 #include <unicode/calendar.h>
 
 #include <cmath>
 #include <limits>
 
+#include <Platform/Ports/TimeZones.h>
 #include <Platform/Ports/UserLocale.h>
 
 namespace Varnel::Platform {
 namespace {
 
 using std::chrono::milliseconds;
+using Time = std::chrono::sys_time<milliseconds>;
 using LocalTime = std::chrono::local_time<milliseconds>;
 
 // The furthest that a calculation may lead; `Date` reaches 292,000 years.
@@ -27,28 +28,25 @@ UDate icuDate(milliseconds time) {
   return static_cast<UDate>(time.count());
 }
 
-std::unique_ptr<icu::BasicTimeZone> makeZone(const std::string& identifier) {
-  // Zones by name are always basic ones.
-  return std::unique_ptr<icu::BasicTimeZone>(static_cast<icu::BasicTimeZone*>(
-      icu::TimeZone::createTimeZone(icu::UnicodeString::fromUTF8(identifier))));
+LocalTime wallClock(Time time, const TimeZone& zone) {
+  return LocalTime(time.time_since_epoch() + zone.offsetAt(time).fromUTC);
 }
 
-LocalTime wallClock(milliseconds time, const icu::BasicTimeZone& zone) {
-  std::int32_t raw = 0;
-  std::int32_t saving = 0;
-  UErrorCode status = U_ZERO_ERROR;
-  zone.getOffset(icuDate(time), false, raw, saving, status);
-  return LocalTime(time + milliseconds(raw) + milliseconds(saving));
-}
-
-milliseconds resolved(LocalTime local, const icu::BasicTimeZone& zone) {
-  std::int32_t raw = 0;
-  std::int32_t saving = 0;
-  UErrorCode status = U_ZERO_ERROR;
-  // The offset before the change: it leads forward out of a gap and to the first of two hours.
-  zone.getOffsetFromLocal(icuDate(local.time_since_epoch()), UCAL_TZ_LOCAL_FORMER,
-                          UCAL_TZ_LOCAL_FORMER, raw, saving, status);
-  return local.time_since_epoch() - milliseconds(raw) - milliseconds(saving);
+// Of a time that comes twice the first; one that is skipped by the offset before the change, which
+// leads forward.
+Time resolved(LocalTime local, const TimeZone& zone) {
+  const Time utc(local.time_since_epoch());
+  // No offset is as long as a day.
+  Date begin = utc - std::chrono::days(1);
+  auto offset = zone.offsetAt(begin).fromUTC;
+  for (auto change = zone.nextChange(begin); change && utc - offset >= *change;
+       change = zone.nextChange(begin)) {
+    const auto changed = zone.offsetAt(*change).fromUTC;
+    if (utc - changed < *change) break;
+    offset = changed;
+    begin = *change;
+  }
+  return utc - offset;
 }
 
 // A product that does not overflow and that the calendar can count with.
@@ -64,10 +62,11 @@ std::optional<std::int32_t> product(std::int64_t amount, std::int64_t count) {
 }  // namespace
 
 struct Calendar::State {
+  const TimeZones& zones;
   std::string zoneIdentifier;
-  std::unique_ptr<icu::BasicTimeZone> zone;
+  std::shared_ptr<const TimeZone> zone = zones.zone(zoneIdentifier);
   // Counts on wall clocks, and so in a zone without changes. Cloned for each calculation.
-  std::unique_ptr<icu::Calendar> prototype;
+  std::unique_ptr<icu::Calendar> prototype = nullptr;
 
   std::optional<LocalTime> addingDays(const DateComponents& components, LocalTime local,
                                       std::int64_t count) const {
@@ -90,18 +89,17 @@ struct Calendar::State {
   }
 };
 
-Calendar::Calendar(const std::string& localeIdentifier, const std::string& timeZoneIdentifier)
-    : state_(std::make_unique<State>()) {
-  state_->zoneIdentifier = timeZoneIdentifier;
-  state_->zone = makeZone(timeZoneIdentifier);
+Calendar::Calendar(const std::string& localeIdentifier, const std::string& timeZoneIdentifier,
+                   const TimeZones& timeZones)
+    : state_(new State{.zones = timeZones, .zoneIdentifier = timeZoneIdentifier}) {
   UErrorCode status = U_ZERO_ERROR;
   state_->prototype.reset(icu::Calendar::createInstance(
       *icu::TimeZone::getGMT(), icu::Locale(localeIdentifier.c_str()), status));
   if (U_FAILURE(status)) state_->prototype.reset();
 }
 
-Calendar::Calendar(const UserLocale& userLocale)
-    : Calendar(userLocale.identifier(), userLocale.timeZoneIdentifier()) {}
+Calendar::Calendar(const UserLocale& userLocale, const TimeZones& timeZones)
+    : Calendar(userLocale.identifier(), timeZones.localIdentifier(), timeZones) {}
 
 Calendar::~Calendar() = default;
 Calendar::Calendar(Calendar&&) noexcept = default;
@@ -114,8 +112,8 @@ const std::string& Calendar::timeZoneIdentifier() const {
 std::optional<Date> Calendar::adding(const DateComponents& components, Date date,
                                      std::int64_t count) const {
   if (!isWithinReach(date)) return std::nullopt;
-  auto time = std::chrono::floor<milliseconds>(date.time_since_epoch());
-  const auto rest = date.time_since_epoch() - time;
+  auto time = std::chrono::floor<milliseconds>(date);
+  const auto rest = date - time;
   if (components.year || components.month || components.day) {
     const auto sum = state_->addingDays(components, wallClock(time, *state_->zone), count);
     if (!sum) return std::nullopt;
@@ -130,17 +128,16 @@ std::optional<Date> Calendar::adding(const DateComponents& components, Date date
       !add(components.minute, std::chrono::minutes(1)) ||
       !add(components.second, std::chrono::seconds(1)))
     return std::nullopt;
-  if (!(std::abs(icuDate(time)) <= farthestMillisecond)) return std::nullopt;
-  return Date(Date::duration(time) + rest);
+  if (!(std::abs(icuDate(time.time_since_epoch())) <= farthestMillisecond)) return std::nullopt;
+  return time + rest;
 }
 
 std::optional<Date> Calendar::withWallClockOf(Date date,
                                               const std::string& timeZoneIdentifier) const {
   if (!isWithinReach(date)) return std::nullopt;
-  const auto time = std::chrono::floor<milliseconds>(date.time_since_epoch());
-  const auto rest = date.time_since_epoch() - time;
-  const LocalTime local = wallClock(time, *makeZone(timeZoneIdentifier));
-  return Date(Date::duration(resolved(local, *state_->zone)) + rest);
+  const auto time = std::chrono::floor<milliseconds>(date);
+  const LocalTime local = wallClock(time, *state_->zones.zone(timeZoneIdentifier));
+  return resolved(local, *state_->zone) + (date - time);
 }
 
 std::optional<int> Calendar::weekdayCount() const {

@@ -12,11 +12,12 @@
 
 namespace Varnel::Platform {
 
+class TimeZones;
 class UserLocale;
 
 /// A calendar as people of one region use it, in one time zone.
 ///
-///     const Calendar calendar("de_AT", "Europe/Vienna");
+///     const Calendar calendar("de_AT", "Europe/Vienna", timeZones);
 ///     calendar.adding({.month = 1}, date);     // the same wall-clock time a month later
 ///     calendar.adding({.month = 1}, date, 3);  // three months: 31 January gives 30 April
 ///
@@ -26,10 +27,11 @@ class UserLocale;
 class VARNEL_API Calendar final {
  public:
   /// The locale is an ICU identifier; it names a calendar ("@calendar=hebrew") or has its region's.
-  /// An unknown time zone counts as UTC.
-  Calendar(const std::string& localeIdentifier, const std::string& timeZoneIdentifier);
+  /// An unknown time zone counts as UTC. The time zones outlive the calendar.
+  Calendar(const std::string& localeIdentifier, const std::string& timeZoneIdentifier,
+           const TimeZones& timeZones);
   /// The user's calendar as of now.
-  explicit Calendar(const UserLocale& userLocale);
+  Calendar(const UserLocale& userLocale, const TimeZones& timeZones);
   ~Calendar();
   Calendar(Calendar&&) noexcept;
   Calendar& operator=(Calendar&&) noexcept;

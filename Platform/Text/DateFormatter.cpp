@@ -1,14 +1,17 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Text/DateFormatter.h>
 
+#include <unicode/simpletz.h>
 #include <unicode/smpdtfmt.h>
-#include <unicode/timezone.h>
 
+#include <algorithm>
 #include <array>
 #include <atomic>
 #include <cstdint>
 #include <cstring>
 #include <mutex>
+
+#include <Platform/Ports/TimeZones.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -48,10 +51,46 @@ UDate icuDate(Date date) {
   return static_cast<UDate>(milliseconds.time_since_epoch().count());
 }
 
+// The library's own rules of a zone may be older than the system's: it gets the system's offsets,
+// and has from the identifier only what it calls the zone.
+class SystemZone final : public icu::SimpleTimeZone {
+ public:
+  SystemZone(const std::string& identifier, std::shared_ptr<const Platform::TimeZone> zone)
+      : SimpleTimeZone(0, icu::UnicodeString::fromUTF8(identifier)), zone_(std::move(zone)) {}
+
+  using SimpleTimeZone::getOffset;
+
+  SystemZone* clone() const override { return new SystemZone(*this); }
+
+  void getOffset(UDate date, UBool, std::int32_t& standard, std::int32_t& saving,
+                 UErrorCode&) const override {
+    const Platform::TimeZone::Offset offset = offsetAt(date);
+    // Where the clocks are advanced by anything else than an hour, the sum is right all the same.
+    saving = offset.isDaylightSaving ? U_MILLIS_PER_HOUR : 0;
+    standard = static_cast<std::int32_t>(milliseconds(offset.fromUTC).count()) - saving;
+  }
+
+  UBool inDaylightTime(UDate date, UErrorCode&) const override {
+    return offsetAt(date).isDaylightSaving;
+  }
+
+ private:
+  using milliseconds = std::chrono::milliseconds;
+
+  Platform::TimeZone::Offset offsetAt(UDate date) const {
+    // `Date` ends somewhat later, but not at a number that a floating one hits.
+    constexpr UDate farthest = 9.2e15;
+    const UDate near = std::clamp(date, -farthest, farthest);
+    return zone_->offsetAt(Date(milliseconds(static_cast<std::int64_t>(near))));
+  }
+
+  std::shared_ptr<const Platform::TimeZone> zone_;
+};
+
 using Format = std::unique_ptr<icu::SimpleDateFormat>;
 
 // Null unless a date can be written with it.
-Format makeFormat(std::string_view pattern, const icu::Locale& locale) {
+Format makeFormat(std::string_view pattern, const icu::Locale& locale, const TimeZones& timeZones) {
   const icu::StringPiece bytes(pattern.data(), static_cast<std::int32_t>(pattern.size()));
   UErrorCode status = U_ZERO_ERROR;
   auto format =
@@ -59,18 +98,17 @@ Format makeFormat(std::string_view pattern, const icu::Locale& locale) {
   icu::UnicodeString sample;
   if (U_SUCCESS(status)) format->format(UDate(0), sample, nullptr, status);
   if (U_FAILURE(status)) return nullptr;
-  // Asked of the system every time: the library's own default stays what it was at first use.
-  format->adoptTimeZone(icu::TimeZone::detectHostTimeZone());
+  const std::string zone = timeZones.localIdentifier();
+  format->adoptTimeZone(new SystemZone(zone, timeZones.zone(zone)));
   return format;
 }
 
 }  // namespace
 
 struct DateFormatter::State {
-  State(std::string_view pattern, std::string_view localeIdentifier)
-      : isCached(!isFinerThanSeconds(pattern)),
-        format(makeFormat(pattern, icu::Locale(std::string(localeIdentifier).c_str()))) {
-    if (!format) format = makeFormat("yyyy-MM-dd HH:mm:ss", icu::Locale::getRoot());
+  State(std::string_view pattern, const icu::Locale& locale, const TimeZones& timeZones)
+      : isCached(!isFinerThanSeconds(pattern)), format(makeFormat(pattern, locale, timeZones)) {
+    if (!format) format = makeFormat("yyyy-MM-dd HH:mm:ss", icu::Locale::getRoot(), timeZones);
   }
 
   [[nodiscard]] std::string compute(Date date) {
@@ -88,8 +126,10 @@ struct DateFormatter::State {
   Format format;
 };
 
-DateFormatter::DateFormatter(std::string_view pattern, std::string_view localeIdentifier)
-    : state_(std::make_unique<State>(pattern, localeIdentifier)) {}
+DateFormatter::DateFormatter(std::string_view pattern, std::string_view localeIdentifier,
+                             const TimeZones& timeZones)
+    : state_(std::make_unique<State>(pattern, icu::Locale(std::string(localeIdentifier).c_str()),
+                                     timeZones)) {}
 
 DateFormatter::~DateFormatter() = default;
 

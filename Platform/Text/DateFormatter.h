@@ -10,10 +10,12 @@
 
 namespace Varnel::Platform {
 
-/// Writes dates by a pattern of Unicode Technical Standard #35, in the time zone that the process
-/// had when the formatter was made.
+class TimeZones;
+
+/// Writes dates by a pattern of Unicode Technical Standard #35, in the time zone where the user was
+/// when the formatter was made.
 ///
-///     DateFormatter("YYYY-MM-dd HH:mm:ss", "en_US").string(clock.now());
+///     DateFormatter("YYYY-MM-dd HH:mm:ss", "en_US", timeZones).string(clock.now());
 ///
 /// Note that "YYYY" is the year of the locale's week, not the calendar's. Immutable; any thread.
 /// Text of the same second as the call before is not computed again when the pattern has no finer
@@ -22,7 +24,8 @@ class VARNEL_API DateFormatter final {
  public:
   /// A pattern that cannot be written stands for "yyyy-MM-dd HH:mm:ss"; a locale (an ICU
   /// identifier) that is unknown for the nearest known one.
-  DateFormatter(std::string_view pattern, std::string_view localeIdentifier);
+  DateFormatter(std::string_view pattern, std::string_view localeIdentifier,
+                const TimeZones& timeZones);
   ~DateFormatter();
   DateFormatter(const DateFormatter&) = delete;
   DateFormatter& operator=(const DateFormatter&) = delete;

@@ -2,9 +2,13 @@
 #include <Platform/Text/PropertyListGuard.h>
 
 #include <algorithm>
+#include <bit>
+#include <cmath>
 #include <cstddef>
 #include <cstdint>
 #include <vector>
+
+#include <Platform/Text/PropertyListScalars.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -90,18 +94,35 @@ class XMLGuard final {
     if (tag.starts_with("<!")) return tag.find('[') == std::string_view::npos;
     if (tag.starts_with("</")) return close(tag);
     if (tag.starts_with("<key")) return countKey();
+    const std::string_view name = nameOf(tag.substr(1));
+    if (name == "integer") return isValue(tag, name, isWholeNumber);
+    if (name == "real") return isValue(tag, name, isReal);
+    if (name == "date") return isValue(tag, name, isDate);
     if (!tag.starts_with("<dict") && !tag.starts_with("<array")) return true;
     if (!tag.ends_with("/>")) keyCounts_.push_back(0);
     return keyCounts_.size() <= maximumDepth;
   }
 
   [[nodiscard]] bool close(std::string_view tag) {
-    std::string_view name = tag.substr(2, tag.size() - 3);
-    name = name.substr(0, name.find_first_of(" \t\r\n"));
+    const std::string_view name = nameOf(tag.substr(2));
     if (name != "dict" && name != "array") return true;
     if (keyCounts_.empty()) return false;
     keyCounts_.pop_back();
     return true;
+  }
+
+  // At `position_`, behind the tag, stands the element's text and then nothing but its end.
+  [[nodiscard]] bool isValue(std::string_view tag, std::string_view name,
+                             bool (*isWhole)(std::string_view)) const {
+    const std::string_view rest = bytes_.substr(position_);
+    const std::string_view text = rest.substr(0, rest.find('<'));
+    const std::string_view end = rest.substr(text.size());
+    return !tag.ends_with("/>") && isWhole(text) && end.starts_with("</") &&
+           nameOf(end.substr(2)) == name;
+  }
+
+  static std::string_view nameOf(std::string_view tag) {
+    return tag.substr(0, tag.find_first_of(" \t\r\n/>"));
   }
 
   // A key is compared with those before it when their hashes collide, as they can be made to.
@@ -138,7 +159,16 @@ class BinaryGuard final {
  private:
   static constexpr std::size_t trailerSize = 32;
 
-  enum Kind : std::uint64_t { data = 0x4, ascii = 0x5, utf16 = 0x6, array = 0xA, dictionary = 0xD };
+  enum Kind : std::uint64_t {
+    integer = 0x1,
+    date = 0x3,
+    data = 0x4,
+    ascii = 0x5,
+    utf16 = 0x6,
+    identifier = 0x8,
+    array = 0xA,
+    dictionary = 0xD
+  };
 
   // Big-endian; the caller has made sure of the bounds.
   [[nodiscard]] std::uint64_t number(std::size_t offset, std::size_t size) const {
@@ -154,9 +184,12 @@ class BinaryGuard final {
     if (position >= table_) return false;
     const std::uint64_t marker = number(position++, 1);
     const std::uint64_t kind = marker >> 4;
-    if (kind < data || kind == 0x8) return true;
-
     std::uint64_t count = marker & 0xF;
+    if (kind == integer) return count < 4 || (count == 4 && number(position, 8) == 0);
+    if (kind == date) return std::isfinite(std::bit_cast<double>(number(position, 8)));
+    if (kind == identifier) return count < 8;
+    if (kind < data) return true;
+
     if (count == 0xF) {
       const std::uint64_t exponent = number(position++, 1) - 0x10;
       const std::size_t countSize = std::size_t{1} << (exponent & 3);

@@ -4,10 +4,12 @@
 #include <plist/plist.h>
 
 #include <algorithm>
+#include <bit>
+#include <cmath>
 #include <cstdlib>
-#include <limits>
 
 #include <Platform/Generic/UniqueHandle.h>
+#include <Platform/Text/NeutralLocale.h>
 #include <Platform/Text/PropertyListGuard.h>
 
 namespace Varnel::Platform {
@@ -70,17 +72,24 @@ PropertyData dataOf(plist_t node) {
   return data;
 }
 
-// The library counts seconds from 2001 in 32 bits; it gives an end of that range for what is
-// beyond it.
+// The library tells a date in 32 bits, and its fraction without the sign. In the binary form that
+// it writes, all of it follows a header and a marker: the seconds from 2001, floating.
 std::optional<PropertyValue> dateOf(plist_t node) {
   using namespace std::chrono;
-  using Range = std::numeric_limits<std::int32_t>;
-  std::int32_t wholeSeconds = 0;
-  std::int32_t fraction = 0;
-  plist_get_date_val(node, &wholeSeconds, &fraction);
-  if (wholeSeconds == Range::min() || wholeSeconds == Range::max()) return std::nullopt;
+  constexpr std::size_t position = 9;
+  char* bytes = nullptr;
+  std::uint32_t size = 0;
+  plist_to_bin(node, &bytes, &size);
+  const Text owner(bytes);
+  if (!bytes || size < position + sizeof(double)) return std::nullopt;
+  std::uint64_t bits = 0;
+  for (const char byte : std::string_view(bytes + position, sizeof(double)))
+    bits = bits << 8 | static_cast<unsigned char>(byte);
+  const auto distance = std::bit_cast<double>(bits);
+  constexpr double farthest = 9.0e12;
+  if (!(std::abs(distance) <= farthest)) return std::nullopt;
   constexpr sys_days epoch = year_month_day(year(2001), January, day(1));
-  return Date(epoch + seconds(wholeSeconds) + microseconds(fraction));
+  return Date(epoch + microseconds(std::llround(distance * 1e6)));
 }
 
 // Absent for a value that has no counterpart.
@@ -144,6 +153,7 @@ Tree parse(std::string_view bytes) {
 
 std::optional<PropertyValue> parsePropertyList(std::string_view bytes) {
   if (bytes.empty() || bytes.size() > maximumSize) return std::nullopt;
+  const NeutralLocale neutral;
   const Tree tree = parse(bytes);
   return tree ? valueOf(tree.get()) : std::nullopt;
 }

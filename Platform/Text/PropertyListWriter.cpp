@@ -8,6 +8,7 @@
 #include <limits>
 
 #include <Platform/Generic/UniqueHandle.h>
+#include <Platform/Text/NeutralLocale.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -49,12 +50,10 @@ struct NodeMaker {
   }
 
   plist_t operator()(Date value) const {
-    const auto distance = value - referenceDate;
-    const auto seconds = std::chrono::floor<std::chrono::seconds>(distance);
+    const auto seconds = std::chrono::floor<std::chrono::seconds>(value - referenceDate);
     using Limits = std::numeric_limits<std::int32_t>;
     if (seconds.count() < Limits::min() || seconds.count() > Limits::max()) return nullptr;
-    return plist_new_date(static_cast<std::int32_t>(seconds.count()),
-                          static_cast<std::int32_t>((distance - seconds).count()));
+    return plist_new_date(static_cast<std::int32_t>(seconds.count()), 0);
   }
 
   plist_t operator()(const PropertyList& values) const {
@@ -85,6 +84,7 @@ plist_t makeNode(const PropertyValue& value) {
 }  // namespace
 
 std::optional<std::string> writePropertyList(const PropertyValue& value) {
+  const NeutralLocale neutral;
   const Node root(makeNode(value));
   if (!root) return std::nullopt;
   char* text = nullptr;

@@ -21,7 +21,8 @@ using Varnel::Platform::visibleText;
 constexpr const char* periodKey = "schedulePeriod";
 
 std::string textOf(const std::optional<Varnel::Platform::Date>& date) {
-  static const Varnel::Platform::DateFormatter formatter("yyyy-MM-dd HH:mm", "en_US");
+  static const Varnel::Platform::DateFormatter formatter(
+      "yyyy-MM-dd HH:mm", "en_US", Varnel::Platform::processPorts().timeZones);
   return date ? formatter.string(*date) : "no date";
 }
 

@@ -131,7 +131,7 @@ int ScanCommand::run(Console& console) const {
   log.log("Did find " + std::to_string(result.groups.size()) + " groups of duplicates among " +
           std::to_string(result.totals.files) + " files");
   analytics.scanFinished(result.groups.size());
-  const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.identifier());
+  const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.numberIdentifier());
   const bool written = console.writeResult(
       isJSON ? jsonOf(result) : textOf(result, byteCounts, Varnel::QNURLResolver::shared()));
   // A machine without sound has done its work all the same.

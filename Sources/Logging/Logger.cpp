@@ -13,6 +13,7 @@
 #include <Platform/Ports/Clock.h>
 #include <Platform/Ports/Ports.h>
 #include <Platform/Ports/StandardOutput.h>
+#include <Platform/Ports/TimeZones.h>
 #include <Platform/Ports/UserAccount.h>
 #include <Platform/Ports/UserLocale.h>
 #include <Platform/Text/VisibleText.h>
@@ -26,6 +27,12 @@ namespace {
 // The year is that of the week, so that the last days of December may bear the next year's number.
 constexpr std::string_view entryDatePattern = "YYYY-MM-dd HH:mm:ss";
 constexpr std::string_view fileNameDatePattern = "YYYY-MM-dd";
+
+// Never destroyed, like the process's logger.
+const Platform::DateFormatter& makeDateFormatter(std::string_view pattern) {
+  const Platform::Ports& ports = Platform::processPorts();
+  return *new Platform::DateFormatter(pattern, ports.userLocale.identifier(), ports.timeZones);
+}
 
 bool isFolder(const Platform::URL& url) {
   if (url.hasDirectoryPath()) return true;
@@ -47,6 +54,7 @@ Logger& Logger::instance() {
     static Logger& logger = *new Logger({.appendFiles = ports.appendFiles,
                                          .clock = ports.clock,
                                          .standardOutput = ports.standardOutput,
+                                         .timeZones = ports.timeZones,
                                          .userAccount = ports.userAccount,
                                          .userLocale = ports.userLocale},
                                         Globals::baseIdentifier());
@@ -63,9 +71,9 @@ Logger& Logger::instance() {
 
 Logger::Logger(Ports ports, std::string_view baseIdentifier)
     : ports_(ports),
-      entryDates_(entryDatePattern, ports.userLocale.identifier()),
-      byteCounts_(ports.userLocale.identifier()),
-      fuzzyByteCounts_(ports.userLocale.identifier()) {
+      entryDates_(entryDatePattern, ports.userLocale.identifier(), ports.timeZones),
+      byteCounts_(ports.userLocale.numberIdentifier()),
+      fuzzyByteCounts_(ports.userLocale.numberIdentifier()) {
   openFile(baseIdentifier);
 }
 
@@ -74,7 +82,8 @@ Logger::~Logger() = default;
 void Logger::openFile(std::string_view baseIdentifier) {
   const std::string folder =
       fmt::format("{}/Library/Logs/{}", ports_.userAccount.homeFolder(), baseIdentifier);
-  const Platform::DateFormatter fileNameDates(fileNameDatePattern, ports_.userLocale.identifier());
+  const Platform::DateFormatter fileNameDates(fileNameDatePattern, ports_.userLocale.identifier(),
+                                              ports_.timeZones);
   const std::string path =
       fmt::format("{}/{}.log", folder, fileNameDates.string(ports_.clock.now()));
 
@@ -188,14 +197,12 @@ std::string_view Logger::nextLinePrefix() {
 }
 
 const Platform::DateFormatter& Logger::logMessageDateFormatter() {
-  static const auto& formatter = *new Platform::DateFormatter(
-      entryDatePattern, Platform::processPorts().userLocale.identifier());
+  static const auto& formatter = makeDateFormatter(entryDatePattern);
   return formatter;
 }
 
 const Platform::DateFormatter& Logger::fileNameDateFormatter() {
-  static const auto& formatter = *new Platform::DateFormatter(
-      fileNameDatePattern, Platform::processPorts().userLocale.identifier());
+  static const auto& formatter = makeDateFormatter(fileNameDatePattern);
   return formatter;
 }
 

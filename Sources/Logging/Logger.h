@@ -23,6 +23,7 @@ namespace Varnel::Platform {
 class AppendFiles;
 class Clock;
 class StandardOutput;
+class TimeZones;
 class UserAccount;
 class UserLocale;
 }  // namespace Varnel::Platform
@@ -48,6 +49,7 @@ class VARNEL_API Logger final {
     Platform::AppendFiles& appendFiles;
     Platform::Clock& clock;
     Platform::StandardOutput& standardOutput;
+    Platform::TimeZones& timeZones;
     Platform::UserAccount& userAccount;
     Platform::UserLocale& userLocale;
   };

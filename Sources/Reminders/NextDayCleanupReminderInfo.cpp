@@ -3,6 +3,7 @@
 
 #include <Platform/Ports/Clock.h>
 #include <Platform/Ports/Ports.h>
+#include <Platform/Ports/TimeZones.h>
 #include <Platform/Ports/UserLocale.h>
 #include <Platform/Text/ByteCountFormatter.h>
 #include <Platform/Text/Calendar.h>
@@ -19,12 +20,13 @@ const std::string& NextDayCleanupReminderInfo::userNotificationIdentifier() {
 
 Platform::UserNotification NextDayCleanupReminderInfo::makeUserNotification() const {
   const Platform::Ports& ports = Platform::processPorts();
-  return makeUserNotification({ports.clock, ports.userLocale, *VarnelModule::instance()});
+  return makeUserNotification(
+      {ports.clock, ports.userLocale, ports.timeZones, *VarnelModule::instance()});
 }
 
 Platform::UserNotification NextDayCleanupReminderInfo::makeUserNotification(Ports ports) const {
   const auto localized = [&](const char* key) { return ports.module.localizedString(key); };
-  const std::string size = Platform::ByteCountFormatter(ports.userLocale.identifier())
+  const std::string size = Platform::ByteCountFormatter(ports.userLocale.numberIdentifier())
                                .string(foundSize_, Platform::ByteCountStyle::file);
   return {
       .identifier = userNotificationIdentifier(),
@@ -33,7 +35,8 @@ Platform::UserNotification NextDayCleanupReminderInfo::makeUserNotification(Port
           Platform::formatted(localized("Varnel_NextDayCleanupReminder_Subtitle"), {size}),
       .actionButtonTitle = localized("Varnel_NextDayCleanupReminder_ActionButton"),
       .otherButtonTitle = localized("Varnel_NextDayCleanupReminder_OtherButton"),
-      .deliveryDate = Platform::Calendar(ports.userLocale).adding({.day = 1}, ports.clock.now()),
+      .deliveryDate = Platform::Calendar(ports.userLocale, ports.timeZones)
+                          .adding({.day = 1}, ports.clock.now()),
   };
 }
 

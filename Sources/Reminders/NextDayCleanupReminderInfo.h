@@ -9,6 +9,7 @@
 
 namespace Varnel::Platform {
 class Clock;
+class TimeZones;
 class UserLocale;
 }  // namespace Varnel::Platform
 
@@ -29,6 +30,7 @@ class VARNEL_API NextDayCleanupReminderInfo final {
   struct Ports {
     Platform::Clock& clock;
     Platform::UserLocale& userLocale;
+    Platform::TimeZones& timeZones;
     const BaseModule& module;
   };
 

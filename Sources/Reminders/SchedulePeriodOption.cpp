@@ -97,7 +97,8 @@ std::string SchedulePeriodOption::analyticsIdentifier() const {
 }
 
 Platform::DateComponents SchedulePeriodOption::repeatInterval() const {
-  return repeatInterval(Platform::Calendar(Platform::processPorts().userLocale));
+  const Platform::Ports& ports = Platform::processPorts();
+  return repeatInterval(Platform::Calendar(ports.userLocale, ports.timeZones));
 }
 
 Platform::DateComponents SchedulePeriodOption::repeatInterval(

@@ -5,6 +5,7 @@
 
 #include <Platform/Ports/Clock.h>
 #include <Platform/Ports/Ports.h>
+#include <Platform/Ports/TimeZones.h>
 #include <Platform/Ports/UserLocale.h>
 #include <Platform/Text/DateFormatter.h>
 
@@ -13,7 +14,7 @@ namespace {
 
 SchedulerAnalyticsSender::Ports portsOfProcess() {
   const Platform::Ports& ports = Platform::processPorts();
-  return {ports.clock, ports.userLocale};
+  return {ports.clock, ports.userLocale, ports.timeZones};
 }
 
 }  // namespace
@@ -27,7 +28,8 @@ SchedulerAnalyticsSender::SchedulerAnalyticsSender(
     : SchedulerAnalyticsSender(portsOfProcess(), std::move(tracker)) {}
 
 void SchedulerAnalyticsSender::trackNotification(const Platform::UserNotification&) {
-  const Platform::DateFormatter formatter("HH:mm", ports_.userLocale.identifier());
+  const Platform::DateFormatter formatter("HH:mm", ports_.userLocale.identifier(),
+                                          ports_.timeZones);
   trackEvent("Notification Clicked", formatter.string(ports_.clock.now()), std::nullopt, {}, {});
 }
 

@@ -9,6 +9,7 @@
 
 namespace Varnel::Platform {
 class Clock;
+class TimeZones;
 class UserLocale;
 struct UserNotification;
 }  // namespace Varnel::Platform
@@ -25,6 +26,7 @@ class VARNEL_API SchedulerAnalyticsSender final : public CommonAnalyticsSender {
   struct Ports {
     Platform::Clock& clock;
     Platform::UserLocale& userLocale;
+    Platform::TimeZones& timeZones;
   };
 
   SchedulerAnalyticsSender(Ports ports, std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker);

@@ -7,6 +7,7 @@
 #include <Basalt/MainQueueExecutor.h>
 #include <Platform/Ports/Clock.h>
 #include <Platform/Ports/Ports.h>
+#include <Platform/Ports/TimeZones.h>
 #include <Platform/Ports/UserLocale.h>
 #include <Platform/Ports/UserNotificationCenter.h>
 #include <Platform/Text/ByteCountFormatter.h>
@@ -38,8 +39,8 @@ std::vector<UserNotification> repeating(std::vector<UserNotification> notificati
 
 SchedulerService::Ports portsOfProcess() {
   const Platform::Ports& ports = Platform::processPorts();
-  return {ports.clock, ports.userLocale, ports.mainQueue, Globals::facts(),
-          VarnelModule::instance()};
+  return {ports.clock,     ports.userLocale, ports.timeZones,
+          ports.mainQueue, Globals::facts(), VarnelModule::instance()};
 }
 
 }  // namespace
@@ -49,7 +50,8 @@ SchedulerService::SchedulerService(Ports ports,
                                    UserNotificationRouter& userNotificationRouter)
     : ExecutionContext(std::make_shared<Basalt::MainQueueExecutor>(ports.mainQueue)),
       ports_(std::move(ports)),
-      analyticsSender_({ports_.clock, ports_.userLocale}, std::move(analyticsTracker)),
+      analyticsSender_({ports_.clock, ports_.userLocale, ports_.timeZones},
+                       std::move(analyticsTracker)),
       userNotificationRouter_(userNotificationRouter) {
   userNotificationRouter.channel(notificationIdentifier)
       .onUpdate(*this, [this](const UserNotificationRouter::Event& event) {
@@ -81,7 +83,7 @@ void SchedulerService::scheduleCleanReminder() {
 
 void SchedulerService::scheduleCleanReminder(std::int64_t sizeLeftToClean) {
   if (sizeLeftToClean < smallestNamedSize) return scheduleCleanReminder();
-  const std::string size = Platform::ByteCountFormatter(ports_.userLocale.identifier())
+  const std::string size = Platform::ByteCountFormatter(ports_.userLocale.numberIdentifier())
                                .string(sizeLeftToClean, Platform::ByteCountStyle::file);
   scheduleNotification(
       localized("Varnel_CleanReminder_Title_WithSize_Format"),
@@ -111,7 +113,8 @@ std::string SchedulerService::simpleAlertSubtitle() const {
 void SchedulerService::scheduleNotification(const std::string& title, const std::string& subtitle) {
   removePreviouslyScheduledNotifications();
   if (schedulePeriod_ == SchedulePeriodOption::never) return;
-  const auto interval = schedulePeriod_.repeatInterval(Platform::Calendar(ports_.userLocale));
+  const auto interval =
+      schedulePeriod_.repeatInterval(Platform::Calendar(ports_.userLocale, ports_.timeZones));
   userNotificationCenter().scheduleNotification({
       .identifier = notificationIdentifier,
       .title = ports_.facts.substitutingApplicationName(title),
@@ -133,7 +136,7 @@ void SchedulerService::removePreviouslyScheduledNotifications() {
 
 Platform::Date SchedulerService::calculateDeliveryDate(
     const Platform::DateComponents& repeatInterval) const {
-  return Platform::Calendar(ports_.userLocale)
+  return Platform::Calendar(ports_.userLocale, ports_.timeZones)
       .adding(repeatInterval, ports_.clock.now())
       .value_or(distantFuture);
 }

@@ -19,6 +19,7 @@ class AnalyticsTracker;
 namespace Varnel::Platform {
 class Clock;
 class MainQueue;
+class TimeZones;
 class UserLocale;
 class UserNotificationCenter;
 }  // namespace Varnel::Platform
@@ -47,6 +48,7 @@ class VARNEL_API SchedulerService final : public Basalt::ExecutionContext {
   struct Ports {
     Platform::Clock& clock;
     Platform::UserLocale& userLocale;
+    Platform::TimeZones& timeZones;
     Platform::MainQueue& mainQueue;
     const ProcessFacts& facts;                 ///< For the application's name.
     std::shared_ptr<const BaseModule> module;  ///< For the texts.

@@ -8,6 +8,7 @@
 
 #include <Platform/Testing/CapturedOutput.h>
 #include <Platform/Testing/FakeAppendFiles.h>
+#include <Platform/Testing/FakeTimeZones.h>
 #include <Platform/Testing/FakeUser.h>
 #include <Platform/Testing/FakeWorkspace.h>
 #include <Platform/Testing/SimulatedClock.h>
@@ -58,8 +59,9 @@ class CommonAnalyticsSenderTest : public testing::Test {
   Platform::Testing::SimulatedClock clock_;
   Platform::Testing::CapturedOutput output_;
   Platform::Testing::FakeUserAccount account_;
+  Platform::Testing::FakeTimeZones zones_;
   Platform::Testing::FakeUserLocale locale_;
-  Logger logger_{{files_, clock_, output_, account_, locale_}, "test"};
+  Logger logger_{{files_, clock_, output_, zones_, account_, locale_}, "test"};
   std::shared_ptr<Tallyhouse::Testing::MemoryTransport> sent_ =
       std::make_shared<Tallyhouse::Testing::MemoryTransport>();
   std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker_ =

@@ -20,6 +20,7 @@
 #include <Platform/Testing/CapturedOutput.h>
 #include <Platform/Testing/FakeApplication.h>
 #include <Platform/Testing/FakeProcessInfo.h>
+#include <Platform/Testing/FakeTimeZones.h>
 #include <Platform/Testing/FakeUser.h>
 #include <Platform/Testing/FakeWorkspace.h>
 #include <Tallyhouse/AnalyticsTracker.h>
@@ -119,6 +120,7 @@ class Host final {
   const std::unique_ptr<Platform::Clock> clock = Platform::POSIX::makeClock();
   const std::unique_ptr<Platform::MainQueue> queue = Platform::Linux::makeMainQueue();
   Platform::Testing::FakeUserLocale locale;
+  Platform::Testing::FakeTimeZones zones;
   Platform::Testing::CapturedSystemLog log;
   Platform::Testing::FakeApplication application;
   Platform::Testing::FakeProcessInfo processInfo;
@@ -129,10 +131,10 @@ class Host final {
   const std::shared_ptr<Tallyhouse::Testing::MemoryTransport> sent =
       std::make_shared<Tallyhouse::Testing::MemoryTransport>();
   const std::unique_ptr<Platform::UserNotificationCenters> centers =
-      Platform::Linux::makeUserNotificationCenters({*clock, locale, *queue, log});
+      Platform::Linux::makeUserNotificationCenters({*clock, locale, zones, *queue, log});
   Platform::UserNotificationCenter& center;
   UserNotificationRouter router;
-  SchedulerService service{{*clock, locale, *queue, facts, module},
+  SchedulerService service{{*clock, locale, zones, *queue, facts, module},
                            std::make_shared<Tallyhouse::AnalyticsTracker>(sent),
                            router};
 };

@@ -9,6 +9,7 @@
 
 #include <Platform/Testing/CapturedOutput.h>
 #include <Platform/Testing/FakeAppendFiles.h>
+#include <Platform/Testing/FakeTimeZones.h>
 #include <Platform/Testing/FakeUser.h>
 #include <Platform/Testing/SimulatedClock.h>
 #include <Tests/Support/TemporaryFolder.h>
@@ -27,7 +28,7 @@ class LoggerFixture : public testing::Test {
   /// Makes the logger on first use; what it prints at start is left out of `printed()`.
   Logger& logger() {
     if (!logger_) {
-      logger_ = std::make_unique<Logger>(Logger::Ports{files, clock, output, user, locale},
+      logger_ = std::make_unique<Logger>(Logger::Ports{files, clock, output, zones, user, locale},
                                          "com.quennel.Test");
       startSize_ = output.text().size();
     }
@@ -49,6 +50,7 @@ class LoggerFixture : public testing::Test {
       std::chrono::sys_days(std::chrono::year(2026) / 3 / 14) + std::chrono::seconds(33999))};
   Platform::Testing::CapturedOutput output;
   Platform::Testing::FakeUserAccount user;
+  Platform::Testing::FakeTimeZones zones;
   Platform::Testing::FakeUserLocale locale;
 
  private:

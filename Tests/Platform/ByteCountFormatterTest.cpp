@@ -26,8 +26,9 @@ TEST(ByteCountFormatter, RoundsHalvesUpAndCarriesIntoTheNextUnit) {
       {-1, memory, "-1 byte"},
       {999, file, "999 bytes"},
       {1000, decimal, "1 KB"},
-      {1000, memory, "1000 bytes"},
-      {1023, binary, "1023 bytes"},
+      {999, memory, "999 bytes"},
+      {1000, memory, "1,000 bytes"},
+      {-1023, binary, "-1,023 bytes"},
       {1024, memory, "1 KB"},
       {1499, file, "1 KB"},
       {1500, file, "2 KB"},
@@ -45,7 +46,9 @@ TEST(ByteCountFormatter, RoundsHalvesUpAndCarriesIntoTheNextUnit) {
       {1'005'000'000, file, "1.01 GB"},
       {2'250'000'000, file, "2.25 GB"},
       {2'500'000'000, file, "2.5 GB"},
-      {kibi * kibi - 513, memory, "1023 KB"},
+      {1016 * kibi, memory, "1,016 KB"},
+      {kibi * kibi - 513, memory, "1,023 KB"},
+      {kibi * kibi * 1023 + kibi * 512, memory, "1,023.5 MB"},
       {kibi * kibi - 512, memory, "1 MB"},
       {kibi * kibi * kibi * 5 / 4, binary, "1.25 GB"},
       {999'994'999'999'999, file, "999.99 TB"},
@@ -60,7 +63,7 @@ TEST(ByteCountFormatter, RoundsHalvesUpAndCarriesIntoTheNextUnit) {
     EXPECT_EQ(formatter.string(test.count, test.style), test.text) << test.count;
 }
 
-TEST(ByteCountFormatter, TakesOnlyTheDecimalSeparatorFromTheLocale) {
+TEST(ByteCountFormatter, TakesOnlyTheSeparatorsFromTheLocale) {
   const auto text = [](const char* locale) {
     return ByteCountFormatter(locale).string(1'500'000, file);
   };
@@ -70,6 +73,15 @@ TEST(ByteCountFormatter, TakesOnlyTheDecimalSeparatorFromTheLocale) {
   EXPECT_EQ(text("fa"), "1\u066B5 MB");
   EXPECT_EQ(text(""), "1.5 MB");
   EXPECT_EQ(text("no such locale"), "1.5 MB");
+  const auto grouped = [](const char* locale) {
+    return ByteCountFormatter(locale).string(1023, memory);
+  };
+  EXPECT_EQ(grouped("de_DE.UTF-8"), "1.023 bytes");
+  EXPECT_EQ(grouped("de_CH"), "1’023 bytes");
+  EXPECT_EQ(grouped("fr"), "1\u202F023 bytes");
+  EXPECT_EQ(grouped("fa"), "1\u066C023 bytes");
+  EXPECT_EQ(grouped("es"), "1023 bytes") << "which groups from five digits on";
+  EXPECT_EQ(grouped("no such locale"), "1,023 bytes");
 }
 
 }  // namespace

@@ -6,6 +6,7 @@
 #include <limits>
 
 #include <Platform/Text/TextFormat.h>
+#include <Tests/Support/Zones.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -13,6 +14,7 @@ namespace {
 using namespace std::chrono;
 using namespace std::chrono_literals;
 
+const auto zones = Tests::zonesOf2026();
 constexpr auto month = DateComponents{.month = 1};
 constexpr auto day = DateComponents{.day = 1};
 
@@ -21,7 +23,7 @@ Date utc(year_month_day date, minutes time = 0min) {
 }
 
 TEST(Calendar, EachRepetitionIsCountedFromTheOriginalDate) {
-  const Calendar calendar("en_US", "UTC");
+  const Calendar calendar("en_US", "UTC", zones);
   const Date last = utc(2026y / January / 31, 9h + 5min) + 123456us;
   const auto nth = [&](int n) { return *calendar.adding(month, last, n) - 123456us; };
   EXPECT_EQ(nth(0), utc(2026y / January / 31, 9h + 5min));
@@ -32,7 +34,7 @@ TEST(Calendar, EachRepetitionIsCountedFromTheOriginalDate) {
 }
 
 TEST(Calendar, KeepsTheWallClockOverBothChangesOfTheClocks) {
-  const Calendar berlin("de_DE", "Europe/Berlin");
+  const Calendar berlin("de_DE", "Europe/Berlin", zones);
   // 18:30 stays 18:30, in winter at 17:30 UTC, in summer at 16:30.
   EXPECT_EQ(berlin.adding(day, utc(2026y / March / 28, 17h + 30min)),
             utc(2026y / March / 29, 16h + 30min));
@@ -53,19 +55,19 @@ TEST(Calendar, KeepsTheWallClockOverBothChangesOfTheClocks) {
 
 TEST(Calendar, CountsInTheCalendarOfTheLocale) {
   // In the Hebrew year 5784 Adar comes twice; a year later there is but one.
-  const Calendar hebrew("he_IL@calendar=hebrew", "UTC");
+  const Calendar hebrew("he_IL@calendar=hebrew", "UTC", zones);
   EXPECT_EQ(hebrew.adding({.year = 1}, utc(2024y / October / 3)), utc(2025y / September / 23));
   // The first month of the Persian year has 31 days.
-  EXPECT_EQ(Calendar("fa_IR", "UTC").adding(month, utc(2026y / March / 21)),
+  EXPECT_EQ(Calendar("fa_IR", "UTC", zones).adding(month, utc(2026y / March / 21)),
             utc(2026y / April / 21));
-  EXPECT_EQ(Calendar("th_TH", "UTC").adding({.year = 1000}, utc(2026y / March / 21)),
+  EXPECT_EQ(Calendar("th_TH", "UTC", zones).adding({.year = 1000}, utc(2026y / March / 21)),
             utc(3026y / March / 21));
   for (const char* locale : {"en_US", "he_IL@calendar=hebrew", "fa_IR", "", "nonsense"})
-    EXPECT_EQ(Calendar(locale, "UTC").weekdayCount(), 7) << locale;
+    EXPECT_EQ(Calendar(locale, "UTC", zones).weekdayCount(), 7) << locale;
 }
 
 TEST(Calendar, MovesAWallClockTimeIntoAnotherZone) {
-  const Calendar newYork("en_US", "America/New_York");
+  const Calendar newYork("en_US", "America/New_York", zones);
   EXPECT_EQ(newYork.withWallClockOf(utc(2026y / July / 1, 7h), "Europe/Berlin"),
             utc(2026y / July / 1, 13h));
   EXPECT_EQ(newYork.withWallClockOf(utc(2026y / July / 1, 7h), "No/Such_Zone"),
@@ -73,7 +75,7 @@ TEST(Calendar, MovesAWallClockTimeIntoAnotherZone) {
 }
 
 TEST(Calendar, AnswersNothingBeyondWhatItCanCount) {
-  const Calendar calendar("en_US", "Europe/Berlin");
+  const Calendar calendar("en_US", "Europe/Berlin", zones);
   const Date now = utc(2026y / March / 1);
   constexpr auto huge = std::numeric_limits<std::int64_t>::max();
   EXPECT_EQ(calendar.adding({.year = huge}, now), std::nullopt);

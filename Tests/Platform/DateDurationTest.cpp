@@ -4,11 +4,14 @@
 
 #include <gtest/gtest.h>
 
-#include <cstdlib>
 #include <latch>
 #include <limits>
 #include <thread>
 #include <vector>
+
+#include <Platform/Linux/Adapters.h>
+#include <Platform/Ports/TimeZones.h>
+#include <Tests/Support/LocalZone.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -18,18 +21,12 @@ using namespace std::chrono_literals;
 
 constexpr const char* timestampPattern = "YYYY-MM-dd HH:mm:ss";
 
-class TimeZone final {
- public:
-  explicit TimeZone(const char* name) { setenv("TZ", name, 1); }
-  ~TimeZone() { unsetenv("TZ"); }
-  TimeZone(const TimeZone&) = delete;
-  TimeZone& operator=(const TimeZone&) = delete;
-};
+const auto zones = Linux::makeTimeZones();
 
 TEST(DateFormatter, WritesTheYearOfTheLocalesWeek) {
-  const TimeZone utc("UTC");
+  const Tests::LocalZone utc("UTC");
   const auto text = [](const char* pattern, const char* locale, sys_days day) {
-    return DateFormatter(pattern, locale).string(day);
+    return DateFormatter(pattern, locale, *zones).string(day);
   };
   EXPECT_EQ(text("YYYY-MM-dd", "en_US", 2024y / December / 28), "2024-12-28");
   EXPECT_EQ(text("YYYY-MM-dd", "en_US", 2024y / December / 31), "2025-12-31");
@@ -40,8 +37,8 @@ TEST(DateFormatter, WritesTheYearOfTheLocalesWeek) {
 }
 
 TEST(DateFormatter, FollowsTheTimeZoneThroughItsChanges) {
-  const TimeZone berlin("Europe/Berlin");
-  const DateFormatter formatter(timestampPattern, "en_US");
+  const Tests::LocalZone berlin("Europe/Berlin");
+  const DateFormatter formatter(timestampPattern, "en_US", *zones);
   const sys_days spring = 2024y / March / 31;
   EXPECT_EQ(formatter.string(spring + 59min + 59s), "2024-03-31 01:59:59");
   EXPECT_EQ(formatter.string(spring + 1h), "2024-03-31 03:00:00");
@@ -50,19 +47,19 @@ TEST(DateFormatter, FollowsTheTimeZoneThroughItsChanges) {
   EXPECT_EQ(formatter.string(autumn + 1h + 30min), "2024-10-27 02:30:00");
   EXPECT_EQ(formatter.string(autumn + 2h + 30min), "2024-10-27 03:30:00");
 
-  const TimeZone tokyo("Asia/Tokyo");
-  EXPECT_EQ(DateFormatter(timestampPattern, "en_US").string(autumn), "2024-10-27 09:00:00");
+  const Tests::LocalZone tokyo("Asia/Tokyo");
+  EXPECT_EQ(DateFormatter(timestampPattern, "en_US", *zones).string(autumn), "2024-10-27 09:00:00");
   EXPECT_EQ(formatter.string(autumn), "2024-10-27 02:00:00") << "the zone it was made in";
 }
 
 TEST(DateFormatter, KeepsTextsOfFormattersAndSecondsApart) {
-  const TimeZone utc("UTC");
+  const Tests::LocalZone utc("UTC");
   const Date date = sys_days(2024y / May / 5) + 1h;
-  const DateFormatter timestamp(timestampPattern, "en_US");
-  const DateFormatter milliseconds("ss.SSS", "en_US");
-  const DateFormatter quoted("ss 'SA' ''", "en_US");
+  const DateFormatter timestamp(timestampPattern, "en_US", *zones);
+  const DateFormatter milliseconds("ss.SSS", "en_US", *zones);
+  const DateFormatter quoted("ss 'SA' ''", "en_US", *zones);
   const DateFormatter longer("'a text that is much too long to be kept with its second' ss",
-                             "en_US");
+                             "en_US", *zones);
   for (const auto part : {0us, 1000us, 999'999us, 1'000'000us, 0us, -1us}) {
     const bool isNext = part >= 1s;
     const bool isBefore = part < 0s;
@@ -78,30 +75,30 @@ TEST(DateFormatter, KeepsTextsOfFormattersAndSecondsApart) {
 
   // Many formatters one after the other at one address and one second.
   for (const char* pattern : {"ss", "mm", "HH", "dd", "MM", "yy", "ss"}) {
-    const DateFormatter formatter(pattern, "en_US");
+    const DateFormatter formatter(pattern, "en_US", *zones);
     EXPECT_EQ(formatter.string(date).size(), 2u);
-    EXPECT_EQ(formatter.string(date), DateFormatter(pattern, "en_US").string(date));
+    EXPECT_EQ(formatter.string(date), DateFormatter(pattern, "en_US", *zones).string(date));
   }
-  EXPECT_EQ(DateFormatter("dd", "en_US").string(date), "05");
-  EXPECT_EQ(DateFormatter("HH", "en_US").string(date), "01");
+  EXPECT_EQ(DateFormatter("dd", "en_US", *zones).string(date), "05");
+  EXPECT_EQ(DateFormatter("HH", "en_US", *zones).string(date), "01");
 }
 
 TEST(DateFormatter, SurvivesOddPatternsAndDates) {
-  const TimeZone utc("UTC");
+  const Tests::LocalZone utc("UTC");
   const Date date = sys_days(2024y / May / 5) + 1h;
-  EXPECT_EQ(DateFormatter("", "en_US").string(date), "");
-  EXPECT_EQ(DateFormatter("'open quote", "en_US").string(date), "open quote");
-  EXPECT_EQ(DateFormatter("yyyy N P", "en_US").string(date), "2024-05-05 01:00:00");
-  EXPECT_EQ(DateFormatter("yyyy", "no such locale").string(date), "2024");
-  EXPECT_EQ(DateFormatter("d MMMM", "de_DE").string(date), "5 Mai");
-  const DateFormatter formatter(timestampPattern, "en_US");
+  EXPECT_EQ(DateFormatter("", "en_US", *zones).string(date), "");
+  EXPECT_EQ(DateFormatter("'open quote", "en_US", *zones).string(date), "open quote");
+  EXPECT_EQ(DateFormatter("yyyy N P", "en_US", *zones).string(date), "2024-05-05 01:00:00");
+  EXPECT_EQ(DateFormatter("yyyy", "no such locale", *zones).string(date), "2024");
+  EXPECT_EQ(DateFormatter("d MMMM", "de_DE", *zones).string(date), "5 Mai");
+  const DateFormatter formatter(timestampPattern, "en_US", *zones);
   EXPECT_FALSE(formatter.string(Date::min()).empty());
   EXPECT_FALSE(formatter.string(Date::max()).empty());
 }
 
 TEST(DateFormatter, GivesEveryThreadTheTextOfItsOwnSecond) {
-  const TimeZone utc("UTC");
-  const DateFormatter formatter("HH:mm:ss", "en_US");
+  const Tests::LocalZone utc("UTC");
+  const DateFormatter formatter("HH:mm:ss", "en_US", *zones);
   std::latch start(4);
   std::vector<std::thread> threads;
   for (int thread = 0; thread < 4; ++thread)

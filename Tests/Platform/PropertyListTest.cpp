@@ -1,12 +1,20 @@
 // SPDX-License-Identifier: MIT
 #include <Platform/Text/PropertyListParser.h>
+#include <Platform/Text/PropertyListWriter.h>
 #include <Platform/Text/StringsTable.h>
 
 #include <gtest/gtest.h>
 
+#include <bit>
+#include <clocale>
+#include <cmath>
+#include <cstdlib>
+#include <limits>
 #include <string>
 #include <thread>
 #include <vector>
+
+#include <Tests/Support/TemporaryFolder.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -106,9 +114,23 @@ TEST(PropertyList, TakesExtremeScalarsAsFarAsTheyHaveACounterpart) {
             PropertyValue(std::numeric_limits<std::int64_t>::min()));
   EXPECT_EQ(parsedElement("<integer>18446744073709551615</integer>"),
             PropertyValue(std::int64_t{-1}));
-  EXPECT_EQ(parsedElement("<date>4001-01-01T00:00:00Z</date>"), std::nullopt);
-  EXPECT_EQ(parsedElement("<array><date>1601-01-01T00:00:00Z</date><true/></array>"),
-            PropertyValue(PropertyList{true}));
+  EXPECT_EQ(parsedElement("<integer>\n\t+0x1F </integer>"), PropertyValue(std::int64_t{31}));
+  EXPECT_EQ(parsedElement("<real> -2.5e-3 </real>"), PropertyValue(-0.0025));
+  EXPECT_EQ(parsedElement("<real>+infinity</real>"),
+            PropertyValue(std::numeric_limits<double>::infinity()));
+  EXPECT_EQ(parsedElement("<date>4001-01-01T00:00:00Z</date>"),
+            PropertyValue(Date(sys_days(4001y / January / 1))));
+  EXPECT_EQ(parsedElement("<date>1601-02-28T23:59:59Z</date>"),
+            PropertyValue(Date(sys_days(1601y / March / 1) - 1s)));
+  const auto binaryDate = [](double secondsFrom2001) {
+    return parsePropertyList(
+        binaryList({"\x33" + bigEndian(std::bit_cast<std::uint64_t>(secondsFrom2001), 8)}));
+  };
+  for (const double distance : {-100'000'000.75, -1.5, -0.5, 0.25, 700'000'000.125})
+    EXPECT_EQ(binaryDate(distance), PropertyValue(Date(sys_days(2001y / January / 1) +
+                                                       microseconds(llround(distance * 1e6)))));
+  EXPECT_EQ(binaryDate(1e300), std::nullopt);
+  EXPECT_EQ(binaryDate(std::numeric_limits<double>::quiet_NaN()), std::nullopt);
   EXPECT_EQ(parsePropertyList("\xEF\xBB\xBF<plist><true/></plist>"), PropertyValue(true));
 }
 
@@ -125,6 +147,66 @@ TEST(PropertyList, RefusesWhatIsNone) {
     EXPECT_EQ(parsePropertyList(binaryList({text})), std::nullopt);
     EXPECT_EQ(parsePropertyList(binaryList({"\xD1\0\1\0\1"s, text})), std::nullopt);
   }
+}
+
+TEST(PropertyList, RefusesNumbersAndDatesThatAreNone) {
+  const struct {
+    const char* element;
+    std::vector<const char*> texts;
+  } rows[] = {
+      {"integer",
+       {"", " ", "abc", "42abc", "4 2", "1.5", "--5", "- 5", "-+5", "010", "0x", "0xG",
+        "4<!-- -->2", "<![CDATA[42]]>", "&#52;2", "-9223372036854775809", "18446744073709551616",
+        "0x10000000000000000", "99999999999999999999999"}},
+      {"real", {"", "abc", "1.5x", "1,5", "+-1", "1e999", "0x1p3", "1 000"}},
+      {"date",
+       {"", "hello", "2024-02-29", "2024-02-30T00:00:00Z", "2023-02-29T00:00:00Z",
+        "2024-13-01T00:00:00Z", "2024-02-29T24:00:00Z", "2024-02-29T12:60:00Z",
+        "2024-02-29T12:00:00", "2024-02-29T12:00:00Zx", "2024-02-29T12:00:00+01:00",
+        "2024-02-29 12:00:00Z", " 2024-02-29T12:00:00Z"}},
+  };
+  for (const auto& [element, texts] : rows) {
+    EXPECT_EQ(parsedElement("<" + std::string(element) + "/>"), std::nullopt) << element;
+    for (const char* text : texts)
+      EXPECT_EQ(parsedElement("<" + std::string(element) + ">" + text + "</" + element + ">"),
+                std::nullopt)
+          << element << " " << text;
+  }
+  EXPECT_EQ(parsePropertyList(binaryList({"\x14" + bigEndian(1, 8) + bigEndian(5, 8)})),
+            std::nullopt);
+  EXPECT_EQ(parsePropertyList(binaryList({"\x14" + bigEndian(0, 8) + bigEndian(5, 8)})),
+            PropertyValue(std::int64_t{5}));
+  EXPECT_EQ(parsePropertyList(binaryList({"\x88\1" + bigEndian(5, 8)})), std::nullopt);
+}
+
+// A locale of the test's own, since a machine may have none whose numbers have a comma.
+TEST(PropertyList, IsTheSameInEveryLocaleOfTheHost) {
+  const Tests::TemporaryFolder folder;
+  const std::string source = folder.write(
+      "source",
+      "LC_NUMERIC\ndecimal_point \",\"\nthousands_sep \".\"\ngrouping 3\nEND LC_NUMERIC\n");
+  const std::string made = (folder.path() / "xx_XX").string();
+  // It fails over the categories that are left out, and makes the locale all the same.
+  static_cast<void>(
+      std::system(("localedef -c -i " + source + " " + made + " 2>/dev/null").c_str()));
+  ::setenv("LOCPATH", folder.path().c_str(), 1);
+  if (!std::setlocale(LC_NUMERIC, "xx_XX"))
+    GTEST_SKIP() << "The machine has no character maps to make a locale from.";
+  const PropertyValue value(PropertyList{1.5, -0.1, Date(sys_days(2024y / May / 1))});
+  const auto written = writePropertyList(value);
+  const auto read = parsedElement("<real>1.5</real>");
+  const std::string hosts = std::to_string(1.5);
+  std::setlocale(LC_NUMERIC, "C");
+  EXPECT_EQ(read, PropertyValue(1.5));
+  EXPECT_EQ(parsePropertyList(written.value_or("")), value);
+  EXPECT_EQ(hosts, "1,500000") << "and the host keeps its own";
+}
+
+TEST(PropertyList, WritesWholeSecondsOfDates) {
+  for (const auto fraction : {0us, 1us, 999'999us})
+    for (const Date second : {sys_days(1999y / May / 1) + 0s, sys_days(2001y / January / 1) - 1s})
+      EXPECT_EQ(parsePropertyList(writePropertyList(second + fraction).value_or("")),
+                PropertyValue(second));
 }
 
 // A thread has a smaller stack than the process, and the limit must fit all of them.

@@ -7,8 +7,10 @@
 #include <fstream>
 
 #include <Platform/Linux/Adapters.h>
+#include <Platform/POSIX/Adapters.h>
 #include <Platform/Ports/ExtendedAttributes.h>
 #include <Platform/Ports/UserDefaults.h>
+#include <Platform/Ports/UserLocale.h>
 #include <Platform/Text/UTF8.h>
 #include <Tests/Support/TemporaryFolder.h>
 
@@ -79,6 +81,33 @@ TEST(UTF8, IsRefusedWhereItIsMalformed) {
   for (const char* text : {"\x80", "12345678\xFF", "1234567\xC3", "\xC0\xAF", "\xED\xA0\x80",
                            "\xF4\x90\x80\x80", "\xE2\x82", "ü\xFE"})
     EXPECT_FALSE(isValidUTF8(text)) << text;
+}
+
+TEST(UserLocale, TakesDatesAndNumbersEachFromTheirCategory) {
+  const struct {
+    const char* all;
+    const char* time;
+    const char* numeric;
+    const char* language;
+    const char* dates;
+    const char* numbers;
+  } rows[] = {
+      {"", "en_GB.UTF-8", "de_AT.UTF-8@euro", "fr_FR", "en_GB", "de_AT"},
+      {"", "en_GB.UTF-8", "", "fr_FR", "en_GB", "fr_FR"},
+      {"", "", "de_AT", "fr_FR", "fr_FR", "de_AT"},
+      {"ja_JP", "en_GB", "de_AT", "fr_FR", "ja_JP", "ja_JP"},
+      {"", "en_GB", "C", "fr_FR", "en_GB", "en_US"},
+      {"", "", "", "", "en_US", "en_US"},
+  };
+  for (const auto& row : rows) {
+    ::setenv("LC_ALL", row.all, 1);
+    ::setenv("LC_TIME", row.time, 1);
+    ::setenv("LC_NUMERIC", row.numeric, 1);
+    ::setenv("LANG", row.language, 1);
+    const auto locale = POSIX::makeUserLocale();
+    EXPECT_EQ(locale->identifier(), row.dates) << &row - rows;
+    EXPECT_EQ(locale->numberIdentifier(), row.numbers) << &row - rows;
+  }
 }
 
 }  // namespace

@@ -7,12 +7,15 @@
 #include <vector>
 
 #include <Platform/Text/Calendar.h>
+#include <Tests/Support/Zones.h>
 
 namespace Varnel::Platform {
 namespace {
 
 using namespace std::chrono;
 using namespace std::chrono_literals;
+
+const auto zones = Tests::zonesOf2026();
 
 Date utc(year_month_day date, minutes time = 0min) {
   return sys_days(date) + time;
@@ -41,7 +44,7 @@ std::vector<Date> deliveries(NotificationSchedule schedule, int count, const Cal
 }
 
 TEST(NotificationSchedule, AYearOfWeeksKeepsTheWallClock) {
-  const Calendar berlin("de_DE", "Europe/Berlin");
+  const Calendar berlin("de_DE", "Europe/Berlin", zones);
   // Thursdays at 09:00, at 08:00 UTC in winter and at 07:00 in summer.
   const auto dates =
       deliveries(repeating(utc(2026y / January / 1, 8h), {.day = 7}, "Europe/Berlin"), 53, berlin);
@@ -58,14 +61,14 @@ TEST(NotificationSchedule, AYearOfWeeksKeepsTheWallClock) {
 }
 
 TEST(NotificationSchedule, MonthsFromThe31stReturnToIt) {
-  const Calendar calendar("en_US", "UTC");
+  const Calendar calendar("en_US", "UTC", zones);
   EXPECT_EQ(deliveries(repeating(utc(2026y / January / 31), {.month = 1}), 4, calendar),
             (std::vector{utc(2026y / January / 31), utc(2026y / February / 28),
                          utc(2026y / March / 31), utc(2026y / April / 30)}));
 }
 
 TEST(NotificationSchedule, PeriodsThatPassedUnseenCountAsOne) {
-  const Calendar calendar("en_US", "UTC");
+  const Calendar calendar("en_US", "UTC", zones);
   auto schedule = repeating(utc(2026y / June / 1), {.day = 7});
   const ScheduleDecision decision = decide(schedule, utc(2026y / June / 23), calendar);
   EXPECT_TRUE(decision.isDue);
@@ -80,7 +83,7 @@ TEST(NotificationSchedule, PeriodsThatPassedUnseenCountAsOne) {
 }
 
 TEST(NotificationSchedule, AClockSetBackRepeatsNothingButDoesNotSilence) {
-  const Calendar calendar("en_US", "UTC");
+  const Calendar calendar("en_US", "UTC", zones);
   auto schedule = repeating(utc(2026y / June / 1), {.day = 7});
   schedule.deliveryCount = 2;  // Delivered on 1 and 8 June.
   for (const Date now : {utc(2026y / June / 7), utc(2026y / June / 2)}) {
@@ -95,13 +98,13 @@ TEST(NotificationSchedule, AClockSetBackRepeatsNothingButDoesNotSilence) {
 
 TEST(NotificationSchedule, FollowsTheUserIntoAnotherTimeZone) {
   const auto schedule = repeating(utc(2026y / July / 1, 7h), {.day = 1}, "Europe/Berlin");
-  const Calendar newYork("en_US", "America/New_York");
+  const Calendar newYork("en_US", "America/New_York", zones);
   EXPECT_EQ(nextDate(schedule, newYork), utc(2026y / July / 1, 13h));
   EXPECT_FALSE(decide(schedule, utc(2026y / July / 1, 12h), newYork).isDue);
 }
 
 TEST(NotificationSchedule, WhatCannotRepeatComesOnce) {
-  const Calendar calendar("en_US", "UTC");
+  const Calendar calendar("en_US", "UTC", zones);
   const Date date = utc(2026y / July / 1);
   const ScheduleDecision once{.isDue = true, .deliveryCount = std::nullopt};
   for (const DateComponents& interval :

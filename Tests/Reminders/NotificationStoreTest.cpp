@@ -16,6 +16,7 @@
 #include <Platform/Testing/CapturedOutput.h>
 #include <Platform/Text/Calendar.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Tests/Support/Zones.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -26,6 +27,7 @@ using ::testing::HasSubstr;
 using ::testing::IsEmpty;
 using ::testing::SizeIs;
 
+const auto zones = Tests::zonesOf2026();
 constexpr Date start = std::chrono::sys_days(std::chrono::year(2026) / 3 / 1);
 
 class NotificationStoreTest : public ::testing::Test {
@@ -42,7 +44,7 @@ class NotificationStoreTest : public ::testing::Test {
 
   const Tests::TemporaryFolder folder;
   const fs::path file = folder.path() / "made" / "store.sqlite";
-  const Calendar calendar{"en_US", "UTC"};
+  const Calendar calendar{"en_US", "UTC", zones};
   Testing::CapturedSystemLog log;
 };
 
@@ -83,7 +85,7 @@ TEST_F(NotificationStoreTest, EachDeliveryIsClaimedOnceAmongMany) {
   std::barrier step(claimerCount);
   const auto claimAll = [&] {
     NotificationStore store(file, log);  // What a process has of its own.
-    const Calendar own("en_US", "UTC");
+    const Calendar own("en_US", "UTC", zones);
     for (int week = 0; week < weekCount; ++week) {
       step.arrive_and_wait();
       claims.at(static_cast<std::size_t>(week)) +=
@@ -195,7 +197,7 @@ TEST_F(NotificationStoreTest, SurvivesWhateverStandsInItsColumns) {
       ASSERT_FALSE(database->execute(sql)) << sql;
   }
   NotificationStore store(file, log);
-  const auto claimed = store.claimDue(start, Calendar("en_US", "Europe/Berlin"));
+  const auto claimed = store.claimDue(start, Calendar("en_US", "Europe/Berlin", zones));
   EXPECT_THAT(store.schedules(), SizeIs(testing::Le(3u)));
   EXPECT_THAT(store.delivered(), SizeIs(1 + claimed.size()));
 }

@@ -5,8 +5,10 @@
 #include <nlohmann/json.hpp>
 
 #include <Basalt/JSON.h>
+#include <Platform/Testing/FakeTimeZones.h>
 #include <Platform/Text/Calendar.h>
 #include <Varnel/Context/BuildSwitches.h>
+#include <Varnel/Context/VarnelModule.h>
 #include <Varnel/Reminders/SchedulePeriodOptionBox.h>
 
 namespace Varnel {
@@ -28,18 +30,38 @@ TEST(SchedulePeriodOption, HasItsPublishedIdentities) {
     Option option;
     const char* kind;
     const char* analytics;
+    const char* textKey;
+    const char* german;
     Platform::DateComponents interval;
   };
   const Row rows[] = {
-      {Option::never, "never", "Never", {.year = 1000}},
-      {Option::weekly, "weekly", "Weekly", {.day = 7}},
-      {Option::onceInTwoWeeks, "onceInTwoWeeks", "Once in Two Weeks", {.day = 14}},
-      {Option::monthly, "monthly", "Monthly", {.month = 1}},
-      {Option::onceInThreeMonths, "onceInThreeMonths", "Once in Three Months", {.month = 3}},
-      {Option::onceInSixMonths, "onceInSixMonths", "Once in Six Months", {.month = 6}},
-      {Option::annually, "annually", "Annually", {.year = 1}},
+      {Option::never, "never", "Never", "Never", "Nie", {.year = 1000}},
+      {Option::weekly, "weekly", "Weekly", "Weekly", "Jede Woche", {.day = 7}},
+      {Option::onceInTwoWeeks,
+       "onceInTwoWeeks",
+       "Once in Two Weeks",
+       "Once In Two Weeks",
+       "Alle zwei Wochen",
+       {.day = 14}},
+      {Option::monthly, "monthly", "Monthly", "Monthly", "Jeden Monat", {.month = 1}},
+      {Option::onceInThreeMonths,
+       "onceInThreeMonths",
+       "Once in Three Months",
+       "Once In Three Months",
+       "Alle drei Monate",
+       {.month = 3}},
+      {Option::onceInSixMonths,
+       "onceInSixMonths",
+       "Once in Six Months",
+       "Once In Six Months",
+       "Alle sechs Monate",
+       {.month = 6}},
+      {Option::annually, "annually", "Annually", "Annually", "Jedes Jahr", {.year = 1}},
   };
-  const Platform::Calendar gregorian("en_US", "UTC");
+  const Platform::Testing::FakeTimeZones zones;
+  const Platform::Calendar gregorian("en_US", "UTC", zones);
+  const auto module = std::make_shared<VarnelModule>();
+  VarnelModule::setInstance(module);
   std::int64_t raw = 0;
   for (const Row& row : rows) {
     EXPECT_EQ(Option::withRawValue(raw), row.option);
@@ -50,7 +72,14 @@ TEST(SchedulePeriodOption, HasItsPublishedIdentities) {
     EXPECT_EQ(row.option.repeatInterval(gregorian), row.interval);
     EXPECT_EQ(row.option.exportJSONObject(), (json{{"kind", row.kind}}));
     EXPECT_EQ(Option(json{{"kind", row.kind}}), row.option);
+    // Without texts the key stands for itself.
+    module->setBundle(Bundle(std::nullopt, {}));
+    EXPECT_EQ(row.option.description(), row.textKey);
+    module->setBundle(Bundle(VARNEL_TEST_RESOURCES, {"de"}));
+    EXPECT_EQ(row.option.description(), row.german);
+    EXPECT_EQ(Box(row.option).description(), row.german);
   }
+  VarnelModule::setInstance(nullptr);
   EXPECT_EQ(Option::withRawValue(7), std::nullopt);
   EXPECT_EQ(Option::withRawValue(-1), std::nullopt);
 }

@@ -11,6 +11,7 @@
 #include <Platform/Testing/FakeUser.h>
 #include <Platform/Testing/FakeWallClockTimer.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Tests/Support/Zones.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -41,12 +42,13 @@ class Listener final : public UserNotificationCenterDelegate {
 // A process of the product, on the store that all share.
 struct Process {
   explicit Process(const std::filesystem::path& file, Date now)
-      : clock(now), center({clock, locale, queue, log, server, timer}, file) {}
+      : clock(now), center({clock, locale, zones, queue, log, server, timer}, file) {}
 
   void listen() { center.setDelegate(listener); }
 
   Testing::SimulatedClock clock;
   Testing::FakeUserLocale locale;
+  Testing::FakeTimeZones zones = Tests::zonesOf2026();
   Testing::FakeMainQueue queue;
   Testing::CapturedSystemLog log;
   Testing::FakeNotificationServer server;
@@ -74,7 +76,7 @@ class ScheduledNotificationCenterTest : public ::testing::Test {
 };
 
 TEST_F(ScheduledNotificationCenterTest, AYearAwakeDeliversEveryWeek) {
-  process.locale.timeZone = "Europe/Berlin";
+  process.zones.local = "Europe/Berlin";
   process.listen();
   process.center.scheduleNotification(weekly());
   process.timer.advanceTo(start + days(364));
@@ -108,10 +110,10 @@ TEST_F(ScheduledNotificationCenterTest, AClockSetBackDeliversNothingTwice) {
 }
 
 TEST_F(ScheduledNotificationCenterTest, AMoveToAnotherZoneKeepsTheTimeOfDay) {
-  process.locale.timeZone = "Europe/Berlin";
+  process.zones.local = "Europe/Berlin";
   process.listen();
   process.center.scheduleNotification(weekly());
-  process.locale.timeZone = "Asia/Tokyo";
+  process.zones.local = "Asia/Tokyo";
   process.center.recheck();
   EXPECT_EQ(process.timer.armedDate(), start + week - 8h);
   EXPECT_EQ(process.center.scheduledNotifications().at(0).deliveryDate, start + week - 8h);
@@ -178,7 +180,14 @@ TEST_F(ScheduledNotificationCenterTest, ALaterRunTakesTheBannerOfAnEarlierOneAwa
   ASSERT_THAT(process.server.banners(), SizeIs(1));
   NotificationStore store(file, process.log);
   ASSERT_EQ(store.delivered().at(0).bannerReference, "1");
+  // Its successor takes the place only when it comes.
   process.center.scheduleNotification(weekly(start + 3 * week));
+  EXPECT_THAT(process.center.deliveredNotifications(), SizeIs(1));
+  EXPECT_THAT(process.server.banners(), SizeIs(1));
+  process.timer.advanceTo(start + 3 * week);
+  EXPECT_THAT(process.center.deliveredNotifications(), SizeIs(1));
+  EXPECT_THAT(process.server.history(), SizeIs(2));
+  process.center.removeDeliveredNotification(weekly());
   EXPECT_THAT(process.server.banners(), IsEmpty());
 }
 

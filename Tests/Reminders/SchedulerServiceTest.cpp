@@ -13,6 +13,7 @@
 #include <Platform/Testing/SimulatedClock.h>
 #include <Tallyhouse/AnalyticsTracker.h>
 #include <Tallyhouse/Testing/MemoryTransport.h>
+#include <Tests/Support/Zones.h>
 #include <Varnel/Context/ProcessFacts.h>
 #include <Varnel/Context/VarnelModule.h>
 #include <Varnel/Identification/CustomDimensionsHolder.h>
@@ -43,6 +44,7 @@ class SchedulerServiceTest : public ::testing::Test {
 
   Platform::Testing::SimulatedClock clock{now};
   Platform::Testing::FakeUserLocale locale;
+  Platform::Testing::FakeTimeZones zones = Tests::zonesOf2026();
   Platform::Testing::FakeMainQueue queue;
   Platform::Testing::FakeApplication application;
   Platform::Testing::FakeUserNotificationCenter center;
@@ -55,7 +57,7 @@ class SchedulerServiceTest : public ::testing::Test {
   const std::shared_ptr<Tallyhouse::Testing::MemoryTransport> sent =
       std::make_shared<Tallyhouse::Testing::MemoryTransport>();
   UserNotificationRouter router{{center, application, queue}};
-  SchedulerService service{{clock, locale, queue, facts, module},
+  SchedulerService service{{clock, locale, zones, queue, facts, module},
                            std::make_shared<Tallyhouse::AnalyticsTracker>(sent),
                            router};
 };
@@ -135,7 +137,6 @@ TEST_F(SchedulerServiceTest, SweepsEveryRepeatingNotificationAndNoOther) {
 TEST_F(SchedulerServiceTest, AClickIsReportedOnceAndTakesTheBannerAwayNotTheRepetition) {
   CustomDimensionsHolder::setClientIdentifier("client");
   CustomDimensionsHolder::setDownloadSourceURL(std::nullopt);
-  setenv("TZ", "UTC", 1);
   service.setSchedulePeriod(SchedulePeriodOption::weekly);
   const UserNotification reminder = onlyScheduled();
   center.deliverNotification(reminder);
@@ -159,13 +160,13 @@ TEST_F(SchedulerServiceTest, AClickIsReportedOnceAndTakesTheBannerAwayNotTheRepe
 }
 
 TEST_F(SchedulerServiceTest, TheNextDaysReminderComesADayLaterAtTheSameTime) {
-  locale.timeZone = "Europe/Berlin";
+  zones.local = "Europe/Berlin";
   clock.set(sys_days(2026y / March / 28) + 17h + 30min);  // 18:30 before the clocks change
   const NextDayCleanupReminderInfo info(1, 3'200'000'000);
   EXPECT_EQ(info, NextDayCleanupReminderInfo(1, 3'200'000'000));
   EXPECT_NE(info, NextDayCleanupReminderInfo(2, 3'200'000'000));
   EXPECT_NE(info, NextDayCleanupReminderInfo(1, 3));
-  EXPECT_EQ(info.makeUserNotification({clock, locale, *module}),
+  EXPECT_EQ(info.makeUserNotification({clock, locale, zones, *module}),
             (UserNotification{.identifier = "com.quennel.Orvane2.daily-cleanup-reminder",
                               .title = "Your duplicates are waiting",
                               .informativeText = "You can still free up to 3.2 GB of disk space.",
@@ -173,7 +174,7 @@ TEST_F(SchedulerServiceTest, TheNextDaysReminderComesADayLaterAtTheSameTime) {
                               .otherButtonTitle = "Not Now",
                               .deliveryDate = sys_days(2026y / March / 29) + 16h + 30min}));
   clock.set(Platform::Date::max());
-  EXPECT_EQ(info.makeUserNotification({clock, locale, *module}).deliveryDate, std::nullopt);
+  EXPECT_EQ(info.makeUserNotification({clock, locale, zones, *module}).deliveryDate, std::nullopt);
 }
 
 }  // namespace

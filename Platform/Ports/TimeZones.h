@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <chrono>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include <Platform/Api.h>
+#include <Platform/Values/Date.h>
+
+namespace Varnel::Platform {
+
+/// How the clocks of one region run. Immutable; any thread.
+class VARNEL_API TimeZone {
+ public:
+  struct Offset final {
+    std::chrono::seconds fromUTC{0};  ///< Negative west of Greenwich.
+    bool isDaylightSaving = false;
+
+    bool operator==(const Offset&) const = default;
+  };
+
+  virtual ~TimeZone() = default;
+
+  /// What the clocks show beyond UTC at `date`.
+  [[nodiscard]] virtual Offset offsetAt(Date date) const = 0;
+
+  /// The first moment after `date` from which another offset may count; until then that of `date`
+  /// does. Absent when there is none.
+  [[nodiscard]] virtual std::optional<Date> nextChange(Date date) const = 0;
+};
+
+/// The time zones that the system knows. Any thread.
+///
+///     const auto zone = timeZones.zone(timeZones.localIdentifier());
+///     const auto clock = date + zone->offsetAt(date).fromUTC;
+class VARNEL_API TimeZones {
+ public:
+  virtual ~TimeZones() = default;
+
+  /// The zone where the user is now: by its name in the time zone database ("Europe/Vienna"), or
+  /// by whatever else names it to `zone`.
+  [[nodiscard]] virtual std::string localIdentifier() const = 0;
+
+  /// The zone with the rules of now; never null. One that the system does not know runs on UTC. It
+  /// may outlive this object.
+  [[nodiscard]] virtual std::shared_ptr<const TimeZone> zone(
+      const std::string& identifier) const = 0;
+};
+
+}  // namespace Varnel::Platform

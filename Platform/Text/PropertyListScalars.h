@@ -1,0 +1,18 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string_view>
+
+namespace Varnel::Platform {
+
+/// Whether the text of an element, as an XML property list has it, is the whole of one value. The
+/// parser behind `parsePropertyList` itself makes something of any text.
+///
+/// Whole numbers are decimal without leading zeros or hexadecimal ("0x1F"), and fit 64 bits, with
+/// or without a sign; reals fit a double. Blanks may stand around numbers.
+[[nodiscard]] bool isWholeNumber(std::string_view text);
+[[nodiscard]] bool isReal(std::string_view text);
+/// A moment that the calendar has: "2024-02-29T12:00:00Z".
+[[nodiscard]] bool isDate(std::string_view text);
+
+}  // namespace Varnel::Platform
