@@ -48,10 +48,12 @@ class Recording {
     return static_cast<double>(samples_.size()) / rate;
   }
 
-  double peak() {
+  // The highest sample within the first so many seconds.
+  double peak(double within = 10) {
     const std::lock_guard lock(mutex_);
+    const auto count = std::min(samples_.size(), static_cast<std::size_t>(within * rate));
     float highest = 0;
-    for (const float sample : samples_) highest = std::max(highest, std::abs(sample));
+    for (std::size_t i = 0; i < count; ++i) highest = std::max(highest, std::abs(samples_[i]));
     return highest;
   }
 
@@ -120,15 +122,15 @@ class SoundPlayerTest : public ::testing::Test {
                       }}};
 };
 
-TEST_F(SoundPlayerTest, EverySoundIsShortSmallAndAsLoudAsTheOthers) {
+TEST_F(SoundPlayerTest, EverySoundBeginsInSilenceAndIsShortSmallAndAsLoudAsTheOthers) {
   const std::pair<Sound, double> durations[] = {
-      {Sound::tutorial, 0.8},
-      {Sound::start, 1.5},
-      {Sound::scanComplete, 1.2},
-      {Sound::cleanComplete, 1.6},
-      {Sound::achievementNotification, 1.1},
-      {Sound::rankIncreased, 1.9},
-      {Sound::purchase, 0.8},
+      {Sound::tutorial, 0.86},
+      {Sound::start, 1.56},
+      {Sound::scanComplete, 1.26},
+      {Sound::cleanComplete, 1.66},
+      {Sound::achievementNotification, 1.16},
+      {Sound::rankIncreased, 1.96},
+      {Sound::purchase, 0.86},
   };
   for (const auto& [sound, seconds] : durations) {
     SCOPED_TRACE(sound.fileName());
@@ -139,6 +141,8 @@ TEST_F(SoundPlayerTest, EverySoundIsShortSmallAndAsLoudAsTheOthers) {
     EXPECT_NEAR(recordings.back()->seconds(), seconds, 0.06);
     EXPECT_NEAR(recordings.back()->loudness(), -19, 2);
     EXPECT_LT(recordings.back()->peak(), 0.9);
+    EXPECT_LT(recordings.back()->peak(0.02), 0.001) << "a first sample that is loud clicks";
+    EXPECT_GT(recordings.back()->peak(0.09), 0.2) << "the attack follows the silence";
   }
 }
 
@@ -150,7 +154,7 @@ TEST_F(SoundPlayerTest, TheEndOfASoundThatWasCutOffNeverArrives) {
   engine.play(Sound::start);
   EXPECT_FALSE(first->isPlaying());
   ASSERT_TRUE(drainUntilIdle());
-  EXPECT_NEAR(recordings.back()->seconds(), 1.5, 0.06);
+  EXPECT_NEAR(recordings.back()->seconds(), 1.56, 0.06);
 }
 
 TEST_F(SoundPlayerTest, DamagedFilesAreSilent) {
@@ -172,7 +176,7 @@ TEST_F(SoundPlayerTest, ATruncatedFileEndsEarly) {
   engine.play(Sound::start);
   ASSERT_TRUE(drainUntilIdle());
   EXPECT_GT(recordings.back()->seconds(), 0.5);
-  EXPECT_LT(recordings.back()->seconds(), 1.3);
+  EXPECT_LT(recordings.back()->seconds(), 1.35);
 }
 
 TEST_F(SoundPlayerTest, AMachineThatCannotPlayStillComesToTheEnd) {
