@@ -4,10 +4,10 @@
 #include <deque>
 #include <mutex>
 #include <system_error>
-#include <thread>
 #include <utility>
 
 #include <Basalt/Executor.h>
+#include <Platform/Concurrency/StartThread.h>
 
 namespace Basalt {
 namespace {
@@ -22,7 +22,7 @@ class ConcurrentQueue final : public Executor {
       return;
     }
     try {
-      std::thread(&ConcurrentQueue::work, this).detach();
+      Varnel::Platform::startThread("concurrent", [this] { work(); }).detach();
       ++threads_;
     } catch (const std::system_error&) {
       // The threads that there are will come to it.

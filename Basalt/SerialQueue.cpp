@@ -9,13 +9,13 @@
 #include <mutex>
 #include <optional>
 #include <system_error>
-#include <thread>
 
 #include <fmt/format.h>
 
 #include <Basalt/Semaphore.h>
 #include <Basalt/ThreadID.h>
 #include <Platform/Concurrency/CurrentThread.h>
+#include <Platform/Concurrency/StartThread.h>
 
 namespace Basalt {
 namespace {
@@ -319,14 +319,13 @@ void SerialQueue::Core::close() {
 
 // Under the mutex.
 bool SerialQueue::Core::startWorker() noexcept try {
-  if (!hasWorker_) std::thread([this] { work(); }).detach();
+  if (!hasWorker_) Varnel::Platform::startThread(label_, [this] { work(); }).detach();
   return hasWorker_ = true;
 } catch (const std::system_error&) {
   return false;
 }
 
 void SerialQueue::Core::work() {
-  Varnel::Platform::nameCurrentThread(label_);
   Varnel::Platform::setCurrentThreadQuality(quality_);
   for (;;) {
     work_.wait();

@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <utility>
 
+#include <Platform/Concurrency/StartThread.h>
 #include <Platform/Ports/Clock.h>
 #include <Tallyhouse/EventSpool.h>
 
@@ -28,7 +29,7 @@ void DeliveryWorker::resume() {
   const std::lock_guard lock(mutex_);
   if (!isPaused_) return;
   transfer_ = std::stop_source();
-  if (!thread_.joinable()) thread_ = std::thread([this] { run(); });
+  if (!thread_.joinable()) thread_ = Varnel::Platform::startThread("analytics", [this] { run(); });
   isPaused_ = false;
   isWoken_ = true;
   changed_.notify_all();

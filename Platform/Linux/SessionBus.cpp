@@ -4,6 +4,8 @@
 #include <memory>
 #include <utility>
 
+#include <Platform/POSIX/BlockedSignals.h>
+
 namespace Varnel::Platform::Linux {
 namespace {
 
@@ -62,6 +64,8 @@ std::string SessionBus::connect() {
   constexpr auto flags =
       static_cast<GDBusConnectionFlags>(G_DBUS_CONNECTION_FLAGS_AUTHENTICATION_CLIENT |
                                         G_DBUS_CONNECTION_FLAGS_MESSAGE_BUS_CONNECTION);
+  // The first connection of the process starts the thread that serves all of them.
+  const POSIX::BlockedSignals inheritedByTheThread;
   UniqueHandle<GDBusConnection*, disconnect> connection(
       g_dbus_connection_new_for_address_sync(address.get(), flags, nullptr, nullptr, &error));
   if (!connection) return take(error);

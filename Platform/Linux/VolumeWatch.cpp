@@ -2,8 +2,6 @@
 #include <Platform/Linux/VolumeWatch.h>
 
 #include <poll.h>
-#include <pthread.h>
-#include <signal.h>
 #include <sys/eventfd.h>
 #include <unistd.h>
 
@@ -13,24 +11,10 @@
 #include <system_error>
 #include <utility>
 
+#include <Platform/Concurrency/StartThread.h>
+
 namespace Varnel::Platform::Linux {
 namespace {
-
-// Keeps the process's signals away from a thread that is started meanwhile.
-class SignalsBlocked final {
- public:
-  SignalsBlocked() {
-    sigset_t all;
-    ::sigfillset(&all);
-    ::pthread_sigmask(SIG_SETMASK, &all, &before_);
-  }
-  ~SignalsBlocked() { ::pthread_sigmask(SIG_SETMASK, &before_, nullptr); }
-  SignalsBlocked(const SignalsBlocked&) = delete;
-  SignalsBlocked& operator=(const SignalsBlocked&) = delete;
-
- private:
-  sigset_t before_;
-};
 
 void appendMissing(std::vector<VolumeChange>& changes, VolumeChange::Kind kind,
                    const VolumeTable& some, const VolumeTable& others) {
@@ -68,8 +52,7 @@ bool VolumeWatch::begin() {
   told_ = table_->current();
   if (!told_) return false;
   try {
-    const SignalsBlocked blocked;
-    thread_ = std::thread([this] { run(); });
+    thread_ = startThread("volume-watch", [this] { run(); });
   } catch (const std::system_error&) {
     return false;
   }
@@ -84,7 +67,6 @@ VolumeWatch::~VolumeWatch() {
 }
 
 void VolumeWatch::run() {
-  ::pthread_setname_np(::pthread_self(), "volume-watch");
   pollfd waiting[] = {{.fd = mountInfo_.get(), .events = POLLPRI, .revents = 0},
                       {.fd = stop_.get(), .events = POLLIN, .revents = 0}};
   for (;;) {

@@ -5,6 +5,7 @@
 #include <condition_variable>
 #include <mutex>
 
+#include <Platform/Concurrency/StartThread.h>
 #include <orvane/Console.h>
 #include <orvane/Scan/ScanObserver.h>
 
@@ -13,10 +14,10 @@ namespace Orvane {
 ProgressLine::ProgressLine(Console& console, const ScanControl& control)
     : console_(console),
       control_(control),
-      thread_([this](const std::stop_token& stop) { show(stop); }) {}
+      thread_(Varnel::Platform::startThread("progress", [this] { show(stop_.get_token()); })) {}
 
 ProgressLine::~ProgressLine() {
-  thread_.request_stop();
+  stop_.request_stop();
   thread_.join();
   console_.clearStatus();
 }

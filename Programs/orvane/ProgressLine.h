@@ -27,7 +27,8 @@ class ProgressLine final {
 
   Console& console_;
   const ScanControl& control_;
-  std::jthread thread_;
+  std::stop_source stop_;
+  std::thread thread_;
 };
 
 }  // namespace Orvane

@@ -8,6 +8,7 @@
 #include <fmt/format.h>
 
 #include <Platform/Concurrency/CurrentThread.h>
+#include <Platform/Concurrency/StartThread.h>
 
 namespace Varnel {
 namespace {
@@ -37,7 +38,7 @@ LogFileChannel::~LogFileChannel() {
 
 void LogFileChannel::startWriter() {
   try {
-    writer_ = std::thread(&LogFileChannel::runWriter, this);
+    writer_ = Platform::startThread("Logging Queue", [this] { runWriter(); });
   } catch (const std::system_error&) {
     // A process that may have no more threads still gets its log, in its own time.
     writeThrough();
@@ -84,7 +85,6 @@ void LogFileChannel::writeThrough() {
 }
 
 void LogFileChannel::runWriter() {
-  Platform::nameCurrentThread("Logging Queue");
   Platform::setCurrentThreadQuality(Platform::QualityOfService::background);
   flush();
   std::unique_lock lock(gatherMutex_);

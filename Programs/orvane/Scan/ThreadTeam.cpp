@@ -5,6 +5,8 @@
 #include <mutex>
 #include <thread>
 
+#include <Platform/Concurrency/StartThread.h>
+
 namespace Orvane {
 
 void runOnThreads(unsigned count, const std::function<void(unsigned)>& work) {
@@ -18,15 +20,16 @@ void runOnThreads(unsigned count, const std::function<void(unsigned)>& work) {
       failure = std::current_exception();
     }
   };
-  {
-    std::vector<std::jthread> helpers;
-    try {
-      for (unsigned worker = 1; worker < count; ++worker) helpers.emplace_back(guarded, worker);
-    } catch (const std::system_error&) {
-      // Out of threads: those that run do the work.
-    }
-    guarded(0);
+  std::vector<std::thread> helpers;
+  helpers.reserve(count);
+  try {
+    for (unsigned worker = 1; worker < count; ++worker)
+      helpers.push_back(Varnel::Platform::startThread("scan", [&, worker] { guarded(worker); }));
+  } catch (const std::exception&) {
+    // Out of threads or memory: those that run do the work.
   }
+  guarded(0);
+  for (std::thread& helper : helpers) helper.join();
   if (failure) std::rethrow_exception(failure);
 }
 

@@ -1,0 +1,19 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Concurrency/StartThread.h>
+
+#include <utility>
+
+#include <Platform/Concurrency/CurrentThread.h>
+#include <Platform/POSIX/BlockedSignals.h>
+
+namespace Varnel::Platform {
+
+std::thread startThread(std::string name, std::function<void()> body) {
+  const POSIX::BlockedSignals inheritedByTheThread;
+  return std::thread([name = std::move(name), body = std::move(body)] {
+    nameCurrentThread(name);
+    body();
+  });
+}
+
+}  // namespace Varnel::Platform
