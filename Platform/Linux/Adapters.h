@@ -44,7 +44,8 @@ class MountTable;
 [[nodiscard]] std::unique_ptr<ProcessLauncher> makeProcessLauncher();
 [[nodiscard]] std::unique_ptr<UserDefaults> makeUserDefaults();
 [[nodiscard]] std::unique_ptr<MainQueue> makeMainQueue();
-[[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog);
+[[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog,
+                                                           MainQueue& mainQueue);
 [[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(SystemLog& systemLog);
 [[nodiscard]] std::unique_ptr<WallClockTimer> makeWallClockTimer(SystemLog& systemLog);
 

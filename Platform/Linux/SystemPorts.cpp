@@ -66,7 +66,7 @@ const Ports& systemPorts() {
       .processInfo = keep(Linux::makeProcessInfo()),
       .processLauncher = keep(Linux::makeProcessLauncher()),
       .securityScope = keep(POSIX::makeSecurityScope()),
-      .soundPlayer = keep(Linux::makeSoundPlayer(systemLog)),
+      .soundPlayer = keep(Linux::makeSoundPlayer(systemLog, mainQueue)),
       .standardOutput = keep(POSIX::makeStandardOutput()),
       .systemLog = systemLog,
       .userAccount = keep(POSIX::makeUserAccount()),
