@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <memory>
 #include <string>
 
@@ -46,7 +47,9 @@ class MountTable;
 [[nodiscard]] std::unique_ptr<MainQueue> makeMainQueue();
 [[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog,
                                                            MainQueue& mainQueue);
-[[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(SystemLog& systemLog);
+/// `patience` is how long a connection to the session bus may take.
+[[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(
+    SystemLog& systemLog, std::chrono::milliseconds patience = std::chrono::seconds(10));
 [[nodiscard]] std::unique_ptr<WallClockTimer> makeWallClockTimer(SystemLog& systemLog);
 
 /// What notification centers are made with, beyond a server and a timer each.
