@@ -25,6 +25,7 @@
 
 #include <Platform/Generic/HostedApplication.h>
 #include <Platform/Generic/SQLiteCookieStorage.h>
+#include <Platform/Generic/WatchedMainQueue.h>
 #include <Platform/Linux/Adapters.h>
 #include <Platform/Linux/UserFolders.h>
 #include <Platform/POSIX/Adapters.h>
@@ -50,7 +51,7 @@ const Ports& systemPorts() {
   static const auto mountTable = Linux::makeMountTable();
   static Clock& clock = keep(POSIX::makeClock());
   static SystemLog& systemLog = keep(POSIX::makeSystemLog());
-  static MainQueue& mainQueue = keep(Linux::makeMainQueue());
+  static MainQueue& mainQueue = *new WatchedMainQueue(Linux::makeMainQueue(), systemLog);
   static UserLocale& userLocale = keep(POSIX::makeUserLocale());
   static const Ports& ports = *new Ports{
       .appendFiles = keep(POSIX::makeAppendFiles()),
