@@ -102,7 +102,7 @@ SessionBus::Connection SessionBus::open(GCancellable* cancellable, std::string& 
   return connection;
 }
 
-void SessionBus::finish(const std::shared_ptr<Attempt>& attempt, Connection connection,
+void SessionBus::finish(std::shared_ptr<Attempt> attempt, Connection connection,
                         const std::string& error) {
   // It was given up.
   if (attempt != attempt_) return;

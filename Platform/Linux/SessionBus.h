@@ -61,8 +61,7 @@ class SessionBus final : public std::enable_shared_from_this<SessionBus> {
   void start();
   static void replied(GObject* connection, GAsyncResult* result, gpointer awaited) noexcept;
   static Connection open(GCancellable* cancellable, std::string& error);
-  void finish(const std::shared_ptr<Attempt>& attempt, Connection connection,
-              const std::string& error);
+  void finish(std::shared_ptr<Attempt> attempt, Connection connection, const std::string& error);
   void adopt(Connection connection);
   void unsubscribe();
 
