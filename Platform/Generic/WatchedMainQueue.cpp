@@ -46,7 +46,7 @@ void WatchedMainQueue::post(Block block) {
 
 void WatchedMainQueue::watch() try {
   queue_->post([firstRun = firstRun_] { firstRun->come(); });
-  thread_ = startThread("main-queue", [this] {
+  thread_ = startThread("queue-watch", [this] {
     if (!firstRun_->comesWithin(patience_))
       systemLog_.write(
           "Nothing runs the main queue: notifications, sounds and progress wait for it. A host "
