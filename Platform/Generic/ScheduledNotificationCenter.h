@@ -6,6 +6,7 @@
 #include <vector>
 
 #include <Platform/Api.h>
+#include <Platform/Ports/NotificationServer.h>
 #include <Platform/Ports/UserNotificationCenter.h>
 
 namespace Varnel::Platform {
@@ -13,7 +14,6 @@ namespace Varnel::Platform {
 class Calendar;
 class Clock;
 class MainQueue;
-class NotificationServer;
 class NotificationStore;
 class SystemLog;
 class TimeZones;
@@ -51,6 +51,7 @@ class VARNEL_API ScheduledNotificationCenter final : public UserNotificationCent
   void deliverNotification(const UserNotification& notification) override;
   [[nodiscard]] std::vector<UserNotification> deliveredNotifications() override;
   void removeDeliveredNotification(const UserNotification& notification) override;
+  [[nodiscard]] bool isBusy() const override { return ports_.notificationServer.isBusy(); }
 
   /// To be called when something else than this center may have changed what is due and when: the
   /// user's time zone, or another process the store.

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <memory>
 #include <string>
 
@@ -49,8 +50,11 @@ class MountTable;
 [[nodiscard]] std::unique_ptr<UserDefaults> makeUserDefaults();
 [[nodiscard]] std::unique_ptr<MainQueue> makeMainQueue();
 [[nodiscard]] std::unique_ptr<StandardOutput> makeStandardOutput();
-[[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog);
-[[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(SystemLog& systemLog);
+[[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog,
+                                                           MainQueue& mainQueue);
+/// `patience` is how long a connection to the session bus may take.
+[[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(
+    SystemLog& systemLog, std::chrono::milliseconds patience = std::chrono::seconds(10));
 [[nodiscard]] std::unique_ptr<WallClockTimer> makeWallClockTimer(SystemLog& systemLog);
 
 /// What notification centers are made with, beyond a server and a timer each.

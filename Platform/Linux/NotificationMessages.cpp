@@ -100,11 +100,8 @@ std::optional<std::uint32_t> bannerNumberIn(GDBusMessage* reply) {
 }
 
 BusMessage closeRequest(const BannerAddress& banner) {
-  BusMessage message = request(banner.server.c_str(), "CloseNotification",
-                               g_variant_new("(u)", guint32{banner.number}));
-  // Whether the banner was still there is of no interest.
-  g_dbus_message_set_flags(message.get(), G_DBUS_MESSAGE_FLAGS_NO_REPLY_EXPECTED);
-  return message;
+  return request(banner.server.c_str(), "CloseNotification",
+                 g_variant_new("(u)", guint32{banner.number}));
 }
 
 std::optional<std::string> errorIn(GDBusMessage* reply) {

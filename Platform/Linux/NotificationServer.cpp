@@ -18,34 +18,46 @@ namespace {
 // What the server's replies and signals refer to. Replies may outlive the adapter.
 class Desktop final : public std::enable_shared_from_this<Desktop> {
  public:
-  explicit Desktop(SystemLog& systemLog)
-      : systemLog_(systemLog), bus_([this](const char* sender, const char* name, GVariant* body) {
-          receive(sender, name, body);
-        }) {}
+  Desktop(SystemLog& systemLog, std::chrono::milliseconds patience)
+      : systemLog_(systemLog),
+        bus_(std::make_shared<SessionBus>([this](const char* sender, const char* name,
+                                                 GVariant* body) { receive(sender, name, body); },
+                                          patience)) {}
 
   std::weak_ptr<NotificationServer::Observer> observer;
 
   void show(const std::string& token, const Banner& banner,
             const std::optional<std::string>& replacedReference) {
-    if (const std::string error = bus_.connect(); !error.empty()) return report(error);
     Shown& shown = shown_[token];
     if (!shown.address && replacedReference)
       shown.address = BannerAddress::parse(*replacedReference);
     shown.version = ++lastVersion_;
-    // Asked each time, because the server may be another one than before.
-    send(capabilitiesRequest(), token, shown.version,
-         [banner](Desktop& self, GDBusMessage* reply, const Key& key) {
-           self.notify(key, banner, g_dbus_message_get_sender(reply), capabilitiesIn(reply));
-         });
+    bus_->connect([weak = weak_from_this(), key = Key{token, shown.version},
+                   banner](const std::string& error) {
+      const auto self = weak.lock();
+      if (!self || !self->isCurrent(key)) return;
+      if (!error.empty()) return self->fail(key, error);
+      // Asked each time, because the server may be another one than before.
+      self->send(capabilitiesRequest(), key,
+                 [banner](Desktop& desktop, GDBusMessage* reply, const Key& asked) {
+                   desktop.notify(asked, banner, g_dbus_message_get_sender(reply),
+                                  capabilitiesIn(reply));
+                 });
+    });
   }
 
   void close(const std::string& token, const std::optional<std::string>& reference) {
     auto address = reference ? BannerAddress::parse(*reference) : std::nullopt;
     if (const auto shown = shown_.extract(token); shown && shown.mapped().address)
       address = shown.mapped().address;
-    if (!address || !bus_.connect().empty() || address->bus != bus_.name()) return;
-    bus_.send(closeRequest(*address));
+    if (!address) return;
+    bus_->connect([weak = weak_from_this(), address](const std::string& error) {
+      const auto self = weak.lock();
+      if (self && error.empty() && address->bus == self->bus_->name()) self->close(*address);
+    });
   }
+
+  bool isBusy() const { return bus_->isBusy(); }
 
  private:
   struct Shown {
@@ -63,38 +75,46 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
   }
 
   template <typename Use>
-  void send(const BusMessage& message, const std::string& token, std::uint64_t version, Use use) {
-    bus_.send(message, [weak = weak_from_this(), key = Key{token, version}, use](
-                           GDBusMessage* reply, const std::string& error) {
-      const auto self = weak.lock();
-      if (!self) return;
-      if (reply) return use(*self, reply, key);
-      self->report(error);
-      if (self->isCurrent(key)) self->shown_.erase(key.token);
-    });
+  void send(const BusMessage& message, const Key& key, Use use) {
+    bus_->send(message,
+               [weak = weak_from_this(), key, use](GDBusMessage* reply, const std::string& error) {
+                 const auto self = weak.lock();
+                 if (!self) return;
+                 reply ? use(*self, reply, key) : self->fail(key, error);
+               });
+  }
+
+  // Whether the banner was still there is of no interest.
+  void close(const BannerAddress& address) {
+    bus_->send(closeRequest(address), [](GDBusMessage*, const std::string&) {});
+  }
+
+  void fail(const Key& key, const std::string& error) {
+    systemLog_.write("Cannot show a notification: " + error);
+    if (isCurrent(key)) shown_.erase(key.token);
   }
 
   void notify(const Key& key, const Banner& banner, const std::string& server,
               ServerCapabilities capabilities) {
     if (!isCurrent(key)) return;
     const auto& replaced = shown_[key.token].address;
-    const bool knowsIt = replaced && replaced->bus == bus_.name() && replaced->server == server;
+    const bool knowsIt = replaced && replaced->bus == bus_->name() && replaced->server == server;
     send(notifyRequest(server, applicationName_, banner, capabilities,
                        knowsIt ? replaced->number : 0),
-         key.token, key.version, [server](Desktop& self, GDBusMessage* reply, const Key& shown) {
+         key, [server](Desktop& self, GDBusMessage* reply, const Key& shown) {
            if (const auto number = bannerNumberIn(reply))
-             self.hasShown(shown, {self.bus_.name(), server, *number});
+             self.hasShown(shown, {self.bus_->name(), server, *number});
          });
   }
 
   void hasShown(const Key& key, const BannerAddress& address) {
     const auto shown = shown_.find(key.token);
     // It was closed before the server had answered.
-    if (shown == shown_.end()) return bus_.send(closeRequest(address));
+    if (shown == shown_.end()) return close(address);
     const auto earlier = std::exchange(shown->second.address, address);
     if (earlier && earlier->bus == address.bus && earlier->server == address.server &&
         earlier->number != address.number)
-      bus_.send(closeRequest(*earlier));
+      close(*earlier);
     // It is being shown anew, in the place of this one.
     if (!isCurrent(key)) return;
     if (const auto told = observer.lock()) told->bannerShown(key.token, address.reference());
@@ -105,13 +125,13 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     if (name == "ActionInvoked" && g_variant_is_of_type(body, G_VARIANT_TYPE("(us)"))) {
       const char* action = nullptr;
       g_variant_get(body, "(u&s)", &number, &action);
-      invoke({bus_.name(), sender, number}, action);
+      invoke({bus_->name(), sender, number}, action);
     }
     if (name == "NotificationClosed" && g_variant_is_of_type(body, G_VARIANT_TYPE("(uu)"))) {
       guint32 reason = 0;
       g_variant_get(body, "(uu)", &number, &reason);
       // An expired one may be called back from the server's history.
-      if (reason != expired) forget({bus_.name(), sender, number}, reason == dismissedByUser);
+      if (reason != expired) forget({bus_->name(), sender, number}, reason == dismissedByUser);
     }
   }
 
@@ -126,7 +146,7 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     const auto token = take(address);
     if (!token) return;
     // Not every server takes it away by itself.
-    bus_.send(closeRequest(address));
+    close(address);
     const auto told = observer.lock();
     if (!told) return;
     if (action == dismissAction)
@@ -141,21 +161,17 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     if (token && told && isDismissed) told->bannerDismissed(*token);
   }
 
-  void report(const std::string& error) {
-    systemLog_.write("Cannot show a notification: " + error);
-  }
-
   SystemLog& systemLog_;
   const std::string applicationName_ = applicationFolderName();
-  SessionBus bus_;
+  const std::shared_ptr<SessionBus> bus_;
   std::map<std::string, Shown> shown_;
   std::uint64_t lastVersion_ = 0;
 };
 
 class BusNotificationServer final : public NotificationServer {
  public:
-  explicit BusNotificationServer(SystemLog& systemLog)
-      : desktop_(std::make_shared<Desktop>(systemLog)) {}
+  BusNotificationServer(SystemLog& systemLog, std::chrono::milliseconds patience)
+      : desktop_(std::make_shared<Desktop>(systemLog, patience)) {}
 
   void setObserver(std::weak_ptr<Observer> observer) override {
     desktop_->observer = std::move(observer);
@@ -167,6 +183,7 @@ class BusNotificationServer final : public NotificationServer {
   void close(const std::string& token, const std::optional<std::string>& reference) override {
     desktop_->close(token, reference);
   }
+  bool isBusy() const override { return desktop_->isBusy(); }
 
  private:
   const std::shared_ptr<Desktop> desktop_;
@@ -174,8 +191,9 @@ class BusNotificationServer final : public NotificationServer {
 
 }  // namespace
 
-std::unique_ptr<NotificationServer> makeNotificationServer(SystemLog& systemLog) {
-  return std::make_unique<BusNotificationServer>(systemLog);
+std::unique_ptr<NotificationServer> makeNotificationServer(SystemLog& systemLog,
+                                                           std::chrono::milliseconds patience) {
+  return std::make_unique<BusNotificationServer>(systemLog, patience);
 }
 
 }  // namespace Varnel::Platform::Linux

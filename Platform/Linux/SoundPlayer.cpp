@@ -3,6 +3,7 @@
 
 #include <utility>
 
+#include <Platform/Generic/BackgroundSoundPlayer.h>
 #include <Platform/Linux/Adapters.h>
 #include <Platform/Linux/GStreamer/Module.h>
 #include <Platform/POSIX/Modules.h>
@@ -11,34 +12,45 @@
 namespace Varnel::Platform::Linux {
 namespace {
 
-// Hands everything to the player of the module. Without the module nothing can be loaded.
+constexpr const char* module = "libvarnel-gstreamer.so";
+
+// Plays by what is in the module. Without the module nothing can be loaded.
 class ModuleSoundPlayer final : public SoundPlayer {
  public:
-  explicit ModuleSoundPlayer(SystemLog& systemLog) : systemLog_(systemLog) {}
+  ModuleSoundPlayer(SystemLog& systemLog, MainQueue& mainQueue)
+      : systemLog_(systemLog), player_(mainQueue, [&systemLog] { return loadOutput(systemLog); }) {}
 
   std::shared_ptr<PlayableSound> load(std::string bytes) override {
-    if (!std::exchange(hasLooked_, true)) loadPlayer();
-    return player_ ? player_->load(std::move(bytes)) : nullptr;
+    if (!missingPart()) return player_.load(std::move(bytes));
+    if (!std::exchange(hasReported_, true))
+      systemLog_.write("The sound module is missing; there will be no sounds.");
+    return nullptr;
+  }
+
+  std::optional<std::string> missingPart() const override {
+    if (POSIX::hasModule(module)) return std::nullopt;
+    return std::string("the sound module, ") + module + ", was not built or is not installed";
   }
 
  private:
-  void loadPlayer() {
+  static std::unique_ptr<SoundOutput> loadOutput(SystemLog& systemLog) {
     // Never closed again: GStreamer cannot be unloaded.
-    if (void* make = POSIX::moduleFunction("libvarnel-gstreamer.so", "varnelMakeSoundPlayer"))
-      player_.reset(reinterpret_cast<decltype(&varnelMakeSoundPlayer)>(make)());
-    else
-      systemLog_.write("The sound module is missing; there will be no sounds.");
+    if (void* make = POSIX::moduleFunction(module, "varnelMakeSoundOutput"))
+      return std::unique_ptr<SoundOutput>(
+          reinterpret_cast<decltype(&varnelMakeSoundOutput)>(make)());
+    systemLog.write("The sound module does not load; there will be no sounds.");
+    return nullptr;
   }
 
   SystemLog& systemLog_;
-  bool hasLooked_ = false;
-  std::unique_ptr<SoundPlayer> player_;
+  bool hasReported_ = false;
+  BackgroundSoundPlayer player_;
 };
 
 }  // namespace
 
-std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog) {
-  return std::make_unique<ModuleSoundPlayer>(systemLog);
+std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog, MainQueue& mainQueue) {
+  return std::make_unique<ModuleSoundPlayer>(systemLog, mainQueue);
 }
 
 }  // namespace Varnel::Platform::Linux

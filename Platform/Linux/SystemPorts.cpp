@@ -26,6 +26,7 @@
 
 #include <Platform/Generic/HostedApplication.h>
 #include <Platform/Generic/SQLiteCookieStorage.h>
+#include <Platform/Generic/WatchedMainQueue.h>
 #include <Platform/Linux/Adapters.h>
 #include <Platform/Linux/UserFolders.h>
 #include <Platform/POSIX/Adapters.h>
@@ -51,7 +52,7 @@ const Ports& systemPorts() {
   static const auto mountTable = Linux::makeMountTable();
   static Clock& clock = keep(POSIX::makeClock());
   static SystemLog& systemLog = keep(POSIX::makeSystemLog());
-  static MainQueue& mainQueue = keep(Linux::makeMainQueue());
+  static MainQueue& mainQueue = *new WatchedMainQueue(Linux::makeMainQueue(), systemLog);
   static TimeZones& timeZones = keep(Linux::makeTimeZones());
   static UserLocale& userLocale = keep(POSIX::makeUserLocale());
   static const Ports& ports = *new Ports{
@@ -68,7 +69,7 @@ const Ports& systemPorts() {
       .processInfo = keep(Linux::makeProcessInfo()),
       .processLauncher = keep(Linux::makeProcessLauncher()),
       .securityScope = keep(POSIX::makeSecurityScope()),
-      .soundPlayer = keep(Linux::makeSoundPlayer(systemLog)),
+      .soundPlayer = keep(Linux::makeSoundPlayer(systemLog, mainQueue)),
       .standardOutput = keep(Linux::makeStandardOutput()),
       .systemLog = systemLog,
       .timeZones = timeZones,

@@ -23,9 +23,8 @@ fs::path ownFolder() {
   return fs::canonical(image.dli_fname, failed).parent_path();
 }
 
-}  // namespace
-
-void* moduleFunction(const char* module, const char* symbol) {
+// The file of a module; empty when there is none.
+fs::path fileOf(const char* module) {
   const fs::path folder = ownFolder();
   const std::array candidates = {
       folder / modulesFolder / module,
@@ -33,11 +32,21 @@ void* moduleFunction(const char* module, const char* symbol) {
   };
   for (const fs::path& candidate : candidates) {
     std::error_code failed;
-    if (!fs::exists(candidate, failed)) continue;
-    void* const loaded = ::dlopen(candidate.c_str(), RTLD_NOW | RTLD_LOCAL);
-    return loaded ? ::dlsym(loaded, symbol) : nullptr;
+    if (fs::exists(candidate, failed)) return candidate;
   }
-  return nullptr;
+  return {};
+}
+
+}  // namespace
+
+bool hasModule(const char* module) {
+  return !fileOf(module).empty();
+}
+
+void* moduleFunction(const char* module, const char* symbol) {
+  const fs::path file = fileOf(module);
+  void* const loaded = file.empty() ? nullptr : ::dlopen(file.c_str(), RTLD_NOW | RTLD_LOCAL);
+  return loaded ? ::dlsym(loaded, symbol) : nullptr;
 }
 
 }  // namespace Varnel::Platform::POSIX

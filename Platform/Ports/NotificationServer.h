@@ -49,6 +49,9 @@ class VARNEL_API NotificationServer {
 
   /// Takes the banner away that has this token or, if that is of an earlier run, this reference.
   virtual void close(const std::string& token, const std::optional<std::string>& reference) = 0;
+
+  /// Whether something of this is still on its way to the server. Ends, also without a server.
+  [[nodiscard]] virtual bool isBusy() const = 0;
 };
 
 }  // namespace Varnel::Platform

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <memory>
+#include <optional>
 #include <string>
 
 #include <Platform/Api.h>
@@ -16,7 +17,7 @@ class VARNEL_API SoundDelegate {
   virtual ~SoundDelegate() = default;
 
   /// Called on the main queue, once a `play`, unless the sound was stopped before. `finished` is
-  /// false when it broke off or could not be played at all.
+  /// false when it broke off or could not be played at all, which shows only then.
   virtual void sound(PlayableSound& sound, bool finished) = 0;
 };
 
@@ -29,13 +30,15 @@ class VARNEL_API PlayableSound {
   /// Whom to tell about the end. The sound does not keep it alive.
   virtual void setDelegate(std::weak_ptr<SoundDelegate> delegate) = 0;
 
-  /// Starts the sound from its beginning and returns at once; nothing while it plays. Always comes
-  /// to an end, even without an audio device.
+  /// Has the sound start from its beginning and returns at once, before it has; nothing while it
+  /// plays. Always comes to an end, even without an audio device.
   virtual void play() = 0;
 
-  /// Silence. The delegate hears nothing more of this `play`, even if its end was on the way.
+  /// Silence, or no start where it had not come to that. The delegate hears nothing more of this
+  /// `play`, even if its end was on the way. Returns at once.
   virtual void stop() = 0;
 
+  /// From `play` to the end or the `stop`.
   [[nodiscard]] virtual bool isPlaying() const = 0;
 };
 
@@ -44,9 +47,13 @@ class VARNEL_API SoundPlayer {
  public:
   virtual ~SoundPlayer() = default;
 
-  /// The sound that a file with these bytes holds. Null when they are no sound, or when the machine
-  /// lacks what it takes to play any. Bytes that only begin like a sound are found out by playing.
+  /// The sound that a file with these bytes holds. Null when they do not begin like a sound, or
+  /// when there is a missing part. Whatever else there is to find out is found out by playing:
+  /// nothing here waits for the machine's sound system.
   [[nodiscard]] virtual std::shared_ptr<PlayableSound> load(std::string bytes) = 0;
+
+  /// The part without which no sound can be loaded, in words for a person; absent when it is there.
+  [[nodiscard]] virtual std::optional<std::string> missingPart() const = 0;
 };
 
 }  // namespace Varnel::Platform

@@ -61,6 +61,12 @@ class VARNEL_API UserNotificationCenter {
 
   /// Forgets a delivered notification and takes its banner away; deliveries to come stay.
   virtual void removeDeliveredNotification(const UserNotification& notification) = 0;
+
+  /// Whether banners are still to be shown or taken away. A program that is about to end lets the
+  /// main queue run meanwhile:
+  ///
+  ///     mainQueue.runWhile([&] { return center.isBusy(); });
+  [[nodiscard]] virtual bool isBusy() const = 0;
 };
 
 /// Hands out the notification centers of products. Main thread only.

@@ -42,6 +42,8 @@ class FakeNotificationServer final : public NotificationServer {
     banners_.erase(token);
   }
 
+  [[nodiscard]] bool isBusy() const override { return !unreported_.empty(); }
+
   /// Lets the center know what has been shown since the last call, as a server does, later.
   void report() {
     for (const auto& [token, reference] : std::exchange(unreported_, {}))

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <memory>
+#include <optional>
 #include <string>
 #include <utility>
 #include <vector>
@@ -47,6 +48,7 @@ class FakeSoundPlayer final : public SoundPlayer {
     if (bytes == "broken") return nullptr;
     return sounds.emplace_back(std::make_shared<FakeSound>(std::move(bytes)));
   }
+  [[nodiscard]] std::optional<std::string> missingPart() const override { return std::nullopt; }
 };
 
 }  // namespace Varnel::Platform::Testing

@@ -59,6 +59,7 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
   void removeDeliveredNotification(const UserNotification& notification) override {
     remove(delivered_, notification);
   }
+  [[nodiscard]] bool isBusy() const override { return false; }
 
   /// What a click of the user does.
   void activate(const UserNotification& notification) {

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <memory>
 
+#include <Platform/Ports/MainQueue.h>
 #include <Platform/Ports/Ports.h>
 #include <Platform/Ports/UserDefaults.h>
 #include <Platform/Ports/UserNotificationCenter.h>
@@ -41,6 +42,7 @@ class PlanningCenter final : public Varnel::Platform::UserNotificationCenter {
   void removeDeliveredNotification(const UserNotification& notification) override {
     center_.removeDeliveredNotification(notification);
   }
+  bool isBusy() const override { return center_.isBusy(); }
 
  private:
   UserNotificationCenter& center_;
@@ -56,6 +58,7 @@ int RemindEveryCommand::run(Console& console) const {
   // Assigning plans anew and clears what was delivered, so only a choice of the user does it.
   service.setSchedulePeriod(period);
   storePeriod(period);
+  ports.mainQueue.runWhile([&center] { return center.isBusy(); });
   return console.writeResult(statusText(center)) ? 0 : 1;
 }
 

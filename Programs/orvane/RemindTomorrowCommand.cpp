@@ -1,4 +1,6 @@
 // SPDX-License-Identifier: MIT
+#include <Platform/Ports/MainQueue.h>
+#include <Platform/Ports/Ports.h>
 #include <Platform/Ports/UserNotificationCenter.h>
 #include <Varnel/Reminders/NextDayCleanupReminderInfo.h>
 #include <Varnel/Reminders/UserNotificationRouter.h>
@@ -14,6 +16,7 @@ int RemindTomorrowCommand::run(Console& console) const {
   // The identifier is always the same, so an earlier reminder gives way.
   center.scheduleNotification(
       Varnel::NextDayCleanupReminderInfo(selectedSize, foundSize).makeUserNotification());
+  Varnel::Platform::processPorts().mainQueue.runWhile([&center] { return center.isBusy(); });
   return console.writeResult(statusText(center)) ? 0 : 1;
 }
 

@@ -1,27 +1,55 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/SoundCommand.h>
 
+#include <memory>
+
 #include <Platform/Ports/MainQueue.h>
 #include <Platform/Ports/Ports.h>
+#include <Platform/Ports/SoundPlayer.h>
 #include <Varnel/Interface/SoundEngine.h>
 #include <orvane/Console.h>
 
 namespace Orvane {
+namespace {
+
+// Notes how the sound ended, and lets the engine know.
+class End final : public Varnel::Platform::SoundDelegate {
+ public:
+  explicit End(Varnel::SoundEngine& engine) : engine_(engine) {}
+
+  bool hasFinished = false;
+
+  void sound(Varnel::Platform::PlayableSound& sound, bool finished) override {
+    hasFinished = finished;
+    engine_.sound(sound, finished);
+  }
+
+ private:
+  Varnel::SoundEngine& engine_;
+};
+
+}  // namespace
 
 int SoundCommand::run(Console& console) const {
-  if (playToTheEnd(sound)) return 0;
-  console.complain("this machine cannot play sounds");
-  return 1;
+  const auto problem = playToTheEnd(sound);
+  if (problem) console.complain(*problem);
+  return problem ? 1 : 0;
 }
 
-bool playToTheEnd(Varnel::Sound sound) {
+std::optional<std::string> playToTheEnd(Varnel::Sound sound) {
+  const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
   Varnel::SoundEngine engine;
   engine.play(sound);
-  if (!engine.currentSound()) return false;
+  if (!engine.currentSound()) {
+    if (auto missing = ports.soundPlayer.missingPart()) return missing;
+    return sound.fileName() + " is missing or is no sound";
+  }
+  const auto end = std::make_shared<End>(engine);
+  engine.currentSound()->setDelegate(end);
   // The end of the sound arrives on the main queue.
-  Varnel::Platform::processPorts().mainQueue.runWhile(
-      [&engine] { return engine.currentSound() != nullptr; });
-  return true;
+  ports.mainQueue.runWhile([&engine] { return engine.currentSound() != nullptr; });
+  if (!end->hasFinished) return "this machine cannot play sounds";
+  return std::nullopt;
 }
 
 }  // namespace Orvane

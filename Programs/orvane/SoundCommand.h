@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <optional>
+#include <string>
+
 #include <Varnel/Interface/Sound.h>
 
 namespace Orvane {
@@ -15,7 +18,7 @@ struct SoundCommand {
   [[nodiscard]] int run(Console& console) const;
 };
 
-/// Plays a sound and waits for its end. False when this machine cannot play it. Main thread only.
-bool playToTheEnd(Varnel::Sound sound);
+/// Plays a sound and waits for its end. What went wrong, or nothing. Main thread only.
+std::optional<std::string> playToTheEnd(Varnel::Sound sound);
 
 }  // namespace Orvane

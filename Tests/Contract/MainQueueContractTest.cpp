@@ -9,10 +9,14 @@
 #include <chrono>
 #include <memory>
 #include <ostream>
+#include <semaphore>
 #include <thread>
 #include <vector>
 
+#include <Platform/Generic/WatchedMainQueue.h>
 #include <Platform/Linux/Adapters.h>
+#include <Platform/Ports/SystemLog.h>
+#include <Platform/Testing/CapturedOutput.h>
 #include <Platform/Testing/FakeMainQueue.h>
 #include <Tests/Support/DrainUntil.h>
 
@@ -127,13 +131,47 @@ TEST(LinuxMainQueue, DescriptorWakesAHostThatPolls) {
   EXPECT_TRUE(Tests::drainUntil(*queue, [&] { return !ran; }));
 }
 
+TEST(WatchedMainQueue, SaysOnceThatNobodyRunsIt) {
+  Testing::CapturedSystemLog log;
+  {
+    WatchedMainQueue healthy(std::make_unique<Testing::FakeMainQueue>(), log,
+                             std::chrono::minutes(10));
+    healthy.post([] {});
+    EXPECT_TRUE(healthy.drain());
+    healthy.post([] {});
+  }
+  EXPECT_EQ(log.text(), "");
+
+  // A line that is awaited: nothing else tells that the watch has ended.
+  struct Line final : SystemLog {
+    void write(std::string_view text) override {
+      EXPECT_THAT(std::string(text), ::testing::HasSubstr("main queue"));
+      written.release();
+    }
+    std::counting_semaphore<> written{0};
+  } line;
+  WatchedMainQueue stalled(std::make_unique<Testing::FakeMainQueue>(), line,
+                           std::chrono::milliseconds(1));
+  for (int i = 0; i < 3; ++i) stalled.post([] {});
+  EXPECT_TRUE(line.written.try_acquire_for(std::chrono::seconds(30)));
+  stalled.drain();
+  stalled.post([] {});
+  EXPECT_FALSE(line.written.try_acquire());
+}
+
 INSTANTIATE_TEST_SUITE_P(
     , MainQueueContract,
     ::testing::Values(Adapter{"Fake",
                               []() -> std::unique_ptr<MainQueue> {
                                 return std::make_unique<Testing::FakeMainQueue>();
                               }},
-                      Adapter{"System", &Linux::makeMainQueue}),
+                      Adapter{"System", &Linux::makeMainQueue},
+                      Adapter{"Watched",
+                              []() -> std::unique_ptr<MainQueue> {
+                                static Testing::CapturedSystemLog log;
+                                return std::make_unique<WatchedMainQueue>(Linux::makeMainQueue(),
+                                                                          log);
+                              }}),
     [](const auto& instance) { return instance.param.name; });
 
 }  // namespace

@@ -207,6 +207,22 @@ TEST(NotificationServer, ALostServerCostsTheBannerAlone) {
   host.awaitBanner();
 }
 
+TEST(NotificationServer, ABusThatAnswersLateDelaysTheBannerAlone) {
+  Server server;
+  const std::string answer = outputOf(
+      "gdbus call --session -d org.freedesktop.DBus -o /org/freedesktop/DBus "
+      "-m org.freedesktop.DBus.GetConnectionUnixProcessID org.freedesktop.DBus");
+  const pid_t bus = std::stoi(answer.substr(answer.find(' ')));
+  ASSERT_EQ(::kill(bus, SIGSTOP), 0);
+  Host host("late");
+  host.center.scheduleNotification(host.reminderIn(0s));
+  host.queue->drain();
+  EXPECT_TRUE(host.center.isBusy());
+  ASSERT_EQ(::kill(bus, SIGCONT), 0);
+  host.awaitBanner();
+  EXPECT_EQ(host.log.text(), "");
+}
+
 TEST(NotificationServer, ANextRunDeliversWhatTheLastOneCouldNotAndTakesItsBannersAway) {
   Server server;
   {
@@ -220,9 +236,12 @@ TEST(NotificationServer, ANextRunDeliversWhatTheLastOneCouldNotAndTakesItsBanner
   Host next("runs");
   next.awaitReferences();
   EXPECT_EQ(Server::displayedCount(), "2\n");
+  const auto settle = [&] { next.queue->runWhile([&] { return next.center.isBusy(); }); };
   next.router.removeDeliveredNotifications("left");
+  settle();
   EXPECT_EQ(Server::displayedCount(), "1\n");
   next.service.setSchedulePeriod(SchedulePeriodOption::never);
+  settle();
   EXPECT_EQ(Server::displayedCount(), "0\n");
 }
 

@@ -61,6 +61,7 @@ class Orvane : public ::testing::Test {
     pointers.push_back(nullptr);
     std::vector<std::string> environment = {"HOME=" + scratch_.path()};
     // A sanitizer keeps to the settings of the test in the program too.
+    environment.insert(environment.end(), moreEnvironment.begin(), moreEnvironment.end());
     for (const char* name : {"TSAN_OPTIONS", "ASAN_OPTIONS", "LSAN_OPTIONS"})
       if (const char* value = std::getenv(name))
         environment.push_back(std::string(name) + "=" + value);
@@ -89,6 +90,7 @@ class Orvane : public ::testing::Test {
   bool hasLog() const { return std::filesystem::exists(scratch_.path("Library")); }
 
   ScanFolder folder;
+  std::vector<std::string> moreEnvironment;
 
  private:
   static std::string read(const std::string& path) {
@@ -264,6 +266,22 @@ TEST_F(Orvane, PlaysTheFrameworksSoundsToTheirEnd) {
   const Outcome unknown = run({"sound", "applause"});
   EXPECT_EQ(unknown.status, 2);
   EXPECT_THAT(unknown.errors, HasSubstr("there is no sound \"applause\""));
+}
+
+TEST_F(Orvane, SaysWhatItLacksToPlayASound) {
+  moreEnvironment = {"GST_PLUGIN_SYSTEM_PATH=" + folder.path(),
+                     "GST_REGISTRY=" + folder.path("registry")};
+  const Outcome withoutDecoders = run({"sound", "start"});
+  EXPECT_EQ(withoutDecoders.status, 1);
+  EXPECT_THAT(withoutDecoders.errors, EndsWith("this machine cannot play sounds\n"));
+
+  // A copy of the library has no modules beside it.
+  std::filesystem::copy_file(VARNEL_LIBRARY, folder.path("libvarnel.so.0"));
+  moreEnvironment = {"LD_LIBRARY_PATH=" + folder.path()};
+  const Outcome withoutModule = run({"sound", "start"});
+  EXPECT_EQ(withoutModule.status, 1);
+  EXPECT_THAT(withoutModule.errors,
+              EndsWith("libvarnel-gstreamer.so, was not built or is not installed\n"));
 }
 
 TEST_F(Orvane, ExplainsAFilesAttributeAndIdentifiesTheInstallation) {

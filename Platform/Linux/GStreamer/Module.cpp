@@ -2,10 +2,10 @@
 #include <Platform/Linux/GStreamer/Module.h>
 
 #include <Platform/Api.h>
-#include <Platform/Linux/GStreamer/Player.h>
+#include <Platform/Linux/GStreamer/Output.h>
 
 // Without an audio device the automatic sink keeps time all the same, in silence.
-extern "C" VARNEL_API Varnel::Platform::SoundPlayer* varnelMakeSoundPlayer() {
-  return new Varnel::Platform::GStreamer::Player(
+extern "C" VARNEL_API Varnel::Platform::SoundOutput* varnelMakeSoundOutput() {
+  return new Varnel::Platform::GStreamer::Output(
       [] { return gst_element_factory_make("autoaudiosink", nullptr); });
 }

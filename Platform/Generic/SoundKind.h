@@ -1,0 +1,11 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string_view>
+
+namespace Varnel::Platform {
+
+/// Whether a file begins like one that holds sound, perhaps beside a film.
+[[nodiscard]] bool looksLikeSound(std::string_view bytes);
+
+}  // namespace Varnel::Platform

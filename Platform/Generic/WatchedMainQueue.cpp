@@ -1,0 +1,60 @@
+// SPDX-License-Identifier: MIT
+#include <Platform/Generic/WatchedMainQueue.h>
+
+#include <condition_variable>
+#include <mutex>
+#include <system_error>
+#include <utility>
+
+#include <Platform/Concurrency/StartThread.h>
+#include <Platform/Ports/SystemLog.h>
+
+namespace Varnel::Platform {
+
+struct WatchedMainQueue::FirstRun {
+  std::mutex mutex;  // Owns hasCome.
+  std::condition_variable came;
+  bool hasCome = false;
+
+  void come() {
+    const std::lock_guard lock(mutex);
+    hasCome = true;
+    came.notify_all();
+  }
+  bool comesWithin(std::chrono::milliseconds patience) {
+    std::unique_lock lock(mutex);
+    return came.wait_for(lock, patience, [this] { return hasCome; });
+  }
+};
+
+WatchedMainQueue::WatchedMainQueue(std::unique_ptr<MainQueue> queue, SystemLog& systemLog,
+                                   std::chrono::milliseconds patience)
+    : queue_(std::move(queue)),
+      systemLog_(systemLog),
+      patience_(patience),
+      firstRun_(std::make_shared<FirstRun>()) {}
+
+WatchedMainQueue::~WatchedMainQueue() {
+  firstRun_->come();
+  if (thread_.joinable()) thread_.join();
+}
+
+void WatchedMainQueue::post(Block block) {
+  if (!isWatched_.load(std::memory_order_relaxed) && !isWatched_.exchange(true)) watch();
+  queue_->post(std::move(block));
+}
+
+void WatchedMainQueue::watch() try {
+  queue_->post([firstRun = firstRun_] { firstRun->come(); });
+  thread_ = startThread("queue-watch", [this] {
+    if (!firstRun_->comesWithin(patience_))
+      systemLog_.write(
+          "Nothing runs the main queue: notifications, sounds and progress wait for it. A host "
+          "whose "
+          "main loop does not run it has to, by its descriptor.");
+  });
+} catch (const std::system_error&) {
+  // Without a thread to spare nothing is said.
+}
+
+}  // namespace Varnel::Platform

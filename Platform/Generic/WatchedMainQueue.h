@@ -1,0 +1,54 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <atomic>
+#include <chrono>
+#include <memory>
+#include <optional>
+#include <thread>
+
+#include <Platform/Api.h>
+#include <Platform/Ports/MainQueue.h>
+
+namespace Varnel::Platform {
+
+class SystemLog;
+
+/// A main queue that says so in the system's log, once, when nobody runs it: a host's loop may be
+/// one that knows nothing of it, and whatever was posted would wait for ever without a word.
+///
+///     WatchedMainQueue queue(makeMainQueue(), systemLog);
+///
+/// The first post starts a thread, which ends when the first block runs or the patience does. Later
+/// posts cost nothing more.
+class VARNEL_API WatchedMainQueue final : public MainQueue {
+ public:
+  /// The log outlives the queue.
+  WatchedMainQueue(std::unique_ptr<MainQueue> queue, SystemLog& systemLog,
+                   std::chrono::milliseconds patience = std::chrono::seconds(10));
+  ~WatchedMainQueue() override;
+  WatchedMainQueue(const WatchedMainQueue&) = delete;
+  WatchedMainQueue& operator=(const WatchedMainQueue&) = delete;
+
+  void post(Block block) override;
+  [[nodiscard]] bool isCurrent() const override { return queue_->isCurrent(); }
+  void run() override { queue_->run(); }
+  void stop() override { queue_->stop(); }
+  void runWhile(const std::function<bool()>& condition) override { queue_->runWhile(condition); }
+  bool drain() override { return queue_->drain(); }
+  [[nodiscard]] std::optional<int> descriptor() override { return queue_->descriptor(); }
+
+ private:
+  struct FirstRun;
+
+  void watch();
+
+  const std::unique_ptr<MainQueue> queue_;
+  SystemLog& systemLog_;
+  const std::chrono::milliseconds patience_;
+  const std::shared_ptr<FirstRun> firstRun_;
+  std::atomic<bool> isWatched_ = false;
+  std::thread thread_;  // Belongs to the one post that starts it.
+};
+
+}  // namespace Varnel::Platform
