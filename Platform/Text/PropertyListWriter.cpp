@@ -14,7 +14,7 @@ namespace Varnel::Platform {
 namespace {
 
 using Node = UniqueHandle<plist_t, plist_free>;
-using XMLText = UniqueHandle<char*, plist_to_xml_free>;
+using XMLText = UniqueHandle<char*, VARNEL_PLIST_FREE_TEXT>;
 
 // Property lists count from 2001-01-01.
 constexpr Date referenceDate{std::chrono::sys_days(std::chrono::year(2001) / 1 / 1)};

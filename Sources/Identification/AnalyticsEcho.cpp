@@ -7,7 +7,7 @@ namespace Varnel {
 namespace {
 
 // As a literal in source code, so that an entry stays one line and a text shows where it ends.
-std::string quoted(std::string_view text) {
+std::string literal(std::string_view text) {
   std::string out = "\"";
   for (const char c : text) {
     switch (c) {
@@ -40,7 +40,7 @@ std::string listText(const Tallyhouse::CustomDimensions& dimensions) {
   std::string text = "[";
   for (const auto& dimension : dimensions) {
     if (text.size() > 1) text += ", ";
-    text += dimension ? "Optional(" + quoted(*dimension) + ")" : "nil";
+    text += dimension ? "Optional(" + literal(*dimension) + ")" : "nil";
   }
   return text += ']';
 }

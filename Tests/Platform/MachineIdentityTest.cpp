@@ -8,6 +8,7 @@
 
 #include <Platform/Linux/Adapters.h>
 #include <Platform/Linux/DefaultRoutes.h>
+#include <Tests/Support/MountNamespace.h>
 #include <Tests/Support/OtherProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
 
@@ -178,7 +179,7 @@ TEST_F(MockedMachine, ReadsTheKernelsTablesOfTwoDefaultRoutes) {
     return std::system(("(" + command + ") >/dev/null 2>&1").c_str()) == 0;
   };
   const Tests::OtherProcess network([&] {
-    if (::unshare(CLONE_NEWNET) != 0) return false;
+    if (!Tests::enterNamespace(CLONE_NEWNET).empty()) return false;
     if (!shell("ip link add first0 type veth peer name first1 && ip link add second0 type veth"
                " peer name second1 && ip addr add 192.0.2.1/24 dev first0 && ip addr add"
                " 198.51.100.1/24 dev second0 && for i in first0 first1 second0 second1;"
