@@ -11,8 +11,6 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr const char* modulesFolder = "varnel";
-
 // The folder of the file that this code was loaded from: the library, or the program that the
 // library is a part of.
 fs::path ownFolder() {
@@ -28,8 +26,8 @@ fs::path ownFolder() {
 void* moduleFunction(const char* module, const char* symbol) {
   const fs::path folder = ownFolder();
   const std::array candidates = {
-      folder / modulesFolder / module,
-      folder.parent_path() / VARNEL_LIBRARY_FOLDER / modulesFolder / module,
+      folder / VARNEL_VERSIONED_NAME / module,
+      folder.parent_path() / VARNEL_LIB_FOLDER / module,
   };
   for (const fs::path& candidate : candidates) {
     std::error_code failed;
