@@ -17,6 +17,13 @@ function(varnel_floor target prefix)
     VARNEL_PREFIX "${prefix}" VARNEL_ROOT "${CMAKE_CURRENT_SOURCE_DIR}")
 endfunction()
 
+# varnel_uses(TARGET LIBRARY…): the floor is built on libraries from outside the tree. A static framework
+# passes them on to its hosts.
+function(varnel_uses target)
+  target_link_libraries(${target} PRIVATE ${ARGN})
+  set_property(GLOBAL APPEND PROPERTY VARNEL_OUTSIDE_LIBRARIES ${ARGN})
+endfunction()
+
 # varnel_sources(TARGET [PUBLIC_HEADERS …] [SOURCES …]): adds the current folder's files to a floor.
 # Public headers are installed and compiled alone; other headers need no listing.
 function(varnel_sources target)

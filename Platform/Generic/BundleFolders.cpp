@@ -13,11 +13,11 @@ bool holdsInfoDictionary(const fs::path& folder) {
 
 }  // namespace
 
-std::optional<fs::path> findSharedFolder(const fs::path& image, std::string_view name) {
+std::optional<fs::path> findSharedFolder(const fs::path& image, const fs::path& path) {
   if (!image.is_absolute()) return std::nullopt;
   for (fs::path folder = image.parent_path(); folder.has_relative_path();
        folder = folder.parent_path()) {
-    fs::path shared = folder / "share" / name;
+    fs::path shared = folder / path;
     if (holdsInfoDictionary(shared)) return shared;
   }
   return std::nullopt;
@@ -27,7 +27,7 @@ std::optional<fs::path> findBundleFolder(const fs::path& image, std::string_view
   if (!image.is_absolute()) return std::nullopt;
   fs::path folder = image.parent_path();
   if (holdsInfoDictionary(folder)) return folder;
-  return findSharedFolder(image, name);
+  return findSharedFolder(image, fs::path("share") / name);
 }
 
 }  // namespace Varnel::Platform

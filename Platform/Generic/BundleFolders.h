@@ -12,12 +12,12 @@ namespace Varnel::Platform {
 // Where the Info.plist of an executable or library is; absent when there is none. Any thread; reads
 // folders.
 
-/// The folder `share/NAME` of the nearest folder above the image that has one: of its installation
-/// prefix, or of the build folder.
+/// The folder of this path, as in "share/varnel-0.1", below the nearest folder above the image that
+/// has one: its installation prefix, or the build folder.
 [[nodiscard]] VARNEL_API std::optional<std::filesystem::path> findSharedFolder(
-    const std::filesystem::path& image, std::string_view name);
+    const std::filesystem::path& image, const std::filesystem::path& path);
 
-/// The folder that the image lies in or, when that has no Info.plist, the shared folder.
+/// The folder that the image lies in or, when that has no Info.plist, the shared folder "share/NAME".
 [[nodiscard]] VARNEL_API std::optional<std::filesystem::path> findBundleFolder(
     const std::filesystem::path& image, std::string_view name);
 

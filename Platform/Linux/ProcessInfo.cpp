@@ -96,17 +96,16 @@ class ProcProcessInfo final : public ProcessInfo {
   }
 
   std::optional<std::string> bundleFolderOfCode(const void* address,
-                                                std::string_view name) const override {
+                                                std::string_view sharedFolder) const override {
     Dl_info image{};
     if (::dladdr(address, &image) == 0 || !image.dli_fname) return std::nullopt;
     std::error_code failed;
     fs::path path = fs::canonical(image.dli_fname, failed);
     // The loader names the executable itself as it was called, perhaps by a relative path.
     if (failed) path = executable_;
-    if (name.empty()) return asText(findBundleFolder(path, nameOfImage(path)));
     // The Info.plist beside a library may be that of the application it is shipped with.
-    const auto shared = findSharedFolder(path, name);
-    return asText(shared ? shared : findBundleFolder(path, name));
+    const auto shared = sharedFolder.empty() ? std::nullopt : findSharedFolder(path, sharedFolder);
+    return asText(shared ? shared : findBundleFolder(path, nameOfImage(path)));
   }
 
  private:

@@ -11,8 +11,6 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr const char* modulesFolder = "varnel";
-
 // The folder of the file that this code was loaded from: the library, or the program that the
 // library is a part of.
 fs::path ownFolder() {
@@ -27,8 +25,8 @@ fs::path ownFolder() {
 fs::path fileOf(const char* module) {
   const fs::path folder = ownFolder();
   const std::array candidates = {
-      folder / modulesFolder / module,
-      folder.parent_path() / VARNEL_LIBRARY_FOLDER / modulesFolder / module,
+      folder / VARNEL_VERSIONED_NAME / module,
+      folder.parent_path() / VARNEL_LIB_FOLDER / module,
   };
   for (const fs::path& candidate : candidates) {
     std::error_code failed;

@@ -38,10 +38,11 @@ class VARNEL_API ProcessInfo {
   [[nodiscard]] virtual std::optional<std::string> mainBundleFolder() const = 0;
 
   /// The folder with the Info.plist of the library or executable that contains `address`; absent
-  /// when there is none. `name` is its folder's name below an installation's shared data, which
-  /// counts before an Info.plist beside the library; when empty, the image's own name serves.
+  /// when there is none. `sharedFolder` is its path below an installation's prefix, as in
+  /// "share/varnel-0.1", which counts before an Info.plist beside the image; when empty, the
+  /// image's own name below "share" serves, after that Info.plist.
   [[nodiscard]] virtual std::optional<std::string> bundleFolderOfCode(
-      const void* address, std::string_view name) const = 0;
+      const void* address, std::string_view sharedFolder) const = 0;
 };
 
 }  // namespace Varnel::Platform

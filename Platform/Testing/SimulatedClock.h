@@ -19,7 +19,8 @@ class SimulatedClock final : public Clock {
   [[nodiscard]] Date now() const override { return now_.load(); }
 
   void set(Date now) { now_.store(now); }
-  void advance(Date::duration step) {
+  template <typename Rep, typename Period>
+  void advance(std::chrono::duration<Rep, Period> step) {
     Date before = now_.load();
     while (!now_.compare_exchange_weak(before, before + step)) {
     }

@@ -1,11 +1,13 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <concepts>
 #include <cstddef>
 #include <cstdint>
 #include <map>
 #include <string>
 #include <string_view>
+#include <type_traits>
 #include <utility>
 #include <variant>
 #include <vector>
@@ -32,10 +34,17 @@ class PropertyValue final {
   using Storage = std::variant<bool, std::int64_t, double, std::string, PropertyData, Date,
                                PropertyList, PropertyDictionary>;
 
-  PropertyValue(bool value) : storage_(value) {}
-  PropertyValue(std::int64_t value) : storage_(value) {}
+  /// Truth values alone: no pointer and no number turns into one.
+  template <std::same_as<bool> Truth>
+  PropertyValue(Truth value) : storage_(value) {}
+  /// Any whole number that 64 bits with a sign hold.
+  template <std::integral Number>
+  requires(!std::same_as<Number, bool> && (std::is_signed_v<Number> || sizeof(Number) < 8))
+      PropertyValue(Number value)
+      : storage_(static_cast<std::int64_t>(value)) {}
   PropertyValue(double value) : storage_(value) {}
   PropertyValue(std::string value) : storage_(std::move(value)) {}
+  PropertyValue(std::string_view value) : storage_(std::string(value)) {}
   PropertyValue(const char* value) : storage_(std::string(value)) {}
   PropertyValue(PropertyData value) : storage_(std::move(value)) {}
   PropertyValue(Date value) : storage_(value) {}

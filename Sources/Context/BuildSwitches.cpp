@@ -1,46 +1,80 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Context/BuildSwitches.h>
 
-#include "BuildConstants.h"
+#include <atomic>
+#include <filesystem>
+#include <string_view>
+#include <utility>
+
+#include <Platform/Ports/Ports.h>
+#include <Platform/Ports/ProcessInfo.h>
+#include <Platform/Ports/SystemLog.h>
+#include <Varnel/Context/Product.h>
+
+namespace {
+
+const Varnel::BuildSwitches& product() {
+  return Varnel::BuildSwitches::ofThisProduct();
+}
+
+}  // namespace
 
 bool QNIsAppStoreVersion() {
-  return Varnel::BuildConstants::channel == "appstore";
+  return product().isAppStoreVersion;
 }
 bool QNIsSiteVersion() {
-  return Varnel::BuildConstants::channel == "site";
+  return product().isSiteVersion;
 }
 bool QNIsMarkettaVersion() {
-  return Varnel::BuildConstants::channel == "marketta";
+  return product().isMarkettaVersion;
 }
 bool QNIsPrivateBetaMode() {
-  return Varnel::BuildConstants::privateBeta;
+  return product().isPrivateBetaMode;
 }
 bool QNIsDebugMode() {
-  return Varnel::BuildConstants::debugMode;
+  return product().isDebugMode;
 }
 const char* QNAppName() {
-  return Varnel::BuildConstants::appName;
+  return product().appName.c_str();
 }
 const char* QNAppDisplayVersion() {
-  return Varnel::BuildConstants::appDisplayVersion;
+  return product().appDisplayVersion.c_str();
 }
 const char* QNAppArrangeVersion() {
-  return Varnel::BuildConstants::appArrangeVersion;
+  return product().appArrangeVersion.c_str();
 }
 
 namespace Varnel {
+namespace {
 
-BuildSwitches BuildSwitches::ofThisBuild() {
-  return {
-      .isAppStoreVersion = QNIsAppStoreVersion(),
-      .isSiteVersion = QNIsSiteVersion(),
-      .isMarkettaVersion = QNIsMarkettaVersion(),
-      .isPrivateBetaMode = QNIsPrivateBetaMode(),
-      .isDebugMode = QNIsDebugMode(),
-      .appName = QNAppName(),
-      .appDisplayVersion = QNAppDisplayVersion(),
-      .appArrangeVersion = QNAppArrangeVersion(),
-  };
+// Set once, by the product or by the first reader, whichever comes first; never freed.
+constinit std::atomic<const BuildSwitches*> chosen = nullptr;
+
+const BuildSwitches& choose(const BuildSwitches* candidate) {
+  const BuildSwitches* earlier = nullptr;
+  if (chosen.compare_exchange_strong(earlier, candidate)) return *candidate;
+  delete candidate;
+  return *earlier;
+}
+
+BuildSwitches undeclared() {
+  const std::filesystem::path executable = Platform::processPorts().processInfo.executablePath();
+  return {.isSiteVersion = true, .appName = executable.filename().string()};
+}
+
+}  // namespace
+
+const BuildSwitches& BuildSwitches::ofThisProduct() {
+  if (const BuildSwitches* switches = chosen.load()) return *switches;
+  return choose(new BuildSwitches(undeclared()));
+}
+
+Product::Product(BuildSwitches switches) {
+  const auto* declared = new BuildSwitches(std::move(switches));
+  if (&choose(declared) == declared) return;
+  Platform::processPorts().systemLog.write(
+      "A product was declared after another one, or after its facts had been asked for; it does "
+      "not count.");
 }
 
 }  // namespace Varnel

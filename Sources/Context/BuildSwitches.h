@@ -7,15 +7,15 @@
 
 extern "C" {
 
-// The facts that a build fixes, in a form that code in any language can call. Each flavour of the
-// suite is compiled with its own constants; nothing reads them at run time.
+// What the running product declared of itself, in a form that code in any language can call. The
+// library belongs to no product: see Product.h.
 
 VARNEL_API bool QNIsAppStoreVersion();
 VARNEL_API bool QNIsSiteVersion();
 VARNEL_API bool QNIsMarkettaVersion();
 VARNEL_API bool QNIsPrivateBetaMode();
 VARNEL_API bool QNIsDebugMode();
-/// UTF-8, as the two below; lives as long as the library.
+/// UTF-8, as the two below; lives as long as the process.
 VARNEL_API const char* QNAppName();
 VARNEL_API const char* QNAppDisplayVersion();
 VARNEL_API const char* QNAppArrangeVersion();
@@ -24,23 +24,36 @@ VARNEL_API const char* QNAppArrangeVersion();
 
 namespace Varnel {
 
-/// The build switches as a value, so that the rules that follow from them can be tried with any
-/// combination in one process.
+/// The build switches of a product as a value, so that the rules that follow from them can be tried
+/// with any combination in one process.
 ///
-///     BuildSwitches beta = BuildSwitches::ofThisBuild();
+///     BuildSwitches beta = BuildSwitches::ofThisProduct();
 ///     beta.isPrivateBetaMode = true;
-struct VARNEL_API BuildSwitches {
+struct VARNEL_API BuildSwitches final {
   bool isAppStoreVersion = false;
   bool isSiteVersion = false;
   bool isMarkettaVersion = false;
   bool isPrivateBetaMode = false;
   bool isDebugMode = false;
+  /// The name in texts, as in "Orvane 2".
   std::string appName = {};
+  /// The version as shown to the user, and as compared with others.
   std::string appDisplayVersion = {};
   std::string appArrangeVersion = {};
+  /// The bundle identifier, for a program that has no information dictionary of its own.
+  std::string bundleIdentifier = {};
+  /// Host of the service that links go through; a plain host name.
+  std::string redirectHost = {};
+  /// The domain of the vendor's web-analytics cookie, with its leading dot.
+  std::string cookieDomain = {};
+  /// The desktop entry without its suffix, and an icon's name or path: the desktop shows banners
+  /// under these.
+  std::string desktopEntry = {};
+  std::string icon = {};
 
-  /// What the exported functions answer.
-  [[nodiscard]] static BuildSwitches ofThisBuild();
+  /// What the exported functions answer: what the product declared or, in a program that declares
+  /// none, its executable's name and the site channel. Any thread; never changes.
+  [[nodiscard]] static const BuildSwitches& ofThisProduct();
 };
 
 }  // namespace Varnel

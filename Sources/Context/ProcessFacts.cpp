@@ -37,15 +37,16 @@ std::string replacingAll(std::string_view text, std::string_view what, std::stri
   return result += text;
 }
 
-// Every channel's build belongs to the one suite and shares its base; an application without a
-// bundle goes by its executable's name.
-std::string baseIdentifierOf(const Platform::ProcessInfo& processInfo) {
+// Every channel's build belongs to the one suite and shares its base. An application without a
+// bundle goes by what its product declares, and one without that by its executable's name.
+std::string baseIdentifierOf(const Platform::ProcessInfo& processInfo,
+                             const BuildSwitches& switches) {
   const Bundle bundle(processInfo.mainBundleFolder(), {});
-  const auto identifier = bundle.identifier();
-  if (!identifier || identifier->empty())
-    return fs::path(processInfo.executablePath()).filename().string();
-  if (TargetKind::withBundleID(*identifier)) return TargetKind::appstore.bundleID();
-  return Basalt::withoutChannelComponent(*identifier);
+  std::string identifier = bundle.identifier().value_or("");
+  if (identifier.empty()) identifier = switches.bundleIdentifier;
+  if (identifier.empty()) return fs::path(processInfo.executablePath()).filename().string();
+  if (TargetKind::withBundleID(identifier)) return TargetKind::appstore.bundleID();
+  return Basalt::withoutChannelComponent(identifier);
 }
 
 ProcessFacts::Ports portsOfProcess() {
@@ -58,10 +59,10 @@ ProcessFacts::Ports portsOfProcess() {
 ProcessFacts::ProcessFacts(Ports ports, BuildSwitches switches)
     : ports_(ports), switches_(std::move(switches)) {}
 
-ProcessFacts::ProcessFacts() : ProcessFacts(portsOfProcess(), BuildSwitches::ofThisBuild()) {}
+ProcessFacts::ProcessFacts() : ProcessFacts(portsOfProcess(), BuildSwitches::ofThisProduct()) {}
 
 const std::string& ProcessFacts::baseIdentifier() const {
-  return baseIdentifier_.get([&] { return baseIdentifierOf(ports_.processInfo); });
+  return baseIdentifier_.get([&] { return baseIdentifierOf(ports_.processInfo, switches_); });
 }
 
 const std::string& ProcessFacts::applicationName() const {

@@ -57,7 +57,7 @@ const std::array<TargetKind, 3>& TargetKind::allValues() {
 }
 
 TargetKind TargetKind::current() {
-  static const TargetKind kind = of(BuildSwitches::ofThisBuild());
+  static const TargetKind kind = of(BuildSwitches::ofThisProduct());
   return kind;
 }
 

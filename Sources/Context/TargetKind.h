@@ -44,7 +44,7 @@ class VARNEL_API TargetKind final {
   /// The three channels in the order of their raw values, which every search follows.
   [[nodiscard]] static const std::array<TargetKind, 3>& allValues();
 
-  /// The channel of this build. Stops the process when the build belongs to none.
+  /// The product's channel. Stops the process when it names none.
   [[nodiscard]] static TargetKind current();
   /// The channel that these switches name. Stops the process when they name none.
   [[nodiscard]] static TargetKind of(const BuildSwitches& switches);

@@ -46,7 +46,7 @@ std::string VarnelModule::identifier() const {
 
 Bundle VarnelModule::fetchBundle() const {
   const Platform::Ports& ports = Platform::processPorts();
-  return Bundle(ports.processInfo.bundleFolderOfCode(&typeid(VarnelModule), "varnel"),
+  return Bundle(ports.processInfo.bundleFolderOfCode(&typeid(VarnelModule), VARNEL_BUNDLE_FOLDER),
                 ports.userLocale.languages());
 }
 

@@ -30,7 +30,8 @@ class VARNEL_API VarnelModule final : public BaseModule {
 
   /// "varnel-module".
   [[nodiscard]] std::string identifier() const override;
-  /// The framework's resources: `share/varnel` of the build folder or of the installation.
+  /// The framework's resources: `share/varnel-VERSION` of the build folder or of
+  /// the installation.
   [[nodiscard]] Bundle fetchBundle() const override;
   [[nodiscard]] std::string typeName() const override;
 };

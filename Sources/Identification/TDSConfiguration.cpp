@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Identification/TDSConfiguration.h>
 
-#include "BuildConstants.h"
+#include <Varnel/Context/BuildSwitches.h>
 
 namespace Varnel {
 
@@ -14,7 +14,7 @@ TDSConfiguration::TDSConfiguration(std::string scheme, std::string host, std::st
       productScheme_(std::move(productScheme)) {}
 
 TDSConfiguration::TDSConfiguration(std::string productName, std::string productScheme)
-    : TDSConfiguration("http", BuildConstants::redirectHost, "/index.php", std::move(productName),
-                       std::move(productScheme)) {}
+    : TDSConfiguration("http", BuildSwitches::ofThisProduct().redirectHost, "/index.php",
+                       std::move(productName), std::move(productScheme)) {}
 
 }  // namespace Varnel

@@ -15,7 +15,7 @@ class VARNEL_API TDSConfiguration final {
   TDSConfiguration(std::string scheme, std::string host, std::string path, std::string productName,
                    std::string productScheme);
 
-  /// The vendor's service: "http", the host that the build was made with, "/index.php".
+  /// The vendor's service: "http", the host that the product declares, "/index.php".
   TDSConfiguration(std::string productName, std::string productScheme);
 
   [[nodiscard]] const std::string& scheme() const { return scheme_; }

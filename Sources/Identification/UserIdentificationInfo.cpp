@@ -14,7 +14,7 @@ UserIdentificationInfo::UserIdentificationInfo(
 
 UserIdentificationInfo::UserIdentificationInfo(
     std::shared_ptr<UserIdentificationProvider> identificator)
-    : UserIdentificationInfo(std::move(identificator), BuildSwitches::ofThisBuild()) {}
+    : UserIdentificationInfo(std::move(identificator), BuildSwitches::ofThisProduct()) {}
 
 std::string UserIdentificationInfo::uniqueClientIdentifier() const {
   if (isSiteVersion_) {

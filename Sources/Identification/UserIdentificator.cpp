@@ -8,10 +8,9 @@
 #include <Platform/Ports/MachineIdentity.h>
 #include <Platform/Ports/Ports.h>
 #include <Platform/Ports/UserAccount.h>
+#include <Varnel/Context/BuildSwitches.h>
 #include <Varnel/Identification/IdentifierRules.h>
 #include <Varnel/Provenance/KVQuarantine.h>
-
-#include "BuildConstants.h"
 
 namespace Varnel {
 namespace {
@@ -26,8 +25,11 @@ UserIdentificator::Ports portsOfProcess() {
 
 }  // namespace
 
-UserIdentificator::UserIdentificator() : UserIdentificator(portsOfProcess()) {}
-UserIdentificator::UserIdentificator(Ports ports) : ports_(ports) {}
+UserIdentificator::UserIdentificator()
+    : UserIdentificator(portsOfProcess(), BuildSwitches::ofThisProduct().cookieDomain) {}
+
+UserIdentificator::UserIdentificator(Ports ports, std::string cookieDomain)
+    : ports_(ports), cookieDomain_(std::move(cookieDomain)) {}
 
 UserIdentificator::Text UserIdentificator::platformText(std::string_view property) const {
   const auto value = ports_.machineIdentity.platformProperty(property);
@@ -80,10 +82,11 @@ std::optional<std::string> UserIdentificator::downloadSourceURLCid() const {
 }
 
 std::optional<std::string> UserIdentificator::GACookieValue() const {
+  if (cookieDomain_.empty()) return std::nullopt;
   Platform::CookieStorage& storage = ports_.cookieStorage;
   const auto cookies = storage.hasGroupContainers() ? storage.cookiesOfGroupContainer(cookieGroup)
                                                     : storage.cookies();
-  return clientIdentifierIn(cookies, BuildConstants::cookieDomain);
+  return clientIdentifierIn(cookies, cookieDomain_);
 }
 
 }  // namespace Varnel

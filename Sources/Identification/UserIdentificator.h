@@ -37,7 +37,9 @@ class VARNEL_API UserIdentificator final : public UserIdentificationProvider {
   };
 
   UserIdentificator();
-  explicit UserIdentificator(Ports ports);
+  /// `cookieDomain` is that of the vendor's web-analytics cookie, by default the product's; without
+  /// one there is no cookie.
+  UserIdentificator(Ports ports, std::string cookieDomain);
   UserIdentificator(const UserIdentificator&) = delete;
   UserIdentificator& operator=(const UserIdentificator&) = delete;
 
@@ -61,6 +63,7 @@ class VARNEL_API UserIdentificator final : public UserIdentificationProvider {
   [[nodiscard]] Text platformText(std::string_view property) const;
 
   const Ports ports_;
+  const std::string cookieDomain_;
   // Absent until read or assigned; the absence of an identifier is kept as well.
   mutable std::optional<Text> machineUUID_;
   mutable std::optional<Text> serialNumber_;

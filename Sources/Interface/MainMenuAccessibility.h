@@ -6,7 +6,7 @@
 #include <utility>
 #include <vector>
 
-#include <Platform/Api.h>
+#include <Basalt/Identifier.h>
 #include <Varnel/Interface/MenuItemGroup.h>
 
 namespace Varnel {
@@ -20,7 +20,10 @@ namespace Varnel {
 /// This is the one place that lists them. Names are published: hosts and their automation scripts
 /// refer to them, misspelt ones ("Duplidates", "bringAllToFrong", "putBackAll") included. Any
 /// thread; the catalogue does not change. Neither copied nor moved.
-class VARNEL_API MainMenuAccessibility final {
+///
+/// The catalogue is compiled into whoever uses it. Nothing of it crosses the library's boundary, so
+/// that it can grow without breaking a host.
+class MainMenuAccessibility final {
  public:
   class Orvane final : public MenuItemGroup {
    public:
@@ -138,10 +141,14 @@ class VARNEL_API MainMenuAccessibility final {
   };
 
   /// The shared catalogue, whose base identifier is "main-menu".
-  [[nodiscard]] static const MainMenuAccessibility& instance();
+  [[nodiscard]] static const MainMenuAccessibility& instance() {
+    static const MainMenuAccessibility& catalogue = *new MainMenuAccessibility("main-menu");
+    return catalogue;
+  }
 
   /// A catalogue whose identifiers all extend `baseIdentifier`; they are empty if that is.
-  explicit MainMenuAccessibility(std::string baseIdentifier);
+  explicit MainMenuAccessibility(std::string baseIdentifier)
+      : baseIdentifier_(std::move(baseIdentifier)) {}
 
   [[nodiscard]] const std::string& baseIdentifier() const { return baseIdentifier_; }
 
@@ -156,21 +163,32 @@ class VARNEL_API MainMenuAccessibility final {
   [[nodiscard]] const Debug& debug() const { return debug_; }
 
   /// Every group, in the order of the menus.
-  [[nodiscard]] std::array<const MenuItemGroup*, 9> groups() const;
+  [[nodiscard]] std::array<const MenuItemGroup*, 9> groups() const {
+    return {&orvane_, &scan_, &edit_, &view_, &go_, &duplicates_, &window_, &help_, &debug_};
+  }
   /// The identifier of every item, menu by menu.
-  [[nodiscard]] std::vector<std::string> identifiers() const;
+  [[nodiscard]] std::vector<std::string> identifiers() const {
+    std::vector<std::string> identifiers;
+    for (const MenuItemGroup* group : groups())
+      for (const MenuItemGroup::Item* item : group->items()) identifiers.push_back((*item)());
+    return identifiers;
+  }
 
  private:
-  std::string baseIdentifier_;
-  Orvane orvane_;
-  Scan scan_;
-  Edit edit_;
-  View view_;
-  Go go_;
-  Duplicates duplicates_;
-  Window window_;
-  Help help_;
-  Debug debug_;
+  [[nodiscard]] std::string of(const char* menu) const {
+    return Basalt::identifier(baseIdentifier_, menu);
+  }
+
+  const std::string baseIdentifier_;
+  const Orvane orvane_{of("orvane")};
+  const Scan scan_{of("scan")};
+  const Edit edit_{of("edit")};
+  const View view_{of("view")};
+  const Go go_{of("go")};
+  const Duplicates duplicates_{of("duplicates")};
+  const Window window_{of("window")};
+  const Help help_{of("help")};
+  const Debug debug_{of("debug")};
 };
 
 }  // namespace Varnel

@@ -6,7 +6,7 @@
 #include <utility>
 #include <vector>
 
-#include <Platform/Api.h>
+#include <Basalt/Identifier.h>
 
 namespace Varnel {
 
@@ -20,18 +20,23 @@ namespace Varnel {
 ///     Edit edit("main-menu.edit");
 ///     edit.undo();  // "main-menu.edit.undo"
 ///
-/// Any thread once made. Neither copied nor moved: items belong to their group.
-class VARNEL_API MenuItemGroup {
+/// Any thread once made. Neither copied nor moved: items belong to their group. Compiled into
+/// whoever uses it.
+class MenuItemGroup {
  public:
   /// An item of a menu. Called, it gives its identifier; empty if the group's base is.
-  class VARNEL_API Item final {
+  class Item final {
    public:
     /// Enters the item into its group, behind those made before it. The name must last.
-    Item(MenuItemGroup& group, std::string_view name);
+    Item(MenuItemGroup& group, std::string_view name) : group_(group), name_(name) {
+      group.items_.push_back(this);
+    }
     Item(const Item&) = delete;
     Item& operator=(const Item&) = delete;
 
-    [[nodiscard]] std::string operator()() const;
+    [[nodiscard]] std::string operator()() const {
+      return Basalt::identifier(group_.baseIdentifier_, name_);
+    }
     [[nodiscard]] std::string_view name() const { return name_; }
 
    private:

@@ -62,7 +62,8 @@ class UserIdentificatorTest : public testing::Test {
   Platform::Testing::FakeUserDefaults userDefaults;
   Platform::Testing::FakeVolumeCatalog volumes;
   UserIdentificator user{
-      {cookies, machine, account, {attributes, processInfo, launcher, log, userDefaults, volumes}}};
+      {cookies, machine, account, {attributes, processInfo, launcher, log, userDefaults, volumes}},
+      ".quennel.example"};
 };
 
 // Servers know users by these values: a change here is a mistake.

@@ -21,8 +21,10 @@ TEST(BundleFolders, NearestInfoDictionaryCounts) {
   // The application's own, beside it, is not that of a library in the same folder.
   folder.write("opt/app/bin/Info.plist", "");
   EXPECT_EQ(findBundleFolder(image, "app"), folder.path() / "opt/app/bin");
-  EXPECT_EQ(findSharedFolder(image, "app"), folder.path() / "opt/app/share/app");
-  EXPECT_EQ(findSharedFolder("bin/app", "app"), std::nullopt);
+  EXPECT_EQ(findSharedFolder(image, "share/app"), folder.path() / "opt/app/share/app");
+  folder.write("opt/data/app-1.0/Info.plist", "");
+  EXPECT_EQ(findSharedFolder(image, "data/app-1.0"), folder.path() / "opt/data/app-1.0");
+  EXPECT_EQ(findSharedFolder("bin/app", "share/app"), std::nullopt);
 }
 
 }  // namespace

@@ -1,0 +1,33 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <Platform/Api.h>
+#include <Varnel/Context/BuildSwitches.h>
+
+namespace Varnel {
+
+/// Declares which product a program is. The installed library belongs to none and serves the whole
+/// suite; each program has one such object, in a source file of its own. CMake's `varnel_product`
+/// writes that file; without it, it reads
+///
+///     #include <Varnel/Context/Product.h>
+///
+///     extern "C" {
+///     [[gnu::init_priority(101)]] Varnel::Product varnelProduct(
+///         {.isSiteVersion = true, .appName = "Fotovia 3", .appDisplayVersion = "3.1"});
+///     }
+///
+/// The program's own start-up calls the constructor, so that nothing need be exported for the
+/// library to find. The object's name is what the linker looks for when the file lies in an
+/// archive; the priority puts it before the program's other objects. A product that names no
+/// channel stops the process at its first question for one. The first declaration counts: a later
+/// one, or one that comes after somebody asked, changes nothing and is reported to the system's
+/// log.
+class VARNEL_API Product final {
+ public:
+  explicit Product(BuildSwitches switches);
+  Product(const Product&) = delete;
+  Product& operator=(const Product&) = delete;
+};
+
+}  // namespace Varnel

@@ -1,0 +1,15 @@
+# Where what the library loads at run time lies, below the prefix. The paths bear the version that
+# breaks compatibility, so that two of them stand side by side.
+
+set(VARNEL_VERSIONED_NAME "varnel-${PROJECT_VERSION_MAJOR}.${PROJECT_VERSION_MINOR}")
+foreach(kind IN ITEMS LIB DATA)
+  set(folder "${CMAKE_INSTALL_${kind}DIR}")
+  if(IS_ABSOLUTE "${folder}")
+    # The library looks from its own place, wherever the prefix has been moved to.
+    file(RELATIVE_PATH folder "${CMAKE_INSTALL_PREFIX}" "${folder}")
+  endif()
+  set(VARNEL_${kind}_FOLDER "${folder}/${VARNEL_VERSIONED_NAME}")
+endforeach()
+
+# In the build tree the modules lie beside the library as well.
+set(VARNEL_MODULES_OUTPUT_FOLDER "${CMAKE_BINARY_DIR}/lib/${VARNEL_VERSIONED_NAME}")
