@@ -17,7 +17,8 @@ namespace Varnel::Platform {
 [[nodiscard]] VARNEL_API std::optional<std::filesystem::path> findSharedFolder(
     const std::filesystem::path& image, const std::filesystem::path& path);
 
-/// The folder that the image lies in or, when that has no Info.plist, the shared folder "share/NAME".
+/// The folder that the image lies in or, when that has no Info.plist, the shared folder
+/// "share/NAME".
 [[nodiscard]] VARNEL_API std::optional<std::filesystem::path> findBundleFolder(
     const std::filesystem::path& image, std::string_view name);
 

@@ -7,8 +7,8 @@ namespace Varnel::Platform::POSIX {
 [[nodiscard]] bool hasModule(const char* module);
 
 /// The function `symbol` of one of the framework's modules ("libvarnel-curl.so"), which lie in the
-/// folder "varnel" beside the library, or null when the module is missing or does not load. A
-/// module is loaded by the first call and stays loaded.
+/// folder "varnel-VERSION" beside the library, or null when the module is missing or does not load.
+/// A module is loaded by the first call and stays loaded.
 [[nodiscard]] void* moduleFunction(const char* module, const char* symbol);
 
 }  // namespace Varnel::Platform::POSIX

@@ -276,7 +276,7 @@ TEST_F(Orvane, SaysWhatItLacksToPlayASound) {
   EXPECT_THAT(withoutDecoders.errors, EndsWith("this machine cannot play sounds\n"));
 
   // A copy of the library has no modules beside it.
-  std::filesystem::copy_file(VARNEL_LIBRARY, folder.path("libvarnel.so.0"));
+  std::filesystem::copy_file(VARNEL_LIBRARY, folder.path(VARNEL_LIBRARY_NAME));
   moreEnvironment = {"LD_LIBRARY_PATH=" + folder.path()};
   const Outcome withoutModule = run({"sound", "start"});
   EXPECT_EQ(withoutModule.status, 1);
