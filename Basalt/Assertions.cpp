@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Basalt/Assertions.h>
+#include <Varnel/Basalt/Assertions.h>
 
 #include <cstdio>
 #include <cstdlib>

@@ -7,8 +7,8 @@
 #include <utility>
 #include <vector>
 
-#include <Basalt/ExecutionContext.h>
-#include <Basalt/Executor.h>
+#include <Varnel/Basalt/ExecutionContext.h>
+#include <Varnel/Basalt/Executor.h>
 
 namespace Basalt {
 

@@ -6,8 +6,8 @@
 #include <system_error>
 #include <utility>
 
-#include <Basalt/Executor.h>
-#include <Platform/Concurrency/StartThread.h>
+#include <Varnel/Basalt/Executor.h>
+#include <Varnel/Platform/Concurrency/StartThread.h>
 
 namespace Basalt {
 namespace {

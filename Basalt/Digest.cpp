@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Basalt/Digest.h>
+#include <Varnel/Basalt/Digest.h>
 
 #include <array>
 

@@ -4,7 +4,7 @@
 #include <memory>
 #include <utility>
 
-#include <Basalt/Executor.h>
+#include <Varnel/Basalt/Executor.h>
 
 namespace Basalt {
 

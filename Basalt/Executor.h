@@ -3,8 +3,8 @@
 
 #include <memory>
 
-#include <Basalt/Block.h>
-#include <Platform/Api.h>
+#include <Varnel/Basalt/Block.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Basalt {
 

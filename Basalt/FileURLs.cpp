@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: MIT
-#include <Basalt/FileURLs.h>
+#include <Varnel/Basalt/FileURLs.h>
 
 #include <filesystem>
 
-#include <Platform/Ports/UserAccount.h>
+#include <Varnel/Platform/Ports/UserAccount.h>
 
 namespace Basalt {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Basalt/FuzzyByteCountFormatter.h>
+#include <Varnel/Basalt/FuzzyByteCountFormatter.h>
 
 #include <algorithm>
 #include <limits>

@@ -5,8 +5,8 @@
 #include <string>
 #include <string_view>
 
-#include <Platform/Api.h>
-#include <Platform/Text/ByteCountFormatter.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Text/ByteCountFormatter.h>
 
 namespace Basalt {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Basalt/Identifier.h>
+#include <Varnel/Basalt/Identifier.h>
 
 namespace Basalt {
 

@@ -4,7 +4,7 @@
 #include <string>
 #include <string_view>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Basalt {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Basalt/JSON.h>
+#include <Varnel/Basalt/JSON.h>
 
 #include <utility>
 

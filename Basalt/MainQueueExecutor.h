@@ -4,8 +4,8 @@
 #include <memory>
 #include <utility>
 
-#include <Basalt/Executor.h>
-#include <Platform/Ports/MainQueue.h>
+#include <Varnel/Basalt/Executor.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
 
 namespace Basalt {
 

@@ -5,8 +5,8 @@
 #include <memory>
 #include <string>
 
-#include <Platform/Api.h>
-#include <Platform/Values/PropertyValue.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/PropertyValue.h>
 
 namespace Basalt {
 

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
-#include <Basalt/SecurityScopeBookkeeping.h>
+#include <Varnel/Basalt/SecurityScopeBookkeeping.h>
 
-#include <Platform/Ports/SecurityScope.h>
+#include <Varnel/Platform/Ports/SecurityScope.h>
 
 namespace Basalt {
 

@@ -8,8 +8,8 @@
 #include <string_view>
 #include <utility>
 
-#include <Platform/Api.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel::Platform {
 class SecurityScope;

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <Platform/Concurrency/NativeSemaphore.h>
-#include <Platform/Values/Date.h>
+#include <Varnel/Platform/Concurrency/NativeSemaphore.h>
+#include <Varnel/Platform/Values/Date.h>
 
 namespace Basalt {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Basalt/SerialQueue.h>
+#include <Varnel/Basalt/SerialQueue.h>
 
 #include <atomic>
 #include <cstdint>
@@ -12,10 +12,10 @@
 
 #include <fmt/format.h>
 
-#include <Basalt/Semaphore.h>
-#include <Basalt/ThreadID.h>
-#include <Platform/Concurrency/CurrentThread.h>
-#include <Platform/Concurrency/StartThread.h>
+#include <Varnel/Basalt/Semaphore.h>
+#include <Varnel/Basalt/ThreadID.h>
+#include <Varnel/Platform/Concurrency/CurrentThread.h>
+#include <Varnel/Platform/Concurrency/StartThread.h>
 
 namespace Basalt {
 namespace {

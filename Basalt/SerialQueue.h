@@ -5,9 +5,9 @@
 #include <string>
 #include <utility>
 
-#include <Basalt/Block.h>
-#include <Platform/Api.h>
-#include <Platform/Values/QualityOfService.h>
+#include <Varnel/Basalt/Block.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/QualityOfService.h>
 
 namespace Basalt {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Basalt/ThreadID.h>
+#include <Varnel/Basalt/ThreadID.h>
 
 #include <atomic>
 

@@ -3,7 +3,7 @@
 
 #include <cstdint>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Basalt {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Basalt/Version.h>
+#include <Varnel/Basalt/Version.h>
 
 #include <charconv>
 #include <limits>

@@ -6,7 +6,7 @@
 #include <string_view>
 #include <vector>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Basalt {
 

@@ -10,14 +10,14 @@
 #include <functional>
 #include <vector>
 
-#include <Platform/POSIX/Adapters.h>
-#include <Platform/Ports/AppendFiles.h>
-#include <Platform/Ports/Clock.h>
-#include <Platform/Testing/CapturedOutput.h>
-#include <Platform/Testing/FakeHTTPClient.h>
-#include <Tallyhouse/AnalyticsTracker.h>
-#include <Tallyhouse/MeasurementProtocol.h>
-#include <Tallyhouse/SpoolingTransport.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/AppendFiles.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Testing/FakeHTTPClient.h>
+#include <Varnel/Tallyhouse/AnalyticsTracker.h>
+#include <Varnel/Tallyhouse/MeasurementProtocol.h>
+#include <Varnel/Tallyhouse/SpoolingTransport.h>
 #include <fmt/format.h>
 
 namespace {

@@ -16,16 +16,16 @@
 #include <thread>
 #include <vector>
 
-#include <Basalt/SerialQueue.h>
 #include <Benchmarks/AllocationCounter.h>
 #include <Benchmarks/Measurements.h>
-#include <Platform/Testing/FakeDeviceRegistry.h>
-#include <Platform/Testing/FakeDiskArbitration.h>
-#include <Platform/Testing/FakeSecurityScope.h>
-#include <Platform/Testing/FakeVolumeCatalog.h>
+#include <Varnel/Basalt/SerialQueue.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
 #include <Varnel/DiskAccess/DiskData.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
+#include <Varnel/Platform/Testing/FakeDeviceRegistry.h>
+#include <Varnel/Platform/Testing/FakeDiskArbitration.h>
+#include <Varnel/Platform/Testing/FakeSecurityScope.h>
+#include <Varnel/Platform/Testing/FakeVolumeCatalog.h>
 
 namespace Varnel::Benchmarks {
 namespace {

@@ -8,11 +8,11 @@
 #include <functional>
 #include <vector>
 
-#include <Platform/Testing/FakeProcessInfo.h>
-#include <Platform/Testing/FakeUser.h>
-#include <Platform/Values/URLQuery.h>
-#include <Varnel/Identification/Identificator.h>
-#include <Varnel/Identification/TDSService.h>
+#include <Varnel/Identification/Links/TDSService.h>
+#include <Varnel/Identification/User/Identificator.h>
+#include <Varnel/Platform/Testing/FakeProcessInfo.h>
+#include <Varnel/Platform/Testing/FakeUser.h>
+#include <Varnel/Platform/Values/URLQuery.h>
 #include <fmt/format.h>
 
 namespace {

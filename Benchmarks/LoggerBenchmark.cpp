@@ -16,10 +16,10 @@
 #include <spdlog/sinks/stdout_sinks.h>
 #include <spdlog/spdlog.h>
 
-#include <Platform/Ports/Clock.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Testing/FakeUser.h>
 #include <Varnel/Logging/Logger.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Testing/FakeUser.h>
 
 // What a log entry of about 105 bytes costs its author, against the work that cannot be avoided and
 // against spdlog. Everything prints to /dev/null and writes to a file of its own; the figures go to

@@ -11,9 +11,9 @@
 #include <string>
 
 #include <Benchmarks/Measurements.h>
-#include <Platform/Testing/CapturedOutput.h>
 #include <Tests/Support/QuarantineDatabase.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Provenance/KVQuarantine.h>
 
 namespace Varnel::Benchmarks {

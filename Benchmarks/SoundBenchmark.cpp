@@ -9,12 +9,12 @@
 #include <vector>
 
 #include <Benchmarks/Measurements.h>
-#include <Platform/Generic/SoundOutput.h>
-#include <Platform/Linux/Adapters.h>
-#include <Platform/Linux/GStreamer/Module.h>
-#include <Platform/Ports/MainQueue.h>
-#include <Platform/Ports/SystemLog.h>
 #include <Varnel/Interface/SoundEngine.h>
+#include <Varnel/Platform/Generic/SoundOutput.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/Sounds/GStreamer/Module.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
 
 namespace {
 

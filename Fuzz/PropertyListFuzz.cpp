@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/PropertyListParser.h>
+#include <Varnel/Platform/Text/PropertyListParser.h>
 
 #include <algorithm>
 #include <cstddef>

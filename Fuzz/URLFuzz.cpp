@@ -4,8 +4,8 @@
 #include <cstdlib>
 #include <string_view>
 
-#include <Platform/Values/URL.h>
-#include <Platform/Values/URLQuery.h>
+#include <Varnel/Platform/Values/URL.h>
+#include <Varnel/Platform/Values/URLQuery.h>
 
 using namespace Varnel::Platform;
 

@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: MIT
-#include <Tallyhouse/AnalyticsContext.h>
+#include <Varnel/Tallyhouse/AnalyticsContext.h>
 
 #include <exception>
 #include <utility>
 
-#include <Platform/Ports/Clock.h>
-#include <Platform/Ports/Ports.h>
-#include <Tallyhouse/AnalyticsTransport.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Tallyhouse/AnalyticsTransport.h>
 
 namespace Tallyhouse {
 

@@ -7,9 +7,9 @@
 #include <optional>
 #include <string_view>
 
-#include <Platform/Api.h>
-#include <Platform/Values/UUID.h>
-#include <Tallyhouse/AnalyticsEvent.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/UUID.h>
+#include <Varnel/Tallyhouse/AnalyticsEvent.h>
 
 namespace Varnel::Platform {
 class Clock;

@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include <Platform/Values/Date.h>
+#include <Varnel/Platform/Values/Date.h>
 
 namespace Tallyhouse {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tallyhouse/AnalyticsTracker.h>
+#include <Varnel/Tallyhouse/AnalyticsTracker.h>
 
 #include <utility>
 

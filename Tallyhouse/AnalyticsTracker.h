@@ -4,8 +4,8 @@
 #include <atomic>
 #include <memory>
 
-#include <Platform/Api.h>
-#include <Tallyhouse/AnalyticsContext.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Tallyhouse/AnalyticsContext.h>
 
 namespace Tallyhouse {
 

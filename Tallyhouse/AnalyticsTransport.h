@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <Platform/Api.h>
-#include <Tallyhouse/AnalyticsEvent.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Tallyhouse/AnalyticsEvent.h>
 
 namespace Tallyhouse {
 

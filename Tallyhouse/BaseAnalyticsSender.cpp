@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tallyhouse/BaseAnalyticsSender.h>
+#include <Varnel/Tallyhouse/BaseAnalyticsSender.h>
 
 #include <utility>
 

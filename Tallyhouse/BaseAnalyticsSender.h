@@ -7,10 +7,10 @@
 #include <string>
 #include <string_view>
 
-#include <Basalt/RouterActionSenderKind.h>
-#include <Platform/Api.h>
-#include <Tallyhouse/AnalyticsContext.h>
-#include <Tallyhouse/AnalyticsTracker.h>
+#include <Varnel/Basalt/RouterActionSenderKind.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Tallyhouse/AnalyticsContext.h>
+#include <Varnel/Tallyhouse/AnalyticsTracker.h>
 
 namespace Tallyhouse {
 

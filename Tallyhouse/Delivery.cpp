@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: MIT
-#include <Tallyhouse/Delivery.h>
+#include <Varnel/Tallyhouse/Delivery.h>
 
 #include <utility>
 
-#include <Platform/Ports/Clock.h>
-#include <Platform/Ports/HTTPClient.h>
-#include <Tallyhouse/EventSpool.h>
-#include <Tallyhouse/MeasurementProtocol.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/HTTPClient.h>
+#include <Varnel/Tallyhouse/EventSpool.h>
+#include <Varnel/Tallyhouse/MeasurementProtocol.h>
 
 namespace Tallyhouse {
 

@@ -8,8 +8,8 @@
 #include <stop_token>
 #include <string>
 
-#include <Platform/Values/Date.h>
-#include <Tallyhouse/DeliveryPolicy.h>
+#include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Tallyhouse/DeliveryPolicy.h>
 
 namespace Varnel::Platform {
 class Clock;

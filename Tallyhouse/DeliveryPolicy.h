@@ -6,8 +6,8 @@
 #include <cstdint>
 #include <optional>
 
-#include <Platform/Api.h>
-#include <Platform/Values/Date.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/Date.h>
 
 namespace Tallyhouse {
 

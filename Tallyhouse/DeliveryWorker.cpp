@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: MIT
-#include <Tallyhouse/DeliveryWorker.h>
+#include <Varnel/Tallyhouse/DeliveryWorker.h>
 
 #include <algorithm>
 #include <utility>
 
-#include <Platform/Concurrency/StartThread.h>
-#include <Platform/Ports/Clock.h>
-#include <Tallyhouse/EventSpool.h>
+#include <Varnel/Platform/Concurrency/StartThread.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Tallyhouse/EventSpool.h>
 
 namespace Tallyhouse {
 

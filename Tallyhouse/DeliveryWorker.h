@@ -9,8 +9,8 @@
 #include <stop_token>
 #include <thread>
 
-#include <Platform/Values/Date.h>
-#include <Tallyhouse/Delivery.h>
+#include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Tallyhouse/Delivery.h>
 
 namespace Varnel::Platform {
 class Clock;

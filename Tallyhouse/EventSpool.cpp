@@ -1,13 +1,13 @@
 // SPDX-License-Identifier: MIT
-#include <Tallyhouse/EventSpool.h>
+#include <Varnel/Tallyhouse/EventSpool.h>
 
 #include <algorithm>
 #include <bit>
 #include <filesystem>
 #include <utility>
 
-#include <Platform/Ports/AppendFiles.h>
-#include <Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Ports/AppendFiles.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
 #include <fmt/format.h>
 
 namespace Tallyhouse {

@@ -9,9 +9,9 @@
 #include <string_view>
 #include <vector>
 
-#include <Platform/Generic/SQLiteDatabase.h>
-#include <Platform/Values/Date.h>
-#include <Tallyhouse/DeliveryPolicy.h>
+#include <Varnel/Platform/Generic/SQLiteDatabase.h>
+#include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Tallyhouse/DeliveryPolicy.h>
 
 namespace Varnel::Platform {
 class AppendFiles;

@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: MIT
-#include <Tallyhouse/MeasurementProtocol.h>
+#include <Varnel/Tallyhouse/MeasurementProtocol.h>
 
 #include <algorithm>
 
-#include <Platform/Values/PercentEncoding.h>
+#include <Varnel/Platform/Values/PercentEncoding.h>
 #include <fmt/format.h>
 
 namespace Tallyhouse {

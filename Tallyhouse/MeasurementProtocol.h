@@ -5,7 +5,7 @@
 #include <string>
 #include <string_view>
 
-#include <Tallyhouse/AnalyticsEvent.h>
+#include <Varnel/Tallyhouse/AnalyticsEvent.h>
 
 namespace Tallyhouse {
 

@@ -1,16 +1,16 @@
 // SPDX-License-Identifier: MIT
-#include <Tallyhouse/SpoolingTransport.h>
+#include <Varnel/Tallyhouse/SpoolingTransport.h>
 
 #include <algorithm>
 #include <exception>
 #include <random>
 #include <utility>
 
-#include <Platform/Ports/Ports.h>
-#include <Tallyhouse/Delivery.h>
-#include <Tallyhouse/DeliveryWorker.h>
-#include <Tallyhouse/EventSpool.h>
-#include <Tallyhouse/MeasurementProtocol.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Tallyhouse/Delivery.h>
+#include <Varnel/Tallyhouse/DeliveryWorker.h>
+#include <Varnel/Tallyhouse/EventSpool.h>
+#include <Varnel/Tallyhouse/MeasurementProtocol.h>
 
 namespace Tallyhouse {
 namespace {

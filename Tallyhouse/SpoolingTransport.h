@@ -7,10 +7,10 @@
 #include <optional>
 #include <string>
 
-#include <Platform/Api.h>
-#include <Platform/Values/URL.h>
-#include <Tallyhouse/AnalyticsTransport.h>
-#include <Tallyhouse/DeliveryPolicy.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/URL.h>
+#include <Varnel/Tallyhouse/AnalyticsTransport.h>
+#include <Varnel/Tallyhouse/DeliveryPolicy.h>
 
 namespace Varnel::Platform {
 class AppendFiles;

@@ -1,15 +1,27 @@
-# The floors of the tree. Each is an object library; code includes its headers by the floor's name
-# (<Platform/Ports/Clock.h>), in the tree through links under the build's include folder and, once
-# installed, below include/varnel alike.
+# The floors of the tree. Each is an object library; code includes its headers below the one name of the
+# framework (<Varnel/Platform/Ports/Clock.h>, <Varnel/Logging/Logger.h>), in the tree through links under
+# the build's include folder and in an installation alike.
 
 set(VARNEL_INCLUDE_ROOT "${CMAKE_BINARY_DIR}/include")
-file(MAKE_DIRECTORY "${VARNEL_INCLUDE_ROOT}")
+if(IS_SYMLINK "${VARNEL_INCLUDE_ROOT}/Varnel")
+  file(REMOVE_RECURSE "${VARNEL_INCLUDE_ROOT}")  # An older build's, which pointed into the tree.
+endif()
 
-# varnel_floor(TARGET PREFIX): declares the floor of the current folder, with headers under PREFIX.
+# varnel_floor(TARGET PREFIX): declares the floor of the current folder, with headers under PREFIX: a
+# folder of Varnel, or Varnel itself, which then gets a link for each folder of the floor.
 function(varnel_floor target prefix)
-  if(NOT IS_SYMLINK "${VARNEL_INCLUDE_ROOT}/${prefix}")
-    file(CREATE_LINK "${CMAKE_CURRENT_SOURCE_DIR}" "${VARNEL_INCLUDE_ROOT}/${prefix}" SYMBOLIC)
+  set(folders "")
+  if(prefix STREQUAL "Varnel")
+    file(GLOB folders RELATIVE "${CMAKE_CURRENT_SOURCE_DIR}" "${CMAKE_CURRENT_SOURCE_DIR}/*/CMakeLists.txt")
+    list(TRANSFORM folders REPLACE "(.*)/CMakeLists.txt" "/\\1")
   endif()
+  file(MAKE_DIRECTORY "${VARNEL_INCLUDE_ROOT}/Varnel")
+  foreach(folder IN LISTS folders ITEMS "")
+    set(link "${VARNEL_INCLUDE_ROOT}/${prefix}${folder}")
+    if(NOT EXISTS "${link}")
+      file(CREATE_LINK "${CMAKE_CURRENT_SOURCE_DIR}${folder}" "${link}" SYMBOLIC)
+    endif()
+  endforeach()
   add_library(${target} OBJECT)
   target_include_directories(${target} PUBLIC "${VARNEL_INCLUDE_ROOT}")
   target_link_libraries(${target} PUBLIC Threads::Threads)

@@ -3,8 +3,8 @@
 
 #include <string_view>
 
-#include <Platform/Api.h>
-#include <Platform/Values/QualityOfService.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/QualityOfService.h>
 
 namespace Varnel::Platform {
 

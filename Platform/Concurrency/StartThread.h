@@ -5,7 +5,7 @@
 #include <string>
 #include <thread>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel::Platform {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/BackgroundSoundPlayer.h>
+#include <Varnel/Platform/Generic/BackgroundSoundPlayer.h>
 
 #include <atomic>
 #include <condition_variable>
@@ -8,9 +8,9 @@
 #include <system_error>
 #include <utility>
 
-#include <Platform/Concurrency/StartThread.h>
-#include <Platform/Generic/SoundKind.h>
-#include <Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Concurrency/StartThread.h>
+#include <Varnel/Platform/Generic/SoundKind.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
 
 namespace Varnel::Platform {
 

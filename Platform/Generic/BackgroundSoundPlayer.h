@@ -5,8 +5,8 @@
 #include <memory>
 #include <string>
 
-#include <Platform/Generic/SoundOutput.h>
-#include <Platform/Ports/SoundPlayer.h>
+#include <Varnel/Platform/Generic/SoundOutput.h>
+#include <Varnel/Platform/Ports/SoundPlayer.h>
 
 namespace Varnel::Platform {
 

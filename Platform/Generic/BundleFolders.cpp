@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/BundleFolders.h>
+#include <Varnel/Platform/Generic/BundleFolders.h>
 
 namespace Varnel::Platform {
 namespace {

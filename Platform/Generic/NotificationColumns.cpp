@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/NotificationColumns.h>
+#include <Varnel/Platform/Generic/NotificationColumns.h>
 
 #include <array>
 #include <string>

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <Platform/Generic/SQLiteStatement.h>
-#include <Platform/Values/UserNotification.h>
+#include <Varnel/Platform/Generic/SQLiteStatement.h>
+#include <Varnel/Platform/Values/UserNotification.h>
 
 namespace Varnel::Platform {
 

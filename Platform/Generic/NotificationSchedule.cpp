@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/NotificationSchedule.h>
+#include <Varnel/Platform/Generic/NotificationSchedule.h>
 
 #include <limits>
 
-#include <Platform/Text/Calendar.h>
+#include <Varnel/Platform/Text/Calendar.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -5,7 +5,7 @@
 #include <optional>
 #include <string>
 
-#include <Platform/Values/UserNotification.h>
+#include <Varnel/Platform/Values/UserNotification.h>
 
 namespace Varnel::Platform {
 

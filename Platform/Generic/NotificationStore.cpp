@@ -1,14 +1,14 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/NotificationStore.h>
+#include <Varnel/Platform/Generic/NotificationStore.h>
 
 #include <fmt/format.h>
 
 #include <algorithm>
 #include <utility>
 
-#include <Platform/Generic/NotificationColumns.h>
-#include <Platform/Text/Calendar.h>
-#include <Platform/Values/UUID.h>
+#include <Varnel/Platform/Generic/NotificationColumns.h>
+#include <Varnel/Platform/Text/Calendar.h>
+#include <Varnel/Platform/Values/UUID.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -6,9 +6,9 @@
 #include <string>
 #include <vector>
 
-#include <Platform/Generic/NotificationSchedule.h>
-#include <Platform/Generic/NotificationStoreFile.h>
-#include <Platform/Values/UserNotification.h>
+#include <Varnel/Platform/Generic/NotificationSchedule.h>
+#include <Varnel/Platform/Generic/NotificationStoreFile.h>
+#include <Varnel/Platform/Values/UserNotification.h>
 
 namespace Varnel::Platform {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/NotificationStoreFile.h>
+#include <Varnel/Platform/Generic/NotificationStoreFile.h>
 
 #include <sqlite3.h>
 
@@ -7,7 +7,7 @@
 #include <fstream>
 #include <utility>
 
-#include <Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
 
 namespace Varnel::Platform {
 namespace {

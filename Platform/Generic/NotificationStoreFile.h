@@ -6,7 +6,7 @@
 #include <optional>
 #include <string>
 
-#include <Platform/Generic/SQLiteDatabase.h>
+#include <Varnel/Platform/Generic/SQLiteDatabase.h>
 
 namespace Varnel::Platform {
 

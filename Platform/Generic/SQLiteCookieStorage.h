@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include <Platform/Ports/CookieStorage.h>
+#include <Varnel/Platform/Ports/CookieStorage.h>
 
 namespace Varnel::Platform {
 

@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/SQLiteDatabase.h>
+#include <Varnel/Platform/Generic/SQLiteDatabase.h>
 
 #include <sqlite3.h>
 
-#include <Platform/Generic/SQLiteError.h>
+#include <Varnel/Platform/Generic/SQLiteError.h>
 
 namespace Varnel::Platform {
 

@@ -7,9 +7,9 @@
 #include <string>
 #include <string_view>
 
-#include <Platform/Generic/SQLiteStatement.h>
-#include <Platform/Generic/UniqueHandle.h>
-#include <Platform/Values/Result.h>
+#include <Varnel/Platform/Generic/SQLiteStatement.h>
+#include <Varnel/Platform/Values/Result.h>
+#include <Varnel/Platform/Values/UniqueHandle.h>
 
 struct sqlite3;
 

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <Platform/Values/PlatformError.h>
+#include <Varnel/Platform/Values/PlatformError.h>
 
 struct sqlite3;
 

@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/SQLiteStatement.h>
+#include <Varnel/Platform/Generic/SQLiteStatement.h>
 
 #include <sqlite3.h>
 
 #include <cassert>
 
-#include <Platform/Generic/SQLiteError.h>
+#include <Varnel/Platform/Generic/SQLiteError.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -5,8 +5,8 @@
 #include <optional>
 #include <string_view>
 
-#include <Platform/Generic/UniqueHandle.h>
-#include <Platform/Values/Result.h>
+#include <Varnel/Platform/Values/Result.h>
+#include <Varnel/Platform/Values/UniqueHandle.h>
 
 struct sqlite3_stmt;
 

@@ -1,19 +1,19 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/ScheduledNotificationCenter.h>
+#include <Varnel/Platform/Generic/ScheduledNotificationCenter.h>
 
 #include <algorithm>
 #include <map>
 #include <string>
 #include <utility>
 
-#include <Platform/Generic/NotificationStore.h>
-#include <Platform/Ports/Clock.h>
-#include <Platform/Ports/MainQueue.h>
-#include <Platform/Ports/NotificationServer.h>
-#include <Platform/Ports/TimeZones.h>
-#include <Platform/Ports/UserLocale.h>
-#include <Platform/Ports/WallClockTimer.h>
-#include <Platform/Text/Calendar.h>
+#include <Varnel/Platform/Generic/NotificationStore.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/NotificationServer.h>
+#include <Varnel/Platform/Ports/TimeZones.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Ports/WallClockTimer.h>
+#include <Varnel/Platform/Text/Calendar.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -5,9 +5,9 @@
 #include <memory>
 #include <vector>
 
-#include <Platform/Api.h>
-#include <Platform/Ports/NotificationServer.h>
-#include <Platform/Ports/UserNotificationCenter.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Ports/NotificationServer.h>
+#include <Varnel/Platform/Ports/UserNotificationCenter.h>
 
 namespace Varnel::Platform {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/SoundKind.h>
+#include <Varnel/Platform/Generic/SoundKind.h>
 
 #include <algorithm>
 #include <cstddef>

@@ -1,13 +1,13 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/WatchedMainQueue.h>
+#include <Varnel/Platform/Generic/WatchedMainQueue.h>
 
 #include <condition_variable>
 #include <mutex>
 #include <system_error>
 #include <utility>
 
-#include <Platform/Concurrency/StartThread.h>
-#include <Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Concurrency/StartThread.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
 
 namespace Varnel::Platform {
 

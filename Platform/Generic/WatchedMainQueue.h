@@ -7,8 +7,8 @@
 #include <optional>
 #include <thread>
 
-#include <Platform/Api.h>
-#include <Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
 
 namespace Varnel::Platform {
 

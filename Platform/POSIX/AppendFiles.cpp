@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Ports/AppendFiles.h>
+#include <Varnel/Platform/Ports/AppendFiles.h>
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -7,8 +7,8 @@
 
 #include <cerrno>
 
-#include <Platform/POSIX/Adapters.h>
-#include <Platform/POSIX/FileDescriptor.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/POSIX/FileDescriptor.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/Clock.h>
 
-#include <Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Concurrency/ForkedChild.h>
+#include <Varnel/Platform/Concurrency/ForkedChild.h>
 
 #include <pthread.h>
 

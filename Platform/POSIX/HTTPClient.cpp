@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Ports/HTTPClient.h>
+#include <Varnel/Platform/Ports/HTTPClient.h>
 
 #include <mutex>
 
-#include <Platform/Generic/Curl/Module.h>
-#include <Platform/POSIX/Adapters.h>
-#include <Platform/POSIX/Modules.h>
+#include <Varnel/Platform/Generic/Curl/Module.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/POSIX/Modules.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {

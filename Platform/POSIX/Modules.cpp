@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/POSIX/Modules.h>
+#include <Varnel/Platform/POSIX/Modules.h>
 
 #include <dlfcn.h>
 

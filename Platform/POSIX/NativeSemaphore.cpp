@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Concurrency/NativeSemaphore.h>
+#include <Varnel/Platform/Concurrency/NativeSemaphore.h>
 
 #include <semaphore.h>
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/NeutralLocale.h>
+#include <Varnel/Platform/Text/NeutralLocale.h>
 
 #include <locale.h>
 

@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Ports/SecurityScope.h>
+#include <Varnel/Platform/Ports/SecurityScope.h>
 
 #include <unistd.h>
 
 #include <string>
 
-#include <Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {

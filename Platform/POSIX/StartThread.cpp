@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Concurrency/StartThread.h>
+#include <Varnel/Platform/Concurrency/StartThread.h>
 
 #include <utility>
 
-#include <Platform/Concurrency/CurrentThread.h>
-#include <Platform/POSIX/BlockedSignals.h>
+#include <Varnel/Platform/Concurrency/CurrentThread.h>
+#include <Varnel/Platform/POSIX/BlockedSignals.h>
 
 namespace Varnel::Platform {
 

@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
 
 #include <syslog.h>
 
 #include <string>
 
-#include <Platform/POSIX/Adapters.h>
-#include <Platform/Ports/StandardOutput.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/StandardOutput.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Ports/UserAccount.h>
+#include <Varnel/Platform/Ports/UserAccount.h>
 
 #include <pwd.h>
 #include <unistd.h>
@@ -9,7 +9,7 @@
 #include <string_view>
 #include <vector>
 
-#include <Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {

@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
 
 #include <cstdlib>
 #include <initializer_list>
 #include <memory>
 #include <string_view>
 
-#include <Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <Platform/Api.h>
-#include <Platform/Values/Date.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/Date.h>
 
 namespace Varnel::Platform {
 

@@ -6,8 +6,8 @@
 #include <string_view>
 #include <vector>
 
-#include <Platform/Api.h>
-#include <Platform/Values/PropertyValue.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/PropertyValue.h>
 
 namespace Varnel::Platform {
 

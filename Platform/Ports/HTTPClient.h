@@ -6,8 +6,8 @@
 #include <stop_token>
 #include <string>
 
-#include <Platform/Api.h>
-#include <Platform/Values/Result.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/Result.h>
 
 namespace Varnel::Platform {
 

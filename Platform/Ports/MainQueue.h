@@ -4,7 +4,7 @@
 #include <functional>
 #include <optional>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel::Platform {
 

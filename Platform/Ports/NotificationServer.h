@@ -5,7 +5,7 @@
 #include <optional>
 #include <string>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel::Platform {
 

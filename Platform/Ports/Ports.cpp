@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/Ports.h>
 
 #include <atomic>
 

@@ -5,7 +5,7 @@
 #include <string>
 #include <string_view>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel::Platform {
 

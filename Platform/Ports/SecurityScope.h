@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <Platform/Api.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel::Platform {
 

@@ -4,7 +4,7 @@
 #include <memory>
 #include <string_view>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel::Platform {
 

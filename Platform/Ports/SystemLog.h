@@ -3,7 +3,7 @@
 
 #include <string_view>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel::Platform {
 

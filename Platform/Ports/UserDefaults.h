@@ -6,7 +6,7 @@
 #include <string>
 #include <variant>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel::Platform {
 

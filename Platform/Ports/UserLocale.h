@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel::Platform {
 

@@ -5,8 +5,8 @@
 #include <string>
 #include <vector>
 
-#include <Platform/Api.h>
-#include <Platform/Values/UserNotification.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/UserNotification.h>
 
 namespace Varnel::Platform {
 

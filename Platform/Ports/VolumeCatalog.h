@@ -7,9 +7,9 @@
 #include <string>
 #include <vector>
 
-#include <Platform/Api.h>
-#include <Platform/Values/Result.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/Result.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel::Platform {
 

@@ -3,8 +3,8 @@
 
 #include <functional>
 
-#include <Platform/Api.h>
-#include <Platform/Values/Date.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/Date.h>
 
 namespace Varnel::Platform {
 

@@ -5,8 +5,8 @@
 #include <string>
 #include <string_view>
 
-#include <Platform/Ports/StandardOutput.h>
-#include <Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Ports/StandardOutput.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
 
 namespace Varnel::Platform::Testing {
 

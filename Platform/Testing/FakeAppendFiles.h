@@ -10,7 +10,7 @@
 #include <string_view>
 #include <system_error>
 
-#include <Platform/Ports/AppendFiles.h>
+#include <Varnel/Platform/Ports/AppendFiles.h>
 
 namespace Varnel::Platform::Testing {
 

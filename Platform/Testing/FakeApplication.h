@@ -3,7 +3,7 @@
 
 #include <atomic>
 
-#include <Platform/Ports/Application.h>
+#include <Varnel/Platform/Ports/Application.h>
 
 namespace Varnel::Platform::Testing {
 

@@ -10,7 +10,7 @@
 #include <utility>
 #include <vector>
 
-#include <Platform/Ports/DeviceRegistry.h>
+#include <Varnel/Platform/Ports/DeviceRegistry.h>
 
 namespace Varnel::Platform::Testing {
 

@@ -9,7 +9,7 @@
 #include <utility>
 #include <vector>
 
-#include <Platform/Ports/DiskArbitration.h>
+#include <Varnel/Platform/Ports/DiskArbitration.h>
 
 namespace Varnel::Platform::Testing {
 

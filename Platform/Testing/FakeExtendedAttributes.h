@@ -6,7 +6,7 @@
 #include <string>
 #include <utility>
 
-#include <Platform/Ports/ExtendedAttributes.h>
+#include <Varnel/Platform/Ports/ExtendedAttributes.h>
 
 namespace Varnel::Platform::Testing {
 

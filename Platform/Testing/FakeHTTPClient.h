@@ -6,7 +6,7 @@
 #include <utility>
 #include <vector>
 
-#include <Platform/Ports/HTTPClient.h>
+#include <Varnel/Platform/Ports/HTTPClient.h>
 
 namespace Varnel::Platform::Testing {
 

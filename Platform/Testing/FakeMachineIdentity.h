@@ -6,7 +6,7 @@
 #include <string_view>
 #include <vector>
 
-#include <Platform/Ports/MachineIdentity.h>
+#include <Varnel/Platform/Ports/MachineIdentity.h>
 
 namespace Varnel::Platform::Testing {
 

@@ -8,7 +8,7 @@
 #include <thread>
 #include <utility>
 
-#include <Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
 
 namespace Varnel::Platform::Testing {
 

@@ -7,7 +7,7 @@
 #include <utility>
 #include <vector>
 
-#include <Platform/Ports/NotificationServer.h>
+#include <Varnel/Platform/Ports/NotificationServer.h>
 
 namespace Varnel::Platform::Testing {
 

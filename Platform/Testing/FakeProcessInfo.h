@@ -6,7 +6,7 @@
 #include <string>
 #include <string_view>
 
-#include <Platform/Ports/ProcessInfo.h>
+#include <Varnel/Platform/Ports/ProcessInfo.h>
 
 namespace Varnel::Platform::Testing {
 

@@ -6,7 +6,7 @@
 #include <system_error>
 #include <vector>
 
-#include <Platform/Ports/ProcessLauncher.h>
+#include <Varnel/Platform/Ports/ProcessLauncher.h>
 
 namespace Varnel::Platform::Testing {
 

@@ -5,7 +5,7 @@
 #include <mutex>
 #include <set>
 
-#include <Platform/Ports/SecurityScope.h>
+#include <Varnel/Platform/Ports/SecurityScope.h>
 
 namespace Varnel::Platform::Testing {
 

@@ -7,7 +7,7 @@
 #include <utility>
 #include <vector>
 
-#include <Platform/Ports/SoundPlayer.h>
+#include <Varnel/Platform/Ports/SoundPlayer.h>
 
 namespace Varnel::Platform::Testing {
 

@@ -9,7 +9,7 @@
 #include <utility>
 #include <vector>
 
-#include <Platform/Ports/TimeZones.h>
+#include <Varnel/Platform/Ports/TimeZones.h>
 
 namespace Varnel::Platform::Testing {
 

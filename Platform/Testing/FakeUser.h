@@ -4,8 +4,8 @@
 #include <string>
 #include <vector>
 
-#include <Platform/Ports/UserAccount.h>
-#include <Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Ports/UserAccount.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
 
 namespace Varnel::Platform::Testing {
 

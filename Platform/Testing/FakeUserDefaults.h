@@ -7,7 +7,7 @@
 #include <optional>
 #include <string>
 
-#include <Platform/Ports/UserDefaults.h>
+#include <Varnel/Platform/Ports/UserDefaults.h>
 
 namespace Varnel::Platform::Testing {
 

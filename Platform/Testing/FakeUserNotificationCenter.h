@@ -7,7 +7,7 @@
 #include <utility>
 #include <vector>
 
-#include <Platform/Ports/UserNotificationCenter.h>
+#include <Varnel/Platform/Ports/UserNotificationCenter.h>
 
 namespace Varnel::Platform::Testing {
 

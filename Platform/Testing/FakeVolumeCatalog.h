@@ -10,7 +10,7 @@
 #include <utility>
 #include <vector>
 
-#include <Platform/Ports/VolumeCatalog.h>
+#include <Varnel/Platform/Ports/VolumeCatalog.h>
 
 namespace Varnel::Platform::Testing {
 

@@ -6,8 +6,8 @@
 #include <optional>
 #include <utility>
 
-#include <Platform/Ports/WallClockTimer.h>
-#include <Platform/Testing/SimulatedClock.h>
+#include <Varnel/Platform/Ports/WallClockTimer.h>
+#include <Varnel/Platform/Testing/SimulatedClock.h>
 
 namespace Varnel::Platform::Testing {
 

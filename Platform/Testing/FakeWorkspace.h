@@ -5,7 +5,7 @@
 #include <optional>
 #include <string>
 
-#include <Platform/Ports/Workspace.h>
+#include <Varnel/Platform/Ports/Workspace.h>
 
 namespace Varnel::Platform::Testing {
 

@@ -3,7 +3,7 @@
 
 #include <atomic>
 
-#include <Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/Clock.h>
 
 namespace Varnel::Platform::Testing {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/ByteCountFormatter.h>
+#include <Varnel/Platform/Text/ByteCountFormatter.h>
 
 #include <unicode/numberformatter.h>
 #include <unicode/uchar.h>

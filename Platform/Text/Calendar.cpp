@@ -1,13 +1,13 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/Calendar.h>
+#include <Varnel/Platform/Text/Calendar.h>
 
 #include <unicode/calendar.h>
 
 #include <cmath>
 #include <limits>
 
-#include <Platform/Ports/TimeZones.h>
-#include <Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Ports/TimeZones.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
 
 namespace Varnel::Platform {
 namespace {

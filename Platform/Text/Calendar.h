@@ -6,9 +6,9 @@
 #include <optional>
 #include <string>
 
-#include <Platform/Api.h>
-#include <Platform/Values/Date.h>
-#include <Platform/Values/DateComponents.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Platform/Values/DateComponents.h>
 
 namespace Varnel::Platform {
 

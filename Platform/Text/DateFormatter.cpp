@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/DateFormatter.h>
+#include <Varnel/Platform/Text/DateFormatter.h>
 
 #include <unicode/simpletz.h>
 #include <unicode/smpdtfmt.h>
@@ -11,7 +11,7 @@
 #include <cstring>
 #include <mutex>
 
-#include <Platform/Ports/TimeZones.h>
+#include <Varnel/Platform/Ports/TimeZones.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -5,8 +5,8 @@
 #include <string>
 #include <string_view>
 
-#include <Platform/Api.h>
-#include <Platform/Values/Date.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/Date.h>
 
 namespace Varnel::Platform {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/DurationFormatter.h>
+#include <Varnel/Platform/Text/DurationFormatter.h>
 
 #include <array>
 #include <chrono>

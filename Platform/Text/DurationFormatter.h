@@ -4,8 +4,8 @@
 #include <optional>
 #include <string>
 
-#include <Platform/Api.h>
-#include <Platform/Values/Date.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/Date.h>
 
 namespace Varnel::Platform {
 

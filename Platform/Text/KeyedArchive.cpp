@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/KeyedArchive.h>
+#include <Varnel/Platform/Text/KeyedArchive.h>
 
-#include <Platform/Text/PropertyListParser.h>
-#include <Platform/Text/PropertyListWriter.h>
+#include <Varnel/Platform/Text/PropertyListParser.h>
+#include <Varnel/Platform/Text/PropertyListWriter.h>
 
 namespace Varnel::Platform {
 

@@ -5,9 +5,9 @@
 #include <string>
 #include <string_view>
 
-#include <Platform/Api.h>
-#include <Platform/Values/PropertyValue.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/PropertyValue.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel::Platform {
 

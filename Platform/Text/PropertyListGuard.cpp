@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/PropertyListGuard.h>
+#include <Varnel/Platform/Text/PropertyListGuard.h>
 
 #include <algorithm>
 #include <bit>
@@ -8,7 +8,7 @@
 #include <cstdint>
 #include <vector>
 
-#include <Platform/Text/PropertyListScalars.h>
+#include <Varnel/Platform/Text/PropertyListScalars.h>
 
 namespace Varnel::Platform {
 namespace {

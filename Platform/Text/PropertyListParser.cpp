@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/PropertyListParser.h>
+#include <Varnel/Platform/Text/PropertyListParser.h>
 
 #include <plist/plist.h>
 
@@ -8,9 +8,9 @@
 #include <cmath>
 #include <cstdlib>
 
-#include <Platform/Generic/UniqueHandle.h>
-#include <Platform/Text/NeutralLocale.h>
-#include <Platform/Text/PropertyListGuard.h>
+#include <Varnel/Platform/Text/NeutralLocale.h>
+#include <Varnel/Platform/Text/PropertyListGuard.h>
+#include <Varnel/Platform/Values/UniqueHandle.h>
 
 namespace Varnel::Platform {
 namespace {

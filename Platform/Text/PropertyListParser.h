@@ -4,8 +4,8 @@
 #include <optional>
 #include <string_view>
 
-#include <Platform/Api.h>
-#include <Platform/Values/PropertyValue.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/PropertyValue.h>
 
 namespace Varnel::Platform {
 

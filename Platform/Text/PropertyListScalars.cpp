@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/PropertyListScalars.h>
+#include <Varnel/Platform/Text/PropertyListScalars.h>
 
 #include <algorithm>
 #include <charconv>

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/PropertyListWriter.h>
+#include <Varnel/Platform/Text/PropertyListWriter.h>
 
 #include <plist/plist.h>
 #include <unicode/ustring.h>
@@ -7,8 +7,8 @@
 #include <algorithm>
 #include <limits>
 
-#include <Platform/Generic/UniqueHandle.h>
-#include <Platform/Text/NeutralLocale.h>
+#include <Varnel/Platform/Text/NeutralLocale.h>
+#include <Varnel/Platform/Values/UniqueHandle.h>
 
 namespace Varnel::Platform {
 namespace {

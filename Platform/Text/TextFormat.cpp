@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/TextFormat.h>
+#include <Varnel/Platform/Text/TextFormat.h>
 
 #include <charconv>
 

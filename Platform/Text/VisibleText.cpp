@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/VisibleText.h>
+#include <Varnel/Platform/Text/VisibleText.h>
 
 #include <unicode/uchar.h>
 #include <unicode/utf8.h>

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Values/PathComponents.h>
+#include <Varnel/Platform/Values/PathComponents.h>
 
 #include <algorithm>
 

@@ -5,8 +5,8 @@
 #include <string_view>
 #include <vector>
 
-#include <Platform/Api.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel::Platform {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Values/PercentEncoding.h>
+#include <Varnel/Platform/Values/PercentEncoding.h>
 
 namespace Varnel::Platform {
 namespace {

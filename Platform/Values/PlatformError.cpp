@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Values/PlatformError.h>
+#include <Varnel/Platform/Values/PlatformError.h>
 
 #include <utility>
 

@@ -7,7 +7,7 @@
 #include <string_view>
 #include <system_error>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel::Platform {
 

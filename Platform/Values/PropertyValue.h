@@ -12,7 +12,7 @@
 #include <variant>
 #include <vector>
 
-#include <Platform/Values/Date.h>
+#include <Varnel/Platform/Values/Date.h>
 
 namespace Varnel::Platform {
 

@@ -5,7 +5,7 @@
 #include <utility>
 #include <variant>
 
-#include <Platform/Values/PlatformError.h>
+#include <Varnel/Platform/Values/PlatformError.h>
 
 namespace Varnel::Platform {
 

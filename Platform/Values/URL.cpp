@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Values/URL.h>
+#include <Varnel/Platform/Values/URL.h>
 
 #include <algorithm>
 
-#include <Platform/Values/PercentEncoding.h>
+#include <Varnel/Platform/Values/PercentEncoding.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -10,8 +10,8 @@
 #include <string>
 #include <string_view>
 
-#include <Platform/Api.h>
-#include <Platform/Values/URLComponents.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/URLComponents.h>
 
 namespace Varnel::Platform {
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Values/URLComponents.h>
+#include <Varnel/Platform/Values/URLComponents.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <algorithm>
 
-#include <Platform/Values/PercentEncoding.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Platform/Values/PercentEncoding.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel::Platform {
 namespace {

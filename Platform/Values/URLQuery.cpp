@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Values/URLQuery.h>
+#include <Varnel/Platform/Values/URLQuery.h>
 
-#include <Platform/Values/PercentEncoding.h>
+#include <Varnel/Platform/Values/PercentEncoding.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Values/UUID.h>
+#include <Varnel/Platform/Values/UUID.h>
 
 #include <algorithm>
 #include <array>

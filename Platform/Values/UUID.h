@@ -4,7 +4,7 @@
 #include <random>
 #include <string>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel::Platform {
 

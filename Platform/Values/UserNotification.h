@@ -4,8 +4,8 @@
 #include <optional>
 #include <string>
 
-#include <Platform/Values/Date.h>
-#include <Platform/Values/DateComponents.h>
+#include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Platform/Values/DateComponents.h>
 
 namespace Varnel::Platform {
 

@@ -3,7 +3,7 @@
 
 #include <utility>
 
-#include <Platform/Text/VisibleText.h>
+#include <Varnel/Platform/Text/VisibleText.h>
 #include <orvane/StandardStreams.h>
 
 namespace Orvane {

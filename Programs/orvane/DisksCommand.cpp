@@ -4,8 +4,8 @@
 #include <nlohmann/json.hpp>
 #include <string>
 
-#include <Platform/Text/VisibleText.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
+#include <Varnel/Platform/Text/VisibleText.h>
 #include <orvane/Console.h>
 
 namespace Orvane {

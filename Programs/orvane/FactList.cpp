@@ -4,7 +4,7 @@
 #include <nlohmann/json.hpp>
 #include <utility>
 
-#include <Platform/Text/VisibleText.h>
+#include <Varnel/Platform/Text/VisibleText.h>
 
 namespace Orvane {
 

@@ -3,9 +3,9 @@
 
 #include <memory>
 
-#include <Varnel/Identification/KeptDownloadSource.h>
-#include <Varnel/Identification/UserIdentificationInfo.h>
-#include <Varnel/Identification/UserIdentificator.h>
+#include <Varnel/Identification/User/KeptDownloadSource.h>
+#include <Varnel/Identification/User/UserIdentificationInfo.h>
+#include <Varnel/Identification/User/UserIdentificator.h>
 #include <orvane/Console.h>
 #include <orvane/FactList.h>
 

@@ -4,9 +4,9 @@
 #include <map>
 #include <memory>
 
-#include <Varnel/Identification/TDSService.h>
-#include <Varnel/Identification/UserIdentificationInfo.h>
-#include <Varnel/Identification/UserIdentificator.h>
+#include <Varnel/Identification/Links/TDSService.h>
+#include <Varnel/Identification/User/UserIdentificationInfo.h>
+#include <Varnel/Identification/User/UserIdentificator.h>
 #include <orvane/Console.h>
 
 namespace Orvane {

@@ -3,8 +3,8 @@
 
 #include <cassert>
 
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/StandardOutput.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/StandardOutput.h>
 #include <orvane/Console.h>
 
 namespace Orvane {

@@ -3,9 +3,9 @@
 
 #include <climits>
 
-#include <Platform/Ports/VolumeCatalog.h>
 #include <Varnel/DiskAccess/DiskAccessGuard.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
+#include <Varnel/Platform/Ports/VolumeCatalog.h>
 
 namespace Orvane {
 namespace {

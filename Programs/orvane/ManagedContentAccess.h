@@ -8,9 +8,9 @@
 #include <optional>
 #include <string>
 
-#include <Platform/Values/QualityOfService.h>
-#include <Platform/Values/URL.h>
-#include <orvane/Scan/ContentAccess.h>
+#include <Scan/ContentAccess.h>
+#include <Varnel/Platform/Values/QualityOfService.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel {
 class DiskAccessManager;

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/PathCommand.h>
 
-#include <Platform/Text/VisibleText.h>
 #include <Varnel/Paths/QNURLResolver.h>
+#include <Varnel/Platform/Text/VisibleText.h>
 #include <orvane/Console.h>
 
 namespace Orvane {

@@ -5,9 +5,9 @@
 #include <condition_variable>
 #include <mutex>
 
-#include <Platform/Concurrency/StartThread.h>
+#include <Scan/ScanObserver.h>
+#include <Varnel/Platform/Concurrency/StartThread.h>
 #include <orvane/Console.h>
-#include <orvane/Scan/ScanObserver.h>
 
 namespace Orvane {
 

@@ -1,13 +1,13 @@
 // SPDX-License-Identifier: MIT
 #include <memory>
 
-#include <Platform/Ports/MainQueue.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/UserDefaults.h>
-#include <Platform/Ports/UserNotificationCenter.h>
-#include <Tallyhouse/AnalyticsTracker.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/UserDefaults.h>
+#include <Varnel/Platform/Ports/UserNotificationCenter.h>
 #include <Varnel/Reminders/SchedulerService.h>
 #include <Varnel/Reminders/UserNotificationRouter.h>
+#include <Varnel/Tallyhouse/AnalyticsTracker.h>
 #include <orvane/Console.h>
 #include <orvane/RemindCommands.h>
 #include <orvane/Reminders.h>

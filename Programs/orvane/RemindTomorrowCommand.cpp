@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Ports/MainQueue.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/UserNotificationCenter.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/UserNotificationCenter.h>
 #include <Varnel/Reminders/NextDayCleanupReminderInfo.h>
 #include <Varnel/Reminders/UserNotificationRouter.h>
 #include <orvane/Console.h>

@@ -4,11 +4,11 @@
 #include <nlohmann/json.hpp>
 #include <optional>
 
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/UserDefaults.h>
-#include <Platform/Ports/UserNotificationCenter.h>
-#include <Platform/Text/DateFormatter.h>
-#include <Platform/Text/VisibleText.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/UserDefaults.h>
+#include <Varnel/Platform/Ports/UserNotificationCenter.h>
+#include <Varnel/Platform/Text/DateFormatter.h>
+#include <Varnel/Platform/Text/VisibleText.h>
 #include <Varnel/Reminders/SchedulePeriodOptionBox.h>
 
 namespace Orvane {

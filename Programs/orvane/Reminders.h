@@ -3,7 +3,7 @@
 
 #include <string>
 
-#include <Platform/Values/UserNotification.h>
+#include <Varnel/Platform/Values/UserNotification.h>
 #include <Varnel/Reminders/SchedulePeriodOption.h>
 
 namespace Varnel::Platform {

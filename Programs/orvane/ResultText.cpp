@@ -4,12 +4,12 @@
 #include <algorithm>
 #include <nlohmann/json.hpp>
 
-#include <Platform/Text/ByteCountFormatter.h>
-#include <Platform/Text/UTF8.h>
-#include <Platform/Text/VisibleText.h>
-#include <Platform/Values/URL.h>
+#include <Scan/ScanResult.h>
 #include <Varnel/Paths/QNURLResolver.h>
-#include <orvane/Scan/ScanResult.h>
+#include <Varnel/Platform/Text/ByteCountFormatter.h>
+#include <Varnel/Platform/Text/UTF8.h>
+#include <Varnel/Platform/Text/VisibleText.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Orvane {
 namespace {

@@ -3,13 +3,13 @@
 
 #include <chrono>
 
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/UserAccount.h>
 #include <Varnel/Context/Globals.h>
-#include <Varnel/Identification/CustomDimensionsHolder.h>
-#include <Varnel/Identification/KeptDownloadSource.h>
-#include <Varnel/Identification/UserIdentificationInfo.h>
-#include <Varnel/Identification/UserIdentificator.h>
+#include <Varnel/Identification/Analytics/CustomDimensionsHolder.h>
+#include <Varnel/Identification/User/KeptDownloadSource.h>
+#include <Varnel/Identification/User/UserIdentificationInfo.h>
+#include <Varnel/Identification/User/UserIdentificator.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/UserAccount.h>
 
 namespace Orvane {
 namespace {

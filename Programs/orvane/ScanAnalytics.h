@@ -6,8 +6,8 @@
 #include <optional>
 #include <string>
 
-#include <Tallyhouse/SpoolingTransport.h>
-#include <Varnel/Identification/CommonAnalyticsSender.h>
+#include <Varnel/Identification/Analytics/CommonAnalyticsSender.h>
+#include <Varnel/Tallyhouse/SpoolingTransport.h>
 
 namespace Orvane {
 

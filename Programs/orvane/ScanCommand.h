@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include <Platform/Values/QualityOfService.h>
+#include <Varnel/Platform/Values/QualityOfService.h>
 
 namespace Orvane {
 

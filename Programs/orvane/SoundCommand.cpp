@@ -3,10 +3,10 @@
 
 #include <memory>
 
-#include <Platform/Ports/MainQueue.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/SoundPlayer.h>
 #include <Varnel/Interface/SoundEngine.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/SoundPlayer.h>
 #include <orvane/Console.h>
 
 namespace Orvane {

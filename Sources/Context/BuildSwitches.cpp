@@ -6,10 +6,10 @@
 #include <string_view>
 #include <utility>
 
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/ProcessInfo.h>
-#include <Platform/Ports/SystemLog.h>
 #include <Varnel/Context/Product.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/ProcessInfo.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
 
 namespace {
 

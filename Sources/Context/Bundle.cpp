@@ -8,11 +8,11 @@
 #include <sstream>
 #include <utility>
 
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/ProcessInfo.h>
-#include <Platform/Ports/UserLocale.h>
-#include <Platform/Text/PropertyListParser.h>
-#include <Platform/Text/StringsTable.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/ProcessInfo.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Text/PropertyListParser.h>
+#include <Varnel/Platform/Text/StringsTable.h>
 
 namespace Varnel {
 namespace {

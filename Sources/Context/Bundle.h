@@ -7,9 +7,9 @@
 #include <string_view>
 #include <vector>
 
-#include <Platform/Api.h>
-#include <Platform/Values/PropertyValue.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/PropertyValue.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel {
 

@@ -8,9 +8,9 @@
 
 #include <nlohmann/json_fwd.hpp>
 
-#include <Basalt/Version.h>
-#include <Platform/Api.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Basalt/Version.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel {
 

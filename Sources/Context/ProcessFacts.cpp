@@ -6,14 +6,14 @@
 
 #include <nlohmann/json.hpp>
 
-#include <Basalt/Assertions.h>
-#include <Basalt/Identifier.h>
-#include <Platform/Ports/Clock.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/ProcessInfo.h>
-#include <Platform/Ports/UserAccount.h>
+#include <Varnel/Basalt/Assertions.h>
+#include <Varnel/Basalt/Identifier.h>
 #include <Varnel/Context/Bundle.h>
 #include <Varnel/Context/TargetKind.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/ProcessInfo.h>
+#include <Varnel/Platform/Ports/UserAccount.h>
 
 namespace Varnel {
 namespace {

@@ -8,11 +8,11 @@
 
 #include <nlohmann/json_fwd.hpp>
 
-#include <Basalt/Version.h>
-#include <Platform/Api.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Basalt/Version.h>
 #include <Varnel/Context/BuildSwitches.h>
 #include <Varnel/Context/OnceValue.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel::Platform {
 class Clock;

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <Platform/Api.h>
 #include <Varnel/Context/BuildSwitches.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel {
 

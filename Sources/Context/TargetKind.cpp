@@ -5,10 +5,10 @@
 
 #include <nlohmann/json.hpp>
 
-#include <Basalt/Assertions.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/Workspace.h>
+#include <Varnel/Basalt/Assertions.h>
 #include <Varnel/Context/BuildSwitches.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/Workspace.h>
 
 namespace Varnel {
 namespace {

@@ -9,9 +9,9 @@
 
 #include <nlohmann/json_fwd.hpp>
 
-#include <Platform/Api.h>
-#include <Platform/Values/URL.h>
 #include <Varnel/Context/UserFeatures.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel::Platform {
 class Workspace;

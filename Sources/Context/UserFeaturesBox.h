@@ -7,8 +7,8 @@
 
 #include <nlohmann/json_fwd.hpp>
 
-#include <Platform/Api.h>
 #include <Varnel/Context/UserFeatures.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel {
 

@@ -4,14 +4,14 @@
 #include <atomic>
 #include <utility>
 
-#include <Basalt/SecurityScopeBookkeeping.h>
-#include <Basalt/SerialQueue.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/VolumeCatalog.h>
+#include <Varnel/Basalt/SecurityScopeBookkeeping.h>
+#include <Varnel/Basalt/SerialQueue.h>
 #include <Varnel/DiskAccess/DiskData.h>
 #include <Varnel/DiskAccess/DiskRecords.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
 #include <Varnel/DiskAccess/VolumeChangeRelay.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/VolumeCatalog.h>
 
 namespace Varnel {
 namespace {

@@ -6,12 +6,12 @@
 #include <string>
 #include <vector>
 
-#include <Basalt/NotificationCenter.h>
-#include <Platform/Api.h>
-#include <Platform/Values/Date.h>
-#include <Platform/Values/QualityOfService.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Basalt/NotificationCenter.h>
 #include <Varnel/DiskAccess/DiskAccessingSession.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Platform/Values/QualityOfService.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel::Platform {
 class DeviceRegistry;

@@ -3,8 +3,8 @@
 
 #include <utility>
 
-#include <Basalt/SecurityScopeBookkeeping.h>
-#include <Basalt/SerialQueue.h>
+#include <Varnel/Basalt/SecurityScopeBookkeeping.h>
+#include <Varnel/Basalt/SerialQueue.h>
 #include <Varnel/DiskAccess/DiskData.h>
 #include <Varnel/DiskAccess/DiskRecords.h>
 #include <Varnel/DiskAccess/WaitingDeadline.h>

@@ -5,10 +5,10 @@
 #include <optional>
 #include <string>
 
-#include <Platform/Api.h>
-#include <Platform/Values/Date.h>
-#include <Platform/Values/QualityOfService.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Platform/Values/QualityOfService.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Basalt {
 class SecurityScopeBookkeeping;

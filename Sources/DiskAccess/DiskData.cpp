@@ -4,7 +4,7 @@
 #include <algorithm>
 #include <utility>
 
-#include <Basalt/SerialQueue.h>
+#include <Varnel/Basalt/SerialQueue.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
 
 namespace Varnel {

@@ -7,11 +7,11 @@
 #include <memory>
 #include <vector>
 
-#include <Basalt/Bag.h>
-#include <Basalt/Semaphore.h>
-#include <Basalt/ThreadID.h>
-#include <Platform/Api.h>
-#include <Platform/Values/QualityOfService.h>
+#include <Varnel/Basalt/Bag.h>
+#include <Varnel/Basalt/Semaphore.h>
+#include <Varnel/Basalt/ThreadID.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/QualityOfService.h>
 
 namespace Basalt {
 class SerialQueue;

@@ -4,10 +4,10 @@
 #include <string_view>
 #include <utility>
 
-#include <Platform/Ports/DeviceRegistry.h>
-#include <Platform/Ports/DiskArbitration.h>
-#include <Platform/Ports/VolumeCatalog.h>
-#include <Platform/Values/UUID.h>
+#include <Varnel/Platform/Ports/DeviceRegistry.h>
+#include <Varnel/Platform/Ports/DiskArbitration.h>
+#include <Varnel/Platform/Ports/VolumeCatalog.h>
+#include <Varnel/Platform/Values/UUID.h>
 
 namespace Varnel::DiskInventory {
 namespace {

@@ -3,7 +3,7 @@
 
 #include <utility>
 
-#include <Basalt/SerialQueue.h>
+#include <Varnel/Basalt/SerialQueue.h>
 #include <Varnel/DiskAccess/DiskData.h>
 
 namespace Varnel {

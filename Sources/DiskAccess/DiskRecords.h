@@ -7,9 +7,9 @@
 #include <utility>
 #include <vector>
 
-#include <Basalt/ThreadID.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Basalt/ThreadID.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Basalt {
 class SerialQueue;

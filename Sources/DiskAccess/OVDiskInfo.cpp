@@ -4,9 +4,9 @@
 #include <array>
 #include <utility>
 
-#include <Platform/Ports/DeviceRegistry.h>
-#include <Platform/Ports/Ports.h>
 #include <Varnel/DiskAccess/DiskInventory.h>
+#include <Varnel/Platform/Ports/DeviceRegistry.h>
+#include <Varnel/Platform/Ports/Ports.h>
 
 namespace Varnel {
 namespace {

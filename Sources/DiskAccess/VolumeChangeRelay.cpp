@@ -3,7 +3,7 @@
 
 #include <string>
 
-#include <Basalt/NotificationCenter.h>
+#include <Varnel/Basalt/NotificationCenter.h>
 
 namespace Varnel {
 namespace {

@@ -4,8 +4,8 @@
 #include <memory>
 #include <string_view>
 
-#include <Platform/Api.h>
-#include <Platform/Ports/VolumeCatalog.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Ports/VolumeCatalog.h>
 
 namespace Basalt {
 class NotificationCenter;

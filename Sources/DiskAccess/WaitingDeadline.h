@@ -3,7 +3,7 @@
 
 #include <optional>
 
-#include <Platform/Values/Date.h>
+#include <Varnel/Platform/Values/Date.h>
 
 namespace Varnel {
 

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Interface/AccessibleAction.h>
 
-#include <Basalt/Identifier.h>
+#include <Varnel/Basalt/Identifier.h>
 
 namespace Varnel {
 

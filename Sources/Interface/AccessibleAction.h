@@ -4,7 +4,7 @@
 #include <string>
 #include <utility>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel {
 

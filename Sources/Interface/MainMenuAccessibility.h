@@ -6,7 +6,7 @@
 #include <utility>
 #include <vector>
 
-#include <Basalt/Identifier.h>
+#include <Varnel/Basalt/Identifier.h>
 #include <Varnel/Interface/MenuItemGroup.h>
 
 namespace Varnel {

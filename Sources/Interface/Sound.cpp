@@ -2,7 +2,7 @@
 #include <Varnel/Interface/Sound.h>
 
 #include <Varnel/Context/Bundle.h>
-#include <Varnel/Context/VarnelModule.h>
+#include <Varnel/Modules/VarnelModule.h>
 
 namespace Varnel {
 

@@ -4,7 +4,7 @@
 #include <fstream>
 #include <sstream>
 
-#include <Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/Ports.h>
 
 namespace Varnel {
 namespace {

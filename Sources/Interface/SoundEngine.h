@@ -7,9 +7,9 @@
 #include <string>
 #include <utility>
 
-#include <Platform/Api.h>
-#include <Platform/Ports/SoundPlayer.h>
 #include <Varnel/Interface/Sound.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Ports/SoundPlayer.h>
 
 namespace Varnel {
 

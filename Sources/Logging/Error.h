@@ -4,8 +4,8 @@
 #include <string>
 #include <string_view>
 
-#include <Platform/Api.h>
-#include <Platform/Values/PlatformError.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/PlatformError.h>
 
 namespace Varnel {
 

@@ -8,10 +8,10 @@
 #include <typeinfo>
 #include <utility>
 
-#include <Basalt/JSON.h>
-#include <Platform/Text/TypeName.h>
+#include <Varnel/Basalt/JSON.h>
 #include <Varnel/Context/Globals.h>
 #include <Varnel/Logging/Error.h>
+#include <Varnel/Platform/Text/TypeName.h>
 
 namespace Varnel {
 namespace {

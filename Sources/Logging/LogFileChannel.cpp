@@ -7,8 +7,8 @@
 
 #include <fmt/format.h>
 
-#include <Platform/Concurrency/CurrentThread.h>
-#include <Platform/Concurrency/StartThread.h>
+#include <Varnel/Platform/Concurrency/CurrentThread.h>
+#include <Varnel/Platform/Concurrency/StartThread.h>
 
 namespace Varnel {
 namespace {

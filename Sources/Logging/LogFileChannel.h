@@ -11,9 +11,9 @@
 #include <string_view>
 #include <thread>
 
-#include <Platform/Ports/AppendFiles.h>
-#include <Platform/Ports/StandardOutput.h>
 #include <Varnel/Logging/LogWritePolicy.h>
+#include <Varnel/Platform/Ports/AppendFiles.h>
+#include <Varnel/Platform/Ports/StandardOutput.h>
 
 namespace Varnel {
 

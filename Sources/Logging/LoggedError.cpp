@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Logging/LoggedError.h>
 
-#include <Platform/Text/VisibleText.h>
 #include <Varnel/Logging/CustomLogStringConvertible.h>
 #include <Varnel/Logging/ErrorBridging.h>
+#include <Varnel/Platform/Text/VisibleText.h>
 
 namespace Varnel {
 namespace {

@@ -7,9 +7,9 @@
 #include <string_view>
 #include <system_error>
 
-#include <Platform/Api.h>
-#include <Platform/Values/PlatformError.h>
 #include <Varnel/Logging/Error.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/PlatformError.h>
 
 namespace Varnel {
 

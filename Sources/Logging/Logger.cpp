@@ -8,18 +8,18 @@
 
 #include <fmt/format.h>
 
-#include <Platform/Concurrency/ForkedChild.h>
-#include <Platform/Ports/AppendFiles.h>
-#include <Platform/Ports/Clock.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/StandardOutput.h>
-#include <Platform/Ports/TimeZones.h>
-#include <Platform/Ports/UserAccount.h>
-#include <Platform/Ports/UserLocale.h>
-#include <Platform/Text/VisibleText.h>
 #include <Varnel/Context/Globals.h>
 #include <Varnel/Logging/LogEntry.h>
 #include <Varnel/Logging/LogFileChannel.h>
+#include <Varnel/Platform/Concurrency/ForkedChild.h>
+#include <Varnel/Platform/Ports/AppendFiles.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/StandardOutput.h>
+#include <Varnel/Platform/Ports/TimeZones.h>
+#include <Varnel/Platform/Ports/UserAccount.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Text/VisibleText.h>
 
 namespace Varnel {
 namespace {

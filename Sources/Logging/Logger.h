@@ -8,16 +8,16 @@
 #include <string>
 #include <string_view>
 
-#include <Basalt/FuzzyByteCountFormatter.h>
-#include <Platform/Api.h>
-#include <Platform/Text/ByteCountFormatter.h>
-#include <Platform/Text/DateFormatter.h>
-#include <Platform/Text/DurationFormatter.h>
-#include <Platform/Values/Date.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Basalt/FuzzyByteCountFormatter.h>
 #include <Varnel/Logging/LoggedError.h>
 #include <Varnel/Logging/LoggingContextTag.h>
 #include <Varnel/Logging/SourcePosition.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Text/ByteCountFormatter.h>
+#include <Varnel/Platform/Text/DateFormatter.h>
+#include <Varnel/Platform/Text/DurationFormatter.h>
+#include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel::Platform {
 class AppendFiles;

@@ -6,9 +6,9 @@
 #include <variant>
 #include <vector>
 
-#include <Platform/Api.h>
-#include <Platform/Values/URL.h>
 #include <Varnel/Logging/LoggedError.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel {
 

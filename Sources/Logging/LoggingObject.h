@@ -4,11 +4,11 @@
 #include <optional>
 #include <string_view>
 
-#include <Platform/Api.h>
-#include <Platform/Values/URL.h>
 #include <Varnel/Logging/LoggedError.h>
 #include <Varnel/Logging/LoggingContextTag.h>
 #include <Varnel/Logging/SourcePosition.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel {
 

@@ -3,9 +3,9 @@
 
 #include <optional>
 
-#include <Platform/Api.h>
 #include <Varnel/Logging/Error.h>
 #include <Varnel/Logging/UserErrorInfo.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel {
 

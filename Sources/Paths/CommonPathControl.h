@@ -4,8 +4,8 @@
 #include <memory>
 #include <utility>
 
-#include <Platform/Api.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel {
 

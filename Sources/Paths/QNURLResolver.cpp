@@ -4,9 +4,9 @@
 #include <algorithm>
 #include <utility>
 
-#include <Basalt/FileURLs.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Text/KeyedArchive.h>
+#include <Varnel/Basalt/FileURLs.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Text/KeyedArchive.h>
 
 namespace Varnel {
 namespace {

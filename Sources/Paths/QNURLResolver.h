@@ -8,9 +8,9 @@
 #include <string>
 #include <string_view>
 
-#include <Platform/Api.h>
-#include <Platform/Values/PathComponents.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/PathComponents.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Varnel::Platform {
 class KeyedArchiver;

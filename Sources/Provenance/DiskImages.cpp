@@ -5,8 +5,8 @@
 #include <string_view>
 #include <thread>
 
-#include <Platform/Ports/ProcessLauncher.h>
-#include <Platform/Text/PropertyListParser.h>
+#include <Varnel/Platform/Ports/ProcessLauncher.h>
+#include <Varnel/Platform/Text/PropertyListParser.h>
 
 namespace Varnel {
 namespace {

@@ -4,8 +4,8 @@
 #include <optional>
 #include <string>
 
-#include <Platform/Values/Date.h>
-#include <Platform/Values/PropertyValue.h>
+#include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Platform/Values/PropertyValue.h>
 
 namespace Varnel::Platform {
 class ProcessLauncher;

@@ -4,14 +4,14 @@
 #include <system_error>
 #include <utility>
 
-#include <Basalt/Executor.h>
-#include <Platform/Ports/ExtendedAttributes.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/ProcessInfo.h>
-#include <Platform/Ports/ProcessLauncher.h>
-#include <Platform/Ports/SystemLog.h>
-#include <Platform/Ports/UserDefaults.h>
-#include <Platform/Ports/VolumeCatalog.h>
+#include <Varnel/Basalt/Executor.h>
+#include <Varnel/Platform/Ports/ExtendedAttributes.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/ProcessInfo.h>
+#include <Varnel/Platform/Ports/ProcessLauncher.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Ports/UserDefaults.h>
+#include <Varnel/Platform/Ports/VolumeCatalog.h>
 #include <Varnel/Provenance/DiskImages.h>
 #include <Varnel/Provenance/EventFilters.h>
 

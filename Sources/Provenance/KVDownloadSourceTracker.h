@@ -6,8 +6,8 @@
 #include <string>
 #include <vector>
 
-#include <Platform/Api.h>
-#include <Platform/Values/Date.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/Date.h>
 #include <Varnel/Provenance/KVQuarantine.h>
 
 namespace Basalt {

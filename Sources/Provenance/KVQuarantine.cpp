@@ -4,12 +4,12 @@
 #include <string_view>
 #include <utility>
 
-#include <Platform/Generic/SQLiteDatabase.h>
-#include <Platform/Ports/ExtendedAttributes.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/SystemLog.h>
-#include <Platform/Ports/UserAccount.h>
-#include <Platform/Text/UTF8.h>
+#include <Varnel/Platform/Generic/SQLiteDatabase.h>
+#include <Varnel/Platform/Ports/ExtendedAttributes.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Ports/UserAccount.h>
+#include <Varnel/Platform/Text/UTF8.h>
 #include <Varnel/Provenance/DownloadList.h>
 
 namespace Varnel {

@@ -6,8 +6,8 @@
 #include <string>
 #include <vector>
 
-#include <Platform/Api.h>
-#include <Platform/Values/URL.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/URL.h>
 #include <Varnel/Provenance/KVQuarantineEntry.h>
 
 namespace Varnel::Platform {

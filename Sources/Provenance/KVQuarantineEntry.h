@@ -8,8 +8,8 @@
 #include <string_view>
 #include <utility>
 
-#include <Platform/Api.h>
-#include <Platform/Values/PropertyValue.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/PropertyValue.h>
 
 namespace Varnel {
 

@@ -3,7 +3,7 @@
 
 #include <cstdint>
 
-#include <Platform/Values/PropertyValue.h>
+#include <Varnel/Platform/Values/PropertyValue.h>
 
 namespace Varnel {
 

@@ -3,8 +3,8 @@
 
 #include <utility>
 
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/Workspace.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/Workspace.h>
 
 namespace Varnel {
 namespace {

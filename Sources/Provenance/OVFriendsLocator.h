@@ -4,7 +4,7 @@
 #include <memory>
 #include <mutex>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel::Platform {
 class Workspace;

@@ -1,14 +1,14 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Reminders/NextDayCleanupReminderInfo.h>
 
-#include <Platform/Ports/Clock.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/TimeZones.h>
-#include <Platform/Ports/UserLocale.h>
-#include <Platform/Text/ByteCountFormatter.h>
-#include <Platform/Text/Calendar.h>
-#include <Platform/Text/TextFormat.h>
-#include <Varnel/Context/VarnelModule.h>
+#include <Varnel/Modules/VarnelModule.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/TimeZones.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Text/ByteCountFormatter.h>
+#include <Varnel/Platform/Text/Calendar.h>
+#include <Varnel/Platform/Text/TextFormat.h>
 
 namespace Varnel {
 

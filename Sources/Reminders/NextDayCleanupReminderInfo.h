@@ -4,8 +4,8 @@
 #include <cstdint>
 #include <string>
 
-#include <Platform/Api.h>
-#include <Platform/Values/UserNotification.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/UserNotification.h>
 
 namespace Varnel::Platform {
 class Clock;

@@ -5,12 +5,12 @@
 
 #include <nlohmann/json.hpp>
 
-#include <Basalt/Assertions.h>
-#include <Basalt/JSON.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Text/Calendar.h>
+#include <Varnel/Basalt/Assertions.h>
+#include <Varnel/Basalt/JSON.h>
 #include <Varnel/Context/Globals.h>
-#include <Varnel/Context/VarnelModule.h>
+#include <Varnel/Modules/VarnelModule.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Text/Calendar.h>
 
 namespace Varnel {
 namespace {

@@ -9,8 +9,8 @@
 
 #include <nlohmann/json_fwd.hpp>
 
-#include <Platform/Api.h>
-#include <Platform/Values/DateComponents.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/DateComponents.h>
 
 namespace Varnel::Platform {
 class Calendar;

@@ -3,7 +3,7 @@
 
 #include <nlohmann/json.hpp>
 
-#include <Basalt/JSON.h>
+#include <Varnel/Basalt/JSON.h>
 
 namespace Varnel {
 namespace {

@@ -9,7 +9,7 @@
 
 #include <nlohmann/json_fwd.hpp>
 
-#include <Platform/Api.h>
+#include <Varnel/Platform/Api.h>
 #include <Varnel/Reminders/SchedulePeriodOption.h>
 
 namespace Varnel {

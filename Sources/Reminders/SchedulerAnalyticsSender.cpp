@@ -3,11 +3,11 @@
 
 #include <utility>
 
-#include <Platform/Ports/Clock.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/TimeZones.h>
-#include <Platform/Ports/UserLocale.h>
-#include <Platform/Text/DateFormatter.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/TimeZones.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Text/DateFormatter.h>
 
 namespace Varnel {
 namespace {

@@ -4,8 +4,8 @@
 #include <memory>
 #include <string>
 
-#include <Platform/Api.h>
-#include <Varnel/Identification/CommonAnalyticsSender.h>
+#include <Varnel/Identification/Analytics/CommonAnalyticsSender.h>
+#include <Varnel/Platform/Api.h>
 
 namespace Varnel::Platform {
 class Clock;

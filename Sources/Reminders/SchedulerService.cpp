@@ -4,19 +4,19 @@
 #include <utility>
 #include <vector>
 
-#include <Basalt/MainQueueExecutor.h>
-#include <Platform/Ports/Clock.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/TimeZones.h>
-#include <Platform/Ports/UserLocale.h>
-#include <Platform/Ports/UserNotificationCenter.h>
-#include <Platform/Text/ByteCountFormatter.h>
-#include <Platform/Text/Calendar.h>
-#include <Platform/Text/TextFormat.h>
-#include <Varnel/Context/BaseModule.h>
+#include <Varnel/Basalt/MainQueueExecutor.h>
 #include <Varnel/Context/Globals.h>
 #include <Varnel/Context/ProcessFacts.h>
-#include <Varnel/Context/VarnelModule.h>
+#include <Varnel/Modules/BaseModule.h>
+#include <Varnel/Modules/VarnelModule.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/TimeZones.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Ports/UserNotificationCenter.h>
+#include <Varnel/Platform/Text/ByteCountFormatter.h>
+#include <Varnel/Platform/Text/Calendar.h>
+#include <Varnel/Platform/Text/TextFormat.h>
 #include <Varnel/Reminders/UserNotificationRouter.h>
 
 namespace Varnel {

@@ -5,10 +5,10 @@
 #include <memory>
 #include <string>
 
-#include <Basalt/ExecutionContext.h>
-#include <Platform/Api.h>
-#include <Platform/Values/Date.h>
-#include <Platform/Values/DateComponents.h>
+#include <Varnel/Basalt/ExecutionContext.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Platform/Values/DateComponents.h>
 #include <Varnel/Reminders/SchedulePeriodOption.h>
 #include <Varnel/Reminders/SchedulerAnalyticsSender.h>
 

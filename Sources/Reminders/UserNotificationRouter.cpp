@@ -5,12 +5,12 @@
 #include <mutex>
 #include <utility>
 
-#include <Basalt/MainQueueExecutor.h>
-#include <Platform/Ports/Application.h>
-#include <Platform/Ports/MainQueue.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/UserNotificationCenter.h>
+#include <Varnel/Basalt/MainQueueExecutor.h>
 #include <Varnel/Context/Globals.h>
+#include <Varnel/Platform/Ports/Application.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/UserNotificationCenter.h>
 
 namespace Varnel {
 

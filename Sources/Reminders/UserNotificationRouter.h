@@ -7,9 +7,9 @@
 #include <optional>
 #include <string>
 
-#include <Basalt/Channel.h>
-#include <Platform/Api.h>
-#include <Platform/Values/UserNotification.h>
+#include <Varnel/Basalt/Channel.h>
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/UserNotification.h>
 
 namespace Varnel::Platform {
 class Application;

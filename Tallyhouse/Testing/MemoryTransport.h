@@ -5,7 +5,7 @@
 #include <utility>
 #include <vector>
 
-#include <Tallyhouse/AnalyticsTransport.h>
+#include <Varnel/Tallyhouse/AnalyticsTransport.h>
 
 namespace Tallyhouse::Testing {
 

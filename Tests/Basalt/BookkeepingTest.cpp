@@ -6,10 +6,10 @@
 #include <set>
 #include <vector>
 
-#include <Basalt/Bag.h>
-#include <Basalt/Block.h>
-#include <Basalt/SecurityScopeBookkeeping.h>
-#include <Platform/Testing/FakeSecurityScope.h>
+#include <Varnel/Basalt/Bag.h>
+#include <Varnel/Basalt/Block.h>
+#include <Varnel/Basalt/SecurityScopeBookkeeping.h>
+#include <Varnel/Platform/Testing/FakeSecurityScope.h>
 
 namespace Basalt {
 namespace {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Basalt/NotificationCenter.h>
+#include <Varnel/Basalt/NotificationCenter.h>
 
 #include <gtest/gtest.h>
 

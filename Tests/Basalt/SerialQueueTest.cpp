@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Basalt/SerialQueue.h>
+#include <Varnel/Basalt/SerialQueue.h>
 
 #include <gtest/gtest.h>
 
@@ -12,8 +12,8 @@
 #include <thread>
 #include <vector>
 
-#include <Basalt/Semaphore.h>
-#include <Basalt/ThreadID.h>
+#include <Varnel/Basalt/Semaphore.h>
+#include <Varnel/Basalt/ThreadID.h>
 
 namespace Basalt {
 namespace {

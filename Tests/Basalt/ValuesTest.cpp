@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <gtest/gtest.h>
 
-#include <Basalt/Identifier.h>
-#include <Basalt/Version.h>
+#include <Varnel/Basalt/Identifier.h>
+#include <Varnel/Basalt/Version.h>
 
 namespace Basalt {
 namespace {

@@ -6,8 +6,8 @@
 
 #include <Tests/Context/PropertyLists.h>
 #include <Tests/Support/TemporaryFolder.h>
-#include <Varnel/Context/VarnelModule.h>
 #include <Varnel/Logging/Logger.h>
+#include <Varnel/Modules/VarnelModule.h>
 
 namespace Varnel {
 namespace {

@@ -6,13 +6,13 @@
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
-#include <Platform/Testing/FakeProcessInfo.h>
-#include <Platform/Testing/FakeUser.h>
-#include <Platform/Testing/FakeWorkspace.h>
-#include <Platform/Testing/SimulatedClock.h>
 #include <Tests/Context/PropertyLists.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Context/Globals.h>
+#include <Varnel/Platform/Testing/FakeProcessInfo.h>
+#include <Varnel/Platform/Testing/FakeUser.h>
+#include <Varnel/Platform/Testing/FakeWorkspace.h>
+#include <Varnel/Platform/Testing/SimulatedClock.h>
 
 namespace Varnel {
 namespace {

@@ -4,8 +4,8 @@
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
-#include <Platform/Testing/FakeWorkspace.h>
 #include <Varnel/Context/BuildSwitches.h>
+#include <Varnel/Platform/Testing/FakeWorkspace.h>
 
 namespace Varnel {
 namespace {

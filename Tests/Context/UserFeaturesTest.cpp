@@ -4,7 +4,7 @@
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
-#include <Basalt/JSON.h>
+#include <Varnel/Basalt/JSON.h>
 #include <Varnel/Context/UserFeaturesBox.h>
 
 namespace Varnel {

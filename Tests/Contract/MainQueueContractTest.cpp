@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -13,12 +13,12 @@
 #include <thread>
 #include <vector>
 
-#include <Platform/Generic/WatchedMainQueue.h>
-#include <Platform/Linux/Adapters.h>
-#include <Platform/Ports/SystemLog.h>
-#include <Platform/Testing/CapturedOutput.h>
-#include <Platform/Testing/FakeMainQueue.h>
 #include <Tests/Support/DrainUntil.h>
+#include <Varnel/Platform/Generic/WatchedMainQueue.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Testing/FakeMainQueue.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -5,11 +5,11 @@
 #include <mutex>
 #include <set>
 
-#include <Platform/Linux/Adapters.h>
-#include <Platform/Linux/MountTable.h>
-#include <Platform/Testing/FakeVolumeCatalog.h>
 #include <Tests/Support/MountNamespace.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/Disks/MountTable.h>
+#include <Varnel/Platform/Testing/FakeVolumeCatalog.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -10,17 +10,17 @@
 #include <thread>
 #include <vector>
 
-#include <Basalt/Semaphore.h>
-#include <Basalt/SerialQueue.h>
-#include <Platform/Testing/FakeDeviceRegistry.h>
-#include <Platform/Testing/FakeDiskArbitration.h>
-#include <Platform/Testing/FakeSecurityScope.h>
-#include <Platform/Testing/FakeVolumeCatalog.h>
+#include <Varnel/Basalt/Semaphore.h>
+#include <Varnel/Basalt/SerialQueue.h>
 #include <Varnel/DiskAccess/DiskAccessGuard.h>
 #include <Varnel/DiskAccess/DiskData.h>
 #include <Varnel/DiskAccess/ManagedAccess.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
 #include <Varnel/DiskAccess/VolumeChangeRelay.h>
+#include <Varnel/Platform/Testing/FakeDeviceRegistry.h>
+#include <Varnel/Platform/Testing/FakeDiskArbitration.h>
+#include <Varnel/Platform/Testing/FakeSecurityScope.h>
+#include <Varnel/Platform/Testing/FakeVolumeCatalog.h>
 
 namespace Varnel {
 namespace {

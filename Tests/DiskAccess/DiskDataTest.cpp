@@ -8,7 +8,7 @@
 #include <optional>
 #include <vector>
 
-#include <Basalt/SerialQueue.h>
+#include <Varnel/Basalt/SerialQueue.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
 #include <Varnel/DiskAccess/WaitingDeadline.h>
 

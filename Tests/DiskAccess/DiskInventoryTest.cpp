@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
-#include <Platform/Testing/FakeDeviceRegistry.h>
-#include <Platform/Testing/FakeDiskArbitration.h>
-#include <Platform/Testing/FakeVolumeCatalog.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
+#include <Varnel/Platform/Testing/FakeDeviceRegistry.h>
+#include <Varnel/Platform/Testing/FakeDiskArbitration.h>
+#include <Varnel/Platform/Testing/FakeVolumeCatalog.h>
 
 namespace Varnel {
 namespace {

@@ -1,23 +1,23 @@
 // SPDX-License-Identifier: MIT
-#include <Varnel/Identification/CommonAnalyticsSender.h>
+#include <Varnel/Identification/Analytics/CommonAnalyticsSender.h>
 
 #include <cmath>
 #include <latch>
 #include <limits>
 #include <thread>
 
-#include <Platform/Testing/CapturedOutput.h>
-#include <Platform/Testing/FakeAppendFiles.h>
-#include <Platform/Testing/FakeTimeZones.h>
-#include <Platform/Testing/FakeUser.h>
-#include <Platform/Testing/FakeWorkspace.h>
-#include <Platform/Testing/SimulatedClock.h>
-#include <Tallyhouse/Testing/MemoryTransport.h>
-#include <Varnel/Identification/CustomDimensionValues.h>
-#include <Varnel/Identification/CustomDimensionsHolder.h>
-#include <Varnel/Identification/FoundValue.h>
+#include <Varnel/Identification/Analytics/CustomDimensionValues.h>
+#include <Varnel/Identification/Analytics/CustomDimensionsHolder.h>
+#include <Varnel/Identification/Analytics/FoundValue.h>
 #include <Varnel/Logging/Logger.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Testing/FakeAppendFiles.h>
+#include <Varnel/Platform/Testing/FakeTimeZones.h>
+#include <Varnel/Platform/Testing/FakeUser.h>
+#include <Varnel/Platform/Testing/FakeWorkspace.h>
+#include <Varnel/Platform/Testing/SimulatedClock.h>
 #include <Varnel/Provenance/OVFriendsLocator.h>
+#include <Varnel/Tallyhouse/Testing/MemoryTransport.h>
 #include <gtest/gtest.h>
 
 namespace Varnel {

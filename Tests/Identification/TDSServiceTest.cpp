@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: MIT
-#include <Varnel/Identification/TDSService.h>
+#include <Varnel/Identification/Links/TDSService.h>
 
 #include <functional>
 
-#include <Platform/Testing/FakeProcessInfo.h>
-#include <Platform/Testing/FakeUser.h>
-#include <Varnel/Identification/Identificator.h>
-#include <Varnel/Identification/TDSServiceValidator.h>
+#include <Varnel/Identification/Links/TDSServiceValidator.h>
+#include <Varnel/Identification/User/Identificator.h>
+#include <Varnel/Platform/Testing/FakeProcessInfo.h>
+#include <Varnel/Platform/Testing/FakeUser.h>
 #include <gtest/gtest.h>
 
 #include <Tests/Context/PropertyLists.h>

@@ -1,23 +1,23 @@
 // SPDX-License-Identifier: MIT
-#include <Varnel/Identification/UserIdentificator.h>
+#include <Varnel/Identification/User/UserIdentificator.h>
 
 #include <gtest/gtest.h>
 
-#include <Basalt/Digest.h>
-#include <Platform/Testing/CapturedOutput.h>
-#include <Platform/Testing/FakeCookieStorage.h>
-#include <Platform/Testing/FakeExtendedAttributes.h>
-#include <Platform/Testing/FakeMachineIdentity.h>
-#include <Platform/Testing/FakeProcessInfo.h>
-#include <Platform/Testing/FakeProcessLauncher.h>
-#include <Platform/Testing/FakeUser.h>
-#include <Platform/Testing/FakeUserDefaults.h>
-#include <Platform/Testing/FakeVolumeCatalog.h>
 #include <Tests/Support/QuarantineDatabase.h>
 #include <Tests/Support/TemporaryFolder.h>
-#include <Varnel/Identification/IdentifierRules.h>
-#include <Varnel/Identification/KeptDownloadSource.h>
-#include <Varnel/Identification/UserIdentificationInfo.h>
+#include <Varnel/Basalt/Digest.h>
+#include <Varnel/Identification/User/IdentifierRules.h>
+#include <Varnel/Identification/User/KeptDownloadSource.h>
+#include <Varnel/Identification/User/UserIdentificationInfo.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Testing/FakeCookieStorage.h>
+#include <Varnel/Platform/Testing/FakeExtendedAttributes.h>
+#include <Varnel/Platform/Testing/FakeMachineIdentity.h>
+#include <Varnel/Platform/Testing/FakeProcessInfo.h>
+#include <Varnel/Platform/Testing/FakeProcessLauncher.h>
+#include <Varnel/Platform/Testing/FakeUser.h>
+#include <Varnel/Platform/Testing/FakeUserDefaults.h>
+#include <Varnel/Platform/Testing/FakeVolumeCatalog.h>
 
 namespace Varnel {
 namespace {

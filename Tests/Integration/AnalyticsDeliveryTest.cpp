@@ -15,15 +15,15 @@
 #include <string_view>
 #include <thread>
 
-#include <Platform/Ports/HTTPClient.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Values/URL.h>
-#include <Platform/Values/URLQuery.h>
-#include <Tallyhouse/AnalyticsTracker.h>
-#include <Tallyhouse/SpoolingTransport.h>
 #include <Tests/Support/ChildProcess.h>
 #include <Tests/Support/MountNamespace.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Ports/HTTPClient.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Values/URL.h>
+#include <Varnel/Platform/Values/URLQuery.h>
+#include <Varnel/Tallyhouse/AnalyticsTracker.h>
+#include <Varnel/Tallyhouse/SpoolingTransport.h>
 
 namespace {
 

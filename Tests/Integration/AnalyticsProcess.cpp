@@ -6,8 +6,8 @@
 #include <cstdlib>
 #include <string>
 
-#include <Tallyhouse/AnalyticsTracker.h>
-#include <Tallyhouse/SpoolingTransport.h>
+#include <Varnel/Tallyhouse/AnalyticsTracker.h>
+#include <Varnel/Tallyhouse/SpoolingTransport.h>
 
 int main(int count, char** arguments) {
   using namespace Tallyhouse;

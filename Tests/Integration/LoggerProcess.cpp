@@ -9,9 +9,9 @@
 #include <string_view>
 #include <thread>
 
-#include <Platform/Ports/Ports.h>
-#include <Platform/Ports/StandardOutput.h>
 #include <Varnel/Logging/Logger.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/StandardOutput.h>
 
 // A process that logs numbered entries and ends in a given way: LoggerProcess ENDING AUTHOR COUNT
 // PAUSE, the pause between entries being in milliseconds.

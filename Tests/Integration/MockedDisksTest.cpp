@@ -7,12 +7,12 @@
 
 #include <memory>
 
-#include <Platform/Linux/Adapters.h>
-#include <Platform/Linux/MountTable.h>
-#include <Platform/Ports/DeviceRegistry.h>
-#include <Platform/Ports/DiskArbitration.h>
-#include <Platform/Ports/VolumeCatalog.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/Disks/MountTable.h>
+#include <Varnel/Platform/Ports/DeviceRegistry.h>
+#include <Varnel/Platform/Ports/DiskArbitration.h>
+#include <Varnel/Platform/Ports/VolumeCatalog.h>
 
 namespace Varnel {
 namespace {

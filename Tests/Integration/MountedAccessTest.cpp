@@ -6,12 +6,12 @@
 #include <thread>
 #include <vector>
 
-#include <Basalt/NotificationCenter.h>
-#include <Basalt/Semaphore.h>
-#include <Basalt/SerialQueue.h>
 #include <Tests/Support/DiskImage.h>
 #include <Tests/Support/MountNamespace.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Basalt/NotificationCenter.h>
+#include <Varnel/Basalt/Semaphore.h>
+#include <Varnel/Basalt/SerialQueue.h>
 #include <Varnel/DiskAccess/DiskAccessGuard.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
 #include <Varnel/DiskAccess/DiskData.h>

@@ -12,26 +12,26 @@
 #include <cstdlib>
 #include <memory>
 
-#include <Platform/Generic/NotificationStore.h>
-#include <Platform/Linux/Adapters.h>
-#include <Platform/POSIX/Adapters.h>
-#include <Platform/Ports/Clock.h>
-#include <Platform/Ports/UserNotificationCenter.h>
-#include <Platform/Testing/CapturedOutput.h>
-#include <Platform/Testing/FakeApplication.h>
-#include <Platform/Testing/FakeProcessInfo.h>
-#include <Platform/Testing/FakeTimeZones.h>
-#include <Platform/Testing/FakeUser.h>
-#include <Platform/Testing/FakeWorkspace.h>
-#include <Tallyhouse/AnalyticsTracker.h>
-#include <Tallyhouse/Testing/MemoryTransport.h>
 #include <Tests/Support/ChildProcess.h>
 #include <Tests/Support/DrainUntil.h>
 #include <Varnel/Context/ProcessFacts.h>
-#include <Varnel/Context/VarnelModule.h>
-#include <Varnel/Identification/CustomDimensionsHolder.h>
+#include <Varnel/Identification/Analytics/CustomDimensionsHolder.h>
+#include <Varnel/Modules/VarnelModule.h>
+#include <Varnel/Platform/Generic/NotificationStore.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/UserNotificationCenter.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Testing/FakeApplication.h>
+#include <Varnel/Platform/Testing/FakeProcessInfo.h>
+#include <Varnel/Platform/Testing/FakeTimeZones.h>
+#include <Varnel/Platform/Testing/FakeUser.h>
+#include <Varnel/Platform/Testing/FakeWorkspace.h>
 #include <Varnel/Reminders/SchedulerService.h>
 #include <Varnel/Reminders/UserNotificationRouter.h>
+#include <Varnel/Tallyhouse/AnalyticsTracker.h>
+#include <Varnel/Tallyhouse/Testing/MemoryTransport.h>
 
 // What runs here has a session bus and a screen of its own: see with-desktop.
 namespace Varnel {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/BackgroundSoundPlayer.h>
+#include <Varnel/Platform/Generic/BackgroundSoundPlayer.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -8,8 +8,8 @@
 #include <semaphore>
 #include <vector>
 
-#include <Platform/Generic/SoundKind.h>
-#include <Platform/Testing/FakeMainQueue.h>
+#include <Varnel/Platform/Generic/SoundKind.h>
+#include <Varnel/Platform/Testing/FakeMainQueue.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -5,9 +5,9 @@
 
 #include <map>
 
-#include <Platform/Testing/FakeSoundPlayer.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Context/Bundle.h>
+#include <Varnel/Platform/Testing/FakeSoundPlayer.h>
 
 namespace Varnel {
 namespace {

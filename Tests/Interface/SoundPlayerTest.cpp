@@ -11,13 +11,13 @@
 #include <sstream>
 #include <vector>
 
-#include <Platform/Generic/BackgroundSoundPlayer.h>
-#include <Platform/Linux/Adapters.h>
-#include <Platform/Linux/GStreamer/Output.h>
-#include <Platform/Testing/CapturedOutput.h>
 #include <Tests/Support/DrainUntil.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Interface/SoundEngine.h>
+#include <Varnel/Platform/Generic/BackgroundSoundPlayer.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/Sounds/GStreamer/Output.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
 
 namespace Varnel {
 namespace {

@@ -10,7 +10,7 @@
 
 #include <gtest/gtest.h>
 
-#include <Basalt/JSON.h>
+#include <Varnel/Basalt/JSON.h>
 #include <Varnel/Context/Globals.h>
 #include <Varnel/Logging/CustomLogStringConvertible.h>
 #include <Varnel/Logging/ErrorBridging.h>

@@ -7,8 +7,8 @@
 #include <fstream>
 #include <thread>
 
-#include <Platform/Testing/CapturedOutput.h>
-#include <Platform/Testing/FakeAppendFiles.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Testing/FakeAppendFiles.h>
 
 namespace Varnel {
 namespace {

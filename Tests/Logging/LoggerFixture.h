@@ -7,13 +7,13 @@
 
 #include <gtest/gtest.h>
 
-#include <Platform/Testing/CapturedOutput.h>
-#include <Platform/Testing/FakeAppendFiles.h>
-#include <Platform/Testing/FakeTimeZones.h>
-#include <Platform/Testing/FakeUser.h>
-#include <Platform/Testing/SimulatedClock.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Logging/Logger.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Testing/FakeAppendFiles.h>
+#include <Varnel/Platform/Testing/FakeTimeZones.h>
+#include <Varnel/Platform/Testing/FakeUser.h>
+#include <Varnel/Platform/Testing/SimulatedClock.h>
 
 namespace Varnel::Tests {
 

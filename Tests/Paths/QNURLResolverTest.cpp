@@ -5,8 +5,8 @@
 
 #include <random>
 
-#include <Platform/Text/KeyedArchive.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Text/KeyedArchive.h>
 
 namespace Varnel {
 namespace {

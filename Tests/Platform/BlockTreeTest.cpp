@@ -5,11 +5,11 @@
 #include <future>
 #include <map>
 
-#include <Platform/Linux/BlockDevices.h>
-#include <Platform/Linux/BlockTree.h>
-#include <Platform/Linux/UdevDatabase.h>
-#include <Platform/Linux/VirtioSerials.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Linux/Disks/BlockDevices.h>
+#include <Varnel/Platform/Linux/Disks/BlockTree.h>
+#include <Varnel/Platform/Linux/Disks/UdevDatabase.h>
+#include <Varnel/Platform/Linux/Disks/VirtioSerials.h>
 
 namespace Varnel::Platform::Linux {
 namespace {

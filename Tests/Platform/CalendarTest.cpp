@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/Calendar.h>
+#include <Varnel/Platform/Text/Calendar.h>
 
 #include <gtest/gtest.h>
 
 #include <limits>
 
-#include <Platform/Text/TextFormat.h>
 #include <Tests/Support/Zones.h>
+#include <Varnel/Platform/Text/TextFormat.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -1,16 +1,16 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/SQLiteCookieStorage.h>
+#include <Varnel/Platform/Generic/SQLiteCookieStorage.h>
 
 #include <gmock/gmock.h>
 #include <sqlite3.h>
 
 #include <memory>
 
-#include <Platform/Generic/SQLiteDatabase.h>
-#include <Platform/Testing/SimulatedClock.h>
 #include <Tests/Support/OpenDescriptors.h>
 #include <Tests/Support/OtherProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Generic/SQLiteDatabase.h>
+#include <Varnel/Platform/Testing/SimulatedClock.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/DateFormatter.h>
-#include <Platform/Text/DurationFormatter.h>
+#include <Varnel/Platform/Text/DateFormatter.h>
+#include <Varnel/Platform/Text/DurationFormatter.h>
 
 #include <gtest/gtest.h>
 
@@ -9,9 +9,9 @@
 #include <thread>
 #include <vector>
 
-#include <Platform/Linux/Adapters.h>
-#include <Platform/Ports/TimeZones.h>
 #include <Tests/Support/LocalZone.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Ports/TimeZones.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -1,16 +1,16 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Ports/MachineIdentity.h>
+#include <Varnel/Platform/Ports/MachineIdentity.h>
 
 #include <gmock/gmock.h>
 #include <sched.h>
 
 #include <cstdlib>
 
-#include <Platform/Linux/Adapters.h>
-#include <Platform/Linux/DefaultRoutes.h>
 #include <Tests/Support/MountNamespace.h>
 #include <Tests/Support/OtherProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/Identity/DefaultRoutes.h>
 
 namespace Varnel::Platform::Linux {
 namespace {

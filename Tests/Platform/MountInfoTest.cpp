@@ -3,8 +3,8 @@
 
 #include <random>
 
-#include <Platform/Linux/FileSystemTypes.h>
-#include <Platform/Linux/MountInfo.h>
+#include <Varnel/Platform/Linux/Disks/FileSystemTypes.h>
+#include <Varnel/Platform/Linux/Disks/MountInfo.h>
 
 namespace Varnel::Platform::Linux {
 namespace {

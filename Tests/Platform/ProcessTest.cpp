@@ -7,16 +7,16 @@
 
 #include <future>
 
-#include <Basalt/Executor.h>
-#include <Basalt/SerialQueue.h>
-#include <Platform/Concurrency/StartThread.h>
-#include <Platform/Linux/Adapters.h>
-#include <Platform/Linux/UserFolders.h>
-#include <Platform/POSIX/Adapters.h>
-#include <Platform/Ports/ProcessInfo.h>
-#include <Platform/Ports/SystemLog.h>
-#include <Platform/Ports/UserAccount.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Basalt/Executor.h>
+#include <Varnel/Basalt/SerialQueue.h>
+#include <Varnel/Platform/Concurrency/StartThread.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/Process/UserFolders.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/ProcessInfo.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Ports/UserAccount.h>
 
 namespace {
 int openedLogs = 0;

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/PropertyListParser.h>
-#include <Platform/Text/PropertyListWriter.h>
-#include <Platform/Text/StringsTable.h>
+#include <Varnel/Platform/Text/PropertyListParser.h>
+#include <Varnel/Platform/Text/PropertyListWriter.h>
+#include <Varnel/Platform/Text/StringsTable.h>
 
 #include <gtest/gtest.h>
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Ports/TimeZones.h>
+#include <Varnel/Platform/Ports/TimeZones.h>
 
 #include <gtest/gtest.h>
 #include <time.h>
@@ -10,10 +10,10 @@
 #include <string>
 #include <vector>
 
-#include <Platform/Linux/Adapters.h>
-#include <Platform/Text/Calendar.h>
-#include <Platform/Text/DateFormatter.h>
 #include <Tests/Support/LocalZone.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Text/Calendar.h>
+#include <Varnel/Platform/Text/DateFormatter.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/TypeName.h>
+#include <Varnel/Platform/Text/TypeName.h>
 
 #include <gtest/gtest.h>
 

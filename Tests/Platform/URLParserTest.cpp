@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Values/URL.h>
-#include <Platform/Values/URLQuery.h>
+#include <Varnel/Platform/Values/URL.h>
+#include <Varnel/Platform/Values/URLQuery.h>
 
 #include <gmock/gmock.h>
 

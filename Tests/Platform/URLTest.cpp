@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Values/URL.h>
+#include <Varnel/Platform/Values/URL.h>
 
 #include <gtest/gtest.h>
 

@@ -6,13 +6,13 @@
 #include <filesystem>
 #include <fstream>
 
-#include <Platform/Linux/Adapters.h>
-#include <Platform/POSIX/Adapters.h>
-#include <Platform/Ports/ExtendedAttributes.h>
-#include <Platform/Ports/UserDefaults.h>
-#include <Platform/Ports/UserLocale.h>
-#include <Platform/Text/UTF8.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/ExtendedAttributes.h>
+#include <Varnel/Platform/Ports/UserDefaults.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Text/UTF8.h>
 
 namespace Varnel::Platform {
 namespace {

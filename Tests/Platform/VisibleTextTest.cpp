@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Text/VisibleText.h>
+#include <Varnel/Platform/Text/VisibleText.h>
 
 #include <string_view>
 

@@ -3,10 +3,10 @@
 
 #include <cstdlib>
 
-#include <Platform/Linux/Adapters.h>
-#include <Platform/Linux/CommandLine.h>
-#include <Platform/Ports/Workspace.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/Process/CommandLine.h>
+#include <Varnel/Platform/Ports/Workspace.h>
 
 namespace Varnel::Platform::Linux {
 namespace {

@@ -5,8 +5,8 @@
 
 #include <Varnel/Context/Globals.h>
 #include <Varnel/Context/TargetKind.h>
-#include <Varnel/Identification/Identificator.h>
-#include <Varnel/Identification/TDSService.h>
+#include <Varnel/Identification/Links/TDSService.h>
+#include <Varnel/Identification/User/Identificator.h>
 #include <Varnel/Logging/Logger.h>
 #include <Varnel/Reminders/SchedulePeriodOption.h>
 

@@ -6,12 +6,12 @@
 #include <chrono>
 #include <thread>
 
-#include <Basalt/Semaphore.h>
-#include <Platform/Ports/VolumeCatalog.h>
-#include <Platform/Testing/FakeDeviceRegistry.h>
-#include <Platform/Testing/FakeDiskArbitration.h>
-#include <Platform/Testing/FakeSecurityScope.h>
+#include <Varnel/Basalt/Semaphore.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
+#include <Varnel/Platform/Ports/VolumeCatalog.h>
+#include <Varnel/Platform/Testing/FakeDeviceRegistry.h>
+#include <Varnel/Platform/Testing/FakeDiskArbitration.h>
+#include <Varnel/Platform/Testing/FakeSecurityScope.h>
 
 namespace Orvane::Testing {
 namespace {

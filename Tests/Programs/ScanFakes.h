@@ -9,9 +9,9 @@
 #include <utility>
 #include <vector>
 
-#include <orvane/Scan/ContentAccess.h>
-#include <orvane/Scan/FileSystem.h>
-#include <orvane/Scan/ScanObserver.h>
+#include <Scan/ContentAccess.h>
+#include <Scan/FileSystem.h>
+#include <Scan/ScanObserver.h>
 
 namespace Orvane::Testing {
 

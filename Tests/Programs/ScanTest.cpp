@@ -13,10 +13,10 @@
 #include <sstream>
 #include <thread>
 
+#include <Scan/DuplicateFinder.h>
 #include <Tests/Programs/ForbiddenCall.h>
 #include <Tests/Programs/ScanFakes.h>
 #include <Tests/Programs/ScanFolder.h>
-#include <orvane/Scan/DuplicateFinder.h>
 
 namespace Orvane::Testing {
 namespace {

@@ -8,16 +8,16 @@
 #include <future>
 #include <thread>
 
-#include <Basalt/Executor.h>
-#include <Platform/Ports/Ports.h>
-#include <Platform/Testing/CapturedOutput.h>
-#include <Platform/Testing/FakeProcessInfo.h>
-#include <Platform/Testing/FakeProcessLauncher.h>
-#include <Platform/Testing/FakeUserDefaults.h>
-#include <Platform/Testing/FakeVolumeCatalog.h>
 #include <Tests/Support/OpenDescriptors.h>
 #include <Tests/Support/QuarantineDatabase.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Basalt/Executor.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Testing/FakeProcessInfo.h>
+#include <Varnel/Platform/Testing/FakeProcessLauncher.h>
+#include <Varnel/Platform/Testing/FakeUserDefaults.h>
+#include <Varnel/Platform/Testing/FakeVolumeCatalog.h>
 #include <Varnel/Provenance/EventFilters.h>
 
 namespace Varnel {

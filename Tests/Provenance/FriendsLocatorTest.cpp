@@ -5,8 +5,8 @@
 
 #include <set>
 
-#include <Platform/Ports/Ports.h>
-#include <Platform/Testing/FakeWorkspace.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Testing/FakeWorkspace.h>
 
 namespace Varnel {
 namespace {

@@ -6,13 +6,13 @@
 
 #include <memory>
 
-#include <Platform/Testing/CapturedOutput.h>
-#include <Platform/Testing/FakeExtendedAttributes.h>
-#include <Platform/Testing/FakeUser.h>
 #include <Tests/Support/OpenDescriptors.h>
 #include <Tests/Support/OtherProcess.h>
 #include <Tests/Support/QuarantineDatabase.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Testing/FakeExtendedAttributes.h>
+#include <Varnel/Platform/Testing/FakeUser.h>
 
 namespace Varnel {
 namespace {

@@ -1,13 +1,13 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/NotificationSchedule.h>
+#include <Varnel/Platform/Generic/NotificationSchedule.h>
 
 #include <gtest/gtest.h>
 
 #include <limits>
 #include <vector>
 
-#include <Platform/Text/Calendar.h>
 #include <Tests/Support/Zones.h>
+#include <Varnel/Platform/Text/Calendar.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/NotificationStore.h>
+#include <Varnel/Platform/Generic/NotificationStore.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -13,10 +13,10 @@
 #include <fstream>
 #include <thread>
 
-#include <Platform/Testing/CapturedOutput.h>
-#include <Platform/Text/Calendar.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Tests/Support/Zones.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Text/Calendar.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -4,11 +4,11 @@
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
-#include <Basalt/JSON.h>
-#include <Platform/Testing/FakeTimeZones.h>
-#include <Platform/Text/Calendar.h>
+#include <Varnel/Basalt/JSON.h>
 #include <Varnel/Context/BuildSwitches.h>
-#include <Varnel/Context/VarnelModule.h>
+#include <Varnel/Modules/VarnelModule.h>
+#include <Varnel/Platform/Testing/FakeTimeZones.h>
+#include <Varnel/Platform/Text/Calendar.h>
 #include <Varnel/Reminders/SchedulePeriodOptionBox.h>
 
 namespace Varnel {

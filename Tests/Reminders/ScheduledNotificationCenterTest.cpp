@@ -1,17 +1,17 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/NotificationStore.h>
-#include <Platform/Generic/ScheduledNotificationCenter.h>
+#include <Varnel/Platform/Generic/NotificationStore.h>
+#include <Varnel/Platform/Generic/ScheduledNotificationCenter.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <Platform/Testing/CapturedOutput.h>
-#include <Platform/Testing/FakeMainQueue.h>
-#include <Platform/Testing/FakeNotificationServer.h>
-#include <Platform/Testing/FakeUser.h>
-#include <Platform/Testing/FakeWallClockTimer.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Tests/Support/Zones.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Testing/FakeMainQueue.h>
+#include <Varnel/Platform/Testing/FakeNotificationServer.h>
+#include <Varnel/Platform/Testing/FakeUser.h>
+#include <Varnel/Platform/Testing/FakeWallClockTimer.h>
 
 namespace Varnel::Platform {
 namespace {

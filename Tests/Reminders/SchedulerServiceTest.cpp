@@ -4,21 +4,21 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <Platform/Testing/FakeApplication.h>
-#include <Platform/Testing/FakeMainQueue.h>
-#include <Platform/Testing/FakeProcessInfo.h>
-#include <Platform/Testing/FakeUser.h>
-#include <Platform/Testing/FakeUserNotificationCenter.h>
-#include <Platform/Testing/FakeWorkspace.h>
-#include <Platform/Testing/SimulatedClock.h>
-#include <Tallyhouse/AnalyticsTracker.h>
-#include <Tallyhouse/Testing/MemoryTransport.h>
 #include <Tests/Support/Zones.h>
 #include <Varnel/Context/ProcessFacts.h>
-#include <Varnel/Context/VarnelModule.h>
-#include <Varnel/Identification/CustomDimensionsHolder.h>
+#include <Varnel/Identification/Analytics/CustomDimensionsHolder.h>
+#include <Varnel/Modules/VarnelModule.h>
+#include <Varnel/Platform/Testing/FakeApplication.h>
+#include <Varnel/Platform/Testing/FakeMainQueue.h>
+#include <Varnel/Platform/Testing/FakeProcessInfo.h>
+#include <Varnel/Platform/Testing/FakeUser.h>
+#include <Varnel/Platform/Testing/FakeUserNotificationCenter.h>
+#include <Varnel/Platform/Testing/FakeWorkspace.h>
+#include <Varnel/Platform/Testing/SimulatedClock.h>
 #include <Varnel/Reminders/NextDayCleanupReminderInfo.h>
 #include <Varnel/Reminders/UserNotificationRouter.h>
+#include <Varnel/Tallyhouse/AnalyticsTracker.h>
+#include <Varnel/Tallyhouse/Testing/MemoryTransport.h>
 
 namespace Varnel {
 namespace {

@@ -4,13 +4,13 @@
 #include <sys/socket.h>
 #include <sys/un.h>
 
-#include <Platform/Linux/Adapters.h>
-#include <Platform/POSIX/FileDescriptor.h>
-#include <Platform/Ports/MainQueue.h>
-#include <Platform/Ports/NotificationServer.h>
-#include <Platform/Testing/CapturedOutput.h>
 #include <Tests/Support/DrainUntil.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/POSIX/FileDescriptor.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/NotificationServer.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
 
 namespace Varnel::Platform {
 namespace {

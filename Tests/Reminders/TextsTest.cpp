@@ -6,8 +6,8 @@
 #include <map>
 #include <set>
 
-#include <Platform/Text/StringsTable.h>
-#include <Platform/Text/TextFormat.h>
+#include <Varnel/Platform/Text/StringsTable.h>
+#include <Varnel/Platform/Text/TextFormat.h>
 #include <Varnel/Reminders/SchedulePeriodOption.h>
 
 namespace Varnel {

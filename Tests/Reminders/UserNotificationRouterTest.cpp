@@ -7,10 +7,10 @@
 #include <latch>
 #include <thread>
 
-#include <Basalt/MainQueueExecutor.h>
-#include <Platform/Testing/FakeApplication.h>
-#include <Platform/Testing/FakeMainQueue.h>
-#include <Platform/Testing/FakeUserNotificationCenter.h>
+#include <Varnel/Basalt/MainQueueExecutor.h>
+#include <Varnel/Platform/Testing/FakeApplication.h>
+#include <Varnel/Platform/Testing/FakeMainQueue.h>
+#include <Varnel/Platform/Testing/FakeUserNotificationCenter.h>
 
 namespace Varnel {
 namespace {

@@ -11,7 +11,7 @@
 #include <fstream>
 #include <string>
 
-#include <Platform/POSIX/FileDescriptor.h>
+#include <Varnel/Platform/POSIX/FileDescriptor.h>
 
 namespace Varnel::Tests {
 

@@ -5,7 +5,7 @@
 
 #include <chrono>
 
-#include <Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
 
 namespace Varnel::Tests {
 

@@ -7,7 +7,7 @@
 #include <stdexcept>
 #include <string>
 
-#include <Platform/Generic/SQLiteDatabase.h>
+#include <Varnel/Platform/Generic/SQLiteDatabase.h>
 
 namespace Varnel::Tests {
 

@@ -4,7 +4,7 @@
 #include <string>
 #include <utility>
 
-#include <Platform/Testing/FakeTimeZones.h>
+#include <Varnel/Platform/Testing/FakeTimeZones.h>
 
 namespace Varnel::Tests {
 

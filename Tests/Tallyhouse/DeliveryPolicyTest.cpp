@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tallyhouse/DeliveryPolicy.h>
+#include <Varnel/Tallyhouse/DeliveryPolicy.h>
 
 #include <gtest/gtest.h>
 

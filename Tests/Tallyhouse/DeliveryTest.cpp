@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
-#include <Tallyhouse/Delivery.h>
+#include <Varnel/Tallyhouse/Delivery.h>
 
 #include <map>
 #include <vector>
 
-#include <Platform/Testing/FakeHTTPClient.h>
 #include <Tests/Tallyhouse/SpoolFixture.h>
+#include <Varnel/Platform/Testing/FakeHTTPClient.h>
 
 namespace Tallyhouse {
 namespace {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tallyhouse/EventSpool.h>
+#include <Varnel/Tallyhouse/EventSpool.h>
 
 #include <sys/stat.h>
 
@@ -7,8 +7,8 @@
 #include <latch>
 #include <thread>
 
-#include <Platform/Testing/FakeAppendFiles.h>
 #include <Tests/Tallyhouse/SpoolFixture.h>
+#include <Varnel/Platform/Testing/FakeAppendFiles.h>
 
 namespace Tallyhouse {
 namespace {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tallyhouse/MeasurementProtocol.h>
+#include <Varnel/Tallyhouse/MeasurementProtocol.h>
 
 #include <gtest/gtest.h>
 

@@ -7,12 +7,12 @@
 
 #include <gtest/gtest.h>
 
-#include <Platform/POSIX/Adapters.h>
-#include <Platform/Ports/AppendFiles.h>
-#include <Platform/Testing/CapturedOutput.h>
-#include <Platform/Testing/SimulatedClock.h>
-#include <Tallyhouse/EventSpool.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/AppendFiles.h>
+#include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Testing/SimulatedClock.h>
+#include <Varnel/Tallyhouse/EventSpool.h>
 
 namespace Tallyhouse::Tests {
 

@@ -1,13 +1,13 @@
 // SPDX-License-Identifier: MIT
-#include <Tallyhouse/SpoolingTransport.h>
+#include <Varnel/Tallyhouse/SpoolingTransport.h>
 
 #include <latch>
 #include <semaphore>
 #include <thread>
 
-#include <Platform/Testing/FakeHTTPClient.h>
-#include <Tallyhouse/AnalyticsTracker.h>
 #include <Tests/Tallyhouse/SpoolFixture.h>
+#include <Varnel/Platform/Testing/FakeHTTPClient.h>
+#include <Varnel/Tallyhouse/AnalyticsTracker.h>
 
 namespace Tallyhouse {
 namespace {

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <Basalt/Columns.h>
+#include <Varnel/Basalt/Columns.h>
 
 namespace Host {
 

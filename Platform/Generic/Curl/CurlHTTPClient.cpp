@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Ports/HTTPClient.h>
+#include <Varnel/Platform/Ports/HTTPClient.h>
 
 #include <curl/curl.h>
 
@@ -11,9 +11,9 @@
 #include <optional>
 #include <utility>
 
-#include <Platform/Generic/Curl/Module.h>
-#include <Platform/Generic/Curl/ThisMachine.h>
-#include <Platform/Generic/UniqueHandle.h>
+#include <Varnel/Platform/Generic/Curl/Module.h>
+#include <Varnel/Platform/Generic/Curl/ThisMachine.h>
+#include <Varnel/Platform/Values/UniqueHandle.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Platform/Generic/Curl/ThisMachine.h>
+#include <Varnel/Platform/Generic/Curl/ThisMachine.h>
 
 #include <arpa/inet.h>
 #include <netinet/in.h>
@@ -7,7 +7,7 @@
 #include <string>
 #include <string_view>
 
-#include <Platform/Generic/UniqueHandle.h>
+#include <Varnel/Platform/Values/UniqueHandle.h>
 
 namespace Varnel::Platform {
 namespace {

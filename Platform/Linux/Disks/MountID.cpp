@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Platform/Linux/Disks/MountID.h>
+
+#include <fcntl.h>
+#include <sys/stat.h>
+
+#include <cerrno>
+#include <charconv>
+#include <string_view>
+#include <system_error>
+
+#include <Varnel/Platform/Linux/Disks/KernelFolder.h>
+#include <Varnel/Platform/POSIX/FileDescriptor.h>
+
+namespace Varnel::Platform::Linux {
+namespace {
+
+PlatformError systemError(int number) {
+  return PlatformError(std::error_code(number, std::generic_category()));
+}
+
+// Kernels before 5.8 tell the mount of an open file alone. To open it so touches no more than a
+// look-up does, and fails like one.
+Result<int> mountIDOfOpened(const std::string& path) {
+  constexpr std::string_view key = "mnt_id:\t";
+  const POSIX::FileDescriptor file(::open(path.c_str(), O_PATH | O_NOFOLLOW | O_CLOEXEC));
+  if (!file) return systemError(errno);
+  const std::string facts =
+      KernelFolder("/proc/self/fdinfo").bytes(std::to_string(file.get())).value_or(std::string());
+  const std::size_t found = facts.find(key);
+  if (found == std::string::npos) return systemError(ENOTSUP);
+  int id = 0;
+  const char* const number = facts.data() + found + key.size();
+  if (std::from_chars(number, facts.data() + facts.size(), id).ec != std::errc())
+    return systemError(ENOTSUP);
+  return id;
+}
+
+}  // namespace
+
+Result<int> mountIDOf(const std::string& path) {
+  // The system would look up what stands before the zero.
+  if (path.find('\0') != std::string::npos) return systemError(EINVAL);
+  struct statx facts {};
+  constexpr int flags = AT_SYMLINK_NOFOLLOW | AT_NO_AUTOMOUNT | AT_STATX_DONT_SYNC;
+  if (::statx(AT_FDCWD, path.c_str(), flags, STATX_MNT_ID, &facts) == 0 &&
+      (facts.stx_mask & STATX_MNT_ID) != 0)
+    return static_cast<int>(facts.stx_mnt_id);
+  return mountIDOfOpened(path);
+}
+
+}  // namespace Varnel::Platform::Linux

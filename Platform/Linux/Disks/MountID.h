@@ -1,0 +1,14 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+
+#include <Varnel/Platform/Values/Result.h>
+
+namespace Varnel::Platform::Linux {
+
+/// The mount that a file lies on, by its number in the mount table. A symbolic link lies where it
+/// is, not where it points. Fails when the path cannot be looked up. Any thread.
+[[nodiscard]] Result<int> mountIDOf(const std::string& path);
+
+}  // namespace Varnel::Platform::Linux

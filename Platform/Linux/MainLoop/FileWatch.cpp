@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Platform/Linux/MainLoop/FileWatch.h>
+
+#include <sys/inotify.h>
+
+#include <unistd.h>
+
+#include <array>
+#include <cstddef>
+#include <utility>
+
+namespace Varnel::Platform::Linux {
+namespace {
+
+namespace fs = std::filesystem;
+
+// A database is written through a file that its owner keeps open, so closing is no sign.
+constexpr std::uint32_t changes =
+    IN_MODIFY | IN_CREATE | IN_DELETE | IN_MOVED_TO | IN_MOVED_FROM | IN_ATTRIB;
+
+POSIX::FileDescriptor watchOf(const fs::path& folder) {
+  POSIX::FileDescriptor descriptor(::inotify_init1(IN_NONBLOCK | IN_CLOEXEC));
+  if (descriptor) ::inotify_add_watch(descriptor.get(), folder.c_str(), changes);
+  return descriptor;
+}
+
+}  // namespace
+
+FileWatch::FileWatch(const fs::path& folder, std::string name, std::function<void()> changed)
+    : name_(std::move(name)),
+      changed_(std::move(changed)),
+      descriptor_(watchOf(folder)),
+      source_(descriptor_.get(), [this] { readEvents(); }) {}
+
+void FileWatch::readEvents() {
+  alignas(inotify_event) std::array<char, 4096> buffer{};
+  bool concerned = false;
+  while (true) {
+    const ssize_t size = ::read(descriptor_.get(), buffer.data(), buffer.size());
+    if (size <= 0) break;
+    for (ssize_t offset = 0; offset < size;) {
+      const auto* event = reinterpret_cast<const inotify_event*>(buffer.data() + offset);
+      offset += static_cast<ssize_t>(sizeof(inotify_event) + event->len);
+      // After an overflow it is not known what has changed.
+      if ((event->mask & IN_Q_OVERFLOW) != 0 || (event->len > 0 && name_ == event->name))
+        concerned = true;
+    }
+  }
+  if (concerned) changed_();
+}
+
+}  // namespace Varnel::Platform::Linux

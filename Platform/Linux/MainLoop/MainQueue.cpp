@@ -1,0 +1,99 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Platform/Ports/MainQueue.h>
+
+#include <glib.h>
+#include <sys/syscall.h>
+#include <unistd.h>
+
+#include <deque>
+#include <functional>
+#include <mutex>
+#include <optional>
+#include <utility>
+#include <vector>
+
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/MainLoop/ContextDescriptor.h>
+
+namespace Varnel::Platform::Linux {
+namespace {
+
+// Posts to GLib's default main context, which GTK, Qt and plain hosts all run. Every block has a
+// source of its own, so that a loop that a block runs inside itself still gets at the rest.
+class DefaultContextQueue final : public MainQueue {
+ public:
+  ~DefaultContextQueue() override {
+    while (g_source_remove_by_user_data(this)) {
+    }
+  }
+
+  void post(Block block) override {
+    {
+      const std::lock_guard lock(mutex_);
+      blocks_.push_back(std::move(block));
+    }
+    // Never g_main_context_invoke: it may run the block here and now.
+    GSource* source = g_idle_source_new();
+    g_source_set_priority(source, G_PRIORITY_DEFAULT);
+    g_source_set_callback(source, &DefaultContextQueue::dispatch, this, nullptr);
+    g_source_attach(source, nullptr);
+    g_source_unref(source);
+  }
+
+  bool isCurrent() const override { return ::syscall(SYS_gettid) == ::getpid(); }
+
+  void run() override {
+    bool stops = std::exchange(stopsNextRun_, false);
+    running_.push_back(&stops);
+    runWhile([&stops] { return !stops; });
+    running_.pop_back();
+  }
+
+  void stop() override {
+    post([this] { (running_.empty() ? stopsNextRun_ : *running_.back()) = true; });
+  }
+
+  void runWhile(const std::function<bool()>& condition) override {
+    while (condition()) g_main_context_iteration(nullptr, TRUE);
+  }
+
+  bool drain() override {
+    bool any = false;
+    while (g_main_context_iteration(nullptr, FALSE)) any = true;
+    return any;
+  }
+
+  std::optional<int> descriptor() override {
+    if (!descriptor_) descriptor_.emplace(g_main_context_default());
+    return descriptor_->refreshed();
+  }
+
+ private:
+  static gboolean dispatch(void* self) noexcept {
+    static_cast<DefaultContextQueue*>(self)->runNext();
+    return G_SOURCE_REMOVE;
+  }
+
+  void runNext() {
+    std::unique_lock lock(mutex_);
+    const Block block = std::move(blocks_.front());
+    blocks_.pop_front();
+    lock.unlock();
+    block();
+  }
+
+  std::mutex mutex_;  // Owns blocks_, of which there are as many as sources.
+  std::deque<Block> blocks_;
+  // The rest belongs to the main thread.
+  std::vector<bool*> running_;  // Whether each run is to end, the innermost last.
+  bool stopsNextRun_ = false;
+  std::optional<ContextDescriptor> descriptor_;
+};
+
+}  // namespace
+
+std::unique_ptr<MainQueue> makeMainQueue() {
+  return std::make_unique<DefaultContextQueue>();
+}
+
+}  // namespace Varnel::Platform::Linux

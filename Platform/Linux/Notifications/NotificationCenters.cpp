@@ -1,0 +1,86 @@
+// SPDX-License-Identifier: MIT
+#include <map>
+
+#include <Varnel/Platform/Generic/ScheduledNotificationCenter.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/MainLoop/FileWatch.h>
+#include <Varnel/Platform/Linux/Process/UserFolders.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/NotificationServer.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Ports/TimeZones.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Ports/WallClockTimer.h>
+
+namespace Varnel::Platform::Linux {
+namespace {
+
+namespace fs = std::filesystem;
+
+constexpr const char* storeName = "notifications.sqlite";
+
+// One center with all that serves it alone. Its file may be changed by other processes of the
+// product, and the link /etc/localtime when the user's time zone does.
+class Center final {
+ public:
+  Center(const NotificationPorts& ports, const fs::path& folder)
+      : server_(makeNotificationServer(ports.systemLog)),
+        timer_(makeWallClockTimer(ports.systemLog)),
+        center_({ports.clock, ports.userLocale, ports.timeZones, ports.mainQueue, ports.systemLog,
+                 *server_, *timer_},
+                folder / storeName),
+        storeWatch_(folder, storeName, [this] { center_.recheck(); }),
+        zoneWatch_("/etc", "localtime", [this] { center_.recheck(); }) {}
+
+  UserNotificationCenter& center() { return center_; }
+
+ private:
+  const std::unique_ptr<NotificationServer> server_;
+  const std::unique_ptr<WallClockTimer> timer_;
+  ScheduledNotificationCenter center_;
+  const FileWatch storeWatch_;
+  const FileWatch zoneWatch_;
+};
+
+// An identifier is the name of one folder and leads nowhere else.
+std::string folderName(std::string identifier) {
+  for (char& character : identifier)
+    if (character == '/' || character == '\0') character = '_';
+  if (identifier.empty() || identifier == "." || identifier == "..") return "_";
+  return identifier;
+}
+
+// Made before it can be watched, for its user alone.
+fs::path privateFolder(const fs::path& folder) {
+  std::error_code ignored;
+  if (fs::create_directories(folder, ignored))
+    fs::permissions(folder, fs::perms::owner_all, ignored);
+  return folder;
+}
+
+class StoredCenters final : public UserNotificationCenters {
+ public:
+  explicit StoredCenters(const NotificationPorts& ports) : ports_(ports) {}
+
+  UserNotificationCenter& center(const std::string& baseIdentifier) override {
+    auto& center = centers_[baseIdentifier];
+    if (!center)
+      center = std::make_unique<Center>(
+          ports_, privateFolder(userStateFolder() / folderName(baseIdentifier)));
+    return center->center();
+  }
+
+ private:
+  const NotificationPorts ports_;
+  std::map<std::string, std::unique_ptr<Center>> centers_;
+};
+
+}  // namespace
+
+std::unique_ptr<UserNotificationCenters> makeUserNotificationCenters(
+    const NotificationPorts& ports) {
+  return std::make_unique<StoredCenters>(ports);
+}
+
+}  // namespace Varnel::Platform::Linux

@@ -1,0 +1,63 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <gio/gio.h>
+
+#include <cstdint>
+#include <optional>
+#include <string>
+
+#include <Varnel/Platform/Ports/NotificationServer.h>
+#include <Varnel/Platform/Values/UniqueHandle.h>
+
+/// The messages of the desktop's notification service, as it is specified for all desktops.
+namespace Varnel::Platform::Linux {
+
+using BusMessage = UniqueHandle<GDBusMessage*, g_object_unref>;
+
+inline constexpr const char* notificationService = "org.freedesktop.Notifications";
+inline constexpr const char* notificationPath = "/org/freedesktop/Notifications";
+
+/// The actions that banners offer.
+inline constexpr const char* defaultAction = "default";
+inline constexpr const char* buttonAction = "action";
+inline constexpr const char* dismissAction = "dismiss";
+
+/// Why a banner was closed: the reason that says that the user did it.
+inline constexpr std::uint32_t dismissedByUser = 2;
+/// Its time was over; the server may still keep it in a list.
+inline constexpr std::uint32_t expired = 1;
+
+/// What a server can do, of that which matters here.
+struct ServerCapabilities final {
+  bool hasActions = false;
+  bool readsMarkup = false;
+};
+
+/// A banner as the bus knows it: the bus's own name, that of the server on it, and its number.
+struct BannerAddress final {
+  std::string bus;
+  std::string server;
+  std::uint32_t number = 0;
+
+  bool operator==(const BannerAddress&) const = default;
+
+  [[nodiscard]] std::string reference() const;
+  [[nodiscard]] static std::optional<BannerAddress> parse(const std::string& reference);
+};
+
+[[nodiscard]] BusMessage capabilitiesRequest();
+[[nodiscard]] ServerCapabilities capabilitiesIn(GDBusMessage* reply);
+
+/// `replaced` is the number of the banner to replace, or 0.
+[[nodiscard]] BusMessage notifyRequest(const std::string& server,
+                                       const std::string& applicationName, const Banner& banner,
+                                       ServerCapabilities capabilities, std::uint32_t replaced);
+[[nodiscard]] std::optional<std::uint32_t> bannerNumberIn(GDBusMessage* reply);
+
+[[nodiscard]] BusMessage closeRequest(const BannerAddress& banner);
+
+/// What a reply that reports an error says.
+[[nodiscard]] std::optional<std::string> errorIn(GDBusMessage* reply);
+
+}  // namespace Varnel::Platform::Linux

@@ -1,0 +1,165 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Platform/Linux/Notifications/SessionBus.h>
+
+#include <system_error>
+#include <utility>
+
+#include <Varnel/Platform/Concurrency/StartThread.h>
+
+namespace Varnel::Platform::Linux {
+namespace {
+
+using Text = UniqueHandle<char*, g_free>;
+using Cancellable = UniqueHandle<GCancellable*, g_object_unref>;
+using Block = std::function<void()>;
+
+std::string take(GError* error) {
+  std::string text = error->message;
+  g_error_free(error);
+  return text;
+}
+
+// Lets the source run the block once, on the main thread. The caller owns the source.
+GSource* attach(GSource* source, Block block) {
+  g_source_set_priority(source, G_PRIORITY_DEFAULT);
+  g_source_set_callback(
+      source,
+      [](gpointer data) -> gboolean {
+        (*static_cast<Block*>(data))();
+        return G_SOURCE_REMOVE;
+      },
+      new Block(std::move(block)), [](gpointer data) { delete static_cast<Block*>(data); });
+  g_source_attach(source, nullptr);
+  return source;
+}
+
+void dispatch(GDBusConnection*, const char* sender, const char*, const char*, const char* name,
+              GVariant* body, gpointer signal) noexcept {
+  (*static_cast<SessionBus::Signal*>(signal))(sender, name, body);
+}
+
+void release(gpointer signal) noexcept {
+  delete static_cast<SessionBus::Signal*>(signal);
+}
+
+}  // namespace
+
+struct SessionBus::Attempt {
+  const Cancellable cancellable{g_cancellable_new()};
+};
+
+struct SessionBus::AwaitedReply {
+  std::weak_ptr<SessionBus> bus;
+  Reply use;
+};
+
+SessionBus::SessionBus(Signal signal, std::chrono::milliseconds patience)
+    : signal_(std::move(signal)), patience_(patience) {}
+
+SessionBus::~SessionBus() {
+  if (attempt_) g_cancellable_cancel(attempt_->cancellable.get());
+  unsubscribe();
+}
+
+void SessionBus::connect(Connected use) {
+  if (connection_ && !g_dbus_connection_is_closed(connection_.get())) return use({});
+  waiting_.push_back(std::move(use));
+  if (!attempt_) start();
+}
+
+// A bus may accept the connection and then say nothing; even to ask for its address may mean to
+// start a program. The thread is left alone with that when the time is over.
+void SessionBus::start() {
+  const auto attempt = attempt_ = std::make_shared<Attempt>();
+  timer_ = Timer(attach(g_timeout_source_new(static_cast<guint>(patience_.count())), [this] {
+    g_cancellable_cancel(attempt_->cancellable.get());
+    finish(attempt_, {}, "The session bus does not answer.");
+  }));
+  try {
+    startThread("session-bus", [weak = weak_from_this(), attempt] {
+      std::string error;
+      const auto connection = std::make_shared<Connection>(open(attempt->cancellable.get(), error));
+      g_source_unref(attach(g_idle_source_new(), [weak, attempt, connection, error] {
+        if (const auto self = weak.lock()) self->finish(attempt, std::move(*connection), error);
+      }));
+    }).detach();
+  } catch (const std::system_error& failure) {
+    finish(attempt, {}, failure.what());
+  }
+}
+
+SessionBus::Connection SessionBus::open(GCancellable* cancellable, std::string& error) {
+  GError* failure = nullptr;
+  const Text address(g_dbus_address_get_for_bus_sync(G_BUS_TYPE_SESSION, cancellable, &failure));
+  constexpr auto flags =
+      static_cast<GDBusConnectionFlags>(G_DBUS_CONNECTION_FLAGS_AUTHENTICATION_CLIENT |
+                                        G_DBUS_CONNECTION_FLAGS_MESSAGE_BUS_CONNECTION);
+  Connection connection;
+  if (address)
+    connection = Connection(g_dbus_connection_new_for_address_sync(address.get(), flags, nullptr,
+                                                                   cancellable, &failure));
+  if (failure) error = take(failure);
+  return connection;
+}
+
+void SessionBus::finish(std::shared_ptr<Attempt> attempt, Connection connection,
+                        const std::string& error) {
+  // It was given up.
+  if (attempt != attempt_) return;
+  if (connection) adopt(std::move(connection));
+  attempt_.reset();
+  timer_ = Timer();
+  for (const Connected& use : std::exchange(waiting_, {})) use(error);
+}
+
+void SessionBus::adopt(Connection connection) {
+  // A signal of the lost connection may still be on its way to us.
+  unsubscribe();
+  connection_ = std::move(connection);
+  subscription_ = g_dbus_connection_signal_subscribe(
+      connection_.get(), notificationService, notificationService, nullptr, notificationPath,
+      nullptr, G_DBUS_SIGNAL_FLAGS_NONE, &dispatch, new Signal(signal_), &release);
+}
+
+void SessionBus::send(const BusMessage& message, Reply reply) {
+  constexpr int defaultTimeout = -1;
+  ++awaitedReplies_;
+  g_dbus_connection_send_message_with_reply(
+      connection_.get(), message.get(), G_DBUS_SEND_MESSAGE_FLAGS_NONE, defaultTimeout, nullptr,
+      nullptr, &replied, new AwaitedReply{weak_from_this(), std::move(reply)});
+}
+
+void SessionBus::replied(GObject* connection, GAsyncResult* result, gpointer data) noexcept {
+  const std::unique_ptr<AwaitedReply> awaited(static_cast<AwaitedReply*>(data));
+  GError* error = nullptr;
+  const BusMessage message(g_dbus_connection_send_message_with_reply_finish(
+      G_DBUS_CONNECTION(connection), result, &error));
+  if (const auto self = awaited->bus.lock()) --self->awaitedReplies_;
+  if (!message) return awaited->use(nullptr, take(error));
+  const auto refusal = errorIn(message.get());
+  if (refusal)
+    awaited->use(nullptr, *refusal);
+  else
+    awaited->use(message.get(), {});
+}
+
+std::string SessionBus::name() const {
+  const char* guid = connection_ ? g_dbus_connection_get_guid(connection_.get()) : nullptr;
+  return guid ? guid : "";
+}
+
+void SessionBus::unsubscribe() {
+  if (connection_) g_dbus_connection_signal_unsubscribe(connection_.get(), subscription_);
+}
+
+void SessionBus::disconnect(GDBusConnection* connection) {
+  g_dbus_connection_close(connection, nullptr, nullptr, nullptr);
+  g_object_unref(connection);
+}
+
+void SessionBus::destroy(GSource* source) {
+  g_source_destroy(source);
+  g_source_unref(source);
+}
+
+}  // namespace Varnel::Platform::Linux

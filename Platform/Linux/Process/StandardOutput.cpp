@@ -1,0 +1,140 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Platform/Ports/StandardOutput.h>
+
+#include <pthread.h>
+#include <signal.h>
+#include <stdio_ext.h>
+
+#include <atomic>
+#include <cerrno>
+#include <cstdio>
+#include <cstdlib>
+#include <ctime>
+
+#include <Varnel/Platform/Linux/Adapters.h>
+
+namespace Varnel::Platform::Linux {
+namespace {
+
+// While it lives, a write to a pipe without a reader fails and does no more: the signal that comes
+// with it goes to the writing thread and is taken back here, whatever the process does with others.
+class BrokenPipeIsNoSignal final {
+ public:
+  BrokenPipeIsNoSignal() {
+    ::sigemptyset(&brokenPipe_);
+    ::sigaddset(&brokenPipe_, SIGPIPE);
+    ::pthread_sigmask(SIG_BLOCK, &brokenPipe_, &before_);
+    wasPending_ = isPending();
+  }
+  ~BrokenPipeIsNoSignal() {
+    constexpr timespec atOnce{};
+    if (!wasPending_ && isPending())
+      while (::sigtimedwait(&brokenPipe_, nullptr, &atOnce) < 0 && errno == EINTR) continue;
+    ::pthread_sigmask(SIG_SETMASK, &before_, nullptr);
+  }
+  BrokenPipeIsNoSignal(const BrokenPipeIsNoSignal&) = delete;
+  BrokenPipeIsNoSignal& operator=(const BrokenPipeIsNoSignal&) = delete;
+
+ private:
+  static bool isPending() {
+    sigset_t pending;
+    ::sigpending(&pending);
+    return ::sigismember(&pending, SIGPIPE) == 1;
+  }
+
+  sigset_t brokenPipe_;
+  sigset_t before_;
+  bool wasPending_ = false;
+};
+
+// Holds the stream's lock, so that entries of several threads stay whole.
+class LockedStream final {
+ public:
+  explicit LockedStream(std::FILE* stream) : stream_(stream) { ::flockfile(stream); }
+  ~LockedStream() { ::funlockfile(stream_); }
+  LockedStream(const LockedStream&) = delete;
+  LockedStream& operator=(const LockedStream&) = delete;
+
+ private:
+  std::FILE* stream_;
+};
+
+// With the stream's lock held, and not for what only goes into the buffer.
+void write(std::FILE* stream, std::string_view text, bool flushes) {
+  const BrokenPipeIsNoSignal guard;
+  const bool isWritten = ::fwrite_unlocked(text.data(), 1, text.size(), stream) == text.size() &&
+                         (!flushes || ::fflush_unlocked(stream) == 0);
+  // What nobody can read any more would be tried again, by the process's end at the latest.
+  if (!isWritten && errno == EPIPE) ::__fpurge(stream);
+}
+
+std::atomic<bool> isProcessEnding = false;
+
+// Does not wait for a thread that writes to a slow reader.
+void flush() {
+  if (::ftrylockfile(stdout) != 0) return;
+  write(stdout, {}, true);
+  ::funlockfile(stdout);
+}
+
+// What the C library writes after this could end the process by a signal.
+void flushBeforeTheEnd() {
+  isProcessEnding = true;
+  flush();
+}
+
+// A child would write the same text again.
+void flushBeforeFork() {
+  flush();
+}
+
+class StandardStream : public StandardOutput {
+ public:
+  explicit StandardStream(std::FILE* stream) : stream_(stream) {}
+
+  void print(std::string_view text) override {
+    const LockedStream lock(stream_);
+    if (staysInBuffer(text.size()))
+      (void)::fwrite_unlocked(text.data(), 1, text.size(), stream_);
+    else
+      write(stream_, text, isProcessEnding);
+  }
+
+ private:
+  // Most texts do, and cost no system call.
+  bool staysInBuffer(std::size_t size) const {
+    return !::__flbf(stream_) && ::__fpending(stream_) + size < ::__fbufsize(stream_) &&
+           !isProcessEnding.load(std::memory_order_relaxed);
+  }
+
+  std::FILE* stream_;
+};
+
+// A host that prints nothing here keeps its standard output for itself.
+class BufferedStandardOutput final : public StandardStream {
+ public:
+  BufferedStandardOutput() : StandardStream(stdout) {}
+
+  void print(std::string_view text) override {
+    [[maybe_unused]] static const bool isWatched =
+        std::atexit(flushBeforeTheEnd) == 0 &&
+        ::pthread_atfork(flushBeforeFork, nullptr, nullptr) == 0;
+    StandardStream::print(text);
+  }
+};
+
+}  // namespace
+
+std::unique_ptr<StandardOutput> makeStandardOutput() {
+  return std::make_unique<BufferedStandardOutput>();
+}
+
+}  // namespace Varnel::Platform::Linux
+
+namespace Varnel::Platform {
+
+std::unique_ptr<StandardOutput> makeStandardErrorOutput() {
+  return std::make_unique<Linux::StandardStream>(stderr);
+}
+
+}  // namespace Varnel::Platform

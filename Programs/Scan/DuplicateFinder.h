@@ -1,0 +1,48 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include <Scan/ScanResult.h>
+
+namespace Orvane {
+
+class ContentAccess;
+class FileSystem;
+class ScanObserver;
+struct ScanControl;
+
+/// Finds the files of equal content in some folders. Files are told apart by ever dearer means:
+/// their size, the digest of their beginning, the digest of everything; what is left is compared
+/// byte by byte, so that the result holds true duplicates only.
+///
+///     DuplicateFinder finder({systemFileSystem(), access, observer}, 4);
+///     ScanResult result = finder.find({"/home/u/Pictures"}, control);
+///
+/// The hard links of one file are one file, known by the first of its paths; symbolic links and
+/// empty files have no part. A file that cannot be read, is gone or changes meanwhile is left out,
+/// counted and reported to the observer. The same files give the same result in the same order,
+/// however many threads read them. One call at a time; the finder keeps nothing from one to the
+/// next.
+class DuplicateFinder final {
+ public:
+  struct Ports {
+    FileSystem& fileSystem;
+    ContentAccess& access;
+    ScanObserver& observer;
+  };
+
+  /// `threads`: how many read at once, at least 1.
+  DuplicateFinder(Ports ports, unsigned threads);
+
+  /// Scans folders given by absolute paths without symbolic links. Once `control` asks to stop it
+  /// returns soon, with a result that is of no use.
+  [[nodiscard]] ScanResult find(const std::vector<std::string>& folders, ScanControl& control);
+
+ private:
+  Ports ports_;
+  unsigned threads_;
+};
+
+}  // namespace Orvane
