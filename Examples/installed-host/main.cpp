@@ -3,14 +3,14 @@
 #include <iostream>
 #include <memory>
 
-#include <Varnel/Basalt/Columns.h>
+#include <Basalt/Columns.h>
+#include <Platform/Window.h>
 #include <Varnel/Context/Globals.h>
 #include <Varnel/Identification/Links/TDSService.h>
 #include <Varnel/Identification/User/UserIdentificationInfo.h>
 #include <Varnel/Identification/User/UserIdentificator.h>
 #include <Varnel/Modules/VarnelModule.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
-#include <Varnel/Platform/Window.h>
 #include <Varnel/Reminders/NextDayCleanupReminderInfo.h>
 #include <Varnel/Reminders/SchedulePeriodOption.h>
 #include <Varnel/Reminders/UserNotificationRouter.h>

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <Varnel/Basalt/Columns.h>
+#include <Basalt/Columns.h>
 
 namespace Host {
 
