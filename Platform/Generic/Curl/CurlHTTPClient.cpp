@@ -2,6 +2,7 @@
 #include <Varnel/Platform/Ports/HTTPClient.h>
 
 #include <curl/curl.h>
+#include <unistd.h>
 
 #include <atomic>
 #include <chrono>
@@ -179,14 +180,19 @@ class CurlHTTPClient final : public HTTPClient {
 };
 
 CurlHTTPClient* madeClient = nullptr;
+::pid_t makersProcess = 0;
 
 CurlHTTPClient* makeClient() {
   if (curl_global_init(CURL_GLOBAL_DEFAULT) != CURLE_OK) return nullptr;
   auto* client = new CurlHTTPClient();
   if (!client->isUsable()) return nullptr;
   madeClient = client;
-  // Registered after those of the TLS library, and so called before them.
-  std::atexit([] { madeClient->close(); });
+  makersProcess = ::getpid();
+  // Registered after those of the TLS library, and so called before them. A forked child has nobody
+  // who would end the transfer that it was forked in.
+  std::atexit([] {
+    if (::getpid() == makersProcess) madeClient->close();
+  });
   return client;
 }
 
