@@ -4,6 +4,8 @@
 #include <dlfcn.h>
 #include <netdb.h>
 #include <sys/mount.h>
+#include <sys/wait.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <chrono>
@@ -309,6 +311,15 @@ TEST(HTTPClient, RefusesPlainHTTPUnlessAllowedAndStopsAtOnce) {
     std::stop_source other;
     other.request_stop();
     EXPECT_FALSE(http.post(plain, other.get_token()));
+    // Nor is the end of a child that is forked meanwhile.
+    const pid_t child = ::fork();
+    if (child == 0) {
+      ::alarm(10);
+      std::exit(0);
+    }
+    int status = 0;
+    EXPECT_EQ(::waitpid(child, &status, 0), child);
+    EXPECT_TRUE(WIFEXITED(status));
     stop.request_stop();
   });
   EXPECT_FALSE(http.post(plain, stop.get_token()));
