@@ -9,13 +9,10 @@
 
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
+#include <Varnel/Platform/POSIX/LastError.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {
-
-std::error_code lastError() {
-  return {errno, std::generic_category()};
-}
 
 class DescriptorAppendFile final : public AppendFile {
  public:

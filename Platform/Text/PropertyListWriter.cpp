@@ -34,6 +34,7 @@ plist_t makeNode(const PropertyValue& value);
 
 // One overload a kind of value; each gives null for what cannot be written.
 struct NodeMaker {
+  plist_t operator()(std::nullptr_t) const { return nullptr; }
   plist_t operator()(bool value) const { return plist_new_bool(value ? 1 : 0); }
   plist_t operator()(double value) const { return plist_new_real(value); }
 

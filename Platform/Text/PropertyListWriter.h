@@ -11,7 +11,7 @@ namespace Varnel::Platform {
 
 /// The value as an XML property list, which `parsePropertyList` reads back, but for the fractions
 /// of seconds: dates in this form have whole ones, and lose the rest. Absent when the value holds
-/// something that the format cannot carry: a text or key that is not UTF-8 or has control
+/// something that the format cannot carry: a null, a text or key that is not UTF-8 or has control
 /// characters, a whole number below zero, a date more than 68 years from 2001. The host's
 /// `setlocale` makes no difference. Any thread.
 [[nodiscard]] VARNEL_API std::optional<std::string> writePropertyList(const PropertyValue& value);

@@ -24,6 +24,10 @@ class Date final : public std::chrono::sys_time<std::chrono::microseconds> {
   constexpr Date(std::chrono::sys_time<Duration> point)
       : Point(std::chrono::floor<duration>(point)) {}
 
+  // As dates, for which a step in nanoseconds does not overflow.
+  [[nodiscard]] static constexpr Date min() noexcept { return Date(duration::min()); }
+  [[nodiscard]] static constexpr Date max() noexcept { return Date(duration::max()); }
+
   template <typename Rep, typename Period>
   friend constexpr Date operator+(Date date, std::chrono::duration<Rep, Period> step) {
     return Date(date.time_since_epoch() + std::chrono::floor<duration>(step));

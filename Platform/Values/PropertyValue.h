@@ -22,8 +22,9 @@ using PropertyData = std::vector<std::byte>;
 using PropertyList = std::vector<PropertyValue>;
 using PropertyDictionary = std::map<std::string, PropertyValue, std::less<>>;
 
-/// A value as property lists and device registries hold it: a truth value, a number, a text, bytes,
-/// a date, a list or a dictionary. Text is UTF-8 where its source says so and otherwise untouched.
+/// A value as property lists, device registries and JSON hold it: null, a truth value, a number, a
+/// text, bytes, a date, a list or a dictionary. Only JSON has nulls; it has neither bytes nor
+/// dates. Text is UTF-8 where its source says so and otherwise untouched.
 ///
 ///     const PropertyValue* serial = find(characteristics, "Serial Number");
 ///     if (const auto* text = serial ? serial->as<std::string>() : nullptr) use(*text);
@@ -31,9 +32,11 @@ using PropertyDictionary = std::map<std::string, PropertyValue, std::less<>>;
 /// A plain value; threads may share one as any other value. Pointers into it live as long as it.
 class PropertyValue final {
  public:
-  using Storage = std::variant<bool, std::int64_t, double, std::string, PropertyData, Date,
-                               PropertyList, PropertyDictionary>;
+  using Storage = std::variant<std::nullptr_t, bool, std::int64_t, double, std::string,
+                               PropertyData, Date, PropertyList, PropertyDictionary>;
 
+  /// Null, which is a value too; what is not there at all is an absent `PropertyValue`.
+  PropertyValue(std::nullptr_t) : storage_(nullptr) {}
   /// Truth values alone: no pointer and no number turns into one.
   template <std::same_as<bool> Truth>
   PropertyValue(Truth value) : storage_(value) {}
@@ -42,7 +45,9 @@ class PropertyValue final {
   requires(!std::same_as<Number, bool> && (std::is_signed_v<Number> || sizeof(Number) < 8))
       PropertyValue(Number value)
       : storage_(static_cast<std::int64_t>(value)) {}
-  PropertyValue(double value) : storage_(value) {}
+  /// No whole number turns into one that floats.
+  template <std::floating_point Number>
+  PropertyValue(Number value) : storage_(static_cast<double>(value)) {}
   PropertyValue(std::string value) : storage_(std::move(value)) {}
   PropertyValue(std::string_view value) : storage_(std::string(value)) {}
   PropertyValue(const char* value) : storage_(std::string(value)) {}

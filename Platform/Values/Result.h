@@ -38,6 +38,10 @@ class [[nodiscard]] Result final {
     assert(hasValue());
     return std::move(*std::get_if<0>(&state_));
   }
+  /// The value, or `other` in place of the error.
+  [[nodiscard]] Value valueOr(Value other) && {
+    return hasValue() ? std::move(*this).value() : std::move(other);
+  }
   [[nodiscard]] Value& operator*() & { return value(); }
   [[nodiscard]] const Value& operator*() const& { return value(); }
   [[nodiscard]] Value&& operator*() && { return std::move(*this).value(); }

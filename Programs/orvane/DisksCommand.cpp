@@ -7,6 +7,7 @@
 #include <Varnel/DiskAccess/OVDiskInfo.h>
 #include <Varnel/Platform/Text/VisibleText.h>
 #include <orvane/Console.h>
+#include <orvane/JSONLine.h>
 
 namespace Orvane {
 namespace {
@@ -63,9 +64,7 @@ int DisksCommand::run(Console& console) const {
     text += textOf(*disk);
     json["disks"].push_back(jsonOf(*disk));
   }
-  if (isJSON)
-    text = json.dump(-1, ' ', false, nlohmann::ordered_json::error_handler_t::replace) + "\n";
-  return console.writeResult(text) ? 0 : 1;
+  return console.writeResult(isJSON ? jsonLine(json) : text) ? 0 : 1;
 }
 
 }  // namespace Orvane

@@ -5,6 +5,7 @@
 #include <utility>
 
 #include <Varnel/Platform/Text/VisibleText.h>
+#include <orvane/JSONLine.h>
 
 namespace Orvane {
 
@@ -21,8 +22,7 @@ std::string FactList::text(Form form) const {
     lines += fact.label + ": " + (fact.value ? visibleText(*fact.value) : "none") + "\n";
     json[fact.key] = fact.value ? nlohmann::ordered_json(*fact.value) : nullptr;
   }
-  if (form == Form::lines) return lines;
-  return json.dump(-1, ' ', false, nlohmann::ordered_json::error_handler_t::replace) + "\n";
+  return form == Form::lines ? lines : jsonLine(json);
 }
 
 }  // namespace Orvane

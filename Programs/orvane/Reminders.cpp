@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/Reminders.h>
 
-#include <nlohmann/json.hpp>
 #include <optional>
 
+#include <Varnel/Basalt/JSON.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/UserDefaults.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
@@ -26,17 +26,25 @@ std::string textOf(const std::optional<Varnel::Platform::Date>& date) {
   return date ? formatter.string(*date) : "no date";
 }
 
+Basalt::JSON storedJSON() {
+  const auto text = Varnel::Platform::processPorts().userDefaults.text(periodKey);
+  try {
+    return Basalt::parseJSON(text.value_or(""));
+  } catch (const Basalt::JSONError&) {
+    return nullptr;
+  }
+}
+
 }  // namespace
 
 SchedulePeriodOption storedPeriod() {
-  const auto text = Varnel::Platform::processPorts().userDefaults.text(periodKey);
-  const auto json = nlohmann::json::parse(text.value_or(""), nullptr, false);
-  // The box takes whatever it cannot read for never.
-  return Varnel::SchedulePeriodOptionBox(json).boxed();
+  // The box takes whatever is no period for never.
+  return Varnel::SchedulePeriodOptionBox(storedJSON()).boxed();
 }
 
 void storePeriod(SchedulePeriodOption period) {
-  Varnel::Platform::processPorts().userDefaults.set(periodKey, period.exportJSON().dump());
+  Varnel::Platform::processPorts().userDefaults.set(periodKey,
+                                                    Basalt::jsonText(period.exportJSON()));
 }
 
 std::string lineOf(const UserNotification& notification) {

@@ -10,6 +10,7 @@
 #include <Varnel/Platform/Text/UTF8.h>
 #include <Varnel/Platform/Text/VisibleText.h>
 #include <Varnel/Platform/Values/URL.h>
+#include <orvane/JSONLine.h>
 
 namespace Orvane {
 namespace {
@@ -87,7 +88,7 @@ std::string jsonOf(const ScanResult& result) {
       {"groups", nlohmann::ordered_json::array()},
   };
   for (const DuplicateGroup& group : result.groups) json["groups"].push_back(jsonOf(group));
-  return json.dump(-1, ' ', false, nlohmann::ordered_json::error_handler_t::replace) + "\n";
+  return jsonLine(json);
 }
 
 }  // namespace Orvane

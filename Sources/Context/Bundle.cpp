@@ -2,14 +2,13 @@
 #include <Varnel/Context/Bundle.h>
 
 #include <filesystem>
-#include <fstream>
 #include <map>
 #include <mutex>
-#include <sstream>
 #include <utility>
 
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/ProcessInfo.h>
+#include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
 #include <Varnel/Platform/Text/PropertyListParser.h>
 #include <Varnel/Platform/Text/StringsTable.h>
@@ -23,15 +22,9 @@ using Platform::StringsTable;
 
 constexpr std::string_view developmentLanguage = "en";
 
-// Empty, and so no property list, when the file cannot be read. A folder or a device is not tried:
-// reading it could fail late or never end.
+// Empty, and so no property list, when the file cannot be read.
 std::string bytesOf(const fs::path& file) {
-  std::error_code failed;
-  if (!fs::is_regular_file(file, failed)) return {};
-  std::ostringstream bytes;
-  // Unlike an iterator over the stream, this stops without an exception where the disk fails.
-  bytes << std::ifstream(file, std::ios::binary).rdbuf();
-  return std::move(bytes).str();
+  return Platform::readFile(file.string()).valueOr("");
 }
 
 std::optional<PropertyDictionary> readDictionary(const fs::path& file) {

@@ -70,7 +70,7 @@ std::string Globals::substitutingHtmlApplicationName(std::string_view text) {
   return facts().substitutingHtmlApplicationName(text);
 }
 
-bool Globals::extractIsAvailable(const nlohmann::json& dictionary, bool defaultValue) {
+bool Globals::extractIsAvailable(const Basalt::JSON& dictionary, bool defaultValue) {
   return facts().extractIsAvailable(dictionary, defaultValue);
 }
 

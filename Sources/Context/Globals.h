@@ -6,8 +6,7 @@
 #include <string_view>
 #include <vector>
 
-#include <nlohmann/json_fwd.hpp>
-
+#include <Varnel/Basalt/JSON.h>
 #include <Varnel/Basalt/Version.h>
 #include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Values/URL.h>
@@ -72,7 +71,7 @@ class VARNEL_API Globals final {
   [[nodiscard]] static std::string substitutingHtmlApplicationName(std::string_view text);
 
   /// This build's availability flag in a server's dictionary, or `defaultValue`.
-  [[nodiscard]] static bool extractIsAvailable(const nlohmann::json& dictionary, bool defaultValue);
+  [[nodiscard]] static bool extractIsAvailable(const Basalt::JSON& dictionary, bool defaultValue);
 
   /// The bundle identifiers of the other channels' builds on this machine. Reads files.
   [[nodiscard]] static std::vector<std::string> findOtherInstalledTargetBundleIDs();

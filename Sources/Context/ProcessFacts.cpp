@@ -4,8 +4,6 @@
 #include <filesystem>
 #include <utility>
 
-#include <nlohmann/json.hpp>
-
 #include <Varnel/Basalt/Assertions.h>
 #include <Varnel/Basalt/Identifier.h>
 #include <Varnel/Context/Bundle.h>
@@ -153,7 +151,7 @@ std::string ProcessFacts::substitutingHtmlApplicationName(std::string_view text)
   return replacingAll(text, defaultNameHTML, applicationNameHTML());
 }
 
-bool ProcessFacts::extractIsAvailable(const nlohmann::json& dictionary, bool defaultValue) const {
+bool ProcessFacts::extractIsAvailable(const Basalt::JSON& dictionary, bool defaultValue) const {
   return TargetKind::of(switches_).extractIsAvailable(dictionary).value_or(defaultValue);
 }
 

@@ -6,8 +6,7 @@
 #include <string_view>
 #include <vector>
 
-#include <nlohmann/json_fwd.hpp>
-
+#include <Varnel/Basalt/JSON.h>
 #include <Varnel/Basalt/Version.h>
 #include <Varnel/Context/BuildSwitches.h>
 #include <Varnel/Context/OnceValue.h>
@@ -67,7 +66,7 @@ class VARNEL_API ProcessFacts final {
   [[nodiscard]] std::string identifier(std::string_view suffix) const;
   [[nodiscard]] std::string substitutingApplicationName(std::string_view text) const;
   [[nodiscard]] std::string substitutingHtmlApplicationName(std::string_view text) const;
-  [[nodiscard]] bool extractIsAvailable(const nlohmann::json& dictionary, bool defaultValue) const;
+  [[nodiscard]] bool extractIsAvailable(const Basalt::JSON& dictionary, bool defaultValue) const;
   [[nodiscard]] std::vector<std::string> findOtherInstalledTargetBundleIDs() const;
 
  private:

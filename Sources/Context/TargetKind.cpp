@@ -3,8 +3,6 @@
 
 #include <algorithm>
 
-#include <nlohmann/json.hpp>
-
 #include <Varnel/Basalt/Assertions.h>
 #include <Varnel/Context/BuildSwitches.h>
 #include <Varnel/Platform/Ports/Ports.h>
@@ -106,11 +104,12 @@ std::vector<TargetKind> TargetKind::findOtherInstalledTargets(
       [&](TargetKind kind) { return kind != *this && kind.urlOfInstance(workspace).has_value(); });
 }
 
-std::optional<bool> TargetKind::extractIsAvailable(const nlohmann::json& dictionary) const {
-  if (!dictionary.is_object()) return std::nullopt;
-  const auto found = dictionary.find(channel(*this).availabilityKey);
-  if (found == dictionary.end() || !found->is_boolean()) return std::nullopt;
-  return found->get<bool>();
+std::optional<bool> TargetKind::extractIsAvailable(const Basalt::JSON& dictionary) const {
+  const auto* values = dictionary.as<Platform::PropertyDictionary>();
+  const bool* flag =
+      values ? Platform::findAs<bool>(*values, channel(*this).availabilityKey) : nullptr;
+  if (!flag) return std::nullopt;
+  return *flag;
 }
 
 UserFeatures TargetKind::defaultUserFeatures() const {

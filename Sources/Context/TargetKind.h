@@ -7,8 +7,7 @@
 #include <string_view>
 #include <vector>
 
-#include <nlohmann/json_fwd.hpp>
-
+#include <Varnel/Basalt/JSON.h>
 #include <Varnel/Context/UserFeatures.h>
 #include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Values/URL.h>
@@ -71,7 +70,7 @@ class VARNEL_API TargetKind final {
 
   /// This channel's flag in a dictionary such as {"isAvailableInSite": true}; absent when it is
   /// missing or no truth value.
-  [[nodiscard]] std::optional<bool> extractIsAvailable(const nlohmann::json& dictionary) const;
+  [[nodiscard]] std::optional<bool> extractIsAvailable(const Basalt::JSON& dictionary) const;
 
   [[nodiscard]] UserFeatures defaultUserFeatures() const;
 

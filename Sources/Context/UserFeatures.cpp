@@ -5,8 +5,6 @@
 #include <string_view>
 #include <utility>
 
-#include <nlohmann/json.hpp>
-
 #include <Varnel/Basalt/JSON.h>
 
 namespace Varnel {
@@ -22,16 +20,16 @@ constexpr std::array<std::pair<std::string_view, UserFeatures>, 5> namesOfMember
 
 }  // namespace
 
-UserFeatures::UserFeatures(const nlohmann::json& json) {
+UserFeatures::UserFeatures(const Basalt::JSON& json) {
   for (const std::string& name : Basalt::importStrings(json, "UserFeatures"))
     for (const auto& [knownName, member] : namesOfMembers)
       if (name == knownName) insert(member);
 }
 
-nlohmann::json UserFeatures::exportJSON() const {
-  auto names = nlohmann::json::array();
+Basalt::JSON UserFeatures::exportJSON() const {
+  Platform::PropertyList names;
   for (const auto& [name, member] : namesOfMembers)
-    if (contains(member)) names.push_back(name);
+    if (contains(member)) names.emplace_back(name);
   return names;
 }
 

@@ -7,8 +7,7 @@
 #include <optional>
 #include <string>
 
-#include <nlohmann/json_fwd.hpp>
-
+#include <Varnel/Basalt/JSON.h>
 #include <Varnel/Platform/Api.h>
 
 namespace Varnel {
@@ -16,7 +15,7 @@ namespace Varnel {
 /// The set of optional features that a build shows its user. A member that is present is shown (or,
 /// for the rate prompt, enabled).
 ///
-///     const UserFeatures suggested(nlohmann::json::parse(R"(["sharing", "irate"])"));
+///     const UserFeatures suggested(Basalt::parseJSON(R"(["sharing", "irate"])"));
 ///     suggested.contains(UserFeatures::irate);  // true
 ///
 /// A value of one word with the algebra of sets; bits that name no member are kept as they are. As
@@ -41,10 +40,10 @@ class VARNEL_API UserFeatures final {
 
   /// Names that no member bears are skipped. Throws `Basalt::JSONError` (type mismatch,
   /// "UserFeatures" at "root") for anything but a list of strings.
-  explicit UserFeatures(const nlohmann::json& json);
+  explicit UserFeatures(const Basalt::JSON& json);
 
   /// The names of the members present, in no promised order.
-  [[nodiscard]] nlohmann::json exportJSON() const;
+  [[nodiscard]] Basalt::JSON exportJSON() const;
 
   [[nodiscard]] constexpr std::int64_t rawValue() const { return rawValue_; }
   [[nodiscard]] constexpr bool isEmpty() const { return rawValue_ == 0; }

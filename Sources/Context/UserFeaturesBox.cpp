@@ -2,15 +2,13 @@
 #include <Varnel/Context/UserFeaturesBox.h>
 
 #include <fmt/format.h>
-#include <nlohmann/json.hpp>
-
 namespace Varnel {
 
 UserFeaturesBox::Pointer UserFeaturesBox::make(UserFeatures boxed) {
   return std::make_shared<const UserFeaturesBox>(boxed);
 }
 
-nlohmann::json UserFeaturesBox::exportJSON() const {
+Basalt::JSON UserFeaturesBox::exportJSON() const {
   return boxed_.exportJSON();
 }
 

@@ -5,8 +5,7 @@
 #include <memory>
 #include <string>
 
-#include <nlohmann/json_fwd.hpp>
-
+#include <Varnel/Basalt/JSON.h>
 #include <Varnel/Context/UserFeatures.h>
 #include <Varnel/Platform/Api.h>
 
@@ -30,12 +29,12 @@ class VARNEL_API UserFeaturesBox final : public std::enable_shared_from_this<Use
   [[nodiscard]] static Pointer make(UserFeatures boxed);
 
   /// Reads JSON as `UserFeatures` does, and throws as it does.
-  explicit UserFeaturesBox(const nlohmann::json& json) : boxed_(json) {}
+  explicit UserFeaturesBox(const Basalt::JSON& json) : boxed_(json) {}
   explicit UserFeaturesBox(UserFeatures boxed) : boxed_(boxed) {}
   UserFeaturesBox(const UserFeaturesBox&) = delete;
   UserFeaturesBox& operator=(const UserFeaturesBox&) = delete;
 
-  [[nodiscard]] nlohmann::json exportJSON() const;
+  [[nodiscard]] Basalt::JSON exportJSON() const;
 
   [[nodiscard]] UserFeatures boxed() const { return boxed_; }
   [[nodiscard]] UserFeatures value() const { return boxed_; }

@@ -1,22 +1,10 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Interface/SoundEngine.h>
 
-#include <fstream>
-#include <sstream>
-
 #include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/ReadFile.h>
 
 namespace Varnel {
-namespace {
-
-// A file that cannot be read has no bytes, and no bytes are no sound.
-std::string bytesOfFile(const std::string& path) {
-  std::ostringstream bytes;
-  bytes << std::ifstream(path, std::ios::binary).rdbuf();
-  return std::move(bytes).str();
-}
-
-}  // namespace
 
 SoundEngine::SoundEngine()
     : SoundEngine({.player = Platform::processPorts().soundPlayer,
@@ -35,7 +23,8 @@ void SoundEngine::play(Sound sound) {
   stop();
   const auto path = ports_.path(sound);
   if (!path) return;
-  const auto loaded = ports_.player.load(bytesOfFile(*path));
+  // A file that cannot be read has no bytes, and no bytes are no sound.
+  const auto loaded = ports_.player.load(Platform::readFile(*path).valueOr(""));
   if (!loaded) return;
   loaded->setDelegate(delegate_);
   loaded->play();

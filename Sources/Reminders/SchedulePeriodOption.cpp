@@ -3,8 +3,6 @@
 
 #include <string_view>
 
-#include <nlohmann/json.hpp>
-
 #include <Varnel/Basalt/Assertions.h>
 #include <Varnel/Basalt/JSON.h>
 #include <Varnel/Context/Globals.h>
@@ -61,7 +59,7 @@ std::optional<SchedulePeriodOption> SchedulePeriodOption::withRawValue(std::int6
   return std::nullopt;
 }
 
-SchedulePeriodOption::SchedulePeriodOption(const nlohmann::json& jsonObject)
+SchedulePeriodOption::SchedulePeriodOption(const Basalt::JSON& jsonObject)
     : SchedulePeriodOption(
           optionOfKind(Basalt::importString(jsonObject, kindKey, "SchedulePeriodOption"))) {}
 
@@ -75,11 +73,11 @@ const std::array<SchedulePeriodOption, 7>& SchedulePeriodOption::optionsAvailabl
   return all;
 }
 
-nlohmann::json SchedulePeriodOption::exportJSONObject() const {
-  return {{kindKey, namesOf(*this).kind}};
+Basalt::JSON SchedulePeriodOption::exportJSONObject() const {
+  return Platform::PropertyDictionary{{std::string(kindKey), namesOf(*this).kind}};
 }
 
-nlohmann::json SchedulePeriodOption::exportJSON() const {
+Basalt::JSON SchedulePeriodOption::exportJSON() const {
   return exportJSONObject();
 }
 

@@ -7,8 +7,7 @@
 #include <optional>
 #include <string>
 
-#include <nlohmann/json_fwd.hpp>
-
+#include <Varnel/Basalt/JSON.h>
 #include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Values/DateComponents.h>
 
@@ -20,7 +19,7 @@ namespace Varnel {
 
 /// How often the user wants to be reminded.
 ///
-///     const auto period = SchedulePeriodOption(json.at("remind"));
+///     const auto period = SchedulePeriodOption(Basalt::parseJSON(R"({"kind": "monthly"})"));
 ///     switch (period.case_()) { case SchedulePeriodOption::Case::weekly: … }
 ///
 /// The analytics identifiers say "Once in …", the keys of the texts "Once In …": both are
@@ -58,7 +57,7 @@ class VARNEL_API SchedulePeriodOption final {
   /// Reads a JSON object whose "kind" is the name of a case, or "default" for `default_()`. Throws
   /// `Basalt::JSONError`: of kind `message` for another name, else what the import of a string
   /// throws.
-  explicit SchedulePeriodOption(const nlohmann::json& jsonObject);
+  explicit SchedulePeriodOption(const Basalt::JSON& jsonObject);
 
   /// The product's own choice: never in the subscription store's edition, else once in two weeks.
   [[nodiscard]] static SchedulePeriodOption default_();
@@ -66,8 +65,8 @@ class VARNEL_API SchedulePeriodOption final {
   /// All seven in the order of their raw values, as menus list them.
   [[nodiscard]] static const std::array<SchedulePeriodOption, 7>& optionsAvailableToUser();
 
-  [[nodiscard]] nlohmann::json exportJSONObject() const;
-  [[nodiscard]] nlohmann::json exportJSON() const;
+  [[nodiscard]] Basalt::JSON exportJSONObject() const;
+  [[nodiscard]] Basalt::JSON exportJSON() const;
 
   [[nodiscard]] constexpr Case case_() const { return option_; }
   [[nodiscard]] constexpr std::int64_t rawValue() const {

@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Reminders/SchedulePeriodOptionBox.h>
 
-#include <nlohmann/json.hpp>
-
 #include <Varnel/Basalt/JSON.h>
 
 namespace Varnel {
@@ -11,7 +9,7 @@ namespace {
 using Pointer = SchedulePeriodOptionBox::Pointer;
 using Case = SchedulePeriodOption::Case;
 
-SchedulePeriodOption leniently(const nlohmann::json& json) {
+SchedulePeriodOption leniently(const Basalt::JSON& json) {
   try {
     return SchedulePeriodOption(json);
   } catch (const Basalt::JSONError&) {
@@ -32,7 +30,7 @@ Pointer SchedulePeriodOptionBox::make(SchedulePeriodOption boxed) {
   return std::make_shared<const SchedulePeriodOptionBox>(boxed);
 }
 
-SchedulePeriodOptionBox::SchedulePeriodOptionBox(const nlohmann::json& json)
+SchedulePeriodOptionBox::SchedulePeriodOptionBox(const Basalt::JSON& json)
     : boxed_(leniently(json)) {}
 
 const Pointer& SchedulePeriodOptionBox::default_() {
@@ -72,7 +70,7 @@ const std::vector<Pointer>& SchedulePeriodOptionBox::optionsAvailableToUser() {
   return boxes;
 }
 
-nlohmann::json SchedulePeriodOptionBox::exportJSON() const {
+Basalt::JSON SchedulePeriodOptionBox::exportJSON() const {
   return boxed_.exportJSON();
 }
 

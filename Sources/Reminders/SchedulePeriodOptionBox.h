@@ -7,8 +7,7 @@
 #include <string>
 #include <vector>
 
-#include <nlohmann/json_fwd.hpp>
-
+#include <Varnel/Basalt/JSON.h>
 #include <Varnel/Platform/Api.h>
 #include <Varnel/Reminders/SchedulePeriodOption.h>
 
@@ -34,7 +33,7 @@ class VARNEL_API SchedulePeriodOptionBox
   explicit SchedulePeriodOptionBox(SchedulePeriodOption boxed) : boxed_(boxed) {}
   /// Reads JSON as `SchedulePeriodOption` does, but never fails: whatever that refuses becomes
   /// `never`, so that a damaged preference turns the reminder off.
-  explicit SchedulePeriodOptionBox(const nlohmann::json& json);
+  explicit SchedulePeriodOptionBox(const Basalt::JSON& json);
   virtual ~SchedulePeriodOptionBox() = default;
   SchedulePeriodOptionBox(const SchedulePeriodOptionBox&) = delete;
   SchedulePeriodOptionBox& operator=(const SchedulePeriodOptionBox&) = delete;
@@ -55,7 +54,7 @@ class VARNEL_API SchedulePeriodOptionBox
   /// ones.
   [[nodiscard]] static const std::vector<Pointer>& optionsAvailableToUser();
 
-  [[nodiscard]] nlohmann::json exportJSON() const;
+  [[nodiscard]] Basalt::JSON exportJSON() const;
 
   [[nodiscard]] SchedulePeriodOption boxed() const { return boxed_; }
   /// The raw value.

@@ -4,7 +4,6 @@
 #include <filesystem>
 
 #include <gtest/gtest.h>
-#include <nlohmann/json.hpp>
 
 #include <Tests/Context/PropertyLists.h>
 #include <Tests/Support/TemporaryFolder.h>
@@ -109,7 +108,7 @@ TEST_F(ProcessFactsTest, FakeTrashIsMadeOrSilentlyNot) {
 }
 
 TEST_F(ProcessFactsTest, AvailabilityIsReadForTheRunningChannelAlone) {
-  const auto dictionary = nlohmann::json::parse(R"({"isAvailableInSite": false})");
+  const auto dictionary = Basalt::parseJSON(R"({"isAvailableInSite": false})");
   EXPECT_FALSE(siteFacts().extractIsAvailable(dictionary, true));
   EXPECT_TRUE(facts({.isAppStoreVersion = true}).extractIsAvailable(dictionary, true));
 }

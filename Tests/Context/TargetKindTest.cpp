@@ -2,7 +2,6 @@
 #include <Varnel/Context/TargetKind.h>
 
 #include <gtest/gtest.h>
-#include <nlohmann/json.hpp>
 
 #include <Varnel/Context/BuildSwitches.h>
 #include <Varnel/Platform/Testing/FakeWorkspace.h>
@@ -31,7 +30,8 @@ TEST(TargetKind, HasThePublishedValues) {
     EXPECT_EQ(row.kind.rawValue(), row.rawValue);
     EXPECT_EQ(row.kind.bundleID(), row.bundleID);
     EXPECT_EQ(row.kind.hasUpdater(), row.hasUpdater);
-    EXPECT_EQ(row.kind.extractIsAvailable({{row.availability, true}}), true) << row.availability;
+    EXPECT_EQ(row.kind.extractIsAvailable(Platform::PropertyDictionary{{row.availability, true}}),
+              true);
     EXPECT_EQ(row.kind.defaultUserFeatures().rawValue(), row.features);
   }
 }
@@ -67,7 +67,7 @@ TEST(TargetKind, FindsInstalledChannelsInTheirOrder) {
 
 TEST(TargetKind, AvailabilityIsATruthValueOrAbsent) {
   const auto read = [](const char* json) {
-    return TargetKind::site.extractIsAvailable(nlohmann::json::parse(json));
+    return TargetKind::site.extractIsAvailable(Basalt::parseJSON(json));
   };
   EXPECT_EQ(read(R"({"isAvailableInSite": true})"), true);
   EXPECT_EQ(read(R"({"isAvailableInSite": "true"})"), std::nullopt);

@@ -2,7 +2,6 @@
 #include <Varnel/Context/UserFeatures.h>
 
 #include <gtest/gtest.h>
-#include <nlohmann/json.hpp>
 
 #include <Varnel/Basalt/JSON.h>
 #include <Varnel/Context/UserFeaturesBox.h>
@@ -10,7 +9,7 @@
 namespace Varnel {
 namespace {
 
-using nlohmann::json;
+using Platform::PropertyList;
 
 static_assert(Basalt::JSONConvertable<UserFeatures>);
 static_assert(Basalt::JSONConvertable<UserFeaturesBox>);
@@ -34,8 +33,8 @@ TEST(UserFeatures, HasThePublishedBitsAndNames) {
   };
   for (const auto& row : rows) {
     EXPECT_EQ(row.member.rawValue(), row.bit);
-    EXPECT_EQ(row.member.exportJSON(), json::array({row.name}));
-    EXPECT_EQ(UserFeatures(json::array({row.name})), row.member);
+    EXPECT_EQ(row.member.exportJSON(), PropertyList{row.name});
+    EXPECT_EQ(UserFeatures(PropertyList{row.name}), row.member);
     const UserFeatures others(31 - row.bit);
     EXPECT_EQ((UserFeaturesBox(row.member).*row.property)(), row.whenPresent) << row.name;
     EXPECT_EQ((UserFeaturesBox(others).*row.property)(), !row.whenPresent) << row.name;
@@ -43,15 +42,15 @@ TEST(UserFeatures, HasThePublishedBitsAndNames) {
 }
 
 TEST(UserFeatures, ImportsKnownNamesAndSkipsOthers) {
-  EXPECT_EQ(UserFeatures(json::parse(R"(["sharing", "irate", "irate"])")).rawValue(), 9);
-  EXPECT_TRUE(UserFeatures(json::parse(R"(["from-a-newer-server"])")).isEmpty());
-  EXPECT_TRUE(UserFeatures(json::array()).isEmpty());
+  EXPECT_EQ(UserFeatures(Basalt::parseJSON(R"(["sharing", "irate", "irate"])")).rawValue(), 9);
+  EXPECT_TRUE(UserFeatures(Basalt::parseJSON(R"(["from-a-newer-server"])")).isEmpty());
+  EXPECT_TRUE(UserFeatures(PropertyList()).isEmpty());
 }
 
 TEST(UserFeatures, RefusesAnythingButAListOfStrings) {
   for (const char* text : {"{}", "\"sharing\"", "null", "7", R"(["sharing", 1])", "[[]]"}) {
     try {
-      const UserFeatures features(json::parse(text));
+      const UserFeatures features(Basalt::parseJSON(text));
       FAIL() << text;
     } catch (const Basalt::JSONError& error) {
       EXPECT_EQ(error.kind(), Basalt::JSONError::Kind::typeMismatch);

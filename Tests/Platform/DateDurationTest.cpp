@@ -23,6 +23,14 @@ constexpr const char* timestampPattern = "YYYY-MM-dd HH:mm:ss";
 
 const auto zones = Linux::makeTimeZones();
 
+// What is finer than a microsecond is cut off, towards the past and in every age.
+static_assert(Date(1us) + 1500ns == Date(2us));
+static_assert(Date(1us) - 1500ns == Date(-1us));
+static_assert(Date(-3us) + 999ns == Date(-3us));
+static_assert(Date(sys_time<nanoseconds>(-1ns)) == Date(-1us));
+static_assert(Date::max() - 1ns == Date::max() - 1us);
+static_assert(Date(sys_days(32767y / December / 31)) + 1500ns > Date(sys_days(2262y / May / 1)));
+
 TEST(DateFormatter, WritesTheYearOfTheLocalesWeek) {
   const Tests::LocalZone utc("UTC");
   const auto text = [](const char* pattern, const char* locale, sys_days day) {

@@ -134,6 +134,27 @@ TEST(PropertyList, TakesExtremeScalarsAsFarAsTheyHaveACounterpart) {
   EXPECT_EQ(parsePropertyList("\xEF\xBB\xBF<plist><true/></plist>"), PropertyValue(true));
 }
 
+static_assert(!std::is_constructible_v<PropertyValue, const void*>);
+static_assert(!std::is_constructible_v<PropertyValue, const int*>);
+static_assert(!std::is_constructible_v<PropertyValue, std::uint64_t>, "it may not fit");
+
+template <typename Type>
+bool holds(const PropertyValue& value, const Type& expected) {
+  const auto* held = value.as<Type>();
+  return held && *held == expected;
+}
+
+TEST(PropertyValue, TakesWhatHasOneMeaning) {
+  EXPECT_TRUE(holds(nullptr, nullptr));
+  EXPECT_TRUE(holds(true, true));
+  EXPECT_TRUE(holds(0, std::int64_t{0}));
+  EXPECT_TRUE(holds(std::int8_t{-7}, std::int64_t{-7}));
+  EXPECT_TRUE(holds(4294967295u, std::int64_t{4294967295}));
+  EXPECT_TRUE(holds(1.5f, 1.5));
+  EXPECT_TRUE(holds("text", "text"s));
+  EXPECT_TRUE(holds(std::string_view("a\0b", 3), "a\0b"s));
+}
+
 TEST(PropertyList, RefusesWhatIsNone) {
   for (const char* bytes :
        {"", " ", "bplist00", "garbage", "<", "<plist>", "<plist></plist>", "<plist/>", "<html/>",
@@ -143,6 +164,7 @@ TEST(PropertyList, RefusesWhatIsNone) {
         "<!DOCTYPE plist [<!ENTITY a 'b'>]><plist><string>&a;</string></plist>"})
     EXPECT_EQ(parsePropertyList(bytes), std::nullopt) << bytes;
   EXPECT_EQ(parsePropertyList(std::string(100, '\0')), std::nullopt);
+  EXPECT_EQ(writePropertyList(PropertyList{true, nullptr}), std::nullopt);
   for (const std::string& text : {"\x53k\0y"s, "\x63\0k\0\0\0y"s}) {
     EXPECT_EQ(parsePropertyList(binaryList({text})), std::nullopt);
     EXPECT_EQ(parsePropertyList(binaryList({"\xD1\0\1\0\1"s, text})), std::nullopt);

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 #include <sys/xattr.h>
 
 #include <cstdlib>
@@ -10,6 +11,7 @@
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/Ports/ExtendedAttributes.h>
+#include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/Ports/UserDefaults.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
 #include <Varnel/Platform/Text/UTF8.h>
@@ -36,6 +38,24 @@ TEST(ExtendedAttributes, TellsAbsentFromFailed) {
             std::generic_category());
   ASSERT_EQ(::setxattr(file.c_str(), "user.empty", "", 0, 0), 0);
   EXPECT_EQ(*attributes->value(file.string(), "empty"), "");
+}
+
+TEST(ReadFile, GivesAllBytesOrTheReason) {
+  const Tests::TemporaryFolder folder;
+  const std::string bytes = std::string(200'000, 'a') + std::string("\0\xFF\n", 3);
+  const std::string file = folder.write("file", bytes);
+  EXPECT_EQ(*readFile(file), bytes);
+  EXPECT_EQ(*readFile(file, bytes.size()), bytes);
+  EXPECT_EQ(readFile(file, bytes.size() - 1).error(), std::errc::file_too_large);
+  EXPECT_EQ(*readFile(folder.write("empty", ""), 0), "");
+  EXPECT_FALSE(readFile("/proc/self/stat")->empty());
+
+  EXPECT_EQ(readFile(folder.path() / "missing").error(), std::errc::no_such_file_or_directory);
+  EXPECT_EQ(readFile(file + "/in a file").error(), std::errc::not_a_directory);
+  const std::string pipe = folder.path() / "pipe";
+  ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
+  for (const std::string& path : {pipe, folder.path().string(), std::string("/dev/zero")})
+    EXPECT_EQ(readFile(path).error(), std::errc::invalid_argument) << path;
 }
 
 TEST(UserDefaults, KeepValuesFromRunToRun) {

@@ -2,7 +2,6 @@
 #include <Varnel/Reminders/SchedulePeriodOption.h>
 
 #include <gtest/gtest.h>
-#include <nlohmann/json.hpp>
 
 #include <Varnel/Basalt/JSON.h>
 #include <Varnel/Context/BuildSwitches.h>
@@ -14,7 +13,7 @@
 namespace Varnel {
 namespace {
 
-using nlohmann::json;
+using Object = Platform::PropertyDictionary;
 using Kind = Basalt::JSONError::Kind;
 using Option = SchedulePeriodOption;
 using Box = SchedulePeriodOptionBox;
@@ -70,8 +69,8 @@ TEST(SchedulePeriodOption, HasItsPublishedIdentities) {
     EXPECT_EQ(row.option.accessibilityIdentifier(), row.kind);
     EXPECT_EQ(row.option.analyticsIdentifier(), row.analytics);
     EXPECT_EQ(row.option.repeatInterval(gregorian), row.interval);
-    EXPECT_EQ(row.option.exportJSONObject(), (json{{"kind", row.kind}}));
-    EXPECT_EQ(Option(json{{"kind", row.kind}}), row.option);
+    EXPECT_EQ(row.option.exportJSONObject(), (Object{{"kind", row.kind}}));
+    EXPECT_EQ(Option(Object{{"kind", row.kind}}), row.option);
     // Without texts the key stands for itself.
     module->setBundle(Bundle(std::nullopt, {}));
     EXPECT_EQ(row.option.description(), row.textKey);
@@ -85,7 +84,7 @@ TEST(SchedulePeriodOption, HasItsPublishedIdentities) {
 }
 
 TEST(SchedulePeriodOption, ReadsDefaultAsWhatTheProductPrefers) {
-  const Option read(json{{"kind", "default"}});
+  const Option read(Object{{"kind", "default"}});
   EXPECT_EQ(read, productDefault);
   EXPECT_EQ(read.exportJSON(), productDefault.exportJSON());
   EXPECT_EQ(Box::default_(), QNIsMarkettaVersion() ? Box::neverBox() : Box::onceInTwoWeeksBox());
@@ -93,7 +92,7 @@ TEST(SchedulePeriodOption, ReadsDefaultAsWhatTheProductPrefers) {
 
 // What a server or a damaged preference may hold; the box takes each for never.
 TEST(SchedulePeriodOption, RefusesWhatIsNoPeriodAndTheBoxTakesItForNever) {
-  const std::string deep = std::string(100'000, '[') + std::string(100'000, ']');
+  const std::string deep = std::string(511, '[') + std::string(511, ']');
   const struct {
     std::string text;
     Kind kind;
@@ -115,7 +114,7 @@ TEST(SchedulePeriodOption, RefusesWhatIsNoPeriodAndTheBoxTakesItForNever) {
       {"null", Kind::typeMismatch, "root"},
   };
   for (const auto& row : rows) {
-    const json value = json::parse(row.text);
+    const Basalt::JSON value = Basalt::parseJSON(row.text);
     try {
       const Option option(value);
       FAIL() << row.text.substr(0, 40);
@@ -125,7 +124,7 @@ TEST(SchedulePeriodOption, RefusesWhatIsNoPeriodAndTheBoxTakesItForNever) {
     }
     EXPECT_EQ(Box(value).boxed(), Option::never);
   }
-  const json brokenText = {{"kind", "week\xffly"}};
+  const Basalt::JSON brokenText = Object{{"kind", "week\xffly"}};
   try {
     const Option option(brokenText);
     FAIL();
@@ -142,8 +141,8 @@ TEST(SchedulePeriodOptionBox, IsAValueInAnObject) {
   EXPECT_EQ(Box::monthlyBox(), Box::monthlyBox());
   EXPECT_EQ(one->hash(), Box::monthlyBox()->hash());
   EXPECT_EQ(one->copy(), one);
-  EXPECT_EQ(one->exportJSON(), (json{{"kind", "monthly"}}));
-  EXPECT_EQ(Box(json{{"kind", "annually"}}).value(), 6);
+  EXPECT_EQ(one->exportJSON(), (Object{{"kind", "monthly"}}));
+  EXPECT_EQ(Box(Object{{"kind", "annually"}}).value(), 6);
 
   const auto& all = Box::optionsAvailableToUser();
   EXPECT_EQ(&all, &Box::optionsAvailableToUser());

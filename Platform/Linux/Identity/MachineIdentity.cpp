@@ -3,23 +3,21 @@
 
 #include <algorithm>
 #include <array>
-#include <fstream>
-#include <sstream>
 #include <utility>
 
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/Disks/KernelFolder.h>
 #include <Varnel/Platform/Linux/Identity/DefaultRoutes.h>
 #include <Varnel/Platform/Linux/Identity/NetworkInterfaces.h>
+#include <Varnel/Platform/Ports/ReadFile.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
 
-// The tables of routes have no bound on their size. What cannot be read is empty.
-std::string readAll(const std::string& path) {
-  std::ostringstream bytes;
-  bytes << std::ifstream(path, std::ios::binary).rdbuf();
-  return std::move(bytes).str();
+// What cannot be read is empty. A router may know a million routes, a line of some 150 bytes each.
+std::string routes(const std::string& path) {
+  constexpr std::size_t maxSize = std::size_t{512} << 20;
+  return readFile(path, maxSize).valueOr("");
 }
 
 std::string lowerCased(std::string text) {
@@ -88,7 +86,7 @@ class MachineFiles final : public MachineIdentity {
   std::vector<PropertyData> primaryInterfaceAddresses() const override {
     const NetworkInterfaces interfaces(root_ + "/sys/class/net");
     const auto name = interfaces.physicalInterface(interfacesOfDefaultRoutes(
-        readAll(root_ + "/proc/net/route"), readAll(root_ + "/proc/net/ipv6_route")));
+        routes(root_ + "/proc/net/route"), routes(root_ + "/proc/net/ipv6_route")));
     auto address = name ? interfaces.hardwareAddress(*name) : std::nullopt;
     if (!address) return {};
     return {std::move(*address)};
