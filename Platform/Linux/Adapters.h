@@ -47,7 +47,8 @@ class MountTable;
 /// `root` is the folder below which /proc lies.
 [[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo(const std::string& root = "/");
 [[nodiscard]] std::unique_ptr<ProcessLauncher> makeProcessLauncher();
-[[nodiscard]] std::unique_ptr<TimeZones> makeTimeZones();
+/// `root` is the folder below which /etc/localtime lies.
+[[nodiscard]] std::unique_ptr<TimeZones> makeTimeZones(const std::string& root = "/");
 [[nodiscard]] std::unique_ptr<UserDefaults> makeUserDefaults();
 [[nodiscard]] std::unique_ptr<MainQueue> makeMainQueue();
 [[nodiscard]] std::unique_ptr<StandardOutput> makeStandardOutput();
