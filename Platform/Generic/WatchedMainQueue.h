@@ -35,6 +35,10 @@ class VARNEL_API WatchedMainQueue final : public MainQueue {
   void run() override { queue_->run(); }
   void stop() override { queue_->stop(); }
   void runWhile(const std::function<bool()>& condition) override { queue_->runWhile(condition); }
+  bool runWhile(const std::function<bool()>& condition,
+                std::chrono::milliseconds patience) override {
+    return queue_->runWhile(condition, patience);
+  }
   bool drain() override { return queue_->drain(); }
   [[nodiscard]] std::optional<int> descriptor() override { return queue_->descriptor(); }
 

@@ -26,6 +26,7 @@ class UserNotificationCenters;
 class VolumeCatalog;
 class WallClockTimer;
 class Workspace;
+struct NotificationSource;
 
 }  // namespace Varnel::Platform
 
@@ -46,15 +47,18 @@ class MountTable;
 /// `root` is the folder below which /proc lies.
 [[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo(const std::string& root = "/");
 [[nodiscard]] std::unique_ptr<ProcessLauncher> makeProcessLauncher();
-[[nodiscard]] std::unique_ptr<TimeZones> makeTimeZones();
+/// `root` is the folder below which /etc/localtime lies.
+[[nodiscard]] std::unique_ptr<TimeZones> makeTimeZones(const std::string& root = "/");
 [[nodiscard]] std::unique_ptr<UserDefaults> makeUserDefaults();
 [[nodiscard]] std::unique_ptr<MainQueue> makeMainQueue();
 [[nodiscard]] std::unique_ptr<StandardOutput> makeStandardOutput();
 [[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog,
                                                            MainQueue& mainQueue);
-/// `patience` is how long a connection to the session bus may take.
+/// The desktop shows the banners as the source's. `patience` is how long a connection to the
+/// session bus may take.
 [[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(
-    SystemLog& systemLog, std::chrono::milliseconds patience = std::chrono::seconds(10));
+    SystemLog& systemLog, const NotificationSource& source,
+    std::chrono::milliseconds patience = std::chrono::seconds(10));
 [[nodiscard]] std::unique_ptr<WallClockTimer> makeWallClockTimer(SystemLog& systemLog);
 
 /// What notification centers are made with, beyond a server and a timer each.

@@ -41,10 +41,13 @@ bool hasModule(const char* module) {
   return !fileOf(module).empty();
 }
 
-void* moduleFunction(const char* module, const char* symbol) {
+Result<void*, ModuleProblem> moduleFunction(const char* module, const char* symbol) {
   const fs::path file = fileOf(module);
-  void* const loaded = file.empty() ? nullptr : ::dlopen(file.c_str(), RTLD_NOW | RTLD_LOCAL);
-  return loaded ? ::dlsym(loaded, symbol) : nullptr;
+  if (file.empty()) return ModuleProblem{moduleIsMissing};
+  void* const loaded = ::dlopen(file.c_str(), RTLD_NOW | RTLD_LOCAL);
+  if (void* const function = loaded ? ::dlsym(loaded, symbol) : nullptr) return function;
+  const char* const error = ::dlerror();
+  return ModuleProblem{std::string("does not load: ") + (error ? error : symbol)};
 }
 
 }  // namespace Varnel::Platform::POSIX

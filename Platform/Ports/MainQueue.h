@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <functional>
 #include <optional>
 
@@ -38,6 +39,9 @@ class VARNEL_API MainQueue {
   /// Runs what is posted, and waits for more, as long as the condition holds; it is asked at first
   /// and whenever something ran. Main thread only.
   virtual void runWhile(const std::function<bool()>& condition) = 0;
+  /// The same for as long as `patience` at the most. False when the condition still holds then.
+  virtual bool runWhile(const std::function<bool()>& condition,
+                        std::chrono::milliseconds patience) = 0;
 
   /// Runs what is posted until nothing is left, without waiting. True if there was anything. Main
   /// thread only.

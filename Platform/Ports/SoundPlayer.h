@@ -52,7 +52,8 @@ class VARNEL_API SoundPlayer {
   /// nothing here waits for the machine's sound system.
   [[nodiscard]] virtual std::shared_ptr<PlayableSound> load(std::string bytes) = 0;
 
-  /// The part without which no sound can be loaded, in words for a person; absent when it is there.
+  /// The part without which no sound can be played, in words for a person; absent when it is there.
+  /// One that is there and does not work is known after the end of the first sound.
   [[nodiscard]] virtual std::optional<std::string> missingPart() const = 0;
 };
 

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/NotificationSource.h>
 #include <Varnel/Platform/Values/UserNotification.h>
 
 namespace Varnel::Platform {
@@ -65,7 +66,7 @@ class VARNEL_API UserNotificationCenter {
   /// Whether banners are still to be shown or taken away. A program that is about to end lets the
   /// main queue run meanwhile:
   ///
-  ///     mainQueue.runWhile([&] { return center.isBusy(); });
+  ///     mainQueue.runWhile([&] { return center.isBusy(); }, std::chrono::seconds(3));
   [[nodiscard]] virtual bool isBusy() const = 0;
 };
 
@@ -74,9 +75,10 @@ class VARNEL_API UserNotificationCenters {
  public:
   virtual ~UserNotificationCenters() = default;
 
-  /// The center of the product with this base identifier, always the same one; it lives as long as
-  /// this object. A system that gives each application one center answers with that.
-  [[nodiscard]] virtual UserNotificationCenter& center(const std::string& baseIdentifier) = 0;
+  /// The center of the product with the source's identifier, always the same one; it lives as long
+  /// as this object, and shows the source that it was first asked for with. A system that gives
+  /// each application one center answers with that.
+  [[nodiscard]] virtual UserNotificationCenter& center(const NotificationSource& source) = 0;
 };
 
 }  // namespace Varnel::Platform

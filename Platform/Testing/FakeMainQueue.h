@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <condition_variable>
 #include <deque>
 #include <functional>
@@ -37,13 +38,20 @@ class FakeMainQueue final : public MainQueue {
   }
 
   void runWhile(const std::function<bool()>& condition) override {
+    while (!runWhile(condition, std::chrono::hours(1))) continue;
+  }
+  bool runWhile(const std::function<bool()>& condition,
+                std::chrono::milliseconds patience) override {
+    const auto end = std::chrono::steady_clock::now() + patience;
     while (condition()) {
+      if (std::chrono::steady_clock::now() >= end) return false;
       {
         std::unique_lock lock(mutex_);
-        posted_.wait(lock, [this] { return !blocks_.empty(); });
+        posted_.wait_until(lock, end, [this] { return !blocks_.empty(); });
       }
       runNext();
     }
+    return true;
   }
 
   void stop() override {

@@ -82,7 +82,9 @@ class FakeUserNotificationCenters final : public UserNotificationCenters {
  public:
   FakeUserNotificationCenter theCenter;
 
-  [[nodiscard]] UserNotificationCenter& center(const std::string&) override { return theCenter; }
+  [[nodiscard]] UserNotificationCenter& center(const NotificationSource&) override {
+    return theCenter;
+  }
 };
 
 }  // namespace Varnel::Platform::Testing

@@ -58,7 +58,7 @@ int RemindEveryCommand::run(Console& console) const {
   // Assigning plans anew and clears what was delivered, so only a choice of the user does it.
   service.setSchedulePeriod(period);
   storePeriod(period);
-  ports.mainQueue.runWhile([&center] { return center.isBusy(); });
+  awaitDesktop(center, console);
   return console.writeResult(statusText(center)) ? 0 : 1;
 }
 

@@ -1,6 +1,4 @@
 // SPDX-License-Identifier: MIT
-#include <Varnel/Platform/Ports/MainQueue.h>
-#include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
 #include <Varnel/Reminders/NextDayCleanupReminderInfo.h>
 #include <Varnel/Reminders/UserNotificationRouter.h>
@@ -16,7 +14,7 @@ int RemindTomorrowCommand::run(Console& console) const {
   // The identifier is always the same, so an earlier reminder gives way.
   center.scheduleNotification(
       Varnel::NextDayCleanupReminderInfo(selectedSize, foundSize).makeUserNotification());
-  Varnel::Platform::processPorts().mainQueue.runWhile([&center] { return center.isBusy(); });
+  awaitDesktop(center, console);
   return console.writeResult(statusText(center)) ? 0 : 1;
 }
 

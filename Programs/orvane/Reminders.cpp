@@ -1,15 +1,18 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/Reminders.h>
 
+#include <chrono>
 #include <optional>
 
 #include <Varnel/Basalt/JSON.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/UserDefaults.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
 #include <Varnel/Platform/Text/DateFormatter.h>
 #include <Varnel/Platform/Text/VisibleText.h>
 #include <Varnel/Reminders/SchedulePeriodOptionBox.h>
+#include <orvane/Console.h>
 
 namespace Orvane {
 namespace {
@@ -19,6 +22,9 @@ using Varnel::Platform::UserNotification;
 using Varnel::Platform::visibleText;
 
 constexpr const char* periodKey = "schedulePeriod";
+
+// Servers answer within milliseconds, unless they have yet to be started.
+constexpr std::chrono::seconds patience(3);
 
 std::string textOf(const std::optional<Varnel::Platform::Date>& date) {
   static const Varnel::Platform::DateFormatter formatter(
@@ -45,6 +51,12 @@ SchedulePeriodOption storedPeriod() {
 void storePeriod(SchedulePeriodOption period) {
   Varnel::Platform::processPorts().userDefaults.set(periodKey,
                                                     Basalt::jsonText(period.exportJSON()));
+}
+
+void awaitDesktop(Varnel::Platform::UserNotificationCenter& center, Console& console) {
+  auto& mainQueue = Varnel::Platform::processPorts().mainQueue;
+  if (!mainQueue.runWhile([&center] { return center.isBusy(); }, patience))
+    console.complain("the desktop does not answer; the banner of an earlier reminder may stay");
 }
 
 std::string lineOf(const UserNotification& notification) {

@@ -12,10 +12,16 @@ class UserNotificationCenter;
 
 namespace Orvane {
 
+class Console;
+
 /// The period that the user chose, kept in this program's settings; never until then, and where the
 /// setting is damaged.
 [[nodiscard]] Varnel::SchedulePeriodOption storedPeriod();
 void storePeriod(Varnel::SchedulePeriodOption period);
+
+/// Lets the desktop show and take away what the center told it to. Complains when that takes more
+/// than a few seconds, and leaves it there.
+void awaitDesktop(Varnel::Platform::UserNotificationCenter& center, Console& console);
 
 /// The stored period and the notifications of a center, a line each.
 [[nodiscard]] std::string statusText(Varnel::Platform::UserNotificationCenter& center);

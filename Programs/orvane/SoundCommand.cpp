@@ -48,7 +48,8 @@ std::optional<std::string> playToTheEnd(Varnel::Sound sound) {
   engine.currentSound()->setDelegate(end);
   // The end of the sound arrives on the main queue.
   ports.mainQueue.runWhile([&engine] { return engine.currentSound() != nullptr; });
-  if (!end->hasFinished) return "this machine cannot play sounds";
+  if (!end->hasFinished)
+    return ports.soundPlayer.missingPart().value_or("this machine cannot play sounds");
   return std::nullopt;
 }
 

@@ -6,6 +6,7 @@
 #include <utility>
 
 #include <Varnel/Basalt/MainQueueExecutor.h>
+#include <Varnel/Context/BuildSwitches.h>
 #include <Varnel/Context/Globals.h>
 #include <Varnel/Platform/Ports/Application.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
@@ -82,7 +83,12 @@ UserNotificationRouter::UserNotificationRouter() : UserNotificationRouter(portsO
 UserNotificationRouter::~UserNotificationRouter() = default;
 
 UserNotificationCenter& UserNotificationRouter::defaultUserNotificationCenter() {
-  return Platform::processPorts().userNotificationCenters.center(Globals::baseIdentifier());
+  const BuildSwitches& product = BuildSwitches::ofThisProduct();
+  return Platform::processPorts().userNotificationCenters.center(
+      {.identifier = Globals::baseIdentifier(),
+       .name = Globals::applicationName(),
+       .desktopEntry = product.desktopEntry,
+       .icon = product.icon});
 }
 
 UserNotificationCenter& UserNotificationRouter::userNotificationCenter() const {

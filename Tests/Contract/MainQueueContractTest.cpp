@@ -87,6 +87,12 @@ TEST_P(MainQueueContract, RunsWhileAConditionHolds) {
   EXPECT_LE(left, 0);
   queue->drain();
   EXPECT_EQ(left, -2);
+
+  // And not for ever, though nothing comes.
+  const auto holds = [] { return true; };
+  EXPECT_FALSE(queue->runWhile(holds, std::chrono::milliseconds(1)));
+  queue->post([&] { left = 7; });
+  EXPECT_TRUE(queue->runWhile([&] { return left < 7; }, std::chrono::minutes(5)));
 }
 
 TEST_P(MainQueueContract, TakesBlocksOfManyThreadsEachInItsOrder) {

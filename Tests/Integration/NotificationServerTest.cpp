@@ -72,6 +72,7 @@ class Server final {
   Server(const Server&) = delete;
   Server& operator=(const Server&) = delete;
 
+  void signal(int number) const { ::kill(process_, number); }
   [[nodiscard]] static std::string displayedCount() { return outputOf("dunstctl count displayed"); }
 
  private:
@@ -83,7 +84,10 @@ class Host final {
  public:
   explicit Host(const std::string& product)
       : productName(product),
-        center(centers->center(product)),
+        center(centers->center({.identifier = product,
+                                .name = "Fotovia & 3",
+                                .desktopEntry = "com.example.Fotovia3",
+                                .icon = "/icons/fotovia 3.png"})),
         router({center, application, *queue}) {
     module->setBundle(Bundle(VARNEL_TEST_RESOURCES, {"en"}));
     CustomDimensionsHolder::setClientIdentifier("client");
@@ -157,6 +161,7 @@ TEST(NotificationServer, AReminderAppearsAndItsClicksComeBackOnce) {
     EXPECT_THAT(host.center.scheduledNotifications(), SizeIs(1));
   }
   const std::string history = outputOf("dunstctl history");
+  EXPECT_THAT(history, HasSubstr("Fotovia & 3"));
   EXPECT_THAT(history, HasSubstr("Time to <clean> & go"));
   EXPECT_THAT(history, HasSubstr("2 &lt; 3 &amp; &quot;&lt;b&gt;plain&lt;/b&gt;&quot;"));
   EXPECT_EQ(host.log.text(), "");
@@ -253,6 +258,21 @@ TEST(NotificationServer, OneProcessLearnsAtOnceWhatAnotherSchedules) {
   other.center.scheduleNotification(other.reminderIn(100ms));
   host.awaitBanner();
   EXPECT_THAT(other.center.deliveredNotifications(), SizeIs(1));
+}
+
+TEST(NotificationServer, AProgramThatPlansWaitsForAFrozenServerOnlyAWhile) {
+  Server server;
+  ::setenv("HOME", getenv("VARNEL_DESKTOP"), 1);
+  Host host("com.quennel.Orvane2");
+  host.center.deliverNotification(host.reminderIn(0s));
+  host.awaitReferences();
+  server.signal(SIGSTOP);
+  const auto start = std::chrono::steady_clock::now();
+  EXPECT_THAT(outputOf(std::string(ORVANE_PROGRAM) + " remind every weekly 2>&1"),
+              AllOf(HasSubstr("the desktop does not answer"), HasSubstr("\nscheduled ")));
+  EXPECT_LT(std::chrono::steady_clock::now() - start, 15s);
+  server.signal(SIGCONT);
+  while (Server::displayedCount() != "0\n") continue;
 }
 
 TEST(NotificationServer, AProgramThatListensTellsOfDeliveriesAndClicks) {

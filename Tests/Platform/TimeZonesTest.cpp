@@ -7,10 +7,13 @@
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
+#include <limits>
+#include <sstream>
 #include <string>
 #include <vector>
 
 #include <Tests/Support/LocalZone.h>
+#include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Text/Calendar.h>
 #include <Varnel/Platform/Text/DateFormatter.h>
@@ -160,6 +163,51 @@ TEST(TimeZones, TakeEveryFormOfTheVariableAndAnythingElseForUTC) {
   for (const Date edge : {Date::min(), Date::max()}) EXPECT_LT(berlin->offsetAt(edge).fromUTC, 24h);
   EXPECT_GT(berlin->nextChange(Date::min()), sys_days(1800y / January / 1));
   EXPECT_EQ(berlin->nextChange(Date::max()), std::nullopt);
+}
+
+TEST(TimeZones, ADamagedFileIsNoZone) {
+  const fs::path whole = "/usr/share/zoneinfo/Europe/Berlin";
+  std::stringstream content;
+  content << std::ifstream(whole, std::ios::binary).rdbuf();
+  const std::string bytes = content.str();
+  if (bytes.empty()) GTEST_SKIP() << "The system has no table of time zones.";
+  const Tests::TemporaryFolder folder;
+  const auto offsetWith = [&](const std::string& damaged) {
+    return system->zone(folder.write("zone", damaged))->offsetAt(sys_days(2026y / July / 1));
+  };
+  EXPECT_EQ(offsetWith(bytes).fromUTC, 2h);
+  for (std::size_t size = 0; size < bytes.size(); size += 7)
+    ASSERT_EQ(offsetWith(bytes.substr(0, size)).fromUTC, 0s) << size;
+  // What a changed byte means is open, and GLib itself complains of rules that it cannot read.
+  const std::size_t rules = bytes.rfind('\n', bytes.size() - 2);
+  for (std::size_t at = 0; at < rules; at += 3) {
+    std::string changed = bytes;
+    changed[at] = static_cast<char>(~changed[at]);
+    EXPECT_LT(offsetWith(changed).fromUTC.count(), std::numeric_limits<std::int32_t>::max()) << at;
+  }
+}
+
+TEST(TimeZones, FindWhereTheUserIsAsTheSystemWasSetUp) {
+  const fs::path berlin = "/usr/share/zoneinfo/Europe/Berlin";
+  if (!fs::exists(berlin)) GTEST_SKIP() << "The system has no table of time zones.";
+  const Tests::TemporaryFolder root;
+  const fs::path localTime = root.path() / "etc/localtime";
+  const auto found = Linux::makeTimeZones(root.path());
+  fs::create_directory(localTime.parent_path());
+  EXPECT_EQ(found->localIdentifier(), "UTC");
+  for (const fs::path& target : {berlin, berlin.lexically_relative(localTime.parent_path())}) {
+    fs::create_symlink(target, localTime);
+    EXPECT_EQ(found->localIdentifier(), "Europe/Berlin");
+    fs::remove(localTime);
+  }
+  // A copy, as a container has that of its host; the name may still be the container's.
+  fs::copy_file(berlin, localTime);
+  EXPECT_EQ(found->localIdentifier(), localTime);
+  root.write("etc/timezone", "Etc/UTC\n");
+  EXPECT_EQ(found->localIdentifier(), localTime);
+  EXPECT_EQ(found->zone(localTime)->offsetAt(sys_days(2026y / July / 1)).fromUTC, 2h);
+  root.write("etc/timezone", "Europe/Berlin\n");
+  EXPECT_EQ(found->localIdentifier(), "Europe/Berlin");
 }
 
 }  // namespace

@@ -275,13 +275,23 @@ TEST_F(Orvane, SaysWhatItLacksToPlayASound) {
   EXPECT_EQ(withoutDecoders.status, 1);
   EXPECT_THAT(withoutDecoders.errors, EndsWith("this machine cannot play sounds\n"));
 
-  // A copy of the library has no modules beside it.
-  std::filesystem::copy_file(VARNEL_LIBRARY, folder.path(VARNEL_LIBRARY_NAME));
-  moreEnvironment = {"LD_LIBRARY_PATH=" + folder.path()};
+  // A copy of the library has its resources, but no modules beside it.
+  namespace fs = std::filesystem;
+  const fs::path library = VARNEL_LIBRARY;
+  const fs::path modules = folder.path("lib/" VARNEL_MODULES_NAME);
+  fs::create_directories(modules);
+  fs::copy_file(library, modules.parent_path() / VARNEL_LIBRARY_NAME);
+  fs::create_directory_symlink(library.parent_path() / "../share", folder.path("share"));
+  moreEnvironment = {"LD_LIBRARY_PATH=" + modules.parent_path().string()};
   const Outcome withoutModule = run({"sound", "start"});
   EXPECT_EQ(withoutModule.status, 1);
   EXPECT_THAT(withoutModule.errors,
               EndsWith("libvarnel-gstreamer.so, was not built or is not installed\n"));
+
+  std::ofstream(modules / "libvarnel-gstreamer.so") << "no module";
+  const Outcome withBrokenModule = run({"sound", "start"});
+  EXPECT_EQ(withBrokenModule.status, 1);
+  EXPECT_THAT(withBrokenModule.errors, HasSubstr("libvarnel-gstreamer.so, does not load: "));
 }
 
 TEST_F(Orvane, ExplainsAFilesAttributeAndIdentifiesTheInstallation) {

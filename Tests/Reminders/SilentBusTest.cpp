@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <stdlib.h>
 #include <sys/socket.h>
@@ -7,10 +8,12 @@
 #include <Tests/Support/DrainUntil.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Ports/NotificationServer.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Values/NotificationSource.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -32,6 +35,61 @@ class SilentBus final {
   const POSIX::FileDescriptor socket_{::socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0)};
 };
 
+// Answers all that it is asked at once, but never says who does.
+class NamelessBus final {
+ public:
+  NamelessBus() {
+    const Guid guid(g_dbus_generate_guid());
+    const std::string address = "unix:path=" + (folder_.path() / "bus").string();
+    server_ = Server(g_dbus_server_new_sync(address.c_str(), G_DBUS_SERVER_FLAGS_NONE, guid.get(),
+                                            nullptr, nullptr, nullptr));
+    g_signal_connect(server_.get(), "new-connection", G_CALLBACK(&accept), nullptr);
+    g_dbus_server_start(server_.get());
+    ::setenv("DBUS_SESSION_BUS_ADDRESS", address.c_str(), 1);
+  }
+
+ private:
+  using Guid = UniqueHandle<char*, g_free>;
+  using Server = UniqueHandle<GDBusServer*, g_object_unref>;
+
+  static gboolean accept(GDBusServer*, GDBusConnection* connection, gpointer) {
+    g_dbus_connection_add_filter(connection, &answer, nullptr, nullptr);
+    g_object_ref(connection);
+    return TRUE;
+  }
+  static GDBusMessage* answer(GDBusConnection* connection, GDBusMessage* message, gboolean incoming,
+                              gpointer) {
+    if (!incoming) return message;
+    const Linux::BusMessage call(message);
+    const Linux::BusMessage reply(g_dbus_message_new_method_reply(call.get()));
+    const char* const services[] = {"actions", nullptr};
+    g_dbus_message_set_body(reply.get(),
+                            std::string_view(g_dbus_message_get_member(call.get())) == "Hello"
+                                ? g_variant_new("(s)", ":1.1")
+                                : g_variant_new("(^as)", services));
+    g_dbus_connection_send_message(connection, reply.get(), G_DBUS_SEND_MESSAGE_FLAGS_NONE, nullptr,
+                                   nullptr);
+    return nullptr;
+  }
+
+  const Tests::TemporaryFolder folder_;
+  Server server_;
+};
+
+// In a host that has made a context of its own the thread's.
+TEST(NotificationServer, ABusThatDoesNotTellWhoAnswersCostsTheBannerAlone) {
+  const NamelessBus bus;
+  const auto mainQueue = Linux::makeMainQueue();
+  Testing::CapturedSystemLog log;
+  const auto server = Linux::makeNotificationServer(log, {});
+  const UniqueHandle<GMainContext*, g_main_context_unref> own(g_main_context_new());
+  g_main_context_push_thread_default(own.get());
+  server->show("token", Banner(), {});
+  EXPECT_TRUE(mainQueue->runWhile([&] { return server->isBusy(); }, std::chrono::seconds(10)));
+  EXPECT_THAT(log.text(), testing::HasSubstr("does not tell who answers"));
+  g_main_context_pop_thread_default(own.get());
+}
+
 TEST(NotificationServer, ABusThatNeverAnswersCostsTheBannersAndNoWaiting) {
   const SilentBus bus;
   Banner banner;
@@ -39,11 +97,11 @@ TEST(NotificationServer, ABusThatNeverAnswersCostsTheBannersAndNoWaiting) {
   const auto mainQueue = Linux::makeMainQueue();
   Testing::CapturedSystemLog log;
   {
-    const auto ended = Linux::makeNotificationServer(log);
+    const auto ended = Linux::makeNotificationServer(log, {});
     ended->show("token", banner, {});
     EXPECT_TRUE(ended->isBusy());
   }
-  const auto server = Linux::makeNotificationServer(log, std::chrono::milliseconds(50));
+  const auto server = Linux::makeNotificationServer(log, {}, std::chrono::milliseconds(50));
   // Each attempt comes to an end, and the next banner makes another.
   std::string lines;
   for (int attempt = 0; attempt < 2; ++attempt) {
@@ -53,6 +111,31 @@ TEST(NotificationServer, ABusThatNeverAnswersCostsTheBannersAndNoWaiting) {
     EXPECT_TRUE(Tests::drainUntil(*mainQueue, [&] { return !server->isBusy(); }));
     EXPECT_EQ(log.text(),
               lines += "Cannot show a notification: The session bus does not answer.\n");
+  }
+}
+
+// As the desktop notification standard orders the parts.
+TEST(NotificationServer, ABannerCarriesWhoseItIs) {
+  struct Row {
+    NotificationSource source;
+    const char* start;
+    const char* hints;
+  };
+  const Row rows[] = {
+      {{.name = "Fotovia \xff", .desktopEntry = "com.example.Fotovia", .icon = "/icons/a b.png"},
+       "('Fotovia \uFFFD', uint32 7, 'file:///icons/a%20b.png', ",
+       "{'desktop-entry': <'com.example.Fotovia'>}, -1)"},
+      {{.name = "Fotovia", .icon = "fotovia"},
+       "('Fotovia', uint32 7, 'fotovia', ",
+       "@a{sv} {}, -1)"},
+      {{}, "('', uint32 7, '', ", "@a{sv} {}, -1)"},
+  };
+  for (const Row& row : rows) {
+    const auto message = Linux::notifyRequest(":1.5", row.source, Banner(), {}, 7);
+    const UniqueHandle<char*, g_free> printed(
+        g_variant_print(g_dbus_message_get_body(message.get()), TRUE));
+    EXPECT_THAT(printed.get(),
+                testing::AllOf(testing::StartsWith(row.start), testing::EndsWith(row.hints)));
   }
 }
 

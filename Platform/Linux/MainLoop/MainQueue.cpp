@@ -5,6 +5,7 @@
 #include <sys/syscall.h>
 #include <unistd.h>
 
+#include <chrono>
 #include <deque>
 #include <functional>
 #include <mutex>
@@ -14,9 +15,20 @@
 
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/MainLoop/ContextDescriptor.h>
+#include <Varnel/Platform/Values/UniqueHandle.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
+
+void destroy(GSource* source) {
+  g_source_destroy(source);
+  g_source_unref(source);
+}
+
+gboolean note(gpointer isOver) noexcept {
+  *static_cast<bool*>(isOver) = true;
+  return G_SOURCE_REMOVE;
+}
 
 // Posts to GLib's default main context, which GTK, Qt and plain hosts all run. Every block has a
 // source of its own, so that a loop that a block runs inside itself still gets at the rest.
@@ -55,6 +67,18 @@ class DefaultContextQueue final : public MainQueue {
 
   void runWhile(const std::function<bool()>& condition) override {
     while (condition()) g_main_context_iteration(nullptr, TRUE);
+  }
+
+  bool runWhile(const std::function<bool()>& condition,
+                std::chrono::milliseconds patience) override {
+    bool isOver = false;
+    const UniqueHandle<GSource*, destroy> timer(
+        g_timeout_source_new(static_cast<guint>(patience.count())));
+    g_source_set_callback(timer.get(), &note, &isOver, nullptr);
+    g_source_attach(timer.get(), nullptr);
+    bool holds = false;
+    runWhile([&] { return (holds = condition()) && !isOver; });
+    return !holds;
   }
 
   bool drain() override {

@@ -24,8 +24,8 @@ constexpr const char* storeName = "notifications.sqlite";
 // product, and the link /etc/localtime when the user's time zone does.
 class Center final {
  public:
-  Center(const NotificationPorts& ports, const fs::path& folder)
-      : server_(makeNotificationServer(ports.systemLog)),
+  Center(const NotificationPorts& ports, const NotificationSource& source, const fs::path& folder)
+      : server_(makeNotificationServer(ports.systemLog, source)),
         timer_(makeWallClockTimer(ports.systemLog)),
         center_({ports.clock, ports.userLocale, ports.timeZones, ports.mainQueue, ports.systemLog,
                  *server_, *timer_},
@@ -63,11 +63,11 @@ class StoredCenters final : public UserNotificationCenters {
  public:
   explicit StoredCenters(const NotificationPorts& ports) : ports_(ports) {}
 
-  UserNotificationCenter& center(const std::string& baseIdentifier) override {
-    auto& center = centers_[baseIdentifier];
+  UserNotificationCenter& center(const NotificationSource& source) override {
+    auto& center = centers_[source.identifier];
     if (!center)
       center = std::make_unique<Center>(
-          ports_, privateFolder(userStateFolder() / folderName(baseIdentifier)));
+          ports_, source, privateFolder(userStateFolder() / folderName(source.identifier)));
     return center->center();
   }
 

@@ -24,6 +24,22 @@ Text valid(const std::string& text) {
   return Text(g_utf8_make_valid(text.data(), static_cast<gssize>(text.size())));
 }
 
+// The bus takes a name or a URI.
+Text iconOf(const NotificationSource& source) {
+  if (source.icon.starts_with('/'))
+    if (Text uri(g_filename_to_uri(source.icon.c_str(), nullptr, nullptr)); uri) return uri;
+  return valid(source.icon);
+}
+
+GVariant* hintsOf(const NotificationSource& source) {
+  GVariantBuilder hints;
+  g_variant_builder_init(&hints, G_VARIANT_TYPE("a{sv}"));
+  if (!source.desktopEntry.empty())
+    g_variant_builder_add(&hints, "{sv}", "desktop-entry",
+                          g_variant_new_string(valid(source.desktopEntry).get()));
+  return g_variant_builder_end(&hints);
+}
+
 GVariant* actionsOf(const Banner& banner, ServerCapabilities capabilities) {
   GVariantBuilder actions;
   g_variant_builder_init(&actions, G_VARIANT_TYPE("as"));
@@ -78,16 +94,14 @@ ServerCapabilities capabilitiesIn(GDBusMessage* reply) {
   return capabilities;
 }
 
-BusMessage notifyRequest(const std::string& server, const std::string& applicationName,
+BusMessage notifyRequest(const std::string& server, const NotificationSource& source,
                          const Banner& banner, ServerCapabilities capabilities,
                          std::uint32_t replaced) {
   Text text = valid(banner.text);
   if (capabilities.readsMarkup) text = Text(g_markup_escape_text(text.get(), -1));
-  GVariantBuilder hints;
-  g_variant_builder_init(&hints, G_VARIANT_TYPE("a{sv}"));
-  GVariant* body = g_variant_new(
-      "(susss@as@a{sv}i)", valid(applicationName).get(), replaced, "", valid(banner.title).get(),
-      text.get(), actionsOf(banner, capabilities), g_variant_builder_end(&hints), expiryOfServer);
+  GVariant* body = g_variant_new("(susss@as@a{sv}i)", valid(source.name).get(), replaced,
+                                 iconOf(source).get(), valid(banner.title).get(), text.get(),
+                                 actionsOf(banner, capabilities), hintsOf(source), expiryOfServer);
   return request(server.c_str(), "Notify", body);
 }
 

@@ -8,6 +8,7 @@
 #include <string>
 
 #include <Varnel/Platform/Ports/NotificationServer.h>
+#include <Varnel/Platform/Values/NotificationSource.h>
 #include <Varnel/Platform/Values/UniqueHandle.h>
 
 /// The messages of the desktop's notification service, as it is specified for all desktops.
@@ -50,9 +51,9 @@ struct BannerAddress final {
 [[nodiscard]] ServerCapabilities capabilitiesIn(GDBusMessage* reply);
 
 /// `replaced` is the number of the banner to replace, or 0.
-[[nodiscard]] BusMessage notifyRequest(const std::string& server,
-                                       const std::string& applicationName, const Banner& banner,
-                                       ServerCapabilities capabilities, std::uint32_t replaced);
+[[nodiscard]] BusMessage notifyRequest(const std::string& server, const NotificationSource& source,
+                                       const Banner& banner, ServerCapabilities capabilities,
+                                       std::uint32_t replaced);
 [[nodiscard]] std::optional<std::uint32_t> bannerNumberIn(GDBusMessage* reply);
 
 [[nodiscard]] BusMessage closeRequest(const BannerAddress& banner);

@@ -9,8 +9,8 @@
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
 #include <Varnel/Platform/Linux/Notifications/SessionBus.h>
-#include <Varnel/Platform/Linux/Process/UserFolders.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Values/NotificationSource.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
@@ -18,8 +18,9 @@ namespace {
 // What the server's replies and signals refer to. Replies may outlive the adapter.
 class Desktop final : public std::enable_shared_from_this<Desktop> {
  public:
-  Desktop(SystemLog& systemLog, std::chrono::milliseconds patience)
+  Desktop(SystemLog& systemLog, NotificationSource source, std::chrono::milliseconds patience)
       : systemLog_(systemLog),
+        source_(std::move(source)),
         bus_(std::make_shared<SessionBus>([this](const char* sender, const char* name,
                                                  GVariant* body) { receive(sender, name, body); },
                                           patience)) {}
@@ -99,9 +100,8 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     if (!isCurrent(key)) return;
     const auto& replaced = shown_[key.token].address;
     const bool knowsIt = replaced && replaced->bus == bus_->name() && replaced->server == server;
-    send(notifyRequest(server, applicationName_, banner, capabilities,
-                       knowsIt ? replaced->number : 0),
-         key, [server](Desktop& self, GDBusMessage* reply, const Key& shown) {
+    send(notifyRequest(server, source_, banner, capabilities, knowsIt ? replaced->number : 0), key,
+         [server](Desktop& self, GDBusMessage* reply, const Key& shown) {
            if (const auto number = bannerNumberIn(reply))
              self.hasShown(shown, {self.bus_->name(), server, *number});
          });
@@ -162,7 +162,7 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
   }
 
   SystemLog& systemLog_;
-  const std::string applicationName_ = applicationFolderName();
+  const NotificationSource source_;
   const std::shared_ptr<SessionBus> bus_;
   std::map<std::string, Shown> shown_;
   std::uint64_t lastVersion_ = 0;
@@ -170,8 +170,9 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
 
 class BusNotificationServer final : public NotificationServer {
  public:
-  BusNotificationServer(SystemLog& systemLog, std::chrono::milliseconds patience)
-      : desktop_(std::make_shared<Desktop>(systemLog, patience)) {}
+  BusNotificationServer(SystemLog& systemLog, const NotificationSource& source,
+                        std::chrono::milliseconds patience)
+      : desktop_(std::make_shared<Desktop>(systemLog, source, patience)) {}
 
   void setObserver(std::weak_ptr<Observer> observer) override {
     desktop_->observer = std::move(observer);
@@ -192,8 +193,9 @@ class BusNotificationServer final : public NotificationServer {
 }  // namespace
 
 std::unique_ptr<NotificationServer> makeNotificationServer(SystemLog& systemLog,
+                                                           const NotificationSource& source,
                                                            std::chrono::milliseconds patience) {
-  return std::make_unique<BusNotificationServer>(systemLog, patience);
+  return std::make_unique<BusNotificationServer>(systemLog, source, patience);
 }
 
 }  // namespace Varnel::Platform::Linux

@@ -33,6 +33,27 @@ GSource* attach(GSource* source, Block block) {
   return source;
 }
 
+// While it lives, what GIO is asked for arrives where the main queue runs, although the host may
+// have made another context the thread's own.
+class OnMainContext final {
+ public:
+  OnMainContext()
+      : isPushed_(g_main_context_get_thread_default() && g_main_context_acquire(context_)) {
+    if (isPushed_) g_main_context_push_thread_default(context_);
+  }
+  ~OnMainContext() {
+    if (!isPushed_) return;
+    g_main_context_pop_thread_default(context_);
+    g_main_context_release(context_);
+  }
+  OnMainContext(const OnMainContext&) = delete;
+  OnMainContext& operator=(const OnMainContext&) = delete;
+
+ private:
+  GMainContext* const context_ = g_main_context_default();
+  const bool isPushed_;
+};
+
 void dispatch(GDBusConnection*, const char* sender, const char*, const char*, const char* name,
               GVariant* body, gpointer signal) noexcept {
   (*static_cast<SessionBus::Signal*>(signal))(sender, name, body);
@@ -116,6 +137,7 @@ void SessionBus::adopt(Connection connection) {
   // A signal of the lost connection may still be on its way to us.
   unsubscribe();
   connection_ = std::move(connection);
+  const OnMainContext here;
   subscription_ = g_dbus_connection_signal_subscribe(
       connection_.get(), notificationService, notificationService, nullptr, notificationPath,
       nullptr, G_DBUS_SIGNAL_FLAGS_NONE, &dispatch, new Signal(signal_), &release);
@@ -123,6 +145,7 @@ void SessionBus::adopt(Connection connection) {
 
 void SessionBus::send(const BusMessage& message, Reply reply) {
   constexpr int defaultTimeout = -1;
+  const OnMainContext here;
   ++awaitedReplies_;
   g_dbus_connection_send_message_with_reply(
       connection_.get(), message.get(), G_DBUS_SEND_MESSAGE_FLAGS_NONE, defaultTimeout, nullptr,
@@ -136,6 +159,9 @@ void SessionBus::replied(GObject* connection, GAsyncResult* result, gpointer dat
       G_DBUS_CONNECTION(connection), result, &error));
   if (const auto self = awaited->bus.lock()) --self->awaitedReplies_;
   if (!message) return awaited->use(nullptr, take(error));
+  // Which none does that a real bus has passed on.
+  if (!g_dbus_message_get_sender(message.get()))
+    return awaited->use(nullptr, "The session bus does not tell who answers.");
   const auto refusal = errorIn(message.get());
   if (refusal)
     awaited->use(nullptr, *refusal);

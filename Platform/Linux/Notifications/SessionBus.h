@@ -24,7 +24,7 @@ class SessionBus final : public std::enable_shared_from_this<SessionBus> {
  public:
   /// Gets what went wrong, or nothing. Must not throw.
   using Connected = std::function<void(const std::string& error)>;
-  /// Gets the reply, or null and what went wrong. Must not throw.
+  /// Gets the reply, which has a sender, or null and what went wrong. Must not throw.
   using Reply = std::function<void(GDBusMessage* reply, const std::string& error)>;
   /// Gets the sender, the member and the body of a signal. Must not throw.
   using Signal = std::function<void(const char* sender, const char* name, GVariant* body)>;

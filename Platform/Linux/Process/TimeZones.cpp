@@ -6,13 +6,20 @@
 #include <cstdint>
 #include <cstdlib>
 #include <filesystem>
-#include <string_view>
+#include <fstream>
+#include <optional>
+#include <sstream>
+#include <string>
+#include <utility>
 
 #include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/Process/ZoneFile.h>
 #include <Varnel/Platform/Values/UniqueHandle.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
+
+namespace fs = std::filesystem;
 
 using ZoneHandle = UniqueHandle<GTimeZone*, g_time_zone_unref>;
 
@@ -53,27 +60,39 @@ class GLibTimeZone final : public TimeZone {
   const ZoneHandle zone_;
 };
 
-// Null for what names no zone. Names stand below the system's folder of zones; a path may lead to
-// a zone of the user's own, but not to what blocks whoever opens it.
-ZoneHandle loadZone(const std::string& identifier) {
-  namespace fs = std::filesystem;
-  const bool isPath = identifier.starts_with('/') || identifier.find("..") != std::string::npos;
+fs::path folderOfZones() {
+  const char* folder = std::getenv("TZDIR");
+  return folder && *folder ? folder : "/usr/share/zoneinfo";
+}
+
+std::optional<std::string> contentOf(const fs::path& file) {
   std::error_code failure;
-  if (identifier.empty() || (isPath && !fs::is_regular_file(identifier, failure))) return {};
+  // What is no plain file may block whoever opens it.
+  if (!fs::is_regular_file(file, failure)) return std::nullopt;
+  std::ostringstream content;
+  content << std::ifstream(file, std::ios::binary).rdbuf();
+  return std::move(content).str();
+}
+
+// Null for what names no zone. Names stand below the system's folder of zones; a path may lead to
+// a zone of the user's own.
+ZoneHandle loadZone(const std::string& identifier) {
+  if (identifier.empty()) return {};
+  const auto content = contentOf(folderOfZones() / identifier);
+  const bool isPath = identifier.starts_with('/') || identifier.find("..") != std::string::npos;
+  // Without a file it may be a rule.
+  if (content ? !isWholeZoneFile(*content) : isPath) return {};
   return ZoneHandle(g_time_zone_new_identifier(identifier.c_str()));
 }
 
 class GLibTimeZones final : public TimeZones {
  public:
+  explicit GLibTimeZones(const std::string& root) : localTime_(fs::path(root) / "etc/localtime") {}
+
   // TZ, or where /etc/localtime leads to.
   std::string localIdentifier() const override {
-    if (const char* variable = std::getenv("TZ")) {
-      std::string name = variable;
-      if (name.starts_with(':')) name.erase(0, 1);
-      return loadZone(name) ? name : "UTC";
-    }
-    const ZoneHandle zone(g_time_zone_new_local());
-    return g_time_zone_get_identifier(zone.get());
+    std::string name = chosenName();
+    return loadZone(name) ? name : "UTC";
   }
 
   std::shared_ptr<const TimeZone> zone(const std::string& identifier) const override {
@@ -81,12 +100,35 @@ class GLibTimeZones final : public TimeZones {
     if (!zone) zone = ZoneHandle(g_time_zone_new_utc());
     return std::make_shared<GLibTimeZone>(std::move(zone));
   }
+
+ private:
+  std::string chosenName() const {
+    if (const char* variable = std::getenv("TZ")) return variable + (*variable == ':' ? 1 : 0);
+    std::error_code isNoLink;
+    const fs::path target = fs::read_symlink(localTime_, isNoLink);
+    return isNoLink ? nameOfCopy() : nameOf((localTime_.parent_path() / target).lexically_normal());
+  }
+
+  static std::string nameOf(const fs::path& file) {
+    const std::string name = file.lexically_relative(folderOfZones());
+    return name.empty() || name.starts_with("..") ? file.string() : name;
+  }
+
+  // A container may have its host's zone and a name of its own, which counts if it names the same.
+  std::string nameOfCopy() const {
+    std::string name;
+    std::getline(std::ifstream(localTime_.parent_path() / "timezone"), name);
+    const auto named = name.empty() ? std::nullopt : contentOf(folderOfZones() / name);
+    return named && named == contentOf(localTime_) ? name : localTime_.string();
+  }
+
+  const fs::path localTime_;
 };
 
 }  // namespace
 
-std::unique_ptr<TimeZones> makeTimeZones() {
-  return std::make_unique<GLibTimeZones>();
+std::unique_ptr<TimeZones> makeTimeZones(const std::string& root) {
+  return std::make_unique<GLibTimeZones>(root);
 }
 
 }  // namespace Varnel::Platform::Linux

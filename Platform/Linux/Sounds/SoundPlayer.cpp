@@ -1,6 +1,11 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/Ports/SoundPlayer.h>
 
+#include <atomic>
+#include <memory>
+#include <mutex>
+#include <optional>
+#include <string>
 #include <utility>
 
 #include <Varnel/Platform/Generic/BackgroundSoundPlayer.h>
@@ -14,36 +19,67 @@ namespace {
 
 constexpr const char* module = "libvarnel-gstreamer.so";
 
+// What became of loading the module, which the player's thread does. It tells the log once. Any
+// thread.
+class Loading final {
+ public:
+  explicit Loading(SystemLog& systemLog) : systemLog_(systemLog) {}
+
+  std::unique_ptr<SoundOutput> load() {
+    const auto make = POSIX::moduleFunction(module, "varnelMakeSoundOutput");
+    // Never closed again: GStreamer cannot be unloaded.
+    if (make)
+      return std::unique_ptr<SoundOutput>(
+          reinterpret_cast<decltype(&varnelMakeSoundOutput)>(*make)());
+    const std::string problem = described(make.error().text);
+    {
+      const std::lock_guard lock(mutex_);
+      failure_ = problem;
+    }
+    report(problem);
+    return nullptr;
+  }
+
+  void report(const std::string& problem) {
+    if (!hasReported_.exchange(true)) systemLog_.write("There will be no sounds: " + problem + ".");
+  }
+
+  std::optional<std::string> problem() const {
+    // It may be installed meanwhile.
+    if (!POSIX::hasModule(module)) return described(POSIX::moduleIsMissing);
+    const std::lock_guard lock(mutex_);
+    return failure_;
+  }
+
+ private:
+  static std::string described(const std::string& problem) {
+    return std::string("the sound module, ") + module + ", " + problem;
+  }
+
+  SystemLog& systemLog_;
+  std::atomic<bool> hasReported_ = false;
+  mutable std::mutex mutex_;  // Owns failure_.
+  std::optional<std::string> failure_;
+};
+
 // Plays by what is in the module. Without the module nothing can be loaded.
 class ModuleSoundPlayer final : public SoundPlayer {
  public:
   ModuleSoundPlayer(SystemLog& systemLog, MainQueue& mainQueue)
-      : systemLog_(systemLog), player_(mainQueue, [&systemLog] { return loadOutput(systemLog); }) {}
+      : loading_(std::make_shared<Loading>(systemLog)),
+        player_(mainQueue, [loading = loading_] { return loading->load(); }) {}
 
   std::shared_ptr<PlayableSound> load(std::string bytes) override {
-    if (!missingPart()) return player_.load(std::move(bytes));
-    if (!std::exchange(hasReported_, true))
-      systemLog_.write("The sound module is missing; there will be no sounds.");
+    const auto missing = missingPart();
+    if (!missing) return player_.load(std::move(bytes));
+    loading_->report(*missing);
     return nullptr;
   }
 
-  std::optional<std::string> missingPart() const override {
-    if (POSIX::hasModule(module)) return std::nullopt;
-    return std::string("the sound module, ") + module + ", was not built or is not installed";
-  }
+  std::optional<std::string> missingPart() const override { return loading_->problem(); }
 
  private:
-  static std::unique_ptr<SoundOutput> loadOutput(SystemLog& systemLog) {
-    // Never closed again: GStreamer cannot be unloaded.
-    if (void* make = POSIX::moduleFunction(module, "varnelMakeSoundOutput"))
-      return std::unique_ptr<SoundOutput>(
-          reinterpret_cast<decltype(&varnelMakeSoundOutput)>(make)());
-    systemLog.write("The sound module does not load; there will be no sounds.");
-    return nullptr;
-  }
-
-  SystemLog& systemLog_;
-  bool hasReported_ = false;
+  const std::shared_ptr<Loading> loading_;
   BackgroundSoundPlayer player_;
 };
 
