@@ -39,10 +39,6 @@ class DescriptorAppendFiles final : public AppendFiles {
     // the file.
     FileDescriptor descriptor(
         ::open(path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_CLOEXEC, S_IRUSR | S_IWUSR));
-    // In a process without standard streams the file must not become one of them: what others print
-    // would go into it.
-    if (descriptor && descriptor.get() <= STDERR_FILENO)
-      descriptor = FileDescriptor(::fcntl(descriptor.get(), F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
     if (!descriptor) return lastError();
     return std::unique_ptr<AppendFile>(
         std::make_unique<DescriptorAppendFile>(std::move(descriptor)));

@@ -1,17 +1,20 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <fcntl.h>
 #include <unistd.h>
 
 #include <utility>
 
 namespace Varnel::Platform::POSIX {
 
-/// Owns a file descriptor; -1 stands for none.
+/// Owns a file descriptor; -1 stands for none. It is never one of the three standard streams: where
+/// a host has closed those, the system gives their numbers to what is opened next, which would then
+/// get what others print. The number may so be another than the one given.
 class FileDescriptor final {
  public:
   FileDescriptor() = default;
-  explicit FileDescriptor(int descriptor) : descriptor_(descriptor) {}
+  explicit FileDescriptor(int descriptor) : descriptor_(awayFromStandardStreams(descriptor)) {}
   FileDescriptor(FileDescriptor&& other) noexcept
       : descriptor_(std::exchange(other.descriptor_, -1)) {}
   FileDescriptor& operator=(FileDescriptor&& other) noexcept {
@@ -30,6 +33,13 @@ class FileDescriptor final {
   explicit operator bool() const { return descriptor_ >= 0; }
 
  private:
+  static int awayFromStandardStreams(int descriptor) {
+    if (descriptor < 0 || descriptor > STDERR_FILENO) return descriptor;
+    const int moved = ::fcntl(descriptor, F_DUPFD_CLOEXEC, STDERR_FILENO + 1);
+    ::close(descriptor);
+    return moved;
+  }
+
   int descriptor_ = -1;
 };
 

@@ -4,7 +4,6 @@
 #include <atomic>
 #include <filesystem>
 #include <string_view>
-#include <utility>
 
 #include <Varnel/Context/Product.h>
 #include <Varnel/Platform/Ports/Ports.h>
@@ -69,9 +68,9 @@ const BuildSwitches& BuildSwitches::ofThisProduct() {
   return choose(new BuildSwitches(undeclared()));
 }
 
-Product::Product(BuildSwitches switches) {
-  const auto* declared = new BuildSwitches(std::move(switches));
-  if (&choose(declared) == declared) return;
+Product::Product(const BuildSwitches& switches) {
+  // A plug-in may bring along the declaration that its program has made already.
+  if (choose(new BuildSwitches(switches)) == switches) return;
   Platform::processPorts().systemLog.write(
       "A product was declared after another one, or after its facts had been asked for; it does "
       "not count.");

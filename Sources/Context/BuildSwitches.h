@@ -51,6 +51,8 @@ struct VARNEL_API BuildSwitches final {
   std::string desktopEntry = {};
   std::string icon = {};
 
+  bool operator==(const BuildSwitches&) const = default;
+
   /// What the exported functions answer: what the product declared or, in a program that declares
   /// none, its executable's name and the site channel. Any thread; never changes.
   [[nodiscard]] static const BuildSwitches& ofThisProduct();

@@ -20,12 +20,12 @@ namespace Varnel {
 /// The program's own start-up calls the constructor, so that nothing need be exported for the
 /// library to find. The object's name is what the linker looks for when the file lies in an
 /// archive; the priority puts it before the program's other objects. A product that names no
-/// channel stops the process at its first question for one. The first declaration counts: a later
-/// one, or one that comes after somebody asked, changes nothing and is reported to the system's
-/// log.
+/// channel stops the process at its first question for one. The first declaration counts:
+/// another one that comes later, or after somebody asked, changes nothing and is reported to the
+/// system's log.
 class VARNEL_API Product final {
  public:
-  explicit Product(BuildSwitches switches);
+  explicit Product(const BuildSwitches& switches);
   Product(const Product&) = delete;
   Product& operator=(const Product&) = delete;
 };

@@ -47,15 +47,16 @@ std::shared_ptr<DiskData> DiskRecords::ofVolume(const Platform::URL& volumeURL) 
 
 std::shared_ptr<DiskData> DiskRecords::usedBy(Basalt::ThreadID thread,
                                               const Platform::URL& volumeURL) const {
-  // The inventory may know of volumes that the disk did not have when its record was made, and the
-  // record of volumes that are gone.
-  const auto holdsVolume = [&](const std::shared_ptr<DiskData>& record) {
-    const auto& volumes = record->diskInfo()->volumeURLs();
-    return (volumes && volumes->contains(volumeURL)) || record == ofVolume(volumeURL);
+  const auto isOfItsDisk = [&](const Use& use) {
+    // The inventory may know of volumes that the disk did not have when its record was made, and
+    // the record of volumes that are gone.
+    const auto& volumes = use.record->diskInfo()->volumeURLs();
+    if (volumes && volumes->contains(volumeURL)) return true;
+    const auto disk = ofVolume(volumeURL);
+    return disk && (disk == use.record || disk == ofVolume(use.volumeURL));
   };
   for (const Use& use : uses_)
-    if (use.thread == thread && (use.volumeURL == volumeURL || holdsVolume(use.record)))
-      return use.record;
+    if (use.thread == thread && (use.volumeURL == volumeURL || isOfItsDisk(use))) return use.record;
   return nullptr;
 }
 

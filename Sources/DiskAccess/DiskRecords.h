@@ -35,9 +35,9 @@ class DiskRecords final {
   /// The record of the disk that holds the volume; null when it is not known.
   [[nodiscard]] std::shared_ptr<DiskData> ofVolume(const Platform::URL& volumeURL) const;
 
-  /// A record on which the thread has a place, and which gave it one for this volume or whose disk
-  /// holds it; null when there is none. A thread that nests accesses to a volume uses this one, as
-  /// it could wait for ever for another: for a thread that waits for the place on this one.
+  /// A record on which the thread has a place for a volume of the same disk, this one or another;
+  /// null when there is none. A thread that nests accesses to a disk uses this one, as it could
+  /// wait for ever for another: for a thread that waits for the place on this one.
   [[nodiscard]] std::shared_ptr<DiskData> usedBy(Basalt::ThreadID thread,
                                                  const Platform::URL& volumeURL) const;
 

@@ -286,6 +286,10 @@ TEST_F(DiskAccessManagerTest, AThreadThatHoldsADiskUsesItWhateverTheLookUpFinds)
     EXPECT_EQ(diskOf(beginOnBusyQueue(archiveVolume, 0)), "SSD-1") << "the dropped one is left";
   }).join();
   EXPECT_EQ(diskOf(begin(homeFile, 0)), "unknown") << "this disk is full, but that place is held";
+  volumes_.mount({.url = archiveVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  awaitInventory();
+  EXPECT_EQ(diskOf(begin(URL::fileURLWithPath("/archive/file"), 0)), "unknown")
+      << "it stands for the disk's other volumes too";
 }
 
 TEST_F(DiskAccessManagerTest, AMountThatAppearsWhileThreadsWaitGetsItsOwnDisk) {

@@ -1,9 +1,11 @@
 // SPDX-License-Identifier: MIT
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <pthread.h>
 #include <signal.h>
 #include <stdlib.h>
 #include <syslog.h>
+#include <unistd.h>
 
 #include <future>
 
@@ -14,6 +16,7 @@
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/Process/UserFolders.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/POSIX/FileDescriptor.h>
 #include <Varnel/Platform/Ports/ProcessInfo.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
@@ -79,6 +82,17 @@ TEST(StartThread, LeavesTheSignalsOfTheProcessToTheHost) {
     EXPECT_TRUE(facts.takesFaults) << name;
   }
   EXPECT_TRUE(currentFacts().takesSignals) << "the caller goes on as before";
+}
+
+// A host may have closed its standard streams: what it prints then must go into no file of ours.
+TEST(FileDescriptor, IsNoStandardStream) {
+  const POSIX::FileDescriptor input(::dup(STDIN_FILENO));
+  ::close(STDIN_FILENO);
+  const POSIX::FileDescriptor file(::open("/", O_RDONLY | O_CLOEXEC));
+  EXPECT_GT(file.get(), STDERR_FILENO);
+  EXPECT_EQ(::fcntl(file.get(), F_GETFD), FD_CLOEXEC);
+  EXPECT_EQ(::fcntl(STDIN_FILENO, F_GETFD), -1);
+  ::dup2(input.get(), STDIN_FILENO);
 }
 
 TEST(SystemLog, LeavesTheProcessesLogToTheHost) {

@@ -32,9 +32,9 @@ TEST(Products, EachProgramIsItsOwnProduct) {
   EXPECT_EQ(linesOf("FotoviaThatExportsNothing"), fotovia);
   EXPECT_EQ(linesOf("FotoviaOfAnArchive"), fotovia);
   EXPECT_EQ(linesOf("FotoviaWithTheLibraryInside"), fotovia);
-  EXPECT_EQ(linesOf("Sweeper"),
-            (Lines{"Welcome to Sweeper", "0.9 (0.9)", "Sweeper", "http://sweeper.example/index.php",
-                   "released", "com.quennel.Orvane2", "onceInTwoWeeks"}));
+  EXPECT_EQ(linesOf("Sweeper"), (Lines{"Welcome to S;w\\${e}e@p@)varnel\"é", "0 (0)", "Sweeper",
+                                       "http://sweeper.example/index.php", "released",
+                                       "com.quennel.Orvane2", "onceInTwoWeeks"}));
 }
 
 TEST(Products, AProgramThatDeclaresNoneGoesByItsExecutablesNameOnTheSite) {

@@ -32,19 +32,10 @@ struct Pipe {
   FileDescriptor writeEnd;
 };
 
-// Where the host has closed its standard streams, a pipe may get their numbers, which the child
-// needs for its own.
-FileDescriptor awayFromStandardStreams(FileDescriptor descriptor) {
-  if (descriptor.get() > STDERR_FILENO) return descriptor;
-  return FileDescriptor(::fcntl(descriptor.get(), F_DUPFD_CLOEXEC, STDERR_FILENO + 1));
-}
-
 std::optional<Pipe> makePipe() {
   std::array<int, 2> ends{};
   if (::pipe2(ends.data(), O_CLOEXEC) != 0) return std::nullopt;
   Pipe pipe{FileDescriptor(ends[0]), FileDescriptor(ends[1])};
-  pipe = {awayFromStandardStreams(std::move(pipe.readEnd)),
-          awayFromStandardStreams(std::move(pipe.writeEnd))};
   if (!pipe.readEnd || !pipe.writeEnd) return std::nullopt;
   return pipe;
 }
