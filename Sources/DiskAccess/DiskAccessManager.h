@@ -61,7 +61,8 @@ class VARNEL_API DiskAccessManager final {
   DiskAccessManager(const DiskAccessManager&) = delete;
   DiskAccessManager& operator=(const DiskAccessManager&) = delete;
 
-  /// The process's manager, made on first use and never destroyed.
+  /// The process's manager, made on first use, which throws as its constructor does, and never
+  /// destroyed.
   [[nodiscard]] static DiskAccessManager& shared();
 
   /// In background mode every disk admits one thread only. Threads that are in stay in.

@@ -14,6 +14,7 @@ namespace Varnel {
 
 /// Begins access to a file through the process's `DiskAccessManager`, with the quality of service
 /// of a utility. Null when there is no access; see `DiskAccessManager::beginAccessingURL`.
+/// The first use throws as `DiskAccessManager::shared()` does.
 ///
 ///     if (auto session = beginManagedAccessing(file, "preview")) {
 ///       read(file);

@@ -15,7 +15,7 @@ namespace Varnel {
 /// language of the interface. The host assigns them to its menu items:
 ///
 ///     const auto& menu = MainMenuAccessibility::instance();
-///     copyItem.setAccessibleId(menu.edit().actionCopy());  // "main-menu.edit.action-copy"
+///     const std::string copy = menu.edit().actionCopy();  // "main-menu.edit.action-copy"
 ///
 /// This is the one place that lists them. Names are published: hosts and their automation scripts
 /// refer to them, misspelt ones ("Duplidates", "bringAllToFrong", "putBackAll") included. Any
