@@ -6,24 +6,19 @@
 #include <array>
 #include <filesystem>
 
+#include <Varnel/Platform/POSIX/ImageFile.h>
+
 namespace Varnel::Platform::POSIX {
 namespace {
 
 namespace fs = std::filesystem;
 
-// The folder of the file that this code was loaded from: the library, or the program that the
-// library is a part of.
-fs::path ownFolder() {
-  Dl_info image{};
-  if (::dladdr(reinterpret_cast<const void*>(&ownFolder), &image) == 0 || !image.dli_fname)
-    return {};
-  std::error_code failed;
-  return fs::canonical(image.dli_fname, failed).parent_path();
-}
-
 // The file of a module; empty when there is none.
 fs::path fileOf(const char* module) {
-  const fs::path folder = ownFolder();
+  // Beside the library, or the program that the library is a part of; never in the current folder.
+  const fs::path own = imageFile(reinterpret_cast<const void*>(&fileOf));
+  if (own.empty()) return {};
+  const fs::path folder = own.parent_path();
   const std::array candidates = {
       folder / VARNEL_VERSIONED_NAME / module,
       folder.parent_path() / VARNEL_LIB_FOLDER / module,

@@ -5,6 +5,7 @@
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
+#include <latch>
 #include <string>
 #include <string_view>
 #include <thread>
@@ -48,6 +49,22 @@ void logInChild(const std::string& author) {
   ::waitpid(child, nullptr, 0);
 }
 
+// The same while another thread is about to print.
+void logInChildWithTheStreamHeld(const std::string& author) {
+  std::latch isHeld(1);
+  std::latch isOver(1);
+  std::thread holder([&] {
+    ::flockfile(stdout);
+    isHeld.count_down();
+    isOver.wait();
+    ::funlockfile(stdout);
+  });
+  isHeld.wait();
+  logInChild(author);
+  isOver.count_down();
+  holder.join();
+}
+
 }  // namespace
 
 int main(int argc, char** argv) {
@@ -66,6 +83,7 @@ int main(int argc, char** argv) {
     if (pause.count() > 0) std::this_thread::sleep_for(pause);
   }
   if (ending == "forked") logInChild(author);
+  if (ending == "forked-in-between") logInChildWithTheStreamHeld(author);
   if (ending == "killed") std::raise(SIGKILL);
   if (ending == "quick-exit") std::quick_exit(EXIT_SUCCESS);
   if (ending == "late-entry") logsAtTheVeryEnd.author = author;

@@ -146,6 +146,8 @@ TEST_F(LoggerProcessTest, WritesEachEntryOnceThoughTheProcessForks) {
   // Parent and child write theirs when they end.
   EXPECT_EQ(std::ranges::count(log(), '\n'), 4) << log();
   EXPECT_THAT(log(), HasSubstr("A:  child\n"));
+  const std::string printedInBetween = entriesIn(run("forked-in-between B 3 0"));
+  EXPECT_EQ(std::ranges::count(printedInBetween, '\n'), 4) << printedInBetween;
 }
 
 TEST_F(LoggerProcessTest, LeavesStandardOutputToAHostThatAsksForIt) {

@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: MIT
+#include <dlfcn.h>
 #include <fcntl.h>
 #include <gtest/gtest.h>
 #include <pthread.h>
@@ -17,6 +18,7 @@
 #include <Varnel/Platform/Linux/Process/UserFolders.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
+#include <Varnel/Platform/POSIX/ImageFile.h>
 #include <Varnel/Platform/Ports/ProcessInfo.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
@@ -118,6 +120,19 @@ TEST(ProcessInfo, KnowsItsExecutable) {
   }
   EXPECT_EQ(Linux::makeProcessInfo("/without-proc")->executablePath(),
             fs::read_symlink("/proc/self/exe"));
+}
+
+TEST(ImageFile, IsKnownWhereverTheProcessHasGoneSince) {
+  const fs::path before = fs::current_path();
+  const Tests::TemporaryFolder folder;
+  const fs::path copy = fs::canonical(folder.path()) / "copy.so";
+  fs::copy_file(POSIX::imageFile(::dlsym(RTLD_DEFAULT, "erf")), copy);
+  fs::current_path(folder.path());
+  void* const library = ::dlopen("./copy.so", RTLD_NOW | RTLD_LOCAL);
+  fs::current_path(before);
+  ASSERT_NE(library, nullptr);
+  EXPECT_EQ(POSIX::imageFile(::dlsym(library, "erf")), copy);
+  ::dlclose(library);
 }
 
 TEST(UserAccount, RefusesRelativeFolders) {

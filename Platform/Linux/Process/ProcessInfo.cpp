@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/Ports/ProcessInfo.h>
 
-#include <dlfcn.h>
 #include <sys/auxv.h>
 #include <sys/utsname.h>
 
@@ -11,6 +10,7 @@
 
 #include <Varnel/Platform/Generic/BundleFolders.h>
 #include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/POSIX/ImageFile.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
@@ -97,12 +97,8 @@ class ProcProcessInfo final : public ProcessInfo {
 
   std::optional<std::string> bundleFolderOfCode(const void* address,
                                                 std::string_view sharedFolder) const override {
-    Dl_info image{};
-    if (::dladdr(address, &image) == 0 || !image.dli_fname) return std::nullopt;
-    std::error_code failed;
-    fs::path path = fs::canonical(image.dli_fname, failed);
-    // The loader names the executable itself as it was called, perhaps by a relative path.
-    if (failed) path = executable_;
+    const fs::path image = POSIX::imageFile(address);
+    const fs::path& path = image.empty() ? executable_ : image;
     // The Info.plist beside a library may be that of the application it is shipped with.
     const auto shared = sharedFolder.empty() ? std::nullopt : findSharedFolder(path, sharedFolder);
     return asText(shared ? shared : findBundleFolder(path, nameOfImage(path)));

@@ -62,6 +62,7 @@ class LockedStream final {
 // With the stream's lock held, and not for what only goes into the buffer.
 void write(std::FILE* stream, std::string_view text, bool flushes) {
   const BrokenPipeIsNoSignal guard;
+  errno = 0;  // A stream of wide text refuses this one and sets none.
   const bool isWritten = ::fwrite_unlocked(text.data(), 1, text.size(), stream) == text.size() &&
                          (!flushes || ::fflush_unlocked(stream) == 0);
   // What nobody can read any more would be tried again, by the process's end at the latest.
@@ -83,9 +84,14 @@ void flushBeforeTheEnd() {
   flush();
 }
 
-// A child would write the same text again.
+// A parent may end without what is in its buffer.
 void flushBeforeFork() {
   flush();
+}
+
+// What other threads have printed since, or are about to, the parent writes.
+void beginAnewInChild() {
+  ::__fpurge(stdout);
 }
 
 class StandardStream : public StandardOutput {
@@ -118,7 +124,7 @@ class BufferedStandardOutput final : public StandardStream {
   void print(std::string_view text) override {
     [[maybe_unused]] static const bool isWatched =
         std::atexit(flushBeforeTheEnd) == 0 &&
-        ::pthread_atfork(flushBeforeFork, nullptr, nullptr) == 0;
+        ::pthread_atfork(flushBeforeFork, nullptr, beginAnewInChild) == 0;
     StandardStream::print(text);
   }
 };

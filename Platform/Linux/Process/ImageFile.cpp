@@ -1,0 +1,44 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Platform/POSIX/ImageFile.h>
+
+#include <dlfcn.h>
+
+#include <cinttypes>
+#include <cstdint>
+#include <cstdio>
+#include <fstream>
+#include <string>
+
+namespace Varnel::Platform::POSIX {
+namespace {
+
+namespace fs = std::filesystem;
+
+fs::path fileMappedAt(std::uintptr_t address) {
+  std::ifstream maps("/proc/self/maps");
+  for (std::string line; std::getline(maps, line);) {
+    std::uintptr_t begin = 0;
+    std::uintptr_t end = 0;
+    if (std::sscanf(line.c_str(), "%" SCNxPTR "-%" SCNxPTR, &begin, &end) != 2) continue;
+    if (address < begin || address >= end) continue;
+    const std::size_t path = line.find('/');
+    return path == std::string::npos ? fs::path() : fs::path(line.substr(path));
+  }
+  return {};
+}
+
+}  // namespace
+
+fs::path imageFile(const void* address) {
+  // The loader names a program as it was called, and a library by the folder in which it was looked
+  // for: a relative one of these leads elsewhere once the process has changed its folder.
+  Dl_info image{};
+  if (::dladdr(address, &image) != 0 && image.dli_fname && *image.dli_fname == '/') {
+    std::error_code failed;
+    fs::path path = fs::canonical(image.dli_fname, failed);
+    if (!failed) return path;
+  }
+  return fileMappedAt(reinterpret_cast<std::uintptr_t>(address));
+}
+
+}  // namespace Varnel::Platform::POSIX
