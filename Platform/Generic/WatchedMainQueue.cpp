@@ -49,9 +49,8 @@ void WatchedMainQueue::watch() try {
   thread_ = startThread("queue-watch", [this] {
     if (!firstRun_->comesWithin(patience_))
       systemLog_.write(
-          "Nothing runs the main queue: notifications, sounds and progress wait for it. A host "
-          "whose "
-          "main loop does not run it has to, by its descriptor.");
+          "Nothing has run the main queue so far: notifications, sounds and progress wait for it. "
+          "A host whose main loop does not run it has to, by its descriptor.");
   });
 } catch (const std::system_error&) {
   // Without a thread to spare nothing is said.

@@ -5,6 +5,12 @@
 #include <sys/socket.h>
 #include <sys/un.h>
 
+#include <chrono>
+#include <latch>
+#include <stop_token>
+#include <string>
+#include <thread>
+
 #include <Tests/Support/DrainUntil.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Linux/Adapters.h>
@@ -39,18 +45,27 @@ class SilentBus final {
 class NamelessBus final {
  public:
   NamelessBus() {
-    const Guid guid(g_dbus_generate_guid());
-    const std::string address = "unix:path=" + (folder_.path() / "bus").string();
-    server_ = Server(g_dbus_server_new_sync(address.c_str(), G_DBUS_SERVER_FLAGS_NONE, guid.get(),
-                                            nullptr, nullptr, nullptr));
-    g_signal_connect(server_.get(), "new-connection", G_CALLBACK(&accept), nullptr);
-    g_dbus_server_start(server_.get());
-    ::setenv("DBUS_SESSION_BUS_ADDRESS", address.c_str(), 1);
+    ::setenv("DBUS_SESSION_BUS_ADDRESS", address_.c_str(), 1);
+    std::latch isReady(1);
+    thread_ = std::jthread([this, &isReady](const std::stop_token& stop) {
+      g_main_context_push_thread_default(context_.get());
+      const Guid guid(g_dbus_generate_guid());
+      const Server server(g_dbus_server_new_sync(address_.c_str(), G_DBUS_SERVER_FLAGS_NONE,
+                                                 guid.get(), nullptr, nullptr, nullptr));
+      g_signal_connect(server.get(), "new-connection", G_CALLBACK(&accept), nullptr);
+      g_dbus_server_start(server.get());
+      isReady.count_down();
+      const std::stop_callback wake(stop, [this] { g_main_context_wakeup(context_.get()); });
+      while (!stop.stop_requested()) g_main_context_iteration(context_.get(), TRUE);
+      g_main_context_pop_thread_default(context_.get());
+    });
+    isReady.wait();
   }
 
  private:
   using Guid = UniqueHandle<char*, g_free>;
   using Server = UniqueHandle<GDBusServer*, g_object_unref>;
+  using Context = UniqueHandle<GMainContext*, g_main_context_unref>;
 
   static gboolean accept(GDBusServer*, GDBusConnection* connection, gpointer) {
     g_dbus_connection_add_filter(connection, &answer, nullptr, nullptr);
@@ -63,17 +78,19 @@ class NamelessBus final {
     const Linux::BusMessage call(message);
     const Linux::BusMessage reply(g_dbus_message_new_method_reply(call.get()));
     const char* const services[] = {"actions", nullptr};
-    g_dbus_message_set_body(reply.get(),
-                            std::string_view(g_dbus_message_get_member(call.get())) == "Hello"
-                                ? g_variant_new("(s)", ":1.1")
-                                : g_variant_new("(^as)", services));
+    const bool asksForServices =
+        std::string_view(g_dbus_message_get_member(call.get())) == "GetCapabilities";
+    g_dbus_message_set_body(reply.get(), asksForServices ? g_variant_new("(^as)", services)
+                                                         : g_variant_new("(s)", ":1.1"));
     g_dbus_connection_send_message(connection, reply.get(), G_DBUS_SEND_MESSAGE_FLAGS_NONE, nullptr,
                                    nullptr);
     return nullptr;
   }
 
   const Tests::TemporaryFolder folder_;
-  Server server_;
+  const std::string address_ = "unix:path=" + (folder_.path() / "bus").string();
+  const Context context_{g_main_context_new()};
+  std::jthread thread_;
 };
 
 // In a host that has made a context of its own the thread's.
@@ -88,6 +105,22 @@ TEST(NotificationServer, ABusThatDoesNotTellWhoAnswersCostsTheBannerAlone) {
   EXPECT_TRUE(mainQueue->runWhile([&] { return server->isBusy(); }, std::chrono::seconds(10)));
   EXPECT_THAT(log.text(), testing::HasSubstr("does not tell who answers"));
   g_main_context_pop_thread_default(own.get());
+}
+
+TEST(NotificationServer, AMainLoopThatComesLateFindsTheConnection) {
+  using Clock = std::chrono::steady_clock;
+  constexpr std::chrono::milliseconds patience(500);
+  const NamelessBus bus;
+  const auto mainQueue = Linux::makeMainQueue();
+  Testing::CapturedSystemLog log;
+  const auto server = Linux::makeNotificationServer(log, {}, patience);
+  server->show("token", Banner(), {});
+  const auto end = Clock::now() + patience;
+  while (!g_main_context_pending(nullptr)) std::this_thread::yield();
+  if (Clock::now() >= end) GTEST_SKIP() << "The machine is too slow.";
+  std::this_thread::sleep_until(end);
+  mainQueue->runWhile([&] { return server->isBusy(); });
+  EXPECT_THAT(log.text(), testing::HasSubstr("does not tell who answers"));
 }
 
 TEST(NotificationServer, ABusThatNeverAnswersCostsTheBannersAndNoWaiting) {

@@ -20,8 +20,8 @@ std::string take(GError* error) {
 }
 
 // Lets the source run the block once, on the main thread. The caller owns the source.
-GSource* attach(GSource* source, Block block) {
-  g_source_set_priority(source, G_PRIORITY_DEFAULT);
+GSource* attach(GSource* source, int priority, Block block) {
+  g_source_set_priority(source, priority);
   g_source_set_callback(
       source,
       [](gpointer data) -> gboolean {
@@ -89,20 +89,23 @@ void SessionBus::connect(Connected use) {
 }
 
 // A bus may accept the connection and then say nothing; even to ask for its address may mean to
-// start a program. The thread is left alone with that when the time is over.
+// start a program. The thread is left alone with that when the time is over, which counts for
+// nothing against a connection that has come: the main loop may have had no time for either.
 void SessionBus::start() {
   const auto attempt = attempt_ = std::make_shared<Attempt>();
-  timer_ = Timer(attach(g_timeout_source_new(static_cast<guint>(patience_.count())), [this] {
-    g_cancellable_cancel(attempt_->cancellable.get());
-    finish(attempt_, {}, "The session bus does not answer.");
-  }));
+  timer_ = Timer(attach(g_timeout_source_new(static_cast<guint>(patience_.count())),
+                        G_PRIORITY_DEFAULT + 1, [this] {
+                          g_cancellable_cancel(attempt_->cancellable.get());
+                          finish(attempt_, {}, "The session bus does not answer.");
+                        }));
   try {
     startThread("session-bus", [weak = weak_from_this(), attempt] {
       std::string error;
       const auto connection = std::make_shared<Connection>(open(attempt->cancellable.get(), error));
-      g_source_unref(attach(g_idle_source_new(), [weak, attempt, connection, error] {
-        if (const auto self = weak.lock()) self->finish(attempt, std::move(*connection), error);
-      }));
+      g_source_unref(
+          attach(g_idle_source_new(), G_PRIORITY_DEFAULT, [weak, attempt, connection, error] {
+            if (const auto self = weak.lock()) self->finish(attempt, std::move(*connection), error);
+          }));
     }).detach();
   } catch (const std::system_error& failure) {
     finish(attempt, {}, failure.what());
