@@ -25,7 +25,7 @@ class ConcurrentQueue final : public Executor {
       Varnel::Platform::startThread("concurrent", [this] { work(); }).detach();
       ++threads_;
     } catch (const std::system_error&) {
-      // The threads that there are will come to it.
+      // The threads that already run will get to the block.
       if (threads_ > 0) return;
       waiting_.pop_back();
       throw;
@@ -59,7 +59,7 @@ class ConcurrentQueue final : public Executor {
 
 }  // namespace
 
-// Its threads outlive main, and so does it.
+// The queue is never destroyed, because its threads outlive main.
 std::shared_ptr<Executor> globalConcurrentQueue() {
   static const auto& queue = *new std::shared_ptr<Executor>(std::make_shared<ConcurrentQueue>());
   return queue;

@@ -29,7 +29,8 @@ class VARNEL_API JSONError final : public std::runtime_error {
     message,       ///< The text or the value is refused for another reason; `what()` says why.
   };
 
-  /// The value at `path` has not the shape that `typeName` needs. The top value's path is "root".
+  /// The value at `path` does not have the shape that `typeName` needs. The top value's path is
+  /// "root".
   [[nodiscard]] static JSONError typeMismatch(std::string typeName, std::string path);
   [[nodiscard]] static JSONError missingValue(std::string typeName, std::string path);
   [[nodiscard]] static JSONError withMessage(const std::string& message);

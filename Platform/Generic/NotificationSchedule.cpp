@@ -8,7 +8,7 @@
 namespace Varnel::Platform {
 namespace {
 
-// Processes in different time zones see one date this far apart at the most.
+// Processes in different time zones see one date at most this far apart.
 constexpr std::chrono::days sameMoment(2);
 
 // The dates of one schedule by number, from the original one, 0. They ascend; a date beyond the
