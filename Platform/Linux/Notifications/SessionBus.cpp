@@ -88,8 +88,8 @@ void SessionBus::connect(Connected use) {
   if (!attempt_) start();
 }
 
-// A bus may accept the connection and then say nothing; even to ask for its address may mean to
-// start a program. The thread is left alone with that when the time is over.
+// A bus may accept the connection and then never answer; even asking for its address may start a
+// program. After the time is over, the thread finishes that by itself and nobody waits for it.
 void SessionBus::start() {
   const auto attempt = attempt_ = std::make_shared<Attempt>();
   timer_ = Timer(attach(g_timeout_source_new(static_cast<guint>(patience_.count())), [this] {
@@ -125,7 +125,7 @@ SessionBus::Connection SessionBus::open(GCancellable* cancellable, std::string& 
 
 void SessionBus::finish(std::shared_ptr<Attempt> attempt, Connection connection,
                         const std::string& error) {
-  // It was given up.
+  // The attempt was given up.
   if (attempt != attempt_) return;
   if (connection) adopt(std::move(connection));
   attempt_.reset();
@@ -134,7 +134,7 @@ void SessionBus::finish(std::shared_ptr<Attempt> attempt, Connection connection,
 }
 
 void SessionBus::adopt(Connection connection) {
-  // A signal of the lost connection may still be on its way to us.
+  // A signal of the lost connection may still arrive.
   unsubscribe();
   connection_ = std::move(connection);
   const OnMainContext here;

@@ -33,8 +33,8 @@ void nameCurrentThread(std::string_view name) {
 }
 
 void setCurrentThreadQuality(QualityOfService quality) {
-  // Here each thread has a niceness of its own. A process that was started with less urgency keeps
-  // it, and a refusal leaves the thread as it was.
+  // On this system each thread has a niceness of its own. A process that was started as less urgent
+  // stays so, and if the system refuses the thread keeps its niceness.
   const int niceness = nicenessOf(quality);
   const auto thread = static_cast<id_t>(::gettid());
   if (niceness > ::getpriority(PRIO_PROCESS, thread)) ::setpriority(PRIO_PROCESS, thread, niceness);

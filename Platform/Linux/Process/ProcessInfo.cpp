@@ -45,7 +45,7 @@ OperatingSystemVersion versionFromRelease(std::string_view release) {
   return version;
 }
 
-// The kernel marks the name of a file that was removed or replaced, as an update does, since the
+// The kernel marks the name of a file that was removed or replaced (by an update, say) since the
 // process began.
 fs::path withoutMarkOfDeletion(const fs::path& path, const fs::path& link) {
   constexpr std::string_view mark = " (deleted)";
@@ -56,8 +56,8 @@ fs::path withoutMarkOfDeletion(const fs::path& path, const fs::path& link) {
   return text;
 }
 
-// Without /proc, in a bare sandbox or early in a machine's start, the kernel has left what the
-// program was called by. A name that leads nowhere from here still tells the last component.
+// Without /proc (in a bare sandbox, or early in a machine's start) there is still the name by which
+// the program was called. Even if that leads nowhere from here, its last component is right.
 fs::path pathThatWasCalled() {
   const auto* name = reinterpret_cast<const char*>(::getauxval(AT_EXECFN));
   if (!name) return {};
@@ -73,7 +73,7 @@ fs::path findExecutable(const fs::path& root) {
   return failed ? pathThatWasCalled() : withoutMarkOfDeletion(path, link);
 }
 
-// The executable is looked up once: an update may give the running file another name.
+// The executable is looked up once, because an update may rename the running file.
 class ProcProcessInfo final : public ProcessInfo {
  public:
   explicit ProcProcessInfo(const fs::path& root) : executable_(findExecutable(root)) {}
@@ -101,9 +101,9 @@ class ProcProcessInfo final : public ProcessInfo {
     if (::dladdr(address, &image) == 0 || !image.dli_fname) return std::nullopt;
     std::error_code failed;
     fs::path path = fs::canonical(image.dli_fname, failed);
-    // The loader names the executable itself as it was called, perhaps by a relative path.
+    // The loader gives the executable's name as it was called, perhaps a relative path.
     if (failed) path = executable_;
-    // The Info.plist beside a library may be that of the application it is shipped with.
+    // The Info.plist beside a library may belong to the application that ships it.
     const auto shared = sharedFolder.empty() ? std::nullopt : findSharedFolder(path, sharedFolder);
     return asText(shared ? shared : findBundleFolder(path, nameOfImage(path)));
   }
