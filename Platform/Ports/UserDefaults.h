@@ -26,8 +26,8 @@ class VARNEL_API UserDefaults {
   [[nodiscard]] virtual std::optional<double> real(const std::string& key) const = 0;
   [[nodiscard]] virtual std::optional<std::string> text(const std::string& key) const = 0;
 
-  /// Keeps a value under a key, from now on and on disk. A disk that refuses loses it at the
-  /// process's end.
+  /// Keeps a value under a key, in memory and on disk. If the disk refuses it, the value lasts as
+  /// long as the process.
   virtual void set(const std::string& key, const Value& value) = 0;
   virtual void remove(const std::string& key) = 0;
 };

@@ -20,7 +20,7 @@ namespace Varnel::Platform::Testing {
 ///     zones.changes["Europe/Berlin"] = {{winterBegin, {1h}}, {summerBegin, {2h, true}}};
 class FakeTimeZones final : public TimeZones {
  public:
-  /// From a moment on another offset counts.
+  /// A moment from which another offset counts.
   struct Change {
     Date begin;
     TimeZone::Offset offset;

@@ -16,7 +16,7 @@ using std::chrono::milliseconds;
 using Time = std::chrono::sys_time<milliseconds>;
 using LocalTime = std::chrono::local_time<milliseconds>;
 
-// The furthest that a calculation may lead; `Date` reaches 292,000 years.
+// How far a calculation may lead; `Date` reaches 292,000 years.
 constexpr double farthestMillisecond = 9.0e15;
 
 bool isWithinReach(Date date) {
@@ -32,8 +32,8 @@ LocalTime wallClock(Time time, const TimeZone& zone) {
   return LocalTime(time.time_since_epoch() + zone.offsetAt(time).fromUTC);
 }
 
-// Of a time that comes twice the first; one that is skipped by the offset before the change, which
-// leads forward.
+// For a time that comes twice, the first one. For a time that is skipped, the offset before the
+// change applies and moves it forward.
 Time resolved(LocalTime local, const TimeZone& zone) {
   const Time utc(local.time_since_epoch());
   // No offset is as long as a day.
@@ -65,7 +65,7 @@ struct Calendar::State {
   const TimeZones& zones;
   std::string zoneIdentifier;
   std::shared_ptr<const TimeZone> zone = zones.zone(zoneIdentifier);
-  // Counts on wall clocks, and so in a zone without changes. Cloned for each calculation.
+  // Counts by wall clocks, as in a zone whose offset never changes. Cloned for each calculation.
   std::unique_ptr<icu::Calendar> prototype = nullptr;
 
   std::optional<LocalTime> addingDays(const DateComponents& components, LocalTime local,

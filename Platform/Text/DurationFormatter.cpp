@@ -43,7 +43,7 @@ Components componentsOf(seconds length) {
 std::optional<std::string> DurationFormatter::string(TimeInterval interval) const {
   constexpr auto longest =
       static_cast<double>(duration_cast<seconds>(Date::duration::max()).count());
-  // Written so that it also refuses what is not a number.
+  // Negated so that it also refuses what is not a number.
   if (!(std::abs(interval) <= longest)) return std::nullopt;
 
   std::string text;

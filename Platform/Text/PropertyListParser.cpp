@@ -72,8 +72,8 @@ PropertyData dataOf(plist_t node) {
   return data;
 }
 
-// The library tells a date in 32 bits, and its fraction without the sign. In the binary form that
-// it writes, all of it follows a header and a marker: the seconds from 2001, floating.
+// The library gives a date in 32 bits, and its fraction without a sign. The binary form that it
+// writes has the whole date behind a header and a marker: the seconds from 2001, in floating point.
 std::optional<PropertyValue> dateOf(plist_t node) {
   using namespace std::chrono;
   constexpr std::size_t position = 9;

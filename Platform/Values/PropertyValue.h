@@ -62,7 +62,7 @@ class PropertyValue final {
     return std::get_if<Type>(&storage_);
   }
 
-  /// What `visitor` answers for the value as its own type.
+  /// The answer of `visitor` for the value as its own type.
   template <typename Visitor>
   decltype(auto) visit(Visitor&& visitor) const {
     return std::visit(std::forward<Visitor>(visitor), storage_);

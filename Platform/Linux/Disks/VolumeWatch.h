@@ -32,8 +32,7 @@ class VolumeWatch final : public VolumeCatalog::Subscription {
   const VolumeCatalog::ChangeHandler handler_;
   POSIX::FileDescriptor mountInfo_;
   POSIX::FileDescriptor stop_;  ///< An event that becomes readable when the thread is to end.
-  std::shared_ptr<const VolumeTable>
-      told_;  ///< What the handler has been told. Belongs to the thread.
+  std::shared_ptr<const VolumeTable> told_;  ///< What the handler knows. Belongs to the thread.
   std::thread thread_;
 };
 

@@ -59,7 +59,7 @@ class LockedStream final {
   std::FILE* stream_;
 };
 
-// With the stream's lock held, and only for a write that does not just fill the buffer.
+// Called with the stream's lock held, and only for a write that may go beyond the buffer.
 void write(std::FILE* stream, std::string_view text, bool flushes) {
   const BrokenPipeIsNoSignal guard;
   const bool isWritten = ::fwrite_unlocked(text.data(), 1, text.size(), stream) == text.size() &&
