@@ -13,9 +13,9 @@ class FileSystem;
 class ScanObserver;
 struct ScanControl;
 
-/// Finds the files of equal content in some folders. Files are told apart by ever dearer means:
-/// their size, the digest of their beginning, the digest of everything; what is left is compared
-/// byte by byte, so that the result holds true duplicates only.
+/// Finds the files of equal content in some folders. Files are told apart by their size, then by a
+/// digest of their beginning, then by a digest of everything. Files that still agree are compared
+/// byte by byte, so the result holds true duplicates only.
 ///
 ///     DuplicateFinder finder({systemFileSystem(), access, observer}, 4);
 ///     ScanResult result = finder.find({"/home/u/Pictures"}, control);

@@ -29,7 +29,7 @@ bool isOnThisMachine(const URL& url) {
   return url.hasHost("127.0.0.1") || url.hasHost("localhost") || url.hasHost("[::1]");
 }
 
-// The holder would find each of them for itself, and the download twice.
+// Found here together. The holder would find each by itself, and the download twice.
 void identifyUser() {
   using Holder = Varnel::CustomDimensionsHolder;
   const auto user =

@@ -19,8 +19,8 @@ namespace Varnel {
 ///     const Bundle bundle = Bundle::main();
 ///     bundle.localizedString("Varnel_Quit");  // "Beenden", or the key where there is no text
 ///
-/// A cheap value; copies share what has been read. Files are read on first use and kept. What is
-/// missing or damaged counts as absent. Any thread.
+/// A cheap value; copies share what has been read. Files are read on first use and kept. A missing
+/// or damaged file counts as absent. Any thread.
 class VARNEL_API Bundle final {
  public:
   /// The bundle in this folder, for a user who prefers these languages (BCP 47, best first).

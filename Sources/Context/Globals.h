@@ -53,12 +53,12 @@ class VARNEL_API Globals final {
   [[nodiscard]] static bool canUseAllCores();
   /// Whether the product has been launched: strictly after 2016-05-09 00:00 UTC.
   [[nodiscard]] static bool isTimeHasCome();
-  /// Computed anew each time: debug mode shows everything, a private beta nothing, and else the
+  /// Computed anew each time. Debug mode shows everything, a private beta nothing; otherwise the
   /// launch date decides.
   [[nodiscard]] static bool isEndUserFeaturesEnabled();
 
   /// The folder that stands in for the trash, made on first use. It bears the temporary resource
-  /// value `OVURLIsBookmarkedKey` (see ProcessFacts.h). That it could not be made is not told.
+  /// value `OVURLIsBookmarkedKey` (see ProcessFacts.h). A failure to make it is not reported.
   [[nodiscard]] static const Platform::URL& fakeTrashURL();
 
   /// `baseIdentifier()` and the suffix joined. An empty suffix is a programming error and stops the

@@ -20,8 +20,8 @@ namespace Varnel {
 ///     Edit edit("main-menu.edit");
 ///     edit.undo();  // "main-menu.edit.undo"
 ///
-/// Any thread once made. Neither copied nor moved: items belong to their group. Compiled into
-/// whoever uses it.
+/// Any thread once made. Neither copied nor moved: items belong to their group. Compiled into each
+/// program that uses it.
 class MenuItemGroup {
  public:
   /// An item of a menu. Called, it gives its identifier; empty if the group's base is.

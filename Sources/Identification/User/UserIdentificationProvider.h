@@ -8,8 +8,8 @@
 
 namespace Varnel {
 
-/// Where the facts come from that tell one installation from another. A fact that the machine does
-/// not give is absent; `userIdentifier()` alone always has a text. Threads as the implementation's.
+/// Supplies the facts that tell one installation from another. A fact that the machine does not
+/// give is absent; `userIdentifier()` alone always has a text. Threads as the implementation's.
 class VARNEL_API UserIdentificationProvider {
  public:
   virtual ~UserIdentificationProvider() = default;
