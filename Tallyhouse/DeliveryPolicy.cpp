@@ -38,7 +38,7 @@ std::optional<Date> DeliveryPolicy::nextSending(const Backlog& backlog,
   if (backlog.hasRefused || backlog.waiting >= static_cast<std::int64_t>(batchEvents))
     next = now;
   else if (backlog.oldest)
-    // An event of the future was dated before the clock was set back: it has lingered.
+    // An event with a future date was made before the clock was set back: it has lingered enough.
     next = *backlog.oldest > now ? now : *backlog.oldest + linger;
   if (!next || !notBefore) return next;
   const Duration longest = std::max(longestRetry, longestRetryAfter);

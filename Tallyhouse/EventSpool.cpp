@@ -85,8 +85,9 @@ void EventSpool::open() {
 std::optional<PlatformError> EventSpool::tryToOpen() {
   std::error_code ignored;
   fs::create_directories(fs::path(path_).parent_path(), ignored);
-  // The library would let others read; its further files take over the rights of this one. A file
-  // that is there is not opened: closing it would give up the locks that this process has on it.
+  // The library would create the file readable for others; its temporary files take over the rights
+  // of this one. A file that exists is not opened here: closing it would release this process's
+  // locks on it.
   if (!fs::exists(path_, ignored)) {
     if (auto file = ports_.appendFiles.open(path_); !file) return PlatformError(file.error());
   }
@@ -144,7 +145,7 @@ void EventSpool::putAside() {
 std::int64_t EventSpool::append(std::string_view uuid, Date date, std::string_view hit) {
   const std::lock_guard lock(mutex_);
   const auto size = static_cast<std::int64_t>(hit.size());
-  // It may have been locked. Ever more rarely, as opening takes its time.
+  // The file may have been locked, so opening is tried again. Ever more rarely, because it is slow.
   if (!insert_ && std::has_single_bit(static_cast<std::uint64_t>(unsavedDropped_) + 1)) open();
   if (!insert_ || !isCleared()) {
     drop(1);
@@ -230,7 +231,7 @@ void EventSpool::moveToRefused(std::span<const SpooledEvent> events) {
 }
 
 bool EventSpool::copyToRefused(std::span<const SpooledEvent> events) {
-  // Copied from the line: what has been cleared meanwhile must not come back.
+  // Copied from the table of waiting events: events that were cleared meanwhile must not come back.
   auto copy = prepare(
       "INSERT INTO refused(uuid, date, hit, times)"
       " SELECT uuid, date, hit, 1 FROM waiting WHERE id = ? AND uuid = ?");
@@ -315,7 +316,7 @@ void EventSpool::makeRoom(std::int64_t bytes) {
   recount();
   const std::int64_t atOnce = std::max<std::int64_t>(limits_.events / 100, 1);
   while (isFull() && waitingEvents_ + refusedEvents_ > 0) {
-    // A refused event is older than what still waits, but for a few.
+    // With few exceptions, a refused event is older than all that still wait.
     const std::int64_t removed =
         refusedEvents_ > 0 ? removeOldest("refused", atOnce) : removeOldest("waiting", atOnce);
     if (removed == 0) return;
@@ -338,7 +339,7 @@ void EventSpool::drop(std::int64_t count) {
 }
 
 bool EventSpool::removeEach(std::string_view table, std::span<const SpooledEvent> events) {
-  // The number alone may have passed to another event since.
+  // The row's number alone may belong to another event by now.
   auto removal = prepare(fmt::format("DELETE FROM {} WHERE id = ? AND uuid = ?", table));
   if (!removal) return false;
   std::int64_t& counter = table == "waiting" ? waitingEvents_ : refusedEvents_;

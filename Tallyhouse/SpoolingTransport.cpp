@@ -27,7 +27,7 @@ std::function<double()> randomNumbers() {
   };
 }
 
-// While the thread cannot deliver, it still moves what was appended into the file now and then.
+// While the thread cannot deliver, it still moves appended events into the file now and then.
 constexpr std::int64_t appendsUntilCheckpoint = 1000;
 
 }  // namespace
@@ -70,7 +70,7 @@ SpoolingTransport::~SpoolingTransport() = default;
 void SpoolingTransport::start() noexcept try {
   parts_->worker.resume();
 } catch (const std::exception&) {
-  // The system has no thread left for us. The events stay in the spool for a better time.
+  // The system grants no thread. The events stay in the spool for a later start.
 }
 
 void SpoolingTransport::accept(const AnalyticsEvent& event) noexcept try {
@@ -80,11 +80,11 @@ void SpoolingTransport::accept(const AnalyticsEvent& event) noexcept try {
     return;
   }
   const std::int64_t waiting = parts_->spool.append(event.uuid, event.date, hit);
-  // In between the thread sleeps on: it will send these with the others.
+  // In between the thread sleeps on, and will send these events with the others.
   if (waiting == 1 || waiting == parts_->batchEvents || waiting % appendsUntilCheckpoint == 0)
     parts_->worker.wake();
 } catch (const std::exception&) {
-  // Out of memory: an event less, but an application that goes on.
+  // Out of memory. The event is lost and the application goes on.
 }
 
 void SpoolingTransport::discardAll() noexcept try {

@@ -27,12 +27,12 @@ std::string_view numberIn(std::string_view text) {
   return text;
 }
 
-// The parser reports what is too close to zero as it does what is too large.
+// The parser reports numbers too close to zero as it reports numbers too large.
 bool isTiny(std::string_view number) {
   return number.find("e-") != number.npos || number.find("E-") != number.npos;
 }
 
-// What does not fit becomes the largest or the smallest.
+// A number that does not fit becomes the largest or the smallest.
 template <typename Number>
 Number parse(std::string_view text, Number largest, Number smallest) {
   const std::string_view digits = numberIn(text);
