@@ -17,7 +17,7 @@ class ConcurrentQueue final : public Executor {
   void execute(Block block) override {
     const std::lock_guard lock(mutex_);
     waiting_.push_back(std::move(block));
-    if (idle_ >= waiting_.size() || threads_ == maximum) {
+    if (idle_ >= waiting_.size() || threads_ == maxThreads) {
       arrived_.notify_one();
       return;
     }
@@ -33,7 +33,7 @@ class ConcurrentQueue final : public Executor {
   }
 
  private:
-  static constexpr std::size_t maximum = 64;
+  static constexpr std::size_t maxThreads = 64;
 
   void work() {
     std::unique_lock lock(mutex_);

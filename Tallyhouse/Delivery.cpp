@@ -38,16 +38,15 @@ std::optional<Date> Delivery::step(Haste haste, std::stop_token stop) {
   const auto nextSending = [&] {
     DeliveryPolicy policy = policy_;
     if (haste == Haste::none) policy.linger = {};
-    return policy.nextSending(spool_.backlog(policy.triesOfRefused), notBefore_,
-                              ports_.clock.now());
+    return policy.nextSending(spool_.backlog(policy.maxRefusals), notBefore_, ports_.clock.now());
   };
   const auto next = nextSending();
   if (!next || *next > ports_.clock.now() || stop.stop_requested()) return next;
   // Fresh events first, so that refused ones do not hold them up.
-  if (const auto waiting = spool_.waiting(policy_.batchEvents, policy_.batchBytes);
+  if (const auto waiting = spool_.waiting(policy_.maxBatchEvents, policy_.maxBatchBytes);
       !waiting.empty())
     send(waiting, false, stop);
-  else if (const auto refused = spool_.refused(policy_.triesOfRefused))
+  else if (const auto refused = spool_.refused(policy_.maxRefusals))
     send({&*refused, 1}, true, stop);
   else if (nextSending())
     backOff({});  // The events cannot be read.

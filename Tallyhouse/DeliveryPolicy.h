@@ -32,11 +32,11 @@ struct VARNEL_API DeliveryPolicy final {
 
   Duration linger = std::chrono::seconds(5);  ///< For how long an event waits for company.
   Duration firstRetry = std::chrono::seconds(5);
-  Duration longestRetry = std::chrono::hours(1);
-  Duration longestRetryAfter = std::chrono::hours(24);  ///< The longest pause that is granted.
-  int triesOfRefused = 3;  ///< After this many refusals an event is set aside.
-  std::size_t batchEvents = 20;
-  std::size_t batchBytes = 15'000;
+  Duration maxRetryDelay = std::chrono::hours(1);
+  Duration maxRetryAfter = std::chrono::hours(24);  ///< The longest pause that is granted.
+  int maxRefusals = 3;  ///< After this many refusals an event is set aside.
+  std::size_t maxBatchEvents = 20;
+  std::size_t maxBatchBytes = 15'000;
 
   /// What an HTTP status means; no status means that there was no answer.
   [[nodiscard]] static Verdict verdict(std::optional<int> status);

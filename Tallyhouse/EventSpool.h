@@ -22,8 +22,8 @@ namespace Tallyhouse {
 
 /// How much may wait. A further event pushes out the oldest.
 struct SpoolLimits final {
-  std::int64_t events = 10'000;
-  std::int64_t bytes = 8 << 20;  ///< Of the events' texts.
+  std::int64_t maxEvents = 10'000;
+  std::int64_t maxBytes = 8 << 20;  ///< Of the events' texts.
 };
 
 /// An event in the spool.
@@ -59,14 +59,14 @@ class EventSpool final {
   /// Puts an event at the end of the line and returns how many events wait now.
   std::int64_t append(std::string_view uuid, Varnel::Platform::Date date, std::string_view hit);
 
-  /// The waiting events. An event refused `triesOfRefused` times does not count.
-  [[nodiscard]] Backlog backlog(int triesOfRefused);
+  /// The waiting events. An event refused `maxRefusals` times does not count.
+  [[nodiscard]] Backlog backlog(int maxRefusals);
 
   /// The head of the line: at most this many events, and at most this many bytes unless the first
   /// event alone is larger.
-  [[nodiscard]] std::vector<SpooledEvent> waiting(std::size_t events, std::size_t bytes);
-  /// The oldest event that was refused less than `triesOfRefused` times.
-  [[nodiscard]] std::optional<SpooledEvent> refused(int triesOfRefused);
+  [[nodiscard]] std::vector<SpooledEvent> waiting(std::size_t maxEvents, std::size_t maxBytes);
+  /// The oldest event that was refused less than `maxRefusals` times.
+  [[nodiscard]] std::optional<SpooledEvent> refused(int maxRefusals);
 
   /// Removes the events. Returns whether they are gone.
   [[nodiscard]] bool removeWaiting(std::span<const SpooledEvent> events);

@@ -26,6 +26,6 @@ void appendToBatch(std::string& batch, std::string_view hit, std::chrono::millis
                    std::string_view uuid);
 
 /// The largest hit that servers accept, less the room for what `appendToBatch` adds.
-inline constexpr std::size_t longestHit = 8192 - 96;
+inline constexpr std::size_t maxHitBytes = 8192 - 96;
 
 }  // namespace Tallyhouse

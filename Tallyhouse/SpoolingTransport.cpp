@@ -35,9 +35,9 @@ constexpr std::int64_t appendsUntilCheckpoint = 1000;
 struct SpoolingTransport::Parts {
   Parts(Ports ports, Configuration configuration)
       : identity{std::move(configuration.trackingID), std::move(configuration.clientID)},
-        batchEvents(static_cast<std::int64_t>(configuration.policy.batchEvents)),
+        maxBatchEvents(static_cast<std::int64_t>(configuration.policy.maxBatchEvents)),
         spool({ports.appendFiles, ports.systemLog}, std::move(configuration.spoolPath),
-              {.events = configuration.mostEvents, .bytes = configuration.mostBytes}),
+              {.maxEvents = configuration.maxEvents, .maxBytes = configuration.maxBytes}),
         worker(ports.clock, spool,
                Delivery({ports.clock, ports.httpClient}, spool,
                         {.url = configuration.endpoint.absoluteString(),
@@ -45,7 +45,7 @@ struct SpoolingTransport::Parts {
                         configuration.policy, randomNumbers())) {}
 
   const AnalyticsIdentity identity;
-  const std::int64_t batchEvents;
+  const std::int64_t maxBatchEvents;
   EventSpool spool;
   DeliveryWorker worker;
 };
@@ -75,13 +75,13 @@ void SpoolingTransport::start() noexcept try {
 
 void SpoolingTransport::accept(const AnalyticsEvent& event) noexcept try {
   const std::string hit = encodedHit(event, parts_->identity);
-  if (hit.size() > longestHit) {
+  if (hit.size() > maxHitBytes) {
     parts_->spool.countDropped();
     return;
   }
   const std::int64_t waiting = parts_->spool.append(event.uuid, event.date, hit);
   // In between the thread sleeps on, and will send these events with the others.
-  if (waiting == 1 || waiting == parts_->batchEvents || waiting % appendsUntilCheckpoint == 0)
+  if (waiting == 1 || waiting == parts_->maxBatchEvents || waiting % appendsUntilCheckpoint == 0)
     parts_->worker.wake();
 } catch (const std::exception&) {
   // Out of memory. The event is lost and the application goes on.

@@ -49,8 +49,8 @@ class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
     std::string clientID;    ///< The installation that sends them.
     std::string spoolPath;   ///< The user's alone. Missing folders are made.
     PlainHTTP plainHTTP = PlainHTTP::refused;
-    std::int64_t mostEvents = 10'000;  ///< How many may wait; then the oldest is dropped.
-    std::int64_t mostBytes = 8 << 20;
+    std::int64_t maxEvents = 10'000;  ///< How many may wait; then the oldest is dropped.
+    std::int64_t maxBytes = 8 << 20;
     DeliveryPolicy policy = {};
   };
 

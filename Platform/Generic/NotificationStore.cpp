@@ -16,7 +16,7 @@ namespace {
 using Failure = std::optional<PlatformError>;
 
 // The delivered list keeps the latest notifications, because nobody has to remove any.
-constexpr int deliveredLimit = 100;
+constexpr int maxDelivered = 100;
 
 std::string schema() {
   constexpr const char* content =
@@ -112,7 +112,7 @@ Failure insertDelivered(SQLiteDatabase& database, DeliveredNotification& deliver
   return run(database,
              "DELETE FROM delivered WHERE key NOT IN "
              "(SELECT key FROM delivered ORDER BY delivered DESC, rowid DESC LIMIT ?)",
-             [](SQLiteStatement& statement) { statement.bind(1, std::int64_t{deliveredLimit}); });
+             [](SQLiteStatement& statement) { statement.bind(1, std::int64_t{maxDelivered}); });
 }
 
 bool anythingChanges(const NotificationSchedule& schedule, Date now, const Calendar& calendar) {

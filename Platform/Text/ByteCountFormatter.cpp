@@ -11,7 +11,7 @@ namespace {
 
 struct Unit {
   std::string_view name;
-  int maximumDecimals;
+  int maxDecimals;
 };
 
 constexpr std::array units{Unit{"KB", 0}, Unit{"MB", 1}, Unit{"GB", 2},
@@ -94,16 +94,16 @@ std::string ByteCountFormatter::string(std::int64_t count, ByteCountStyle style)
 
   std::uint64_t unitSize = step;
   auto unit = units.begin();
-  Rounded value = divide(bytes, unitSize, unit->maximumDecimals);
+  Rounded value = divide(bytes, unitSize, unit->maxDecimals);
   // A number that rounds up to a full step is shown in the next unit.
   while (value.whole >= step) {
     unitSize *= step;
     ++unit;
-    value = divide(bytes, unitSize, unit->maximumDecimals);
+    value = divide(bytes, unitSize, unit->maxDecimals);
   }
   text += wholeText(value.whole);
   if (value.fraction != 0)
-    text.append(decimalSeparator_).append(decimalText(value.fraction, unit->maximumDecimals));
+    text.append(decimalSeparator_).append(decimalText(value.fraction, unit->maxDecimals));
   return text.append(" ").append(unit->name);
 }
 

@@ -17,11 +17,11 @@ using Time = std::chrono::sys_time<milliseconds>;
 using LocalTime = std::chrono::local_time<milliseconds>;
 
 // How far a calculation may lead; `Date` reaches 292,000 years.
-constexpr double farthestMillisecond = 9.0e15;
+constexpr double maxMilliseconds = 9.0e15;
 
 bool isWithinReach(Date date) {
-  constexpr Date::duration farthest = milliseconds(static_cast<std::int64_t>(farthestMillisecond));
-  return date.time_since_epoch() <= farthest && date.time_since_epoch() >= -farthest;
+  constexpr Date::duration maxDuration = milliseconds(static_cast<std::int64_t>(maxMilliseconds));
+  return date.time_since_epoch() <= maxDuration && date.time_since_epoch() >= -maxDuration;
 }
 
 UDate icuDate(milliseconds time) {
@@ -84,7 +84,7 @@ struct Calendar::State {
         !add(UCAL_DATE, components.day))
       return std::nullopt;
     const UDate sum = calendar->getTime(status);
-    if (U_FAILURE(status) || !(std::abs(sum) <= farthestMillisecond)) return std::nullopt;
+    if (U_FAILURE(status) || !(std::abs(sum) <= maxMilliseconds)) return std::nullopt;
     return LocalTime(milliseconds(static_cast<std::int64_t>(sum)));
   }
 };
@@ -128,7 +128,7 @@ std::optional<Date> Calendar::adding(const DateComponents& components, Date date
       !add(components.minute, std::chrono::minutes(1)) ||
       !add(components.second, std::chrono::seconds(1)))
     return std::nullopt;
-  if (!(std::abs(icuDate(time.time_since_epoch())) <= farthestMillisecond)) return std::nullopt;
+  if (!(std::abs(icuDate(time.time_since_epoch())) <= maxMilliseconds)) return std::nullopt;
   return time + rest;
 }
 

@@ -80,8 +80,8 @@ class SystemZone final : public icu::SimpleTimeZone {
 
   Platform::TimeZone::Offset offsetAt(UDate date) const {
     // `Date` ends somewhat later, but not at a number that floating point represents.
-    constexpr UDate farthest = 9.2e15;
-    const UDate near = std::clamp(date, -farthest, farthest);
+    constexpr UDate maxDate = 9.2e15;
+    const UDate near = std::clamp(date, -maxDate, maxDate);
     return zone_->offsetAt(Date(milliseconds(static_cast<std::int64_t>(near))));
   }
 

@@ -13,7 +13,7 @@
 namespace Varnel::Platform {
 namespace {
 
-constexpr std::size_t maximumDepth = 512;
+constexpr std::size_t maxDepth = 512;
 
 /// What a parse may cost, one unit being about a byte of memory or ten nanoseconds.
 class Budget final {
@@ -100,7 +100,7 @@ class XMLGuard final {
     if (name == "date") return isValue(tag, name, isDate);
     if (!tag.starts_with("<dict") && !tag.starts_with("<array")) return true;
     if (!tag.ends_with("/>")) keyCounts_.push_back(0);
-    return keyCounts_.size() <= maximumDepth;
+    return keyCounts_.size() <= maxDepth;
   }
 
   [[nodiscard]] bool close(std::string_view tag) {
@@ -180,7 +180,7 @@ class BinaryGuard final {
   }
 
   [[nodiscard]] bool visit(std::uint64_t index, std::size_t depth) {
-    if (index >= objectCount_ || depth > maximumDepth || !budget_.spendNode()) return false;
+    if (index >= objectCount_ || depth > maxDepth || !budget_.spendNode()) return false;
     std::size_t position = number(table_ + index * offsetSize_, offsetSize_);
     if (position >= table_) return false;
     const std::uint64_t marker = number(position++, 1);

@@ -56,8 +56,8 @@ bool isHostName(std::string_view host) {
 }
 
 bool isPort(std::string_view port) {
-  constexpr std::size_t mostDigits = 5;
-  if (port.size() > mostDigits || !std::all_of(port.begin(), port.end(), isDigit)) return false;
+  constexpr std::size_t maxDigits = 5;
+  if (port.size() > maxDigits || !std::all_of(port.begin(), port.end(), isDigit)) return false;
   int number = 0;
   for (const char c : port) number = number * 10 + (c - '0');
   return number <= 65535;

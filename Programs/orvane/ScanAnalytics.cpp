@@ -17,7 +17,7 @@ namespace {
 using Tallyhouse::SpoolingTransport;
 using Varnel::Platform::URL;
 
-constexpr auto longestGoodbye = std::chrono::seconds(2);
+constexpr auto maxGoodbye = std::chrono::seconds(2);
 
 class ScanSender final : public Varnel::CommonAnalyticsSender {
  public:
@@ -68,8 +68,7 @@ ScanAnalytics::ScanAnalytics(const std::optional<std::string>& endpoint, bool pr
 }
 
 ScanAnalytics::~ScanAnalytics() {
-  if (transport_ && !transport_->drain(longestGoodbye))
-    sender_->log("Events wait for the next run");
+  if (transport_ && !transport_->drain(maxGoodbye)) sender_->log("Events wait for the next run");
 }
 
 void ScanAnalytics::scanStarted(std::size_t folders) {

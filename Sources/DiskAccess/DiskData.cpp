@@ -31,7 +31,7 @@ DiskData::DiskData(std::shared_ptr<const OVDiskInfo> diskInfo, bool isBackground
                    std::shared_ptr<Basalt::SerialQueue> queue)
     : queue_(std::move(queue)),
       diskInfo_(std::move(diskInfo)),
-      limit_(diskInfo_->maxTreads()),
+      maxThreads_(diskInfo_->maxTreads()),
       isBackgroundMode_(isBackgroundMode) {}
 
 std::shared_ptr<DiskData::AccessRequest> DiskData::requestAccess(Basalt::ThreadID thread,

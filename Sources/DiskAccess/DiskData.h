@@ -90,12 +90,13 @@ class VARNEL_API DiskData final : public std::enable_shared_from_this<DiskData> 
 
  private:
   [[nodiscard]] bool hasFreePlace() const {
-    return static_cast<std::int64_t>(accessingThreads_.count()) < (isBackgroundMode_ ? 1 : limit_);
+    return static_cast<std::int64_t>(accessingThreads_.count()) <
+           (isBackgroundMode_ ? 1 : maxThreads_);
   }
 
   const std::shared_ptr<Basalt::SerialQueue> queue_;
   const std::shared_ptr<const OVDiskInfo> diskInfo_;
-  const std::int64_t limit_;  ///< Outside background mode.
+  const std::int64_t maxThreads_;  ///< Outside background mode.
   bool isBackgroundMode_;
   Requests requests_;  ///< The line, by class and within a class in the order of coming.
   Basalt::Bag<Basalt::ThreadID> accessingThreads_;

@@ -8,7 +8,7 @@ namespace Varnel::Platform::Linux {
 namespace {
 
 // More layers than any machine has. A table that runs in circles ends here.
-constexpr int mostLayers = 16;
+constexpr int maxLayers = 16;
 
 // The device that carries a disk: "…/virtio1" of "…/virtio1/block/vda", "…/nvme0" of
 // "…/nvme0/nvme0n1".
@@ -108,7 +108,7 @@ std::string BlockDevices::virtioSerial(const std::string& name, std::string_view
 }
 
 std::optional<bool> BlockDevices::areInternal(const std::vector<std::string>& names) const {
-  return areInternal(names, mostLayers);
+  return areInternal(names, maxLayers);
 }
 
 std::optional<bool> BlockDevices::areInternal(const std::vector<std::string>& names,

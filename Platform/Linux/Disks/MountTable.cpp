@@ -22,7 +22,7 @@ namespace Varnel::Platform::Linux {
 namespace {
 
 constexpr std::size_t leastRoom = 8192;
-constexpr int mostAttempts = 4;
+constexpr int maxAttempts = 4;
 
 // Finds the block devices below mounts.
 class DeviceNames final {
@@ -151,7 +151,7 @@ std::shared_ptr<const VolumeTable> MountTable::current() {
   if (!file_) return nullptr;
   // The kernel tells of each change only once, so the thread that hears of it must read. The table
   // comes in pieces, which may not fit together if it changes in between.
-  for (int attempt = 0; attempt < mostAttempts; ++attempt) {
+  for (int attempt = 0; attempt < maxAttempts; ++attempt) {
     if (hasChanged()) isStale_ = true;
     if (!isStale_) break;
     if (!readWhole(file_, buffer_)) break;

@@ -10,7 +10,7 @@
 namespace Varnel::Platform {
 namespace {
 
-constexpr std::size_t longestName = 15;
+constexpr std::size_t maxNameLength = 15;
 
 int nicenessOf(QualityOfService quality) {
   switch (quality) {
@@ -29,7 +29,7 @@ int nicenessOf(QualityOfService quality) {
 }  // namespace
 
 void nameCurrentThread(std::string_view name) {
-  ::pthread_setname_np(::pthread_self(), std::string(name.substr(0, longestName)).c_str());
+  ::pthread_setname_np(::pthread_self(), std::string(name.substr(0, maxNameLength)).c_str());
 }
 
 void setCurrentThreadQuality(QualityOfService quality) {

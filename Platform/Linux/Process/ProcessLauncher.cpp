@@ -41,11 +41,11 @@ std::optional<Pipe> makePipe() {
 }
 
 void enlarge(const FileDescriptor& pipe) {
-  constexpr int usualLimit = 1 << 20;
-  int limit = 0;
-  if (!(std::ifstream("/proc/sys/fs/pipe-max-size") >> limit)) limit = usualLimit;
+  constexpr int usualMaxSize = 1 << 20;
+  int maxSize = 0;
+  if (!(std::ifstream("/proc/sys/fs/pipe-max-size") >> maxSize)) maxSize = usualMaxSize;
   // A user who has many large pipes may be refused; the pipe then keeps its size.
-  ::fcntl(pipe.get(), F_SETPIPE_SZ, limit);
+  ::fcntl(pipe.get(), F_SETPIPE_SZ, maxSize);
 }
 
 // What the child does between its birth and the program's start.
