@@ -38,7 +38,7 @@ class SerialQueueLine final {
     entries_.insert(place == Place::front ? entries_.begin() : entries_.end(), std::move(entry));
   }
 
-  /// Of a line that is not empty, as `pop`.
+  /// The line must not be empty, as for `pop`.
   [[nodiscard]] const Entry& front() const { return entries_.front(); }
   Entry pop() {
     Entry entry = std::move(entries_.front());

@@ -47,7 +47,7 @@ class DeliveryWorker final {
   enum class State { working, idle, blocked };
 
   void run();
-  // With the lock held before and after.
+  // Called with the lock held, which is held again on return.
   std::optional<Varnel::Platform::Date> step(std::unique_lock<std::mutex>& lock);
   void waitForNext(std::unique_lock<std::mutex>& lock, std::optional<Varnel::Platform::Date> next);
 

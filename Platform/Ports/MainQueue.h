@@ -9,7 +9,7 @@
 
 namespace Varnel::Platform {
 
-/// The queue of the main thread. Whatever touches notifications or sounds runs here.
+/// The queue of the main thread. All code that uses notifications or sounds runs here.
 ///
 ///     mainQueue.post([this] { reload(); });  // from any thread
 ///

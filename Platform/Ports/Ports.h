@@ -29,7 +29,7 @@ class UserNotificationCenters;
 class VolumeCatalog;
 class Workspace;
 
-/// One service of each kind. The objects behind the references outlive whoever uses them; those of
+/// One service of each kind. The objects behind the references outlive all their users; those of
 /// the process are never destroyed.
 ///
 ///     static auto& clock = *new MyClock();  // a host's own service among the system's

@@ -20,7 +20,7 @@ class VARNEL_API UserDefaults {
 
   virtual ~UserDefaults() = default;
 
-  /// The value under a key; absent when there is none, or none that reads as this type.
+  /// The value under a key; absent when there is none, or when it cannot be read as this type.
   [[nodiscard]] virtual std::optional<bool> truthValue(const std::string& key) const = 0;
   [[nodiscard]] virtual std::optional<std::int64_t> integer(const std::string& key) const = 0;
   [[nodiscard]] virtual std::optional<double> real(const std::string& key) const = 0;

@@ -27,7 +27,8 @@ class FakeTimeZones final : public TimeZones {
   };
 
   std::string local = "UTC";
-  /// Of each zone, in the order of time. Before the first one, and in other zones, it is UTC.
+  /// The changes of each zone, in the order of time. Before the first one, and in other zones, the
+  /// clocks show UTC.
   std::map<std::string, std::vector<Change>> changes;
 
   [[nodiscard]] std::string localIdentifier() const override { return local; }

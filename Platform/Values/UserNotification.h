@@ -25,7 +25,7 @@ struct UserNotification final {
   std::optional<std::string> actionButtonTitle = std::nullopt;
   std::optional<std::string> otherButtonTitle = std::nullopt;
 
-  /// When to deliver it; at once when absent or past. Of a scheduled notification that repeats it
+  /// When to deliver it; at once when absent or past. For a scheduled notification that repeats, it
   /// is the next date.
   std::optional<Date> deliveryDate = std::nullopt;
   /// How often to deliver it again. Must be positive; otherwise the notification does not repeat.

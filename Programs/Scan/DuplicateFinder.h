@@ -20,7 +20,7 @@ struct ScanControl;
 ///     DuplicateFinder finder({systemFileSystem(), access, observer}, 4);
 ///     ScanResult result = finder.find({"/home/u/Pictures"}, control);
 ///
-/// The hard links of one file are one file, known by the first of its paths; symbolic links and
+/// All hard links of a file count as one file, known by the first of its paths; symbolic links and
 /// empty files have no part. A file that cannot be read, is gone or changes meanwhile is left out,
 /// counted and reported to the observer. The same files give the same result in the same order,
 /// however many threads read them. One call at a time; the finder keeps nothing from one to the

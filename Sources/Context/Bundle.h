@@ -24,7 +24,7 @@ namespace Varnel {
 class VARNEL_API Bundle final {
  public:
   /// The bundle in this folder, for a user who prefers these languages (BCP 47, best first).
-  /// Without a folder the bundle has nothing in it.
+  /// Without a folder the bundle is empty.
   Bundle(std::optional<std::string> folder, std::vector<std::string> languages);
 
   /// The running application's bundle.

@@ -65,7 +65,7 @@ class VARNEL_API Globals final {
   /// process.
   [[nodiscard]] static std::string identifier(std::string_view suffix);
 
-  /// The text with this build's name wherever the product's default name, "Orvane 2", stands.
+  /// The text with this build's name in every place of the product's default name, "Orvane 2".
   [[nodiscard]] static std::string substitutingApplicationName(std::string_view text);
   /// The same for texts in HTML, where the default name is "Orvane&nbsp;2".
   [[nodiscard]] static std::string substitutingHtmlApplicationName(std::string_view text);

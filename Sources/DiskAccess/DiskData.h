@@ -21,7 +21,8 @@ namespace Varnel {
 
 class OVDiskInfo;
 
-/// The record of one disk: who accesses it and who waits to. `DiskAccessManager` keeps one a disk.
+/// The record of one disk: the threads that access it and those that wait. `DiskAccessManager`
+/// keeps one for each disk.
 ///
 /// Held by `std::shared_ptr`. Its queue owns its state: unless said otherwise, operations run on
 /// the queue.

@@ -10,8 +10,8 @@
 
 namespace Varnel {
 
-/// One menu of the main menu: a base identifier, and items whose identifiers extend it. A group is
-/// written down by deriving from it, one member an item:
+/// One menu of the main menu: a base identifier, and items whose identifiers extend it. To write a
+/// group down, derive from this and give each item a member:
 ///
 ///     struct Edit final : MenuItemGroup {
 ///       using MenuItemGroup::MenuItemGroup;

@@ -18,7 +18,7 @@ class VARNEL_API UserIdentificationProvider {
   [[nodiscard]] virtual std::optional<std::string> serialNumber() const = 0;
   /// Stable for one user of one machine.
   [[nodiscard]] virtual std::string userIdentifier() const = 0;
-  /// Of the primary network interface, as in "00:1b:63:84:45:e6".
+  /// The address of the primary network interface, as in "00:1b:63:84:45:e6".
   [[nodiscard]] virtual std::optional<std::string> primaryMacAddress() const = 0;
   /// The "cid" item of the download's URL.
   [[nodiscard]] virtual std::optional<std::string> downloadSourceURLCid() const = 0;
