@@ -37,7 +37,7 @@ class PropertyValue final {
 
   /// Null, which is a value too; what is not there at all is an absent `PropertyValue`.
   PropertyValue(std::nullptr_t) : storage_(nullptr) {}
-  /// Truth values alone: no pointer and no number turns into one.
+  /// Truth values only: no pointer and no number is converted.
   template <std::same_as<bool> Truth>
   PropertyValue(Truth value) : storage_(value) {}
   /// Any whole number that 64 bits with a sign hold.

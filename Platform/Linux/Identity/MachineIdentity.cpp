@@ -36,7 +36,7 @@ bool isMachineID(const std::string& text) {
          !isOneCharacterRepeated(text);
 }
 
-// What makers of boards leave in place of an identity.
+// Placeholders that makers of boards leave in place of an identity.
 bool isPlaceholder(const std::string& text) {
   constexpr std::array<std::string_view, 21> placeholders = {
       "to be filled by o.e.m.",
@@ -99,8 +99,8 @@ class MachineFiles final : public MachineIdentity {
     return trimmed(*bytes);
   }
 
-  // The identifier must not depend on who may read what: everybody may read the machine's own, root
-  // alone the board's, which therefore serves only where there is no other.
+  // The identifier must not depend on who reads it. Everybody may read the machine's own, but only
+  // root may read the board's: so the board's serves only where there is no other.
   std::optional<PropertyValue> uuid() const {
     for (const char* file : {"etc/machine-id", "var/lib/dbus/machine-id"}) {
       auto id = read(file);

@@ -27,9 +27,9 @@ std::int64_t secondsOf(Date date) {
   return std::chrono::floor<std::chrono::seconds>(date).time_since_epoch().count();
 }
 
-// GLib reads two rules otherwise than the C library does: days of the year that do not count the
-// leap day ("J60"), which no zone has, and from 2038 on a winter that is the exception, which
-// Dublin has.
+// GLib reads two kinds of rules differently from the C library: days of the year without the leap
+// day ("J60"), which no zone uses, and, from 2038 on, zones whose winter time is the exception, as
+// in Dublin.
 class GLibTimeZone final : public TimeZone {
  public:
   explicit GLibTimeZone(ZoneHandle zone) : zone_(std::move(zone)) {}
@@ -74,8 +74,8 @@ std::optional<std::string> contentOf(const fs::path& file) {
   return std::move(content).str();
 }
 
-// Null for what names no zone. Names stand below the system's folder of zones; a path may lead to
-// a zone of the user's own.
+// Null for a text that names no zone. Names are looked up in the system's folder of zones; a path
+// may lead to the user's own zone file.
 ZoneHandle loadZone(const std::string& identifier) {
   if (identifier.empty()) return {};
   const auto content = contentOf(folderOfZones() / identifier);

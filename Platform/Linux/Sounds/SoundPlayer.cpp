@@ -62,7 +62,7 @@ class Loading final {
   std::optional<std::string> failure_;
 };
 
-// Plays by what is in the module. Without the module nothing can be loaded.
+// Plays with the module's output. Without the module nothing can be loaded.
 class ModuleSoundPlayer final : public SoundPlayer {
  public:
   ModuleSoundPlayer(SystemLog& systemLog, MainQueue& mainQueue)
