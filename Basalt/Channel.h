@@ -87,8 +87,8 @@ class Producer final : private Channel<Update> {
  public:
   [[nodiscard]] Channel<Update> channel() const { return *this; }
 
-  /// Hands the update to the executors of all who are subscribed now. Throws what `execute` of one
-  /// of them throws; those behind it then hear nothing.
+  /// Hands the update to the executors of all present subscriptions. An exception of an `execute`
+  /// reaches the caller, and the subscriptions behind it then miss the update.
   void update(Update update) const {
     const auto shared = std::make_shared<const Update>(std::move(update));
     for (const auto& subscription : this->subscriptions()) {

@@ -39,7 +39,7 @@ class VARNEL_API MainQueue {
   /// Runs what is posted, and waits for more, as long as the condition holds. The condition is
   /// checked at first and whenever something has run. Main thread only.
   virtual void runWhile(const std::function<bool()>& condition) = 0;
-  /// The same for as long as `patience` at the most. False when the condition still holds then.
+  /// The same for at most `patience`. False when the condition still holds then.
   virtual bool runWhile(const std::function<bool()>& condition,
                         std::chrono::milliseconds patience) = 0;
 

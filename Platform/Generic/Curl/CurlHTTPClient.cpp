@@ -188,8 +188,8 @@ CurlHTTPClient* makeClient() {
   if (!client->isUsable()) return nullptr;
   madeClient = client;
   makersProcess = ::getpid();
-  // Registered after the exit handlers of the TLS library, and so called before them. A forked
-  // child has nobody who would end the transfer that it was forked in.
+  // Registered after the exit handlers of the TLS library, and so called before them. In a forked
+  // child no thread would end a transfer that was under way.
   std::atexit([] {
     if (::getpid() == makersProcess) madeClient->close();
   });

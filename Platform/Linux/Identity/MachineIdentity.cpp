@@ -14,7 +14,8 @@
 namespace Varnel::Platform::Linux {
 namespace {
 
-// What cannot be read is empty. A router may know a million routes, a line of some 150 bytes each.
+// Empty when the file cannot be read. A router may know a million routes, each in a line of some
+// 150 bytes.
 std::string routes(const std::string& path) {
   constexpr std::size_t maxSize = std::size_t{512} << 20;
   return readFile(path, maxSize).valueOr("");

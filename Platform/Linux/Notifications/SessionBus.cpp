@@ -33,8 +33,8 @@ GSource* attach(GSource* source, Block block) {
   return source;
 }
 
-// While it lives, what GIO is asked for arrives where the main queue runs, although the host may
-// have made another context the thread's own.
+// While it lives, GIO's answers arrive where the main queue runs, even if the host has made another
+// context the thread's default.
 class OnMainContext final {
  public:
   OnMainContext()
@@ -159,7 +159,7 @@ void SessionBus::replied(GObject* connection, GAsyncResult* result, gpointer dat
       G_DBUS_CONNECTION(connection), result, &error));
   if (const auto self = awaited->bus.lock()) --self->awaitedReplies_;
   if (!message) return awaited->use(nullptr, take(error));
-  // Which none does that a real bus has passed on.
+  // A message from a real bus always has a sender.
   if (!g_dbus_message_get_sender(message.get()))
     return awaited->use(nullptr, "The session bus does not tell who answers.");
   const auto refusal = errorIn(message.get());

@@ -67,7 +67,7 @@ fs::path folderOfZones() {
 
 std::optional<std::string> contentOf(const fs::path& file) {
   std::error_code failure;
-  // What is no plain file may block whoever opens it.
+  // Opening anything but a plain file may block.
   if (!fs::is_regular_file(file, failure)) return std::nullopt;
   std::ostringstream content;
   content << std::ifstream(file, std::ios::binary).rdbuf();
@@ -80,7 +80,7 @@ ZoneHandle loadZone(const std::string& identifier) {
   if (identifier.empty()) return {};
   const auto content = contentOf(folderOfZones() / identifier);
   const bool isPath = identifier.starts_with('/') || identifier.find("..") != std::string::npos;
-  // Without a file it may be a rule.
+  // Without a file the text may be a rule.
   if (content ? !isWholeZoneFile(*content) : isPath) return {};
   return ZoneHandle(g_time_zone_new_identifier(identifier.c_str()));
 }
