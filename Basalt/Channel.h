@@ -17,8 +17,8 @@ namespace Basalt {
 ///     channel.onUpdate(context, [](const Event& event) { … });
 ///
 /// A cheap value; copies are one channel. Any thread. Each update reaches everybody who subscribed
-/// before it was sent, in the order of subscription; nothing is kept for those who come later.
-/// Handlers may subscribe and end subscriptions, also of the update that is being delivered.
+/// before it was sent, in the order of subscription; later subscribers miss it. Handlers may
+/// subscribe and end subscriptions, also of the update that is being delivered.
 template <typename Update>
 class Channel {
  public:
@@ -66,7 +66,7 @@ class Channel {
 
   void add(Subscription subscription) const {
     auto shared = std::make_shared<const Subscription>(std::move(subscription));
-    Subscriptions kept;  // The ended ones go after the lock: their handlers may own anything.
+    Subscriptions kept;  // Ended ones are freed after the lock: their handlers may own anything.
     const std::lock_guard lock(state_->mutex);
     for (const auto& each : state_->subscriptions)
       if (!each->hasEnded()) kept.push_back(each);
@@ -87,8 +87,8 @@ class Producer final : private Channel<Update> {
  public:
   [[nodiscard]] Channel<Update> channel() const { return *this; }
 
-  /// Hands the update to the executors of all who are subscribed now. Throws what `execute` of one
-  /// of them throws; those behind it then hear nothing.
+  /// Hands the update to the executors of all present subscriptions. An exception of an `execute`
+  /// reaches the caller, and the subscriptions behind it then miss the update.
   void update(Update update) const {
     const auto shared = std::make_shared<const Update>(std::move(update));
     for (const auto& subscription : this->subscriptions()) {

@@ -17,7 +17,7 @@ class ConcurrentQueue final : public Executor {
   void execute(Block block) override {
     const std::lock_guard lock(mutex_);
     waiting_.push_back(std::move(block));
-    if (idle_ >= waiting_.size() || threads_ == maximum) {
+    if (idle_ >= waiting_.size() || threads_ == maxThreads) {
       arrived_.notify_one();
       return;
     }
@@ -25,7 +25,7 @@ class ConcurrentQueue final : public Executor {
       Varnel::Platform::startThread("concurrent", [this] { work(); }).detach();
       ++threads_;
     } catch (const std::system_error&) {
-      // The threads that there are will come to it.
+      // The threads that already run will get to the block.
       if (threads_ > 0) return;
       waiting_.pop_back();
       throw;
@@ -33,7 +33,7 @@ class ConcurrentQueue final : public Executor {
   }
 
  private:
-  static constexpr std::size_t maximum = 64;
+  static constexpr std::size_t maxThreads = 64;
 
   void work() {
     std::unique_lock lock(mutex_);
@@ -59,7 +59,7 @@ class ConcurrentQueue final : public Executor {
 
 }  // namespace
 
-// Its threads outlive main, and so does it.
+// The queue is never destroyed, because its threads outlive main.
 std::shared_ptr<Executor> globalConcurrentQueue() {
   static const auto& queue = *new std::shared_ptr<Executor>(std::make_shared<ConcurrentQueue>());
   return queue;

@@ -8,8 +8,8 @@
 
 namespace Basalt {
 
-/// Base of objects that subscribe to channels: their handlers run on the object's executor and are
-/// not called any more once it is gone.
+/// Base of objects that subscribe to channels. The handlers run on the object's executor and are
+/// not called once the object is gone.
 ///
 ///     class Badge final : public ExecutionContext {
 ///      public:
@@ -18,7 +18,7 @@ namespace Basalt {
 ///       }
 ///     };
 ///
-/// Destroy the object on its executor, or where that runs nothing of it.
+/// Destroy the object on its executor, or at a moment when the executor runs none of its handlers.
 class ExecutionContext {
  public:
   ExecutionContext(const ExecutionContext&) = delete;

@@ -20,9 +20,9 @@ class VARNEL_API Executor {
 };
 
 /// The process's queue of default priority for work that may wait: blocks run side by side on
-/// threads that are started as needed, 64 at the most, and begin in the order of submission. What
-/// still runs or waits when the process ends is dropped. `execute` throws `std::system_error` when
-/// the system grants not even one thread. Any thread.
+/// threads that are started as needed, 64 at most, and begin in the order of submission. Blocks
+/// that still run or wait when the process ends are dropped. `execute` throws `std::system_error`
+/// when the system grants not even one thread. Any thread.
 [[nodiscard]] VARNEL_API std::shared_ptr<Executor> globalConcurrentQueue();
 
 }  // namespace Basalt

@@ -27,7 +27,7 @@ FuzzyByteCountFormatter::FuzzyByteCountFormatter(std::string_view localeIdentifi
 
 std::string FuzzyByteCountFormatter::string(std::int64_t count, ByteCountStyle style) const {
   if (count == 0) return formatter_.string(0, style);
-  // Negated as unsigned, since the least count has no positive counterpart.
+  // Negated as unsigned, because the lowest count has no positive counterpart.
   const auto bits = static_cast<std::uint64_t>(count);
   constexpr std::uint64_t greatest = std::numeric_limits<std::int64_t>::max();
   const std::uint64_t rounded = roundedUp(count < 0 ? 0 - bits : bits, unitStep(style));

@@ -22,7 +22,7 @@ JSONError noJSONAt(std::size_t byte) {
   return JSONError::withMessage(fmt::format("Unable to read JSON at byte {}", byte));
 }
 
-// Asked before anything deeper is read.
+// Called before anything deeper is read.
 bool isWithinDepth(int depth, Library::parse_event_t, Library&) {
   if (depth < maxDepth) return true;
   throw JSONError::withMessage("Unable to read JSON: it is nested too deep");

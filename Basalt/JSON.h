@@ -19,8 +19,8 @@ namespace Basalt {
 ///     if (const auto* object = json.as<PropertyDictionary>()) use(*object);
 using JSON = Varnel::Platform::PropertyValue;
 
-/// Why a text is no JSON, or a JSON value could not become a value of some type. It is thrown by
-/// constructors and functions that import JSON, and by nothing else.
+/// Why a text is not JSON, or why a JSON value could not become a value of some type. It is thrown
+/// by constructors and functions that import JSON, and by nothing else.
 class VARNEL_API JSONError final : public std::runtime_error {
  public:
   enum class Kind {
@@ -29,7 +29,8 @@ class VARNEL_API JSONError final : public std::runtime_error {
     message,       ///< The text or the value is refused for another reason; `what()` says why.
   };
 
-  /// The value at `path` has not the shape that `typeName` needs. The top value's path is "root".
+  /// The value at `path` does not have the shape that `typeName` needs. The top value's path is
+  /// "root".
   [[nodiscard]] static JSONError typeMismatch(std::string typeName, std::string path);
   [[nodiscard]] static JSONError missingValue(std::string typeName, std::string path);
   [[nodiscard]] static JSONError withMessage(const std::string& message);
@@ -47,15 +48,15 @@ class VARNEL_API JSONError final : public std::runtime_error {
 };
 
 /// The value that a JSON text in UTF-8 stands for. Throws `JSONError` of kind `message` for a text
-/// that is no JSON, has something behind its value or numbers that no double holds, or is nested
+/// that is not JSON, has something behind its value or numbers that no double holds, or is nested
 /// more than 512 deep. Whole numbers that fit 64 bits with a sign are integers, all others
-/// floating. Of duplicate keys the last one counts. The host's `setlocale` makes no difference. Any
-/// thread.
+/// floating. If a key comes twice, the last one counts. The host's `setlocale` makes no difference.
+/// Any thread.
 [[nodiscard]] VARNEL_API JSON parseJSON(std::string_view text);
 
-/// The value as a JSON text on one line, without an end of line, which `parseJSON` reads back. What
-/// JSON cannot carry is replaced: bytes, dates and numbers that are not finite by null, and bytes
-/// of a text or key that are not UTF-8 by U+FFFD. Any thread.
+/// The value as a JSON text on one line, without an end of line, which `parseJSON` reads back.
+/// Values that JSON cannot carry are replaced: bytes, dates and numbers that are not finite by
+/// null, and bytes of a text or key that are not UTF-8 by U+FFFD. Any thread.
 [[nodiscard]] VARNEL_API std::string jsonText(const JSON& json);
 
 /// A type that can be made from a JSON value; its constructor throws `JSONError`.

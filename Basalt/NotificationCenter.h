@@ -10,7 +10,7 @@
 
 namespace Basalt {
 
-/// Something that happened, told to whoever asked for its name.
+/// Something that happened, told to those that observe its name.
 struct Notification {
   std::string name;
   Varnel::Platform::PropertyDictionary userInfo;

@@ -24,8 +24,8 @@ namespace Basalt {
 ///       scopes.endAccessingSecurityScopedResource(url, "scan");
 ///     }
 ///
-/// Any thread. Ending what was not begun does nothing, so that no gate is closed under another's
-/// feet. Destruction leaves open what is open. The scope outlives the object.
+/// Any thread. Ending an access that was not begun does nothing, so that nobody else's gate is
+/// closed. Destruction leaves open gates open. The scope outlives the object.
 class VARNEL_API SecurityScopeBookkeeping final {
  public:
   using URL = Varnel::Platform::URL;
@@ -34,7 +34,7 @@ class VARNEL_API SecurityScopeBookkeeping final {
   SecurityScopeBookkeeping(const SecurityScopeBookkeeping&) = delete;
   SecurityScopeBookkeeping& operator=(const SecurityScopeBookkeeping&) = delete;
 
-  /// False when the process may not access the file; each success wants one end.
+  /// False when the process may not access the file. Each success needs one end.
   [[nodiscard]] bool beginAccessingSecurityScopedResource(const URL& url, std::string_view propose);
   void endAccessingSecurityScopedResource(const URL& url, std::string_view propose);
 

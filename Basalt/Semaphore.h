@@ -12,8 +12,8 @@ namespace Basalt {
 ///     std::thread worker([&] { work(); done.signal(); });
 ///     done.wait();
 ///
-/// Any thread. It must outlive every `signal`, even one that a waiter has already been woken by:
-/// share it, or know that the signalling thread has gone on.
+/// Any thread. It must outlive every call of `signal`, also one that has already woken its waiter:
+/// share the semaphore, or be sure that the signalling thread has left the call.
 class Semaphore final {
  public:
   explicit Semaphore(unsigned count = 0) : semaphore_(count) {}
@@ -24,7 +24,7 @@ class Semaphore final {
   void wait() { semaphore_.wait(); }
 
   /// Waits until a wall-clock time, for ever when it is `Date::max()`. Returns false when the time
-  /// came first; a signal that is there already is taken even when the time has passed.
+  /// came first; a signal that has already come is taken even when the time has passed.
   [[nodiscard]] bool waitUntil(Varnel::Platform::Date deadline) {
     if (deadline != Varnel::Platform::Date::max()) return semaphore_.waitUntil(deadline);
     semaphore_.wait();

@@ -5,7 +5,6 @@
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
-#include <deque>
 #include <mutex>
 #include <optional>
 #include <system_error>
@@ -13,6 +12,7 @@
 #include <fmt/format.h>
 
 #include <Varnel/Basalt/Semaphore.h>
+#include <Varnel/Basalt/SerialQueueLine.h>
 #include <Varnel/Basalt/ThreadID.h>
 #include <Varnel/Platform/Concurrency/CurrentThread.h>
 #include <Varnel/Platform/Concurrency/StartThread.h>
@@ -20,8 +20,10 @@
 namespace Basalt {
 namespace {
 
+using Runner = SerialQueueLine::Runner;
+
 /// How many brief blocks of others a thread runs when it gives a queue up.
-constexpr std::size_t briefBlockLimit = 16;
+constexpr std::size_t maxBriefBlocks = 16;
 
 constexpr std::size_t cacheLine = 64;
 
@@ -42,25 +44,15 @@ void append(Block& first, Block&& second) {
     first = std::move(second);
 }
 
-/// Where a thread sleeps that waits for a queue. Shared, as the one that wakes it may still be
-/// about it when the thread has gone on.
-struct Waiter {
-  Semaphore wake;
-  bool ownsQueue = false;  ///< Set before the wake-up; otherwise the thread has to try again.
-};
-
 constinit thread_local bool hasLostItsWaiter = false;
 
 struct KeptWaiter {
   const std::shared_ptr<Waiter> waiter = std::make_shared<Waiter>();
-  KeptWaiter() = default;
   ~KeptWaiter() { hasLostItsWaiter = true; }
-  KeptWaiter(const KeptWaiter&) = delete;
-  KeptWaiter& operator=(const KeptWaiter&) = delete;
 };
 
-// The same for all waits of a thread, until the thread ends: objects that are destroyed later, the
-// static ones among them, may still wait for a queue.
+// A thread keeps one waiter for all its waits. What it destroys after the waiter, static objects
+// among that, may still wait for a queue.
 std::shared_ptr<Waiter> currentWaiter() {
   if (hasLostItsWaiter) return std::make_shared<Waiter>();
   thread_local const KeptWaiter kept;
@@ -69,61 +61,59 @@ std::shared_ptr<Waiter> currentWaiter() {
 
 }  // namespace
 
-// The queue has one owner at a time: a thread, its own worker, or one to which it is being handed.
-// Who finds the word without `held` and `queued` may take it by one compare-and-swap and gives it
-// up by another as long as nobody stands in line. Whoever stands in line has said so in the word,
-// and makes the owner look: a block is run or handed on in its turn, the queue is handed to a
-// thread that has blocks behind it, and else the first thread is woken to try again, since a queue
-// that stays free for newcomers meanwhile is worth more than the order of threads that nothing
-// orders.
+// A queue has one owner at a time: a thread that runs a block of it, or the thread to which it is
+// being handed, often the queue's own worker. While nobody stands in line, a thread takes the queue
+// and gives it up by one exchange of a word each. A thread that joins the line says so in the word;
+// the owner then fails to give the queue up, and passes it on.
 class SerialQueue::Core final {
  public:
   Core(std::string label, QualityOfService quality) : label_(std::move(label)), quality_(quality) {}
 
   [[nodiscard]] const std::string& label() const { return label_; }
   [[nodiscard]] bool isCurrent() const {
-    return holder_.load(std::memory_order_relaxed) == currentThreadID();
+    return runningThread_.load(std::memory_order_relaxed) == currentThreadID();
   }
 
   void acquire();
-  void release() noexcept;
-  void enqueue(Block&& block);
+  // Aligned so that its speed does not depend on the length of the code before it.
+  [[gnu::aligned(cacheLine)]] void release() noexcept;
   void submit(Block&& block);
+  void enqueue(Block&& block);
   void afterRelease(Block&& block);
   void close();
 
  private:
+  using Lock = std::unique_lock<std::mutex>;
+
   using Bits = std::uint32_t;
-  static constexpr Bits held = 1;     ///< It has an owner.
-  static constexpr Bits queued = 2;   ///< Blocks stand in line; newcomers join it. Never unheld.
+  static constexpr Bits held = 1;     ///< There is an owner; the owner alone clears this.
+  static constexpr Bits queued = 2;   ///< Blocks stand in line. Only while held.
   static constexpr Bits waiting = 4;  ///< Threads stand in line.
-  static constexpr Bits closed = 8;   ///< Nobody can submit any more.
+  static constexpr Bits closed = 8;   ///< The handle is gone: nobody can submit any more.
 
-  enum class Runner { anyThread, worker };
-  struct Entry {
-    Block block;
-    Runner runner = Runner::anyThread;
-    std::shared_ptr<Waiter> waiter;  ///< A thread instead of a block.
-  };
+  // The transitions. A mark of the line changes together with the line, under the mutex.
+  bool take();                  ///< From free to held.
+  bool takeOrMark(Bits mark);   ///< From free to held, or from held to held and marked.
+  bool takeAndMark(Bits mark);  ///< From either to held and marked.
+  bool giveUp();                ///< From held without a mark to free.
+  /// From held to held by the next in line, or to free. `mayRun`: how many more brief blocks the
+  /// calling thread may run itself.
+  std::optional<Block> passOn(Lock lock, std::size_t mayRun) noexcept;
 
-  bool tryTake();
-  bool giveUp();
-  void releaseSlowly(Block& afterRelease) noexcept;
-  bool takeOrMark(Bits mark);
   void acquireSlowly();
-  void pushBlock(Block&& block, Runner runner);
-  Entry popFront();
+  void releaseSlowly(Block& afterRelease) noexcept;
+  [[nodiscard]] Bits bitsOfLine() const;
+  Block takeBlockFromLine();
+  void run(Block&& block) noexcept;
   void runBriefBlocks() noexcept;
-  std::optional<Block> passOn(std::size_t mayRun) noexcept;
   bool startWorker() noexcept;
   void work();
-  [[nodiscard]] Bits bitsOfLine() const;
 
-  // What every hold looks at, on one cache line up to whether there is anything to run after it.
+  // On one cache line, with the beginning of `afterRelease_`: all that a hold without rivals uses.
   alignas(cacheLine) std::atomic<Bits> word_ = 0;
-  std::atomic<ThreadID> holder_ = ThreadID::none;  ///< Set only while a block runs.
+  std::atomic<ThreadID> runningThread_ = ThreadID::none;
 
-  // Owned by the holder.
+  // Belong to the owner.
   Block briefBlock_;    ///< What the block that runs has submitted, in turn.
   Block afterRelease_;  ///< What is to be done once the queue is given up.
   std::size_t briefBlockCount_ = 0;
@@ -132,21 +122,22 @@ class SerialQueue::Core final {
   const QualityOfService quality_;
 
   std::mutex mutex_;  ///< Owns what follows.
-  std::deque<Entry> line_;
-  std::size_t blocksInLine_ = 0;
+  SerialQueueLine line_;
   bool hasWorker_ = false;
   Semaphore work_;  ///< Signalled when the worker has become the owner.
 };
+
+// Taking.
 
 void SerialQueue::Core::acquire() {
   Bits idle = 0;
   if (!word_.compare_exchange_strong(idle, held, std::memory_order_acquire,
                                      std::memory_order_relaxed)) [[unlikely]]
     acquireSlowly();
-  holder_.store(currentThreadID(), std::memory_order_relaxed);
+  runningThread_.store(currentThreadID(), std::memory_order_relaxed);
 }
 
-bool SerialQueue::Core::tryTake() {
+bool SerialQueue::Core::take() {
   Bits word = word_.load(std::memory_order_relaxed);
   while (!(word & held))
     if (word_.compare_exchange_weak(word, word | held, std::memory_order_acquire,
@@ -155,7 +146,6 @@ bool SerialQueue::Core::tryTake() {
   return false;
 }
 
-// Under the mutex: takes the queue if it is free, and otherwise makes its owner look at the line.
 bool SerialQueue::Core::takeOrMark(Bits mark) {
   Bits word = word_.load(std::memory_order_relaxed);
   while (!word_.compare_exchange_weak(word, word | (word & held ? mark : held),
@@ -164,21 +154,11 @@ bool SerialQueue::Core::takeOrMark(Bits mark) {
   return !(word & held);
 }
 
-void SerialQueue::Core::acquireSlowly() {
-  if (isCurrent()) stop("A block waits for the queue that it runs on", label_);
-  const std::shared_ptr<Waiter> waiter = currentWaiter();
-  for (bool isNew = true; !tryTake(); isNew = false) {
-    {
-      const std::lock_guard lock(mutex_);
-      if (takeOrMark(waiting)) return;
-      waiter->ownsQueue = false;
-      // Who was woken in vain keeps the place at the front.
-      line_.insert(isNew ? line_.end() : line_.begin(), Entry{.block = {}, .waiter = waiter});
-    }
-    waiter->wake.wait();
-    if (waiter->ownsQueue) return;
-  }
+bool SerialQueue::Core::takeAndMark(Bits mark) {
+  return !(word_.fetch_or(mark | held, std::memory_order_acquire) & held);
 }
+
+// Giving up.
 
 void SerialQueue::Core::release() noexcept {
   if (briefBlock_) runBriefBlocks();
@@ -189,28 +169,111 @@ void SerialQueue::Core::release() noexcept {
   if (afterRelease) afterRelease();
 }
 
-// Succeeds as long as nobody stands in line.
 bool SerialQueue::Core::giveUp() {
-  holder_.store(ThreadID::none, std::memory_order_relaxed);
+  runningThread_.store(ThreadID::none, std::memory_order_relaxed);
   Bits alone = held;
   return word_.compare_exchange_strong(alone, 0, std::memory_order_release,
                                        std::memory_order_relaxed);
 }
 
-// Runs the brief blocks that are next, and passes the queue on. They add to what is to be done
-// then.
+// The brief blocks that are next run here first. They may add to what follows the release.
 void SerialQueue::Core::releaseSlowly(Block& afterRelease) noexcept {
-  std::size_t mayRun = briefBlockLimit;
+  std::size_t mayRun = maxBriefBlocks;
   do {
-    std::optional<Block> block = passOn(mayRun);
+    std::optional<Block> block = passOn(Lock(mutex_), mayRun);
     if (!block) return;
     --mayRun;
-    holder_.store(currentThreadID(), std::memory_order_relaxed);
-    (*block)();
-    block.reset();
+    run(std::move(*block));
     runBriefBlocks();
     append(afterRelease, std::move(afterRelease_));
   } while (!giveUp());
+}
+
+// A block that is next and that the calling thread may run is returned: the thread stays the owner.
+std::optional<Block> SerialQueue::Core::passOn(Lock lock, std::size_t mayRun) noexcept {
+  if (line_.isEmpty()) {
+    if (!(word_.load(std::memory_order_relaxed) & closed)) {
+      word_.store(0, std::memory_order_release);
+    } else if (hasWorker_) {
+      work_.signal();
+    } else {
+      lock.unlock();
+      delete this;
+    }
+  } else if (line_.front().thread) {
+    const std::shared_ptr<Waiter> thread = line_.pop().thread;
+    // Blocks behind the thread keep their order: it becomes the owner. Otherwise the queue stays
+    // free for newcomers until the thread has woken up. That is worth more than the order of
+    // threads that nothing orders.
+    thread->ownsQueue = line_.hasBlocks();
+    word_.store(bitsOfLine() | (thread->ownsQueue ? held : 0), std::memory_order_release);
+    lock.unlock();
+    thread->wake.signal();
+  } else if ((line_.front().runner == Runner::worker || mayRun == 0) && startWorker()) {
+    // Under the mutex, which the worker needs before it can delete the queue.
+    work_.signal();
+  } else {
+    return takeBlockFromLine();
+  }
+  return std::nullopt;
+}
+
+// For the owner, who stores the word without an exchange: nobody marks it without the mutex, and
+// nobody takes the queue while it is held.
+SerialQueue::Core::Bits SerialQueue::Core::bitsOfLine() const {
+  return (word_.load(std::memory_order_relaxed) & closed) | (line_.hasBlocks() ? queued : 0) |
+         (line_.hasThreads() ? waiting : 0);
+}
+
+Block SerialQueue::Core::takeBlockFromLine() {
+  Block block = line_.pop().block;
+  word_.store(bitsOfLine() | held, std::memory_order_relaxed);
+  return block;
+}
+
+// Waiting.
+
+void SerialQueue::Core::acquireSlowly() {
+  if (isCurrent()) stop("A block waits for the queue that it runs on", label_);
+  const std::shared_ptr<Waiter> thread = currentWaiter();
+  // A thread that was woken in vain keeps its place at the front.
+  for (auto place = SerialQueueLine::Place::back; !take(); place = SerialQueueLine::Place::front) {
+    {
+      const std::lock_guard lock(mutex_);
+      if (takeOrMark(waiting)) return;
+      thread->ownsQueue = false;
+      line_.add({.block = {}, .thread = thread}, place);
+    }
+    thread->wake.wait();
+    if (thread->ownsQueue) return;
+  }
+}
+
+// Blocks.
+
+void SerialQueue::Core::submit(Block&& block) {
+  const bool isInBlock = isCurrent();
+  const bool isQueued = word_.load(std::memory_order_acquire) & queued;
+  if (isInBlock && !isQueued && briefBlockCount_ < maxBriefBlocks) {
+    append(briefBlock_, std::move(block));
+    ++briefBlockCount_;
+    return;
+  }
+  if (isInBlock || !take()) {
+    const std::lock_guard lock(mutex_);
+    if (!takeOrMark(queued)) {
+      line_.add({.block = std::move(block)});
+      return;
+    }
+  }
+  run(std::move(block));
+  release();
+}
+
+void SerialQueue::Core::run(Block&& block) noexcept {
+  runningThread_.store(currentThreadID(), std::memory_order_relaxed);
+  block();
+  block = Block();
 }
 
 void SerialQueue::Core::runBriefBlocks() noexcept {
@@ -221,100 +284,17 @@ void SerialQueue::Core::runBriefBlocks() noexcept {
   briefBlockCount_ = 0;
 }
 
-// Gives the queue to whoever is next. The exception is a block that the calling thread may run:
-// that is returned, and the caller stays the owner.
-std::optional<Block> SerialQueue::Core::passOn(std::size_t mayRun) noexcept {
-  std::unique_lock lock(mutex_);
-  if (line_.empty()) {
-    if (!(word_.load(std::memory_order_relaxed) & closed)) {
-      word_.store(0, std::memory_order_release);
-    } else if (hasWorker_) {
-      work_.signal();
-    } else {
-      lock.unlock();
-      delete this;
-    }
-    return std::nullopt;
-  }
-  if (line_.front().waiter) {
-    const std::shared_ptr<Waiter> waiter = popFront().waiter;
-    waiter->ownsQueue = blocksInLine_ > 0;
-    word_.store(bitsOfLine() | (waiter->ownsQueue ? held : 0), std::memory_order_release);
-    lock.unlock();
-    waiter->wake.signal();
-    return std::nullopt;
-  }
-  const bool isForWorker = line_.front().runner == Runner::worker || mayRun == 0;
-  if (isForWorker && startWorker()) {
-    // Not after the mutex: the worker may be the last one to use the queue.
-    work_.signal();
-    return std::nullopt;
-  }
-  std::optional<Block> block = popFront().block;
-  word_.store(bitsOfLine() | held, std::memory_order_relaxed);
-  return block;
-}
-
-SerialQueue::Core::Entry SerialQueue::Core::popFront() {
-  Entry entry = std::move(line_.front());
-  line_.pop_front();
-  if (!entry.waiter) --blocksInLine_;
-  return entry;
-}
-
-SerialQueue::Core::Bits SerialQueue::Core::bitsOfLine() const {
-  return (word_.load(std::memory_order_relaxed) & closed) | (blocksInLine_ > 0 ? queued : 0) |
-         (line_.size() > blocksInLine_ ? waiting : 0);
-}
-
-void SerialQueue::Core::pushBlock(Block&& block, Runner runner) {
-  line_.push_back({.block = std::move(block), .runner = runner, .waiter = nullptr});
-  ++blocksInLine_;
-}
-
-void SerialQueue::Core::enqueue(Block&& block) {
-  {
-    const std::lock_guard lock(mutex_);
-    if (!startWorker())
-      throw std::system_error(std::make_error_code(std::errc::resource_unavailable_try_again));
-    pushBlock(std::move(block), Runner::worker);
-    if (word_.fetch_or(queued | held, std::memory_order_acquire) & held) return;
-  }
-  passOn(0);
-}
-
-void SerialQueue::Core::submit(Block&& block) {
-  const bool isInBlock = isCurrent();
-  const bool isQueued = word_.load(std::memory_order_acquire) & queued;
-  if (isInBlock && !isQueued && briefBlockCount_ < briefBlockLimit) {
-    append(briefBlock_, std::move(block));
-    ++briefBlockCount_;
-    return;
-  }
-  if (isInBlock || !tryTake()) {
-    const std::lock_guard lock(mutex_);
-    if (!takeOrMark(queued)) {
-      pushBlock(std::move(block), Runner::anyThread);
-      return;
-    }
-  }
-  holder_.store(currentThreadID(), std::memory_order_relaxed);
-  [&]() noexcept { block(); }();
-  block = Block();
-  release();
-}
-
 void SerialQueue::Core::afterRelease(Block&& block) {
   if (!isCurrent()) stop("Only a block of the queue may act after it", label_);
   append(afterRelease_, std::move(block));
 }
 
-void SerialQueue::Core::close() {
-  {
-    const std::lock_guard lock(mutex_);
-    if (word_.fetch_or(closed | held, std::memory_order_acquire) & held) return;
-  }
-  passOn(0);
+void SerialQueue::Core::enqueue(Block&& block) {
+  Lock lock(mutex_);
+  if (!startWorker())
+    throw std::system_error(std::make_error_code(std::errc::resource_unavailable_try_again));
+  line_.add({.block = std::move(block), .runner = Runner::worker});
+  if (takeAndMark(queued)) passOn(std::move(lock), 0);
 }
 
 // Under the mutex.
@@ -329,27 +309,27 @@ void SerialQueue::Core::work() {
   Varnel::Platform::setCurrentThreadQuality(quality_);
   for (;;) {
     work_.wait();
-    Block block;
-    {
-      const std::lock_guard lock(mutex_);
-      if (line_.empty()) break;
-      // A thread that was woken in vain may have gone before the block meanwhile.
-      if (!line_.front().waiter) {
-        block = popFront().block;
-        word_.store(bitsOfLine() | held, std::memory_order_relaxed);
-      }
-    }
-    if (!block) {
-      passOn(0);
+    Lock lock(mutex_);
+    if (line_.isEmpty()) break;
+    // A thread that was woken in vain may have gone before the block meanwhile.
+    if (line_.front().thread) {
+      passOn(std::move(lock), 0);
       continue;
     }
-    holder_.store(currentThreadID(), std::memory_order_relaxed);
-    [&]() noexcept { block(); }();
-    block = Block();
+    Block block = takeBlockFromLine();
+    lock.unlock();
+    run(std::move(block));
     release();
   }
   delete this;
 }
+
+void SerialQueue::Core::close() {
+  Lock lock(mutex_);
+  if (takeAndMark(closed)) passOn(std::move(lock), 0);
+}
+
+// The handle.
 
 SerialQueue::SerialQueue(std::string label, QualityOfService quality)
     : core_(new Core(std::move(label), quality)) {}

@@ -17,13 +17,13 @@ namespace Basalt {
 ///     queue.async([state] { state->rebuild(); });                     // on the queue's own thread
 ///     const int count = queue.sync([&] { return state->count(); });  // here, after the rebuild
 ///
-/// Blocks run in the order in which a thread submitted them, and in that of threads that wait for
-/// one another; a `sync` that nobody is ordered behind may overtake others that wait.
+/// The blocks of one thread run in the order in which it submitted them, and so do those of threads
+/// that wait for one another. While only `sync` calls wait, a newer one may overtake them.
 ///
 /// Any thread may call any operation, on the queue or off it, unless it says otherwise. An idle
 /// queue costs a `sync` about as much as a mutex. Destruction never waits, and may happen in a
-/// block of the queue: what was submitted still runs, so blocks own what they touch. Blocks given
-/// to `async`, `submit` and `afterRelease` must not throw.
+/// block of the queue: submitted blocks still run, so blocks own what they touch. Blocks given to
+/// `async`, `submit` and `afterRelease` must not throw.
 class VARNEL_API SerialQueue final {
  public:
   using QualityOfService = Varnel::Platform::QualityOfService;
@@ -37,8 +37,8 @@ class VARNEL_API SerialQueue final {
   [[nodiscard]] const std::string& label() const;
 
   /// Runs the block on the calling thread, after everything submitted before, and returns what it
-  /// returns. What it throws reaches the caller once the queue has been given up. A call from a
-  /// block of the same queue could never return and stops the process.
+  /// returns. An exception of the block reaches the caller after the queue has been given up. A
+  /// call from a block of the same queue could never return and stops the process.
   template <typename Function>
   decltype(auto) sync(Function&& block) {
     const Hold hold(*core_);
@@ -54,8 +54,8 @@ class VARNEL_API SerialQueue final {
   /// the queue is given up.
   void submit(Block&& block);
 
-  /// From a block of the queue alone: runs `block` on this thread once the queue has been given
-  /// up. Here belongs what wakes other threads, which would otherwise run into the queue.
+  /// From a block of the queue alone: runs `block` on this thread once the queue has been given up.
+  /// Use it to wake other threads: woken earlier, they would find the queue held.
   void afterRelease(Block&& block);
 
   /// Whether the calling code runs in a block of this queue.

@@ -7,7 +7,7 @@ namespace Basalt {
 namespace {
 
 std::atomic<std::uint64_t> lastID = 0;
-// Every grant of a lock asks for it: with this model that is a plain load.
+// Read for every grant of a queue. With this model the read is a plain load.
 [[gnu::tls_model("initial-exec")]] constinit thread_local ThreadID currentID = ThreadID::none;
 
 }  // namespace

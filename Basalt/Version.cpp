@@ -18,7 +18,7 @@ Version::Version(std::string_view text) {
     if (next == end || *next != '.') break;
     position = next + 1;
   }
-  // Without trailing zeros the built-in comparison of vectors is that of versions.
+  // Without trailing zeros, versions compare as their vectors do.
   while (!components_.empty() && components_.back() == 0) components_.pop_back();
 }
 

@@ -17,8 +17,8 @@ namespace Basalt {
 /// A value.
 class VARNEL_API Version final {
  public:
-  /// Reads numbers up to the first thing that is none: "2.1b3 (7)" is 2.1. A text that starts with
-  /// no number is version 0; a number beyond 32 bits counts as the largest.
+  /// Reads numbers up to the first thing that is not one: "2.1b3 (7)" is 2.1. A text that does not
+  /// start with a number is version 0; a number beyond 32 bits counts as the largest.
   explicit Version(std::string_view text);
 
   /// The number at `index`, 0 beyond the end.

@@ -39,7 +39,7 @@ void AnalyticsContext::trackEvent(std::string_view category, std::string_view ac
   event.uuid = uuids_.next();
   transport_->accept(event);
 } catch (const std::exception&) {
-  // Out of memory: an event less, but an application that goes on.
+  // Out of memory. The event is lost and the application goes on.
 }
 
 Consent AnalyticsContext::consent() const noexcept {

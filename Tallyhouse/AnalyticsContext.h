@@ -24,7 +24,8 @@ enum class Consent { granted, refused };
 
 /// Makes events and hands them to a transport, as long as the user consents.
 ///
-/// Any thread. No operation throws or waits for the network; what cannot be kept is lost silently.
+/// Any thread. No operation throws or waits for the network. An event that cannot be kept is
+/// silently lost.
 class VARNEL_API AnalyticsContext final {
  public:
   struct Ports {
@@ -44,7 +45,7 @@ class VARNEL_API AnalyticsContext final {
                   bool isTest = false) noexcept;
 
   [[nodiscard]] Consent consent() const noexcept;
-  /// Refusing stops the collection and throws away what has not been delivered.
+  /// Refusing stops the collection and throws away all events that have not been delivered.
   void setConsent(Consent consent) noexcept;
 
  private:

@@ -25,7 +25,7 @@ struct AnalyticsEvent final {
   std::optional<std::int64_t> value;
   CustomDimensions customDimensions;
   CustomMetrics customMetrics;
-  bool isTest = false;  ///< Sent, but marked as no user's doing.
+  bool isTest = false;  ///< Sent, but marked as a test.
 };
 
 }  // namespace Tallyhouse

@@ -9,7 +9,7 @@
 
 namespace Tallyhouse {
 
-/// What a host makes once and gives to every sender of events.
+/// Made once by a host, and given to every sender of events.
 ///
 ///     auto tracker = std::make_shared<AnalyticsTracker>(transport);
 ///     tracker->setShouldPrintEvents(true);

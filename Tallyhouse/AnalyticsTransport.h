@@ -6,16 +6,16 @@
 
 namespace Tallyhouse {
 
-/// The way that events take from the application to whoever counts them. `SpoolingTransport` posts
-/// them to a server, `Testing::MemoryTransport` keeps them for a test.
+/// The way that events take from the application to the place where they are counted.
+/// `SpoolingTransport` posts them to a server, `Testing::MemoryTransport` keeps them for a test.
 ///
 /// Called by one thread at a time. No operation waits for the network, and none throws.
 class VARNEL_API AnalyticsTransport {
  public:
   virtual ~AnalyticsTransport() = default;
 
-  /// Called when the user's consent is known to be given, maybe more than once: what earlier runs
-  /// left may go.
+  /// Called when the user's consent is known, perhaps more than once. Events of earlier runs may be
+  /// sent from now on.
   virtual void start() noexcept = 0;
 
   /// Takes over one event.

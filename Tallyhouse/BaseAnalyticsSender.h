@@ -22,8 +22,8 @@ namespace Tallyhouse {
 ///     };
 ///     WindowSender(tracker).trackEvent("Close", RouterActionSenderKind::menuItem);
 ///
-/// Any thread, if what a class overrides allows it. Nothing waits for the network. The tracker is
-/// not null.
+/// Any thread, if the overrides of a subclass allow it. Nothing waits for the network. The tracker
+/// is not null.
 class VARNEL_API BaseAnalyticsSender {
  public:
   explicit BaseAnalyticsSender(std::shared_ptr<AnalyticsTracker> tracker);

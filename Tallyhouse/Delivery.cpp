@@ -38,19 +38,18 @@ std::optional<Date> Delivery::step(Haste haste, std::stop_token stop) {
   const auto nextSending = [&] {
     DeliveryPolicy policy = policy_;
     if (haste == Haste::none) policy.linger = {};
-    return policy.nextSending(spool_.backlog(policy.triesOfRefused), notBefore_,
-                              ports_.clock.now());
+    return policy.nextSending(spool_.backlog(policy.maxRefusals), notBefore_, ports_.clock.now());
   };
   const auto next = nextSending();
   if (!next || *next > ports_.clock.now() || stop.stop_requested()) return next;
-  // Fresh events first: those that were refused hold up no other.
-  if (const auto waiting = spool_.waiting(policy_.batchEvents, policy_.batchBytes);
+  // Fresh events first, so that refused ones do not hold them up.
+  if (const auto waiting = spool_.waiting(policy_.maxBatchEvents, policy_.maxBatchBytes);
       !waiting.empty())
     send(waiting, false, stop);
-  else if (const auto refused = spool_.refused(policy_.triesOfRefused))
+  else if (const auto refused = spool_.refused(policy_.maxRefusals))
     send({&*refused, 1}, true, stop);
   else if (nextSending())
-    backOff({});  // What is there cannot be read.
+    backOff({});  // The events cannot be read.
   return nextSending();
 }
 
@@ -66,7 +65,8 @@ void Delivery::send(std::span<const SpooledEvent> events, bool areRefused, std::
   const Verdict verdict =
       DeliveryPolicy::verdict(answer ? std::optional(answer->status) : std::nullopt);
   if (verdict == Verdict::delivered) {
-    // What cannot be removed is sent again: not at once, or a full disk would make it a flood.
+    // Events that cannot be removed are sent again. A pause keeps a full disk from making that a
+    // flood.
     if (!(areRefused ? spool_.removeRefused(events.front()) : spool_.removeWaiting(events)))
       return backOff({});
     failures_ = 0;

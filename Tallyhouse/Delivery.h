@@ -27,8 +27,8 @@ struct Endpoint final {
   bool allowsPlainHTTP = false;
 };
 
-/// Carries events from the spool to the server, one batch a step. It has no thread of its own: who
-/// calls `step` again when it says so has it all delivered.
+/// Carries events from the spool to the server, one batch for each step. It has no thread of its
+/// own: its caller calls `step` again at the time that `step` returns.
 ///
 /// One thread at a time.
 class Delivery final {
@@ -38,16 +38,16 @@ class Delivery final {
     Varnel::Platform::HTTPClient& httpClient;
   };
   enum class Haste {
-    usual,  ///< Events wait a little for others.
-    none,   ///< What waits goes at once, unless the server wants to be left alone.
+    usual,  ///< Events wait a little for others to join their batch.
+    none,   ///< Waiting events are sent at once, unless the server has asked for a pause.
   };
 
   /// `random` gives numbers from 0 to 1.
   Delivery(Ports ports, EventSpool& spool, Endpoint endpoint, DeliveryPolicy policy,
            std::function<double()> random);
 
-  /// Sends a batch if one is due and waits for the answer. The return is when to call again; absent
-  /// while there is nothing to send. After `stop` nothing more is sent.
+  /// Sends a batch if one is due and waits for the answer. Returns when to call again; absent while
+  /// there is nothing to send. After `stop` nothing more is sent.
   [[nodiscard]] std::optional<Varnel::Platform::Date> step(Haste haste, std::stop_token stop);
 
   /// How many attempts in a row have failed.

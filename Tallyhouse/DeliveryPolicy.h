@@ -11,32 +11,32 @@
 
 namespace Tallyhouse {
 
-/// What an answer of the server means for the events that it answered.
+/// What the server's answer means for the events of a batch.
 enum class Verdict {
   delivered,  ///< They arrived.
   refused,    ///< The server will not have them as they are.
   later,      ///< Nothing is known of them: send them again.
 };
 
-/// What waits for delivery.
+/// The events that wait for delivery.
 struct Backlog final {
   std::int64_t waiting = 0;
-  std::optional<Varnel::Platform::Date> oldest;  ///< Of those waiting; absent when there are none.
-  bool hasRefused = false;  ///< Whether some were refused, but less often than to be set aside.
+  std::optional<Varnel::Platform::Date> oldest;  ///< Of the waiting events; absent if none.
+  bool hasRefused = false;  ///< Whether some were refused, but not often enough to be set aside.
 };
 
-/// When events are sent, how many at once, and what becomes of those that do not get through. Plain
+/// Decides when events are sent, how many at once, and what becomes of those that fail. Plain
 /// figures and functions of them: no clock, no network, no state.
 struct VARNEL_API DeliveryPolicy final {
   using Duration = std::chrono::milliseconds;
 
   Duration linger = std::chrono::seconds(5);  ///< For how long an event waits for company.
   Duration firstRetry = std::chrono::seconds(5);
-  Duration longestRetry = std::chrono::hours(1);
-  Duration longestRetryAfter = std::chrono::hours(24);  ///< The most that a server may ask for.
-  int triesOfRefused = 3;  ///< After as many refusals an event is set aside.
-  std::size_t batchEvents = 20;
-  std::size_t batchBytes = 15'000;
+  Duration maxRetryDelay = std::chrono::hours(1);
+  Duration maxRetryAfter = std::chrono::hours(24);  ///< The longest pause that is granted.
+  int maxRefusals = 3;  ///< After this many refusals an event is set aside.
+  std::size_t maxBatchEvents = 20;
+  std::size_t maxBatchBytes = 15'000;
 
   /// What an HTTP status means; no status means that there was no answer.
   [[nodiscard]] static Verdict verdict(std::optional<int> status);

@@ -85,10 +85,10 @@ std::optional<Date> DeliveryWorker::step(std::unique_lock<std::mutex>& lock) {
 }
 
 void DeliveryWorker::waitForNext(std::unique_lock<std::mutex>& lock, std::optional<Date> next) {
-  // The wall clock may jump while the wait counts time that passes, and another process may leave
-  // something behind.
-  constexpr Date::duration longestWait = std::chrono::minutes(10);
-  const auto wait = next ? std::min(*next - clock_.now(), longestWait) : longestWait;
+  // The wall clock may jump, while the wait counts the time that passes. Another process may leave
+  // events behind as well.
+  constexpr Date::duration maxWait = std::chrono::minutes(10);
+  const auto wait = next ? std::min(*next - clock_.now(), maxWait) : maxWait;
   if (wait <= Date::duration::zero() || isWoken_ || isEnding_) return;
   // Before a long wait, so that an idle spool is one small file.
   lock.unlock();

@@ -36,18 +36,18 @@ class DeliveryWorker final {
   /// Interrupts a transfer and delivers nothing until `resume`.
   void pause();
 
-  /// Says that there is something new to look at.
+  /// Tells the thread that there is something new in the spool.
   void wake();
 
-  /// Waits, while sending without lingering, until nothing waits or the server has to be left
-  /// alone. Returns whether nothing waits.
+  /// Sends without lingering, and waits until no event is left or the server has asked for a pause.
+  /// Returns whether no event is left.
   bool drain(std::chrono::milliseconds timeout);
 
  private:
   enum class State { working, idle, blocked };
 
   void run();
-  // With the lock held before and after.
+  // Called with the lock held, which is held again on return.
   std::optional<Varnel::Platform::Date> step(std::unique_lock<std::mutex>& lock);
   void waitForNext(std::unique_lock<std::mutex>& lock, std::optional<Varnel::Platform::Date> next);
 
@@ -63,7 +63,7 @@ class DeliveryWorker final {
   bool isWoken_ = false;
   int drainers_ = 0;
   std::int64_t drainsAsked_ = 0;
-  std::int64_t drainsSeen_ = 0;  ///< Those asked for before the step that made `state_`.
+  std::int64_t drainsSeen_ = 0;  ///< How many were asked for before the step that made `state_`.
   std::stop_source transfer_;
   std::thread thread_;
 };

@@ -20,7 +20,7 @@ using Step = Varnel::Platform::SQLiteStatement::Step;
 namespace {
 
 // Another process may hold the lock for one short change.
-constexpr auto longestWaitForLock = std::chrono::milliseconds(500);
+constexpr auto maxLockWait = std::chrono::milliseconds(500);
 
 // With the write-ahead log and this degree of synchronisation a change costs no wait for the disk,
 // and what a process has written outlives it. Moving the log into the file does wait; that is left
@@ -85,8 +85,9 @@ void EventSpool::open() {
 std::optional<PlatformError> EventSpool::tryToOpen() {
   std::error_code ignored;
   fs::create_directories(fs::path(path_).parent_path(), ignored);
-  // The library would let others read; its further files take over the rights of this one. A file
-  // that is there is not opened: closing it would give up the locks that this process has on it.
+  // The library would create the file readable for others; its temporary files take over the rights
+  // of this one. A file that exists is not opened here: closing it would release this process's
+  // locks on it.
   if (!fs::exists(path_, ignored)) {
     if (auto file = ports_.appendFiles.open(path_); !file) return PlatformError(file.error());
   }
@@ -95,7 +96,7 @@ std::optional<PlatformError> EventSpool::tryToOpen() {
   auto database = Database::open(path_, Database::Access::readWrite);
   if (!database) return database.error();
   database_.emplace(std::move(database).value());
-  database_->setBusyTimeout(longestWaitForLock);
+  database_->setBusyTimeout(maxLockWait);
   auto error = database_->execute(setUp);
   if (!error) error = damage();
   if (!error) {
@@ -144,7 +145,7 @@ void EventSpool::putAside() {
 std::int64_t EventSpool::append(std::string_view uuid, Date date, std::string_view hit) {
   const std::lock_guard lock(mutex_);
   const auto size = static_cast<std::int64_t>(hit.size());
-  // It may have been locked. Ever more rarely, as opening takes its time.
+  // The file may have been locked, so opening is tried again. Ever more rarely, because it is slow.
   if (!insert_ && std::has_single_bit(static_cast<std::uint64_t>(unsavedDropped_) + 1)) open();
   if (!insert_ || !isCleared()) {
     drop(1);
@@ -163,7 +164,7 @@ std::int64_t EventSpool::append(std::string_view uuid, Date date, std::string_vi
   return waitingEvents_;
 }
 
-Backlog EventSpool::backlog(int triesOfRefused) {
+Backlog EventSpool::backlog(int maxRefusals) {
   const std::lock_guard lock(mutex_);
   Backlog backlog;
   if (!isCleared()) return backlog;
@@ -173,34 +174,34 @@ Backlog EventSpool::backlog(int triesOfRefused) {
     backlog.waiting = std::max<std::int64_t>(waitingEvents_, 1);
   }
   backlog.hasRefused =
-      number(fmt::format("SELECT 1 FROM refused WHERE times < {} LIMIT 1", triesOfRefused))
+      number(fmt::format("SELECT 1 FROM refused WHERE times < {} LIMIT 1", maxRefusals))
           .has_value();
   return backlog;
 }
 
-std::vector<SpooledEvent> EventSpool::waiting(std::size_t events, std::size_t bytes) {
+std::vector<SpooledEvent> EventSpool::waiting(std::size_t maxEvents, std::size_t maxBytes) {
   const std::lock_guard lock(mutex_);
   std::vector<SpooledEvent> found;
   auto rows = prepare("SELECT id, uuid, date, hit FROM waiting ORDER BY id LIMIT ?");
   if (!rows) return found;
-  rows->bind(1, static_cast<std::int64_t>(events));
+  rows->bind(1, static_cast<std::int64_t>(maxEvents));
   std::size_t size = 0;
   for (auto step = rows->step();; step = rows->step()) {
     if (!step) failed(step.error());
     if (!step || *step == Step::done) return found;
     SpooledEvent event = currentEvent(*rows);
     size += event.hit.size();
-    if (size > bytes && !found.empty()) return found;
+    if (size > maxBytes && !found.empty()) return found;
     found.push_back(std::move(event));
   }
 }
 
-std::optional<SpooledEvent> EventSpool::refused(int triesOfRefused) {
+std::optional<SpooledEvent> EventSpool::refused(int maxRefusals) {
   const std::lock_guard lock(mutex_);
   auto rows =
       prepare("SELECT id, uuid, date, hit FROM refused WHERE times < ? ORDER BY times, id LIMIT 1");
   if (!rows) return std::nullopt;
-  rows->bind(1, static_cast<std::int64_t>(triesOfRefused));
+  rows->bind(1, static_cast<std::int64_t>(maxRefusals));
   const auto step = rows->step();
   if (!step) failed(step.error());
   if (!step || *step == Step::done) return std::nullopt;
@@ -230,7 +231,7 @@ void EventSpool::moveToRefused(std::span<const SpooledEvent> events) {
 }
 
 bool EventSpool::copyToRefused(std::span<const SpooledEvent> events) {
-  // Copied from the line: what has been cleared meanwhile must not come back.
+  // Copied from the table of waiting events: events that were cleared meanwhile must not come back.
   auto copy = prepare(
       "INSERT INTO refused(uuid, date, hit, times)"
       " SELECT uuid, date, hit, 1 FROM waiting WHERE id = ? AND uuid = ?");
@@ -309,13 +310,14 @@ void EventSpool::recountIfShared() {
 // A full spool loses a hundredth at a time, so that most events find room without a search.
 void EventSpool::makeRoom(std::int64_t bytes) {
   const auto isFull = [&] {
-    return waitingEvents_ + refusedEvents_ >= limits_.events || bytes_ + bytes > limits_.bytes;
+    return waitingEvents_ + refusedEvents_ >= limits_.maxEvents ||
+           bytes_ + bytes > limits_.maxBytes;
   };
   if (!isFull()) return;
   recount();
-  const std::int64_t atOnce = std::max<std::int64_t>(limits_.events / 100, 1);
+  const std::int64_t atOnce = std::max<std::int64_t>(limits_.maxEvents / 100, 1);
   while (isFull() && waitingEvents_ + refusedEvents_ > 0) {
-    // A refused event is older than what still waits, but for a few.
+    // With few exceptions, a refused event is older than all that still wait.
     const std::int64_t removed =
         refusedEvents_ > 0 ? removeOldest("refused", atOnce) : removeOldest("waiting", atOnce);
     if (removed == 0) return;
@@ -338,7 +340,7 @@ void EventSpool::drop(std::int64_t count) {
 }
 
 bool EventSpool::removeEach(std::string_view table, std::span<const SpooledEvent> events) {
-  // The number alone may have passed to another event since.
+  // The row's number alone may belong to another event by now.
   auto removal = prepare(fmt::format("DELETE FROM {} WHERE id = ? AND uuid = ?", table));
   if (!removal) return false;
   std::int64_t& counter = table == "waiting" ? waitingEvents_ : refusedEvents_;

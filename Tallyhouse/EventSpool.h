@@ -20,10 +20,10 @@ class SystemLog;
 
 namespace Tallyhouse {
 
-/// How much may wait. Whatever comes on top pushes out the oldest.
+/// How much may wait. A further event pushes out the oldest.
 struct SpoolLimits final {
-  std::int64_t events = 10'000;
-  std::int64_t bytes = 8 << 20;  ///< Of the events' texts.
+  std::int64_t maxEvents = 10'000;
+  std::int64_t maxBytes = 8 << 20;  ///< Of the events' texts.
 };
 
 /// An event in the spool.
@@ -37,12 +37,13 @@ struct SpooledEvent final {
 /// Events on their way, in a file that only the user can read. What `append` has taken survives the
 /// end of the process, but not always a loss of power.
 ///
-/// Fresh events wait in line. One that the server refuses leaves the line, so that it holds up no
-/// other, and is tried alone until it is set aside for good. All of them count towards the limits.
+/// Fresh events wait in line. An event that the server refuses leaves the line, so that it does not
+/// hold up the others, and is tried alone until it is set aside for good. All of them count towards
+/// the limits.
 ///
-/// Any thread. Nothing throws: what goes wrong with the file is told to the system's log once, and
-/// the events that it would have held count as dropped; a file that cannot be opened is tried again
-/// now and then. A damaged file is put beside (".damaged") and a new one begun. Two processes may
+/// Any thread. Nothing throws. A failure of the file is reported to the system's log once, and the
+/// events that it would have held count as dropped. A file that cannot be opened is tried again now
+/// and then. A damaged file is set aside (as ".damaged") and a new one begun. Two processes may
 /// share a file; an event may then be delivered by both.
 class EventSpool final {
  public:
@@ -55,30 +56,31 @@ class EventSpool final {
   EventSpool(const EventSpool&) = delete;
   EventSpool& operator=(const EventSpool&) = delete;
 
-  /// Puts an event at the end of the line and returns how many now wait.
+  /// Puts an event at the end of the line and returns how many events wait now.
   std::int64_t append(std::string_view uuid, Varnel::Platform::Date date, std::string_view hit);
 
-  /// What waits; an event refused `triesOfRefused` times does not.
-  [[nodiscard]] Backlog backlog(int triesOfRefused);
+  /// The waiting events. An event refused `maxRefusals` times does not count.
+  [[nodiscard]] Backlog backlog(int maxRefusals);
 
-  /// The head of the line: at most so many events, and bytes unless the first alone is larger.
-  [[nodiscard]] std::vector<SpooledEvent> waiting(std::size_t events, std::size_t bytes);
-  /// The oldest event refused less than `triesOfRefused` times.
-  [[nodiscard]] std::optional<SpooledEvent> refused(int triesOfRefused);
+  /// The head of the line: at most this many events, and at most this many bytes unless the first
+  /// event alone is larger.
+  [[nodiscard]] std::vector<SpooledEvent> waiting(std::size_t maxEvents, std::size_t maxBytes);
+  /// The oldest event that was refused less than `maxRefusals` times.
+  [[nodiscard]] std::optional<SpooledEvent> refused(int maxRefusals);
 
-  /// Whether they are gone.
+  /// Removes the events. Returns whether they are gone.
   [[nodiscard]] bool removeWaiting(std::span<const SpooledEvent> events);
   [[nodiscard]] bool removeRefused(const SpooledEvent& event);
   /// Takes the events out of the line as refused once.
   void moveToRefused(std::span<const SpooledEvent> events);
   void countRefusal(const SpooledEvent& event);
 
-  /// Empties the spool, and removes what was put beside. While the file does not allow it, nothing
-  /// that it holds is given out and nothing is taken.
+  /// Empties the spool, and removes files that were set aside. Until the file allows that, none of
+  /// its events is given out and none is taken.
   void clear();
 
-  /// Moves what was appended into the file proper. Takes as long as the disk does; `append` does
-  /// not wait for it.
+  /// Moves appended events from the log into the file itself. Takes as long as the disk does;
+  /// `append` does not wait for it.
   void checkpoint();
 
   /// Counts an event that could not even be appended.
@@ -121,7 +123,7 @@ class EventSpool final {
   std::int64_t waitingEvents_ = 0;
   std::int64_t refusedEvents_ = 0;
   std::int64_t bytes_ = 0;
-  std::int64_t foreignChanges_ = 0;  ///< A number that the other connections' changes change.
+  std::int64_t foreignChanges_ = 0;  ///< Changes with every change by another connection.
   std::int64_t unsavedDropped_ = 0;
   bool mustClear_ = false;
   bool hasReported_ = false;

@@ -9,14 +9,14 @@
 
 namespace Tallyhouse {
 
-/// Whose events they are.
+/// Says whose events they are.
 struct AnalyticsIdentity final {
   std::string trackingID;  ///< The property that counts them.
   std::string clientID;    ///< The installation that sends them.
 };
 
 /// The event as one line of the measurement protocol, version 1: "v=1&t=event&tid=…&ec=…&cd1=…".
-/// What is known only when it is sent is still missing.
+/// The facts that are known only on sending are still missing.
 [[nodiscard]] std::string encodedHit(const AnalyticsEvent& event,
                                      const AnalyticsIdentity& identity);
 
@@ -25,7 +25,7 @@ struct AnalyticsIdentity final {
 void appendToBatch(std::string& batch, std::string_view hit, std::chrono::milliseconds age,
                    std::string_view uuid);
 
-/// The most bytes that servers take as one hit, and room for what `appendToBatch` adds.
-inline constexpr std::size_t longestHit = 8192 - 96;
+/// The largest hit that servers accept, less the room for what `appendToBatch` adds.
+inline constexpr std::size_t maxHitBytes = 8192 - 96;
 
 }  // namespace Tallyhouse

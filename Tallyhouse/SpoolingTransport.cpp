@@ -27,7 +27,7 @@ std::function<double()> randomNumbers() {
   };
 }
 
-// While the thread cannot deliver, it still moves what was appended into the file now and then.
+// While the thread cannot deliver, it still moves appended events into the file now and then.
 constexpr std::int64_t appendsUntilCheckpoint = 1000;
 
 }  // namespace
@@ -35,9 +35,9 @@ constexpr std::int64_t appendsUntilCheckpoint = 1000;
 struct SpoolingTransport::Parts {
   Parts(Ports ports, Configuration configuration)
       : identity{std::move(configuration.trackingID), std::move(configuration.clientID)},
-        batchEvents(static_cast<std::int64_t>(configuration.policy.batchEvents)),
+        maxBatchEvents(static_cast<std::int64_t>(configuration.policy.maxBatchEvents)),
         spool({ports.appendFiles, ports.systemLog}, std::move(configuration.spoolPath),
-              {.events = configuration.mostEvents, .bytes = configuration.mostBytes}),
+              {.maxEvents = configuration.maxEvents, .maxBytes = configuration.maxBytes}),
         worker(ports.clock, spool,
                Delivery({ports.clock, ports.httpClient}, spool,
                         {.url = configuration.endpoint.absoluteString(),
@@ -45,7 +45,7 @@ struct SpoolingTransport::Parts {
                         configuration.policy, randomNumbers())) {}
 
   const AnalyticsIdentity identity;
-  const std::int64_t batchEvents;
+  const std::int64_t maxBatchEvents;
   EventSpool spool;
   DeliveryWorker worker;
 };
@@ -70,21 +70,21 @@ SpoolingTransport::~SpoolingTransport() = default;
 void SpoolingTransport::start() noexcept try {
   parts_->worker.resume();
 } catch (const std::exception&) {
-  // The system has no thread left for us. The events stay in the spool for a better time.
+  // The system grants no thread. The events stay in the spool for a later start.
 }
 
 void SpoolingTransport::accept(const AnalyticsEvent& event) noexcept try {
   const std::string hit = encodedHit(event, parts_->identity);
-  if (hit.size() > longestHit) {
+  if (hit.size() > maxHitBytes) {
     parts_->spool.countDropped();
     return;
   }
   const std::int64_t waiting = parts_->spool.append(event.uuid, event.date, hit);
-  // In between the thread sleeps on: it will send these with the others.
-  if (waiting == 1 || waiting == parts_->batchEvents || waiting % appendsUntilCheckpoint == 0)
+  // In between the thread sleeps on, and will send these events with the others.
+  if (waiting == 1 || waiting == parts_->maxBatchEvents || waiting % appendsUntilCheckpoint == 0)
     parts_->worker.wake();
 } catch (const std::exception&) {
-  // Out of memory: an event less, but an application that goes on.
+  // Out of memory. The event is lost and the application goes on.
 }
 
 void SpoolingTransport::discardAll() noexcept try {

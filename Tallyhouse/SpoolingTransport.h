@@ -23,8 +23,8 @@ namespace Tallyhouse {
 
 /// Posts events to a server, by way of a file: an event that was accepted survives the end of the
 /// process and weeks without a network, though not always a loss of power. A thread of its own
-/// sends batches and deletes what the server has taken; what gets lost on the way is sent again
-/// under the same UUID.
+/// sends batches and deletes what the server has taken; an event that gets lost on the way is sent
+/// again under the same UUID.
 ///
 ///     auto transport = SpoolingTransport::make({
 ///         .endpoint = *URL::parse("https://collect.quennel.example/batch"),
@@ -49,8 +49,8 @@ class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
     std::string clientID;    ///< The installation that sends them.
     std::string spoolPath;   ///< The user's alone. Missing folders are made.
     PlainHTTP plainHTTP = PlainHTTP::refused;
-    std::int64_t mostEvents = 10'000;  ///< That may wait; then the oldest is dropped.
-    std::int64_t mostBytes = 8 << 20;
+    std::int64_t maxEvents = 10'000;  ///< How many may wait; then the oldest is dropped.
+    std::int64_t maxBytes = 8 << 20;
     DeliveryPolicy policy = {};
   };
 
@@ -66,7 +66,7 @@ class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
   void accept(const AnalyticsEvent& event) noexcept override;
   void discardAll() noexcept override;
 
-  /// Sends what waits without lingering, and waits for it: until all is delivered, an attempt
+  /// Sends the waiting events without lingering, and waits until all are delivered, an attempt
   /// fails, or the time is over. Returns whether all is delivered; false without consent.
   bool drain(std::chrono::milliseconds timeout);
 

@@ -6,9 +6,9 @@
 namespace Varnel::Platform {
 
 /// Has `function` called in every child that the process forks from now on, before `fork` returns
-/// there. The child is a copy with the forking thread alone: what other threads did or held stands
-/// still for ever, and `function` leaves it alone. On a system without such children it is never
-/// called.
+/// there. Only the forking thread lives on in the child. Whatever other threads were doing or
+/// holding stays so for ever, and `function` must not touch it. On a system without such children
+/// it is never called.
 VARNEL_API void callInForkedChildren(void (*function)());
 
 }  // namespace Varnel::Platform

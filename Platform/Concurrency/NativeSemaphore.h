@@ -20,7 +20,8 @@ class VARNEL_API NativeSemaphore final {
   void post();
   void wait();
 
-  /// False when the wall clock reached `deadline` first. A count that is there is taken even then.
+  /// False when the wall clock reached `deadline` first. A count that is already there is taken
+  /// even then.
   [[nodiscard]] bool waitUntil(Date deadline);
 
  private:

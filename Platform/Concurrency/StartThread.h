@@ -15,8 +15,9 @@ namespace Varnel::Platform {
 ///     worker_ = Platform::startThread("volume-watch", [this] { run(); });
 ///
 /// The thread takes no part in the process's signals: all but those of its own faults are blocked,
-/// so that a host that waits for a signal, or handles it on a thread of its choice, alone gets it.
-/// Threads and programs that are started from it inherit that, unless their starter says otherwise.
+/// so that only the host gets them, whether it waits for a signal or handles it on a thread of its
+/// choice. Threads and programs that are started from this thread inherit that, unless their
+/// starter says otherwise.
 ///
 /// Throws `std::system_error` when the system has no more threads. `body` must not throw.
 [[nodiscard]] VARNEL_API std::thread startThread(std::string name, std::function<void()> body);

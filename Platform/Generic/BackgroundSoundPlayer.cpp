@@ -14,10 +14,10 @@
 
 namespace Varnel::Platform {
 
-// Runs jobs one after the other, on a thread that is there while there are any.
+// Runs jobs one after the other, on a thread that exists while there are jobs.
 class BackgroundSoundPlayer::Worker final {
  public:
-  /// Gets the output; null when there is none.
+  /// Given the output; null when there is none.
   using Job = std::function<void(SoundOutput* output)>;
 
   explicit Worker(OutputMaker makeOutput) : makeOutput_(std::move(makeOutput)) {}
@@ -25,7 +25,7 @@ class BackgroundSoundPlayer::Worker final {
   Worker(const Worker&) = delete;
   Worker& operator=(const Worker&) = delete;
 
-  /// False when there is no thread to be had: the job then waits for the next one.
+  /// False when the system grants no thread: the job then waits for the next one.
   bool post(Job job) try {
     const std::lock_guard lock(mutex_);
     jobs_.push_back(std::move(job));
@@ -42,7 +42,7 @@ class BackgroundSoundPlayer::Worker final {
 
  private:
   void run() {
-    // Known to this thread alone, and to those that come after it.
+    // Used by this thread alone, and by the threads that follow it.
     if (makeOutput_) output_ = std::exchange(makeOutput_, nullptr)();
     while (Job job = next()) job(output_.get());
   }
@@ -115,7 +115,7 @@ class BackgroundSoundPlayer::Sound final : public PlayableSound,
     std::unique_ptr<SoundOutput::Playback> playback;  // The worker's.
   };
 
-  // The end of an earlier play means nothing.
+  // The end of an earlier play is ignored.
   void end(const std::shared_ptr<Play>& play, bool finished) {
     if (!play || play != current_) return;
     stop();

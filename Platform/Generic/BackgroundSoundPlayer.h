@@ -12,7 +12,7 @@ namespace Varnel::Platform {
 
 class MainQueue;
 
-/// Plays sounds into an output whose operations take their time, on a thread of its own.
+/// Plays sounds into an output with slow operations, on a thread of its own.
 ///
 ///     BackgroundSoundPlayer player(mainQueue, [] { return std::make_unique<Output>(); });
 ///
@@ -24,7 +24,7 @@ class BackgroundSoundPlayer final : public SoundPlayer {
   using OutputMaker = std::function<std::unique_ptr<SoundOutput>()>;
 
   BackgroundSoundPlayer(MainQueue& mainQueue, OutputMaker makeOutput);
-  /// Waits for what the thread has in hand.
+  /// Waits until the thread has finished its present job.
   ~BackgroundSoundPlayer() override;
   BackgroundSoundPlayer(const BackgroundSoundPlayer&) = delete;
   BackgroundSoundPlayer& operator=(const BackgroundSoundPlayer&) = delete;

@@ -9,7 +9,7 @@
 
 namespace Varnel::Platform {
 
-// Where the Info.plist of an executable or library is; absent when there is none. Any thread; reads
+// Where an executable or library has its Info.plist; absent when there is none. Any thread; reads
 // folders.
 
 /// The folder of this path, as in "share/varnel-0.1", below the nearest folder above the image that

@@ -7,7 +7,7 @@
 
 namespace Varnel::Platform {
 
-/// An application of which only its host knows whether it is in front. Any thread.
+/// An application whose host alone knows whether it is in front. Any thread.
 class HostedApplication final : public Application {
  public:
   [[nodiscard]] bool isActive() const override { return isActive_; }

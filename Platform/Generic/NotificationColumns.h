@@ -13,10 +13,10 @@ inline constexpr int notificationColumnCount = 12;
 inline constexpr const char* notificationColumns =
     "identifier, title, text, action, other, date, years, months, days, hours, minutes, seconds";
 
-/// Gives the parameters from `first` on the content.
+/// Binds the content to the parameters from `first` on.
 void bindNotification(SQLiteStatement& statement, int first, const UserNotification& notification);
 
-/// The content in the columns from `first` on. Whatever they hold, it is some notification.
+/// The content in the columns from `first` on. Any content gives a notification.
 [[nodiscard]] UserNotification readNotification(SQLiteStatement& row, int first);
 
 }  // namespace Varnel::Platform

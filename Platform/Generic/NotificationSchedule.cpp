@@ -8,7 +8,7 @@
 namespace Varnel::Platform {
 namespace {
 
-// Processes in different time zones see one date this far apart at the most.
+// Processes in different time zones see one date at most this far apart.
 constexpr std::chrono::days sameMoment(2);
 
 // The dates of one schedule by number, from the original one, 0. They ascend; a date beyond the
@@ -38,9 +38,9 @@ class Dates final {
 
   // The first number from `start` whose date is after `now`.
   std::int64_t firstAfter(Date now, std::int64_t start) const {
-    constexpr auto farthest = std::numeric_limits<std::int64_t>::max() / 4;
+    constexpr auto maxNumber = std::numeric_limits<std::int64_t>::max() / 4;
     std::int64_t step = 1;
-    while (start + step < farthest && !isAfter(start + step, now)) step *= 2;
+    while (start + step < maxNumber && !isAfter(start + step, now)) step *= 2;
     std::int64_t low = start;
     for (std::int64_t high = start + step; low < high;) {
       const std::int64_t middle = low + (high - low) / 2;

@@ -16,8 +16,8 @@ class Calendar;
 struct NotificationSchedule final {
   std::string key;  ///< Names it in the store.
   UserNotification notification;
-  /// Where the user was when it was scheduled: wherever the user goes, it comes at the same time
-  /// by the clocks there.
+  /// The time zone in which it was scheduled. Wherever the user travels, it comes at the same time
+  /// by the local clocks.
   std::string timeZone;
   std::int64_t deliveryCount = 0;
 
@@ -34,14 +34,15 @@ struct ScheduleDecision final {
 };
 
 /// The date of the next delivery, by the user's present calendar; absent when the calendar does not
-/// reach it: then it never comes.
+/// reach that far: then the delivery never comes.
 [[nodiscard]] std::optional<Date> nextDate(const NotificationSchedule& schedule,
                                            const Calendar& calendar);
 
 /// Whether the schedule is due, and how it goes on. Periods that passed unseen count as one.
 ///
-/// A clock that is set back repeats nothing that has been delivered. Only when it is set back by
-/// more than a period and some days was it wrong before, and the schedule goes on from the present.
+/// A clock that is set back repeats nothing that has been delivered. A clock that is set back by
+/// more than a period and some days must have been wrong before: then the schedule goes on from the
+/// present.
 [[nodiscard]] ScheduleDecision decide(const NotificationSchedule& schedule, Date now,
                                       const Calendar& calendar);
 

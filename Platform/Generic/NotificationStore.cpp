@@ -15,8 +15,8 @@ namespace {
 
 using Failure = std::optional<PlatformError>;
 
-// The delivered list keeps the latest; nobody is obliged to remove what was delivered.
-constexpr int deliveredLimit = 100;
+// The delivered list keeps the latest notifications, because nobody has to remove any.
+constexpr int maxDelivered = 100;
 
 std::string schema() {
   constexpr const char* content =
@@ -31,7 +31,7 @@ std::string schema() {
       content, notificationColumns);
 }
 
-// An identifier names its notification; others get a name that nobody else has.
+// A notification is known by its identifier. One without an identifier gets a unique name.
 std::string keyOf(const UserNotification& notification) {
   return notification.identifier ? "identifier " + *notification.identifier
                                  : "unique " + randomUUIDString();
@@ -112,7 +112,7 @@ Failure insertDelivered(SQLiteDatabase& database, DeliveredNotification& deliver
   return run(database,
              "DELETE FROM delivered WHERE key NOT IN "
              "(SELECT key FROM delivered ORDER BY delivered DESC, rowid DESC LIMIT ?)",
-             [](SQLiteStatement& statement) { statement.bind(1, std::int64_t{deliveredLimit}); });
+             [](SQLiteStatement& statement) { statement.bind(1, std::int64_t{maxDelivered}); });
 }
 
 bool anythingChanges(const NotificationSchedule& schedule, Date now, const Calendar& calendar) {
@@ -156,7 +156,7 @@ void NotificationStore::removeSchedule(const std::string& key) {
 
 std::vector<DeliveredNotification> NotificationStore::claimDue(Date now, const Calendar& calendar) {
   std::vector<DeliveredNotification> claimed;
-  // Whoever watches the file is not woken for nothing.
+  // Processes that watch the file are not woken for nothing.
   const auto known = schedules();
   if (std::none_of(known.begin(), known.end(), [&](const NotificationSchedule& schedule) {
         return anythingChanges(schedule, now, calendar);

@@ -30,8 +30,8 @@ struct DeliveredNotification final {
 ///
 ///     for (const auto& delivered : store.claimDue(now, calendar)) show(delivered);
 ///
-/// One thread at a time; several processes may share the file. What fails is told to the system's
-/// log and counts as not done, or as nothing there.
+/// One thread at a time; several processes may share the file. A failure is reported to the
+/// system's log, and counts as "not done" or "nothing there".
 class NotificationStore final {
  public:
   NotificationStore(std::filesystem::path file, SystemLog& systemLog);

@@ -22,12 +22,13 @@ bool isDamage(const PlatformError& error) {
   return code == SQLITE_CORRUPT || code == SQLITE_NOTADB;
 }
 
-// Another process is at work in the file, longer than anybody waits.
+// Another process has kept the file locked for longer than we wait.
 bool isBusy(const PlatformError& error) {
   return (error.code() & resultCodeMask) == SQLITE_BUSY;
 }
 
-// Nobody else may read what the user is told, nor files that stand beside it for a while.
+// Only the user may read the notifications. That includes the library's temporary files beside the
+// database.
 void makeForUserAlone(const fs::path& file) {
   std::error_code ignored;
   if (!fs::exists(file.parent_path(), ignored)) {
@@ -38,8 +39,8 @@ void makeForUserAlone(const fs::path& file) {
   fs::permissions(file, fs::perms::owner_read | fs::perms::owner_write, ignored);
 }
 
-// What is wrong with a file: it is no database, has pages that do not fit or tables that are not
-// those of the schema.
+// Damage: the file is not a database, its pages do not fit, or its tables are not those of the
+// schema.
 std::optional<PlatformError> check(SQLiteDatabase& database, const std::string& schema) {
   const auto damaged = [](const std::string& message) {
     return PlatformError("SQLite", SQLITE_CORRUPT,
@@ -65,7 +66,7 @@ std::optional<PlatformError> transaction(SQLiteDatabase& database,
   if (auto error = database.execute("BEGIN IMMEDIATE")) return error;
   auto error = work(database);
   if (!error) error = database.execute("COMMIT");
-  // It fails where the failure has ended the transaction already.
+  // This fails if the error has already ended the transaction.
   if (error) static_cast<void>(database.execute("ROLLBACK"));
   return error;
 }

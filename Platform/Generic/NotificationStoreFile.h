@@ -15,15 +15,15 @@ class SystemLog;
 /// The database file of a notification store, for its user alone, opened on first use.
 ///
 /// A damaged file is set aside (with ".damaged" behind its name) and a fresh one made; where no
-/// file can be had at all, memory serves as long as the object lives. Both are told to the system's
-/// log. A file that somebody else renamed or removed is made anew; one that another process keeps
-/// locked makes the work fail, to be tried again. One thread at a time; several processes may share
-/// the file.
+/// file can be made, the database is in memory for the life of the object. Both are reported to the
+/// system's log. A file that somebody else renamed or removed is made anew. While another process
+/// keeps the file locked, work fails and can be tried again. One thread at a time; several
+/// processes may share the file.
 class NotificationStoreFile final {
  public:
   using Work = std::function<std::optional<PlatformError>(SQLiteDatabase&)>;
 
-  /// The schema makes the tables that are missing and fails where they are not as they must be.
+  /// The schema creates missing tables and fails when existing ones differ from it.
   NotificationStoreFile(std::filesystem::path file, std::string schema, SystemLog& systemLog);
 
   /// Does the work; true if it succeeded.

@@ -16,7 +16,7 @@ std::int64_t secondsOf(Date date) {
   return std::chrono::floor<std::chrono::seconds>(date).time_since_epoch().count();
 }
 
-// An identifier is the name of one folder and leads nowhere else.
+// An identifier must be the name of one folder, not a path to another place.
 bool isFolderName(const std::string& name) {
   return !name.empty() && name != "." && name != ".." && name.find('/') == std::string::npos;
 }

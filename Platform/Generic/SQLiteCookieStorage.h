@@ -15,7 +15,8 @@ class Clock;
 /// SQLite file, expiry in seconds since 1970. An application's own is `APPLICATION/cookies.sqlite`
 /// below the data folder, a group's `group-containers/GROUP/cookies.sqlite`.
 ///
-/// Files are opened for each call and only read; who writes them meanwhile is waited for briefly.
+/// Files are opened for each call and only read. While another process writes, the call waits
+/// briefly.
 class SQLiteCookieStorage final : public CookieStorage {
  public:
   SQLiteCookieStorage(std::filesystem::path dataFolder, std::string application,

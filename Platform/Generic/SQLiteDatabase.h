@@ -32,7 +32,7 @@ class SQLiteDatabase final {
   };
 
   /// Opens with the library's defaults and nothing else: the file is created when missing, locks
-  /// are not waited for, and whether it is a database shows when something is prepared.
+  /// are not waited for, and only the first statement shows whether it is a database.
   [[nodiscard]] static Result<SQLiteDatabase> open(const std::string& path);
 
   /// Opens for this kind of access.
@@ -44,7 +44,7 @@ class SQLiteDatabase final {
   /// Compiles one statement.
   [[nodiscard]] Result<SQLiteStatement> prepare(std::string_view sql);
 
-  /// Runs statements, separated by ";", that return nothing of interest. The error, or none.
+  /// Runs statements, separated by ";", and ignores their rows. Returns the error, or none.
   [[nodiscard]] std::optional<PlatformError> execute(const std::string& sql);
 
   /// The number of rows that the last INSERT, UPDATE or DELETE touched.

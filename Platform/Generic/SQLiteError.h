@@ -7,8 +7,8 @@ struct sqlite3;
 
 namespace Varnel::Platform {
 
-/// What the connection says of its last failure, whose result code was `status`. The connection may
-/// be null: then the library was out of memory.
+/// The connection's last failure as an error; `status` is its result code. The connection may be
+/// null: then the library was out of memory.
 [[nodiscard]] PlatformError sqliteError(sqlite3* connection, int status);
 
 }  // namespace Varnel::Platform

@@ -22,7 +22,8 @@ namespace Varnel::Platform {
 ///       use(statement.text(0));
 ///     }
 ///
-/// One thread at a time. What a column returns lives until the next step, reset or end.
+/// One thread at a time. A column's value lives until the next step or reset, or the end of the
+/// statement.
 class SQLiteStatement final {
  public:
   enum class Step { row, done };

@@ -30,7 +30,7 @@ Banner bannerOf(const UserNotification& notification) {
 }  // namespace
 
 // Hears of the banners that this process has shown, by the keys of their notifications. It ends
-// with its center, and whoever still holds it weakly finds it gone.
+// with its center; weak references to it then find it gone.
 class ScheduledNotificationCenter::Banners final : public NotificationServer::Observer {
  public:
   explicit Banners(ScheduledNotificationCenter& center) : center_(center) {}
@@ -150,7 +150,7 @@ void ScheduledNotificationCenter::deliver(const DeliveredNotification& delivered
   else
     banners_->show(delivered);
 
-  // Told later, so that those who make the delegate at launch can still subscribe to its events.
+  // Told later, so that a host that makes the delegate at launch can still subscribe to its events.
   ports_.mainQueue.post([banners = std::weak_ptr(banners_), listener = delegate_,
                          notification = delivered.notification] {
     const auto center = banners.lock();
@@ -159,7 +159,7 @@ void ScheduledNotificationCenter::deliver(const DeliveredNotification& delivered
   });
 }
 
-// The user's, wherever that is by now.
+// The user's present time zone.
 Calendar ScheduledNotificationCenter::calendar() const {
   return {ports_.userLocale, ports_.timeZones};
 }
@@ -172,7 +172,7 @@ void ScheduledNotificationCenter::awaitNext() {
       if (const auto date = nextDate(schedule, present); date && (!next || *date < *next))
         next = date;
   }
-  // What is due and still there could not be claimed: the store is out of order for now.
+  // What is still due could not be claimed: the store does not work at present.
   const Date now = ports_.clock.now();
   const bool isOutOfOrder = !delegate_.expired() && store_->isOutOfOrder();
   if (isOutOfOrder || (next && *next <= now)) next = now + retryDelay;

@@ -27,7 +27,7 @@ struct DeliveredNotification;
 /// processes of the product share. Main thread only.
 class VARNEL_API ScheduledNotificationCenter final : public UserNotificationCenter {
  public:
-  /// All outlive the center, which is the only user of server and timer.
+  /// All outlive the center. No one else uses the server and the timer.
   struct Ports {
     Clock& clock;
     UserLocale& userLocale;
@@ -53,8 +53,8 @@ class VARNEL_API ScheduledNotificationCenter final : public UserNotificationCent
   void removeDeliveredNotification(const UserNotification& notification) override;
   [[nodiscard]] bool isBusy() const override { return ports_.notificationServer.isBusy(); }
 
-  /// To be called when something else than this center may have changed what is due and when: the
-  /// user's time zone, or another process the store.
+  /// Call this when something outside may have changed what is due: the user's time zone has
+  /// changed, or another process has changed the store.
   void recheck();
 
  private:

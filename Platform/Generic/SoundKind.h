@@ -5,7 +5,7 @@
 
 namespace Varnel::Platform {
 
-/// Whether a file begins like one that holds sound, perhaps beside a film.
+/// Whether a file begins like one that holds sound, with or without a film.
 [[nodiscard]] bool looksLikeSound(std::string_view bytes);
 
 }  // namespace Varnel::Platform

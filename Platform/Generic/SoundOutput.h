@@ -7,8 +7,8 @@
 
 namespace Varnel::Platform {
 
-/// What a `BackgroundSoundPlayer` plays its sounds into. All operations may take their time; one
-/// thread at a time.
+/// What a `BackgroundSoundPlayer` plays its sounds into. All operations may be slow. One thread at
+/// a time.
 class SoundOutput {
  public:
   /// A sound that is being played. Destroying it is silence, and `ended` is called no more.
@@ -16,12 +16,13 @@ class SoundOutput {
    public:
     virtual ~Playback() = default;
   };
-  /// Told about the end, and whether it was the sound's own. From any thread; may call twice.
+  /// Called at the end, with whether the sound ended by itself. From any thread; may be called
+  /// twice.
   using Ended = std::function<void(bool finished)>;
 
   virtual ~SoundOutput() = default;
 
-  /// Starts to play the file with these bytes; null when it cannot.
+  /// Starts to play the file with these bytes; null when that fails.
   [[nodiscard]] virtual std::unique_ptr<Playback> start(const std::string& bytes, Ended ended) = 0;
 };
 

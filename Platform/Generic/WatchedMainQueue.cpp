@@ -53,7 +53,7 @@ void WatchedMainQueue::watch() try {
           "A host whose main loop does not run it has to, by its descriptor.");
   });
 } catch (const std::system_error&) {
-  // Without a thread to spare nothing is said.
+  // Without a free thread nothing is reported.
 }
 
 }  // namespace Varnel::Platform

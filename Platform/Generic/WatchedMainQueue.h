@@ -14,13 +14,13 @@ namespace Varnel::Platform {
 
 class SystemLog;
 
-/// A main queue that says so in the system's log, once, when nobody runs it: a host's loop may be
-/// one that knows nothing of it, and whatever was posted would wait for ever without a word.
+/// A main queue that reports to the system's log, once, when nobody runs it. The host's loop may
+/// not know of the queue, and then posted blocks would silently wait for ever.
 ///
 ///     WatchedMainQueue queue(makeMainQueue(), systemLog);
 ///
-/// The first post starts a thread, which ends when the first block runs or the patience does. Later
-/// posts cost nothing more.
+/// The first post starts a thread, which ends when the first block runs or `patience` is over.
+/// Later posts cost nothing more.
 class VARNEL_API WatchedMainQueue final : public MainQueue {
  public:
   /// The log outlives the queue.

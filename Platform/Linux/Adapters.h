@@ -54,8 +54,8 @@ class MountTable;
 [[nodiscard]] std::unique_ptr<StandardOutput> makeStandardOutput();
 [[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog,
                                                            MainQueue& mainQueue);
-/// The desktop shows the banners as the source's. `patience` is how long a connection to the
-/// session bus may take.
+/// The desktop shows the banners under the source's name. `patience` is how long a connection to
+/// the session bus may take.
 [[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(
     SystemLog& systemLog, const NotificationSource& source,
     std::chrono::milliseconds patience = std::chrono::seconds(10));

@@ -48,7 +48,7 @@ std::unique_ptr<CookieStorage> makeCookieStorage(const Clock& clock) {
 }  // namespace
 
 const Ports& systemPorts() {
-  // The adapters own it together, and they are kept.
+  // The adapters share it, and they are never destroyed.
   static const auto mountTable = Linux::makeMountTable();
   static Clock& clock = keep(POSIX::makeClock());
   static SystemLog& systemLog = keep(POSIX::makeSystemLog());

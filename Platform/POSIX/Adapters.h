@@ -20,7 +20,7 @@ namespace Varnel::Platform::POSIX {
 
 [[nodiscard]] std::unique_ptr<AppendFiles> makeAppendFiles();
 [[nodiscard]] std::unique_ptr<Clock> makeClock();
-/// Without the module of libcurl every post fails.
+/// Every post fails when the module of libcurl is missing.
 [[nodiscard]] std::unique_ptr<HTTPClient> makeHTTPClient();
 [[nodiscard]] std::unique_ptr<SecurityScope> makeSecurityScope();
 [[nodiscard]] std::unique_ptr<SystemLog> makeSystemLog();

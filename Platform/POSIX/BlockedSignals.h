@@ -11,7 +11,7 @@ namespace Varnel::Platform::POSIX {
 ///     const POSIX::BlockedSignals blocked;
 ///     connection = libraryThatStartsThreads();
 ///
-/// Signals of a thread's own faults stay as they are: a crash handler of the host is to see them.
+/// Signals of a thread's own faults are not blocked, so that the host's crash handler sees them.
 class BlockedSignals final {
  public:
   BlockedSignals() {

@@ -9,8 +9,8 @@
 namespace Varnel::Platform::POSIX {
 
 /// Owns a file descriptor; -1 stands for none. It is never one of the three standard streams: where
-/// a host has closed those, the system gives their numbers to what is opened next, which would then
-/// get what others print. The number may so be another than the one given.
+/// a host has closed those, the system gives their numbers to files that are opened next, and other
+/// code would print into them. So the number may differ from the given one.
 class FileDescriptor final {
  public:
   FileDescriptor() = default;

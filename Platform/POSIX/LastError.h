@@ -6,7 +6,7 @@
 
 namespace Varnel::Platform::POSIX {
 
-/// What stopped the system call just made.
+/// The error of the system call that has just failed.
 [[nodiscard]] inline std::error_code lastError() {
   return {errno, std::generic_category()};
 }

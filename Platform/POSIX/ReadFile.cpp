@@ -13,13 +13,14 @@ namespace Varnel::Platform {
 Result<std::string, std::error_code> readFile(const std::string& path, std::size_t maxSize) {
   constexpr std::size_t step = 1u << 16;
   struct stat facts {};
-  // Asked before the opening, which waits for a pipe's writer and wakes devices.
+  // Checked before the file is opened: opening waits for a pipe's writer, and wakes devices.
   if (::stat(path.c_str(), &facts) != 0) return POSIX::lastError();
   if (!S_ISREG(facts.st_mode)) return std::make_error_code(std::errc::invalid_argument);
   const POSIX::FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC));
   if (!file) return POSIX::lastError();
 
-  // Not as many as the file's size: it may grow, and files of the kernel have none.
+  // Read to the end instead of to the file's size: it may grow, and the kernel's files have no
+  // size.
   std::string bytes;
   for (;;) {
     const std::size_t size = bytes.size();

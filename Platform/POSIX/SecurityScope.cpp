@@ -15,7 +15,7 @@ class FileRights final : public SecurityScope {
  public:
   bool startAccessing(const URL& url) override {
     const std::string path = url.path();
-    // The system would look up what stands before the zero.
+    // The system would look up only the part before the zero.
     return path.find('\0') == std::string::npos && ::access(path.c_str(), R_OK) == 0;
   }
   void stopAccessing(const URL&) override {}

@@ -38,12 +38,13 @@ std::optional<std::string> environmentVariable(const char* name) {
   return value && *value ? std::optional<std::string>(value) : std::nullopt;
 }
 
-// A relative home would be another folder wherever the process goes.
+// A relative home would change with the working directory.
 std::string homeOr(const std::optional<std::string>& path, std::string_view fallback) {
   return withoutTrailingSlashes(path && path->front() == '/' ? *path : fallback);
 }
 
-// A user without a record (a bare container) still has the environment; the root folder comes last.
+// For a user without a record (in a bare container) the environment serves, and at last the root
+// folder.
 class PasswdAccount final : public UserAccount {
  public:
   std::string homeFolder() const override {

@@ -28,7 +28,7 @@ std::string identifierFrom(std::string_view posixName) {
 std::string firstIdentifier(std::initializer_list<const char*> variables) {
   for (const char* variable : variables) {
     const std::string_view value = environment(variable);
-    // POSIX: the first variable that is set decides, even when it says "C".
+    // POSIX: the first variable that is set decides, even when it is "C".
     if (!value.empty()) return identifierFrom(value);
   }
   return {};

@@ -10,12 +10,12 @@ class VARNEL_API Application {
  public:
   virtual ~Application() = default;
 
-  /// Whether the application is in front. Where the system does not tell, it is not until the host
-  /// says so.
+  /// Whether the application is in front. Where the system does not tell, the answer is no until
+  /// the host calls `setActive`.
   [[nodiscard]] virtual bool isActive() const = 0;
 
-  /// What a host calls when its windows come to the front or leave it. Has no effect where the
-  /// system tells.
+  /// To be called by the host when its windows come to the front or leave it. Has no effect where
+  /// the system itself tells.
   virtual void setActive(bool isActive) = 0;
 };
 

@@ -8,7 +8,7 @@ namespace Varnel::Platform {
 
 /// Tells the wall-clock time. Any thread.
 ///
-/// Tests hand in a `SimulatedClock`, which stands still until it is moved.
+/// Tests use a `SimulatedClock`, which stands still until it is moved.
 class VARNEL_API Clock {
  public:
   virtual ~Clock() = default;

@@ -30,7 +30,7 @@ class VARNEL_API CookieStorage {
   /// The cookies of this application's own store that have not expired, in the store's order.
   [[nodiscard]] virtual std::vector<Cookie> cookies() = 0;
 
-  /// The same of the store shared by the group with this identifier.
+  /// The same for the store shared by the group with this identifier.
   [[nodiscard]] virtual std::vector<Cookie> cookiesOfGroupContainer(
       const std::string& identifier) = 0;
 };

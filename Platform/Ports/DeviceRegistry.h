@@ -17,7 +17,7 @@ class VARNEL_API RegistryEntry {
  public:
   virtual ~RegistryEntry() = default;
 
-  /// The value of one property of this entry alone.
+  /// The value of one of this entry's own properties.
   [[nodiscard]] virtual std::optional<PropertyValue> property(std::string_view name) const = 0;
 
   /// All properties; absent when they cannot be read.

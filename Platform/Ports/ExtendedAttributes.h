@@ -16,8 +16,8 @@ class VARNEL_API ExtendedAttributes {
   virtual ~ExtendedAttributes() = default;
 
   /// The bytes of the attribute `name` of the file or folder at `path`; symbolic links are
-  /// followed. Absent when the file has no such attribute. Failed (generic category) when there is
-  /// no such file, it may not be read, or its file system keeps no attributes.
+  /// followed. Absent when the file has no such attribute. Failed (generic category) when the file
+  /// does not exist or may not be read, or when its file system has no attributes.
   [[nodiscard]] virtual Result<std::optional<std::string>, std::error_code> value(
       const std::string& path, const std::string& name) = 0;
 };

@@ -11,7 +11,7 @@
 
 namespace Varnel::Platform {
 
-/// What is posted, and where to.
+/// The content of a post, and where it goes.
 struct HTTPPost final {
   std::string url;  ///< Percent-encoded.
   std::string contentType;
@@ -19,7 +19,7 @@ struct HTTPPost final {
   bool allowsPlainHTTP = false;  ///< Otherwise anything but https fails.
 };
 
-/// What the server answered. Its content is of no interest.
+/// The server's answer, without its content.
 struct HTTPResponse final {
   int status = 0;
   std::optional<std::chrono::seconds> retryAfter;  ///< From now, if the server asks for a pause.
@@ -36,8 +36,8 @@ class VARNEL_API HTTPClient {
   virtual ~HTTPClient() = default;
 
   /// Posts and waits for the answer: for some 30 seconds, or until `stop` is requested. The
-  /// server's certificate must be good. Redirections are not followed. Once a final status has come
-  /// that is the answer, whatever becomes of the content. What is for this machine itself never
+  /// server's certificate must be good. Redirections are not followed. The final status, once it
+  /// has come, is the answer, whatever becomes of the content. A post to this machine itself never
   /// goes through a proxy.
   [[nodiscard]] virtual Result<HTTPResponse, HTTPFailure> post(const HTTPPost& request,
                                                                std::stop_token stop) = 0;

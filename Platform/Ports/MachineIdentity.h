@@ -10,9 +10,9 @@
 
 namespace Varnel::Platform {
 
-/// What distinguishes this machine from others. Any thread; calls read kernel tables and small
-/// files. It stands beside `DeviceRegistry` rather than in it: half of it is no device anywhere but
-/// on the one system whose registry knows everything.
+/// The facts that distinguish this machine from others. Any thread; calls read kernel tables and
+/// small files. It is a port beside `DeviceRegistry`, because on most systems half of these facts
+/// belong to no device.
 class VARNEL_API MachineIdentity {
  public:
   virtual ~MachineIdentity() = default;

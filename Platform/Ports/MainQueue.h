@@ -9,7 +9,7 @@
 
 namespace Varnel::Platform {
 
-/// The queue of the main thread. Whatever touches notifications or sounds runs here.
+/// The queue of the main thread. All code that uses notifications or sounds runs here.
 ///
 ///     mainQueue.post([this] { reload(); });  // from any thread
 ///
@@ -32,14 +32,14 @@ class VARNEL_API MainQueue {
   /// Runs what is posted, and waits for more, until a `stop`. Main thread only.
   virtual void run() = 0;
 
-  /// Ends the innermost `run` behind what has been posted before; the next one, if none is under
-  /// way. Any thread.
+  /// Ends the innermost `run` after the blocks posted before this call; if none is under way, the
+  /// next `run`. Any thread.
   virtual void stop() = 0;
 
-  /// Runs what is posted, and waits for more, as long as the condition holds; it is asked at first
-  /// and whenever something ran. Main thread only.
+  /// Runs what is posted, and waits for more, as long as the condition holds. The condition is
+  /// checked at first and whenever something has run. Main thread only.
   virtual void runWhile(const std::function<bool()>& condition) = 0;
-  /// The same for as long as `patience` at the most. False when the condition still holds then.
+  /// The same for at most `patience`. False when the condition still holds then.
   virtual bool runWhile(const std::function<bool()>& condition,
                         std::chrono::milliseconds patience) = 0;
 
@@ -47,10 +47,9 @@ class VARNEL_API MainQueue {
   /// thread only.
   virtual bool drain() = 0;
 
-  /// A file descriptor that can be polled for reading and is readable when `drain` has something to
-  /// do, and now and then when it has not. To be asked for again before each poll: it takes in then
-  /// what is to be waited for. Stays the queue's. Absent where the system has no such thing. Main
-  /// thread only.
+  /// A file descriptor to poll for reading. It is readable when `drain` has something to do, and
+  /// sometimes when it has not. Call this again before each poll: the call registers what is to be
+  /// waited for. The queue owns the descriptor. Absent where the system has none. Main thread only.
   [[nodiscard]] virtual std::optional<int> descriptor() = 0;
 };
 

@@ -26,16 +26,17 @@ struct Banner final {
 /// restarts costs the banners and nothing else.
 class VARNEL_API NotificationServer {
  public:
-  /// Told on the main thread, and never from within an operation, what becomes of banners.
+  /// Hears what becomes of banners. Called on the main thread, and never from within an operation.
   class Observer {
    public:
     virtual ~Observer() = default;
 
     /// The banner is shown and has this reference.
     virtual void bannerShown(const std::string& token, const std::string& reference) = 0;
-    /// The user clicked the banner or its action button; the banner is gone. Comes once a banner.
+    /// The user clicked the banner or its action button; the banner is gone. Called at most once
+    /// for each banner.
     virtual void bannerActivated(const std::string& token) = 0;
-    /// The user closed the banner. One that only expires is not told.
+    /// The user closed the banner. An expired banner is not reported.
     virtual void bannerDismissed(const std::string& token) = 0;
   };
 
@@ -47,10 +48,11 @@ class VARNEL_API NotificationServer {
   virtual void show(const std::string& token, const Banner& banner,
                     const std::optional<std::string>& replacedReference) = 0;
 
-  /// Takes the banner away that has this token or, if that is of an earlier run, this reference.
+  /// Removes the banner with this token or, if an earlier run showed it, with this reference.
   virtual void close(const std::string& token, const std::optional<std::string>& reference) = 0;
 
-  /// Whether something of this is still on its way to the server. Ends, also without a server.
+  /// Whether any of these requests is still on its way to the server. Becomes false in the end,
+  /// also without a server.
   [[nodiscard]] virtual bool isBusy() const = 0;
 };
 

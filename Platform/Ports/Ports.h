@@ -29,7 +29,7 @@ class UserNotificationCenters;
 class VolumeCatalog;
 class Workspace;
 
-/// One service of each kind. The objects behind the references outlive whoever uses them; those of
+/// One service of each kind. The objects behind the references outlive all their users; those of
 /// the process are never destroyed.
 ///
 ///     static auto& clock = *new MyClock();  // a host's own service among the system's
@@ -73,8 +73,8 @@ struct Ports {
 /// Any thread.
 [[nodiscard]] VARNEL_API bool installProcessPorts(const Ports& ports);
 
-/// The services of the system that the library was built for. Whoever builds for another system
-/// supplies this function with the adapters. Made on first use and never destroyed.
+/// The services of the system that the library was built for. A port to another system supplies
+/// this function together with its adapters. Made on first use and never destroyed.
 [[nodiscard]] VARNEL_API const Ports& systemPorts();
 
 }  // namespace Varnel::Platform

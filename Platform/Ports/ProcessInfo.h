@@ -27,7 +27,8 @@ class VARNEL_API ProcessInfo {
   [[nodiscard]] virtual std::optional<std::string> environmentVariable(
       std::string_view name) const = 0;
 
-  /// The system's version; where it is numbered otherwise, its core's. Unknown numbers are 0.
+  /// The system's version; where it is numbered otherwise, its core's. Numbers that are not known
+  /// are 0.
   [[nodiscard]] virtual OperatingSystemVersion operatingSystemVersion() const = 0;
 
   /// The absolute path of the running executable, which may have been removed or replaced since;

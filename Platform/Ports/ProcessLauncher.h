@@ -12,7 +12,7 @@
 namespace Varnel::Platform {
 
 /// A program that was launched, with pipes as its standard input and output. One thread at a time.
-/// Destruction ends it if it still runs; nothing of it stays behind.
+/// Destruction ends it if it still runs, and leaves nothing of it behind.
 class VARNEL_API LaunchedProcess {
  public:
   virtual ~LaunchedProcess() = default;
@@ -23,7 +23,7 @@ class VARNEL_API LaunchedProcess {
   /// Ends it, and what it has started, at once; waits for its end. Does nothing once it has ended.
   virtual void terminate() = 0;
 
-  /// What its output pipe holds, to the end. Never waits: to be called after it has ended.
+  /// Everything that its output pipe holds. Never waits: to be called after the program has ended.
   [[nodiscard]] virtual std::string readOutput() = 0;
 };
 
@@ -32,10 +32,10 @@ class VARNEL_API ProcessLauncher {
  public:
   virtual ~ProcessLauncher() = default;
 
-  /// Starts the program at `path`. It inherits the environment and standard error and nothing else;
-  /// its input is an open pipe that never gives anything. The output pipe is as large as the system
-  /// allows: a program that writes more waits until it is terminated. Failed (generic category)
-  /// when the program cannot be started.
+  /// Starts the program at `path`. It inherits only the environment and standard error; its input
+  /// is an open pipe without any data. The output pipe is as large as the system allows: a program
+  /// that writes more waits until it is terminated. Failed (generic category) when the program
+  /// cannot be started.
   [[nodiscard]] virtual Result<std::unique_ptr<LaunchedProcess>, std::error_code> launch(
       const std::string& path, const std::vector<std::string>& arguments) = 0;
 };

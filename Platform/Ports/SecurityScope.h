@@ -12,7 +12,7 @@ class VARNEL_API SecurityScope {
   virtual ~SecurityScope() = default;
 
   /// Opens the gate for a file or folder; false when the process may not read it. Every success
-  /// wants one `stopAccessing`.
+  /// needs one `stopAccessing`.
   [[nodiscard]] virtual bool startAccessing(const URL& url) = 0;
   virtual void stopAccessing(const URL& url) = 0;
 };

@@ -16,26 +16,27 @@ class VARNEL_API SoundDelegate {
  public:
   virtual ~SoundDelegate() = default;
 
-  /// Called on the main queue, once a `play`, unless the sound was stopped before. `finished` is
-  /// false when it broke off or could not be played at all, which shows only then.
+  /// Called on the main queue, once for each `play`, unless the sound was stopped before.
+  /// `finished` is false when the sound broke off or could not be played, which is not known
+  /// earlier.
   virtual void sound(PlayableSound& sound, bool finished) = 0;
 };
 
-/// A sound that is in memory and can be played. Main thread only. Letting go of the last reference
-/// stops it.
+/// A sound that is in memory and can be played. Main thread only. It stops when its last reference
+/// is gone.
 class VARNEL_API PlayableSound {
  public:
   virtual ~PlayableSound() = default;
 
-  /// Whom to tell about the end. The sound does not keep it alive.
+  /// The object to call at the end. The sound does not keep it alive.
   virtual void setDelegate(std::weak_ptr<SoundDelegate> delegate) = 0;
 
-  /// Has the sound start from its beginning and returns at once, before it has; nothing while it
-  /// plays. Always comes to an end, even without an audio device.
+  /// Asks the sound to start from its beginning, and returns at once, before it has started. Does
+  /// nothing while the sound plays. A play always comes to an end, even without an audio device.
   virtual void play() = 0;
 
-  /// Silence, or no start where it had not come to that. The delegate hears nothing more of this
-  /// `play`, even if its end was on the way. Returns at once.
+  /// Stops the sound, or cancels a start that has not happened yet. The delegate hears nothing more
+  /// of this `play`, even if its end was on the way. Returns at once.
   virtual void stop() = 0;
 
   /// From `play` to the end or the `stop`.
@@ -47,13 +48,14 @@ class VARNEL_API SoundPlayer {
  public:
   virtual ~SoundPlayer() = default;
 
-  /// The sound that a file with these bytes holds. Null when they do not begin like a sound, or
-  /// when there is a missing part. Whatever else there is to find out is found out by playing:
-  /// nothing here waits for the machine's sound system.
+  /// The sound in a file with these bytes. Null when they do not begin like a sound, or when there
+  /// is a missing part. All other faults show only when the sound is played, because nothing here
+  /// waits for the machine's sound system.
   [[nodiscard]] virtual std::shared_ptr<PlayableSound> load(std::string bytes) = 0;
 
-  /// The part without which no sound can be played, in words for a person; absent when it is there.
-  /// One that is there and does not work is known after the end of the first sound.
+  /// The name, for a person, of a missing part without which no sound can be played; absent when
+  /// nothing is missing. A part that is there but does not work is known only after the end of the
+  /// first sound.
   [[nodiscard]] virtual std::optional<std::string> missingPart() const = 0;
 };
 

@@ -14,8 +14,8 @@ class VARNEL_API StandardOutput {
   virtual ~StandardOutput() = default;
 
   /// Prints the text as it is, with no terminator. Texts of different threads never mix. A stream
-  /// that is closed or full, or whose reader has gone, loses the text without a word or a signal;
-  /// one whose reader is slow may block.
+  /// that is closed or full, or whose reader has gone, loses the text without a report or a signal.
+  /// A slow reader may make the call block.
   virtual void print(std::string_view text) = 0;
 };
 
@@ -24,7 +24,7 @@ class VARNEL_API StandardOutput {
 ///     static StandardOutput& errorOutput = *makeStandardErrorOutput().release();
 ///     if (!installProcessPorts(systemPorts().withStandardOutput(errorOutput))) return 1;
 ///
-/// It is released from its pointer because destructors may log until the process has ended.
+/// The pointer is released because destructors may log until the process has ended.
 [[nodiscard]] VARNEL_API std::unique_ptr<StandardOutput> makeStandardErrorOutput();
 
 }  // namespace Varnel::Platform

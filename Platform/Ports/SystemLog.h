@@ -7,7 +7,7 @@
 
 namespace Varnel::Platform {
 
-/// The system's own log, for what must be told below the framework's logger. Any thread.
+/// The system's own log, for code below the framework's logger. Any thread.
 class VARNEL_API SystemLog {
  public:
   virtual ~SystemLog() = default;

@@ -23,11 +23,11 @@ class VARNEL_API TimeZone {
 
   virtual ~TimeZone() = default;
 
-  /// What the clocks show beyond UTC at `date`.
+  /// The difference between the zone's clocks and UTC at `date`.
   [[nodiscard]] virtual Offset offsetAt(Date date) const = 0;
 
-  /// The first moment after `date` from which another offset may count; until then that of `date`
-  /// does. Absent when there is none.
+  /// The first moment after `date` at which the offset may change; until then it is that of `date`.
+  /// Absent when there is none.
   [[nodiscard]] virtual std::optional<Date> nextChange(Date date) const = 0;
 };
 
@@ -39,12 +39,12 @@ class VARNEL_API TimeZones {
  public:
   virtual ~TimeZones() = default;
 
-  /// The zone where the user is now: by its name in the time zone database ("Europe/Vienna"), or
-  /// by whatever else names it to `zone`.
+  /// The user's present zone: its name in the time zone database ("Europe/Vienna"), or another text
+  /// that `zone` understands.
   [[nodiscard]] virtual std::string localIdentifier() const = 0;
 
-  /// The zone with the rules of now; never null. One that the system does not know runs on UTC. It
-  /// may outlive this object.
+  /// The zone with its present rules; never null. A zone that the system does not know runs on UTC.
+  /// The result may outlive this object.
   [[nodiscard]] virtual std::shared_ptr<const TimeZone> zone(
       const std::string& identifier) const = 0;
 };

@@ -7,8 +7,8 @@
 
 namespace Varnel::Platform {
 
-/// The user that the process runs as. Any thread. Paths are absolute and have no trailing "/" (but
-/// the root is "/").
+/// The user that the process runs as. Any thread. Paths are absolute and have no trailing "/",
+/// except for the root "/".
 class VARNEL_API UserAccount {
  public:
   virtual ~UserAccount() = default;

@@ -20,14 +20,14 @@ class VARNEL_API UserDefaults {
 
   virtual ~UserDefaults() = default;
 
-  /// The value under a key; absent when there is none, or none that reads as this type.
+  /// The value under a key; absent when there is none, or when it cannot be read as this type.
   [[nodiscard]] virtual std::optional<bool> truthValue(const std::string& key) const = 0;
   [[nodiscard]] virtual std::optional<std::int64_t> integer(const std::string& key) const = 0;
   [[nodiscard]] virtual std::optional<double> real(const std::string& key) const = 0;
   [[nodiscard]] virtual std::optional<std::string> text(const std::string& key) const = 0;
 
-  /// Keeps a value under a key, from now on and on disk. A disk that refuses loses it at the
-  /// process's end.
+  /// Keeps a value under a key, in memory and on disk. If the disk refuses it, the value lasts as
+  /// long as the process.
   virtual void set(const std::string& key, const Value& value) = 0;
   virtual void remove(const std::string& key) = 0;
 };

@@ -13,7 +13,8 @@ namespace Varnel::Platform {
 
 class UserNotificationCenter;
 
-/// What a center tells, and asks of, the one who listens to it. Called on the main thread.
+/// The listener of a center, which tells it of events and asks it one question. Called on the main
+/// thread.
 class VARNEL_API UserNotificationCenterDelegate {
  public:
   virtual ~UserNotificationCenterDelegate() = default;
@@ -35,29 +36,30 @@ class VARNEL_API UserNotificationCenterDelegate {
 ///     center.setDelegate(router);
 ///     center.scheduleNotification(reminder);
 ///
-/// Main thread only. Nothing fails visibly: what cannot be kept or shown is reported to the
-/// system's log.
+/// Main thread only. No operation fails visibly: a notification that cannot be kept or shown is
+/// reported to the system's log.
 class VARNEL_API UserNotificationCenter {
  public:
   virtual ~UserNotificationCenter() = default;
 
-  /// The one that listens from now on; held weakly. What came due earlier is delivered now.
-  /// Without a delegate nothing is delivered and what is due waits.
+  /// The only listener from now on; held weakly. Notifications that came due earlier are delivered
+  /// now. Without a delegate nothing is delivered, and due notifications wait.
   virtual void setDelegate(std::weak_ptr<UserNotificationCenterDelegate> delegate) = 0;
 
   /// Keeps the notification until its delivery date, in the place of one with its identifier.
   virtual void scheduleNotification(const UserNotification& notification) = 0;
 
-  /// Those that have a delivery ahead, the next one first.
+  /// The notifications that have a delivery ahead, the next one first.
   [[nodiscard]] virtual std::vector<UserNotification> scheduledNotifications() = 0;
 
-  /// Cancels all deliveries to come; what has been delivered stays.
+  /// Cancels all deliveries to come. The notification stays in the delivered list if it is there.
   virtual void removeScheduledNotification(const UserNotification& notification) = 0;
 
   /// Delivers now, whatever the dates of the notification say, and replaces its banner.
   virtual void deliverNotification(const UserNotification& notification) = 0;
 
-  /// Those delivered and neither removed nor dismissed by the user, the latest first.
+  /// The delivered notifications that were neither removed nor dismissed by the user, the latest
+  /// first.
   [[nodiscard]] virtual std::vector<UserNotification> deliveredNotifications() = 0;
 
   /// Forgets a delivered notification and takes its banner away; deliveries to come stay.

@@ -13,7 +13,7 @@
 
 namespace Varnel::Platform {
 
-/// A mounted volume. What the system does not tell is absent.
+/// A mounted volume. A fact that the system does not tell is absent.
 struct MountedVolume {
   URL url;                         ///< The folder it is mounted on; its path ends with "/".
   std::optional<bool> isLocal;     ///< False for network file systems.

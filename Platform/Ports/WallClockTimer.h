@@ -15,11 +15,11 @@ class VARNEL_API WallClockTimer {
  public:
   virtual ~WallClockTimer() = default;
 
-  /// What to call, on the main thread and never within `arm`: at the date or soon after it, and
-  /// whenever the clock was set while the timer was armed. The timer is disarmed then.
+  /// The handler is called on the main thread and never within `arm`: at the date or soon after it,
+  /// and whenever the clock was set while the timer was armed. The timer is disarmed by then.
   virtual void setHandler(std::function<void()> handler) = 0;
 
-  /// Waits for this date instead of any other. One that is past has been reached.
+  /// Waits for this date instead of any earlier one. A date in the past counts as reached.
   virtual void arm(Date date) = 0;
   virtual void disarm() = 0;
 };

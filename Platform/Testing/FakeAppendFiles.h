@@ -31,7 +31,8 @@ class FakeAppendFiles final : public AppendFiles {
     return std::unique_ptr<AppendFile>(std::make_unique<File>(*this, path));
   }
 
-  /// From now on no file can be opened; with `std::errc()` each one can again. Open files stay so.
+  /// From now on no file can be opened; with `std::errc()`, files can be opened again. Open files
+  /// stay open.
   void failOpening(std::errc failure) {
     const std::lock_guard lock(mutex_);
     openFailure_ = failure;
@@ -48,7 +49,7 @@ class FakeAppendFiles final : public AppendFiles {
   void hold() { setHeld(true); }
   void release() { setHeld(false); }
 
-  /// Returns when `count` appends have ended since the start, failed ones included.
+  /// Returns when `count` appends have ended since the beginning, failed ones included.
   void waitForAppends(std::size_t count) {
     std::unique_lock lock(mutex_);
     changed_.wait(lock, [&] { return appends_ >= count; });

@@ -49,7 +49,8 @@ class FakeDeviceRegistry final : public DeviceRegistry {
     state_->remove(device);
   }
 
-  /// A device whose properties, or whose parent, cannot be read any more. Single properties can.
+  /// From now on the device's list of properties, or its parent, cannot be read. Single properties
+  /// can.
   void breakProperties(Device device) {
     const std::lock_guard lock(state_->mutex);
     state_->nodes[device].propertiesBroken = true;

@@ -19,7 +19,8 @@ namespace Varnel::Platform::Testing {
 ///     disks.setMountURLs("sda1", {URL::fileURLWithPath("/home/")});
 class FakeDiskArbitration final : public DiskArbitration {
  public:
-  /// Where the device is mounted from now on. Sessions that are open keep the view they began with.
+  /// Mounts the device at these places from now on. Open sessions keep the view that they began
+  /// with.
   void setMountURLs(const std::string& deviceName, std::vector<URL> urls) {
     const std::lock_guard lock(mutex_);
     mounts_.insert_or_assign(deviceName, std::move(urls));

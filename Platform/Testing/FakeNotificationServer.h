@@ -21,7 +21,7 @@ namespace Varnel::Platform::Testing {
 /// One thread. Several centers may share one, as several processes share a desktop's.
 class FakeNotificationServer final : public NotificationServer {
  public:
-  /// What `show` does while false: nothing, as without a server.
+  /// While false, `show` does nothing, as without a server.
   bool isPresent = true;
 
   void setObserver(std::weak_ptr<Observer> observer) override { observer_ = std::move(observer); }

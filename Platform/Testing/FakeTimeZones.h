@@ -20,14 +20,15 @@ namespace Varnel::Platform::Testing {
 ///     zones.changes["Europe/Berlin"] = {{winterBegin, {1h}}, {summerBegin, {2h, true}}};
 class FakeTimeZones final : public TimeZones {
  public:
-  /// From a moment on another offset counts.
+  /// A moment from which another offset counts.
   struct Change {
     Date begin;
     TimeZone::Offset offset;
   };
 
   std::string local = "UTC";
-  /// Of each zone, in the order of time. Before the first one, and in other zones, it is UTC.
+  /// The changes of each zone, in the order of time. Before the first one, and in other zones, the
+  /// clocks show UTC.
   std::map<std::string, std::vector<Change>> changes;
 
   [[nodiscard]] std::string localIdentifier() const override { return local; }

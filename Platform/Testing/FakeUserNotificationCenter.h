@@ -21,7 +21,7 @@ namespace Varnel::Platform::Testing {
 /// One thread.
 class FakeUserNotificationCenter final : public UserNotificationCenter {
  public:
-  /// Those that the delegate wanted to be shown, oldest first.
+  /// The notifications that the delegate wanted to be shown, oldest first.
   std::vector<UserNotification> presented;
 
   void setDelegate(std::weak_ptr<UserNotificationCenterDelegate> delegate) override {
@@ -61,7 +61,7 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
   }
   [[nodiscard]] bool isBusy() const override { return false; }
 
-  /// What a click of the user does.
+  /// Acts as a click of the user.
   void activate(const UserNotification& notification) {
     if (const auto listener = delegate_.lock()) listener->didActivate(*this, notification);
   }

@@ -36,7 +36,7 @@ class FakeWallClockTimer final : public WallClockTimer {
     clock_.set(date);
   }
 
-  /// What setting the clock does, and sleep.
+  /// Acts as a user who sets the clock, or as a machine that wakes up.
   void setClock(Date date) {
     clock_.set(date);
     if (armed_) fire();

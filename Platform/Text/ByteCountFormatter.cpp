@@ -11,7 +11,7 @@ namespace {
 
 struct Unit {
   std::string_view name;
-  int maximumDecimals;
+  int maxDecimals;
 };
 
 constexpr std::array units{Unit{"KB", 0}, Unit{"MB", 1}, Unit{"GB", 2},
@@ -72,7 +72,7 @@ ByteCountFormatter::ByteCountFormatter(std::string_view localeIdentifier) {
   if (decimalSeparator_.empty()) decimalSeparator_.push_back('.');
 }
 
-// Counts of one unit stay below 1024, so that there is one group at the most.
+// Counts of one unit stay below 1024, so there is at most one group.
 std::string ByteCountFormatter::wholeText(std::uint64_t number) const {
   std::string text = std::to_string(number);
   if (text.size() > 3) text.insert(text.size() - 3, groupingSeparator_);
@@ -83,7 +83,7 @@ std::string ByteCountFormatter::string(std::int64_t count, ByteCountStyle style)
   if (count == 0) return "Zero KB";
   std::string text;
   if (count < 0) text += '-';
-  // Negated as unsigned, since the least count has no positive counterpart.
+  // Negated as unsigned, because the lowest count has no positive counterpart.
   const auto bits = static_cast<std::uint64_t>(count);
   const std::uint64_t bytes = count < 0 ? 0 - bits : bits;
   const std::uint64_t step = unitStep(style);
@@ -94,16 +94,16 @@ std::string ByteCountFormatter::string(std::int64_t count, ByteCountStyle style)
 
   std::uint64_t unitSize = step;
   auto unit = units.begin();
-  Rounded value = divide(bytes, unitSize, unit->maximumDecimals);
-  // What rounds up to a full step is shown in the next unit.
+  Rounded value = divide(bytes, unitSize, unit->maxDecimals);
+  // A number that rounds up to a full step is shown in the next unit.
   while (value.whole >= step) {
     unitSize *= step;
     ++unit;
-    value = divide(bytes, unitSize, unit->maximumDecimals);
+    value = divide(bytes, unitSize, unit->maxDecimals);
   }
   text += wholeText(value.whole);
   if (value.fraction != 0)
-    text.append(decimalSeparator_).append(decimalText(value.fraction, unit->maximumDecimals));
+    text.append(decimalSeparator_).append(decimalText(value.fraction, unit->maxDecimals));
   return text.append(" ").append(unit->name);
 }
 

@@ -16,12 +16,12 @@ using std::chrono::milliseconds;
 using Time = std::chrono::sys_time<milliseconds>;
 using LocalTime = std::chrono::local_time<milliseconds>;
 
-// The furthest that a calculation may lead; `Date` reaches 292,000 years.
-constexpr double farthestMillisecond = 9.0e15;
+// How far a calculation may lead; `Date` reaches 292,000 years.
+constexpr double maxMilliseconds = 9.0e15;
 
 bool isWithinReach(Date date) {
-  constexpr Date::duration farthest = milliseconds(static_cast<std::int64_t>(farthestMillisecond));
-  return date.time_since_epoch() <= farthest && date.time_since_epoch() >= -farthest;
+  constexpr Date::duration maxDuration = milliseconds(static_cast<std::int64_t>(maxMilliseconds));
+  return date.time_since_epoch() <= maxDuration && date.time_since_epoch() >= -maxDuration;
 }
 
 UDate icuDate(milliseconds time) {
@@ -32,8 +32,8 @@ LocalTime wallClock(Time time, const TimeZone& zone) {
   return LocalTime(time.time_since_epoch() + zone.offsetAt(time).fromUTC);
 }
 
-// Of a time that comes twice the first; one that is skipped by the offset before the change, which
-// leads forward.
+// For a time that comes twice, the first one. For a time that is skipped, the offset before the
+// change applies and moves it forward.
 Time resolved(LocalTime local, const TimeZone& zone) {
   const Time utc(local.time_since_epoch());
   // No offset is as long as a day.
@@ -65,7 +65,7 @@ struct Calendar::State {
   const TimeZones& zones;
   std::string zoneIdentifier;
   std::shared_ptr<const TimeZone> zone = zones.zone(zoneIdentifier);
-  // Counts on wall clocks, and so in a zone without changes. Cloned for each calculation.
+  // Counts by wall clocks, as in a zone whose offset never changes. Cloned for each calculation.
   std::unique_ptr<icu::Calendar> prototype = nullptr;
 
   std::optional<LocalTime> addingDays(const DateComponents& components, LocalTime local,
@@ -84,7 +84,7 @@ struct Calendar::State {
         !add(UCAL_DATE, components.day))
       return std::nullopt;
     const UDate sum = calendar->getTime(status);
-    if (U_FAILURE(status) || !(std::abs(sum) <= farthestMillisecond)) return std::nullopt;
+    if (U_FAILURE(status) || !(std::abs(sum) <= maxMilliseconds)) return std::nullopt;
     return LocalTime(milliseconds(static_cast<std::int64_t>(sum)));
   }
 };
@@ -128,7 +128,7 @@ std::optional<Date> Calendar::adding(const DateComponents& components, Date date
       !add(components.minute, std::chrono::minutes(1)) ||
       !add(components.second, std::chrono::seconds(1)))
     return std::nullopt;
-  if (!(std::abs(icuDate(time.time_since_epoch())) <= farthestMillisecond)) return std::nullopt;
+  if (!(std::abs(icuDate(time.time_since_epoch())) <= maxMilliseconds)) return std::nullopt;
   return time + rest;
 }
 

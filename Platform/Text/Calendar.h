@@ -21,9 +21,9 @@ class UserLocale;
 ///     calendar.adding({.month = 1}, date);     // the same wall-clock time a month later
 ///     calendar.adding({.month = 1}, date, 3);  // three months: 31 January gives 30 April
 ///
-/// Years, months and days keep the wall-clock time: one that the zone skips moves forward by what
-/// was skipped, and of one that comes twice the first is meant. Hours and smaller are lengths of
-/// time. A month that is too short gives its last day. Immutable; any thread.
+/// Years, months and days keep the wall-clock time. A time that the zone skips moves forward by the
+/// length of the gap; a time that comes twice means the first. Hours and smaller units are lengths
+/// of time. A month that is too short gives its last day. Immutable; any thread.
 class VARNEL_API Calendar final {
  public:
   /// The locale is an ICU identifier; it names a calendar ("@calendar=hebrew") or has its region's.
@@ -43,7 +43,8 @@ class VARNEL_API Calendar final {
   [[nodiscard]] std::optional<Date> adding(const DateComponents& components, Date date,
                                            std::int64_t count = 1) const;
 
-  /// The moment at which this calendar's clocks show what those of another zone show at `date`.
+  /// The moment at which this calendar's clocks show the time that the other zone's clocks show at
+  /// `date`.
   [[nodiscard]] std::optional<Date> withWallClockOf(Date date,
                                                     const std::string& timeZoneIdentifier) const;
 

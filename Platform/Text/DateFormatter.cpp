@@ -27,7 +27,7 @@ struct CachedText {
   std::array<char, 48> characters{};
 };
 
-// Formatters share a slot only when more than four are in turn on one thread.
+// Formatters share a slot only when more than four are in use on one thread.
 constinit thread_local std::array<CachedText, 4> cachedTexts{};
 
 // Never given twice, unlike an address.
@@ -51,8 +51,8 @@ UDate icuDate(Date date) {
   return static_cast<UDate>(milliseconds.time_since_epoch().count());
 }
 
-// The library's own rules of a zone may be older than the system's: it gets the system's offsets,
-// and has from the identifier only what it calls the zone.
+// The library's own rules of a zone may be older than the system's. So it is given the system's
+// offsets, and uses the identifier only for the zone's names.
 class SystemZone final : public icu::SimpleTimeZone {
  public:
   SystemZone(const std::string& identifier, std::shared_ptr<const Platform::TimeZone> zone)
@@ -65,7 +65,8 @@ class SystemZone final : public icu::SimpleTimeZone {
   void getOffset(UDate date, UBool, std::int32_t& standard, std::int32_t& saving,
                  UErrorCode&) const override {
     const Platform::TimeZone::Offset offset = offsetAt(date);
-    // Where the clocks are advanced by anything else than an hour, the sum is right all the same.
+    // The sum is right even where daylight saving advances the clocks by something other than an
+    // hour.
     saving = offset.isDaylightSaving ? U_MILLIS_PER_HOUR : 0;
     standard = static_cast<std::int32_t>(milliseconds(offset.fromUTC).count()) - saving;
   }
@@ -78,9 +79,9 @@ class SystemZone final : public icu::SimpleTimeZone {
   using milliseconds = std::chrono::milliseconds;
 
   Platform::TimeZone::Offset offsetAt(UDate date) const {
-    // `Date` ends somewhat later, but not at a number that a floating one hits.
-    constexpr UDate farthest = 9.2e15;
-    const UDate near = std::clamp(date, -farthest, farthest);
+    // `Date` ends somewhat later, but not at a number that floating point represents.
+    constexpr UDate maxDate = 9.2e15;
+    const UDate near = std::clamp(date, -maxDate, maxDate);
     return zone_->offsetAt(Date(milliseconds(static_cast<std::int64_t>(near))));
   }
 

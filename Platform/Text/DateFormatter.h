@@ -18,12 +18,12 @@ class TimeZones;
 ///     DateFormatter("YYYY-MM-dd HH:mm:ss", "en_US", timeZones).string(clock.now());
 ///
 /// Note that "YYYY" is the year of the locale's week, not the calendar's. Immutable; any thread.
-/// Text of the same second as the call before is not computed again when the pattern has no finer
-/// unit.
+/// When the pattern has no unit below a second, two dates of one second in a row are formatted
+/// once.
 class VARNEL_API DateFormatter final {
  public:
-  /// A pattern that cannot be written stands for "yyyy-MM-dd HH:mm:ss"; a locale (an ICU
-  /// identifier) that is unknown for the nearest known one.
+  /// A pattern that cannot be used is replaced by "yyyy-MM-dd HH:mm:ss", and an unknown locale (an
+  /// ICU identifier) by the nearest known one.
   DateFormatter(std::string_view pattern, std::string_view localeIdentifier,
                 const TimeZones& timeZones);
   ~DateFormatter();

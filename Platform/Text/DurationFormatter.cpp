@@ -41,10 +41,10 @@ Components componentsOf(seconds length) {
 }  // namespace
 
 std::optional<std::string> DurationFormatter::string(TimeInterval interval) const {
-  constexpr auto longest =
+  constexpr auto maxInterval =
       static_cast<double>(duration_cast<seconds>(Date::duration::max()).count());
-  // Written so that it also refuses what is not a number.
-  if (!(std::abs(interval) <= longest)) return std::nullopt;
+  // Negated so that it also refuses what is not a number.
+  if (!(std::abs(interval) <= maxInterval)) return std::nullopt;
 
   std::string text;
   for (const auto& [count, unit] :

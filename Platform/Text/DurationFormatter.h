@@ -12,8 +12,8 @@ namespace Varnel::Platform {
 /// Writes lengths of time in English with abbreviated units: "1h 5m 3s".
 ///
 /// The units are y, mo, d, h, m and s, counted on the calendar from a fixed start; units of zero
-/// are left out, "0s" stands when nothing is left, fractions of a second are cut off, and of a
-/// negative length the first unit alone bears the minus. Immutable; any thread.
+/// are left out, and "0s" is the text of no length at all. Fractions of a second are cut off. In a
+/// negative length only the first unit has the minus. Immutable; any thread.
 class VARNEL_API DurationFormatter final {
  public:
   /// Absent for a length that no calendar can hold: not a number, infinite, or beyond all dates.

@@ -29,8 +29,8 @@ class VARNEL_API KeyedArchiver final {
   PropertyDictionary values_;
 };
 
-/// Takes the parts out of an archive again. What the archive holds under a key is given out only if
-/// it is of the kind that is asked for, so that foreign or damaged bytes do no harm. Any thread.
+/// Takes the parts out of an archive again. A value is given out only if it is of the requested
+/// kind, so foreign or damaged bytes do no harm. Any thread.
 class VARNEL_API KeyedUnarchiver final {
  public:
   /// Absent when the bytes are no archive.

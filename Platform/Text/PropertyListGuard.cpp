@@ -13,7 +13,7 @@
 namespace Varnel::Platform {
 namespace {
 
-constexpr std::size_t maximumDepth = 512;
+constexpr std::size_t maxDepth = 512;
 
 /// What a parse may cost, one unit being about a byte of memory or ten nanoseconds.
 class Budget final {
@@ -30,8 +30,8 @@ class Budget final {
   std::uint64_t left_ = std::uint64_t{1} << 27;
 };
 
-/// Follows the tags of an XML text without looking at what they mean. Its depth is never less than
-/// the parser's.
+/// Follows the tags of an XML text and ignores their meaning. Its depth is never less than the
+/// parser's.
 class XMLGuard final {
  public:
   explicit XMLGuard(std::string_view bytes) : bytes_(bytes) {}
@@ -61,7 +61,7 @@ class XMLGuard final {
     return length != 0 && takeTag(rest.substr(0, length));
   }
 
-  // Neither ends a text: one may consist of pieces between comments.
+  // Neither of these ends a text, which may consist of pieces between comments.
   [[nodiscard]] bool skipPast(std::string_view end, std::size_t prefixLength) {
     const std::size_t found = bytes_.find(end, position_ + prefixLength);
     if (found == std::string_view::npos) return false;
@@ -70,8 +70,8 @@ class XMLGuard final {
     return true;
   }
 
-  // Zero where readers could disagree on the tag's end, which is where it has brackets within
-  // quotes, or lacks the end.
+  // Zero where readers could disagree on the tag's end: when it has brackets within quotes, or no
+  // end.
   static std::size_t tagLength(std::string_view rest) {
     char quote = 0;
     for (std::size_t index = 1; index < rest.size(); ++index) {
@@ -100,7 +100,7 @@ class XMLGuard final {
     if (name == "date") return isValue(tag, name, isDate);
     if (!tag.starts_with("<dict") && !tag.starts_with("<array")) return true;
     if (!tag.ends_with("/>")) keyCounts_.push_back(0);
-    return keyCounts_.size() <= maximumDepth;
+    return keyCounts_.size() <= maxDepth;
   }
 
   [[nodiscard]] bool close(std::string_view tag) {
@@ -125,10 +125,11 @@ class XMLGuard final {
     return tag.substr(0, tag.find_first_of(" \t\r\n/>"));
   }
 
-  // A key is compared with those before it when their hashes collide, as they can be made to.
+  // A key is compared with those before it when their hashes collide, and a forger can make them
+  // collide.
   [[nodiscard]] bool countKey() { return keyCounts_.empty() || budget_.spend(++keyCounts_.back()); }
 
-  // Each entity that is replaced moves the rest of its text.
+  // Replacing an entity moves the rest of its text.
   [[nodiscard]] std::uint64_t textCost() const { return entityCount_ * textLength_ / 256; }
 
   const std::string_view bytes_;
@@ -139,8 +140,8 @@ class XMLGuard final {
   Budget budget_;
 };
 
-/// Visits the objects of a binary list as the parser will, those of several references again each
-/// time. Cycles exceed the depth, references that multiply the budget.
+/// Visits the objects of a binary list as the parser will: an object with several references once
+/// for each. Cycles exceed the depth, and references that multiply exceed the budget.
 class BinaryGuard final {
  public:
   explicit BinaryGuard(std::string_view bytes) : bytes_(bytes) {}
@@ -179,7 +180,7 @@ class BinaryGuard final {
   }
 
   [[nodiscard]] bool visit(std::uint64_t index, std::size_t depth) {
-    if (index >= objectCount_ || depth > maximumDepth || !budget_.spendNode()) return false;
+    if (index >= objectCount_ || depth > maxDepth || !budget_.spendNode()) return false;
     std::size_t position = number(table_ + index * offsetSize_, offsetSize_);
     if (position >= table_) return false;
     const std::uint64_t marker = number(position++, 1);
@@ -207,7 +208,7 @@ class BinaryGuard final {
         return visitText(position, count, 2);
       case array:
         return visitAll(position, count, depth);
-      // Of keys the worst is assumed: that each is compared with all before it.
+      // For keys the worst case is assumed: each one is compared with all before it.
       case dictionary:
         return budget_.spend(count * count / 2) && visitAll(position, count * 2, depth);
       default:

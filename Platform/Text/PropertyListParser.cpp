@@ -15,7 +15,7 @@
 namespace Varnel::Platform {
 namespace {
 
-constexpr std::size_t maximumSize = std::size_t{16} << 20;
+constexpr std::size_t maxSize = std::size_t{16} << 20;
 
 void release(void* memory) {
   std::free(memory);
@@ -72,8 +72,8 @@ PropertyData dataOf(plist_t node) {
   return data;
 }
 
-// The library tells a date in 32 bits, and its fraction without the sign. In the binary form that
-// it writes, all of it follows a header and a marker: the seconds from 2001, floating.
+// The library gives a date in 32 bits, and its fraction without a sign. The binary form that it
+// writes has the whole date behind a header and a marker: the seconds from 2001, in floating point.
 std::optional<PropertyValue> dateOf(plist_t node) {
   using namespace std::chrono;
   constexpr std::size_t position = 9;
@@ -86,8 +86,8 @@ std::optional<PropertyValue> dateOf(plist_t node) {
   for (const char byte : std::string_view(bytes + position, sizeof(double)))
     bits = bits << 8 | static_cast<unsigned char>(byte);
   const auto distance = std::bit_cast<double>(bits);
-  constexpr double farthest = 9.0e12;
-  if (!(std::abs(distance) <= farthest)) return std::nullopt;
+  constexpr double maxDistance = 9.0e12;
+  if (!(std::abs(distance) <= maxDistance)) return std::nullopt;
   constexpr sys_days epoch = year_month_day(year(2001), January, day(1));
   return Date(epoch + microseconds(std::llround(distance * 1e6)));
 }
@@ -152,7 +152,7 @@ Tree parse(std::string_view bytes) {
 }  // namespace
 
 std::optional<PropertyValue> parsePropertyList(std::string_view bytes) {
-  if (bytes.empty() || bytes.size() > maximumSize) return std::nullopt;
+  if (bytes.empty() || bytes.size() > maxSize) return std::nullopt;
   const NeutralLocale neutral;
   const Tree tree = parse(bytes);
   return tree ? valueOf(tree.get()) : std::nullopt;

@@ -17,10 +17,10 @@ namespace Varnel::Platform {
 ///
 /// The bytes may come from anywhere: lists that are damaged, cyclic, nested more than 512 deep,
 /// larger than 16 MiB, have more than some 16,000 keys in one dictionary or zero characters in a
-/// text are refused, and so are those with a number or date that is none, has something behind it
-/// or does not fit 64 bits. Of duplicate keys the last one counts. A unique identifier is read as
-/// its number, a number beyond the signed range as its 64 bits; dates that `Date` does not reach
-/// are left out. The host's `setlocale` makes no difference. Any thread.
+/// text are refused. So are lists with a malformed number or date, one with something behind it, or
+/// a number that does not fit 64 bits. If a key comes twice, the last one counts. A unique
+/// identifier is read as its number, a number beyond the signed range as its 64 bits; dates that
+/// `Date` does not reach are left out. The host's `setlocale` makes no difference. Any thread.
 [[nodiscard]] VARNEL_API std::optional<PropertyValue> parsePropertyList(std::string_view bytes);
 
 }  // namespace Varnel::Platform

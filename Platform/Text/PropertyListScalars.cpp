@@ -44,8 +44,8 @@ bool isWholeNumber(std::string_view text) {
   // The parser takes them for octal.
   if (!isHexadecimal && text.size() > 1 && text.starts_with('0')) return false;
   const auto magnitude = numberOf<std::uint64_t>(text, isHexadecimal ? 16 : 10);
-  constexpr std::uint64_t mostNegative = std::uint64_t{1} << 63;
-  return magnitude && !(isNegative && *magnitude > mostNegative);
+  constexpr std::uint64_t maxNegative = std::uint64_t{1} << 63;
+  return magnitude && !(isNegative && *magnitude > maxNegative);
 }
 
 bool isReal(std::string_view text) {

@@ -5,8 +5,8 @@
 
 namespace Varnel::Platform {
 
-/// Whether the text of an element, as an XML property list has it, is the whole of one value. The
-/// parser behind `parsePropertyList` itself makes something of any text.
+/// Whether the text of an element in an XML property list is exactly one value. The parser behind
+/// `parsePropertyList` makes a value of any text.
 ///
 /// Whole numbers are decimal without leading zeros or hexadecimal ("0x1F"), and fit 64 bits, with
 /// or without a sign; reals fit a double. Blanks may stand around numbers.

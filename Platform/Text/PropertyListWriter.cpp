@@ -32,7 +32,7 @@ bool isText(std::string_view bytes) {
 
 plist_t makeNode(const PropertyValue& value);
 
-// One overload a kind of value; each gives null for what cannot be written.
+// One overload for each kind of value; null for a value that cannot be written.
 struct NodeMaker {
   plist_t operator()(std::nullptr_t) const { return nullptr; }
   plist_t operator()(bool value) const { return plist_new_bool(value ? 1 : 0); }

@@ -9,8 +9,8 @@
 
 namespace Varnel::Platform {
 
-/// The value as an XML property list, which `parsePropertyList` reads back, but for the fractions
-/// of seconds: dates in this form have whole ones, and lose the rest. Absent when the value holds
+/// The value as an XML property list, which `parsePropertyList` reads back. Only fractions of
+/// seconds are lost, because dates in this form have whole seconds. Absent when the value holds
 /// something that the format cannot carry: a null, a text or key that is not UTF-8 or has control
 /// characters, a whole number below zero, a date more than 68 years from 2001. The host's
 /// `setlocale` makes no difference. Any thread.

@@ -6,7 +6,7 @@
 namespace Varnel::Platform {
 namespace {
 
-// The place that "2$@…" names, counted from 0, having taken it off `rest`; or else none.
+// The position that "2$@…" names, counted from 0, which is removed from `rest`; or none.
 std::size_t takePosition(std::string_view& rest) {
   std::size_t position = 0;
   const auto [end, error] = std::from_chars(rest.data(), rest.data() + rest.size(), position, 10);

@@ -40,8 +40,8 @@ std::size_t startOfLastComponent(std::string_view name) {
   return start;
 }
 
-/// "Outer" of "Outer::Inner::Name". A function, the unnamed namespace and an instance of a template
-/// are no namespaces to go by.
+/// "Outer" of "Outer::Inner::Name". A function, the unnamed namespace or an instance of a template
+/// does not count as a namespace.
 std::string_view outermostNamespace(std::string_view name) {
   std::size_t length = 0;
   while (length < name.size() && isPartOfIdentifier(name[length])) ++length;

@@ -13,8 +13,8 @@ namespace Varnel::Platform {
 ///
 /// A plain value; the functions are for any thread.
 struct TypeName {
-  /// Empty where there is none. A class that stands in no namespace counts as one for what it
-  /// holds: names do not tell them apart.
+  /// Empty where there is none. A class outside all namespaces counts as the namespace of the types
+  /// inside it, because names do not tell the two apart.
   std::string outermostNamespace;
   std::string name;  ///< Without scope; a template's arguments are as the compiler writes them.
 

@@ -10,7 +10,7 @@
 namespace Varnel::Platform {
 namespace {
 
-// Nearly all text is ASCII, which is told eight bytes at a time, and the last few one by one.
+// Nearly all text is ASCII, which is recognised eight bytes at a time, and the last few one by one.
 std::size_t lengthOfASCII(std::string_view bytes) {
   std::size_t length = 0;
   for (; length + sizeof(std::uint64_t) <= bytes.size(); length += sizeof(std::uint64_t)) {

@@ -12,7 +12,7 @@
 namespace Varnel::Platform {
 namespace {
 
-// An object rather than a function, so that the search has it inline.
+// An object rather than a function, so that the search can inline it.
 constexpr auto isPlain = [](char c) { return c >= 0x20 && c < 0x7F && c != '\\'; };
 
 /// Whether the character must not reach a terminal as it is; negative ones stand for wrong bytes.
@@ -49,7 +49,7 @@ void appendEscaped(std::string& text, std::string_view bytes) {
 std::string visibleText(std::string text, Backslashes backslashes) {
   const auto* bytes = reinterpret_cast<const std::uint8_t*>(text.data());
   const std::string_view whole = text;
-  // Nearly all text is plain, and this stands in the way of whoever logs.
+  // Nearly all text is plain, and every caller of the logger waits for this.
   const auto special = std::find_if_not(whole.begin(), whole.end(), isPlain);
   if (special == whole.end()) return text;
   std::string shown;

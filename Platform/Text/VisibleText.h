@@ -7,15 +7,15 @@
 
 namespace Varnel::Platform {
 
-/// What becomes of the backslashes in a text whose other characters are escaped with them.
+/// What becomes of the backslashes that a text itself holds.
 enum class Backslashes {
-  doubled,  ///< So that no two texts show alike.
-  kept,     ///< So that a text without anything to escape stays as it is.
+  doubled,  ///< No two texts look the same.
+  kept,     ///< A text without anything to escape stays as it is.
 };
 
-/// The text in a form that shows on a terminal as what it is and keeps to one line: control
-/// characters, characters that turn the direction of writing or break lines, and bytes that are not
-/// UTF-8 become "\n", "\t" and so on or "\xNN" for each byte.
+/// The text in a form that a terminal shows as it is, on one line: control characters, characters
+/// that turn the direction of writing or break lines, and bytes that are not UTF-8 become "\n",
+/// "\t" and so on or "\xNN" for each byte.
 ///
 ///     visibleText("a\nb\xff");  // a\nb\xFF
 ///

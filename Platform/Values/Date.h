@@ -11,7 +11,7 @@ namespace Varnel::Platform {
 ///     Date soon = clock.now() + 1500ns;                     // a microsecond later
 ///     Date launch = std::chrono::sys_days(2016y / 5 / 9);
 ///
-/// A value, and a time point of the standard library. What is finer than a microsecond is cut off,
+/// A value, and a time point of the standard library. Anything finer than a microsecond is cut off,
 /// towards the past.
 class Date final : public std::chrono::sys_time<std::chrono::microseconds> {
  public:

@@ -6,7 +6,7 @@
 
 namespace Varnel::Platform {
 
-/// An amount of calendar time, unit by unit; what is not set counts for nothing.
+/// An amount of calendar time, unit by unit. A unit that is not set counts as 0.
 ///
 ///     const DateComponents quarter{.month = 3};
 ///

@@ -5,8 +5,8 @@
 
 namespace Varnel::Platform {
 
-/// Whose notifications they are: the product, as its notification center keeps it and as the
-/// desktop shows it to the user.
+/// The product that notifications come from, as its notification center keeps it and as the desktop
+/// shows it to the user.
 ///
 ///     const NotificationSource fotovia{.identifier = "com.example.Fotovia",
 ///                                      .name = "Fotovia 3",

@@ -9,7 +9,7 @@ std::string_view PathReader::next() {
   const std::size_t start = position_;
   if (path_[start] == '/') {
     position_ = std::min(path_.find_first_not_of('/', start), path_.size());
-    // Slashes between two names only part them; at either end they are a component.
+    // Slashes between two names only separate them; at either end they are a component.
     if (start == 0 || atEnd()) return path_.substr(start, 1);
     return next();
   }

@@ -26,7 +26,7 @@ class VARNEL_API PathReader final {
 
   [[nodiscard]] bool atEnd() const { return position_ == path_.size(); }
 
-  /// The component at the reader's place, which moves behind it. Not to be called at the end.
+  /// The next component; the reader moves behind it. Not to be called at the end.
   [[nodiscard]] std::string_view next();
 
  private:
@@ -37,7 +37,7 @@ class VARNEL_API PathReader final {
 /// Every component of a path as `PathReader` gives them; none for an empty text. Any thread.
 [[nodiscard]] VARNEL_API PathComponents pathComponents(std::string_view path);
 
-/// The components of a URL's path; the trailing slash of a folder is none of them. Any thread.
+/// The components of a URL's path; the trailing slash of a folder does not count. Any thread.
 [[nodiscard]] VARNEL_API PathComponents pathComponents(const URL& url);
 
 /// The path of these components, with one slash between each two: runs of slashes are collapsed and

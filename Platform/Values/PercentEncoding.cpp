@@ -45,7 +45,7 @@ void appendPercentEncoded(std::string& out, std::string_view text, const ByteSet
 }
 
 void appendPercentRepaired(std::string& out, std::string_view text, const ByteSet& allowed) {
-  // What is valid already, mostly everything, goes over in runs.
+  // Valid bytes, which are nearly all, are copied in runs.
   std::size_t run = 0;
   for (std::size_t i = 0; i < text.size(); ++i) {
     if (contains(allowed, text[i]) || isEscape(text.substr(i))) continue;

@@ -24,7 +24,7 @@ inline constexpr std::string_view localizedRecoveryOptionsKey = "NSLocalizedReco
 inline constexpr std::string_view underlyingErrorKey = "NSUnderlyingError";
 
 /// The error that every other kind of error bridges to: a domain, a code within it, and further
-/// facts by key. What a system calls its common error object.
+/// facts by key. Some systems call this their common error object.
 ///
 ///     PlatformError error("Varnel.GenericError", 0);
 ///     log(error.description());  // Error Domain=Varnel.GenericError Code=0 "…"

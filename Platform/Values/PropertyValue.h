@@ -35,9 +35,9 @@ class PropertyValue final {
   using Storage = std::variant<std::nullptr_t, bool, std::int64_t, double, std::string,
                                PropertyData, Date, PropertyList, PropertyDictionary>;
 
-  /// Null, which is a value too; what is not there at all is an absent `PropertyValue`.
+  /// Null, which is a value too. A value that is missing altogether is an absent `PropertyValue`.
   PropertyValue(std::nullptr_t) : storage_(nullptr) {}
-  /// Truth values alone: no pointer and no number turns into one.
+  /// Truth values only: no pointer and no number is converted.
   template <std::same_as<bool> Truth>
   PropertyValue(Truth value) : storage_(value) {}
   /// Any whole number that 64 bits with a sign hold.
@@ -45,7 +45,7 @@ class PropertyValue final {
   requires(!std::same_as<Number, bool> && (std::is_signed_v<Number> || sizeof(Number) < 8))
       PropertyValue(Number value)
       : storage_(static_cast<std::int64_t>(value)) {}
-  /// No whole number turns into one that floats.
+  /// Whole numbers are not converted to it.
   template <std::floating_point Number>
   PropertyValue(Number value) : storage_(static_cast<double>(value)) {}
   PropertyValue(std::string value) : storage_(std::move(value)) {}
@@ -62,7 +62,7 @@ class PropertyValue final {
     return std::get_if<Type>(&storage_);
   }
 
-  /// What `visitor` answers for the value as its own type.
+  /// The answer of `visitor` for the value as its own type.
   template <typename Visitor>
   decltype(auto) visit(Visitor&& visitor) const {
     return std::visit(std::forward<Visitor>(visitor), storage_);

@@ -25,19 +25,20 @@ namespace Varnel::Platform {
 ///     page->absoluteString();     // "https://quennel.example/%C3%BCber%20uns?lang=de"
 ///
 /// A path is a run of bytes, as the system sees it: every byte comes back from `path()` as it went
-/// in, valid UTF-8 or not. Nothing here asks the file system. An immutable value but for its
+/// in, valid UTF-8 or not. Nothing here asks the file system. An immutable value, except for its
 /// temporary resource values; two URLs are equal when their texts are.
 class VARNEL_API URL final {
  public:
   /// The URL of a file system path. A trailing "/" marks a folder. A relative path stays relative.
   [[nodiscard]] static URL fileURLWithPath(std::string_view path);
 
-  /// The file URL whose `absoluteString()` is `text`; absent for any text that no file URL has.
+  /// The file URL whose `absoluteString()` is `text`; absent when no file URL has this text.
   [[nodiscard]] static std::optional<URL> fileURLWithAbsoluteString(std::string_view text);
 
   /// The URL that `text` means. Valid bytes and escapes stay as they are; a byte that may not stand
-  /// where it does is percent-encoded. Absent when the text is empty or its structure is no URL's:
-  /// a scheme, host or port that can be none, or a first path component that looks like a scheme.
+  /// where it does is percent-encoded. Absent when the text is empty or does not have the structure
+  /// of a URL: a malformed scheme, host or port, or a first path component that looks like a
+  /// scheme.
   [[nodiscard]] static std::optional<URL> parse(std::string_view text);
 
   /// The same for a text that may be relative to `base`; the answer is the URL that the two make.

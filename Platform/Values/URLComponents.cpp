@@ -65,12 +65,12 @@ std::string withoutDotSegments(std::string_view path) {
 
 std::string mergedPath(const URLComponents& base, std::string_view reference) {
   const bool isBareHost = base.host && base.path.empty();
-  // Without a slash, the last position plus one is nothing at all.
+  // Without a slash, `rfind` plus one is 0.
   std::string merged(isBareHost ? "/" : base.path.substr(0, base.path.rfind('/') + 1));
   return merged += reference;
 }
 
-// What must stand before a path lest its beginning read as a host or a scheme.
+// The text to put before a path whose beginning would otherwise read as a host or a scheme.
 std::string_view guardOf(const URLComponents& parts) {
   if (parts.host) return {};
   if (parts.path.starts_with("//")) return "/.";

@@ -29,11 +29,11 @@ struct VARNEL_API URLComponents final {
 
   [[nodiscard]] static URLComponents split(std::string_view text);
 
-  /// The text of the parts. Where they would read back as others (a path that begins with "//" and
-  /// no host before it), "/." or "./" keeps them apart.
+  /// The text of the parts. Where the text would be split differently (a path that begins with "//"
+  /// and no host before it), "/." or "./" goes before the path.
   [[nodiscard]] std::string text() const;
 
-  /// The text of the URL that this reference means, seen from `base` (RFC 3986, section 5.2). A
+  /// The text of the URL that this reference means relative to `base` (RFC 3986, section 5.2). A
   /// reference with a scheme stays as it is.
   [[nodiscard]] std::string textResolvedAgainst(const URLComponents& base) const;
 };

@@ -48,7 +48,7 @@ bool isBracketedAddress(std::string_view host) {
                      [](char c) { return isHexDigit(c) || c == ':' || c == '.'; });
 }
 
-// A name in another script is repaired by its bytes; a name with blanks or brackets is none.
+// A name in another script has its bytes encoded. A name with blanks or brackets is refused.
 bool isHostName(std::string_view host) {
   return std::all_of(host.begin(), host.end(), [](char c) {
     return contains(nameBytes, c) || c == '%' || static_cast<unsigned char>(c) >= 0x80;
@@ -56,8 +56,8 @@ bool isHostName(std::string_view host) {
 }
 
 bool isPort(std::string_view port) {
-  constexpr std::size_t mostDigits = 5;
-  if (port.size() > mostDigits || !std::all_of(port.begin(), port.end(), isDigit)) return false;
+  constexpr std::size_t maxDigits = 5;
+  if (port.size() > maxDigits || !std::all_of(port.begin(), port.end(), isDigit)) return false;
   int number = 0;
   for (const char c : port) number = number * 10 + (c - '0');
   return number <= 65535;

@@ -20,13 +20,14 @@ struct VARNEL_API URLQueryItem final {
   bool operator==(const URLQueryItem&) const = default;
 };
 
-/// The items of an encoded query, in order. Only "&" parts items, and only the first "=" of an item
-/// parts its name from its value; "+" is a plus. An empty query has no items; between two
+/// The items of an encoded query, in order. Only "&" separates items, and only the first "=" of an
+/// item separates its name from its value; "+" is a plus. An empty query has no items; between two
 /// neighbouring "&" stands an item with an empty name.
 [[nodiscard]] VARNEL_API std::vector<URLQueryItem> decodedURLQuery(std::string_view query);
 
 /// The query of these items: letters, digits and "-._~!$'()*+,:;@/?" stay, every other byte is
-/// percent-encoded. `decodedURLQuery` gives the same items back (but for one empty flag alone).
+/// percent-encoded. `decodedURLQuery` gives the same items back, except for a query of one empty
+/// flag.
 ///
 ///     encodedURLQuery(items);  // "ov2&product=Orvane%202&source="
 [[nodiscard]] VARNEL_API std::string encodedURLQuery(std::span<const URLQueryItem> items);

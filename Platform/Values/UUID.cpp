@@ -40,8 +40,8 @@ std::mt19937_64 seededEngine() {
 }  // namespace
 
 std::string randomUUIDString() {
-  // The system's randomness comes without a library whose state is gone once the process exits:
-  // an inventory may still be under way by then.
+  // The system's randomness needs no library. A library's state may be gone while the process
+  // exits, when an inventory may still be under way.
   std::random_device random;
   Words words{};
   std::generate(words.begin(), words.end(), std::ref(random));

@@ -12,7 +12,7 @@ namespace Varnel::Platform {
 /// "6F1C0E5A-2F8E-4C0B-9B1B-7B9D4E2A8C11". Any thread; the randomness is the system's own.
 [[nodiscard]] VARNEL_API std::string randomUUIDString();
 
-/// The same in numbers: it asks for the system's randomness once, and then takes a hundredth of the
+/// For many UUIDs: it asks for the system's randomness once, and then takes a hundredth of the
 /// time. For names that must differ, not for secrets. One thread at a time.
 class VARNEL_API UUIDGenerator final {
  public:

@@ -9,7 +9,7 @@
 
 namespace Varnel::Platform {
 
-/// What a center tells the user, now or at some date.
+/// A message to the user, shown by a center now or at some date.
 ///
 ///     UserNotification tomorrow{.identifier = "com.example.daily", .title = "Good morning"};
 ///     tomorrow.deliveryDate = calendar.adding({.day = 1}, clock.now());
@@ -18,17 +18,17 @@ namespace Varnel::Platform {
 /// Texts are plain and UTF-8; a button without a title is not shown. A plain value.
 struct UserNotification final {
   /// Tells the notification from others: a center holds one scheduled and one delivered with the
-  /// same identifier. Those without one are told apart by all that they hold.
+  /// same identifier. Notifications without one are equal only if all their members are.
   std::optional<std::string> identifier = std::nullopt;
   std::optional<std::string> title = std::nullopt;
   std::optional<std::string> informativeText = std::nullopt;
   std::optional<std::string> actionButtonTitle = std::nullopt;
   std::optional<std::string> otherButtonTitle = std::nullopt;
 
-  /// When to deliver it; at once when absent or past. Of a scheduled notification that repeats it
+  /// When to deliver it; at once when absent or past. For a scheduled notification that repeats, it
   /// is the next date.
   std::optional<Date> deliveryDate = std::nullopt;
-  /// How often to deliver it again. Must be positive; others do not repeat.
+  /// How often to deliver it again. Must be positive; otherwise the notification does not repeat.
   std::optional<DateComponents> deliveryRepeatInterval = std::nullopt;
   /// When it was delivered; set by the center.
   std::optional<Date> actualDeliveryDate = std::nullopt;

@@ -7,8 +7,8 @@
 
 namespace Orvane {
 
-/// The leave to read file contents. The scan opens and reads files only inside `whileAccessing`, so
-/// that whoever implements it decides how many readers a disk has at once. Any thread.
+/// Permission to read file contents. The scan opens and reads files only inside `whileAccessing`,
+/// so the implementation decides how many readers a disk has at once. Any thread.
 class ContentAccess {
  public:
   virtual ~ContentAccess() = default;

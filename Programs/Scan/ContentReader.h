@@ -13,20 +13,20 @@ namespace Orvane {
 
 struct ScanControl;
 
-/// A 128-bit digest of some bytes. Equal digests mean likely equal bytes, never certainly: someone
-/// who wants to can make two contents that agree in it.
+/// A 128-bit digest of some bytes. Equal digests make equal bytes likely but never certain:
+/// different contents with one digest can be made on purpose.
 using Digest = std::array<std::uint64_t, 2>;
 
-/// What became of the comparison of two files.
+/// The outcome of the comparison of two files.
 struct Comparison {
   bool isEqual = false;
   std::optional<Loss> firstLoss{};
   std::optional<Loss> secondLoss{};
 };
 
-/// One worker's means to look at contents: the ports and the buffers that it uses over and over. It
-/// counts what it reads and stops at the next block once it is asked to; what it returns then is of
-/// no use. One thread at a time.
+/// Reads contents for one worker, with ports and buffers that it uses over and over. It counts what
+/// it reads. Once asked to stop, it stops at the next block, and its result is of no use. One
+/// thread at a time.
 class ContentReader final {
  public:
   using DigestResult = Varnel::Platform::Result<Digest, Loss>;

@@ -18,7 +18,7 @@ ContentStream::ContentStream(const FileRecord& file, std::uint64_t length, Ports
 ContentStream::Block ContentStream::next(std::span<std::byte> buffer) {
   if (remaining_ < buffer.size()) buffer = buffer.first(static_cast<std::size_t>(remaining_));
   Block block = Loss{Loss::Kind::unreadable, std::make_error_code(std::errc::no_such_device)};
-  // There is no access to a file on no known volume.
+  // A file on no known volume cannot be accessed.
   (void)ports_.access.whileAccessing(path_, file_.status.identity.device,
                                      [&] { block = readBlock(buffer); });
   return block;

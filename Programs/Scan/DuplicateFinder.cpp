@@ -16,8 +16,8 @@
 namespace Orvane {
 namespace {
 
-/// How much of a file is looked at first: what a disk reads in one go anyway, and all of most
-/// files.
+/// How much of a file is looked at first. A disk reads this much in one go anyway, and most files
+/// are not larger.
 constexpr std::uint64_t headLength = 4096;
 constexpr std::uint64_t wholeLength = std::numeric_limits<std::uint64_t>::max();
 
@@ -138,7 +138,7 @@ class Scan final {
   }
 
   /// Digests each candidate's first `length` bytes and leaves out those that are lost. The
-  /// candidates come sorted by disk.
+  /// candidates are sorted by disk.
   void takeDigests(Candidates& candidates, std::uint64_t length) {
     std::vector<std::size_t> ends;
     for (std::size_t i = 1; i <= candidates.size(); ++i) {
@@ -217,7 +217,7 @@ class Scan final {
         }
       }
       if (loss) {
-        // Without the first file its comparisons count for nothing.
+        // Comparisons with a first file that was lost do not count.
         losses.emplace_back(group.front()->path(), *loss);
         different.insert(different.end(), equal.begin() + 1, equal.end());
         std::sort(different.begin(), different.end(),
@@ -237,7 +237,7 @@ class Scan final {
     for (const FileRecord* file : equal) group.paths.push_back(file->path());
   }
 
-  /// Has the workers run `read` for every index up to the last of the lanes' ends.
+  /// Makes the workers run `read` for every index below the end of the last lane.
   template <typename Read>
   void readAll(const std::vector<std::size_t>& laneEnds, const Read& read) {
     if (laneEnds.empty() || laneEnds.back() == 0) return;

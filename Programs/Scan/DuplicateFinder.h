@@ -13,14 +13,14 @@ class FileSystem;
 class ScanObserver;
 struct ScanControl;
 
-/// Finds the files of equal content in some folders. Files are told apart by ever dearer means:
-/// their size, the digest of their beginning, the digest of everything; what is left is compared
-/// byte by byte, so that the result holds true duplicates only.
+/// Finds the files of equal content in some folders. Files are told apart by their size, then by a
+/// digest of their beginning, then by a digest of everything. Files that still agree are compared
+/// byte by byte, so the result holds true duplicates only.
 ///
 ///     DuplicateFinder finder({systemFileSystem(), access, observer}, 4);
 ///     ScanResult result = finder.find({"/home/u/Pictures"}, control);
 ///
-/// The hard links of one file are one file, known by the first of its paths; symbolic links and
+/// All hard links of a file count as one file, known by the first of its paths; symbolic links and
 /// empty files have no part. A file that cannot be read, is gone or changes meanwhile is left out,
 /// counted and reported to the observer. The same files give the same result in the same order,
 /// however many threads read them. One call at a time; the finder keeps nothing from one to the

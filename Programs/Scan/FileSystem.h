@@ -16,7 +16,7 @@ namespace Orvane {
 template <typename Value>
 using FileResult = Varnel::Platform::Result<Value, std::error_code>;
 
-/// Which file it is, whatever names it has.
+/// Identifies a file, whatever names it has.
 struct FileIdentity {
   std::uint64_t device = 0;
   std::uint64_t inode = 0;
@@ -24,7 +24,7 @@ struct FileIdentity {
   auto operator<=>(const FileIdentity&) const = default;
 };
 
-/// What tells one state of a file's content from another.
+/// Tells one state of a file's content from another.
 struct FileStatus {
   FileIdentity identity;
   std::uint64_t size = 0;       ///< Bytes.
@@ -33,8 +33,8 @@ struct FileStatus {
   bool operator==(const FileStatus&) const = default;
 };
 
-/// What one folder holds: its regular files and its folders, by name and in no order. Everything
-/// else in it (symbolic links, devices, sockets, pipes) is left out.
+/// The content of one folder: its regular files and its folders, by name and in no order.
+/// Everything else in it (symbolic links, devices, sockets, pipes) is left out.
 struct FolderListing {
   struct File {
     std::string name;
@@ -76,8 +76,8 @@ class FileSystem {
   /// Lists a folder, as far as it can be read.
   [[nodiscard]] virtual FileResult<FolderListing> list(const std::string& folder) = 0;
 
-  /// Opens a file; never waits for the other end of a pipe that took the file's place. Whether it
-  /// is still a file, and which, its status tells.
+  /// Opens a file, and never waits for the other end of a pipe that took the file's place. The
+  /// status tells whether it is still a file, and which one.
   [[nodiscard]] virtual FileResult<std::unique_ptr<OpenFile>> open(const std::string& path,
                                                                    ReadingPlan plan) = 0;
 };

@@ -15,7 +15,8 @@
 namespace Orvane {
 namespace {
 
-/// The path of what goes by the name in the folder. Takes no recursion, however deep it lies.
+/// The path of the entry with this name in the folder. Works without recursion, however deep the
+/// folder lies.
 std::string pathBelow(const Folder* folder, std::string_view name) {
   std::size_t size = name.size();
   for (const Folder* each = folder; each != nullptr; each = each->parent)
@@ -27,7 +28,7 @@ std::string pathBelow(const Folder* folder, std::string_view name) {
   return path;
 }
 
-/// Whether the folder is one of those from `folder` up to the one that was given.
+/// Whether the folder is `folder` or one of those above it, up to the root of the walk.
 bool isOnTheWay(const FileIdentity& identity, const Folder* folder) {
   for (; folder != nullptr; folder = folder->parent)
     if (folder->identity == identity) return true;
@@ -41,7 +42,7 @@ class Walk final {
   Walk(const std::vector<std::string>& folders, FileSystem& fileSystem, ScanControl& control)
       : fileSystem_(fileSystem), control_(control), given_(folders.begin(), folders.end()) {}
 
-  /// Lists the folders given, so that a scan of what is not there ends before it begins.
+  /// Lists the given folders first, so that a scan of a missing folder ends before it begins.
   [[nodiscard]] bool start() {
     for (const std::string& path : given_) {
       ++running_;
@@ -81,7 +82,7 @@ class Walk final {
   /// Lists the folder, files its content and returns the folders in it.
   std::vector<Folder> visit(Folder folder) {
     const std::string path = folder.path();
-    // A folder given that lies in another one is walked by itself.
+    // A given folder that lies in another one is walked by itself.
     if (folder.parent != nullptr && given_.contains(path)) return {};
     FileResult<FolderListing> listing = fileSystem_.list(path);
     const std::lock_guard lock(mutex_);

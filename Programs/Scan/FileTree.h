@@ -15,8 +15,8 @@ struct ScanControl;
 /// A folder that the walk has listed. It knows its way up rather than its path, so that a deep tree
 /// takes no more memory than a wide one.
 struct Folder {
-  const Folder* parent = nullptr;  ///< Kept by the tree; null for a folder that was given.
-  std::string name;                ///< For a folder that was given its path, empty for "/".
+  const Folder* parent = nullptr;  ///< Kept by the tree; null for a given folder.
+  std::string name;                ///< For a given folder its path, which is empty for "/".
   FileIdentity identity{};
 
   [[nodiscard]] std::string path() const;
@@ -39,14 +39,14 @@ struct FileRecord {
 ///     FileTree tree = walkFolders({"/home/u/Pictures"}, systemFileSystem(), 4, control);
 ///
 /// Symbolic links are not followed, and a folder that is mounted again below itself is not entered
-/// again. A folder that is given twice, or lies in another one given, is walked once. A value that
-/// moves; the records refer to its folders.
+/// again. A folder that is given twice, or lies in another given one, is walked once. A value that
+/// can be moved but not copied; the records refer to its folders.
 struct FileTree {
   std::deque<Folder> folders;
   std::vector<FileRecord> files;          ///< In no order; hard links are separate records.
   std::vector<LostPath> unreadableFiles;  ///< In the order of their paths, as the next.
   std::vector<LostPath> unreadableFolders;
-  std::vector<LostPath> lostRoots;  ///< Folders given that could not be listed.
+  std::vector<LostPath> lostRoots;  ///< Given folders that could not be listed.
 };
 
 /// Walks the folders, given by absolute paths without symbolic links, with several threads. It

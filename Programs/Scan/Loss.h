@@ -11,7 +11,7 @@ struct Loss {
   enum class Kind {
     unreadable,  ///< The system refused or failed to read it.
     vanished,    ///< It was gone when its turn came.
-    changed,     ///< It is not, or no longer, what the walk saw.
+    changed,     ///< It is no longer what the walk saw.
     incomplete,  ///< A part of the folder was read before the system failed.
   };
 

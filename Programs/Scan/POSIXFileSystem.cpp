@@ -161,7 +161,7 @@ class POSIXFileSystem final : public FileSystem {
   FileResult<std::unique_ptr<OpenFile>> open(const std::string& path, ReadingPlan plan) override {
     Descriptor descriptor = openWithoutLinks(path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
     if (descriptor.get() < 0) return lastError();
-    // Without read-ahead a cold disk is asked for the beginning alone.
+    // Without read-ahead, a cold disk reads only the beginning.
     if (plan == ReadingPlan::beginningOnly)
       ::posix_fadvise(descriptor.get(), 0, 0, POSIX_FADV_RANDOM);
     std::unique_ptr<OpenFile> file = std::make_unique<DescriptorFile>(std::move(descriptor));

@@ -9,8 +9,8 @@
 
 namespace Orvane {
 
-/// Hears what a scan leaves out. Called on the thread that runs the scan, in the order of the
-/// paths within each step.
+/// Hears of everything that a scan leaves out. Called on the thread that runs the scan, in the
+/// order of the paths within each step.
 class ScanObserver {
  public:
   virtual ~ScanObserver() = default;
@@ -19,8 +19,8 @@ class ScanObserver {
   virtual void folderLeftOut(const std::string& path, const Loss& loss) = 0;
 };
 
-/// How far a running scan is, for any thread to look at, and the wish to stop it, for any thread or
-/// signal handler to set. The figures are taken one by one and need not fit together.
+/// The progress of a running scan, which any thread may read, and the request to stop it, which any
+/// thread or signal handler may set. The figures are read one by one and need not fit together.
 struct ScanControl {
   std::atomic<bool> isCancelled{false};
   std::atomic<std::uint64_t> filesFound{0};

@@ -20,7 +20,7 @@ struct DuplicateGroup {
   bool operator==(const DuplicateGroup&) const = default;
 };
 
-/// What a scan saw. Every regular file is one of `files`; the lines below it say what became of
+/// The figures of a scan. Every regular file is counted in `files`; the members below it count
 /// those that had no part in the comparison.
 struct ScanTotals {
   std::uint64_t folders = 0;

@@ -26,7 +26,7 @@ void runOnThreads(unsigned count, const std::function<void(unsigned)>& work) {
     for (unsigned worker = 1; worker < count; ++worker)
       helpers.push_back(Varnel::Platform::startThread("scan", [&, worker] { guarded(worker); }));
   } catch (const std::exception&) {
-    // Out of threads or memory: those that run do the work.
+    // Out of threads or memory: the threads that already run do the work.
   }
   guarded(0);
   for (std::thread& helper : helpers) helper.join();

@@ -22,8 +22,8 @@ class WorkLanes final {
   /// `ends`: the ascending ends of the lanes.
   explicit WorkLanes(const std::vector<std::size_t>& ends);
 
-  /// Draws an index from the worker's lane or, when that is used up, from the ones after it. False
-  /// when all are.
+  /// Draws an index from the worker's lane or, when that is used up, from the next lanes. False
+  /// when all are used up.
   [[nodiscard]] bool next(unsigned worker, std::size_t& index);
 
  private:

@@ -125,9 +125,9 @@ void addSound(CLI::App& app, Invocation& invocation) {
       ->required();
 }
 
-/// Gives the folders among the arguments of a scan such names that the parser takes them for what
-/// they are. It would split "[a,b]" in two, has a use of its own for "++", and looks for options
-/// behind a "--" that follows a folder.
+/// Rewrites the folders among the arguments of a scan so that the parser takes them as folders. It
+/// would split "[a,b]" in two, treat "++" specially, and look for options behind a "--" that
+/// follows a folder.
 void protectFolders(std::vector<std::string>& arguments) {
   const auto command = std::find_if(arguments.begin(), arguments.end(), [](const auto& argument) {
     return !argument.starts_with('-');

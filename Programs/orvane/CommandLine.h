@@ -25,7 +25,7 @@ struct UsageError {
   std::string message;
 };
 
-/// Reads the program's arguments; does nothing of what they ask for.
+/// Parses the program's arguments, and runs nothing.
 [[nodiscard]] std::variant<Invocation, Information, UsageError> parseCommandLine(
     int count, const char* const* arguments);
 

@@ -23,7 +23,7 @@ class ConsoleOutput final : public Varnel::Platform::StandardOutput {
 }  // namespace
 
 void sendLogTo(Console& console) {
-  // Process ports are used until the process has ended.
+  // Never destroyed: the process's ports are used until it has ended.
   static ConsoleOutput& output = *new ConsoleOutput(console);
   [[maybe_unused]] const bool isInTime = Varnel::Platform::installProcessPorts(
       Varnel::Platform::systemPorts().withStandardOutput(output));

@@ -12,7 +12,8 @@ namespace {
 
 using Varnel::Platform::URL;
 
-/// What the system can be asked about: the path or, of one that is too long, a folder on the way.
+/// The longest part of the path that the system accepts: the path itself or, if that is too long, a
+/// folder above.
 std::string askablePath(const std::string& path) {
   return path.size() < PATH_MAX ? path : path.substr(0, path.rfind('/', PATH_MAX - 1));
 }
@@ -25,7 +26,8 @@ ManagedContentAccess::ManagedContentAccess(Ports ports, Varnel::Platform::Qualit
 bool ManagedContentAccess::whileAccessing(const std::string& path, std::uint64_t device,
                                           const std::function<void()>& read) {
   const URL url = URL::fileURLWithPath(askablePath(path));
-  // No scope to open: the user named the folders, and what cannot be read shows when it is opened.
+  // No security scope to open: the user named the folders, and an unreadable file shows when it is
+  // opened.
   const Varnel::DiskAccessGuard access(ports_.manager.beginAccessingURL(
       url, "Search for duplicates", qos_, false, std::nullopt, volumeOf(url, device)));
   if (!access) return false;
@@ -34,7 +36,7 @@ bool ManagedContentAccess::whileAccessing(const std::string& path, std::uint64_t
 }
 
 std::optional<URL> ManagedContentAccess::volumeOf(const URL& url, std::uint64_t device) {
-  // A device's volumes all lie on one disk, so the first that is met stands for them; asking once
+  // All volumes of a device number lie on one disk, so the first one found stands for them. This
   // saves a look-up for every file.
   {
     const std::lock_guard lock(mutex_);

@@ -44,7 +44,7 @@ Basalt::JSON storedJSON() {
 }  // namespace
 
 SchedulePeriodOption storedPeriod() {
-  // The box takes whatever is no period for never.
+  // The box turns any value that is no period into never.
   return Varnel::SchedulePeriodOptionBox(storedJSON()).boxed();
 }
 

@@ -19,8 +19,8 @@ class Console;
 [[nodiscard]] Varnel::SchedulePeriodOption storedPeriod();
 void storePeriod(Varnel::SchedulePeriodOption period);
 
-/// Lets the desktop show and take away what the center told it to. Complains when that takes more
-/// than a few seconds, and leaves it there.
+/// Lets the desktop show and take away what the center told it to. If that takes more than a few
+/// seconds, it complains and does not wait longer.
 void awaitDesktop(Varnel::Platform::UserNotificationCenter& center, Console& console);
 
 /// The stored period and the notifications of a center, a line each.

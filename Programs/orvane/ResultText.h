@@ -23,8 +23,8 @@ struct ScanResult;
 
 /// The result for programs: one JSON object on one line. Each of its "groups" has the "size" of a
 /// file in bytes and the "paths"; the totals stand beside them. Where a path is not UTF-8, which
-/// JSON texts must be, its wrong bytes show as U+FFFD, and the group has "urls" besides: the file
-/// URLs of all its paths, in which no byte is lost.
+/// JSON texts must be, its wrong bytes show as U+FFFD, and the group also has "urls": the file URLs
+/// of all its paths, in which no byte is lost.
 [[nodiscard]] std::string jsonOf(const ScanResult& result);
 
 }  // namespace Orvane

@@ -17,7 +17,7 @@ namespace {
 using Tallyhouse::SpoolingTransport;
 using Varnel::Platform::URL;
 
-constexpr auto longestGoodbye = std::chrono::seconds(2);
+constexpr auto maxGoodbye = std::chrono::seconds(2);
 
 class ScanSender final : public Varnel::CommonAnalyticsSender {
  public:
@@ -29,7 +29,7 @@ bool isOnThisMachine(const URL& url) {
   return url.hasHost("127.0.0.1") || url.hasHost("localhost") || url.hasHost("[::1]");
 }
 
-// The holder would find each of them for itself, and the download twice.
+// Found here together. The holder would find each by itself, and the download twice.
 void identifyUser() {
   using Holder = Varnel::CustomDimensionsHolder;
   const auto user =
@@ -68,8 +68,7 @@ ScanAnalytics::ScanAnalytics(const std::optional<std::string>& endpoint, bool pr
 }
 
 ScanAnalytics::~ScanAnalytics() {
-  if (transport_ && !transport_->drain(longestGoodbye))
-    sender_->log("Events wait for the next run");
+  if (transport_ && !transport_->drain(maxGoodbye)) sender_->log("Events wait for the next run");
 }
 
 void ScanAnalytics::scanStarted(std::size_t folders) {

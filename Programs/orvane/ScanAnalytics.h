@@ -19,7 +19,7 @@ class ScanAnalytics final {
 
   /// Without an endpoint nothing is sent.
   ScanAnalytics(const std::optional<std::string>& endpoint, bool printsEvents);
-  /// Gives events a moment to arrive; otherwise they wait for the next run.
+  /// Gives events a moment to arrive. Those that do not wait for the next run.
   ~ScanAnalytics();
   ScanAnalytics(const ScanAnalytics&) = delete;
   ScanAnalytics& operator=(const ScanAnalytics&) = delete;
@@ -30,7 +30,7 @@ class ScanAnalytics final {
 
  private:
   std::shared_ptr<Tallyhouse::SpoolingTransport> transport_;
-  std::unique_ptr<Varnel::CommonAnalyticsSender> sender_;  ///< Absent when nobody listens.
+  std::unique_ptr<Varnel::CommonAnalyticsSender> sender_;  ///< Null when events go nowhere.
 };
 
 }  // namespace Orvane

@@ -134,7 +134,7 @@ int ScanCommand::run(Console& console) const {
   const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.numberIdentifier());
   const bool written = console.writeResult(
       isJSON ? jsonOf(result) : textOf(result, byteCounts, Varnel::QNURLResolver::shared()));
-  // A machine without sound has done its work all the same.
+  // The scan has succeeded even on a machine without sound.
   if (playsSound) playToTheEnd(Varnel::Sound::scanComplete);
   return written ? 0 : 1;
 }

@@ -18,7 +18,7 @@ struct SoundCommand {
   [[nodiscard]] int run(Console& console) const;
 };
 
-/// Plays a sound and waits for its end. What went wrong, or nothing. Main thread only.
+/// Plays a sound and waits for its end. Returns the error, or nothing. Main thread only.
 std::optional<std::string> playToTheEnd(Varnel::Sound sound);
 
 }  // namespace Orvane

@@ -16,7 +16,7 @@ void failOnClosedPipes();
 /// Writes all of the text to the standard output, or says what went wrong.
 [[nodiscard]] std::error_code writeStandardOutput(std::string_view text);
 
-/// Writes the text to standard error; a failure has nobody to be told to.
+/// Writes the text to standard error; a failure there cannot be reported.
 void writeStandardError(std::string_view text);
 
 [[nodiscard]] bool isStandardErrorATerminal();

@@ -7,7 +7,7 @@
 
 extern "C" {
 
-// What the running product declared of itself, in a form that code in any language can call. The
+// The running product's declaration of itself, as functions that code in any language can call. The
 // library belongs to no product: see Product.h.
 
 VARNEL_API bool QNIsAppStoreVersion();
@@ -15,7 +15,7 @@ VARNEL_API bool QNIsSiteVersion();
 VARNEL_API bool QNIsMarkettaVersion();
 VARNEL_API bool QNIsPrivateBetaMode();
 VARNEL_API bool QNIsDebugMode();
-/// UTF-8, as the two below; lives as long as the process.
+/// UTF-8, as are the two below; lives as long as the process.
 VARNEL_API const char* QNAppName();
 VARNEL_API const char* QNAppDisplayVersion();
 VARNEL_API const char* QNAppArrangeVersion();
@@ -53,8 +53,9 @@ struct VARNEL_API BuildSwitches final {
 
   bool operator==(const BuildSwitches&) const = default;
 
-  /// What the exported functions answer: what the product declared or, in a program that declares
-  /// none, its executable's name and the site channel. Any thread; never changes.
+  /// The switches behind the exported functions: those that the product declared or, in a program
+  /// that declares no product, the executable's name and the site channel. Any thread; never
+  /// changes.
   [[nodiscard]] static const BuildSwitches& ofThisProduct();
 };
 

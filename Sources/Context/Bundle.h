@@ -19,12 +19,12 @@ namespace Varnel {
 ///     const Bundle bundle = Bundle::main();
 ///     bundle.localizedString("Varnel_Quit");  // "Beenden", or the key where there is no text
 ///
-/// A cheap value; copies share what has been read. Files are read on first use and kept. What is
-/// missing or damaged counts as absent. Any thread.
+/// A cheap value; copies share what has been read. Files are read on first use and kept. A missing
+/// or damaged file counts as absent. Any thread.
 class VARNEL_API Bundle final {
  public:
   /// The bundle in this folder, for a user who prefers these languages (BCP 47, best first).
-  /// Without a folder the bundle has nothing in it.
+  /// Without a folder the bundle is empty.
   Bundle(std::optional<std::string> folder, std::vector<std::string> languages);
 
   /// The running application's bundle.

@@ -53,19 +53,19 @@ class VARNEL_API Globals final {
   [[nodiscard]] static bool canUseAllCores();
   /// Whether the product has been launched: strictly after 2016-05-09 00:00 UTC.
   [[nodiscard]] static bool isTimeHasCome();
-  /// Computed anew each time: debug mode shows everything, a private beta nothing, and else the
+  /// Computed anew each time. Debug mode shows everything, a private beta nothing; otherwise the
   /// launch date decides.
   [[nodiscard]] static bool isEndUserFeaturesEnabled();
 
   /// The folder that stands in for the trash, made on first use. It bears the temporary resource
-  /// value `OVURLIsBookmarkedKey` (see ProcessFacts.h). That it could not be made is not told.
+  /// value `OVURLIsBookmarkedKey` (see ProcessFacts.h). A failure to make it is not reported.
   [[nodiscard]] static const Platform::URL& fakeTrashURL();
 
   /// `baseIdentifier()` and the suffix joined. An empty suffix is a programming error and stops the
   /// process.
   [[nodiscard]] static std::string identifier(std::string_view suffix);
 
-  /// The text with this build's name wherever the product's default name, "Orvane 2", stands.
+  /// The text with this build's name in every place of the product's default name, "Orvane 2".
   [[nodiscard]] static std::string substitutingApplicationName(std::string_view text);
   /// The same for texts in HTML, where the default name is "Orvane&nbsp;2".
   [[nodiscard]] static std::string substitutingHtmlApplicationName(std::string_view text);

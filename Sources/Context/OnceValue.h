@@ -6,12 +6,12 @@
 
 namespace Varnel {
 
-/// A value computed by whoever reads it first and kept from then on.
+/// A value that its first reader computes, and that is kept from then on.
 ///
 ///     const std::string& name() const { return name_.get([&] { return findName(); }); }
 ///
-/// Any thread; other readers wait for the first. What `compute` throws reaches that reader, and the
-/// next one computes again. `compute` must not read the value itself.
+/// Any thread; other readers wait for the first. An exception of `compute` reaches that reader, and
+/// the next one computes again. `compute` must not read the value itself.
 template <typename Value>
 class OnceValue final {
  public:

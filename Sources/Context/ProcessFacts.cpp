@@ -36,7 +36,7 @@ std::string replacingAll(std::string_view text, std::string_view what, std::stri
 }
 
 // Every channel's build belongs to the one suite and shares its base. An application without a
-// bundle goes by what its product declares, and one without that by its executable's name.
+// bundle uses the identifier that its product declares; without one, its executable's name.
 std::string baseIdentifierOf(const Platform::ProcessInfo& processInfo,
                              const BuildSwitches& switches) {
   const Bundle bundle(processInfo.mainBundleFolder(), {});
@@ -123,7 +123,7 @@ const Platform::URL& ProcessFacts::fakeTrashURL() const {
     const std::string path = ports_.userAccount.homeFolder() + "/Library/Application Support/" +
                              switches_.appName + "/FakeTrash";
     auto url = Platform::URL::fileURLWithPath(path);
-    // Whoever uses the folder finds out soon enough that it could not be made.
+    // The users of the folder will notice if it could not be made.
     std::error_code ignored;
     fs::create_directories(path, ignored);
     url.setTemporaryResourceValue(OVURLIsBookmarkedKey, true);

@@ -17,12 +17,11 @@ namespace Varnel {
 ///         {.isSiteVersion = true, .appName = "Fotovia 3", .appDisplayVersion = "3.1"});
 ///     }
 ///
-/// The program's own start-up calls the constructor, so that nothing need be exported for the
-/// library to find. The object's name is what the linker looks for when the file lies in an
-/// archive; the priority puts it before the program's other objects. A product that names no
-/// channel stops the process at its first question for one. The first declaration counts:
-/// another one that comes later, or after somebody asked, changes nothing and is reported to the
-/// system's log.
+/// The program's own start-up calls the constructor, so nothing need be exported. The linker looks
+/// for the object by its name when the file lies in an archive. The priority constructs it before
+/// the program's other objects. A product that names no channel stops the process at its first
+/// question for one. The first declaration counts: another one that comes later, or after somebody
+/// asked, changes nothing and is reported to the system's log.
 class VARNEL_API Product final {
  public:
   explicit Product(const BuildSwitches& switches);

@@ -75,7 +75,7 @@ class VARNEL_API TargetKind final {
   [[nodiscard]] UserFeatures defaultUserFeatures() const;
 
   /// The features to show when a server suggests some: the App Store build takes the suggestion as
-  /// it is, the others add their defaults to it; without one, each has its defaults.
+  /// it is, the others add their defaults to it; without a suggestion, each build has its defaults.
   [[nodiscard]] UserFeatures userFeatures(std::optional<UserFeatures> withSuggestion) const;
 
   constexpr bool operator==(const TargetKind&) const = default;

@@ -16,8 +16,8 @@
 namespace Varnel {
 namespace {
 
-/// What the look-up of a volume's record is asked, and in time finds. Whoever asks does not wait:
-/// it reads the answer if there is one.
+/// A look-up of a volume's record: the question and, later, the answer. The asking thread does not
+/// wait; it reads the answer if there is one.
 struct RecordLookup {
   explicit RecordLookup(Platform::URL url) : volumeURL(std::move(url)) {}
 
@@ -44,8 +44,8 @@ DiskAccessManager::Ports portsOfProcess() {
 
 }  // namespace
 
-/// What blocks of the planning queue share with the manager. The queue owns it but for what is
-/// said to be anybody's.
+/// The state that blocks of the planning queue share with the manager. The queue owns it, except
+/// for the members that say otherwise.
 class DiskAccessManager::State final : public std::enable_shared_from_this<State> {
  public:
   explicit State(Ports ports)
@@ -75,14 +75,14 @@ class DiskAccessManager::State final : public std::enable_shared_from_this<State
   const std::shared_ptr<Basalt::SerialQueue> planningQueue_;
   const std::shared_ptr<DiskData> unknownDiskData_;
   std::atomic<bool> isBackgroundMode_ = false;
-  std::atomic<bool> isUpdateQueued_ = false;  ///< As long as it has not begun.
+  std::atomic<bool> isUpdateQueued_ = false;  ///< True until the update begins.
 
   const std::shared_ptr<DiskRecords> records_;
   bool isDetached_ = false;
 };
 
 void DiskAccessManager::State::scheduleUpdate() {
-  // An inventory that has not begun sees this change too.
+  // An inventory that has not begun yet will see this change too.
   if (isUpdateQueued_.exchange(true)) return;
   planningQueue_->async([self = shared_from_this()] {
     self->isUpdateQueued_.exchange(false);

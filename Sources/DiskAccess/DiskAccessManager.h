@@ -24,7 +24,7 @@ namespace Varnel {
 
 /// Admits the threads of the process to each physical disk: as many as suit its kind come in at
 /// once, the others wait and come in by quality of service. A place that comes free lets in all
-/// that wait, so under a steady rush there are more readers than that.
+/// waiting threads, so under a steady rush there are more readers than that.
 ///
 ///     auto session = DiskAccessManager::shared().beginAccessingURL(file, "compare");
 ///     if (!session) return;  // no access: do not touch the disk
@@ -55,8 +55,8 @@ class VARNEL_API DiskAccessManager final {
   DiskAccessManager();
   explicit DiskAccessManager(Ports ports);
 
-  /// Waits for an inventory that is under way, after which the ports are not used any more but by
-  /// the sessions that are left.
+  /// Waits for an inventory that is under way. After that, only sessions that are left use the
+  /// ports.
   ~DiskAccessManager();
   DiskAccessManager(const DiskAccessManager&) = delete;
   DiskAccessManager& operator=(const DiskAccessManager&) = delete;
@@ -70,11 +70,11 @@ class VARNEL_API DiskAccessManager final {
   void setIsBackgroundMode(bool isBackgroundMode);
 
   /// Begins access to a file or folder and waits for a place on its disk, at most
-  /// `accessWaitingTimeout` seconds of the wall clock: without a value, or with one that is not a
-  /// number or too large for a date, for ever; a negative one not at all. A thread that has a place
-  /// on the disk gets another at once, and one that came to the volume through the record for
-  /// unknown disks gets another there. `volumeURL` spares the search for the file's volume; it is
-  /// written as the inventory writes it, with a "/" at the end.
+  /// `accessWaitingTimeout` seconds of the wall clock. Without a value, or with one that is not a
+  /// number or too large for a date, it waits for ever; with a negative one, not at all. A thread
+  /// that has a place on the disk gets another at once. If it came to the volume through the record
+  /// for unknown disks, it gets the next place there too. `volumeURL` saves the search for the
+  /// file's volume; it is written as in the inventory, with a "/" at the end.
   ///
   /// Null when the volume cannot be told, the security scope cannot be opened, or the time is up.
   /// In the last case a security scope that was opened stays open.

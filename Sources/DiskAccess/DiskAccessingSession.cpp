@@ -39,7 +39,8 @@ bool DiskAccessingSession::waitForAdmission(Platform::QualityOfService qos,
                                             std::optional<Platform::TimeInterval> waitingTimeout) {
   const Basalt::ThreadID thread = Basalt::currentThreadID();
   Basalt::SerialQueue& queue = diskData_->queue();
-  // The granter shares the request: it may still be signalling when this thread goes on.
+  // The granting thread shares the request, because it may still be signalling when this thread
+  // goes on.
   const auto request = queue.sync([&] {
     if (auto used = records_->usedBy(thread, volumeURL_)) diskData_ = std::move(used);
     auto pending = diskData_->requestAccess(thread, qos);

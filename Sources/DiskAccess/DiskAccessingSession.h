@@ -20,15 +20,15 @@ class DiskData;
 class DiskRecords;
 class OVDiskInfo;
 
-/// What a thread holds while it reads files of one disk; `DiskAccessManager` hands it out.
+/// Held by a thread while it reads files of one disk; `DiskAccessManager` hands it out.
 ///
 ///     if (auto session = DiskAccessManager::shared().beginAccessingURL(file, "compare")) {
 ///       read(file);
 ///       session->endAccessing();
 ///     }
 ///
-/// It belongs to the thread that began it. A thread may hold several, of one disk too, and ends
-/// each. Destruction ends nothing: a session that is dropped keeps its place, and its security
+/// It belongs to the thread that began it. A thread may hold several, even of one disk, and must
+/// end each. Destruction ends nothing: a session that is dropped keeps its place, and its security
 /// scope open. `DiskAccessGuard` ends what it holds.
 class VARNEL_API DiskAccessingSession final {
  public:

@@ -31,7 +31,7 @@ DiskData::DiskData(std::shared_ptr<const OVDiskInfo> diskInfo, bool isBackground
                    std::shared_ptr<Basalt::SerialQueue> queue)
     : queue_(std::move(queue)),
       diskInfo_(std::move(diskInfo)),
-      limit_(diskInfo_->maxTreads()),
+      maxThreads_(diskInfo_->maxTreads()),
       isBackgroundMode_(isBackgroundMode) {}
 
 std::shared_ptr<DiskData::AccessRequest> DiskData::requestAccess(Basalt::ThreadID thread,
@@ -40,7 +40,7 @@ std::shared_ptr<DiskData::AccessRequest> DiskData::requestAccess(Basalt::ThreadI
     accessingThreads_.insert(thread);
     return nullptr;
   }
-  // Threads that come in vain again and again must not pile up in front of a disk that stays full.
+  // Requests of threads that gave up must not pile up while a disk stays full.
   if (requests_.size() == requests_.capacity())
     std::erase_if(requests_, [](const auto& other) { return other->isClaimed(); });
   auto request = std::make_shared<AccessRequest>(urgencyClassOf(qos));
@@ -54,8 +54,8 @@ std::shared_ptr<DiskData::AccessRequest> DiskData::requestAccess(Basalt::ThreadI
 
 void DiskData::releaseAccess(Basalt::ThreadID thread) {
   accessingThreads_.remove(thread);
-  // A request can only join a full disk, whose next release sees it: without any now, there is
-  // nothing that a pass could find.
+  // A request joins only a full disk, and the disk's next release sees it. So if there is none now,
+  // a pass has nothing to do.
   if (!requests_.empty())
     queue_->submit([self = shared_from_this()] { self->grantPendingRequests(); });
 }

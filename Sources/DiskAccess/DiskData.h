@@ -21,22 +21,23 @@ namespace Varnel {
 
 class OVDiskInfo;
 
-/// The record of one disk: who accesses it and who waits to. `DiskAccessManager` keeps one a disk.
+/// The record of one disk: the threads that access it and those that wait. `DiskAccessManager`
+/// keeps one for each disk.
 ///
 /// Held by `std::shared_ptr`. Its queue owns its state: unless said otherwise, operations run on
 /// the queue.
 class VARNEL_API DiskData final : public std::enable_shared_from_this<DiskData> {
  public:
-  /// A thread's place in the line of a full disk. The thread waits for `sema`; whoever claims the
-  /// request first settles its outcome: the granter, or the thread when its time is up.
+  /// A thread's place in the line of a full disk. The thread waits for `sema`; the first to claim
+  /// the request settles its outcome: the granting thread, or the waiting one when its time is up.
   class AccessRequest final {
    public:
     explicit AccessRequest(int urgencyClass) : urgencyClass_(urgencyClass) {}
 
-    /// 0 for the class of requests that is granted first.
+    /// 0 for the class that is granted first.
     [[nodiscard]] int urgencyClass() const { return urgencyClass_; }
 
-    /// True for the first caller alone. Any thread, as the one below.
+    /// True for the first caller alone. Any thread, as for the one below.
     [[nodiscard]] bool claim() { return !flag_.test_and_set(std::memory_order_acq_rel); }
 
     [[nodiscard]] bool isClaimed() const { return flag_.test(std::memory_order_relaxed); }
@@ -53,7 +54,7 @@ class VARNEL_API DiskData final : public std::enable_shared_from_this<DiskData> 
   DiskData(const DiskData&) = delete;
   DiskData& operator=(const DiskData&) = delete;
 
-  /// Any thread, as the one below.
+  /// Any thread, as for the one below.
   [[nodiscard]] const std::shared_ptr<const OVDiskInfo>& diskInfo() const { return diskInfo_; }
   [[nodiscard]] Basalt::SerialQueue& queue() const { return *queue_; }
 
@@ -85,17 +86,18 @@ class VARNEL_API DiskData final : public std::enable_shared_from_this<DiskData> 
   /// How many places are taken, a thread counting once for each that it has.
   [[nodiscard]] std::size_t accessCount() const { return accessingThreads_.count(); }
 
-  /// How many requests stand in line. Those whose thread has given up may be among them.
+  /// How many requests stand in line, perhaps including some whose thread has given up.
   [[nodiscard]] std::size_t requestCount() const { return requests_.size(); }
 
  private:
   [[nodiscard]] bool hasFreePlace() const {
-    return static_cast<std::int64_t>(accessingThreads_.count()) < (isBackgroundMode_ ? 1 : limit_);
+    return static_cast<std::int64_t>(accessingThreads_.count()) <
+           (isBackgroundMode_ ? 1 : maxThreads_);
   }
 
   const std::shared_ptr<Basalt::SerialQueue> queue_;
   const std::shared_ptr<const OVDiskInfo> diskInfo_;
-  const std::int64_t limit_;  ///< Outside background mode.
+  const std::int64_t maxThreads_;  ///< Outside background mode.
   bool isBackgroundMode_;
   Requests requests_;  ///< The line, by class and within a class in the order of coming.
   Basalt::Bag<Basalt::ThreadID> accessingThreads_;

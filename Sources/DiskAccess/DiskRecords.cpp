@@ -23,7 +23,7 @@ void DiskRecords::update(const OVDiskInfo::Array& disks, bool isBackgroundMode) 
     for (const Platform::URL& volumeURL : *disk->volumeURLs())
       diskUniqueIDsByVolumeURL_[volumeURL] = *disk->uniqueID();
   }
-  // A thread that was woken a moment ago stands in no line and counts not yet; but its session has
+  // A thread that was just woken has left the line and is not counted yet, but its session holds
   // the record.
   for (auto& [uniqueID, record] : diskDataByUniqueID_)
     if (record->accessCount() > 0 || record.use_count() > 1)

@@ -26,8 +26,8 @@ class DiskRecords final {
  public:
   explicit DiskRecords(std::shared_ptr<Basalt::SerialQueue> queue) : queue_(std::move(queue)) {}
 
-  /// Follows an inventory. A disk that stays keeps its record; one that is gone is remembered while
-  /// anybody has to do with it.
+  /// Follows an inventory. A disk that stays keeps its record. The record of a disk that is gone is
+  /// kept while a thread uses it or waits for it.
   void update(const OVDiskInfo::Array& disks, bool isBackgroundMode);
 
   void setIsBackgroundMode(bool isBackgroundMode);
@@ -36,12 +36,12 @@ class DiskRecords final {
   [[nodiscard]] std::shared_ptr<DiskData> ofVolume(const Platform::URL& volumeURL) const;
 
   /// A record on which the thread has a place for a volume of the same disk, this one or another;
-  /// null when there is none. A thread that nests accesses to a disk uses this one, as it could
-  /// wait for ever for another: for a thread that waits for the place on this one.
+  /// null when there is none. A thread that nests accesses to a disk uses this record. For another
+  /// it could wait for ever: the thread in front of it may wait for the place that it has here.
   [[nodiscard]] std::shared_ptr<DiskData> usedBy(Basalt::ThreadID thread,
                                                  const Platform::URL& volumeURL) const;
 
-  /// A place that a record has given to a thread, and what for.
+  /// A place that a record has given to a thread, and the volume that it is for.
   struct Use {
     Basalt::ThreadID thread;
     std::shared_ptr<DiskData> record;
@@ -50,8 +50,8 @@ class DiskRecords final {
 
   void add(Use use) { uses_.push_back(std::move(use)); }
 
-  /// Takes one such use out, and without one any other of the thread's uses of the record: as often
-  /// as the record counts the thread, so often it stands here.
+  /// Takes one such use out or, if there is none, any other use of the record by the thread. So the
+  /// thread stands here as often as the record counts it.
   void remove(Basalt::ThreadID thread, const std::shared_ptr<DiskData>& record,
               const Platform::URL& volumeURL);
 

@@ -11,7 +11,7 @@
 namespace Varnel {
 namespace {
 
-constexpr std::array<std::int64_t, 5> threadLimits{1, 4, 2, 1, 1};
+constexpr std::array<std::int64_t, 5> maxThreadsByKind{1, 4, 2, 1, 1};
 
 }  // namespace
 
@@ -22,7 +22,7 @@ OVDiskInfo::OVDiskInfo(std::optional<std::string> uniqueID, std::optional<Volume
 std::int64_t OVDiskInfo::maxTreads() const {
   const auto value = static_cast<std::int64_t>(kind_);
   const auto index = static_cast<std::uint64_t>(value);
-  return index < threadLimits.size() ? threadLimits[index] : value;
+  return index < maxThreadsByKind.size() ? maxThreadsByKind[index] : value;
 }
 
 bool OVDiskInfo::isEqual(const OVDiskInfo* other) const {

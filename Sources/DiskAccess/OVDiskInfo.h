@@ -38,7 +38,7 @@ inline constexpr OVDiskKind OVDiskKindNetwork = OVDiskKind::network;
 ///       print(disk->uniqueID().value_or("?"), disk->maxTreads());
 ///
 /// Immutable, and shared by pointer: a copy of the pointer is the copy of the disk. Any thread.
-/// Nothing here fails: what the system does not tell is absent.
+/// Nothing here fails: a fact that the system does not tell is absent.
 class VARNEL_API OVDiskInfo final {
  public:
   /// The services that an inventory asks.

@@ -8,8 +8,8 @@
 
 namespace Varnel {
 
-/// An action that is offered both as a button and as a menu item, and what interface automation
-/// finds either by:
+/// An action that is offered both as a button and as a menu item, with the identifiers by which
+/// interface automation finds them:
 ///
 ///     const AccessibleAction remove("remove");
 ///     remove.buttonIdentifier();    // "remove.button"

@@ -21,8 +21,8 @@ namespace Varnel {
 /// refer to them, misspelt ones ("Duplidates", "bringAllToFrong", "putBackAll") included. Any
 /// thread; the catalogue does not change. Neither copied nor moved.
 ///
-/// The catalogue is compiled into whoever uses it. Nothing of it crosses the library's boundary, so
-/// that it can grow without breaking a host.
+/// The catalogue is compiled into each program that uses it. Nothing of it crosses the library's
+/// boundary, so it can grow without breaking a host.
 class MainMenuAccessibility final {
  public:
   class Orvane final : public MenuItemGroup {

@@ -10,8 +10,8 @@
 
 namespace Varnel {
 
-/// One menu of the main menu: a base identifier, and items whose identifiers extend it. A group is
-/// written down by deriving from it, one member an item:
+/// One menu of the main menu: a base identifier, and items whose identifiers extend it. To write a
+/// group down, derive from this and give each item a member:
 ///
 ///     struct Edit final : MenuItemGroup {
 ///       using MenuItemGroup::MenuItemGroup;
@@ -20,8 +20,8 @@ namespace Varnel {
 ///     Edit edit("main-menu.edit");
 ///     edit.undo();  // "main-menu.edit.undo"
 ///
-/// Any thread once made. Neither copied nor moved: items belong to their group. Compiled into
-/// whoever uses it.
+/// Any thread once made. Neither copied nor moved: items belong to their group. Compiled into each
+/// program that uses it.
 class MenuItemGroup {
  public:
   /// An item of a menu. Called, it gives its identifier; empty if the group's base is.

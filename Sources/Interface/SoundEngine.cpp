@@ -11,7 +11,7 @@ SoundEngine::SoundEngine()
                    .path = [](Sound sound) { return sound.path(); }}) {}
 
 SoundEngine::SoundEngine(Ports ports)
-    // Only the life of the reference is shared, not that of the engine.
+    // Sounds share this reference, and do not keep the engine alive.
     : ports_(std::move(ports)), delegate_(std::make_shared<char>(), this) {}
 
 SoundEngine::~SoundEngine() {
@@ -23,7 +23,7 @@ void SoundEngine::play(Sound sound) {
   stop();
   const auto path = ports_.path(sound);
   if (!path) return;
-  // A file that cannot be read has no bytes, and no bytes are no sound.
+  // A file that cannot be read counts as empty, and an empty file is no sound.
   const auto loaded = ports_.player.load(Platform::readFile(*path).valueOr(""));
   if (!loaded) return;
   loaded->setDelegate(delegate_);

@@ -20,9 +20,9 @@ namespace Varnel {
 ///     engine.setSoundsEnabled(preferences.sounds);
 ///     engine.play(Sound::scanComplete);
 ///
-/// Sounds that are missing or damaged, and a machine that cannot play any, are passed over in
-/// silence. Main thread only; the end of a sound is noticed when the main queue runs. Destroying
-/// the engine stops its sound.
+/// Missing or damaged sounds are silently ignored, and so is a machine that cannot play any. Main
+/// thread only; the end of a sound is noticed when the main queue runs. Destroying the engine stops
+/// its sound.
 class VARNEL_API SoundEngine final : private Platform::SoundDelegate {
  public:
   /// Where the resource of a sound is; absent when there is none.
@@ -51,8 +51,8 @@ class VARNEL_API SoundEngine final : private Platform::SoundDelegate {
   /// A sound has come to its end. Calls `stop`, whichever sound it was.
   void sound(Platform::PlayableSound& sound, bool didFinishPlaying) override;
 
-  /// What is being played; null for nothing. Assigning starts and stops nothing by itself, but a
-  /// sound that nobody holds any more falls silent.
+  /// The sound that is being played; null for none. Assigning starts and stops nothing by itself,
+  /// but a sound that is no longer referred to falls silent.
   [[nodiscard]] const std::shared_ptr<Platform::PlayableSound>& currentSound() const {
     return currentSound_;
   }
@@ -60,7 +60,7 @@ class VARNEL_API SoundEngine final : private Platform::SoundDelegate {
     currentSound_ = std::move(sound);
   }
 
-  /// Whether `play` plays; true at first. Muting leaves a sound that is playing alone.
+  /// Whether `play` plays; true at first. Muting does not stop a sound that is playing.
   [[nodiscard]] bool soundsEnabled() const { return soundsEnabled_; }
   void setSoundsEnabled(bool enabled) { soundsEnabled_ = enabled; }
 

@@ -21,7 +21,7 @@ class VARNEL_API CustomLogStringConvertible {
   CustomLogStringConvertible& operator=(const CustomLogStringConvertible&) = default;
 };
 
-/// Gives a type that has a `description()` that same text for the log, with no code of its own:
+/// Lets a type with a `description()` use that text for the log as well, without further code:
 ///
 ///     class ScanError final : public Error, public LogsItsDescription<ScanError> { … };
 template <typename Described>

@@ -9,7 +9,7 @@
 
 namespace Varnel {
 
-/// The base of error values: one class a kind of error, with a code for each case.
+/// The base of error values: one class for each kind of error, with a code for each case.
 ///
 ///     class ScanError final : public Error {
 ///      public:

@@ -18,7 +18,7 @@ namespace {
 
 Platform::TypeName nameOf(const std::exception& exception) {
   const Platform::TypeName name = Platform::typeName(typeid(exception));
-  // What a stream throws may be a class of the library's own, with a reserved name.
+  // A stream may throw a class of the standard library's own, with a reserved name.
   const bool isStreams = name.name.starts_with("__") &&
                          dynamic_cast<const std::ios_base::failure*>(&exception) != nullptr;
   return isStreams ? Platform::typeName(typeid(std::ios_base::failure)) : name;
@@ -30,7 +30,7 @@ std::optional<std::error_code> codeOf(const std::exception& exception) {
   return std::nullopt;
 }
 
-// What was being handled when the exception was thrown, if it has kept that.
+// The exception that was being handled when this one was thrown, if it is nested in this one.
 std::optional<Platform::PlatformError> underlyingError(const std::exception& exception) {
   const auto* nesting = dynamic_cast<const std::nested_exception*>(&exception);
   if (nesting == nullptr || nesting->nested_ptr() == nullptr) return std::nullopt;

@@ -14,8 +14,8 @@ namespace Varnel {
 //
 //     catch (const std::exception& caught) { presentAlert(platformError(caught)); }
 
-/// The name, without scope, of the exception's own type: "ImportFailure". One that was thrown with
-/// another nested in it has the name of what was thrown.
+/// The name, without scope, of the exception's own type: "ImportFailure". An exception with another
+/// nested in it has the name of the outer one's own type.
 [[nodiscard]] VARNEL_API std::string typeName(const std::exception& exception);
 
 /// An exception with an error code (`std::system_error` and its kin, `std::future_error`) keeps the
@@ -25,7 +25,7 @@ namespace Varnel {
 /// `what()`; a nested exception becomes the underlying error.
 [[nodiscard]] VARNEL_API Platform::PlatformError platformError(const std::exception& exception);
 
-/// What the log says of a platform error: "NSError: " and its description.
+/// The log's text for a platform error: "NSError: " and its description.
 [[nodiscard]] VARNEL_API std::string logDescription(const Platform::PlatformError& error);
 
 }  // namespace Varnel

@@ -6,8 +6,8 @@
 
 namespace Varnel {
 
-/// What code reports when it must give an error of its own kind and cannot convert the one it
-/// caught. A value.
+/// For code that must give an error of its own kind and cannot convert the one that it caught. A
+/// value.
 ///
 ///     return GenericError::fallback;
 class VARNEL_API GenericError final : public Error, public CustomLogStringConvertible {

@@ -45,7 +45,7 @@ void LogFileChannel::startWriter() {
   try {
     writer_ = Platform::startThread("Logging Queue", [this] { runWriter(); });
   } catch (const std::system_error&) {
-    // A process that may have no more threads still gets its log, in its own time.
+    // Without another thread the log is still written, but by the caller.
     writeThrough();
   }
 }

@@ -18,9 +18,8 @@
 namespace Varnel {
 
 /// Appends log entries to a file without making their authors wait for the disk: entries gather in
-/// memory, and a thread of the channel's own, which also opens the file, writes whatever has
-/// gathered when the policy says so. Entries are written in the order of their `append`, each
-/// whole.
+/// memory, and a thread of the channel's own opens the file, and writes the gathered entries when
+/// the policy says so. Entries are written in the order of their `append`, each whole.
 ///
 /// A file that cannot be opened is reported on the standard output, and later entries are dropped.
 /// A failed write is reported once for each entry that it carried; later ones are tried again.
@@ -30,7 +29,7 @@ class LogFileChannel final {
  public:
   enum class Start {
     atOnce,
-    withTheFirstEntry,  ///< Until then there is neither a file nor a thread.
+    withTheFirstEntry,  ///< Before it there is neither a file nor a thread.
   };
 
   LogFileChannel(Platform::AppendFiles& files, Platform::StandardOutput& output, std::string path,
@@ -81,7 +80,7 @@ class LogFileChannel final {
   Batch gathered_;
   Clock::time_point since_ = Clock::now();  ///< Of the first waiting byte, or of the last write.
   std::size_t
-      wakeMark_;  ///< So many bytes wake the writer; more than there can be while it is awake.
+      wakeMark_;  ///< This many bytes wake the writer. While it is awake, more than there can be.
   bool isStarted_;
   bool isEnded_ = false;  ///< The file could not be opened.
   bool writesThrough_ = false;

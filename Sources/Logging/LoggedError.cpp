@@ -8,7 +8,7 @@
 namespace Varnel {
 namespace {
 
-// Descriptions often quote file names, which nobody has looked at.
+// Descriptions often quote file names, which may hold anything.
 std::string visibleLogDescription(const Platform::PlatformError& error) {
   return Platform::visibleText(logDescription(error), Platform::Backslashes::kept);
 }

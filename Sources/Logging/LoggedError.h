@@ -13,9 +13,9 @@
 
 namespace Varnel {
 
-/// What the log keeps of an error of any kind: the framework's error values, platform errors,
-/// standard exceptions and error codes all convert to it, so that whatever was caught or returned
-/// can be handed to `Logger::logError` as it is.
+/// The facts that the log keeps of an error. The framework's error values, platform errors,
+/// standard exceptions and error codes all convert to it, so any of them can be handed to
+/// `Logger::logError` as it is.
 ///
 ///     catch (const std::exception& exception) { logger.logError(exception, "Scanner"); }
 ///
@@ -24,11 +24,12 @@ class VARNEL_API LoggedError final {
  public:
   LoggedError(const Error& error);
   LoggedError(const Platform::PlatformError& error);
-  /// If the exception is an `Error` as well, that is what counts.
+  /// An exception that is also an `Error` counts as an `Error`.
   LoggedError(const std::exception& exception);
   LoggedError(std::error_code code);
 
-  /// An error value that is thrown has two bases to choose from.
+  /// For error values that derive from a standard exception as well, where the conversion would be
+  /// ambiguous.
   template <typename Thrown>
   requires std::derived_from<Thrown, Error> && std::derived_from<Thrown, std::exception>
   LoggedError(const Thrown& error) : LoggedError(static_cast<const Error&>(error)) {}

@@ -100,7 +100,8 @@ void Logger::openFile(std::string_view baseIdentifier) {
   ports_.standardOutput.print(fmt::format("Will store log at {}\n", path));
 }
 
-// The parent writes what has gathered; its thread, and locks that it held, are not in the child.
+// The parent writes the gathered entries. The child has neither the parent's thread nor the owners
+// of its locks.
 void Logger::beginAnewInForkedChild() {
   static auto& ofTheParents = *new std::vector<std::unique_ptr<LogFileChannel>>;
   if (!fileChannel_) return;
@@ -115,7 +116,7 @@ void Logger::log(std::string_view message, std::string_view author, const Loggin
   std::vector<std::string> items;
   for (const LoggingContextTag& tag : tags)
     if (auto item = tag.text(*this))
-      // A file's name must neither drive the terminal nor pass for an entry of its own.
+      // A file's name must neither control the terminal nor look like an entry of its own.
       items.push_back(Platform::visibleText(*std::move(item), Platform::Backslashes::kept));
   const LogEntry::Buffer buffer =
       LogEntry::text(entryDates_.string(ports_.clock.now()), author, message, items);

@@ -40,9 +40,9 @@ class LogFileChannel;
 ///     logger.logError(error, "Scanner");
 ///
 /// Any thread. Callers never wait for the disk: the file gets its entries after at most a second,
-/// or as soon as there are 4096 bytes of them, and all that is left when the process exits. Nothing
-/// throws and nothing is reported to callers: what goes wrong with the file is told on the standard
-/// output. Of the two operations of a name, leave the tags out rather than passing "{}".
+/// or as soon as there are 4096 bytes of them, and the rest when the process exits. Nothing throws
+/// and nothing is reported to callers: failures of the file are printed on the standard output. An
+/// entry without tags is logged without the argument: "{}" would be ambiguous.
 class VARNEL_API Logger final {
  public:
   struct Ports {
@@ -58,7 +58,7 @@ class VARNEL_API Logger final {
   [[nodiscard]] static Logger& instance();
 
   /// A logger of one's own; `baseIdentifier` names the folder of its files. The ports must outlive
-  /// it. Destruction, which nobody may be logging at, writes what has gathered.
+  /// it. Destruction writes what has gathered; nobody may be logging meanwhile.
   Logger(Ports ports, std::string_view baseIdentifier);
   ~Logger();
   Logger(const Logger&) = delete;
@@ -102,7 +102,7 @@ class VARNEL_API Logger final {
   /// "undefined" for an interval that has no text.
   [[nodiscard]] std::string stringForTiming(Platform::TimeInterval interval) const;
   [[nodiscard]] std::string stringForTiming(Platform::Date startData, Platform::Date endDate) const;
-  /// From the date until now.
+  /// The time from the date until now.
   [[nodiscard]] std::string stringForTiming(Platform::Date fromDate) const;
   /// The path; in anonymous mode "directory" or the extension alone, "[*.jpg]", and nothing for a
   /// file without one. Anonymous mode asks the file system whether the URL is a folder.

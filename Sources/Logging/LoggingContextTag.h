@@ -39,7 +39,7 @@ class VARNEL_API LoggingContextTag final {
   [[nodiscard]] Case case_() const { return kind_; }
 
   /// "job: scan", "location: /home/ada/Music" and so on, locations as this logger writes them.
-  /// Absent for a location that the logger keeps to itself.
+  /// Absent for a location without a text in anonymous mode.
   [[nodiscard]] std::optional<std::string> text(const Logger& logger) const;
 
  private:

@@ -27,7 +27,7 @@ class VARNEL_API LoggingObject {
  public:
   virtual ~LoggingObject() = default;
 
-  /// Where the entries go: to the process's logger unless a class knows better.
+  /// Where the entries go: to the process's logger unless a class overrides it.
   [[nodiscard]] virtual Logger& logger() const;
 
   /// The name in each entry: the name of the class, written out.

@@ -9,7 +9,7 @@
 
 namespace Varnel {
 
-/// What an alert tells the user of an error.
+/// The texts with which an alert tells the user of an error.
 ///
 ///     UserErrorInfo info{"The folder is gone.", "Choose another folder.", {"OK"}};
 struct VARNEL_API UserErrorInfo {

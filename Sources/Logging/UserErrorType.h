@@ -14,7 +14,7 @@ namespace Varnel {
 ///     if (auto shown = error.userError()) presentAlert(*shown);
 class VARNEL_API UserErrorType : public Error {
  public:
-  /// The texts for the user; absent when this error is none of theirs.
+  /// The texts for the user; absent when the error does not concern the user.
   [[nodiscard]] virtual std::optional<UserErrorInfo> userErrorInfo() const = 0;
 
   /// The platform error of this error's domain and code with those texts; absent without them.

@@ -24,11 +24,11 @@ namespace Varnel {
 ///       using BaseModule::identifier;
 ///     };
 ///
-/// The last step of making a module is to log that it is there. A base's constructor could not
-/// reach what its subclass overrides, so the final class's constructor or `makeModule` does it.
+/// Making a module ends with a log entry of its version. The constructor of a base class cannot
+/// call what its subclass overrides, so the final class's constructor or `makeModule` logs it.
 ///
-/// Any thread. `bundle` and `version` are found by their first reader unless they were set before;
-/// what finds the bundle must not ask for either.
+/// Any thread. `bundle` and `version` are found by their first reader unless they were set before.
+/// The code that finds the bundle must not ask for either.
 class VARNEL_API BaseModule {
  public:
   BaseModule();
@@ -62,7 +62,7 @@ class VARNEL_API BaseModule {
   [[nodiscard]] Bundle bundle() const;
   void setBundle(Bundle bundle);
 
-  /// What `fetchVersion()` found, or "undefined".
+  /// The answer of `fetchVersion()`, or "undefined".
   [[nodiscard]] std::string version() const;
   void setVersion(std::string version);
 

@@ -23,7 +23,7 @@ class VARNEL_API VarnelModule final : public BaseModule {
 
   using BaseModule::identifier;
 
-  /// The shared module, made, and logged, on first use.
+  /// The shared module. The first use makes it and logs it.
   [[nodiscard]] static std::shared_ptr<VarnelModule> instance();
   /// Puts another module in its place; null makes the next reader make a new one.
   static void setInstance(std::shared_ptr<VarnelModule> instance);

@@ -11,7 +11,7 @@ namespace Varnel {
 
 /// A path shown as a row of components, for use inside a scrolling list: a single click goes
 /// through to the list, which selects the row, and the menu of a right click is the list's own.
-/// What the control asks of the toolkit stands behind `View`:
+/// `View` stands for the toolkit:
 ///
 ///     class PathRow : public Toolkit::Widget, CommonPathControl::View { … };
 ///     void PathRow::mousePressed(…) { control.mouseDown({.clickCount = n, .location = p}); }
@@ -37,7 +37,7 @@ class VARNEL_API CommonPathControl final {
     [[nodiscard]] virtual Platform::URL url() const = 0;
   };
 
-  /// The toolkit's menu, which is only passed on.
+  /// The toolkit's menu, which is passed on unseen.
   class Menu {
    public:
     virtual ~Menu() = default;
@@ -48,9 +48,9 @@ class VARNEL_API CommonPathControl final {
    public:
     virtual ~View() = default;
 
-    /// Lets the next responder have a press.
+    /// Passes a press on to the next responder.
     virtual void nextResponderMouseDown(const MouseEvent& event) = 0;
-    /// Does with a press what path controls of the toolkit do.
+    /// Handles a press as the toolkit's path controls do.
     virtual void pathControlMouseDown(const MouseEvent& event) = 0;
 
     /// Whether the view shows a path at the moment.

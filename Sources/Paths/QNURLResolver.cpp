@@ -25,14 +25,14 @@ void dropTrailingSlash(PathComponents& components) {
 
 // Whether joining the components of the path would give the path itself.
 bool isTidy(std::string_view path) {
-  // Without an early end, and on bytes, the compiler looks at sixteen at once.
+  // Without an early exit, and with bytes, the compiler compares sixteen at once.
   unsigned char hasRun = 0;
   for (std::size_t i = 1; i < path.size(); ++i)
     hasRun |= static_cast<unsigned char>(((path[i - 1] ^ '/') | (path[i] ^ '/')) == 0);
   return hasRun == 0 && (path.size() < 2 || path.back() != '/');
 }
 
-// What follows a base in a path, both tidy: empty, or text from the slash on.
+// The part of a path after a base, when both are tidy: empty, or text from the slash on.
 std::optional<std::string_view> tailBelow(std::string_view path, std::string_view basePath) {
   if (!path.starts_with(basePath)) return std::nullopt;
   if (basePath == "/") return path == "/" ? std::string_view() : path;

@@ -19,16 +19,16 @@ class KeyedUnarchiver;
 
 namespace Varnel {
 
-/// Turns absolute paths into the short forms that people are shown, and those back into full paths:
+/// Turns absolute paths into short forms for people, and short forms back into full paths:
 ///
 ///     const QNURLResolver& resolver = QNURLResolver::shared();
 ///     resolver.abbreviatedPath("/home/ann/Documents/");   // "~/Documents/"
 ///     resolver.expandedPathForPath("~/Documents/");       // "/home/ann/Documents"
 ///
-/// Two bases are known: what lies below the home URL starts with "~", what lies below the root URL
-/// with "/". Components are compared byte for byte. An immutable value: copies share one state,
-/// and two are equal when the components of their bases are. Any thread. Only
-/// `abbreviatedPathForURL` may look into the file system.
+/// There are two bases: short forms below the home URL start with "~", those below the root URL
+/// with "/". Components are compared byte for byte. An immutable value: copies share one state, and
+/// two are equal when the components of their bases are. Any thread. Only `abbreviatedPathForURL`
+/// may look into the file system.
 class VARNEL_API QNURLResolver final {
  public:
   using PathComponents = Platform::PathComponents;

@@ -32,7 +32,7 @@ bool isMountedAt(const PropertyValue& entity, const std::string& volumePath) {
   return mountPoint && *mountPoint == volumePath;
 }
 
-// False when it had to be ended.
+// False when the tool had to be ended.
 bool waitForEnd(Platform::LaunchedProcess& process, std::optional<Platform::TimeInterval> timeout) {
   using Clock = std::chrono::steady_clock;
   const auto start = Clock::now();
@@ -54,7 +54,8 @@ std::optional<PropertyValue> mountedDrivesInfo(Platform::ProcessLauncher& launch
   const auto launched = launcher.launch(toolPath, {"info", "-plist"});
   if (!launched) return std::nullopt;
   Platform::LaunchedProcess& tool = **launched;
-  // Only what has ended has told all. A failure may come after the answer, and does not change it.
+  // Only a tool that has ended has printed everything. It may fail after its answer, which counts
+  // all the same.
   if (!waitForEnd(tool, timeout)) return std::nullopt;
   return Platform::parsePropertyList(tool.readOutput());
 }

@@ -9,7 +9,7 @@
 
 namespace Varnel {
 
-// Neither records nor texts move once they are in: both have their room from the start.
+// Records and texts never move: the room for both is reserved from the start.
 class DownloadList::Block final {
  public:
   explicit Block(std::size_t textSize) {

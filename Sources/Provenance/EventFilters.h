@@ -11,7 +11,7 @@
 
 namespace Varnel {
 
-/// Whether an entry of the download database is the one that is sought.
+/// Whether an entry of the download database is the wanted one.
 using EventFilter = std::function<bool(const KVQuarantineEntry&)>;
 
 /// Passes the entry with exactly this event identifier.

@@ -21,7 +21,7 @@ namespace {
 using Platform::PlatformError;
 using Platform::URL;
 
-// The process's ports outlive everybody.
+// The process's ports are never destroyed.
 std::shared_ptr<Platform::UserDefaults> unowned(Platform::UserDefaults& userDefaults) {
   return {std::shared_ptr<void>(), &userDefaults};
 }

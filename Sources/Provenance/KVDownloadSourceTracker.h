@@ -30,14 +30,14 @@ namespace Varnel {
 ///       if (const auto entry = tracker->installSourceEntry()) remember(entry->dataURLString());
 ///     });
 ///
-/// Of a copy that runs from a mounted disk image the image's attribute names the download, else
-/// that of the application itself; where neither names one, the first download with the product's
-/// name in its URL is taken.
+/// The attribute of the disk image names the download, if the copy runs from a mounted one; else
+/// the attribute of the application itself. If neither names one, the first download with the
+/// product's name in its URL is taken.
 ///
 /// `installSourceEntry()` may be called from any thread; the properties are to be set before.
 class VARNEL_API KVDownloadSourceTracker final {
  public:
-  /// What the tracker asks of the system; outlives it.
+  /// The services that the tracker asks; they outlive it.
   struct VARNEL_API Ports {
     Platform::ExtendedAttributes& extendedAttributes;
     Platform::ProcessInfo& processInfo;
@@ -55,7 +55,7 @@ class VARNEL_API KVDownloadSourceTracker final {
     std::string diskImageTool = "/usr/bin/hdiutil";
     std::string volumesRoot = "/Volumes";
     std::optional<std::string> bundlePath = {};  ///< The running application's when absent.
-    /// After it the tool is ended. Absent, the tool has all the time that it takes.
+    /// The tool is ended after this time. Absent: never.
     std::optional<Platform::TimeInterval> toolTimeout = {};
   };
 

@@ -33,7 +33,7 @@ class VARNEL_API KVQuarantine final {
   /// A reader of this user's current database.
   [[nodiscard]] static std::shared_ptr<KVQuarantine> systemQuarantine();
 
-  /// Where the database was in earlier versions of the system, and where it is. The account
+  /// The database's place in earlier versions of the system, and its present place. The account
   /// defaults to the process's user, here and below.
   [[nodiscard]] static std::string systemQuarantinePath();
   [[nodiscard]] static std::string systemQuarantinePath(const Platform::UserAccount& account);
@@ -55,9 +55,9 @@ class VARNEL_API KVQuarantine final {
 
   [[nodiscard]] const std::string& path() const { return path_; }
 
-  /// The rows with a data URL, in the database's order. Each has its event identifier, empty where
-  /// the row has none, and its data URL; the rest is absent or 0. Without a table of downloads
-  /// there are none. A file that cannot be opened is told to the system's log; one that is missing
+  /// The rows with a data URL, in the database's order. Each entry has its event identifier (empty
+  /// when the row has none) and its data URL; the rest is absent or 0. Without a table of downloads
+  /// there are none. A file that cannot be opened is reported to the system's log; a missing file
   /// is created, empty.
   [[nodiscard]] std::vector<KVQuarantineEntry> entries() const;
 

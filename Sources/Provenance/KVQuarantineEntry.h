@@ -25,8 +25,8 @@ class VARNEL_API KVQuarantineEntry final {
   using Text = std::optional<std::string_view>;
 
   /// An entry from a record with the keys of the system's table ("LSQuarantineEventIdentifier",
-  /// "LSQuarantineTimeStamp", …). A text that is none is absent; the time and the type number also
-  /// read from texts, and are 0 when nothing can be read.
+  /// "LSQuarantineTimeStamp", …). A value that should be a text and is not is absent. The time and
+  /// the type number are read from texts too, and are 0 when that fails.
   [[nodiscard]] static KVQuarantineEntry entryWithDictionary(
       const Platform::PropertyDictionary& dictionary);
 

@@ -27,12 +27,12 @@ std::string_view numberIn(std::string_view text) {
   return text;
 }
 
-// The parser reports what is too close to zero as it does what is too large.
+// The parser reports numbers too close to zero as it reports numbers too large.
 bool isTiny(std::string_view number) {
   return number.find("e-") != number.npos || number.find("E-") != number.npos;
 }
 
-// What does not fit becomes the largest or the smallest.
+// A number that does not fit becomes the largest or the smallest.
 template <typename Number>
 Number parse(std::string_view text, Number largest, Number smallest) {
   const std::string_view digits = numberIn(text);
@@ -43,13 +43,13 @@ Number parse(std::string_view text, Number largest, Number smallest) {
   return isNegative(digits) ? smallest : largest;
 }
 
-constexpr std::int64_t largestInteger = std::numeric_limits<std::int64_t>::max();
-constexpr std::int64_t smallestInteger = std::numeric_limits<std::int64_t>::min();
+constexpr std::int64_t maxInteger = std::numeric_limits<std::int64_t>::max();
+constexpr std::int64_t minInteger = std::numeric_limits<std::int64_t>::min();
 
 std::int64_t truncated(double number) {
-  constexpr double limit = 9223372036854775808.0;
-  if (number >= limit) return largestInteger;
-  if (number < -limit) return smallestInteger;
+  constexpr double twoTo63 = 9223372036854775808.0;
+  if (number >= twoTo63) return maxInteger;
+  if (number < -twoTo63) return minInteger;
   return number == number ? static_cast<std::int64_t>(number) : 0;
 }
 
@@ -68,8 +68,7 @@ std::int64_t lenientInteger(const PropertyValue& value) {
   if (const auto* integer = value.as<std::int64_t>()) return *integer;
   if (const auto* real = value.as<double>()) return truncated(*real);
   if (const auto* truth = value.as<bool>()) return *truth ? 1 : 0;
-  if (const auto* text = value.as<std::string>())
-    return parse(*text, largestInteger, smallestInteger);
+  if (const auto* text = value.as<std::string>()) return parse(*text, maxInteger, minInteger);
   return 0;
 }
 

@@ -23,7 +23,7 @@ OVFriendsLocator& OVFriendsLocator::sharedLocator() {
 std::shared_ptr<Platform::Workspace> OVFriendsLocator::workspace() {
   OVFriendsLocator& locator = sharedLocator();
   const std::lock_guard lock(locator.mutex_);
-  // The process's ports outlive everybody.
+  // The process's ports are never destroyed.
   if (!locator.workspace_)
     locator.workspace_ = {std::shared_ptr<void>(), &Platform::processPorts().workspace};
   return locator.workspace_;

@@ -16,8 +16,8 @@ namespace Varnel {
 ///
 ///     if (!OVFriendsLocator::isVeltInstalled()) offerVelt();
 ///
-/// Nothing is remembered: each question asks the workspace again. Of editions, "MAS" is the one of
-/// the store and "Site" that of the web site. Any thread; questions may read files.
+/// Nothing is remembered: each question asks the workspace again. "MAS" means the store's edition,
+/// "Site" that of the web site. Any thread; questions may read files.
 class VARNEL_API OVFriendsLocator final {
  public:
   OVFriendsLocator(const OVFriendsLocator&) = delete;
@@ -27,7 +27,7 @@ class VARNEL_API OVFriendsLocator final {
   [[nodiscard]] static OVFriendsLocator& sharedLocator();
 
   /// The workspace that the shared locator asks: the process's own until another is set. Setting
-  /// none brings that one back.
+  /// none restores it.
   [[nodiscard]] static std::shared_ptr<Platform::Workspace> workspace();
   void setWorkspace(std::shared_ptr<Platform::Workspace> workspace);
 
@@ -43,7 +43,7 @@ class VARNEL_API OVFriendsLocator final {
   [[nodiscard]] static bool isDrumlinInstalled();
   [[nodiscard]] static bool isBrambleInstalled();
 
-  /// Any generation or edition.
+  /// Counts any generation or edition.
   [[nodiscard]] static bool isKelvaneInstalled();
   [[nodiscard]] static bool isOrvane1Installed();
   [[nodiscard]] static bool isVeltInstalled();

@@ -10,7 +10,7 @@
 
 namespace Varnel {
 
-/// What the rows of a database never have.
+/// The members that rows of a database never have.
 struct KVQuarantineEntry::Details {
   using OwnText = std::optional<std::string>;
 
@@ -22,7 +22,7 @@ struct KVQuarantineEntry::Details {
   std::optional<Platform::PropertyValue> originAlias;
 };
 
-/// What an entry stands for. The texts belong to whoever holds the record.
+/// The content of an entry. The owner of the record owns the texts.
 struct KVQuarantineEntry::Record {
   Text eventIdentifier;
   Text dataURLString;

@@ -17,7 +17,7 @@ namespace Varnel {
 
 class BaseModule;
 
-/// What a scan found and its user left, for a reminder on the next day.
+/// The duplicates that a scan found and the user left, for a reminder on the next day.
 ///
 ///     const NextDayCleanupReminderInfo info(selected, found);
 ///     router.userNotificationCenter().scheduleNotification(info.makeUserNotification());
@@ -26,7 +26,7 @@ class BaseModule;
 /// thread.
 class VARNEL_API NextDayCleanupReminderInfo final {
  public:
-  /// What the notification is made with: by default the process's own.
+  /// The services that make the notification: by default the process's own.
   struct Ports {
     Platform::Clock& clock;
     Platform::UserLocale& userLocale;

@@ -31,8 +31,8 @@ class VARNEL_API SchedulePeriodOptionBox
   [[nodiscard]] static Pointer make(SchedulePeriodOption boxed);
 
   explicit SchedulePeriodOptionBox(SchedulePeriodOption boxed) : boxed_(boxed) {}
-  /// Reads JSON as `SchedulePeriodOption` does, but never fails: whatever that refuses becomes
-  /// `never`, so that a damaged preference turns the reminder off.
+  /// Reads JSON as `SchedulePeriodOption` does, but never fails: a value that it refuses becomes
+  /// `never`, so a damaged preference turns the reminder off.
   explicit SchedulePeriodOptionBox(const Basalt::JSON& json);
   virtual ~SchedulePeriodOptionBox() = default;
   SchedulePeriodOptionBox(const SchedulePeriodOptionBox&) = delete;

@@ -38,8 +38,8 @@ class UserNotificationRouter;
 ///     service.scheduleCleanReminder(bytesLeft);                  // after a scan
 ///
 /// A reminder comes one full period after it was scheduled, and again after each. When the user
-/// clicks it, the service reports that and takes the banner away. The period is the host's to keep;
-/// a new service has `never` and touches nothing until told.
+/// clicks it, the service reports that and takes the banner away. The host keeps the period: a new
+/// service has `never`, and changes nothing until it is called.
 ///
 /// Every repeating notification of the application counts as this service's and is swept away with
 /// its reminder: the host schedules none. Main thread only; nothing fails.
@@ -68,7 +68,8 @@ class VARNEL_API SchedulerService final : public Basalt::ExecutionContext {
   void scheduleCleanReminder();
   /// Schedules it for a number of bytes, which it names from 2,000,000,000 on.
   void scheduleCleanReminder(std::int64_t sizeLeftToClean);
-  /// Plans the reminder anew with its texts; where there is none, one without a size.
+  /// Plans the reminder anew with the texts of the present one; without one, a reminder without a
+  /// size.
   void rescheduleExistingReminder();
 
   [[nodiscard]] Platform::UserNotificationCenter& userNotificationCenter() const;

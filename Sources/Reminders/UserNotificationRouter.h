@@ -19,15 +19,15 @@ class UserNotificationCenter;
 
 namespace Varnel {
 
-/// The one delegate of the notification center: passes its events on to whoever asked for a
+/// The one delegate of the notification center: passes its events on to those that registered for a
 /// notification's identifier.
 ///
 ///     UserNotificationRouter router;  // at launch, before any notification can arrive
 ///     router.register_("com.example.daily", [](const auto& notification, auto kind) { … });
 ///
 /// `register_` and `channel` may be called on any thread, all else on the main thread. Handlers run
-/// on the main queue, never within the call that caused the event. An event that nobody asked for
-/// is lost. Nothing fails.
+/// on the main queue, never within the call that caused the event. An event for which nobody has
+/// registered is lost. Nothing fails.
 class VARNEL_API UserNotificationRouter final {
  public:
   enum class EventKind : std::int64_t {
@@ -50,7 +50,7 @@ class VARNEL_API UserNotificationRouter final {
     Platform::MainQueue& mainQueue;
   };
 
-  /// Becomes the delegate of the center, which thereupon delivers what came due.
+  /// Becomes the delegate of the center, which then delivers the notifications that came due.
   explicit UserNotificationRouter(Ports ports);
   /// The router of the running application's own center.
   UserNotificationRouter();
@@ -69,13 +69,14 @@ class VARNEL_API UserNotificationRouter final {
   /// The events of notifications with this identifier.
   [[nodiscard]] Basalt::Channel<Event> channel(const std::string& identifier);
 
-  /// What a host calls that was launched through a notification.
+  /// To be called by a host that was launched through a notification.
   void handleLaunch(const Platform::UserNotification& notification);
 
   /// Cancels what is scheduled under this identifier, if it has been delivered before and is still
-  /// in the delivered list: published behaviour. What was never delivered stays scheduled.
+  /// in the delivered list: published behaviour. A notification that was never delivered stays
+  /// scheduled.
   void removeScheduledNotifications(const std::string& identifier);
-  /// Removes what has been delivered under this identifier.
+  /// Removes delivered notifications with this identifier.
   void removeDeliveredNotifications(const std::string& identifier);
 
  private:
@@ -85,8 +86,7 @@ class VARNEL_API UserNotificationRouter final {
   void removeNotifications(const std::string& identifier, Removal removal);
 
   const Ports ports_;
-  const std::shared_ptr<Routes>
-      routes_;  ///< What the center listens to, as long as the router lives.
+  const std::shared_ptr<Routes> routes_;  ///< The center's delegate, for the router's life.
 };
 
 /// The name under which the interface layer knows the class.

@@ -126,8 +126,8 @@ class AnalyticsDeliveryTest : public testing::Test {
     DeliveryPolicy quick;
     quick.linger = 1ms;
     quick.firstRetry = 1ms;
-    quick.longestRetry = 20ms;
-    quick.longestRetryAfter = 1s;
+    quick.maxRetryDelay = 20ms;
+    quick.maxRetryAfter = 1s;
     return SpoolingTransport::make({.endpoint = *URL::parse(url),
                                     .trackingID = "QN-1",
                                     .clientID = "12.34",

@@ -72,7 +72,7 @@ TEST_F(EventSpoolTest, WhatIsRefusedLeavesTheLineAndIsSetAsideAtLast) {
 
 TEST_F(EventSpoolTest, DropsAndCountsTheOldestAtEitherLimit) {
   {
-    const auto spool = openSpool({.events = 4, .bytes = 1000});
+    const auto spool = openSpool({.maxEvents = 4, .maxBytes = 1000});
     append(*spool, {"a", "b", "c", "d"});
     spool->moveToRefused(spool->waiting(1, many));
     append(*spool, {"e", "f"});
@@ -82,7 +82,7 @@ TEST_F(EventSpoolTest, DropsAndCountsTheOldestAtEitherLimit) {
     spool->append("large", clock.now(), std::string(990, 'x'));
     EXPECT_EQ(namesOf(*spool), "e f large ");
   }
-  const auto spool = openSpool({.events = 2, .bytes = 1000});
+  const auto spool = openSpool({.maxEvents = 2, .maxBytes = 1000});
   EXPECT_EQ(spool->droppedCount(), 4);
   append(*spool, {"g"});
   EXPECT_EQ(namesOf(*spool), "large g ");
@@ -154,8 +154,8 @@ TEST_F(EventSpoolTest, WhatIsRefusedIsNotLostWhenItCannotBeMoved) {
 }
 
 TEST_F(EventSpoolTest, TheLimitsHoldForAllThatShareAFile) {
-  const auto one = openSpool({.events = 4, .bytes = 1000});
-  const auto other = openSpool({.events = 4, .bytes = 1000});
+  const auto one = openSpool({.maxEvents = 4, .maxBytes = 1000});
+  const auto other = openSpool({.maxEvents = 4, .maxBytes = 1000});
   append(*one, {"a", "b", "c"});
   EXPECT_EQ(other->backlog(3).waiting, 3);
   append(*other, {"d", "e"});

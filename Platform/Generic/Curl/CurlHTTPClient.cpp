@@ -21,12 +21,12 @@ namespace {
 
 using Answer = Result<HTTPResponse, HTTPFailure>;
 
-constexpr long longestConnectingInSeconds = 10;
-constexpr long longestTransferInSeconds = 30;
+constexpr long maxConnectingSeconds = 10;
+constexpr long maxTransferSeconds = 30;
 constexpr int pollingInMilliseconds = 1000;
-// Content is waited for so that the connection can serve again, and no longer than it is worth.
-constexpr auto longestContent = std::chrono::seconds(1);
-constexpr std::size_t mostContent = 64 * 1024;
+// Waiting for the content lets the connection be used again. More than this is not worth it.
+constexpr auto maxContentTime = std::chrono::seconds(1);
+constexpr std::size_t maxContentBytes = 64 * 1024;
 constexpr int firstFinalStatus = 200;
 
 using Easy = UniqueHandle<CURL*, curl_easy_cleanup>;
@@ -37,15 +37,15 @@ using URLParts = UniqueHandle<CURLU*, curl_url_cleanup>;
 std::size_t ignoreContent(char*, std::size_t size, std::size_t count, void* received) {
   auto& total = *static_cast<std::size_t*>(received);
   total += size * count;
-  return total <= mostContent ? size * count : 0;
+  return total <= maxContentBytes ? size * count : 0;
 }
 
 HTTPFailure failure(CURLcode code) {
   return {curl_easy_strerror(code)};
 }
 
-// What the server has said so far; absent until its final status has come. A proxy's answer to the
-// wish for a tunnel is no status.
+// The server's answer so far; absent until its final status has come. A proxy's answer to a request
+// for a tunnel does not count.
 std::optional<HTTPResponse> responseOf(CURL* easy) {
   long status = 0;
   curl_off_t retryAfter = 0;
@@ -86,7 +86,7 @@ class CurlHTTPClient final : public HTTPClient {
     if (curl_multi_add_handle(multi_, easy.get()) != CURLM_OK) return failure(CURLE_FAILED_INIT);
     const CURLcode code = transfer(easy.get(), stop);
     curl_multi_remove_handle(multi_, easy.get());
-    // The server has decided, whatever became of its content.
+    // The final status is the answer, whatever became of the content.
     if (const auto response = responseOf(easy.get())) return *response;
     if (code == CURLE_ABORTED_BY_CALLBACK) return HTTPFailure{"cancelled"};
     return failure(code == CURLE_OK ? CURLE_GOT_NOTHING : code);
@@ -100,7 +100,7 @@ class CurlHTTPClient final : public HTTPClient {
   }
 
  private:
-  // The right to use what the transfers share, unless `stop` came first.
+  // The right to use what all transfers share; none if `stop` came first.
   class Turn final {
    public:
     Turn(CurlHTTPClient& client, const std::stop_token& stop) : client_(client) {
@@ -124,7 +124,7 @@ class CurlHTTPClient final : public HTTPClient {
 
   static Headers headersOf(const HTTPPost& request) {
     curl_slist* list = curl_slist_append(nullptr, ("Content-Type: " + request.contentType).c_str());
-    // Servers that do not know the question would let every batch wait a second.
+    // Servers that do not understand this header would delay every batch by a second.
     curl_slist* longer = list ? curl_slist_append(list, "Expect:") : nullptr;
     return Headers(longer ? longer : list);
   }
@@ -140,13 +140,13 @@ class CurlHTTPClient final : public HTTPClient {
     set(CURLOPT_SSL_VERIFYPEER, 1L);
     set(CURLOPT_SSL_VERIFYHOST, 2L);
     set(CURLOPT_FOLLOWLOCATION, 0L);
-    // Otherwise the proxies that the environment names would see what is for this machine alone.
+    // Otherwise the environment's proxies would see what is meant for this machine alone.
     if (isOnThisMachine(url)) set(CURLOPT_PROXY, "");
     set(CURLOPT_NOSIGNAL, 1L);
     // A name server that is silent would hold up the end of an interrupted transfer.
     set(CURLOPT_QUICK_EXIT, 1L);
-    set(CURLOPT_CONNECTTIMEOUT, longestConnectingInSeconds);
-    set(CURLOPT_TIMEOUT, longestTransferInSeconds);
+    set(CURLOPT_CONNECTTIMEOUT, maxConnectingSeconds);
+    set(CURLOPT_TIMEOUT, maxTransferSeconds);
     set(CURLOPT_POSTFIELDSIZE_LARGE, static_cast<curl_off_t>(request.body.size()));
     set(CURLOPT_POSTFIELDS, request.body.data());
     set(CURLOPT_HTTPHEADER, headers);
@@ -166,7 +166,7 @@ class CurlHTTPClient final : public HTTPClient {
       int left = 0;
       if (const CURLMsg* message = curl_multi_info_read(multi_, &left)) return message->data.result;
       if (stop.stop_requested() || isClosing_) return CURLE_ABORTED_BY_CALLBACK;
-      if (!endOfContent && responseOf(easy)) endOfContent = Clock::now() + longestContent;
+      if (!endOfContent && responseOf(easy)) endOfContent = Clock::now() + maxContentTime;
       if (endOfContent && Clock::now() >= *endOfContent) return CURLE_OPERATION_TIMEDOUT;
       curl_multi_poll(multi_, nullptr, 0, pollingInMilliseconds, nullptr);
     }
@@ -176,7 +176,7 @@ class CurlHTTPClient final : public HTTPClient {
   std::condition_variable_any free_;
   bool isBusy_ = false;
   std::atomic<bool> isClosing_ = false;
-  CURLM* multi_;  // Belongs to who is busy. Waking it is free for all.
+  CURLM* multi_;  // Belongs to the thread that is busy. Any thread may wake it.
 };
 
 CurlHTTPClient* madeClient = nullptr;
@@ -188,8 +188,8 @@ CurlHTTPClient* makeClient() {
   if (!client->isUsable()) return nullptr;
   madeClient = client;
   makersProcess = ::getpid();
-  // Registered after those of the TLS library, and so called before them. A forked child has nobody
-  // who would end the transfer that it was forked in.
+  // Registered after the exit handlers of the TLS library, and so called before them. In a forked
+  // child no thread would end a transfer that was under way.
   std::atexit([] {
     if (::getpid() == makersProcess) madeClient->close();
   });

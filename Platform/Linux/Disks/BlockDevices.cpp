@@ -7,8 +7,8 @@
 namespace Varnel::Platform::Linux {
 namespace {
 
-// More layers than anybody stacks; a table that runs in circles ends here.
-constexpr int mostLayers = 16;
+// More layers than any machine has. A table that runs in circles ends here.
+constexpr int maxLayers = 16;
 
 // The device that carries a disk: "…/virtio1" of "…/virtio1/block/vda", "…/nvme0" of
 // "…/nvme0/nvme0n1".
@@ -17,7 +17,7 @@ std::string_view carrierOf(std::string_view diskPlace) {
   return lastComponent(above) == "block" ? folderOf(above) : above;
 }
 
-// The part of a place that does not depend on where one looks from.
+// The part of a place that is the same from every starting folder.
 std::string_view withoutClimbing(std::string_view place) {
   while (place.starts_with("../")) place.remove_prefix(3);
   return place;
@@ -43,7 +43,7 @@ std::string BlockDevices::place(const std::string& name) const {
 }
 
 std::vector<std::string> BlockDevices::lowerDevices(const std::string& name) const {
-  // The kinds of which there are many, and which stand on nothing.
+  // The kinds that are numerous and rest on no other device.
   for (const std::string_view alone : {"loop", "ram", "zram"})
     if (name.starts_with(alone)) return {};
   return devices_->names(name + "/slaves");
@@ -75,7 +75,7 @@ StorageDevice BlockDevices::storageDevice(const std::string& name, std::string_v
   StorageDevice device;
   device.bus = bus(place);
   device.isRemovable = flag(name + "/removable");
-  // Of an NVMe disk with several paths, each path is listed too.
+  // An NVMe disk with several paths is listed once for each path as well.
   if (device.bus == Bus::nvme) device.isHidden = flag(name + "/hidden");
   if (!isSmartCapable(device)) return device;
 
@@ -98,7 +98,8 @@ StorageDevice BlockDevices::storageDevice(const std::string& name, std::string_v
 
 std::string BlockDevices::virtioSerial(const std::string& name, std::string_view place,
                                        VirtioSerials& virtioSerials) const {
-  // No other disk has this number until the system is started anew. Older kernels count none.
+  // No other disk gets this number until the next start of the system. Older kernels have no such
+  // number.
   const std::string sequence = text(name + "/diskseq");
   return virtioSerials.of(sequence.empty() ? std::string(place) : sequence,
                           [devices = devices_, path = name + "/serial"] {
@@ -107,7 +108,7 @@ std::string BlockDevices::virtioSerial(const std::string& name, std::string_view
 }
 
 std::optional<bool> BlockDevices::areInternal(const std::vector<std::string>& names) const {
-  return areInternal(names, mostLayers);
+  return areInternal(names, maxLayers);
 }
 
 std::optional<bool> BlockDevices::areInternal(const std::vector<std::string>& names,

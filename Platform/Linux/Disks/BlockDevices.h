@@ -14,8 +14,8 @@ namespace Varnel::Platform::Linux {
 
 class VirtioSerials;
 
-/// The kernel's table of block devices. Reads tables alone, never a device but for what
-/// `VirtioSerials` says. Any thread.
+/// The kernel's table of block devices. Reads tables only and no device, except for what
+/// `VirtioSerials` describes. Any thread.
 class BlockDevices final {
  public:
   /// `folder` is where the devices are listed.
@@ -38,7 +38,8 @@ class BlockDevices final {
                                             VirtioSerials& virtioSerials) const;
 
   /// Whether all of these disks, partitions or logical devices stay in the machine; absent when one
-  /// does not tell, or there are none. A disk image is put in and taken out like a stick.
+  /// does not tell, or there are none. A disk image does not stay: it comes and goes like a USB
+  /// stick.
   [[nodiscard]] std::optional<bool> areInternal(const std::vector<std::string>& names) const;
 
  private:

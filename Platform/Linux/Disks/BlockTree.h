@@ -18,7 +18,7 @@ class VirtioSerials;
 struct BlockTree {
   struct Node {
     PropertyDictionary properties;
-    std::optional<std::size_t> parent;  ///< The first one; absent at the top.
+    std::optional<std::size_t> parent;  ///< The first parent; absent at the top.
     std::vector<std::size_t> children;
   };
 

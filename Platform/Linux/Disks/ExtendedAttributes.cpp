@@ -27,7 +27,7 @@ std::optional<std::string> read(const std::string& path, const std::string& name
     if (size == 0) return std::string();
     std::string bytes(static_cast<std::size_t>(size), '\0');
     const ssize_t length = ::getxattr(path.c_str(), name.c_str(), bytes.data(), bytes.size());
-    // It has grown since it was measured.
+    // The attribute has grown since it was measured.
     if (length < 0 && errno == ERANGE) continue;
     if (length < 0) return absentOr(error);
     bytes.resize(static_cast<std::size_t>(length));

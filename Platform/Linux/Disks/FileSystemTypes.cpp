@@ -7,8 +7,8 @@
 namespace Varnel::Platform::Linux {
 namespace {
 
-// Both tables are sorted. libmount has such tables too, but takes tmpfs and overlay for the
-// kernel's own and does not know most of the network file systems in user space.
+// Both tables are sorted. libmount has such tables too, but counts tmpfs and overlay as the
+// kernel's own and lacks most network file systems in user space.
 constexpr std::string_view pseudoTypes[] = {
     "anon_inodefs", "autofs",  "bdev",      "binfmt_misc", "bpf",        "cgroup",     "cgroup2",
     "configfs",     "cpuset",  "dax",       "debugfs",     "devpts",     "devtmpfs",   "dmabuf",

@@ -3,7 +3,7 @@
 
 #include <string_view>
 
-/// What the type of a file system tells about a volume.
+/// Facts about a volume that follow from the type of its file system.
 namespace Varnel::Platform::Linux {
 
 /// Whether the kernel shows itself in such a file system, rather than anybody's files.

@@ -19,13 +19,13 @@ class KernelFolder final {
   /// Whether the folder itself could be opened.
   explicit operator bool() const { return static_cast<bool>(folder_); }
 
-  /// The names of what lies in a folder below, sorted; empty when it cannot be read.
+  /// The sorted names of the entries of a folder below; empty when it cannot be read.
   [[nodiscard]] std::vector<std::string> names(const std::string& folder = ".") const;
 
   /// Where a symbolic link points, as it is written.
   [[nodiscard]] std::optional<std::string> link(const std::string& path) const;
 
-  /// The bytes of a file, 4096 at the most.
+  /// The bytes of a file, 4096 at most.
   [[nodiscard]] std::optional<std::string> bytes(const std::string& path) const;
 
   [[nodiscard]] bool contains(const std::string& path) const;

@@ -19,8 +19,8 @@ PlatformError systemError(int number) {
   return PlatformError(std::error_code(number, std::generic_category()));
 }
 
-// Kernels before 5.8 tell the mount of an open file alone. To open it so touches no more than a
-// look-up does, and fails like one.
+// Kernels before 5.8 tell only the mount of an open file. Opening it this way touches no more than
+// a look-up does, and fails like one.
 Result<int> mountIDOfOpened(const std::string& path) {
   constexpr std::string_view key = "mnt_id:\t";
   const POSIX::FileDescriptor file(::open(path.c_str(), O_PATH | O_NOFOLLOW | O_CLOEXEC));
@@ -39,7 +39,7 @@ Result<int> mountIDOfOpened(const std::string& path) {
 }  // namespace
 
 Result<int> mountIDOf(const std::string& path) {
-  // The system would look up what stands before the zero.
+  // The system would look up only the part before the zero.
   if (path.find('\0') != std::string::npos) return systemError(EINVAL);
   struct statx facts {};
   constexpr int flags = AT_SYMLINK_NOFOLLOW | AT_NO_AUTOMOUNT | AT_STATX_DONT_SYNC;

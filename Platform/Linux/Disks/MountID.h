@@ -7,8 +7,8 @@
 
 namespace Varnel::Platform::Linux {
 
-/// The mount that a file lies on, by its number in the mount table. A symbolic link lies where it
-/// is, not where it points. Fails when the path cannot be looked up. Any thread.
+/// The mount that a file lies on, by its number in the mount table. For a symbolic link it is the
+/// mount of the link itself. Fails when the path cannot be looked up. Any thread.
 [[nodiscard]] Result<int> mountIDOf(const std::string& path);
 
 }  // namespace Varnel::Platform::Linux

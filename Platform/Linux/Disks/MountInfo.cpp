@@ -15,7 +15,7 @@ namespace {
 
 constexpr std::string_view deletedSuffix = "//deleted";
 
-// The text up to the separator, which is taken away with it.
+// Removes the text up to the separator, and the separator, from the line; returns the text.
 std::string_view takeUntil(std::string_view& rest, char separator) {
   const std::size_t end = rest.find(separator);
   const std::string_view field = rest.substr(0, end);
@@ -71,7 +71,8 @@ std::optional<Mount> parseLine(std::string_view line) {
   return mount;
 }
 
-// Looks at mounts the way a path look-up meets them. Its keys refer to the mounts it was made of.
+// Looks at mounts the way a path look-up meets them. Its keys refer to the mounts that it was made
+// from.
 class Reachability final {
  public:
   explicit Reachability(const std::vector<Mount>& mounts) {
@@ -103,7 +104,7 @@ class Reachability final {
   bool isReachable(const Mount& mount) {
     std::vector<const Mount*> chain;
     const Mount* top = &mount;
-    // Not reachable until shown: so a table that runs in circles comes to an end.
+    // Not reachable until shown otherwise, so that a table that runs in circles comes to an end.
     while (top && reachable_.emplace(top->id, false).second) {
       chain.push_back(top);
       top = parentOf(*top);

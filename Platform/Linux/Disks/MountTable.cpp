@@ -22,7 +22,7 @@ namespace Varnel::Platform::Linux {
 namespace {
 
 constexpr std::size_t leastRoom = 8192;
-constexpr int mostAttempts = 4;
+constexpr int maxAttempts = 4;
 
 // Finds the block devices below mounts.
 class DeviceNames final {
@@ -30,8 +30,8 @@ class DeviceNames final {
   std::vector<std::string> of(const Mount& mount) {
     std::string device = mount.device;
     if (device.starts_with("0:")) {
-      // btrfs has device numbers of its own making, and its source is a block device. Of others the
-      // source is whatever the user liked to write.
+      // btrfs has device numbers of its own making, and its source is a block device. For other
+      // types the source is any text of the user's choice.
       if (mount.type != "btrfs") return {};
       struct stat node {};
       if (::stat(mount.source.c_str(), &node) != 0 || !S_ISBLK(node.st_mode)) return {};
@@ -74,7 +74,8 @@ std::vector<Mount> visibleMounts(std::string_view mountInfo) {
   std::vector<Mount> mounts = reachableMounts(parseMountInfo(mountInfo));
   const bool hasRoot =
       std::any_of(mounts.begin(), mounts.end(), [](const Mount& m) { return m.target == "/"; });
-  // A process whose root folder was changed is not told of the mount that the folder lies on.
+  // The table of a process whose root folder was changed does not list the mount that the folder
+  // lies on.
   if (!hasRoot)
     if (auto root = mountOfRootFolder()) mounts.insert(mounts.begin(), *std::move(root));
   return mounts;
@@ -148,9 +149,9 @@ std::shared_ptr<const VolumeTable> MountTable::current() {
   const std::lock_guard lock(mutex_);
   if (!file_) file_ = openMountInfo();
   if (!file_) return nullptr;
-  // The kernel tells of each change once, so whoever hears of it must read. It hands the table out
-  // in pieces; after a change in between they may not fit together.
-  for (int attempt = 0; attempt < mostAttempts; ++attempt) {
+  // The kernel tells of each change only once, so the thread that hears of it must read. The table
+  // comes in pieces, which may not fit together if it changes in between.
+  for (int attempt = 0; attempt < maxAttempts; ++attempt) {
     if (hasChanged()) isStale_ = true;
     if (!isStale_) break;
     if (!readWhole(file_, buffer_)) break;

@@ -58,10 +58,10 @@ class MountTable final {
   std::shared_ptr<const VolumeTable> table_;
 };
 
-/// Opens the kernel's mount table, whose changes wake a poll for exceptional conditions.
+/// Opens the kernel's mount table. A change wakes a poll for exceptional conditions.
 [[nodiscard]] POSIX::FileDescriptor openMountInfo();
 
-/// Reads a file of the kernel's from its beginning, over what the buffer held before.
+/// Reads one of the kernel's files from its beginning into the buffer, in place of what it held.
 [[nodiscard]] bool readWhole(const POSIX::FileDescriptor& file, std::string& buffer);
 
 }  // namespace Varnel::Platform::Linux

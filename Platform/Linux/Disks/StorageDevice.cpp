@@ -28,7 +28,7 @@ Bus busOf(const std::vector<std::string>& subsystems) {
 }
 
 bool decidesBus(std::string_view subsystem) {
-  // A SCSI device may still turn out to hang on USB; what the other buses carry cannot.
+  // A SCSI device may still turn out to hang on USB; a device of another bus cannot.
   return !subsystem.empty() && subsystem != "scsi";
 }
 

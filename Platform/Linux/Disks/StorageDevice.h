@@ -6,13 +6,13 @@
 #include <string_view>
 #include <vector>
 
-/// What is known of a storage device, and what follows from it. Plain functions over plain data.
+/// The facts of a storage device, and what follows from them. Plain functions over plain data.
 namespace Varnel::Platform::Linux {
 
 /// How a disk is attached, as far as it matters here.
 enum class Bus { none, nvme, scsi, virtio, mmc, usb, firewire, other };
 
-/// The facts of one whole disk. A text that the system does not tell is empty.
+/// The facts of one whole disk. A text that the system does not give is empty.
 struct StorageDevice {
   Bus bus = Bus::none;
   bool isRemovable = false;
@@ -20,13 +20,13 @@ struct StorageDevice {
   bool isSolidState = false;
   std::string serialNumber;    ///< As the device's driver tells it.
   std::string serialPage;      ///< The SCSI product data page 0x80, raw.
-  std::string recordedSerial;  ///< What udev found out when the device was plugged in.
+  std::string recordedSerial;  ///< What udev recorded when the device was plugged in.
   std::string worldWideName;
   std::string place;  ///< In the kernel's tree of devices.
 };
 
 /// The bus that a chain of subsystems tells, that of the disk's own device first. A SCSI disk may
-/// hang on USB, so what is further away counts more.
+/// hang on USB, so links further from the disk count more.
 [[nodiscard]] Bus busOf(const std::vector<std::string>& subsystems);
 
 /// Whether the chain needs no further link to tell the bus.

@@ -8,7 +8,7 @@
 
 namespace Varnel::Platform::Linux {
 
-/// What udev's rules found out about a block device when it was plugged in. Absent when udev does
+/// What udev's rules recorded about a block device when it was plugged in. Absent when udev does
 /// not run or does not know. Any thread.
 [[nodiscard]] std::optional<std::string> udevProperty(const std::string& deviceName,
                                                       const char* property);

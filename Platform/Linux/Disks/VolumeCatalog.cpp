@@ -40,7 +40,7 @@ class MountTableCatalog final : public VolumeCatalog {
   Result<std::optional<URL>> volumeURL(const URL& url) override {
     const auto mountID = mountIDOf(url.path());
     if (!mountID) return mountID.error();
-    // Asked after the file, the table knows the mount that the file was found on.
+    // The table is read after the file was looked up, so it knows the file's mount.
     const auto table = table_->current();
     if (!table) return PlatformError(std::make_error_code(std::errc::no_such_file_or_directory));
     const Volume* volume = table->withMountID(*mountID);

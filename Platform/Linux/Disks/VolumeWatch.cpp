@@ -48,7 +48,8 @@ std::unique_ptr<VolumeWatch> VolumeWatch::start(std::shared_ptr<MountTable> tabl
 
 bool VolumeWatch::begin() {
   if (!mountInfo_ || !stop_) return false;
-  // The file above counts changes from its opening on, so none can slip through before this.
+  // The file above counts changes from the moment it was opened, so none is missed before this
+  // point.
   told_ = table_->current();
   if (!told_) return false;
   try {

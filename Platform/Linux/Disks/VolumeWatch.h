@@ -12,11 +12,11 @@
 namespace Varnel::Platform::Linux {
 
 /// A subscription to the changes of the mount table: a thread that waits for them in the kernel and
-/// ends with this object. The table shows a change before the handler hears of it. What went and
-/// came back before the thread could look may go untold.
+/// ends with this object. The table shows a change before the handler hears of it. A volume that
+/// went and came back before the thread could look may go unreported.
 class VolumeWatch final : public VolumeCatalog::Subscription {
  public:
-  /// Changes that happen after the return are told. Null when the table cannot be watched.
+  /// Changes after the return are reported. Null when the table cannot be watched.
   [[nodiscard]] static std::unique_ptr<VolumeWatch> start(std::shared_ptr<MountTable> table,
                                                           VolumeCatalog::ChangeHandler handler);
   ~VolumeWatch() override;
@@ -32,11 +32,11 @@ class VolumeWatch final : public VolumeCatalog::Subscription {
   const VolumeCatalog::ChangeHandler handler_;
   POSIX::FileDescriptor mountInfo_;
   POSIX::FileDescriptor stop_;  ///< An event that becomes readable when the thread is to end.
-  std::shared_ptr<const VolumeTable> told_;  ///< What the handler knows; the thread's alone.
+  std::shared_ptr<const VolumeTable> told_;  ///< What the handler knows. Belongs to the thread.
   std::thread thread_;
 };
 
-/// What lies between two views: first the volumes that went, then those that came.
+/// The changes from one view to the other: first the volumes that went, then those that came.
 [[nodiscard]] std::vector<VolumeChange> changesBetween(const VolumeTable& before,
                                                        const VolumeTable& after);
 

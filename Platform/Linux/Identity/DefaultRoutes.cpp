@@ -41,7 +41,7 @@ bool isZero(std::string_view digits) {
   return digits.find_first_not_of('0') == std::string_view::npos;
 }
 
-// A route that is up and does not refuse its packets.
+// Whether a route is up and does not refuse its packets.
 bool isUsable(std::optional<std::uint32_t> flags) {
   constexpr std::uint32_t up = 0x0001;
   constexpr std::uint32_t rejecting = 0x0200;

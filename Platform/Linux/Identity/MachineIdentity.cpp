@@ -14,7 +14,8 @@
 namespace Varnel::Platform::Linux {
 namespace {
 
-// What cannot be read is empty. A router may know a million routes, a line of some 150 bytes each.
+// Empty when the file cannot be read. A router may know a million routes, each in a line of some
+// 150 bytes.
 std::string routes(const std::string& path) {
   constexpr std::size_t maxSize = std::size_t{512} << 20;
   return readFile(path, maxSize).valueOr("");
@@ -36,7 +37,7 @@ bool isMachineID(const std::string& text) {
          !isOneCharacterRepeated(text);
 }
 
-// What makers of boards leave in place of an identity.
+// Placeholders that makers of boards leave in place of an identity.
 bool isPlaceholder(const std::string& text) {
   constexpr std::array<std::string_view, 21> placeholders = {
       "to be filled by o.e.m.",
@@ -99,8 +100,8 @@ class MachineFiles final : public MachineIdentity {
     return trimmed(*bytes);
   }
 
-  // The identifier must not depend on who may read what: everybody may read the machine's own, root
-  // alone the board's, which therefore serves only where there is no other.
+  // The identifier must not depend on who reads it. Everybody may read the machine's own, but only
+  // root may read the board's: so the board's serves only where there is no other.
   std::optional<PropertyValue> uuid() const {
     for (const char* file : {"etc/machine-id", "var/lib/dbus/machine-id"}) {
       auto id = read(file);

@@ -51,7 +51,7 @@ std::vector<std::string> NetworkInterfaces::lowerInterfaces(const std::string& n
 
 std::optional<std::string> NetworkInterfaces::physicalInterface(
     const std::vector<std::string>& names) const {
-  // Depth first: what lies below a route's interface comes before the next route.
+  // Depth first: the interfaces below a route's interface come before the next route.
   std::vector<std::string> waiting(names.rbegin(), names.rend());
   std::set<std::string> seen;
   while (!waiting.empty()) {

@@ -20,7 +20,7 @@ class NetworkInterfaces final {
   [[nodiscard]] std::optional<std::string> physicalInterface(
       const std::vector<std::string>& names) const;
 
-  /// The address that the hardware was made with where it is known, else the present one.
+  /// The address that the hardware was made with; where it is not known, the present one.
   [[nodiscard]] std::optional<PropertyData> hardwareAddress(const std::string& name) const;
 
  private:

@@ -15,7 +15,7 @@ bool watch(int all, int descriptor, unsigned events) {
   // The flags of poll and epoll have the same values.
   event.events = events;
   event.data.fd = descriptor;
-  // The number may stand for another file by now, which the kernel does not know yet.
+  // By now the number may stand for another file, which is not registered with the kernel yet.
   return ::epoll_ctl(all, EPOLL_CTL_MOD, descriptor, &event) == 0 ||
          ::epoll_ctl(all, EPOLL_CTL_ADD, descriptor, &event) == 0;
 }
@@ -40,7 +40,7 @@ int ContextDescriptor::refreshed() {
   for (const auto& [descriptor, unused] : watched_)
     if (!events.contains(descriptor)) ::epoll_ctl(all_.get(), EPOLL_CTL_DEL, descriptor, nullptr);
   for (const auto& [descriptor, wanted] : events)
-    // What cannot be watched, such as a plain file, is always ready.
+    // A file that cannot be watched, such as a plain file, is always ready.
     if (!watch(all_.get(), descriptor, wanted)) timeout = 0;
   watched_ = std::move(events);
   setTimer(timeout);

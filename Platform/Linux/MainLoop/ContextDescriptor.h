@@ -11,7 +11,7 @@ namespace Varnel::Platform::Linux {
 
 /// One file descriptor that is readable when a GLib main context has something to dispatch, for
 /// hosts that poll by themselves. Made, used and destroyed on the thread that runs the context; the
-/// thread owns the context meanwhile, or posts of others would not wake it.
+/// thread owns the context meanwhile; otherwise posts from other threads would not wake it.
 class ContextDescriptor final {
  public:
   explicit ContextDescriptor(GMainContext* context);

@@ -14,7 +14,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-// A database is written through a file that its owner keeps open, so closing is no sign.
+// A database is written through a file that stays open, so its closing cannot be waited for.
 constexpr std::uint32_t changes =
     IN_MODIFY | IN_CREATE | IN_DELETE | IN_MOVED_TO | IN_MOVED_FROM | IN_ATTRIB;
 
@@ -41,7 +41,7 @@ void FileWatch::readEvents() {
     for (ssize_t offset = 0; offset < size;) {
       const auto* event = reinterpret_cast<const inotify_event*>(buffer.data() + offset);
       offset += static_cast<ssize_t>(sizeof(inotify_event) + event->len);
-      // After an overflow it is not known what has changed.
+      // After an overflow, anything may have changed.
       if ((event->mask & IN_Q_OVERFLOW) != 0 || (event->len > 0 && name_ == event->name))
         concerned = true;
     }

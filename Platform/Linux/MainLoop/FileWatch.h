@@ -11,7 +11,7 @@
 namespace Varnel::Platform::Linux {
 
 /// Calls back, on the main thread, after a file of a folder was written, made, moved or removed.
-/// Where nothing can be watched, nothing is told.
+/// Where the folder cannot be watched, nothing is reported.
 class FileWatch final {
  public:
   FileWatch(const std::filesystem::path& folder, std::string name, std::function<void()> changed);

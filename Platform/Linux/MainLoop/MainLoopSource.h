@@ -10,7 +10,7 @@ struct _GSource;
 namespace Varnel::Platform::Linux {
 
 /// Calls back on the main thread whenever a file descriptor is readable, as long as it lives. The
-/// descriptor is somebody else's; with -1 nothing is watched. Main thread only.
+/// caller owns the descriptor; with -1 nothing is watched. Main thread only.
 class MainLoopSource final {
  public:
   MainLoopSource(int descriptor, std::function<void()> readable);

@@ -31,7 +31,7 @@ gboolean note(gpointer isOver) noexcept {
 }
 
 // Posts to GLib's default main context, which GTK, Qt and plain hosts all run. Every block has a
-// source of its own, so that a loop that a block runs inside itself still gets at the rest.
+// source of its own. So a nested loop, which a block runs, still reaches the other blocks.
 class DefaultContextQueue final : public MainQueue {
  public:
   ~DefaultContextQueue() override {
@@ -108,7 +108,7 @@ class DefaultContextQueue final : public MainQueue {
 
   std::mutex mutex_;  // Owns blocks_, of which there are as many as sources.
   std::deque<Block> blocks_;
-  // The rest belongs to the main thread.
+  // The members below belong to the main thread.
   std::vector<bool*> running_;  // Whether each run is to end, the innermost last.
   bool stopsNextRun_ = false;
   std::optional<ContextDescriptor> descriptor_;

@@ -21,7 +21,7 @@ namespace {
 
 using std::chrono::seconds;
 
-// The kernel counts to 2262.
+// The kernel's clock ends in 2262.
 constexpr Date latest = std::chrono::sys_days(std::chrono::year(2200) / std::chrono::January / 1);
 constexpr Date earliest = Date() + seconds(1);
 
@@ -46,7 +46,8 @@ class DescriptorTimer final : public WallClockTimer {
     if (!connect()) return;
     const itimerspec setting = settingOf(date);
     isArmed_ = true;
-    // When the clock was set since the last time it fails with ECANCELED, and has armed the timer.
+    // If the clock was set since the last call, it fails with ECANCELED and has armed the timer all
+    // the same.
     if (::timerfd_settime(descriptor_.get(), TFD_TIMER_ABSTIME | TFD_TIMER_CANCEL_ON_SET, &setting,
                           nullptr) != 0 &&
         errno != ECANCELED)

@@ -20,8 +20,8 @@ namespace fs = std::filesystem;
 
 constexpr const char* storeName = "notifications.sqlite";
 
-// One center with all that serves it alone. Its file may be changed by other processes of the
-// product, and the link /etc/localtime when the user's time zone does.
+// One center with everything that serves it alone. Other processes of the product may change its
+// file; a change of the user's time zone changes the link /etc/localtime.
 class Center final {
  public:
   Center(const NotificationPorts& ports, const NotificationSource& source, const fs::path& folder)
@@ -43,7 +43,7 @@ class Center final {
   const FileWatch zoneWatch_;
 };
 
-// An identifier is the name of one folder and leads nowhere else.
+// An identifier must be the name of one folder, not a path to another place.
 std::string folderName(std::string identifier) {
   for (char& character : identifier)
     if (character == '/' || character == '\0') character = '_';
@@ -51,7 +51,7 @@ std::string folderName(std::string identifier) {
   return identifier;
 }
 
-// Made before it can be watched, for its user alone.
+// The folder must exist before it can be watched. It is for the user alone.
 fs::path privateFolder(const fs::path& folder) {
   std::error_code ignored;
   if (fs::create_directories(folder, ignored))

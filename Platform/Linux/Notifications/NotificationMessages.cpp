@@ -19,7 +19,7 @@ BusMessage request(const char* destination, const char* method, GVariant* body) 
   return message;
 }
 
-// The bus carries nothing but valid UTF-8.
+// The bus carries valid UTF-8 only.
 Text valid(const std::string& text) {
   return Text(g_utf8_make_valid(text.data(), static_cast<gssize>(text.size())));
 }

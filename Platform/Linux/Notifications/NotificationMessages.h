@@ -24,12 +24,12 @@ inline constexpr const char* defaultAction = "default";
 inline constexpr const char* buttonAction = "action";
 inline constexpr const char* dismissAction = "dismiss";
 
-/// Why a banner was closed: the reason that says that the user did it.
+/// The reason of a closed banner that means: the user closed it.
 inline constexpr std::uint32_t dismissedByUser = 2;
 /// Its time was over; the server may still keep it in a list.
 inline constexpr std::uint32_t expired = 1;
 
-/// What a server can do, of that which matters here.
+/// The capabilities of a server that matter here.
 struct ServerCapabilities final {
   bool hasActions = false;
   bool readsMarkup = false;
@@ -58,7 +58,7 @@ struct BannerAddress final {
 
 [[nodiscard]] BusMessage closeRequest(const BannerAddress& banner);
 
-/// What a reply that reports an error says.
+/// The error that a reply reports.
 [[nodiscard]] std::optional<std::string> errorIn(GDBusMessage* reply);
 
 }  // namespace Varnel::Platform::Linux

@@ -38,7 +38,7 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
       const auto self = weak.lock();
       if (!self || !self->isCurrent(key)) return;
       if (!error.empty()) return self->fail(key, error);
-      // Asked each time, because the server may be another one than before.
+      // Asked each time, because another server may have taken its place.
       self->send(capabilitiesRequest(), key,
                  [banner](Desktop& desktop, GDBusMessage* reply, const Key& asked) {
                    desktop.notify(asked, banner, g_dbus_message_get_sender(reply),
@@ -85,7 +85,7 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
                });
   }
 
-  // Whether the banner was still there is of no interest.
+  // It does not matter whether the banner was still there.
   void close(const BannerAddress& address) {
     bus_->send(closeRequest(address), [](GDBusMessage*, const std::string&) {});
   }
@@ -109,13 +109,13 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
 
   void hasShown(const Key& key, const BannerAddress& address) {
     const auto shown = shown_.find(key.token);
-    // It was closed before the server had answered.
+    // The banner was closed before the server had answered.
     if (shown == shown_.end()) return close(address);
     const auto earlier = std::exchange(shown->second.address, address);
     if (earlier && earlier->bus == address.bus && earlier->server == address.server &&
         earlier->number != address.number)
       close(*earlier);
-    // It is being shown anew, in the place of this one.
+    // The banner is being replaced by a newer one.
     if (!isCurrent(key)) return;
     if (const auto told = observer.lock()) told->bannerShown(key.token, address.reference());
   }
@@ -130,12 +130,12 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     if (name == "NotificationClosed" && g_variant_is_of_type(body, G_VARIANT_TYPE("(uu)"))) {
       guint32 reason = 0;
       g_variant_get(body, "(uu)", &number, &reason);
-      // An expired one may be called back from the server's history.
+      // The user may bring an expired banner back from the server's history.
       if (reason != expired) forget({bus_->name(), sender, number}, reason == dismissedByUser);
     }
   }
 
-  // Its token, once: what follows for the same banner is an echo.
+  // The banner's token, once: further signals for the same banner are ignored.
   std::optional<std::string> take(const BannerAddress& address) {
     for (auto shown = shown_.begin(); shown != shown_.end(); ++shown)
       if (shown->second.address == address) return shown_.extract(shown).key();
@@ -145,7 +145,7 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
   void invoke(const BannerAddress& address, std::string_view action) {
     const auto token = take(address);
     if (!token) return;
-    // Not every server takes it away by itself.
+    // Not every server closes the banner by itself.
     close(address);
     const auto told = observer.lock();
     if (!told) return;

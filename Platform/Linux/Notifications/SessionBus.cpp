@@ -33,8 +33,8 @@ GSource* attach(GSource* source, int priority, Block block) {
   return source;
 }
 
-// While it lives, what GIO is asked for arrives where the main queue runs, although the host may
-// have made another context the thread's own.
+// While it lives, GIO's answers arrive where the main queue runs, even if the host has made another
+// context the thread's default.
 class OnMainContext final {
  public:
   OnMainContext()
@@ -88,9 +88,10 @@ void SessionBus::connect(Connected use) {
   if (!attempt_) start();
 }
 
-// A bus may accept the connection and then say nothing; even to ask for its address may mean to
-// start a program. The thread is left alone with that when the time is over, which counts for
-// nothing against a connection that has come: the main loop may have had no time for either.
+// A bus may accept the connection and then never answer; even asking for its address may start a
+// program. After the time is over, the thread finishes that by itself and nobody waits for it. The
+// end of the time counts for nothing against a connection that has come: the main loop may have had
+// no time for either.
 void SessionBus::start() {
   const auto attempt = attempt_ = std::make_shared<Attempt>();
   timer_ = Timer(attach(g_timeout_source_new(static_cast<guint>(patience_.count())),
@@ -128,7 +129,7 @@ SessionBus::Connection SessionBus::open(GCancellable* cancellable, std::string& 
 
 void SessionBus::finish(std::shared_ptr<Attempt> attempt, Connection connection,
                         const std::string& error) {
-  // It was given up.
+  // The attempt was given up.
   if (attempt != attempt_) return;
   if (connection) adopt(std::move(connection));
   attempt_.reset();
@@ -137,7 +138,7 @@ void SessionBus::finish(std::shared_ptr<Attempt> attempt, Connection connection,
 }
 
 void SessionBus::adopt(Connection connection) {
-  // A signal of the lost connection may still be on its way to us.
+  // A signal of the lost connection may still arrive.
   unsubscribe();
   connection_ = std::move(connection);
   const OnMainContext here;
@@ -162,7 +163,7 @@ void SessionBus::replied(GObject* connection, GAsyncResult* result, gpointer dat
       G_DBUS_CONNECTION(connection), result, &error));
   if (const auto self = awaited->bus.lock()) --self->awaitedReplies_;
   if (!message) return awaited->use(nullptr, take(error));
-  // Which none does that a real bus has passed on.
+  // A message from a real bus always has a sender.
   if (!g_dbus_message_get_sender(message.get()))
     return awaited->use(nullptr, "The session bus does not tell who answers.");
   const auto refusal = errorIn(message.get());

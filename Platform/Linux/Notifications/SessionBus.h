@@ -22,11 +22,11 @@ namespace Varnel::Platform::Linux {
 ///     });
 class SessionBus final : public std::enable_shared_from_this<SessionBus> {
  public:
-  /// Gets what went wrong, or nothing. Must not throw.
+  /// Given the error, or an empty text. Must not throw.
   using Connected = std::function<void(const std::string& error)>;
-  /// Gets the reply, which has a sender, or null and what went wrong. Must not throw.
+  /// Given the reply, which has a sender, or null and the error. Must not throw.
   using Reply = std::function<void(GDBusMessage* reply, const std::string& error)>;
-  /// Gets the sender, the member and the body of a signal. Must not throw.
+  /// Given the sender, the member and the body of a signal. Must not throw.
   using Signal = std::function<void(const char* sender, const char* name, GVariant* body)>;
 
   /// Signals of the notification service go to `signal`, as long as the object lives. `patience` is
@@ -36,17 +36,17 @@ class SessionBus final : public std::enable_shared_from_this<SessionBus> {
   SessionBus(const SessionBus&) = delete;
   SessionBus& operator=(const SessionBus&) = delete;
 
-  /// Connects if need be. Calls `use` within the call where there is a connection, and otherwise
-  /// when there is one or none is to be had.
+  /// Connects if need be. Calls `use` at once if there is a connection, and otherwise when the
+  /// attempt to connect has succeeded or failed.
   void connect(Connected use);
 
-  /// Sends a message, over the connection that must be there, and does not wait for the reply.
+  /// Sends a message over the present connection, without waiting for the reply. There must be one.
   void send(const BusMessage& message, Reply reply);
 
   /// Whether a connection or a reply is still to come.
   [[nodiscard]] bool isBusy() const { return attempt_ || awaitedReplies_ > 0; }
 
-  /// The bus's own name, which no other bus has. Empty without a connection.
+  /// The bus's unique name. Empty without a connection.
   [[nodiscard]] std::string name() const;
 
  private:
@@ -68,8 +68,8 @@ class SessionBus final : public std::enable_shared_from_this<SessionBus> {
   const Signal signal_;
   const std::chrono::milliseconds patience_;
   std::shared_ptr<Attempt> attempt_;  // The connection that is being made.
-  Timer timer_;                       // Its end.
-  std::vector<Connected> waiting_;    // For it.
+  Timer timer_;                       // Ends the attempt.
+  std::vector<Connected> waiting_;    // Called at the end of the attempt.
   Connection connection_;
   guint subscription_ = 0;
   int awaitedReplies_ = 0;

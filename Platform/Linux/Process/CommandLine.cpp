@@ -46,7 +46,7 @@ std::optional<Words> expanded(const Words& words) {
   for (const std::string& word : words) {
     auto text = expanded(word);
     if (!text) return std::nullopt;
-    // A word of nothing but a code goes with it.
+    // A word that is only a field code vanishes with the code.
     if (!text->empty() || word.empty()) result.push_back(std::move(*text));
   }
   return result;
@@ -61,12 +61,12 @@ struct EnvOption {
   std::string_view name;
 };
 
-// Those that take a value, which may be the next word.
+// The options that take a value, which may be the next word.
 constexpr EnvOption optionsWithValue[] = {
     {'a', "--argv0"}, {'C', "--chdir"}, {'S', "--split-string"}, {'u', "--unset"}};
 
-// The letter of the option that is the first word, if it takes a value; `value` is what of that
-// stands in the same word. Letters may share a dash, and names be shortened.
+// The letter of the option in the first word, if it takes a value; `value` is the part of the value
+// that stands in the same word. Letters may share a dash, and names may be shortened.
 char optionIn(std::string_view word, std::optional<std::string>& value) {
   if (word.starts_with("--")) {
     const std::size_t mark = word.find('=');
@@ -86,7 +86,7 @@ char optionIn(std::string_view word, std::optional<std::string>& value) {
   return 0;
 }
 
-// Removes the options of "env". False when they are broken.
+// Removes the options of "env". False when they are malformed.
 bool skipOptions(Words& words) {
   while (!words.empty() && words.front().starts_with('-')) {
     std::optional<std::string> value;
@@ -101,7 +101,7 @@ bool skipOptions(Words& words) {
       words.pop_front();
     }
     if (letter != 'S') continue;
-    // Its value is words in place of itself, options included.
+    // Its value stands for words in its place, options included.
     const auto more = split(*value);
     if (!more) return false;
     words.insert(words.begin(), more->begin(), more->end());

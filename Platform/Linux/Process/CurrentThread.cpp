@@ -10,7 +10,7 @@
 namespace Varnel::Platform {
 namespace {
 
-constexpr std::size_t longestName = 15;
+constexpr std::size_t maxNameLength = 15;
 
 int nicenessOf(QualityOfService quality) {
   switch (quality) {
@@ -29,12 +29,12 @@ int nicenessOf(QualityOfService quality) {
 }  // namespace
 
 void nameCurrentThread(std::string_view name) {
-  ::pthread_setname_np(::pthread_self(), std::string(name.substr(0, longestName)).c_str());
+  ::pthread_setname_np(::pthread_self(), std::string(name.substr(0, maxNameLength)).c_str());
 }
 
 void setCurrentThreadQuality(QualityOfService quality) {
-  // Here each thread has a niceness of its own. A process that was started with less urgency keeps
-  // it, and a refusal leaves the thread as it was.
+  // On this system each thread has a niceness of its own. A process that was started as less urgent
+  // stays so, and if the system refuses the thread keeps its niceness.
   const int niceness = nicenessOf(quality);
   const auto thread = static_cast<id_t>(::gettid());
   if (niceness > ::getpriority(PRIO_PROCESS, thread)) ::setpriority(PRIO_PROCESS, thread, niceness);

@@ -45,7 +45,7 @@ OperatingSystemVersion versionFromRelease(std::string_view release) {
   return version;
 }
 
-// The kernel marks the name of a file that was removed or replaced, as an update does, since the
+// The kernel marks the name of a file that was removed or replaced (by an update, say) since the
 // process began.
 fs::path withoutMarkOfDeletion(const fs::path& path, const fs::path& link) {
   constexpr std::string_view mark = " (deleted)";
@@ -56,8 +56,8 @@ fs::path withoutMarkOfDeletion(const fs::path& path, const fs::path& link) {
   return text;
 }
 
-// Without /proc, in a bare sandbox or early in a machine's start, the kernel has left what the
-// program was called by. A name that leads nowhere from here still tells the last component.
+// Without /proc (in a bare sandbox, or early in a machine's start) there is still the name by which
+// the program was called. Even if that leads nowhere from here, its last component is right.
 fs::path pathThatWasCalled() {
   const auto* name = reinterpret_cast<const char*>(::getauxval(AT_EXECFN));
   if (!name) return {};
@@ -73,7 +73,7 @@ fs::path findExecutable(const fs::path& root) {
   return failed ? pathThatWasCalled() : withoutMarkOfDeletion(path, link);
 }
 
-// The executable is looked up once: an update may give the running file another name.
+// The executable is looked up once, because an update may rename the running file.
 class ProcProcessInfo final : public ProcessInfo {
  public:
   explicit ProcProcessInfo(const fs::path& root) : executable_(findExecutable(root)) {}
@@ -99,7 +99,7 @@ class ProcProcessInfo final : public ProcessInfo {
                                                 std::string_view sharedFolder) const override {
     const fs::path image = POSIX::imageFile(address);
     const fs::path& path = image.empty() ? executable_ : image;
-    // The Info.plist beside a library may be that of the application it is shipped with.
+    // The Info.plist beside a library may belong to the application that ships it.
     const auto shared = sharedFolder.empty() ? std::nullopt : findSharedFolder(path, sharedFolder);
     return asText(shared ? shared : findBundleFolder(path, nameOfImage(path)));
   }

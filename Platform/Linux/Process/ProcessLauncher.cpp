@@ -41,11 +41,11 @@ std::optional<Pipe> makePipe() {
 }
 
 void enlarge(const FileDescriptor& pipe) {
-  constexpr int usualLimit = 1 << 20;
-  int limit = 0;
-  if (!(std::ifstream("/proc/sys/fs/pipe-max-size") >> limit)) limit = usualLimit;
+  constexpr int usualMaxSize = 1 << 20;
+  int maxSize = 0;
+  if (!(std::ifstream("/proc/sys/fs/pipe-max-size") >> maxSize)) maxSize = usualMaxSize;
   // A user who has many large pipes may be refused; the pipe then keeps its size.
-  ::fcntl(pipe.get(), F_SETPIPE_SZ, limit);
+  ::fcntl(pipe.get(), F_SETPIPE_SZ, maxSize);
 }
 
 // What the child does between its birth and the program's start.
@@ -57,8 +57,8 @@ class SpawnSettings final {
     ::posix_spawn_file_actions_adddup2(&actions_, output.writeEnd.get(), STDOUT_FILENO);
     ::posix_spawn_file_actions_addclosefrom_np(&actions_, STDERR_FILENO + 1);
 
-    // A group of its own lets it be ended together with what it has started. Signals that the host
-    // blocks or ignores are the host's affair.
+    // A group of its own lets the program be ended together with what it has started. The host's
+    // own choice of blocked and ignored signals is not passed on.
     sigset_t none;
     sigset_t all;
     ::sigemptyset(&none);
@@ -95,7 +95,7 @@ class SpawnedProcess final : public LaunchedProcess {
  public:
   SpawnedProcess(pid_t process, FileDescriptor input, FileDescriptor output)
       : process_(process), input_(std::move(input)), output_(std::move(output)) {
-    // Nothing that the program started and left behind can make the reader wait.
+    // The reader must not wait for processes that the program started and left behind.
     ::fcntl(output_.get(), F_SETFL, O_NONBLOCK);
     descriptor_ = FileDescriptor(static_cast<int>(::syscall(SYS_pidfd_open, process_, 0)));
   }
@@ -112,14 +112,15 @@ class SpawnedProcess final : public LaunchedProcess {
   }
 
   void terminate() override {
-    // Until its end is collected, the number cannot become another process's.
+    // Until the child's end is collected, no other process can get its number.
     if (hasEnded_) return;
     ::kill(-process_, SIGKILL);
-    ::kill(process_, SIGKILL);  // It may have left its group.
+    ::kill(process_, SIGKILL);  // The child may have left its group.
     collect(0);
   }
 
-  // What the program left behind may still be writing; more than a pipeful is not its output.
+  // Processes that the program left behind may still be writing. More than a pipeful is not the
+  // program's.
   std::string readOutput() override {
     const int capacity = std::max(::fcntl(output_.get(), F_GETPIPE_SZ), 0);
     std::string text(static_cast<std::size_t>(capacity), '\0');

@@ -16,8 +16,8 @@
 namespace Varnel::Platform::Linux {
 namespace {
 
-// While it lives, a write to a pipe without a reader fails and does no more: the signal that comes
-// with it goes to the writing thread and is taken back here, whatever the process does with others.
+// While it lives, a write to a pipe without a reader only fails. The signal that comes with it goes
+// to the writing thread, and is consumed here whatever the process does with signals.
 class BrokenPipeIsNoSignal final {
  public:
   BrokenPipeIsNoSignal() {
@@ -59,13 +59,13 @@ class LockedStream final {
   std::FILE* stream_;
 };
 
-// With the stream's lock held, and not for what only goes into the buffer.
+// Called with the stream's lock held, and only for a write that may go beyond the buffer.
 void write(std::FILE* stream, std::string_view text, bool flushes) {
   const BrokenPipeIsNoSignal guard;
   errno = 0;  // A stream of wide text refuses this one and sets none.
   const bool isWritten = ::fwrite_unlocked(text.data(), 1, text.size(), stream) == text.size() &&
                          (!flushes || ::fflush_unlocked(stream) == 0);
-  // What nobody can read any more would be tried again, by the process's end at the latest.
+  // Text that nobody can read any more would be written again, at the latest when the process ends.
   if (!isWritten && errno == EPIPE) ::__fpurge(stream);
 }
 
@@ -78,13 +78,13 @@ void flush() {
   ::funlockfile(stdout);
 }
 
-// What the C library writes after this could end the process by a signal.
+// A later write of the C library could end the process by a signal.
 void flushBeforeTheEnd() {
   isProcessEnding = true;
   flush();
 }
 
-// A parent may end without what is in its buffer.
+// A forked child would write the same text again, and the parent may end without it.
 void flushBeforeFork() {
   flush();
 }
@@ -107,7 +107,7 @@ class StandardStream : public StandardOutput {
   }
 
  private:
-  // Most texts do, and cost no system call.
+  // Most texts fit, and cost no system call.
   bool staysInBuffer(std::size_t size) const {
     return !::__flbf(stream_) && ::__fpending(stream_) + size < ::__fbufsize(stream_) &&
            !isProcessEnding.load(std::memory_order_relaxed);
@@ -116,7 +116,7 @@ class StandardStream : public StandardOutput {
   std::FILE* stream_;
 };
 
-// A host that prints nothing here keeps its standard output for itself.
+// A host that never prints here keeps its standard output to itself.
 class BufferedStandardOutput final : public StandardStream {
  public:
   BufferedStandardOutput() : StandardStream(stdout) {}

@@ -27,9 +27,9 @@ std::int64_t secondsOf(Date date) {
   return std::chrono::floor<std::chrono::seconds>(date).time_since_epoch().count();
 }
 
-// GLib reads two rules otherwise than the C library does: days of the year that do not count the
-// leap day ("J60"), which no zone has, and from 2038 on a winter that is the exception, which
-// Dublin has.
+// GLib reads two kinds of rules differently from the C library: days of the year without the leap
+// day ("J60"), which no zone uses, and, from 2038 on, zones whose winter time is the exception, as
+// in Dublin.
 class GLibTimeZone final : public TimeZone {
  public:
   explicit GLibTimeZone(ZoneHandle zone) : zone_(std::move(zone)) {}
@@ -67,20 +67,20 @@ fs::path folderOfZones() {
 
 std::optional<std::string> contentOf(const fs::path& file) {
   std::error_code failure;
-  // What is no plain file may block whoever opens it.
+  // Opening anything but a plain file may block.
   if (!fs::is_regular_file(file, failure)) return std::nullopt;
   std::ostringstream content;
   content << std::ifstream(file, std::ios::binary).rdbuf();
   return std::move(content).str();
 }
 
-// Null for what names no zone. Names stand below the system's folder of zones; a path may lead to
-// a zone of the user's own.
+// Null for a text that names no zone. Names are looked up in the system's folder of zones; a path
+// may lead to the user's own zone file.
 ZoneHandle loadZone(const std::string& identifier) {
   if (identifier.empty()) return {};
   const auto content = contentOf(folderOfZones() / identifier);
   const bool isPath = identifier.starts_with('/') || identifier.find("..") != std::string::npos;
-  // Without a file it may be a rule.
+  // Without a file the text may be a rule.
   if (content ? !isWholeZoneFile(*content) : isPath) return {};
   return ZoneHandle(g_time_zone_new_identifier(identifier.c_str()));
 }

@@ -6,8 +6,8 @@
 
 namespace Varnel::Platform::Linux {
 
-/// The folders of the desktop's base-directory convention. The environment may move them, by
-/// absolute paths alone; they need not exist.
+/// The folders of the desktop's base-directory convention. The environment may move them, but only
+/// to absolute paths. They need not exist.
 [[nodiscard]] std::filesystem::path userDataFolder();
 [[nodiscard]] std::filesystem::path userConfigurationFolder();
 [[nodiscard]] std::filesystem::path userStateFolder();

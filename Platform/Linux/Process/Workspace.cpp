@@ -44,8 +44,7 @@ std::optional<fs::path> find(const std::string& program) {
   return failed ? fs::path(found.get()) : resolved;
 }
 
-// Absent for an entry that hides the application, or tells by the program that it says to try that
-// it is not there.
+// Absent for an entry that hides the application, or whose "TryExec" program is missing.
 std::optional<fs::path> executableOf(const DesktopEntry& entry) {
   if (textIn(entry, G_KEY_FILE_DESKTOP_KEY_TYPE) != G_KEY_FILE_DESKTOP_TYPE_APPLICATION)
     return std::nullopt;
@@ -62,7 +61,8 @@ std::optional<fs::path> executableOf(const DesktopEntry& entry) {
 class DesktopEntries final : public Workspace {
  public:
   std::optional<URL> applicationURL(const std::string& bundleIdentifier) override {
-    // An identifier is one file name; a separator would leave the folder of desktop entries.
+    // An identifier must be one file name. With a separator, it could lead out of the folder of
+    // desktop entries.
     if (bundleIdentifier.empty() || bundleIdentifier.find('/') != std::string::npos)
       return std::nullopt;
     const DesktopEntry entry = entryOf(bundleIdentifier);

@@ -15,8 +15,8 @@ std::uint64_t byteAt(std::string_view bytes, std::size_t position) {
   return static_cast<unsigned char>(bytes[position]);
 }
 
-// A header and what it counts. Of the two that a file has, the first is for readers that know only
-// times of 32 bits.
+// A header and the data that it counts. A file has two blocks; the first is for readers that know
+// only times of 32 bits.
 class Block final {
  public:
   Block(std::string_view bytes, std::size_t timeSize)

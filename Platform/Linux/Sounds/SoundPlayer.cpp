@@ -19,8 +19,8 @@ namespace {
 
 constexpr const char* module = "libvarnel-gstreamer.so";
 
-// What became of loading the module, which the player's thread does. It tells the log once. Any
-// thread.
+// The outcome of loading the module, which the player's thread does. Reports a failure to the log
+// once. Any thread.
 class Loading final {
  public:
   explicit Loading(SystemLog& systemLog) : systemLog_(systemLog) {}
@@ -45,7 +45,7 @@ class Loading final {
   }
 
   std::optional<std::string> problem() const {
-    // It may be installed meanwhile.
+    // The module may be installed meanwhile.
     if (!POSIX::hasModule(module)) return described(POSIX::moduleIsMissing);
     const std::lock_guard lock(mutex_);
     return failure_;
@@ -62,7 +62,7 @@ class Loading final {
   std::optional<std::string> failure_;
 };
 
-// Plays by what is in the module. Without the module nothing can be loaded.
+// Plays with the module's output. Without the module nothing can be loaded.
 class ModuleSoundPlayer final : public SoundPlayer {
  public:
   ModuleSoundPlayer(SystemLog& systemLog, MainQueue& mainQueue)

@@ -6,7 +6,8 @@
 namespace Varnel {
 namespace {
 
-// As a literal in source code, so that an entry stays one line and a text shows where it ends.
+// Written as a literal in source code, so that an entry stays on one line and the ends of a text
+// show.
 std::string literal(std::string_view text) {
   std::string out = "\"";
   for (const char c : text) {

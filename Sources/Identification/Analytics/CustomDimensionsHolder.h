@@ -15,9 +15,9 @@ namespace Varnel {
 ///
 ///     CustomDimensionsHolder::setLaunchCount(settings.launches());
 ///
-/// Identifier and download source are found at their first reading unless set before, which reads
-/// files and may wait for a program. Meanwhile the other values can be read, and all of them set.
-/// Any thread.
+/// Identifier and download source are found when they are first read, unless they were set before.
+/// Finding them reads files and may wait for a program; meanwhile the other values can be read, and
+/// all values can be set. Any thread.
 class VARNEL_API CustomDimensionsHolder final {
  public:
   CustomDimensionsHolder() = delete;

@@ -11,9 +11,10 @@ namespace Varnel {
 ///
 ///     std::string name() { return name_.get([] { return findName(); }); }
 ///
-/// Any thread. Who reads it first looks, however long that takes, and others that need the value
-/// wait. Setting it never waits, and what was set meanwhile wins over what was found. `find` must
-/// not read the value itself; what it throws reaches the reader, and the next one looks again.
+/// Any thread. The first reader looks for the value, however long that takes; other readers wait.
+/// Setting it never waits, and a value that was set meanwhile wins over the one that was found.
+/// `find` must not read the value itself. Its exception reaches the reader, and the next reader
+/// looks again.
 template <typename Value>
 class FoundValue final {
  public:
@@ -39,7 +40,7 @@ class FoundValue final {
     return value_;
   }
 
-  std::mutex findMutex_;  ///< Held by the one that looks. Taken before `mutex_`.
+  std::mutex findMutex_;  ///< Held by the thread that looks. Taken before `mutex_`.
   std::mutex mutex_;      ///< Owns the value.
   std::optional<Value> value_;
 };

@@ -9,7 +9,7 @@
 namespace Varnel {
 
 /// Where the redirect service is reached, and which product asks. Plain texts that may be changed
-/// at any time; whoever shares one between threads guards it.
+/// at any time. Not safe to share between threads without a lock.
 class VARNEL_API TDSConfiguration final {
  public:
   TDSConfiguration(std::string scheme, std::string host, std::string path, std::string productName,

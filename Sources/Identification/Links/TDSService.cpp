@@ -78,7 +78,7 @@ TDSService::QueryItems TDSService::defaultParams() const {
 std::optional<URL> TDSService::prepareUrl(const URL& url) const {
   const QueryItems items = defaultParams();
   if (items.empty()) return url;
-  // Its own items are not decoded and encoded again: their bytes are the page's affair.
+  // The URL's own items are not decoded and encoded again, because only the page knows their form.
   std::string query(url.components().query.value_or(""));
   if (!query.empty()) query += '&';
   return url.withQuery(query += Platform::encodedURLQuery(items));

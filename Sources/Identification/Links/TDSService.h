@@ -34,7 +34,8 @@ class TDSServiceValidator;
 ///     http://links.quennel.example/index.php?ov2&product=Orvane&version=…&coupon=spring&action=buy
 ///
 /// One thread at a time. Each call reads the system's facts anew and asks the identificator, which
-/// may wait: keep it off the main thread where that matters. What makes no URL gives none.
+/// may wait: keep it off the main thread where that matters. Parts that make no URL give an absent
+/// one.
 class VARNEL_API TDSService final {
  public:
   struct Ports {

@@ -7,7 +7,7 @@
 
 namespace Varnel {
 
-/// Whoever knows the one identifier by which links and analytics recognise this installation.
+/// Supplies the one identifier by which links and analytics recognise this installation.
 class VARNEL_API Identificator {
  public:
   virtual ~Identificator() = default;

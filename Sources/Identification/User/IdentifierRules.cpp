@@ -17,7 +17,7 @@ bool continuesCharacter(char byte) {
   return (static_cast<unsigned char>(byte) & 0xC0) == 0x80;
 }
 
-// What follows the first `count` characters of a text in UTF-8.
+// The part of a UTF-8 text after its first `count` characters.
 std::string_view withoutFirstCharacters(std::string_view text, int count) {
   for (; count > 0 && !text.empty(); --count) {
     text.remove_prefix(1);

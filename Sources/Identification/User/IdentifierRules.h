@@ -11,8 +11,9 @@
 
 namespace Varnel {
 
-/// The digest of "UUID name" in lower-case hexadecimal, "(null)" standing for a UUID that is not
-/// there; "(null)" where the text is not UTF-8. It must never change: servers know users by it.
+/// The digest of "UUID name" in lower-case hexadecimal, with "(null)" in the place of a missing
+/// UUID. The result is "(null)" when the text is not UTF-8. It must never change: servers know
+/// users by it.
 [[nodiscard]] std::string userIdentifierOf(const std::optional<std::string>& machineUUID,
                                            const std::string& loginName);
 
@@ -25,7 +26,7 @@ namespace Varnel {
 [[nodiscard]] std::optional<std::string> campaignOf(std::string_view url);
 
 /// The client id in the first "_ga" cookie of exactly this domain: what follows the six characters
-/// of version and depth ("GA1.2."). Absent when nothing does, or the value is not UTF-8.
+/// of version and depth ("GA1.2."). Absent when nothing follows, or the value is not UTF-8.
 [[nodiscard]] std::optional<std::string> clientIdentifierIn(
     const std::vector<Platform::Cookie>& cookies, std::string_view domain);
 

@@ -10,8 +10,8 @@
 
 namespace Varnel {
 
-/// Asks another provider only once where the application was downloaded from, which runs a program
-/// and reads a database each time, and for all else each time.
+/// Finds the application's download once and keeps it, because finding it runs a program and reads
+/// a database. All other questions go to another provider each time.
 ///
 ///     auto user = std::make_shared<KeptDownloadSource>(std::make_shared<UserIdentificator>());
 ///     show(user->downloadSourceURLString());                        // finds it

@@ -8,8 +8,8 @@
 
 namespace Varnel {
 
-/// Where the facts come from that tell one installation from another. A fact that the machine does
-/// not give is absent; `userIdentifier()` alone always has a text. Threads as the implementation's.
+/// Supplies the facts that tell one installation from another. A fact that the machine does not
+/// give is absent; `userIdentifier()` alone always has a text. Threads as the implementation's.
 class VARNEL_API UserIdentificationProvider {
  public:
   virtual ~UserIdentificationProvider() = default;
@@ -18,7 +18,7 @@ class VARNEL_API UserIdentificationProvider {
   [[nodiscard]] virtual std::optional<std::string> serialNumber() const = 0;
   /// Stable for one user of one machine.
   [[nodiscard]] virtual std::string userIdentifier() const = 0;
-  /// Of the primary network interface, as in "00:1b:63:84:45:e6".
+  /// The address of the primary network interface, as in "00:1b:63:84:45:e6".
   [[nodiscard]] virtual std::optional<std::string> primaryMacAddress() const = 0;
   /// The "cid" item of the download's URL.
   [[nodiscard]] virtual std::optional<std::string> downloadSourceURLCid() const = 0;

@@ -24,11 +24,11 @@ namespace Varnel {
 ///     identificator.downloadSourceURLCid(); // the campaign, if the download's URL names one
 ///
 /// Machine UUID, serial number and user identifier are computed once, or assigned; the others are
-/// found anew at each reading, and those of the download block for as long as the tracker takes.
-/// One thread at a time. Nothing fails or is logged: what cannot be found is absent.
+/// found anew at each reading. Those of the download block for as long as the tracker takes. One
+/// thread at a time. Nothing fails or is logged: a fact that cannot be found is absent.
 class VARNEL_API UserIdentificator final : public UserIdentificationProvider {
  public:
-  /// What the object asks of the system; outlives it.
+  /// The services that the object asks; they outlive it.
   struct Ports {
     Platform::CookieStorage& cookieStorage;
     Platform::MachineIdentity& machineIdentity;

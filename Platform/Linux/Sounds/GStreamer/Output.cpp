@@ -12,8 +12,8 @@ using Bytes = UniqueHandle<GBytes*, g_bytes_unref>;
 using Element = UniqueHandle<GstElement*, gst_object_unref>;
 
 bool fill(GstBin* pipeline, const std::string& bytes, const SinkMaker& makeSink) {
-  // The source pushes: parsers that pull for themselves may outrun the decoder's set-up, and their
-  // sound would never end.
+  // The source pushes. Parsers that pull may outrun the decoder's set-up, and their sound would
+  // never end.
   GError* missing = nullptr;
   GstElement* made = gst_parse_bin_from_description_full(
       "appsrc name=source ! decodebin ! audioconvert ! audioresample name=last", FALSE, nullptr,
@@ -37,7 +37,7 @@ bool fill(GstBin* pipeline, const std::string& bytes, const SinkMaker& makeSink)
   return taken == GST_FLOW_OK;
 }
 
-// On the thread of the pipeline that has something to say.
+// Runs on the thread of the pipeline that sent the message.
 GstBusSyncReply heard(GstBus*, GstMessage* message, gpointer ended) noexcept {
   const GstMessageType type = GST_MESSAGE_TYPE(message);
   if (type == GST_MESSAGE_EOS || type == GST_MESSAGE_ERROR)

@@ -17,7 +17,7 @@ using SinkMaker = std::function<GstElement*()>;
 
 /// Plays the sounds that the machine's decoders know, from memory, into elements of `makeSink`.
 ///
-/// The thread that starts a sound may be changed by what plays it: some sinks block SIGPIPE on it.
+/// The sink may change the thread that starts a sound: some sinks block SIGPIPE on it.
 class Output final : public SoundOutput {
  public:
   explicit Output(SinkMaker makeSink) : makeSink_(std::move(makeSink)) {}
