@@ -14,6 +14,7 @@ using Platform::PropertyList;
 static_assert(Basalt::JSONConvertable<UserFeatures>);
 static_assert(Basalt::JSONConvertable<UserFeaturesBox>);
 static_assert(!std::is_default_constructible_v<UserFeaturesBox>);
+static_assert(!std::is_convertible_v<Basalt::JSON, UserFeatures>);
 
 TEST(UserFeatures, HasThePublishedBitsAndNames) {
   const struct {

@@ -21,6 +21,7 @@ using Box = SchedulePeriodOptionBox;
 static_assert(Basalt::JSONObjectConvertable<Option>);
 static_assert(Basalt::JSONConvertable<Box>);
 static_assert(!std::is_default_constructible_v<Box>);
+static_assert(!std::is_convertible_v<Basalt::JSON, Option>, "what may throw is asked for by name");
 
 const Option productDefault = QNIsMarkettaVersion() ? Option::never : Option::onceInTwoWeeks;
 
