@@ -145,6 +145,9 @@ TEST(WatchedMainQueue, SaysOnceThatNobodyRunsIt) {
     healthy.post([] {});
     EXPECT_TRUE(healthy.drain());
     healthy.post([] {});
+    // One that goes before it has run keeps nobody waiting.
+    WatchedMainQueue(std::make_unique<Testing::FakeMainQueue>(), log, std::chrono::minutes(10))
+        .post([] {});
   }
   EXPECT_EQ(log.text(), "");
 

@@ -355,7 +355,7 @@ TEST_F(DiskAccessManagerTest, ADiskThatGoesIsRememberedForAThreadThatIsBeingWoke
   volumes_.mount(stick);
   awaitInventory();
   EXPECT_EQ(accessCount(*woken->diskData()), 1u);
-  EXPECT_FALSE(begin(stickFile, 0)) << "its only place is taken";
+  std::thread([&] { EXPECT_FALSE(begin(stickFile, 0)) << "its only place is taken"; }).join();
 }
 
 TEST_F(DiskAccessManagerTest, AStormOfMountsCostsOneInventoryAndLosesNone) {
@@ -539,6 +539,19 @@ TEST_F(DiskAccessManagerTest, MayGoWhileSessionsAreLeft) {
   volumes_.announce({.kind = Platform::VolumeChange::Kind::mounted, .volumeURL = stickVolume});
   left->endAccessing();
   EXPECT_EQ(accessCount(*left->diskData()), 0u);
+
+  // On the planning queue itself it leaves an inventory behind, for which nothing is there any
+  // more.
+  manager_.emplace(DiskAccessManager::Ports{devices_, disks_, volumes_, scope_, center_});
+  awaitInventory();
+  Basalt::SerialQueue& queue = DiskAccessGuard(begin(homeFile))->diskData()->queue();
+  const int inventories = disks_.openedSessions();
+  queue.sync([&] {
+    center_.post({.name = std::string(didMountNotification), .userInfo = {}});
+    manager_.reset();
+  });
+  queue.sync([] {});
+  EXPECT_EQ(disks_.openedSessions(), inventories);
 }
 
 }  // namespace

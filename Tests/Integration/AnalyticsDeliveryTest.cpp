@@ -364,8 +364,9 @@ TEST(HTTPClient, GoesThroughAProxyButNotToThisMachine) {
   EXPECT_EQ(statusOf("https://other.example"), 0) << "a certificate for another host";
   EXPECT_EQ(statusOf("https://collect.example:444"), 0) << "refused";
   EXPECT_EQ(statusOf("https://collect.example:445"), 0) << "led nowhere";
-  EXPECT_EQ(statusOf("http://127.0.0.1.example"), 202);
-  for (const char* behaviour : {"tunnel", "201", "tunnel", "403", "blind tunnel", "202"})
+  for (const char* url : {"http://127.0.0.1.example", "http://notlocalhost"})
+    EXPECT_EQ(statusOf(url), 202) << url;
+  for (const char* behaviour : {"tunnel", "201", "tunnel", "403", "blind tunnel", "202", "202"})
     EXPECT_EQ(proxy.next().behaviour, behaviour);
 }
 

@@ -5,6 +5,7 @@
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
+#include <fstream>
 #include <latch>
 #include <string>
 #include <string_view>
@@ -43,7 +44,12 @@ void printForNobody() {
 void logInChild(const std::string& author) {
   const pid_t child = ::fork();
   if (child == 0) {
-    Varnel::Logger::instance().log("child", author);
+    Varnel::Logger& logger = Varnel::Logger::instance();
+    logger.log("child", author);
+    // The child writes while it lives, not only when it ends.
+    for (std::string text; text.find("child") == std::string::npos; std::this_thread::yield())
+      std::getline(std::ifstream(logger.logFileURL()->path()), text, '\0');
+    logger.log("grown", author);
     std::exit(EXIT_SUCCESS);
   }
   ::waitpid(child, nullptr, 0);
@@ -86,6 +92,6 @@ int main(int argc, char** argv) {
   if (ending == "forked-in-between") logInChildWithTheStreamHeld(author);
   if (ending == "killed") std::raise(SIGKILL);
   if (ending == "quick-exit") std::quick_exit(EXIT_SUCCESS);
-  if (ending == "late-entry") logsAtTheVeryEnd.author = author;
+  if (ending == "late-entry" || ending == "without-reader") logsAtTheVeryEnd.author = author;
   return EXIT_SUCCESS;
 }

@@ -3,11 +3,13 @@
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <sys/syscall.h>
 
 #include <atomic>
 #include <semaphore>
 #include <vector>
 
+#include <Tests/Support/ForbiddenCalls.h>
 #include <Varnel/Platform/Generic/SoundKind.h>
 #include <Varnel/Platform/Testing/FakeMainQueue.h>
 
@@ -85,17 +87,21 @@ TEST_F(BackgroundSoundPlayerTest, ASoundEndsOnceAndMayBePlayedAgain) {
 TEST_F(BackgroundSoundPlayerTest, AStopBeforeTheStartCancelsIt) {
   const auto first = load();
   const auto second = load();
+  auto dropped = load();
   first->play();
   // Waits behind the first, which has not started yet.
   second->play();
   EXPECT_TRUE(second->isPlaying());
   second->stop();
   EXPECT_FALSE(second->isPlaying());
-  machine.mayStart.release(2);
+  dropped->play();
+  dropped.reset();
+  machine.mayStart.release(3);
+  machine.started.acquire();
   first->stop();
   player.reset();
   queue.drain();
-  EXPECT_LE(machine.ends.size(), 1u);
+  EXPECT_EQ(machine.ends.size(), 1u);
   EXPECT_THAT(listener->ends, IsEmpty());
 }
 
@@ -120,13 +126,18 @@ TEST_F(BackgroundSoundPlayerTest, WhatCannotBePlayedEndsOnTheMainQueue) {
   const auto unheard = mute.load(file);
   unheard->setDelegate(listener);
   const auto damaged = load(file + "?");
+  BackgroundSoundPlayer another(queue, [] { return nullptr; });
+  const auto threadless = another.load(file);
+  threadless->setDelegate(listener);
   machine.mayStart.release();
-  for (const auto& sound : {unheard, damaged}) {
+  const auto expectFailure = [&](PlayableSound& sound) {
     listener->ends.clear();
-    sound->play();
-    queue.runWhile([&] { return sound->isPlaying(); });
+    sound.play();
+    queue.runWhile([&] { return sound.isPlaying(); });
     EXPECT_THAT(listener->ends, ElementsAre(false));
-  }
+  };
+  for (const auto& sound : {unheard, damaged}) expectFailure(*sound);
+  Tests::onAKernelThatForbids({SYS_clone, SYS_clone3}, EAGAIN, [&] { expectFailure(*threadless); });
 }
 
 TEST(SoundKind, IsToldByTheFirstBytes) {

@@ -157,11 +157,6 @@ TEST(ErrorBridging, KeepsTheCodeOfAnExceptionThatHasOne) {
             "Varnel.ThrownError");
 }
 
-TEST(GenericError, BridgesToItsDomain) {
-  EXPECT_EQ(GenericError::fallback.platformError().domain(), "Varnel.GenericError");
-  EXPECT_EQ(GenericError::fallback.platformError().code(), 0);
-}
-
 TEST(UserErrorType, HasAnErrorForTheUserOnlyWithTexts) {
   EXPECT_EQ(ScanError().userError(), std::nullopt);
 

@@ -2,11 +2,13 @@
 #include <Varnel/Logging/LogFileChannel.h>
 
 #include <gtest/gtest.h>
+#include <sys/syscall.h>
 
 #include <filesystem>
 #include <fstream>
 #include <thread>
 
+#include <Tests/Support/ForbiddenCalls.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Platform/Testing/FakeAppendFiles.h>
 
@@ -93,6 +95,14 @@ TEST_F(LogFileChannelTest, ReportsAFullDiskOnceForEachEntryAndGoesOn) {
   const std::string report = "Did fail to write log to file with error No space left on device\n";
   EXPECT_EQ(output.text(), report + report);
   EXPECT_EQ(text(), "kept\n");
+}
+
+TEST_F(LogFileChannelTest, WritesAtOnceInAProcessThatMayHaveNoMoreThreads) {
+  Tests::onAKernelThatForbids({SYS_clone, SYS_clone3}, EAGAIN, [&] {
+    LogFileChannel channel(files, output, "/log", {.interval = longTime});
+    channel.append("entry\n");
+    EXPECT_EQ(text(), "entry\n");
+  });
 }
 
 TEST_F(LogFileChannelTest, WritesThroughOnceItIsTold) {

@@ -31,6 +31,9 @@ TEST(Calendar, EachRepetitionIsCountedFromTheOriginalDate) {
   EXPECT_EQ(nth(2), utc(2026y / March / 31, 9h + 5min));
   EXPECT_EQ(nth(25), utc(2028y / February / 29, 9h + 5min));
   EXPECT_EQ(calendar.adding({.year = 1}, utc(2024y / February / 29)), utc(2025y / February / 28));
+  EXPECT_EQ(calendar.adding(month, utc(1969y / March / 1) - 1us), utc(1969y / March / 29) - 1us);
+  EXPECT_EQ(calendar.adding({.day = 1, .hour = 2, .minute = 3, .second = 4}, last, 3),
+            last + days(3) + 6h + 9min + 12s);
 }
 
 TEST(Calendar, KeepsTheWallClockOverBothChangesOfTheClocks) {
@@ -68,8 +71,8 @@ TEST(Calendar, CountsInTheCalendarOfTheLocale) {
 
 TEST(Calendar, MovesAWallClockTimeIntoAnotherZone) {
   const Calendar newYork("en_US", "America/New_York", zones);
-  EXPECT_EQ(newYork.withWallClockOf(utc(2026y / July / 1, 7h), "Europe/Berlin"),
-            utc(2026y / July / 1, 13h));
+  EXPECT_EQ(newYork.withWallClockOf(utc(2026y / July / 1, 7h) + 123456us, "Europe/Berlin"),
+            utc(2026y / July / 1, 13h) + 123456us);
   EXPECT_EQ(newYork.withWallClockOf(utc(2026y / July / 1, 7h), "No/Such_Zone"),
             utc(2026y / July / 1, 11h));
 }
@@ -82,7 +85,9 @@ TEST(Calendar, AnswersNothingBeyondWhatItCanCount) {
   EXPECT_EQ(calendar.adding({.day = 2}, now, huge), std::nullopt);
   EXPECT_EQ(calendar.adding({.hour = huge}, now), std::nullopt);
   EXPECT_EQ(calendar.adding({.year = 2'000'000'000}, now), std::nullopt);
-  EXPECT_TRUE(calendar.adding({.year = 280'000}, now));
+  const auto late = calendar.adding({.year = 280'000}, now);
+  ASSERT_TRUE(late);
+  EXPECT_EQ(calendar.adding({.hour = 2'000'000'000}, *late), std::nullopt);
   EXPECT_EQ(calendar.adding({.year = 1}, Date::max()), std::nullopt);
   for (const Date edge : {Date::min(), Date::max()}) {
     EXPECT_EQ(calendar.withWallClockOf(edge, "UTC"), std::nullopt);

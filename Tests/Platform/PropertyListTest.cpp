@@ -100,13 +100,23 @@ TEST(PropertyList, ReadsTheBinaryForm) {
   for (std::uint64_t reference = 1; reference <= 8; ++reference)
     dictionary += bigEndian(reference, 2);
   const std::string number = "\x13" + bigEndian(static_cast<std::uint64_t>(-7), 8);
-  const std::string bytes = binaryList({dictionary, "Qa", "Qb", "Qc", "Qd", number,
-                                        "\x62\xD8\x3D\xDE\x00"s, "\x80\x05", binaryArray({6, 6})});
-  const PropertyDictionary expected{
-      {"a", std::int64_t{-7}}, {"b", "😀"}, {"c", std::int64_t{5}}, {"d", PropertyList{"😀", "😀"}}};
+  const std::string bytes =
+      binaryList({dictionary, "Qa", "Qb", "Qc", "Qd", number, "\x63\x00g\xD8\x3D\xDE\x00"s,
+                  "\x80\x05", binaryArray({6, 6})});
+  const PropertyDictionary expected{{"a", std::int64_t{-7}},
+                                    {"b", "g😀"},
+                                    {"c", std::int64_t{5}},
+                                    {"d", PropertyList{"g😀", "g😀"}}};
   EXPECT_EQ(parsePropertyList(bytes), PropertyValue(expected));
   for (std::size_t size = 0; size < bytes.size(); ++size)
     EXPECT_EQ(parsePropertyList(std::string_view(bytes).substr(0, size)), std::nullopt) << size;
+  // Any byte may be wrong, those of the table of offsets and of the trailer too.
+  for (std::size_t index = 0; index < bytes.size(); ++index)
+    for (const char wrong : {'\x00', '\x01', '\x7F', '\x80', '\xFF'}) {
+      std::string damaged = bytes;
+      damaged[index] = wrong;
+      EXPECT_NO_THROW((void)parsePropertyList(damaged)) << index;
+    }
 }
 
 TEST(PropertyList, TakesExtremeScalarsAsFarAsTheyHaveACounterpart) {
@@ -184,8 +194,8 @@ TEST(PropertyList, RefusesNumbersAndDatesThatAreNone) {
       {"date",
        {"", "hello", "2024-02-29", "2024-02-30T00:00:00Z", "2023-02-29T00:00:00Z",
         "2024-13-01T00:00:00Z", "2024-02-29T24:00:00Z", "2024-02-29T12:60:00Z",
-        "2024-02-29T12:00:00", "2024-02-29T12:00:00Zx", "2024-02-29T12:00:00+01:00",
-        "2024-02-29 12:00:00Z", " 2024-02-29T12:00:00Z"}},
+        "2024-02-29T12:00:60Z", "2024-02-29T12:00:00", "2024-02-29T12:00:00Zx",
+        "2024-02-29T12:00:00+01:00", "2024-02-29 12:00:00Z", " 2024-02-29T12:00:00Z"}},
   };
   for (const auto& [element, texts] : rows) {
     EXPECT_EQ(parsedElement("<" + std::string(element) + "/>"), std::nullopt) << element;
@@ -237,6 +247,8 @@ TEST(PropertyList, RefusesAbsurdNesting) {
     EXPECT_TRUE(parsePropertyList(nested("<array>", "</array>", 512)).has_value());
     EXPECT_TRUE(parsePropertyList(nested("<dict><key>a</key>", "</dict>", 512)).has_value());
     EXPECT_EQ(parsePropertyList(nested("<array>", "</array>", 513)), std::nullopt);
+    EXPECT_TRUE(parsedElement("<array>" + repeated("<array/><dict/>", 513) + "</array>"))
+        << "one beside the other";
     for (const char* opening : {
              "<array>",
              "<dict><key>a</key>",

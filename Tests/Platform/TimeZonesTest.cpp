@@ -163,6 +163,8 @@ TEST(TimeZones, TakeEveryFormOfTheVariableAndAnythingElseForUTC) {
   for (const Date edge : {Date::min(), Date::max()}) EXPECT_LT(berlin->offsetAt(edge).fromUTC, 24h);
   EXPECT_GT(berlin->nextChange(Date::min()), sys_days(1800y / January / 1));
   EXPECT_EQ(berlin->nextChange(Date::max()), std::nullopt);
+  const Date change = *berlin->nextChange(sys_days(1949y / January / 1));
+  EXPECT_NE(berlin->offsetAt(change - 1us).fromUTC, berlin->offsetAt(change).fromUTC);
 }
 
 TEST(TimeZones, ADamagedFileIsNoZone) {

@@ -50,6 +50,7 @@ TEST(TypeName, IsFoundInWhateverTheRuntimeWrites) {
       {"ImportFailure", "", "ImportFailure"},
       {"Ünicöde::Fehler", "Ünicöde", "Fehler"},
       {"std::ios_base::failure[abi:cxx11]", "std", "failure"},
+      {"Host::Failure[abi:a][abi:b]", "Host", "Failure"},
       {"std::_Nested_exception<Host::Of<int> >", "Host", "Of<int>"},
       {"std::_Nested_exception<Host::Failure const>", "Host", "Failure"},
       {"std::__1::__nested<main::Local>", "", "Local"},

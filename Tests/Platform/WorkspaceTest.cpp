@@ -33,11 +33,13 @@ TEST(Workspace, FindsTheProgramOfACommandLine) {
       {R"(env -S "-u A B=1 'My App'" x)", "My App"},
       {R"(env --split-string="env -i A=%%" app)", "app"},
       {"env A=1 env B=2 app", "app"},
+      {"env --uns LANG --split='-i app'", "app"},
       {"environment", "environment"},
       {"", {}},
       {"   ", {}},
       {"%U", {}},
       {R"("")", {}},
+      {R"("" app)", {}},
       {R"("/opt/app)", {}},
       {"app %x", {}},
       {"app 100%", {}},
@@ -64,6 +66,7 @@ TEST(Workspace, AnApplicationIsWhereItsDesktopEntryLeads) {
   const std::string onPath = program("bin/velt");
   const std::string bundled = program("Velt.app/velt");
   folder.write("Velt.app/Info.plist", "");
+  fs::create_symlink(bundled, folder.path() / "bin/linked");
   ::setenv("XDG_DATA_HOME", (folder.path() / "user").c_str(), 1);
   ::setenv("XDG_DATA_DIRS", (folder.path() / "system").c_str(), 1);
   ::setenv("PATH", (folder.path() / "bin").c_str(), 1);
@@ -73,6 +76,7 @@ TEST(Workspace, AnApplicationIsWhereItsDesktopEntryLeads) {
   // One backslash of a path takes four: the text's escape, and the quotation's.
   entry(apps + "quoted", "Exec=\"" + root + R"(/My \\"\\$Apps/50%% off/velt" --open %U)" + "\n");
   entry(apps + "env", "Exec=env LANG=C \"" + bundled + "\" %F\n");
+  entry(apps + "linked", "Exec=linked\n");
   entry(apps + "name", "Exec=velt\nTryExec=" + onPath + "\n");
   entry(apps + "com.quennel.Velt/dash", "Exec=velt\n");
   entry(apps + "hidden", "Exec=velt\n");
@@ -89,6 +93,7 @@ TEST(Workspace, AnApplicationIsWhereItsDesktopEntryLeads) {
     Text path;
   } cases[] = {{"quoted", quoted},
                {"env", root + "/Velt.app"},
+               {"linked", root + "/Velt.app"},
                {"name", onPath},
                {"com.quennel.Velt-dash", onPath},
                {"hidden", {}},
