@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: MIT
+#include <cstdlib>
 #include <fstream>
 #include <vector>
 
@@ -49,6 +50,9 @@ std::vector<std::string> lastEntries(std::size_t count) {
 }
 
 TEST(Module, LogsOnceThatItIsThereHoweverItIsMade) {
+  // A log of its own: other tests run at the same time.
+  const Tests::TemporaryFolder home;
+  ASSERT_EQ(::setenv("HOME", home.path().c_str(), 1), 0);
   Logger::instance().log("begin", "Test");
   const auto report = makeModule<ReportModule>(Bundle(std::nullopt, {}));
   const VarnelModule direct;
