@@ -81,6 +81,21 @@ class DiskAccessManagerTest : public ::testing::Test {
     if (const auto session = begin(homeFile)) session->endAccessing();
   }
 
+  void mount(const Platform::MountedVolume& volume) {
+    volumes_.mount(volume);
+    awaitInventory();
+  }
+  void mount(const URL& volume) {
+    mount({.url = volume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  }
+  void mountStick() {
+    mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
+  }
+  void unmount(const URL& volume) {
+    volumes_.unmount(volume);
+    awaitInventory();
+  }
+
   Session begin(const URL& file, std::optional<double> timeout = {}, QoS qos = QoS::utility) {
     return manager_->beginAccessingURL(file, "test", qos, true, timeout);
   }
@@ -178,8 +193,7 @@ TEST_F(DiskAccessManagerTest, OpensASecurityScopeOnlyWhenAskedAndOnAVolume) {
 }
 
 TEST_F(DiskAccessManagerTest, ASessionThatIsDroppedKeepsItsPlaceAndItsScope) {
-  volumes_.mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
-  awaitInventory();
+  mountStick();
   std::shared_ptr<DiskData> disk;
   std::thread([&] { disk = begin(stickFile)->diskData(); }).join();
   EXPECT_EQ(accessCount(*disk), 1u);
@@ -187,21 +201,18 @@ TEST_F(DiskAccessManagerTest, ASessionThatIsDroppedKeepsItsPlaceAndItsScope) {
   for (const double timeout : {0.0, -1.0, 0.001}) EXPECT_FALSE(begin(stickFile, timeout));
   EXPECT_EQ(scope_.openAccesses(stickFile), 4) << "a time-out leaves its scope open";
 
-  volumes_.unmount(stickVolume);
-  awaitInventory();
+  unmount(stickVolume);
   const Session gone =
       manager_->beginAccessingURL(stickFile, "test", QoS::utility, false, 0, stickVolume);
   ASSERT_TRUE(gone);
   EXPECT_EQ(gone->diskInfo()->uniqueID(), "unknown");
   gone->endAccessing();
-  volumes_.mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
-  awaitInventory();
+  mountStick();
   EXPECT_FALSE(begin(stickFile, 0)) << "the place is still taken when the disk returns";
 }
 
 TEST_F(DiskAccessManagerTest, SessionsOfOneThreadNestAndCountEach) {
-  volumes_.mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
-  awaitInventory();
+  mountStick();
   const Session outer = begin(stickFile);
   const Session inner = begin(stickFile);
   outer->endAccessing();
@@ -267,8 +278,7 @@ TEST_F(DiskAccessManagerTest, TheRelayTellsWhichVolumeCameOrWent) {
 TEST_F(DiskAccessManagerTest, AThreadThatHoldsADiskUsesItWhateverTheLookUpFinds) {
   manager_->setIsBackgroundMode(true);
   disks_.setMountURLs("nvme0n1", {homeVolume, archiveVolume});
-  volumes_.mount({.url = archiveVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
-  awaitInventory();
+  mount(archiveVolume);
   const auto diskOf = [](const Session& session) {
     return session ? session->diskInfo()->uniqueID().value() : "none";
   };
@@ -286,8 +296,7 @@ TEST_F(DiskAccessManagerTest, AThreadThatHoldsADiskUsesItWhateverTheLookUpFinds)
     EXPECT_EQ(diskOf(beginOnBusyQueue(archiveVolume, 0)), "SSD-1") << "the dropped one is left";
   }).join();
   EXPECT_EQ(diskOf(begin(homeFile, 0)), "unknown") << "this disk is full, but that place is held";
-  volumes_.mount({.url = archiveVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
-  awaitInventory();
+  mount(archiveVolume);
   EXPECT_EQ(diskOf(begin(URL::fileURLWithPath("/archive/file"), 0)), "unknown")
       << "it stands for the disk's other volumes too";
 }
@@ -308,8 +317,7 @@ TEST_F(DiskAccessManagerTest, AMountThatAppearsWhileThreadsWaitGetsItsOwnDisk) {
   }
   awaitRequests(*holder->diskData(), 3);
   plugDisk("HDD-1", "sda1", "Rotational", stickVolume);
-  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
-  awaitInventory();
+  mount(stickVolume);
   begin(stickFile)->endAccessing();
   const Session known = begin(stickFile);
   EXPECT_EQ(known->diskInfo()->uniqueID(), "HDD-1");
@@ -321,11 +329,9 @@ TEST_F(DiskAccessManagerTest, AMountThatAppearsWhileThreadsWaitGetsItsOwnDisk) {
   // Its record outlives the disk while somebody is on it, and is new afterwards.
   const std::shared_ptr<DiskData> record = known->diskData();
   disks_.setMountURLs("sda1", {});
-  volumes_.unmount(stickVolume);
-  awaitInventory();
+  unmount(stickVolume);
   disks_.setMountURLs("sda1", {stickVolume});
-  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
-  awaitInventory();
+  mount(stickVolume);
   const Session again = begin(stickFile);
   EXPECT_EQ(again->diskData(), record);
   EXPECT_EQ(accessCount(*record), 2u);
@@ -334,10 +340,7 @@ TEST_F(DiskAccessManagerTest, AMountThatAppearsWhileThreadsWaitGetsItsOwnDisk) {
 }
 
 TEST_F(DiskAccessManagerTest, ADiskThatGoesIsRememberedForAThreadThatIsBeingWoken) {
-  const Platform::MountedVolume stick{
-      .url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"};
-  volumes_.mount(stick);
-  awaitInventory();
+  mountStick();
   Session holder = begin(stickFile);
   DiskData& disk = *holder->diskData();
   Session woken;
@@ -352,8 +355,7 @@ TEST_F(DiskAccessManagerTest, ADiskThatGoesIsRememberedForAThreadThatIsBeingWoke
   });
   waiting.join();
   ASSERT_TRUE(woken);
-  volumes_.mount(stick);
-  awaitInventory();
+  mountStick();
   EXPECT_EQ(accessCount(*woken->diskData()), 1u);
   std::thread([&] { EXPECT_FALSE(begin(stickFile, 0)) << "its only place is taken"; }).join();
 }
@@ -409,8 +411,7 @@ TEST_F(DiskAccessManagerTest, BackgroundModeOffWakesWaitersAndOnWakesNobody) {
   // A disk that comes in background mode starts in it.
   manager_->setIsBackgroundMode(true);
   plugDisk("SSD-2", "nvme1n1", "Solid State", stickVolume);
-  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
-  awaitInventory();
+  mount(stickVolume);
   const DiskAccessGuard access(begin(stickFile));
   std::thread([&] { EXPECT_FALSE(begin(stickFile, 0)); }).join();
 }
@@ -478,9 +479,8 @@ TEST_F(DiskAccessManagerTest, LosesNoPlaceUnderStress) {
 // Threads that nest sessions without a time-out while the planning queue is busy: all come through.
 TEST_F(DiskAccessManagerTest, NestedSessionsNeverWaitForOneAnother) {
   plugDisk("HDD-1", "sda1", "Rotational", stickVolume);
-  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
   manager_->setIsBackgroundMode(true);
-  awaitInventory();
+  mount(stickVolume);
   const auto unknown = beginOnBusyQueue(homeVolume);
   unknown->endAccessing();
   const struct {
