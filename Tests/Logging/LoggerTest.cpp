@@ -31,13 +31,12 @@ class LoggerTest : public Tests::LoggerFixture {
 
 TEST_F(LoggerTest, WritesTagsOnOneLineBelowTheMessage) {
   const URL music = URL::fileURLWithPath("/home/ada/Music/");
-  struct Row {
+  const struct {
     std::string author;
     std::string message;
     LoggingContextTags tags;
     std::string entry;
-  };
-  const Row rows[] = {
+  } rows[] = {
       {"", "", {}, ":  \n"},
       {"Scanner",
        "Did finish",
@@ -52,10 +51,6 @@ TEST_F(LoggerTest, WritesTagsOnOneLineBelowTheMessage) {
            "originally: ScanError, originally: GenericError, underlying error: fallback, "
            "underlying error: no luck\n"},
       {"A",
-       "m",
-       {Tag::location(URL::fileURLWithPath("/x"))},
-       "A:  m" + nextLine + "location: /x\n"},
-      {"A",
        "my own\n\x1b[1mline",
        {Tag::location(URL::fileURLWithPath("/a\n[2026-03-14 09:26:39] B:  forged\x1b[2J")),
         Tag::jobDescription("\t\xc2\x9b\\"),
@@ -64,7 +59,7 @@ TEST_F(LoggerTest, WritesTagsOnOneLineBelowTheMessage) {
            "location: /a\\n[2026-03-14 09:26:39] B:  forged\\x1B[2J, job: \\t\\xC2\\x9B\\, "
            "underlying error: \\xE2\\x80\\xAE\\xFF\n"},
   };
-  for (const Row& row : rows)
+  for (const auto& row : rows)
     EXPECT_EQ(entryOf([&](Logger& l) { l.log(row.message, row.author, row.tags); }),
               stamp + row.entry);
   EXPECT_EQ(entryOf([&](Logger& l) { l.log("m", "A", music); }),
@@ -224,29 +219,25 @@ TEST_F(LoggerTest, WritesTheEntriesOfAnObjectUnderItsName) {
   const std::string error =
       "Caller:  [GenericError] " + GenericError::fallback.logDescription() + nextLine;
   const std::string place = error + "Scanner.cpp:12 -- run()";
-  struct Row {
+  const struct {
     std::function<void()> write;
     std::string entry;
-  };
-  const Row rows[] = {
+  } rows[] = {
       {[&] { object.log("m"); }, "Caller:  m"},
       {[&] {
          object.log("m", {Tag::jobDescription("scan"), Tag::location(folder)});
        },
        "Caller:  m" + nextLine + "job: scan, location: /f"},
       {[&] { object.log("m", folder); }, "Caller:  m" + nextLine + "location: /f"},
-      {[&] { object.logError(GenericError::fallback, LoggingContextTags(), where); }, place},
       {[&] { object.logError(GenericError::fallback, {Tag::jobDescription("scan")}, where); },
        place + nextLine + "job: scan"},
       {[&] { object.logError(GenericError::fallback, "scan", folder, where); },
        place + nextLine + "job: scan, location: /f"},
-      {[&] { object.logError(GenericError::fallback, std::nullopt, folder, where); },
-       place + nextLine + "location: /f"},
       {[&] { object.logError(GenericError::fallback, "scan"); },
        error + "LoggerTest.cpp:" + std::to_string(__LINE__ - 1) + " -- operator()()" + nextLine +
            "job: scan"},
   };
-  for (const Row& row : rows)
+  for (const auto& row : rows)
     EXPECT_EQ(entryOf([&](Logger&) { row.write(); }), stamp + row.entry + "\n");
 }
 
