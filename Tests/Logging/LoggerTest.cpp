@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Logging/Logger.h>
 
-#include <thread>
 #include <vector>
 
 #include <gmock/gmock.h>
 
 #include <Tests/Logging/LoggerFixture.h>
+#include <Tests/Support/Crew.h>
 #include <Varnel/Logging/GenericError.h>
 #include <Varnel/Logging/LogEntry.h>
 #include <Varnel/Logging/LoggingObject.h>
@@ -167,28 +167,24 @@ TEST_F(LoggerTest, GoesOnWithoutAFile) {
 }
 
 TEST_F(LoggerTest, KeepsTheEntriesOfManyThreadsWholeAndInOrder) {
-  constexpr int threads = 4;
   constexpr int entries = 2000;
   (void)logger();
-  std::vector<std::jthread> authors;
-  for (int author = 0; author < threads; ++author)
-    authors.emplace_back([this, author] {
-      for (int i = 0; i < entries; ++i) {
-        if (i % 100 == 0) logger().setIsAnonymousMode(i % 200 == 0);
-        logger().log(std::to_string(i), std::to_string(author));
-      }
-    });
-  authors.clear();
+  Tests::Crew(4, [this](unsigned author) {
+    for (int i = 0; i < entries; ++i) {
+      if (i % 100 == 0) logger().setIsAnonymousMode(i % 200 == 0);
+      logger().log(std::to_string(i), std::to_string(author));
+    }
+  });
   destroyLogger();
 
   std::istringstream lines(files.text(logPath()));
-  std::vector<int> next(threads, 0);
+  std::vector<int> next(4, 0);
   for (std::string line; std::getline(lines, line);) {
     const int author = line.at(stamp.size()) - '0';
     EXPECT_EQ(line, stamp + std::to_string(author) + ":  " +
                         std::to_string(next.at(static_cast<std::size_t>(author))++));
   }
-  EXPECT_EQ(next, std::vector<int>(threads, entries));
+  EXPECT_EQ(next, std::vector<int>(4, entries));
   EXPECT_EQ(printed().size(), files.text(logPath()).size());
 }
 

@@ -4,11 +4,9 @@
 
 #include <gtest/gtest.h>
 
-#include <latch>
 #include <limits>
-#include <thread>
-#include <vector>
 
+#include <Tests/Support/Crew.h>
 #include <Tests/Support/LocalZone.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Ports/TimeZones.h>
@@ -90,18 +88,13 @@ TEST(DateFormatter, SurvivesOddPatternsAndDates) {
 TEST(DateFormatter, GivesEveryThreadTheTextOfItsOwnSecond) {
   const Tests::LocalZone utc("UTC");
   const DateFormatter formatter("HH:mm:ss", "en_US", *zones);
-  std::latch start(4);
-  std::vector<std::thread> threads;
-  for (int thread = 0; thread < 4; ++thread)
-    threads.emplace_back([&formatter, &start, thread] {
-      start.arrive_and_wait();
-      for (int step = 0; step < 4000; ++step) {
-        const int second = (thread * 7 + step / 4) % 60;
-        const std::string digits = (second < 10 ? "0" : "") + std::to_string(second);
-        ASSERT_EQ(formatter.string(Date(seconds(second))), "00:00:" + digits);
-      }
-    });
-  for (std::thread& thread : threads) thread.join();
+  Tests::Crew(4, [&](unsigned thread) {
+    for (unsigned step = 0; step < 4000; ++step) {
+      const unsigned second = (thread * 7 + step / 4) % 60;
+      const std::string digits = (second < 10 ? "0" : "") + std::to_string(second);
+      ASSERT_EQ(formatter.string(Date(seconds(second))), "00:00:" + digits);
+    }
+  });
 }
 
 TEST(DurationFormatter, CutsOffFractionsAndLeavesOutZeroUnits) {

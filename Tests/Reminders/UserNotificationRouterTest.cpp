@@ -4,9 +4,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <latch>
-#include <thread>
-
+#include <Tests/Support/Crew.h>
 #include <Varnel/Basalt/MainQueueExecutor.h>
 #include <Varnel/Platform/Testing/FakeApplication.h>
 #include <Varnel/Platform/Testing/FakeMainQueue.h>
@@ -137,27 +135,17 @@ TEST_F(UserNotificationRouterTest, IsHeldWeakly) {
 }
 
 TEST_F(UserNotificationRouterTest, AnyThreadMayRegisterWhileEventsCome) {
-  constexpr int threadCount = 4;
   constexpr int eventCount = 200;
-  std::vector<int> counts(threadCount, 0);
-  std::latch start(threadCount + 1);
-  {
-    std::vector<std::jthread> threads;
-    for (int i = 0; i < threadCount; ++i)
-      threads.emplace_back([&, i] {
-        start.arrive_and_wait();
-        for (int n = 0; n < eventCount; ++n)
-          static_cast<void>(router.channel("x" + std::to_string(n)));
-        router.register_("a", [&counts, i](const UserNotification&, Kind) {
-          ++counts[static_cast<std::size_t>(i)];
-        });
-      });
-    start.arrive_and_wait();
-    for (int n = 0; n < eventCount; ++n) {
-      router.handleLaunch(notification);
-      queue.drain();
-    }
+  std::vector<int> counts(4, 0);
+  Tests::Crew threads(4, [&](unsigned i) {
+    for (int n = 0; n < eventCount; ++n) static_cast<void>(router.channel("x" + std::to_string(n)));
+    router.register_("a", [&counts, i](const UserNotification&, Kind) { ++counts[i]; });
+  });
+  for (int n = 0; n < eventCount; ++n) {
+    router.handleLaunch(notification);
+    queue.drain();
   }
+  threads.join();
   const auto before = counts;
   router.handleLaunch(notification);
   queue.drain();
