@@ -23,11 +23,9 @@ void DiskRecords::update(const OVDiskInfo::Array& disks, bool isBackgroundMode) 
     for (const Platform::URL& volumeURL : *disk->volumeURLs())
       diskUniqueIDsByVolumeURL_[volumeURL] = *disk->uniqueID();
   }
-  // A thread that was just woken has left the line and is not counted yet, but its session holds
-  // the record.
+  // Each use holds its record, and so does the session of a thread that waits or was just woken.
   for (auto& [uniqueID, record] : diskDataByUniqueID_)
-    if (record->accessCount() > 0 || record.use_count() > 1)
-      records.try_emplace(uniqueID, std::move(record));
+    if (record.use_count() > 1) records.try_emplace(uniqueID, std::move(record));
   diskDataByUniqueID_ = std::move(records);
 }
 

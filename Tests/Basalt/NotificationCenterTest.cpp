@@ -5,8 +5,9 @@
 
 #include <atomic>
 #include <optional>
-#include <thread>
 #include <vector>
+
+#include <Tests/Support/Crew.h>
 
 namespace Basalt {
 namespace {
@@ -54,16 +55,12 @@ TEST(NotificationCenter, ServesSeveralThreadsAndMayGoBeforeItsObservers) {
   {
     NotificationCenter center;
     survivor = center.addObserver("tick", [&](const Notification&) { ++calls; });
-    std::vector<std::thread> threads;
-    for (int thread = 0; thread < 3; ++thread) {
-      threads.emplace_back([&] {
-        for (int i = 0; i < 500; ++i) {
-          const auto passing = center.addObserver("tick", [](const Notification&) {});
-          center.post({.name = "tick", .userInfo = {}});
-        }
-      });
-    }
-    for (std::thread& thread : threads) thread.join();
+    Varnel::Tests::Crew(3, [&](unsigned) {
+      for (int i = 0; i < 500; ++i) {
+        const auto passing = center.addObserver("tick", [](const Notification&) {});
+        center.post({.name = "tick", .userInfo = {}});
+      }
+    });
   }
   EXPECT_EQ(calls, 1500);
 }

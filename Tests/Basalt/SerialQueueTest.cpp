@@ -4,14 +4,15 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <latch>
 #include <memory>
 #include <random>
 #include <stdexcept>
 #include <string>
 #include <thread>
+#include <utility>
 #include <vector>
 
+#include <Tests/Support/Crew.h>
 #include <Varnel/Basalt/Semaphore.h>
 #include <Varnel/Basalt/ThreadID.h>
 
@@ -188,7 +189,7 @@ TEST(SerialQueue, IsWaitedForByWhatAThreadDestroysLast) {
 // Any mixture of calls from several threads: one block at a time, each thread's in their order, and
 // none lost.
 TEST(SerialQueue, KeepsItsPromisesUnderStress) {
-  constexpr int threadCount = 4;
+  constexpr unsigned threadCount = 4;
   constexpr int callCount = 4000;
   for (unsigned round = 0; round < 3; ++round) {
     auto queue = std::make_shared<SerialQueue>("stress");
@@ -199,46 +200,39 @@ TEST(SerialQueue, KeepsItsPromisesUnderStress) {
       bool isInOrder = true;
     };
     const auto state = std::make_shared<State>();
-    std::latch start(threadCount);
-    std::vector<std::thread> threads;
-    for (int thread = 0; thread < threadCount; ++thread) {
-      threads.emplace_back([&, thread, queue] {
-        std::minstd_rand random(round * threadCount + static_cast<unsigned>(thread) + 1);
-        start.arrive_and_wait();
-        for (int call = 0; call < callCount; ++call) {
-          const auto block = [state, thread, call] {
-            if (++state->running != 1) state->isInOrder = false;
-            if (state->last[static_cast<std::size_t>(thread)] != call - 1) state->isInOrder = false;
-            state->last[static_cast<std::size_t>(thread)] = call;
-            ++state->blocks;
-            --state->running;
-          };
-          const unsigned kind = static_cast<unsigned>(random()) % 16;
-          if (kind == 0) {
-            queue->async(block);
-          } else if (kind == 1) {
-            queue->sync([&] { queue->submit(block); });
-          } else if (kind == 2) {
-            queue->async([block, owner = queue] { owner->submit(block); });
-            queue->sync([] {});
-          } else if (kind == 3) {
-            EXPECT_THROW(queue->sync([&] {
-              block();
-              throw std::runtime_error("on purpose");
-            }),
-                         std::runtime_error);
-          } else if (kind < 8) {
-            queue->submit(block);
-          } else {
-            queue->sync(block);
-          }
+    Varnel::Tests::Crew(threadCount, [&](unsigned thread) {
+      std::minstd_rand random(round * threadCount + thread + 1);
+      for (int call = 0; call < callCount; ++call) {
+        const auto block = [state, thread, call] {
+          if (++state->running != 1) state->isInOrder = false;
+          if (std::exchange(state->last[thread], call) != call - 1) state->isInOrder = false;
+          ++state->blocks;
+          --state->running;
+        };
+        const unsigned kind = static_cast<unsigned>(random()) % 16;
+        if (kind == 0) {
+          queue->async(block);
+        } else if (kind == 1) {
+          queue->sync([&] { queue->submit(block); });
+        } else if (kind == 2) {
+          queue->async([block, owner = queue] { owner->submit(block); });
+          queue->sync([] {});
+        } else if (kind == 3) {
+          EXPECT_THROW(queue->sync([&] {
+            block();
+            throw std::runtime_error("on purpose");
+          }),
+                       std::runtime_error);
+        } else if (kind < 8) {
+          queue->submit(block);
+        } else {
+          queue->sync(block);
         }
-      });
-    }
-    for (std::thread& thread : threads) thread.join();
+      }
+    });
     queue->sync([&] {
       EXPECT_TRUE(state->isInOrder);
-      EXPECT_EQ(state->blocks, threadCount * callCount);
+      EXPECT_EQ(state->blocks, 4 * callCount);
     });
   }
 }

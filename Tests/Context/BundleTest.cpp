@@ -55,12 +55,8 @@ TEST_F(BundleTest, WhatIsMissingOrDamagedIsAbsent) {
   EXPECT_FALSE(Bundle(std::nullopt, {}).url().has_value());
   folder_.write("Info.plist", "<plist><array/></plist>");
   EXPECT_EQ(inLanguages({"en"}).infoDictionary(), nullptr);
-}
-
-TEST_F(BundleTest, FoldersInThePlaceOfItsFilesAreAbsentToo) {
-  folder_.write("Info.plist/file", "");
+  // A folder in the place of a file.
   folder_.write("it.lproj/Localizable.strings/file", "");
-  EXPECT_EQ(inLanguages({"en"}).infoDictionary(), nullptr);
   EXPECT_EQ(inLanguages({"it"}).localizedString("Only English"), "English text");
 }
 

@@ -51,6 +51,7 @@ TEST_F(ProcessFactsTest, EveryChannelSharesTheSuitesBaseIdentifier) {
   process.mainBundle.reset();
   EXPECT_EQ(facts().baseIdentifier(), "host");
   EXPECT_EQ(facts().identifier("Scan"), "host.Scan");
+  EXPECT_DEATH((void)Globals::identifier(""), "Globals");
 }
 
 TEST_F(ProcessFactsTest, SubstitutesEveryDefaultNameByTheBuildsOwn) {
@@ -118,15 +119,6 @@ TEST_F(ProcessFactsTest, NamesTheSiblingsInstalled) {
     workspace.applications.emplace(identifier, URL::fileURLWithPath("/opt/app"));
   EXPECT_EQ(siteFacts().findOtherInstalledTargetBundleIDs(),
             std::vector<std::string>{"com.quennel.Orvane2"});
-}
-
-TEST(Globals, AnswersForThisBuild) {
-  EXPECT_EQ(Globals::isSiteVersion(), QNIsSiteVersion());
-  EXPECT_EQ(Globals::isSiteVersion() + Globals::isAppStoreVersion() + Globals::isMarkettaVersion(),
-            1);
-  EXPECT_EQ(Globals::applicationVersionString(),
-            std::string(QNAppDisplayVersion()) + " (" + QNAppArrangeVersion() + ")");
-  EXPECT_DEATH((void)Globals::identifier(""), "Globals");
 }
 
 }  // namespace

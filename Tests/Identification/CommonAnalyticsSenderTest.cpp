@@ -6,16 +6,11 @@
 #include <limits>
 #include <thread>
 
+#include <Tests/Logging/LoggerFixture.h>
 #include <Varnel/Identification/Analytics/CustomDimensionValues.h>
 #include <Varnel/Identification/Analytics/CustomDimensionsHolder.h>
 #include <Varnel/Identification/Analytics/FoundValue.h>
-#include <Varnel/Logging/Logger.h>
-#include <Varnel/Platform/Testing/CapturedOutput.h>
-#include <Varnel/Platform/Testing/FakeAppendFiles.h>
-#include <Varnel/Platform/Testing/FakeTimeZones.h>
-#include <Varnel/Platform/Testing/FakeUser.h>
 #include <Varnel/Platform/Testing/FakeWorkspace.h>
-#include <Varnel/Platform/Testing/SimulatedClock.h>
 #include <Varnel/Provenance/OVFriendsLocator.h>
 #include <Varnel/Tallyhouse/Testing/MemoryTransport.h>
 #include <gtest/gtest.h>
@@ -37,7 +32,7 @@ class ScannerSender final : public CommonAnalyticsSender {
   Logger& logger_;
 };
 
-class CommonAnalyticsSenderTest : public testing::Test {
+class CommonAnalyticsSenderTest : public Tests::LoggerFixture {
  protected:
   CommonAnalyticsSenderTest() {
     const auto workspace = std::make_shared<Platform::Testing::FakeWorkspace>();
@@ -50,23 +45,16 @@ class CommonAnalyticsSenderTest : public testing::Test {
   }
 
   std::string lastEntry() const {
-    const std::string text = output_.text();
+    const std::string text = output.text();
     const std::size_t begin = text.rfind("] ");
     return begin == std::string::npos ? text : text.substr(begin + 2);
   }
 
-  Platform::Testing::FakeAppendFiles files_;
-  Platform::Testing::SimulatedClock clock_;
-  Platform::Testing::CapturedOutput output_;
-  Platform::Testing::FakeUserAccount account_;
-  Platform::Testing::FakeTimeZones zones_;
-  Platform::Testing::FakeUserLocale locale_;
-  Logger logger_{{files_, clock_, output_, zones_, account_, locale_}, "test"};
   std::shared_ptr<Tallyhouse::Testing::MemoryTransport> sent_ =
       std::make_shared<Tallyhouse::Testing::MemoryTransport>();
   std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker_ =
       std::make_shared<Tallyhouse::AnalyticsTracker>(sent_);
-  ScannerSender sender_{tracker_, logger_};
+  ScannerSender sender_{tracker_, logger()};
 };
 
 TEST(FoundValue, MakesNobodyWaitThatHasAnother) {
@@ -110,9 +98,9 @@ TEST_F(CommonAnalyticsSenderTest, EmptyDimensionsStandForTheHoldersAndOthersForT
 }
 
 TEST_F(CommonAnalyticsSenderTest, EchoesToTheLetterWhileTheTrackerPrints) {
-  const std::string before = output_.text();
+  const std::string before = output.text();
   sender_.trackCustomEvent("Scan", "Quiet", "", 0);
-  EXPECT_EQ(output_.text(), before);
+  EXPECT_EQ(output.text(), before);
   EXPECT_EQ(sent_->events().size(), 1u);
 
   tracker_->setShouldPrintEvents(true);
@@ -124,16 +112,6 @@ TEST_F(CommonAnalyticsSenderTest, EchoesToTheLetterWhileTheTrackerPrints) {
   EXPECT_EQ(lastEntry(),
             "CommonAnalyticsSender:  Category: `Scanner` Action: `Go` Label: `nil` Value: `nil` "
             "CustomDimensions: [nil]\n");
-}
-
-TEST_F(CommonAnalyticsSenderTest, SendsNothingWithoutConsent) {
-  sender_.trackCustomEvent("Scan", "Before", "", 0);
-  tracker_->context()->setConsent(Tallyhouse::Consent::refused);
-  sender_.trackCustomEvent("Scan", "Meanwhile", "", 0);
-  EXPECT_TRUE(sent_->events().empty());
-  tracker_->context()->setConsent(Tallyhouse::Consent::granted);
-  sender_.trackCustomEvent("Scan", "After", "", 0);
-  EXPECT_EQ(sent_->events().size(), 1u);
 }
 
 TEST(CustomDimensionValues, AchievementsAreTheCeilingOfTheProductAsComputed) {

@@ -1,18 +1,16 @@
 // SPDX-License-Identifier: MIT
 #include <algorithm>
-#include <cstdio>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <map>
-#include <memory>
 #include <sstream>
 #include <string>
-#include <vector>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <Tests/Support/ChildProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
 
 namespace Varnel {
@@ -22,30 +20,22 @@ namespace fs = std::filesystem;
 using testing::EndsWith;
 using testing::HasSubstr;
 
-struct ClosePipe {
-  void operator()(std::FILE* pipe) const { ::pclose(pipe); }
-};
-using Process = std::unique_ptr<std::FILE, ClosePipe>;
-
 // Runs the logging process in a home folder of its own.
 class LoggerProcessTest : public testing::Test {
  protected:
-  [[nodiscard]] Process start(const std::string& arguments) const {
-    const std::string command = "HOME='" + home.path().string() +
-                                "' TSAN_OPTIONS=\"$TSAN_OPTIONS die_after_fork=0\" exec '" +
-                                VARNEL_LOGGER_PROCESS "' " + arguments;
-    return Process(::popen(command.c_str(), "r"));
+  [[nodiscard]] Tests::ChildProcess start(const std::string& arguments) const {
+    return Tests::ChildProcess({"/bin/sh", "-c",
+                                "HOME='" + home.path().string() +
+                                    "' TSAN_OPTIONS=\"$TSAN_OPTIONS die_after_fork=0\" exec '" +
+                                    VARNEL_LOGGER_PROCESS "' " + arguments});
   }
 
-  // Everything that the process prints until it ends.
-  [[nodiscard]] static std::string outputOf(const Process& process) {
-    std::string output;
-    for (int byte = 0; (byte = std::fgetc(process.get())) != EOF;)
-      output += static_cast<char>(byte);
-    return output;
-  }
+  // All that the process prints until it ends.
   [[nodiscard]] std::string run(const std::string& arguments) const {
-    return outputOf(start(arguments));
+    Tests::ChildProcess process = start(arguments);
+    std::string output = process.readAll();
+    process.wait();
+    return output;
   }
 
   // The only log file below the home folder.
@@ -85,10 +75,9 @@ TEST_F(LoggerProcessTest, LosesNothingWhenTheProcessExits) {
 }
 
 TEST_F(LoggerProcessTest, SharesTheFileWithAnotherProcess) {
-  const Process first = start("exit A 20000 0");
-  const Process second = start("exit B 20000 0");
-  EXPECT_FALSE(outputOf(first).empty());
-  EXPECT_FALSE(outputOf(second).empty());
+  Tests::ChildProcess first = start("exit A 20000 0 >/dev/null");
+  Tests::ChildProcess second = start("exit B 20000 0 >/dev/null");
+  EXPECT_EQ(first.wait() + second.wait(), 0);
 
   std::istringstream lines(log());
   std::map<char, int> next;
@@ -101,8 +90,7 @@ TEST_F(LoggerProcessTest, SharesTheFileWithAnotherProcess) {
 
 TEST_F(LoggerProcessTest, LosesAtMostASecondOr4096BytesWhenKilled) {
   constexpr std::size_t slowEntries = 60;
-  const Process slow = start("killed S 60 30");
-  const std::string printed = entriesIn(outputOf(slow));
+  const std::string printed = entriesIn(run("killed S 60 30"));
   // A second's worth at 30 ms each, and half as much again for a machine that is busy.
   constexpr std::size_t lostInTime = 50;
   const auto kept = static_cast<std::size_t>(std::ranges::count(log(), '\n'));
@@ -134,7 +122,7 @@ TEST_F(LoggerProcessTest, KeepsItsFileApartFromAClosedStandardOutput) {
 TEST_F(LoggerProcessTest, OutlivesTheReaderOfItsStandardOutput) {
   // A few entries meet the closed pipe only when the process ends.
   for (const std::string count : {"3", "2000"}) {
-    EXPECT_EQ(::pclose(start("without-reader A " + count + " 0").release()), 0);
+    EXPECT_EQ(start("without-reader A " + count + " 0").wait(), 0);
     EXPECT_THAT(log(), HasSubstr("A:  " + std::to_string(std::stoi(count) - 1) + "\n"));
     EXPECT_THAT(log(), EndsWith("A:  late\n"));
   }

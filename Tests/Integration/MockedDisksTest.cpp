@@ -114,18 +114,6 @@ TEST_F(MockedDisks, FixedDisksAreDevicesWithTheirKindAndTheStickIsNone) {
   for (std::size_t i = 2; i < all.size(); ++i) EXPECT_NE(all[i]->uniqueID(), "USB-1");
 }
 
-TEST_F(MockedDisks, TheTreeLeadsFromAPartitionToItsDevice) {
-  const auto serviceOf = [&](const char* name) {
-    auto entries = devices_->entriesMatchingProperty("BSD Name", name);
-    return OVDiskInfo::serviceForDevice(std::move(entries->at(0)));
-  };
-  const auto disk = serviceOf("sda2");
-  EXPECT_THAT(OVDiskInfo::bsdNamesForDevice(*disk), testing::ElementsAre("sda", "sda1", "sda2"));
-  EXPECT_EQ(*findAs<std::string>(*OVDiskInfo::characteristicsForDevice(*disk), "Serial Number"),
-            "SATA-1");
-  EXPECT_FALSE(OVDiskInfo::characteristicsForDevice(*serviceOf("sdb1")));
-}
-
 TEST_F(MockedDisks, ADiskThatWasUnpluggedIsGoneFromTheNextInventory) {
   umockdev_testbed_remove_device(testbed_.get(), std::string("/sys").append(nvme).c_str());
   for (const auto& disk : inventory()) EXPECT_NE(disk->uniqueID(), "NVME-1");

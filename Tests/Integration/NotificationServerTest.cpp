@@ -2,13 +2,8 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <signal.h>
-#include <spawn.h>
-#include <sys/wait.h>
-#include <unistd.h>
 
 #include <algorithm>
-#include <array>
-#include <cstdio>
 #include <cstdlib>
 #include <memory>
 
@@ -45,38 +40,18 @@ using ::testing::IsEmpty;
 using ::testing::Not;
 using ::testing::SizeIs;
 using ::testing::StartsWith;
-
-std::string outputOf(const std::string& command) {
-  std::string text;
-  FILE* pipe = ::popen(command.c_str(), "r");
-  std::array<char, 256> buffer{};
-  while (std::fgets(buffer.data(), buffer.size(), pipe)) text += buffer.data();
-  ::pclose(pipe);
-  return text;
-}
+using Tests::outputOf;
 
 class Server final {
  public:
-  Server() {
-    const std::string configuration = std::string(getenv("VARNEL_DESKTOP")) + "/dunstrc";
-    const char* arguments[] = {"dunst", "-conf", configuration.c_str(), nullptr};
-    EXPECT_EQ(::posix_spawnp(&process_, "dunst", nullptr, nullptr,
-                             const_cast<char* const*>(arguments), environ),
-              0);
-    outputOf("gdbus wait --session --timeout 30 org.freedesktop.Notifications");
-  }
-  ~Server() {
-    ::kill(process_, SIGKILL);
-    ::waitpid(process_, nullptr, 0);
-  }
-  Server(const Server&) = delete;
-  Server& operator=(const Server&) = delete;
+  Server() { outputOf("gdbus wait --session --timeout 30 org.freedesktop.Notifications"); }
 
-  void signal(int number) const { ::kill(process_, number); }
+  void signal(int number) const { process_.signal(number); }
   [[nodiscard]] static std::string displayedCount() { return outputOf("dunstctl count displayed"); }
 
  private:
-  pid_t process_ = 0;
+  Tests::ChildProcess process_{
+      {"/usr/bin/env", "dunst", "-conf", std::string(getenv("VARNEL_DESKTOP")) + "/dunstrc"}};
 };
 
 // One run of the host.

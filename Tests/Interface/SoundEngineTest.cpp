@@ -3,8 +3,6 @@
 
 #include <gtest/gtest.h>
 
-#include <map>
-
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Context/Bundle.h>
 #include <Varnel/Platform/Testing/FakeSoundPlayer.h>
@@ -31,18 +29,14 @@ class SoundEngineTest : public ::testing::Test {
 };
 
 TEST(Sound, HasPublishedValuesAndFiles) {
-  const std::map<int, std::string> fileNames = {{0, "Tutorial.m4a"},
-                                                {1, "Start.m4a"},
-                                                {2, "ScanComplete.m4a"},
-                                                {3, "CleanComplete.m4a"},
-                                                {4, "AchievementNotification.m4a"},
-                                                {5, "RankIncreased.m4a"},
-                                                {6, "Purchase.aiff"}};
+  std::string names;
   for (int value = -1; value <= 7; ++value) {
     const auto sound = Sound::withRawValue(value);
-    ASSERT_EQ(sound.has_value(), fileNames.contains(value)) << value;
-    EXPECT_EQ(sound ? sound->fileName() : "", sound ? fileNames.at(value) : "");
+    names += sound ? sound->fileName() + " " : "- ";
   }
+  EXPECT_EQ(names,
+            "- Tutorial.m4a Start.m4a ScanComplete.m4a CleanComplete.m4a "
+            "AchievementNotification.m4a RankIncreased.m4a Purchase.aiff - ");
   EXPECT_EQ(Sound::achievementNotification.rawValue(), 4);
   EXPECT_EQ(std::hash<Sound>()(Sound::purchase), 6u);
 }

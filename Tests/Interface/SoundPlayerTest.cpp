@@ -156,7 +156,7 @@ TEST_F(SoundPlayerTest, EverySoundBeginsInSilenceAndIsShortSmallAndAsLoudAsTheOt
   }
 }
 
-TEST_F(SoundPlayerTest, DamagedFilesAreSilent) {
+TEST_F(SoundPlayerTest, DamagedFilesAreSilentAndACutOneEndsEarly) {
   const std::string whole = bytesOf(Sound::start);
   std::string mangled = whole;
   for (std::size_t i = 200; i < mangled.size(); i += 3) mangled[i] = static_cast<char>(i);
@@ -167,10 +167,6 @@ TEST_F(SoundPlayerTest, DamagedFilesAreSilent) {
     engine.play(Sound::start);
     EXPECT_TRUE(drainUntilIdle());
   }
-}
-
-TEST_F(SoundPlayerTest, ATruncatedFileEndsEarly) {
-  const std::string whole = bytesOf(Sound::start);
   putInPlace(whole.substr(0, whole.size() * 2 / 3));
   engine.play(Sound::start);
   ASSERT_TRUE(drainUntilIdle());

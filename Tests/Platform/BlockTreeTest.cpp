@@ -172,17 +172,9 @@ TEST(BlockTree, AMissingTableIsNoTable) {
 
 TEST(StorageDevice, MalformedPagesHoldNoSerialNumber) {
   using namespace std::string_view_literals;
-  EXPECT_EQ(serialInPage("\0\x80\0\x04"
-                         "ABCDEF"sv),
-            "ABCD");
-  EXPECT_EQ(serialInPage("\0\x80\xff\xff"
-                         "AB"sv),
-            "AB");
-  for (const std::string_view page : {""sv, "\0\x80\0"sv,
-                                      "\0\x83\0\x02"
-                                      "AB"sv,
-                                      "\0\x80\0\0"
-                                      "AB"sv})
+  EXPECT_EQ(serialInPage("\0\x80\0\x04WXYZuv"sv), "WXYZ");
+  EXPECT_EQ(serialInPage("\0\x80\xff\xffXY"sv), "XY");
+  for (const std::string_view page : {""sv, "\0\x80\0"sv, "\0\x83\0\x02XY"sv, "\0\x80\0\0XY"sv})
     EXPECT_EQ(serialInPage(page), "");
 }
 

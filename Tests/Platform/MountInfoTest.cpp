@@ -62,11 +62,10 @@ TEST(MountInfo, KeepsOnlyTheMountsThatAPathCanReach) {
            " rw - tmpfs t rw\n";
   };
   const std::string root = line(1, 0, "/");
-  struct Case {
+  const struct {
     std::string table;
     std::vector<std::string> reachable;
-  };
-  const Case cases[] = {
+  } cases[] = {
       {root + line(2, 1, "/a") + line(3, 2, "/a/b"), {"1/", "2/a", "3/a/b"}},
       // stacked on the same folder: the last one is seen
       {root + line(2, 1, "/a") + line(3, 2, "/a") + line(4, 3, "/a"), {"1/", "4/a"}},
@@ -81,7 +80,7 @@ TEST(MountInfo, KeepsOnlyTheMountsThatAPathCanReach) {
       {line(1, 1, "/") + line(2, 1, "/a") + line(9, 77, "/b"), {"1/", "2/a", "9/b"}},
       {line(5, 6, "/a") + line(6, 5, "/b"), {}},
   };
-  for (const Case& each : cases) EXPECT_EQ(reachableTargets(each.table), each.reachable);
+  for (const auto& each : cases) EXPECT_EQ(reachableTargets(each.table), each.reachable);
 }
 
 TEST(FileSystemTypes, OnlyTheKernelsOwnAreNoVolumesAndOnlyRemoteOnesAreNetwork) {

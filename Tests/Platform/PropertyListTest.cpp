@@ -148,21 +148,13 @@ static_assert(!std::is_constructible_v<PropertyValue, const void*>);
 static_assert(!std::is_constructible_v<PropertyValue, const int*>);
 static_assert(!std::is_constructible_v<PropertyValue, std::uint64_t>, "it may not fit");
 
-template <typename Type>
-bool holds(const PropertyValue& value, const Type& expected) {
-  const auto* held = value.as<Type>();
-  return held && *held == expected;
-}
-
 TEST(PropertyValue, TakesWhatHasOneMeaning) {
-  EXPECT_TRUE(holds(nullptr, nullptr));
-  EXPECT_TRUE(holds(true, true));
-  EXPECT_TRUE(holds(0, std::int64_t{0}));
-  EXPECT_TRUE(holds(std::int8_t{-7}, std::int64_t{-7}));
-  EXPECT_TRUE(holds(4294967295u, std::int64_t{4294967295}));
-  EXPECT_TRUE(holds(1.5f, 1.5));
-  EXPECT_TRUE(holds("text", "text"s));
-  EXPECT_TRUE(holds(std::string_view("a\0b", 3), "a\0b"s));
+  EXPECT_TRUE(PropertyValue(true).as<bool>());
+  EXPECT_EQ(PropertyValue(std::int8_t{-7}), PropertyValue(std::int64_t{-7}));
+  EXPECT_EQ(PropertyValue(4294967295u), PropertyValue(std::int64_t{4294967295}));
+  EXPECT_EQ(*PropertyValue(1.5f).as<double>(), 1.5);
+  EXPECT_EQ(*PropertyValue("text").as<std::string>(), "text");
+  EXPECT_EQ(*PropertyValue(std::string_view("a\0b", 3)).as<std::string>(), "a\0b"s);
 }
 
 TEST(PropertyList, RefusesWhatIsNone) {

@@ -60,6 +60,8 @@ TEST_F(NotificationStoreTest, KeepsEveryPartOfANotificationForTheNextRun) {
   ASSERT_THAT(schedules, SizeIs(3));
   EXPECT_EQ(schedules[0].notification, weekly());
   EXPECT_EQ(schedules[0].timeZone, "UTC");
+  EXPECT_EQ(fs::status(file).permissions(), fs::perms::owner_read | fs::perms::owner_write);
+  EXPECT_EQ(fs::status(file.parent_path()).permissions(), fs::perms::owner_all);
 
   const auto claimed = store.claimDue(start, calendar);
   ASSERT_THAT(claimed, SizeIs(3));
@@ -68,13 +70,6 @@ TEST_F(NotificationStoreTest, KeepsEveryPartOfANotificationForTheNextRun) {
   EXPECT_EQ(store.delivered().back().notification, expected);
   EXPECT_THAT(store.schedules(), SizeIs(1));
   EXPECT_EQ(log.text(), "");
-}
-
-TEST_F(NotificationStoreTest, IsReadableByItsUserAlone) {
-  NotificationStore store(file, log);
-  store.schedule(weekly(), start, calendar);
-  EXPECT_EQ(fs::status(file).permissions(), fs::perms::owner_read | fs::perms::owner_write);
-  EXPECT_EQ(fs::status(file.parent_path()).permissions(), fs::perms::owner_all);
 }
 
 TEST_F(NotificationStoreTest, EachDeliveryIsClaimedOnceAmongMany) {

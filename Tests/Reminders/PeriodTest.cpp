@@ -26,44 +26,41 @@ static_assert(!std::is_convertible_v<Basalt::JSON, Option>, "what may throw is a
 const Option productDefault = QNIsMarkettaVersion() ? Option::never : Option::onceInTwoWeeks;
 
 TEST(SchedulePeriodOption, HasItsPublishedIdentities) {
-  struct Row {
+  const struct {
     Option option;
     const char* kind;
     const char* analytics;
     const char* textKey;
-    const char* german;
     Platform::DateComponents interval;
-  };
-  const Row rows[] = {
-      {Option::never, "never", "Never", "Never", "Nie", {.year = 1000}},
-      {Option::weekly, "weekly", "Weekly", "Weekly", "Jede Woche", {.day = 7}},
+  } rows[] = {
+      {Option::never, "never", "Never", "Never", {.year = 1000}},
+      {Option::weekly, "weekly", "Weekly", "Weekly", {.day = 7}},
       {Option::onceInTwoWeeks,
        "onceInTwoWeeks",
        "Once in Two Weeks",
        "Once In Two Weeks",
-       "Alle zwei Wochen",
        {.day = 14}},
-      {Option::monthly, "monthly", "Monthly", "Monthly", "Jeden Monat", {.month = 1}},
+      {Option::monthly, "monthly", "Monthly", "Monthly", {.month = 1}},
       {Option::onceInThreeMonths,
        "onceInThreeMonths",
        "Once in Three Months",
        "Once In Three Months",
-       "Alle drei Monate",
        {.month = 3}},
       {Option::onceInSixMonths,
        "onceInSixMonths",
        "Once in Six Months",
        "Once In Six Months",
-       "Alle sechs Monate",
        {.month = 6}},
-      {Option::annually, "annually", "Annually", "Annually", "Jedes Jahr", {.year = 1}},
+      {Option::annually, "annually", "Annually", "Annually", {.year = 1}},
   };
   const Platform::Testing::FakeTimeZones zones;
   const Platform::Calendar gregorian("en_US", "UTC", zones);
   const auto module = std::make_shared<VarnelModule>();
   VarnelModule::setInstance(module);
+  // Without texts the key stands for itself.
+  module->setBundle(Bundle(std::nullopt, {}));
   std::int64_t raw = 0;
-  for (const Row& row : rows) {
+  for (const auto& row : rows) {
     EXPECT_EQ(Option::withRawValue(raw), row.option);
     EXPECT_EQ(Option::optionsAvailableToUser().at(static_cast<std::size_t>(raw)), row.option);
     EXPECT_EQ(std::hash<Option>{}(row.option), static_cast<std::size_t>(raw++));
@@ -72,13 +69,10 @@ TEST(SchedulePeriodOption, HasItsPublishedIdentities) {
     EXPECT_EQ(row.option.repeatInterval(gregorian), row.interval);
     EXPECT_EQ(row.option.exportJSONObject(), (Object{{"kind", row.kind}}));
     EXPECT_EQ(Option(Object{{"kind", row.kind}}), row.option);
-    // Without texts the key stands for itself.
-    module->setBundle(Bundle(std::nullopt, {}));
     EXPECT_EQ(row.option.description(), row.textKey);
-    module->setBundle(Bundle(VARNEL_TEST_RESOURCES, {"de"}));
-    EXPECT_EQ(row.option.description(), row.german);
-    EXPECT_EQ(Box(row.option).description(), row.german);
   }
+  module->setBundle(Bundle(VARNEL_TEST_RESOURCES, {"de"}));
+  EXPECT_EQ(Box(Option::annually).description(), "Jedes Jahr");
   VarnelModule::setInstance(nullptr);
   EXPECT_EQ(Option::withRawValue(7), std::nullopt);
   EXPECT_EQ(Option::withRawValue(-1), std::nullopt);

@@ -90,14 +90,6 @@ TEST_F(ScheduledNotificationCenterTest, AYearAwakeDeliversEveryWeek) {
       (Banner{.title = "Week", .text = "Text", .actionTitle = "Do", .dismissTitle = "Later"}));
 }
 
-TEST_F(ScheduledNotificationCenterTest, SleepOverThreePeriodsDeliversOnce) {
-  process.listen();
-  process.center.scheduleNotification(weekly());
-  process.timer.setClock(start + 3 * week + 1h);
-  EXPECT_THAT(process.server.history(), SizeIs(1));
-  EXPECT_EQ(process.timer.armedDate(), start + 4 * week);
-}
-
 TEST_F(ScheduledNotificationCenterTest, AClockSetBackDeliversNothingTwice) {
   process.listen();
   process.center.scheduleNotification(weekly());

@@ -149,12 +149,11 @@ TEST(NotificationServer, ABusThatNeverAnswersCostsTheBannersAndNoWaiting) {
 
 // As the desktop notification standard orders the parts.
 TEST(NotificationServer, ABannerCarriesWhoseItIs) {
-  struct Row {
+  const struct {
     NotificationSource source;
     const char* start;
     const char* hints;
-  };
-  const Row rows[] = {
+  } rows[] = {
       {{.name = "Fotovia \xff", .desktopEntry = "com.example.Fotovia", .icon = "/icons/a b.png"},
        "('Fotovia \uFFFD', uint32 7, 'file:///icons/a%20b.png', ",
        "{'desktop-entry': <'com.example.Fotovia'>}, -1)"},
@@ -163,7 +162,7 @@ TEST(NotificationServer, ABannerCarriesWhoseItIs) {
        "@a{sv} {}, -1)"},
       {{}, "('', uint32 7, '', ", "@a{sv} {}, -1)"},
   };
-  for (const Row& row : rows) {
+  for (const auto& row : rows) {
     const auto message = Linux::notifyRequest(":1.5", row.source, Banner(), {}, 7);
     const UniqueHandle<char*, g_free> printed(
         g_variant_print(g_dbus_message_get_body(message.get()), TRUE));

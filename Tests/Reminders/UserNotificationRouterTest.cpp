@@ -4,9 +4,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <latch>
-#include <thread>
-
+#include <Tests/Support/Crew.h>
 #include <Varnel/Basalt/MainQueueExecutor.h>
 #include <Varnel/Platform/Testing/FakeApplication.h>
 #include <Varnel/Platform/Testing/FakeMainQueue.h>
@@ -52,6 +50,9 @@ TEST_F(UserNotificationRouterTest, ReachesAllHandlersOfTheIdentifierInTheirOrder
   queue.drain();
   EXPECT_THAT(events, ElementsAre("first A 1", "second A 1", "first A 2", "second A 2", "first A 0",
                                   "second A 0"));
+  EXPECT_EQ(Router::eventKindWithRawValue(2), Kind::didActivate);
+  EXPECT_EQ(Router::eventKindWithRawValue(3), std::nullopt);
+  EXPECT_EQ(Router::eventKindWithRawValue(-1), std::nullopt);
 }
 
 TEST_F(UserNotificationRouterTest, DropsWhatNobodyAskedForAndReplaysNothing) {
@@ -134,39 +135,21 @@ TEST_F(UserNotificationRouterTest, IsHeldWeakly) {
 }
 
 TEST_F(UserNotificationRouterTest, AnyThreadMayRegisterWhileEventsCome) {
-  constexpr int threadCount = 4;
   constexpr int eventCount = 200;
-  std::vector<int> counts(threadCount, 0);
-  std::latch start(threadCount + 1);
-  {
-    std::vector<std::jthread> threads;
-    for (int i = 0; i < threadCount; ++i)
-      threads.emplace_back([&, i] {
-        start.arrive_and_wait();
-        for (int n = 0; n < eventCount; ++n)
-          static_cast<void>(router.channel("x" + std::to_string(n)));
-        router.register_("a", [&counts, i](const UserNotification&, Kind) {
-          ++counts[static_cast<std::size_t>(i)];
-        });
-      });
-    start.arrive_and_wait();
-    for (int n = 0; n < eventCount; ++n) {
-      router.handleLaunch(notification);
-      queue.drain();
-    }
+  std::vector<int> counts(4, 0);
+  Tests::Crew threads(4, [&](unsigned i) {
+    for (int n = 0; n < eventCount; ++n) static_cast<void>(router.channel("x" + std::to_string(n)));
+    router.register_("a", [&counts, i](const UserNotification&, Kind) { ++counts[i]; });
+  });
+  for (int n = 0; n < eventCount; ++n) {
+    router.handleLaunch(notification);
+    queue.drain();
   }
+  threads.join();
   const auto before = counts;
   router.handleLaunch(notification);
   queue.drain();
   for (std::size_t i = 0; i < counts.size(); ++i) EXPECT_EQ(counts[i], before[i] + 1);
-}
-
-TEST(UserNotificationRouter, EventKindsHaveTheirRawValues) {
-  EXPECT_EQ(Router::eventKindWithRawValue(0), Kind::didLaunchWith);
-  EXPECT_EQ(Router::eventKindWithRawValue(1), Kind::didDeliver);
-  EXPECT_EQ(Router::eventKindWithRawValue(2), Kind::didActivate);
-  for (const std::int64_t raw : {-1, 3})
-    EXPECT_EQ(Router::eventKindWithRawValue(raw), std::nullopt);
 }
 
 }  // namespace

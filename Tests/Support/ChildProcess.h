@@ -57,6 +57,14 @@ class ChildProcess final {
     return bytes;
   }
 
+  /// All that is left, waited for until the output ends.
+  std::string readAll() {
+    std::string text;
+    for (int c = std::fgetc(output_); c != EOF; c = std::fgetc(output_))
+      text += static_cast<char>(c);
+    return text;
+  }
+
   /// Waits for its end; its exit status, or as a shell tells a signal.
   int wait() {
     int status = 0;
@@ -64,6 +72,8 @@ class ChildProcess final {
     process_ = 0;
     return WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
   }
+
+  void signal(int number) const { ::kill(process_, number); }
 
   /// Ends the process as a crash would, if it runs.
   void kill() {
@@ -77,5 +87,10 @@ class ChildProcess final {
   ::pid_t process_ = 0;
   std::FILE* output_ = nullptr;
 };
+
+/// What a command of the shell prints.
+inline std::string outputOf(const std::string& command) {
+  return ChildProcess({"/bin/sh", "-c", command}).readAll();
+}
 
 }  // namespace Varnel::Tests

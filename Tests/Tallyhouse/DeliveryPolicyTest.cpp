@@ -25,13 +25,12 @@ TEST(DeliveryPolicy, OnlyAnAnswerOfTheServerItselfSettlesABatch) {
 
 TEST(DeliveryPolicy, RetriesBackOffAndHeedTheServerWithinReason) {
   const DeliveryPolicy policy;
-  struct Case {
+  const struct {
     int failures;
     std::optional<std::chrono::seconds> retryAfter;
     double random;
     DeliveryPolicy::Duration delay;
-  };
-  const Case cases[] = {
+  } cases[] = {
       {1, {}, 0, 5s},
       {2, {}, 0, 10s},
       {4, {}, 0, 40s},
@@ -45,7 +44,7 @@ TEST(DeliveryPolicy, RetriesBackOffAndHeedTheServerWithinReason) {
       {1, -5s, 0, 5s},
       {1, {}, 17, 2500ms},
   };
-  for (const Case& c : cases)
+  for (const auto& c : cases)
     EXPECT_EQ(policy.retryDelay(c.failures, c.retryAfter, c.random), c.delay) << c.failures;
 }
 
@@ -70,7 +69,7 @@ TEST(DeliveryPolicy, EventsWaitForCompanyButNotForAClockThatWasSetBack) {
       {"which may be over", one, noon - 1h, noon + 3s},
       {"or lie in a future that was", full, noon + 25h, noon},
   };
-  for (const Case& c : cases)
+  for (const auto& c : cases)
     EXPECT_EQ(policy.nextSending(c.backlog, c.notBefore, noon), c.next) << c.what;
 }
 

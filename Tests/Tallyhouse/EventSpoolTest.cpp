@@ -4,9 +4,8 @@
 #include <sys/stat.h>
 
 #include <fstream>
-#include <latch>
-#include <thread>
 
+#include <Tests/Support/Crew.h>
 #include <Tests/Tallyhouse/SpoolFixture.h>
 #include <Varnel/Platform/Testing/FakeAppendFiles.h>
 
@@ -166,13 +165,9 @@ TEST_F(EventSpoolTest, ThreadsAndProcessesMayShareAFile) {
   const auto one = openSpool();
   const auto other = openSpool();
   constexpr int each = 200;
-  std::latch start(4);
-  std::vector<std::thread> threads;
-  for (int i = 0; i < 4; ++i)
-    threads.emplace_back([&, &spool = i % 2 ? *one : *other] {
-      start.arrive_and_wait();
-      for (int n = 0; n < each; ++n) spool.append("x", clock.now(), "ea=x");
-    });
+  Varnel::Tests::Crew threads(4, [&](unsigned i) {
+    for (int n = 0; n < each; ++n) (i % 2 ? *one : *other).append("x", clock.now(), "ea=x");
+  });
   std::size_t removed = 0;
   while (removed < 2 * each) {
     const auto batch = one->waiting(20, many);
@@ -180,7 +175,7 @@ TEST_F(EventSpoolTest, ThreadsAndProcessesMayShareAFile) {
     removed += batch.size();
     one->checkpoint();
   }
-  for (std::thread& thread : threads) thread.join();
+  threads.join();
   const std::size_t left = other->waiting(10'000, 1 << 20).size();
   EXPECT_EQ(removed + left, 4u * each);
   EXPECT_EQ(one->droppedCount(), 0);

@@ -1,10 +1,9 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Tallyhouse/SpoolingTransport.h>
 
-#include <latch>
 #include <semaphore>
-#include <thread>
 
+#include <Tests/Support/Crew.h>
 #include <Tests/Tallyhouse/SpoolFixture.h>
 #include <Varnel/Platform/Testing/FakeHTTPClient.h>
 #include <Varnel/Tallyhouse/AnalyticsTracker.h>
@@ -51,14 +50,9 @@ TEST_F(SpoolingTransportTest, TakesHTTPSUnlessToldOtherwise) {
 TEST_F(SpoolingTransportTest, EventsOfManyThreadsAllArrive) {
   const auto transport = std::shared_ptr(make());
   AnalyticsTracker tracker({clock}, transport);
-  std::latch start(4);
-  std::vector<std::thread> threads;
-  for (int i = 0; i < 4; ++i)
-    threads.emplace_back([&] {
-      start.arrive_and_wait();
-      for (int n = 0; n < 100; ++n) track(tracker, "Go");
-    });
-  for (std::thread& thread : threads) thread.join();
+  Varnel::Tests::Crew(4, [&](unsigned) {
+    for (int n = 0; n < 100; ++n) track(tracker, "Go");
+  });
   EXPECT_TRUE(transport->drain(30s));
   std::ptrdiff_t lines = 0;
   for (const HTTPPost& post : http.posts())
