@@ -18,10 +18,7 @@ using Varnel::Platform::PropertyList;
 constexpr auto largest = std::numeric_limits<std::int64_t>::max();
 
 TEST(JSON, IsReadFromTexts) {
-  const struct {
-    std::string_view text;
-    JSON value;
-  } rows[] = {
+  const std::pair<std::string_view, JSON> rows[] = {
       {" null\n", nullptr},
       {"true", true},
       {"-9223372036854775808", std::numeric_limits<std::int64_t>::min()},
@@ -35,9 +32,9 @@ TEST(JSON, IsReadFromTexts) {
       {R"({"b": [1], "a": {"": null}, "b": 2})",
        PropertyDictionary{{"a", PropertyDictionary{{"", nullptr}}}, {"b", 2}}},
   };
-  for (const auto& row : rows) {
-    EXPECT_EQ(parseJSON(row.text), row.value) << row.text;
-    EXPECT_EQ(parseJSON(jsonText(row.value)), row.value) << row.text;
+  for (const auto& [text, value] : rows) {
+    EXPECT_EQ(parseJSON(text), value) << text;
+    EXPECT_EQ(parseJSON(jsonText(value)), value) << text;
   }
 }
 

@@ -1,8 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
 
-#include <condition_variable>
-#include <mutex>
+#include <atomic>
 #include <set>
 
 #include <Tests/Support/MountNamespace.h>
@@ -57,33 +56,22 @@ class Listener {
     return [this](const VolumeChange& change) {
       if (change.volumeURL != url_) return;
       const bool isListed = catalog_.volumeName(url_).has_value();
-      const std::lock_guard lock(mutex_);
-      ++told_;
-      isConsistent_ &= isListed == (change.kind == VolumeChange::Kind::mounted);
-      changed_.notify_all();
+      if (isListed != (change.kind == VolumeChange::Kind::mounted)) isConsistent = false;
+      ++told;
+      told.notify_all();
     };
   }
 
   void waitUntilTold(int count) {
-    std::unique_lock lock(mutex_);
-    changed_.wait(lock, [&] { return told_ >= count; });
+    for (int before; (before = told) < count;) told.wait(before);
   }
-  int told() {
-    const std::lock_guard lock(mutex_);
-    return told_;
-  }
-  bool isConsistent() {
-    const std::lock_guard lock(mutex_);
-    return isConsistent_;
-  }
+
+  std::atomic<int> told = 0;
+  std::atomic<bool> isConsistent = true;
 
  private:
   VolumeCatalog& catalog_;
   const URL url_;
-  std::mutex mutex_;  ///< Owns the rest.
-  std::condition_variable changed_;
-  int told_ = 0;
-  bool isConsistent_ = true;
 };
 
 template <typename Type>
@@ -156,9 +144,9 @@ TYPED_TEST(VolumeCatalogContract, TellsOfAChangeOnceTheListShowsIt) {
   second.waitUntilTold(3);
   subject.unmount(url);
   second.waitUntilTold(4);
-  EXPECT_EQ(first.told(), 2) << "a subscription that has ended hears nothing";
-  EXPECT_TRUE(first.isConsistent());
-  EXPECT_TRUE(second.isConsistent());
+  EXPECT_EQ(first.told, 2) << "a subscription that has ended hears nothing";
+  EXPECT_TRUE(first.isConsistent);
+  EXPECT_TRUE(second.isConsistent);
 }
 
 }  // namespace

@@ -46,13 +46,10 @@ class DiskDataTest : public ::testing::Test {
 };
 
 TEST_F(DiskDataTest, AdmitsAsManyThreadsAsTheDiskBears) {
-  const struct {
-    OVDiskKind kind;
-    int limit;
-  } cases[] = {{OVDiskKindUnknown, 1},          {OVDiskKindSolidState, 4},
-               {OVDiskKindRotational, 2},       {OVDiskKindNetwork, 1},
-               {OVDiskKindExternal, 1},         {static_cast<OVDiskKind>(7), 7},
-               {static_cast<OVDiskKind>(-1), 0}};
+  const std::pair<OVDiskKind, int> cases[] = {
+      {OVDiskKindUnknown, 1},          {OVDiskKindSolidState, 4}, {OVDiskKindRotational, 2},
+      {OVDiskKindNetwork, 1},          {OVDiskKindExternal, 1},   {static_cast<OVDiskKind>(7), 7},
+      {static_cast<OVDiskKind>(-1), 0}};
   for (const auto& [kind, limit] : cases) {
     const auto data = disk(kind);
     int admitted = 0;
@@ -80,12 +77,10 @@ TEST_F(DiskDataTest, GrantsByClassAndWithinAClassInOrder) {
   const auto data = disk(OVDiskKindUnknown);
   EXPECT_FALSE(request(*data, first));
   // In the order of their coming, with the place that each should get.
-  const struct {
-    QoS qos;
-    std::size_t place;
-  } cases[] = {{QoS::background, 7}, {QoS::utility, 5},           {QoS::default_, 2},
-               {QoS::background, 8}, {QoS::userInteractive, 0},   {QoS::userInitiated, 3},
-               {QoS::default_, 4},   {static_cast<QoS>(0x15), 1}, {QoS::utility, 6}};
+  const std::pair<QoS, std::size_t> cases[] = {
+      {QoS::background, 7}, {QoS::utility, 5},           {QoS::default_, 2},
+      {QoS::background, 8}, {QoS::userInteractive, 0},   {QoS::userInitiated, 3},
+      {QoS::default_, 4},   {static_cast<QoS>(0x15), 1}, {QoS::utility, 6}};
   std::vector<std::shared_ptr<DiskData::AccessRequest>> expected(std::size(cases));
   for (const auto& [qos, place] : cases) expected[place] = request(*data, second, qos);
   const auto granted = queue_->sync([&] { return data->claimPendingRequests(); });
@@ -140,19 +135,17 @@ TEST(WaitingDeadline, KeepsToTheCalendar) {
   using std::chrono::microseconds;
   constexpr double infinity = std::numeric_limits<double>::infinity();
   const Date now = std::chrono::sys_days(std::chrono::year(2026) / 3 / 14);
-  const struct {
-    std::optional<double> timeout;
-    Date deadline;
-  } cases[] = {{std::nullopt, Date::max()},
-               {0, now},
-               {-1, now},
-               {-infinity, now},
-               {1.5, now + microseconds(1'500'000)},
-               {1e10, now + microseconds(10'000'000'000'000'000)},
-               {1e13, Date::max()},
-               {1e300, Date::max()},
-               {infinity, Date::max()},
-               {std::numeric_limits<double>::quiet_NaN(), Date::max()}};
+  const std::pair<std::optional<double>, Date> cases[] = {
+      {std::nullopt, Date::max()},
+      {0, now},
+      {-1, now},
+      {-infinity, now},
+      {1.5, now + microseconds(1'500'000)},
+      {1e10, now + microseconds(10'000'000'000'000'000)},
+      {1e13, Date::max()},
+      {1e300, Date::max()},
+      {infinity, Date::max()},
+      {std::numeric_limits<double>::quiet_NaN(), Date::max()}};
   for (const auto& [timeout, deadline] : cases)
     EXPECT_EQ(waitingDeadline(now, timeout), deadline) << timeout.value_or(-99);
 }

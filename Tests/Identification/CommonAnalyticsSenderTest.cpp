@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Identification/Analytics/CommonAnalyticsSender.h>
 
-#include <cmath>
 #include <latch>
 #include <limits>
 #include <thread>

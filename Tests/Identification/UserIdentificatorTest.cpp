@@ -120,10 +120,7 @@ TEST_F(UserIdentificatorTest, TheLastPrimaryAddressIsWrittenInSixBytes) {
 
 TEST_F(UserIdentificatorTest, TheDownloadNamesItsCampaign) {
   EXPECT_EQ(user.downloadSourceURLString(), std::nullopt);
-  const struct {
-    const char* url;
-    Text cid;
-  } cases[] = {
+  const std::pair<const char*, Text> cases[] = {
       {"https://example.org/a.dmg?lang=de&cid=12.34&cid=5", "12.34"},
       {"https://example.org/a b.dmg?x=ä&cid=1#top", "1"},
       {"https://example.org/a.dmg?CID=1&acid=2&cid1=3", std::nullopt},
@@ -136,18 +133,15 @@ TEST_F(UserIdentificatorTest, TheDownloadNamesItsCampaign) {
       {"?cid=7", "7"},
       {"", std::nullopt},
   };
-  for (const auto& each : cases) {
-    download(each.url);
-    EXPECT_EQ(user.downloadSourceURLString(), each.url);
-    EXPECT_EQ(user.downloadSourceURLCid(), each.cid) << each.url;
+  for (const auto& [url, cid] : cases) {
+    download(url);
+    EXPECT_EQ(user.downloadSourceURLString(), url);
+    EXPECT_EQ(user.downloadSourceURLCid(), cid) << url;
   }
 }
 
 TEST_F(UserIdentificatorTest, TheClientIdentifierIsCutFromTheFirstCookieOfTheDomain) {
-  const struct {
-    std::vector<Cookie> stored;
-    Text value;
-  } cases[] = {
+  const std::pair<std::vector<Cookie>, Text> cases[] = {
       {{}, std::nullopt},
       {{analyticsCookie("GA1.2.1"), analyticsCookie("GA1.2.2")}, "1"},
       {{analyticsCookie("GA1.2."), analyticsCookie("GA1.2.2")}, std::nullopt},
@@ -161,9 +155,9 @@ TEST_F(UserIdentificatorTest, TheClientIdentifierIsCutFromTheFirstCookieOfTheDom
       {{{".quennel.example", "/", "_GA", "GA1.2.1"}, {".quennel.example", "/", "_gat", "GA1.2.1"}},
        std::nullopt},
   };
-  for (const auto& each : cases) {
-    cookies.ofGroup["Cookies"] = each.stored;
-    EXPECT_EQ(user.GACookieValue(), each.value);
+  for (const auto& [stored, value] : cases) {
+    cookies.ofGroup["Cookies"] = stored;
+    EXPECT_EQ(user.GACookieValue(), value);
   }
   cookies.own = {analyticsCookie("GA1.2.own")};
   EXPECT_EQ(user.GACookieValue(), std::nullopt);

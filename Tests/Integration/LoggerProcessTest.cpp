@@ -114,11 +114,6 @@ TEST_F(LoggerProcessTest, GoesOnWhenTheDiskIsFull) {
   EXPECT_THAT(printed, HasSubstr(report + report + report));
 }
 
-TEST_F(LoggerProcessTest, KeepsItsFileApartFromAClosedStandardOutput) {
-  (void)run("exit A 3 0 >&-");
-  EXPECT_EQ(std::ranges::count(log(), '\n'), 3) << log();
-}
-
 TEST_F(LoggerProcessTest, OutlivesTheReaderOfItsStandardOutput) {
   // A few entries meet the closed pipe only when the process ends.
   for (const std::string count : {"3", "2000"}) {

@@ -101,12 +101,10 @@ TEST_F(MockedDisks, FixedDisksAreDevicesWithTheirKindAndTheStickIsNone) {
   const auto& solidState = *all[0];
   EXPECT_EQ(solidState.uniqueID(), "NVME-1");
   EXPECT_EQ(solidState.kind(), OVDiskKindSolidState);
-  EXPECT_EQ(solidState.maxTreads(), 4);
   EXPECT_THAT(*solidState.volumeURLs(), IsEmpty());
   const auto& rotational = *all[1];
   EXPECT_EQ(rotational.uniqueID(), "SATA-1");
   EXPECT_EQ(rotational.kind(), OVDiskKindRotational);
-  EXPECT_EQ(rotational.maxTreads(), 2);
   // Where the running system's root lies on no block device, it cannot lie on a mocked one.
   if (!numberOfRoot().starts_with("0:")) {
     EXPECT_THAT(*rotational.volumeURLs(), Contains(Platform::URL::fileURLWithPath("/")));

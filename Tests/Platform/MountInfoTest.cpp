@@ -62,10 +62,7 @@ TEST(MountInfo, KeepsOnlyTheMountsThatAPathCanReach) {
            " rw - tmpfs t rw\n";
   };
   const std::string root = line(1, 0, "/");
-  const struct {
-    std::string table;
-    std::vector<std::string> reachable;
-  } cases[] = {
+  const std::pair<std::string, std::vector<std::string>> cases[] = {
       {root + line(2, 1, "/a") + line(3, 2, "/a/b"), {"1/", "2/a", "3/a/b"}},
       // stacked on the same folder: the last one is seen
       {root + line(2, 1, "/a") + line(3, 2, "/a") + line(4, 3, "/a"), {"1/", "4/a"}},
@@ -80,7 +77,7 @@ TEST(MountInfo, KeepsOnlyTheMountsThatAPathCanReach) {
       {line(1, 1, "/") + line(2, 1, "/a") + line(9, 77, "/b"), {"1/", "2/a", "9/b"}},
       {line(5, 6, "/a") + line(6, 5, "/b"), {}},
   };
-  for (const auto& each : cases) EXPECT_EQ(reachableTargets(each.table), each.reachable);
+  for (const auto& [table, reachable] : cases) EXPECT_EQ(reachableTargets(table), reachable);
 }
 
 TEST(FileSystemTypes, OnlyTheKernelsOwnAreNoVolumesAndOnlyRemoteOnesAreNetwork) {

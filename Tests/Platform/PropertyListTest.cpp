@@ -174,10 +174,7 @@ TEST(PropertyList, RefusesWhatIsNone) {
 }
 
 TEST(PropertyList, RefusesNumbersAndDatesThatAreNone) {
-  const struct {
-    const char* element;
-    std::vector<const char*> texts;
-  } rows[] = {
+  const std::pair<const char*, std::vector<const char*>> rows[] = {
       {"integer",
        {"", " ", "abc", "42abc", "4 2", "1.5", "--5", "- 5", "-+5", "010", "0x", "0xG",
         "4<!-- -->2", "<![CDATA[42]]>", "&#52;2", "-9223372036854775809", "18446744073709551616",

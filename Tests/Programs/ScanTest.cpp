@@ -15,7 +15,6 @@
 #include <random>
 #include <set>
 #include <sstream>
-#include <thread>
 
 #include <Scan/DuplicateFinder.h>
 #include <Tests/Programs/ScanFakes.h>

@@ -98,18 +98,15 @@ class DownloadSource : public testing::Test {
 };
 
 TEST_F(DownloadSource, TheApplicationsOwnAttributeDecides) {
-  const struct {
-    const char* attribute;
-    const char* event;
-  } cases[] = {
+  const std::pair<const char*, const char*> cases[] = {
       {"0083;5f3a;Browser;bundle", "bundle"}, {"0083;5f3a;Browser;bundle;more", "bundle"},
       {"0083;5f3a;Browser;BUNDLE", "named"},  {"0083;5f3a;Browser;", ""},
       {"0083;5f3a;Browser", "named"},         {"0083;5f3a;Browser;\xFF", "named"},
   };
   EXPECT_EQ(trace(application), "named");
-  for (const auto& each : cases) {
-    ASSERT_TRUE(Tests::setQuarantineAttribute(application, each.attribute));
-    EXPECT_EQ(trace(application), each.event) << each.attribute;
+  for (const auto& [attribute, event] : cases) {
+    ASSERT_TRUE(Tests::setQuarantineAttribute(application, attribute));
+    EXPECT_EQ(trace(application), event) << attribute;
   }
   EXPECT_EQ(log.text(), "");
 }

@@ -35,10 +35,7 @@ const Question questions[] = {
 };
 
 TEST(FriendsLocator, EachProductAnswersForItselfAndItsFamily) {
-  const struct {
-    const char* installed;
-    std::set<std::string> yes;
-  } cases[] = {
+  const std::pair<const char*, std::set<std::string>> cases[] = {
       {"com.quennel.Kelvane", {"Kelvane", "KelvaneClassic"}},
       {"com.quennel.Kelvane2", {"Kelvane", "Kelvane2"}},
       {"com.quennel.Kelvane3", {"Kelvane", "Kelvane3"}},
@@ -54,12 +51,12 @@ TEST(FriendsLocator, EachProductAnswersForItselfAndItsFamily) {
   };
   const auto workspace = std::make_shared<Platform::Testing::FakeWorkspace>();
   OVFriendsLocator::sharedLocator().setWorkspace(workspace);
-  for (const auto& each : cases) {
-    workspace->applications = {{each.installed, URL::fileURLWithPath("/opt/app")}};
+  for (const auto& [installed, expected] : cases) {
+    workspace->applications = {{installed, URL::fileURLWithPath("/opt/app")}};
     std::set<std::string> yes;
     for (const Question& question : questions)
       if (question.ask()) yes.insert(question.name);
-    EXPECT_EQ(yes, each.yes) << each.installed;
+    EXPECT_EQ(yes, expected) << installed;
   }
 }
 

@@ -35,13 +35,10 @@ void addKeys(const std::string& code, std::map<std::string, int>& keys) {
 
 // The keys that the code looks up, with the number of texts that each puts into its format.
 std::map<std::string, int> keysOfTheCode() {
-  std::map<std::string, int> keys = {{"Never", 0},
-                                     {"Weekly", 0},
-                                     {"Once In Two Weeks", 0},
-                                     {"Monthly", 0},
-                                     {"Once In Three Months", 0},
-                                     {"Once In Six Months", 0},
-                                     {"Annually", 0}};
+  std::map<std::string, int> keys;
+  for (const char* period : {"Never", "Weekly", "Once In Two Weeks", "Monthly",
+                             "Once In Three Months", "Once In Six Months", "Annually"})
+    keys[period] = 0;
   for (const auto& entry : fs::recursive_directory_iterator(VARNEL_TEST_SOURCES))
     if (entry.path().extension() == ".cpp") addKeys(bytesOf(entry.path()), keys);
   return keys;

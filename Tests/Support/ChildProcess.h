@@ -43,12 +43,7 @@ class ChildProcess final {
   }
 
   /// The next line without its end, waited for; what there is when the output ends.
-  std::string readLine() {
-    std::string line;
-    for (int c = std::fgetc(output_); c != EOF && c != '\n'; c = std::fgetc(output_))
-      line += static_cast<char>(c);
-    return line;
-  }
+  std::string readLine() { return readUntil('\n'); }
 
   /// The next bytes, waited for.
   std::string read(std::size_t size) {
@@ -58,12 +53,7 @@ class ChildProcess final {
   }
 
   /// All that is left, waited for until the output ends.
-  std::string readAll() {
-    std::string text;
-    for (int c = std::fgetc(output_); c != EOF; c = std::fgetc(output_))
-      text += static_cast<char>(c);
-    return text;
-  }
+  std::string readAll() { return readUntil(EOF); }
 
   /// Waits for its end; its exit status, or as a shell tells a signal.
   int wait() {
@@ -84,6 +74,13 @@ class ChildProcess final {
   }
 
  private:
+  std::string readUntil(int end) {
+    std::string text;
+    for (int c = std::fgetc(output_); c != EOF && c != end; c = std::fgetc(output_))
+      text += static_cast<char>(c);
+    return text;
+  }
+
   ::pid_t process_ = 0;
   std::FILE* output_ = nullptr;
 };

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <sys/socket.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -16,23 +17,20 @@ class OtherProcess final {
  public:
   template <typename Prepare>
   explicit OtherProcess(Prepare prepare) {
-    std::array<int, 2> ready{};
-    std::array<int, 2> leave{};
-    if (::pipe(ready.data()) != 0 || ::pipe(leave.data()) != 0) throw std::runtime_error("pipe");
+    std::array<int, 2> ends{};
+    if (::socketpair(AF_UNIX, SOCK_STREAM, 0, ends.data()) != 0) throw std::runtime_error("socket");
     process_ = ::fork();
+    char byte = 0;
     if (process_ == 0) {
-      ::close(leave[1]);
+      ::close(ends[0]);
       const auto kept = prepare();
-      char byte = kept ? 1 : 0;
-      if (::write(ready[1], &byte, 1) == 1) static_cast<void>(::read(leave[0], &byte, 1));
+      byte = kept ? 1 : 0;
+      if (::write(ends[1], &byte, 1) == 1) static_cast<void>(::read(ends[1], &byte, 1));
       ::_exit(0);
     }
-    ::close(ready[1]);
-    ::close(leave[0]);
-    leave_ = leave[1];
-    char byte = 0;
-    isReady_ = ::read(ready[0], &byte, 1) == 1 && byte == 1;
-    ::close(ready[0]);
+    ::close(ends[1]);
+    leave_ = ends[0];
+    isReady_ = ::read(leave_, &byte, 1) == 1 && byte == 1;
   }
   ~OtherProcess() {
     ::close(leave_);
