@@ -12,7 +12,7 @@
 namespace Varnel::Platform {
 
 struct WatchedMainQueue::FirstRun {
-  std::mutex mutex;  // Owns hasCome.
+  std::mutex mutex;  // Owns hasCome. The report is written under it, so that none follows the end.
   std::condition_variable came;
   bool hasCome = false;
 
@@ -21,9 +21,12 @@ struct WatchedMainQueue::FirstRun {
     hasCome = true;
     came.notify_all();
   }
-  bool comesWithin(std::chrono::milliseconds patience) {
+  void reportUnlessItComes(SystemLog& systemLog, std::chrono::milliseconds patience) {
     std::unique_lock lock(mutex);
-    return came.wait_for(lock, patience, [this] { return hasCome; });
+    if (came.wait_for(lock, patience, [this] { return hasCome; })) return;
+    systemLog.write(
+        "Nothing has run the main queue so far: notifications, sounds and progress wait for it. A "
+        "host whose main loop does not run it has to, by its descriptor.");
   }
 };
 
@@ -36,7 +39,6 @@ WatchedMainQueue::WatchedMainQueue(std::unique_ptr<MainQueue> queue, SystemLog& 
 
 WatchedMainQueue::~WatchedMainQueue() {
   firstRun_->come();
-  if (thread_.joinable()) thread_.join();
 }
 
 void WatchedMainQueue::post(Block block) {
@@ -46,12 +48,9 @@ void WatchedMainQueue::post(Block block) {
 
 void WatchedMainQueue::watch() try {
   queue_->post([firstRun = firstRun_] { firstRun->come(); });
-  thread_ = startThread("queue-watch", [this] {
-    if (!firstRun_->comesWithin(patience_))
-      systemLog_.write(
-          "Nothing has run the main queue so far: notifications, sounds and progress wait for it. "
-          "A host whose main loop does not run it has to, by its descriptor.");
-  });
+  startThread("queue-watch", [firstRun = firstRun_, &systemLog = systemLog_, patience = patience_] {
+    firstRun->reportUnlessItComes(systemLog, patience);
+  }).detach();
 } catch (const std::system_error&) {
   // Without a free thread nothing is reported.
 }

@@ -5,7 +5,6 @@
 #include <chrono>
 #include <memory>
 #include <optional>
-#include <thread>
 
 #include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
@@ -52,7 +51,6 @@ class VARNEL_API WatchedMainQueue final : public MainQueue {
   const std::chrono::milliseconds patience_;
   const std::shared_ptr<FirstRun> firstRun_;
   std::atomic<bool> isWatched_ = false;
-  std::thread thread_;  // Belongs to the one post that starts it.
 };
 
 }  // namespace Varnel::Platform

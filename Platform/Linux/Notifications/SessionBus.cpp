@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/Linux/Notifications/SessionBus.h>
 
+#include <mutex>
 #include <system_error>
 #include <utility>
 
@@ -19,16 +20,28 @@ std::string take(GError* error) {
   return text;
 }
 
+// Orders what a thread does before it hands a block over, and what the main loop does with it. GLib
+// orders them as well, out of the thread sanitizer's sight.
+constinit std::mutex handOver;
+
 // Lets the source run the block once, on the main thread. The caller owns the source.
 GSource* attach(GSource* source, int priority, Block block) {
+  std::unique_lock order(handOver);
+  auto* const handed = new Block(std::move(block));
+  order.unlock();
   g_source_set_priority(source, priority);
   g_source_set_callback(
       source,
       [](gpointer data) -> gboolean {
+        std::unique_lock(handOver).unlock();
         (*static_cast<Block*>(data))();
         return G_SOURCE_REMOVE;
       },
-      new Block(std::move(block)), [](gpointer data) { delete static_cast<Block*>(data); });
+      handed,
+      [](gpointer data) {
+        std::unique_lock(handOver).unlock();
+        delete static_cast<Block*>(data);
+      });
   g_source_attach(source, nullptr);
   return source;
 }
