@@ -185,7 +185,9 @@ TEST_F(DiskAccessManagerTest, MayGoWhileSessionsAreLeft) {
   // more.
   manager_.emplace(DiskAccessManager::Ports{devices_, disks_, volumes_, scope_, center_});
   awaitInventory();
-  Basalt::SerialQueue& queue = DiskAccessGuard(begin(homeFile))->diskData()->queue();
+  // The record keeps the queue.
+  const std::shared_ptr<DiskData> disk = DiskAccessGuard(begin(homeFile))->diskData();
+  Basalt::SerialQueue& queue = disk->queue();
   const int inventories = disks_.openedSessions();
   queue.sync([&] {
     center_.post({.name = std::string(didMountNotification), .userInfo = {}});
