@@ -15,7 +15,7 @@ namespace Varnel {
 
 class ProcessFacts;
 
-/// What the process knows of itself: its name and version, the channel that it was built for,
+/// What the process knows of itself: its name and version, the channel of its product,
 /// whether a sandbox holds it. Stored facts are computed by their first reader and never change.
 ///
 ///     title = Globals::substitutingApplicationName(localized("About Orvane 2"));
@@ -65,12 +65,12 @@ class VARNEL_API Globals final {
   /// process.
   [[nodiscard]] static std::string identifier(std::string_view suffix);
 
-  /// The text with this build's name in every place of the product's default name, "Orvane 2".
+  /// The text with the product's name in every place of the default one, "Orvane 2".
   [[nodiscard]] static std::string substitutingApplicationName(std::string_view text);
   /// The same for texts in HTML, where the default name is "Orvane&nbsp;2".
   [[nodiscard]] static std::string substitutingHtmlApplicationName(std::string_view text);
 
-  /// This build's availability flag in a server's dictionary, or `defaultValue`.
+  /// The flag of the product's channel in a server's dictionary, or `defaultValue`.
   [[nodiscard]] static bool extractIsAvailable(const Basalt::JSON& dictionary, bool defaultValue);
 
   /// The bundle identifiers of the other channels' builds on this machine. Reads files.
