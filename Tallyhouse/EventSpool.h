@@ -9,7 +9,7 @@
 #include <string_view>
 #include <vector>
 
-#include <Varnel/Platform/Generic/SQLiteDatabase.h>
+#include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 #include <Varnel/Platform/Values/Date.h>
 #include <Varnel/Tallyhouse/DeliveryPolicy.h>
 

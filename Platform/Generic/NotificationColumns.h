@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <Varnel/Platform/Generic/SQLiteStatement.h>
+#include <Varnel/Platform/SQLite/SQLiteStatement.h>
 #include <Varnel/Platform/Values/UserNotification.h>
 
 namespace Varnel::Platform {

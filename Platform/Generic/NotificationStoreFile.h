@@ -6,7 +6,7 @@
 #include <optional>
 #include <string>
 
-#include <Varnel/Platform/Generic/SQLiteDatabase.h>
+#include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 
 namespace Varnel::Platform {
 

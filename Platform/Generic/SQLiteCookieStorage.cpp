@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/Generic/SQLiteCookieStorage.h>
 
-#include <Varnel/Platform/Generic/SQLiteDatabase.h>
 #include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 
 namespace Varnel::Platform {
 namespace {

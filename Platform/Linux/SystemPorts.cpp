@@ -10,6 +10,7 @@
 #include <Varnel/Platform/Ports/MachineIdentity.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/ProcessInfo.h>
 #include <Varnel/Platform/Ports/ProcessLauncher.h>
 #include <Varnel/Platform/Ports/SecurityScope.h>
@@ -66,6 +67,7 @@ const Ports& systemPorts() {
       .httpClient = keep(POSIX::makeHTTPClient()),
       .machineIdentity = keep(Linux::makeMachineIdentity()),
       .mainQueue = mainQueue,
+      .privateFiles = keep(POSIX::makePrivateFiles()),
       .processInfo = keep(Linux::makeProcessInfo()),
       .processLauncher = keep(Linux::makeProcessLauncher()),
       .securityScope = keep(POSIX::makeSecurityScope()),

@@ -8,6 +8,7 @@ namespace Varnel::Platform {
 class AppendFiles;
 class Clock;
 class HTTPClient;
+class PrivateFiles;
 class SecurityScope;
 class SystemLog;
 class UserAccount;
@@ -22,6 +23,7 @@ namespace Varnel::Platform::POSIX {
 [[nodiscard]] std::unique_ptr<Clock> makeClock();
 /// Every post fails when the module of libcurl is missing.
 [[nodiscard]] std::unique_ptr<HTTPClient> makeHTTPClient();
+[[nodiscard]] std::unique_ptr<PrivateFiles> makePrivateFiles();
 [[nodiscard]] std::unique_ptr<SecurityScope> makeSecurityScope();
 [[nodiscard]] std::unique_ptr<SystemLog> makeSystemLog();
 [[nodiscard]] std::unique_ptr<UserAccount> makeUserAccount();

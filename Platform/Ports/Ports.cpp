@@ -28,6 +28,7 @@ Ports Ports::withStandardOutput(StandardOutput& output) const {
       .httpClient = httpClient,
       .machineIdentity = machineIdentity,
       .mainQueue = mainQueue,
+      .privateFiles = privateFiles,
       .processInfo = processInfo,
       .processLauncher = processLauncher,
       .securityScope = securityScope,

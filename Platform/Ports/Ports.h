@@ -15,6 +15,7 @@ class ExtendedAttributes;
 class HTTPClient;
 class MachineIdentity;
 class MainQueue;
+class PrivateFiles;
 class ProcessInfo;
 class ProcessLauncher;
 class SecurityScope;
@@ -46,6 +47,7 @@ struct Ports {
   HTTPClient& httpClient;
   MachineIdentity& machineIdentity;
   MainQueue& mainQueue;
+  PrivateFiles& privateFiles;
   ProcessInfo& processInfo;
   ProcessLauncher& processLauncher;
   SecurityScope& securityScope;

@@ -4,11 +4,11 @@
 #include <string_view>
 #include <utility>
 
-#include <Varnel/Platform/Generic/SQLiteDatabase.h>
 #include <Varnel/Platform/Ports/ExtendedAttributes.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
+#include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 #include <Varnel/Platform/Text/UTF8.h>
 #include <Varnel/Provenance/DownloadList.h>
 

@@ -9,7 +9,7 @@
 #include <Tests/Support/OpenDescriptors.h>
 #include <Tests/Support/OtherProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
-#include <Varnel/Platform/Generic/SQLiteDatabase.h>
+#include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 #include <Varnel/Platform/Testing/SimulatedClock.h>
 
 namespace Varnel::Platform {

@@ -7,7 +7,7 @@
 #include <stdexcept>
 #include <string>
 
-#include <Varnel/Platform/Generic/SQLiteDatabase.h>
+#include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 
 namespace Varnel::Tests {
 

@@ -33,6 +33,8 @@ class SQLiteStatement final {
   void bind(int index, std::int64_t value);
   void bind(int index, std::string_view text);
   void bindNull(int index);
+  /// Binds the column of another statement's row, whatever its type is.
+  void bind(int index, SQLiteStatement& row, int column);
 
   /// Fetches the next row or runs the statement to its end.
   [[nodiscard]] Result<Step> step();

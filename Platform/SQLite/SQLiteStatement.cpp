@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: MIT
-#include <Varnel/Platform/Generic/SQLiteStatement.h>
+#include <Varnel/Platform/SQLite/SQLiteStatement.h>
 
 #include <sqlite3.h>
 
 #include <cassert>
 
-#include <Varnel/Platform/Generic/SQLiteError.h>
+#include <Varnel/Platform/SQLite/SQLiteError.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -32,6 +32,11 @@ void SQLiteStatement::bind(int index, std::string_view text) {
 
 void SQLiteStatement::bindNull(int index) {
   expectOK(::sqlite3_bind_null(statement_.get(), index));
+}
+
+void SQLiteStatement::bind(int index, SQLiteStatement& row, int column) {
+  expectOK(::sqlite3_bind_value(statement_.get(), index,
+                                ::sqlite3_column_value(row.statement_.get(), column)));
 }
 
 Result<SQLiteStatement::Step> SQLiteStatement::step() {

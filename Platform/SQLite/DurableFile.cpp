@@ -1,0 +1,359 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Platform/SQLite/DurableFile.h>
+
+#include <array>
+#include <atomic>
+#include <filesystem>
+#include <utility>
+
+#include <Varnel/Platform/Concurrency/ForkedChild.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/SQLite/Salvage.h>
+#include <fmt/format.h>
+
+namespace Varnel::Platform {
+
+// What lies beside the file PATH:
+//   PATH-journal, PATH-wal, PATH-shm    the library's
+//   PATH.lock                           held while the file is opened, set aside or replaced, so
+//   that
+//                                       no two processes do that at once
+//   PATH.salvage                        was set aside, and its rows are not taken over yet
+//   PATH.damaged                        was set aside, and its rows are taken over
+// A process may be killed after each step: the next one to open the file goes on from there.
+//
+// A file that has lost its journal is set aside as well. A new one has another identity, so that
+// all other connections notice, and shares nothing with what they still have in memory.
+
+namespace {
+
+namespace fs = std::filesystem;
+
+constexpr const char* lockSuffix = ".lock";
+constexpr const char* pendingSuffix = ".salvage";
+constexpr const char* asideSuffix = ".damaged";
+constexpr std::array<const char*, 3> journalSuffixes{"-wal", "-shm", "-journal"};
+
+// A file that is taken away this often within one operation is beyond help.
+constexpr int maxRounds = 4;
+// The log is moved into the file when it has this many pages, unless somebody does so before.
+constexpr int maxLoggedPages = 8000;
+
+// An error that another attempt cannot mend, and that is worth a line in the log.
+bool isWorthALine(SQLiteFailure meaning) {
+  return meaning != SQLiteFailure::busy && meaning != SQLiteFailure::damaged;
+}
+
+// Whether the connection keeps a write-ahead log.
+bool loggedMode(SQLiteDatabase& database) {
+  auto mode = database.prepare("PRAGMA journal_mode");
+  return mode && mode->step() && mode->text(0) == "wal";
+}
+
+bool isDamage(const std::optional<PlatformError>& error) {
+  return error && meaningOf(*error) == SQLiteFailure::damaged;
+}
+
+// The library's connections are of no use in a forked child, and not even to be closed there.
+std::atomic<int> forks = 0;
+
+int forksSoFar() {
+  [[maybe_unused]] static const bool isWatched = [] {
+    callInForkedChildren([] { ++forks; });
+    return true;
+  }();
+  return forks.load(std::memory_order_relaxed);
+}
+
+}  // namespace
+
+struct DurableFile::Connection {
+  SQLiteDatabase database;
+  FileIdentity file;
+  std::optional<FileIdentity> journal;  ///< The write-ahead log, if there is one.
+  int forksBefore = forksSoFar();
+};
+
+DurableFile::DurableFile(Ports ports, const std::string& path, DurableFormat format,
+                         Migrating migrating)
+    : ports_(ports),
+      path_(fs::absolute(path).string()),
+      logPath_(path_ + "-wal"),
+      format_(std::move(format)),
+      migrating_(migrating) {}
+
+DurableFile::~DurableFile() {
+  if (isFromBeforeFork()) static_cast<void>(connection_.release());
+}
+
+DurableFile::Failure DurableFile::read(const Work& work) {
+  return attempt([&](SQLiteDatabase& database) { return database.transaction("BEGIN", work); });
+}
+
+DurableFile::Failure DurableFile::change(const Work& work) {
+  return attempt(
+      [&](SQLiteDatabase& database) { return database.transaction("BEGIN IMMEDIATE", work); });
+}
+
+DurableFile::Failure DurableFile::changeByOneStatement(const Work& work) {
+  return attempt([&](SQLiteDatabase& database) {
+    auto error = work(database);
+    database.finishCached();
+    return error;
+  });
+}
+
+void DurableFile::checkpoint() {
+  loggedPages_ = 0;
+  if (!connection_ || isFromBeforeFork() || isLost()) return;
+  deadline_.restart();
+  static_cast<void>(connection_->database.execute("PRAGMA wal_checkpoint(PASSIVE)"));
+}
+
+std::int64_t DurableFile::damageCount() {
+  std::int64_t count = 0;
+  static_cast<void>(read([&](SQLiteDatabase& database) -> Failure {
+    const auto found = database.integer("SELECT damages FROM durable_file");
+    if (!found) return found.error();
+    count = found->value_or(0);
+    return std::nullopt;
+  }));
+  return count;
+}
+
+void DurableFile::removeSetAside() {
+  for (const char* aside : {pendingSuffix, asideSuffix}) {
+    static_cast<void>(ports_.privateFiles.remove(path_ + aside));
+    for (const char* suffix : journalSuffixes)
+      static_cast<void>(ports_.privateFiles.remove(path_ + aside + suffix));
+  }
+}
+
+DurableFile::Failure DurableFile::attempt(const Work& operation) {
+  if (isFromBeforeFork()) return fileError(SQLiteFailure::refused, path_ + " is the parent's");
+  deadline_.restart();
+  Failure error;
+  for (int round = 0; round < maxRounds; ++round) {
+    if ((error = ensureOpen())) return said(*error);
+    error = operation(connection_->database);
+    if (isLost()) {
+      error = replaceLost();
+    } else if (isDamage(error)) {
+      error = setAside(*error);
+    } else {
+      if (loggedPages_ >= maxLoggedPages) checkpoint();
+      return error;
+    }
+    if (error) return said(*error);
+  }
+  return said(fileError(SQLiteFailure::other, path_ + " is taken away again and again"));
+}
+
+bool DurableFile::isFromBeforeFork() const {
+  return connection_ && connection_->forksBefore != forksSoFar();
+}
+
+// Whether what the connection writes can still be found by the path.
+bool DurableFile::isLost() const {
+  const auto file = ports_.privateFiles.identity(path_);
+  if (!file || file->isEmpty || *file != connection_->file) return true;
+  return connection_->journal && ports_.privateFiles.identity(logPath_) != connection_->journal;
+}
+
+DurableFile::Failure DurableFile::ensureOpen() {
+  if (connection_) return std::nullopt;
+  if (const auto turn = takeTurn(); !turn) {
+    // Where nothing can be locked nothing can be changed, by anybody, but perhaps read.
+    if (meaningOf(turn.error()) != SQLiteFailure::readOnly) return turn.error();
+    if (open()) return turn.error();
+  } else {
+    auto error = open();
+    if (isDamage(error)) error = moveAside(error->localizedDescription());
+    if (!error && !connection_) error = open();
+    if (error) return error;
+    takeOverSetAside();
+  }
+  // A large file takes its time, which others need not wait for.
+  const auto error = check();
+  if (isDamage(error)) return setAside(*error);
+  if (error) connection_.reset();
+  return error;
+}
+
+// Only one who holds the lock may open, set aside or replace the file.
+Result<std::unique_ptr<FileLock>> DurableFile::takeTurn() {
+  while (true) {
+    auto lock = ports_.privateFiles.tryLock(path_ + lockSuffix);
+    if (!lock || *lock) return lock;
+    if (!deadline_.pause())
+      return fileError(SQLiteFailure::busy,
+                       path_ + " is being opened or mended by another process");
+  }
+}
+
+DurableFile::Failure DurableFile::open() {
+  finishMovingAside();
+  if (!ports_.privateFiles.identity(path_)) removeJournals();
+  const auto path = ports_.privateFiles.prepare(path_);
+  if (!path) return path.error();
+  auto database = SQLiteDatabase::open(*path, SQLiteDatabase::Access::existing);
+  if (!database) return database.error();
+  const bool isReadOnly = database->isReadOnly();
+  const Migrating migrating = isReadOnly ? Migrating::never : migrating_;
+  database->waitWithin(deadline_);
+  auto error = judgeFormat(*database, format_, migrating);
+  if (error && isReadOnly && meaningOf(*error) != SQLiteFailure::damaged) {
+    // A write-ahead log needs files beside it, even for reading. Without a log the file is whole.
+    const auto log = ports_.privateFiles.identity(logPath_);
+    if (log && !log->isEmpty) return error;
+    database = SQLiteDatabase::open(*path, SQLiteDatabase::Access::immutable);
+    if (!database) return database.error();
+    error = judgeFormat(*database, format_, migrating);
+  }
+  if (!error && !isReadOnly) error = setUp(*database, *path);
+  if (!error) error = applyFormat(*database, format_, migrating);
+  if (error) return error;
+  const auto file = ports_.privateFiles.identity(path_);
+  if (!file || database->hasMoved())
+    return fileError(SQLiteFailure::busy, path_ + " was taken away while it was opened");
+  const bool hasLog = !isReadOnly && loggedMode(*database);
+  connection_ = std::make_unique<Connection>(
+      Connection{.database = std::move(*database),
+                 .file = *file,
+                 .journal = hasLog ? ports_.privateFiles.identity(logPath_) : std::nullopt});
+  return std::nullopt;
+}
+
+DurableFile::Failure DurableFile::setUp(SQLiteDatabase& database, const std::string& path) {
+  if (const auto failure = ports_.privateFiles.protect(path);
+      failure && failure != std::errc::read_only_file_system)
+    return PlatformError(failure);
+  if (format_.journal == DurableFormat::Journal::writeAhead) {
+    const auto error = database.execute("PRAGMA journal_mode = WAL");
+    if (error && meaningOf(*error) != SQLiteFailure::other) return error;
+  }
+  loggedPages_ = 0;
+  database.countLoggedPages(loggedPages_);
+  // A journal that is emptied, not removed, is found again by no name but its own.
+  if (!loggedMode(database))
+    if (auto error = database.execute("PRAGMA journal_mode = TRUNCATE")) return error;
+  const bool isFull = format_.synchronisation == DurableFormat::Synchronisation::survivesPowerLoss;
+  return database.execute(isFull ? "PRAGMA synchronous = FULL" : "PRAGMA synchronous = NORMAL");
+}
+
+DurableFile::Failure DurableFile::check() {
+  auto verdict = connection_->database.prepare("PRAGMA quick_check(1)");
+  if (!verdict) return verdict.error();
+  const auto step = verdict->step();
+  if (!step) return step.error();
+  const std::string found(verdict->text(0).value_or("no verdict"));
+  if (found == "ok") return std::nullopt;
+  return fileError(SQLiteFailure::damaged, found);
+}
+
+DurableFile::Failure DurableFile::setAside(const PlatformError& damage) {
+  const auto damaged = std::move(connection_);
+  const auto turn = takeTurn();
+  if (!turn) return meaningOf(turn.error()) == SQLiteFailure::readOnly ? damage : turn.error();
+  // Another process may have done so meanwhile.
+  if (ports_.privateFiles.identity(path_) == damaged->file)
+    if (auto error = moveAside(damage.localizedDescription())) return error;
+  auto error = open();
+  if (!error) takeOverSetAside();
+  return error;
+}
+
+DurableFile::Failure DurableFile::replaceLost() {
+  auto lost = std::move(connection_);
+  const auto turn = takeTurn();
+  const auto fail = [&](const PlatformError& error) {
+    // Its rows may be nowhere else.
+    connection_ = std::move(lost);
+    return error;
+  };
+  if (!turn) return fail(turn.error());
+  PrivateFiles& files = ports_.privateFiles;
+  const auto there = files.identity(path_);
+  Failure error;
+  if (there == lost->file)
+    error = moveAside("its journal or what it held was taken away");
+  else if (lost->journal && files.identity(logPath_) == lost->journal)
+    removeJournals();
+  if (!error) error = open();
+  if (error) return fail(*error);
+  // Whoever has set the file aside takes its rows over, and what was written after that is done
+  // again.
+  const bool isSetAside = files.identity(path_ + pendingSuffix) == lost->file ||
+                          files.identity(path_ + asideSuffix) == lost->file;
+  if (there == lost->file || !isSetAside) {
+    if (!there) say("was removed or renamed, and is begun anew");
+    error = takeOver(&lost->database, !there);
+    if (error) return fail(*error);
+  }
+  // Two connections to one file would share what they know about its log.
+  lost.reset();
+  takeOverSetAside();
+  return std::nullopt;
+}
+
+// The file goes first: without it nobody takes the journals for those of another.
+DurableFile::Failure DurableFile::moveAside(const std::string& reason) {
+  if (const auto failure = ports_.privateFiles.rename(path_, path_ + pendingSuffix))
+    return PlatformError(failure);
+  finishMovingAside();
+  say("is set aside as " + path_ + asideSuffix + ": " + reason);
+  return std::nullopt;
+}
+
+void DurableFile::finishMovingAside() {
+  PrivateFiles& files = ports_.privateFiles;
+  if (files.identity(path_) || !files.identity(path_ + pendingSuffix)) return;
+  for (const char* suffix : journalSuffixes)
+    static_cast<void>(files.rename(path_ + suffix, path_ + pendingSuffix + suffix));
+}
+
+// Journals whose file is gone would be taken for those of the file that comes in its place. Those
+// who have them open keep what is in them.
+void DurableFile::removeJournals() {
+  for (const char* suffix : journalSuffixes)
+    static_cast<void>(ports_.privateFiles.remove(path_ + suffix));
+}
+
+// What fails here is tried again when the file is opened next.
+void DurableFile::takeOverSetAside() {
+  PrivateFiles& files = ports_.privateFiles;
+  const std::string pending = path_ + pendingSuffix;
+  if (!files.identity(pending)) return;
+  const auto resolved = files.prepare(pending);
+  if (!resolved) return;
+  {
+    auto from = SQLiteDatabase::open(*resolved, SQLiteDatabase::Access::existing);
+    if (takeOver(from ? &*from : nullptr, true)) return;
+  }
+  for (const char* suffix : journalSuffixes) {
+    static_cast<void>(files.remove(path_ + asideSuffix + suffix));
+    static_cast<void>(files.rename(pending + suffix, path_ + asideSuffix + suffix));
+  }
+  static_cast<void>(files.rename(pending, path_ + asideSuffix));
+}
+
+DurableFile::Failure DurableFile::takeOver(SQLiteDatabase* from, bool isCounted) {
+  return connection_->database.transaction("BEGIN IMMEDIATE", [&](SQLiteDatabase& to) -> Failure {
+    if (from)
+      if (auto error = salvage(*from, to, format_.tables)) return error;
+    if (!isCounted) return std::nullopt;
+    return to.execute("UPDATE durable_file SET damages = damages + 1");
+  });
+}
+
+PlatformError DurableFile::said(const PlatformError& error) {
+  if (isWorthALine(meaningOf(error)) && said_.insert(meaningOf(error)).second)
+    say("cannot be used: " + error.localizedDescription());
+  return error;
+}
+
+void DurableFile::say(const std::string& what) const {
+  ports_.systemLog.write(fmt::format("The file of {} {} {}", format_.subject, path_, what));
+}
+
+}  // namespace Varnel::Platform

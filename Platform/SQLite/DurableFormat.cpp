@@ -1,0 +1,112 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Platform/SQLite/DurableFormat.h>
+
+#include <algorithm>
+
+#include <Varnel/Platform/SQLite/SQLiteDatabase.h>
+#include <Varnel/Platform/SQLite/SQLiteFailure.h>
+#include <fmt/format.h>
+
+namespace Varnel::Platform {
+namespace {
+
+using Failure = std::optional<PlatformError>;
+
+constexpr int minorsPerMajor = 1000;
+
+// How often the file was damaged or lost.
+constexpr const char* ownSchema =
+    "CREATE TABLE durable_file(damages INTEGER NOT NULL);"
+    "INSERT INTO durable_file VALUES(0);";
+
+struct FoundFormat {
+  std::int64_t applicationID = 0;
+  FormatVersion version;
+  bool isEmpty = false;
+};
+
+Result<FoundFormat> formatOf(SQLiteDatabase& database) {
+  const auto applicationID = database.integer("PRAGMA application_id");
+  if (!applicationID) return applicationID.error();
+  const auto version = database.integer("PRAGMA user_version");
+  if (!version) return version.error();
+  const auto entries = database.integer("SELECT count(*) FROM sqlite_master");
+  if (!entries) return entries.error();
+  const auto number = static_cast<int>(version->value_or(0));
+  return FoundFormat{.applicationID = applicationID->value_or(0),
+                     .version = {number / minorsPerMajor, number % minorsPerMajor},
+                     .isEmpty = applicationID->value_or(0) == 0 && number == 0 && *entries == 0};
+}
+
+auto firstMigration(const DurableFormat& format, FormatVersion version) {
+  return std::find_if(format.migrations.begin(), format.migrations.end(),
+                      [&](const Migration& migration) { return migration.from == version; });
+}
+
+bool canMigrate(const DurableFormat& format, FormatVersion version, Migrating migrating) {
+  return migrating == Migrating::allowed && version < format.version &&
+         firstMigration(format, version) != format.migrations.end();
+}
+
+// A file that calls itself one of this very version has its tables.
+Failure missingTable(SQLiteDatabase& database, const DurableFormat& format) {
+  for (const SavedTable& table : format.tables) {
+    const auto found = database.integer(fmt::format(
+        "SELECT count(*) FROM sqlite_master WHERE type = 'table' AND name = '{}'", table.name));
+    if (!found) return found.error();
+    if (*found == 0)
+      return fileError(SQLiteFailure::damaged, fmt::format("there is no table {}", table.name));
+  }
+  return std::nullopt;
+}
+
+Failure stamp(SQLiteDatabase& database, const DurableFormat& format) {
+  return database.execute(
+      fmt::format("PRAGMA application_id = {}; PRAGMA user_version = {}", format.applicationID,
+                  format.version.major * minorsPerMajor + format.version.minor));
+}
+
+Failure migrate(SQLiteDatabase& database, const DurableFormat& format, FormatVersion version) {
+  for (auto next = firstMigration(format, version); next != format.migrations.end(); ++next)
+    if (auto error = database.execute(next->sql)) return error;
+  return stamp(database, format);
+}
+
+Failure create(SQLiteDatabase& database, const DurableFormat& format) {
+  auto error = database.execute(ownSchema);
+  if (!error) error = database.execute(format.schema);
+  return error ? error : stamp(database, format);
+}
+
+}  // namespace
+
+Failure judgeFormat(SQLiteDatabase& database, const DurableFormat& format, Migrating migrating) {
+  const auto found = formatOf(database);
+  if (!found) return found.error();
+  if (found->isEmpty) return std::nullopt;
+  if (found->applicationID != format.applicationID)
+    return fileError(SQLiteFailure::refused, "the file belongs to another application");
+  const FormatVersion version = found->version;
+  const auto named = fmt::format("the file's format is {}.{}", version.major, version.minor);
+  if (version.major > format.version.major) return fileError(SQLiteFailure::newer, named);
+  if (version.major < format.version.major && !canMigrate(format, version, migrating))
+    return fileError(SQLiteFailure::older, named);
+  return version == format.version ? missingTable(database, format) : std::nullopt;
+}
+
+Failure applyFormat(SQLiteDatabase& database, const DurableFormat& format, Migrating migrating) {
+  const auto apply = [&](SQLiteDatabase&) -> Failure {
+    const auto found = formatOf(database);
+    if (!found) return found.error();
+    if (found->isEmpty) return create(database, format);
+    if (canMigrate(format, found->version, migrating))
+      return migrate(database, format, found->version);
+    return std::nullopt;
+  };
+  const auto found = formatOf(database);
+  if (!found) return found.error();
+  if (!found->isEmpty && !canMigrate(format, found->version, migrating)) return std::nullopt;
+  return database.transaction("BEGIN IMMEDIATE", apply);
+}
+
+}  // namespace Varnel::Platform
