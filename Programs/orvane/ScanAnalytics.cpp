@@ -62,7 +62,8 @@ ScanAnalytics::ScanAnalytics(const std::optional<std::string>& endpoint, bool pr
   if (!endpoint && !printsEvents) return;
   identifyUser();
   if (endpoint) transport_ = transportTo(*URL::parse(*endpoint));
-  auto tracker = std::make_shared<Tallyhouse::AnalyticsTracker>(transport_);
+  auto tracker =
+      std::make_shared<Tallyhouse::AnalyticsTracker>(transport_, Tallyhouse::Consent::granted);
   tracker->setShouldPrintEvents(printsEvents);
   sender_ = std::make_unique<ScanSender>(std::move(tracker));
 }

@@ -141,7 +141,7 @@ class AnalyticsDeliveryTest : public testing::Test {
 
 TEST_F(AnalyticsDeliveryTest, AnEventArrivesWithAllThatItCarries) {
   Server server({"204"});
-  AnalyticsTracker tracker(transport(server.url()));
+  AnalyticsTracker tracker(transport(server.url()), Consent::granted);
   tracker.context()->trackEvent("Scan", "Finished", "100 % \xC3\xA4&=", -5,
                                 {"12.34", std::nullopt, "13.0", "3", "2", "1", "0000001", "null"},
                                 {std::nullopt, 7});
@@ -156,7 +156,7 @@ TEST_F(AnalyticsDeliveryTest, AnEventArrivesWithAllThatItCarries) {
 
 TEST_F(AnalyticsDeliveryTest, NoBehaviourOfAServerLosesOrRenamesAnEvent) {
   Server server({"503/1", "cut", "garbage", "500/99999999999999999999", "429/soon", "302", "200"});
-  AnalyticsTracker tracker(transport(server.url()));
+  AnalyticsTracker tracker(transport(server.url()), Consent::granted);
   const auto start = std::chrono::steady_clock::now();
   tracker.context()->trackEvent("Scan", "Once", std::nullopt, std::nullopt, {}, {});
   std::set<std::string> uuids;
@@ -177,7 +177,7 @@ TEST_F(AnalyticsDeliveryTest, AServerThatHangsDelaysNeitherTheCallerNorTheEnd) {
   Server server({"hang"});
   const auto start = std::chrono::steady_clock::now();
   {
-    AnalyticsTracker tracker(transport(server.url()));
+    AnalyticsTracker tracker(transport(server.url()), Consent::granted);
     tracker.context()->trackEvent("Scan", "First", std::nullopt, std::nullopt, {}, {});
     EXPECT_EQ(server.next().hits.size(), 1u);
     for (int i = 0; i < 100; ++i)
@@ -186,7 +186,7 @@ TEST_F(AnalyticsDeliveryTest, AServerThatHangsDelaysNeitherTheCallerNorTheEnd) {
   EXPECT_LT(std::chrono::steady_clock::now() - start, 10s);
   Server other({"200"});
   const auto repeated = transport(other.url());
-  AnalyticsTracker tracker(repeated);
+  AnalyticsTracker tracker(repeated, Consent::granted);
   EXPECT_TRUE(repeated->drain(30s));
   std::size_t arrived = 0;
   while (arrived < 101) arrived += other.next().hits.size();
@@ -208,7 +208,7 @@ TEST_F(AnalyticsDeliveryTest, AKilledProcessDeliversOnTheNextStart) {
   }
   Server server({"200"});
   const auto transport = this->transport(server.url());
-  AnalyticsTracker tracker(transport);
+  AnalyticsTracker tracker(transport, Consent::granted);
   EXPECT_TRUE(transport->drain(60s));
   std::set<std::string> actions;
   std::set<std::string> uuids = before;
