@@ -27,13 +27,16 @@ class FakeUserDefaults final : public UserDefaults {
   [[nodiscard]] std::optional<std::string> text(const std::string& key) const override {
     return read<std::string>(key);
   }
-  void set(const std::string& key, const Value& value) override {
+  [[nodiscard]] std::optional<PlatformError> set(const std::string& key,
+                                                 const Value& value) override {
     const std::lock_guard lock(mutex_);
     values_[key] = value;
+    return std::nullopt;
   }
-  void remove(const std::string& key) override {
+  [[nodiscard]] std::optional<PlatformError> remove(const std::string& key) override {
     const std::lock_guard lock(mutex_);
     values_.erase(key);
+    return std::nullopt;
   }
 
  private:

@@ -12,6 +12,7 @@
 #include <Tests/Support/QuarantineDatabase.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Basalt/Executor.h>
+#include <Varnel/Context/ApplicationData.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Platform/Testing/FakeProcessInfo.h>
@@ -261,7 +262,7 @@ TEST(SharedTracker, IsOneAndHoldsWhatClientsNeed) {
   const auto tracker = KVDownloadSourceTracker::sharedTracker();
   EXPECT_EQ(tracker, KVDownloadSourceTracker::sharedTracker());
   EXPECT_EQ(tracker->quarantine()->path(), KVQuarantine::systemQuarantinePathV2());
-  EXPECT_EQ(tracker->userDefaults().get(), &Platform::processPorts().userDefaults);
+  EXPECT_EQ(tracker->userDefaults().get(), &ApplicationData::settings());
   std::promise<std::thread::id> ran;
   tracker->privateQueue()->execute([&] { ran.set_value(std::this_thread::get_id()); });
   EXPECT_NE(ran.get_future().get(), std::this_thread::get_id());
