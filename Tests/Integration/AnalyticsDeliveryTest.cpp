@@ -224,10 +224,33 @@ TEST_F(AnalyticsDeliveryTest, AKilledProcessDeliversOnTheNextStart) {
   EXPECT_EQ(actions.size(), count - before.size());
 }
 
+// The exit status of the host.
+int orvane(std::vector<std::string> arguments) {
+  arguments.insert(arguments.begin(), ORVANE_PROGRAM);
+  return Varnel::Tests::ChildProcess(arguments).wait();
+}
+
+TEST_F(AnalyticsDeliveryTest, ARefusalTakesBackWhatHasNotBeenSent) {
+  ::setenv("HOME", (folder_.path() / "home").c_str(), 1);
+  const std::string scanned = folder_.write("scanned/file", "content").parent_path();
+  Server server({"204"});
+  const std::vector<std::string> away = {"scan", "--analytics", "http://127.0.0.1:1", scanned,
+                                         scanned};
+  EXPECT_EQ(orvane({"scan", "--analytics", server.url(), scanned, scanned}), 0) << "not asked";
+  ASSERT_EQ(orvane({"analytics", "consent", "yes"}), 0);
+  EXPECT_EQ(orvane(away), 0);
+  ASSERT_EQ(orvane({"analytics", "consent", "no"}), 0);
+  EXPECT_EQ(orvane({"scan", "--analytics", server.url(), scanned, scanned}), 0) << "refused";
+  ASSERT_EQ(orvane({"analytics", "consent", "yes"}), 0);
+  EXPECT_EQ(orvane({"scan", "--analytics", server.url(), scanned}), 0);
+  EXPECT_EQ(parameter(server.next().hits.at(0), "ev"), "1") << "the folders of the last scan";
+}
+
 TEST_F(AnalyticsDeliveryTest, AScanSendsItsEventsOnceWhateverItsEnvironment) {
   ::setenv("HOME", (folder_.path() / "home").c_str(), 1);
   const Proxies proxies("http://127.0.0.1:1");
   folder_.write("scanned/file", "content");
+  ASSERT_EQ(orvane({"analytics", "consent", "yes"}), 0);
   Server server({"short"});
   for (int run = 0; run < 2; ++run) {
     Varnel::Tests::ChildProcess orvane({ORVANE_PROGRAM, "scan", "--analytics",
