@@ -67,11 +67,12 @@ std::error_code writeDurably(const std::string& path, std::string_view bytes) {
   return ::fsync(file.get()) == 0 ? std::error_code() : lastError();
 }
 
-// Until then a loss of power may bring the old name back.
+// Until then a loss of power may bring the old text back. Some file systems know no such request.
 std::error_code synchroniseFolderOf(const std::string& path) {
   const std::string folder = std::filesystem::path(path).parent_path().string();
   const FileDescriptor descriptor(::open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
-  return descriptor && ::fsync(descriptor.get()) == 0 ? std::error_code() : lastError();
+  if (!descriptor) return lastError();
+  return ::fsync(descriptor.get()) == 0 || errno == EINVAL ? std::error_code() : lastError();
 }
 
 }  // namespace

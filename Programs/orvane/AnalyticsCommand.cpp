@@ -8,9 +8,10 @@
 namespace Orvane {
 
 int AnalyticsCommand::run(Console& console) const {
-  // The answer first: it holds whatever becomes of the spool.
-  if (answer && !storeConsent(*answer, console)) return 1;
+  const bool isKept = !answer || storeConsent(*answer, console);
+  // Whether it is kept or not: the user wants these events gone.
   if (answer == Tallyhouse::Consent::refused) ScanAnalytics::discardEvents();
+  if (!isKept) return 1;
   return console.writeResult("consent: " + textOf(storedConsent()) + "\n") ? 0 : 1;
 }
 
