@@ -111,12 +111,14 @@ int main() {
   Tallyhouse::DeliveryPolicy patient;
   patient.linger = std::chrono::hours(1);
   patient.firstRetry = std::chrono::hours(1);
-  Tallyhouse::AnalyticsTracker tracker(Tallyhouse::SpoolingTransport::make(
-      {*files, *clock, http, log}, {.endpoint = *URL::parse("https://h.example/batch"),
-                                    .trackingID = "QN-1",
-                                    .clientID = "1234567890.1456789012",
-                                    .spoolPath = folder / "Analytics.db",
-                                    .policy = patient}));
+  Tallyhouse::AnalyticsTracker tracker(
+      Tallyhouse::SpoolingTransport::make({*files, *clock, http, log},
+                                          {.endpoint = *URL::parse("https://h.example/batch"),
+                                           .trackingID = "QN-1",
+                                           .clientID = "1234567890.1456789012",
+                                           .spoolPath = folder / "Analytics.db",
+                                           .policy = patient}),
+      Tallyhouse::Consent::granted);
   BareInsertion insertion(folder / "bare.db");
   std::vector<double> ours, bare;
   for (int round = 0; round < rounds; ++round) {

@@ -13,7 +13,7 @@ namespace Tallyhouse {
 AnalyticsContext::AnalyticsContext(Ports ports, std::shared_ptr<AnalyticsTransport> transport,
                                    Consent consent)
     : ports_(ports), transport_(std::move(transport)), consent_(consent) {
-  applyConsent();
+  if (consent_ != Consent::notAsked) tellTransport();
 }
 
 AnalyticsContext::AnalyticsContext(std::shared_ptr<AnalyticsTransport> transport, Consent consent)
@@ -50,10 +50,10 @@ Consent AnalyticsContext::consent() const noexcept {
 void AnalyticsContext::setConsent(Consent consent) noexcept {
   const std::lock_guard lock(mutex_);
   consent_ = consent;
-  applyConsent();
+  tellTransport();
 }
 
-void AnalyticsContext::applyConsent() noexcept {
+void AnalyticsContext::tellTransport() noexcept {
   if (!transport_) return;
   if (consent_ == Consent::granted)
     transport_->start();

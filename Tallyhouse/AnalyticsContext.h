@@ -19,10 +19,14 @@ namespace Tallyhouse {
 
 class AnalyticsTransport;
 
-/// Whether the user agreed to be counted.
-enum class Consent { granted, refused };
+/// Whether the user agreed to be counted. Only `granted` lets an event be kept or sent.
+enum class Consent { notAsked, refused, granted };
 
 /// Makes events and hands them to a transport, as long as the user consents.
+///
+/// Without consent nothing is kept, neither in memory nor in a file, and nothing is sent: an event
+/// of that time is gone. Events that earlier runs left, by consent, wait untouched until this
+/// context is told one way or the other.
 ///
 /// Any thread. No operation throws or waits for the network. An event that cannot be kept is
 /// silently lost.
@@ -33,23 +37,26 @@ class VARNEL_API AnalyticsContext final {
   };
 
   /// Without a transport, events go nowhere.
-  AnalyticsContext(Ports ports, std::shared_ptr<AnalyticsTransport> transport, Consent consent);
-  AnalyticsContext(std::shared_ptr<AnalyticsTransport> transport, Consent consent);
+  AnalyticsContext(Ports ports, std::shared_ptr<AnalyticsTransport> transport,
+                   Consent consent = Consent::notAsked);
+  explicit AnalyticsContext(std::shared_ptr<AnalyticsTransport> transport,
+                            Consent consent = Consent::notAsked);
   AnalyticsContext(const AnalyticsContext&) = delete;
   AnalyticsContext& operator=(const AnalyticsContext&) = delete;
 
-  /// Sends one event.
+  /// Sends one event, given consent.
   void trackEvent(std::string_view category, std::string_view action,
                   const std::optional<std::string>& label, std::optional<std::int64_t> value,
                   const CustomDimensions& customDimensions, const CustomMetrics& customMetrics,
                   bool isTest = false) noexcept;
 
   [[nodiscard]] Consent consent() const noexcept;
-  /// Refusing stops the collection and throws away all events that have not been delivered.
+  /// Anything but `granted` stops the collection and throws away all events that have not been
+  /// delivered, those of earlier runs included.
   void setConsent(Consent consent) noexcept;
 
  private:
-  void applyConsent() noexcept;
+  void tellTransport() noexcept;
 
   const Ports ports_;
   const std::shared_ptr<AnalyticsTransport> transport_;

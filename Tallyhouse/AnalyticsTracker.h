@@ -12,16 +12,16 @@ namespace Tallyhouse {
 /// Made once by a host, and given to every sender of events.
 ///
 ///     auto tracker = std::make_shared<AnalyticsTracker>(transport);
-///     tracker->setShouldPrintEvents(true);
+///     if (userAgreed) tracker->context()->setConsent(Consent::granted);
 ///     BaseAnalyticsSender(tracker).trackEvent("Opened", "window", std::nullopt, {}, {});
 ///
-/// Without a transport nothing is collected. Any thread.
+/// Without a transport, and without the user's consent, nothing is collected. Any thread.
 class VARNEL_API AnalyticsTracker final {
  public:
   explicit AnalyticsTracker(std::shared_ptr<AnalyticsTransport> transport = nullptr,
-                            Consent consent = Consent::granted);
+                            Consent consent = Consent::notAsked);
   AnalyticsTracker(AnalyticsContext::Ports ports, std::shared_ptr<AnalyticsTransport> transport,
-                   Consent consent = Consent::granted);
+                   Consent consent = Consent::notAsked);
   AnalyticsTracker(const AnalyticsTracker&) = delete;
   AnalyticsTracker& operator=(const AnalyticsTracker&) = delete;
 

@@ -14,7 +14,7 @@ class VARNEL_API AnalyticsTransport {
  public:
   virtual ~AnalyticsTransport() = default;
 
-  /// Called when the user's consent is known, perhaps more than once. Events of earlier runs may be
+  /// Called when the user has consented, perhaps more than once. Events of earlier runs may be
   /// sent from now on.
   virtual void start() noexcept = 0;
 

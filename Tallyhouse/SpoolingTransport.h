@@ -29,7 +29,7 @@ namespace Tallyhouse {
 ///     auto transport = SpoolingTransport::make({
 ///         .endpoint = *URL::parse("https://collect.quennel.example/batch"),
 ///         .trackingID = "QN-1", .clientID = id, .spoolPath = support + "/Analytics.db"});
-///     auto tracker = std::make_shared<AnalyticsTracker>(std::move(transport));
+///     auto tracker = std::make_shared<AnalyticsTracker>(std::move(transport), consent);
 ///
 /// `accept` costs the insertion of a row and never waits for the network. Destruction interrupts a
 /// transfer, which the next run repeats; call `drain` before it where a process is short-lived.

@@ -7,6 +7,7 @@
 
 namespace Varnel::Platform {
 
+class ApplicationStorage;
 class Clock;
 class DeviceRegistry;
 class DiskArbitration;
@@ -14,13 +15,13 @@ class ExtendedAttributes;
 class MachineIdentity;
 class MainQueue;
 class NotificationServer;
+class PrivateFiles;
 class ProcessInfo;
 class ProcessLauncher;
 class SoundPlayer;
 class StandardOutput;
 class SystemLog;
 class TimeZones;
-class UserDefaults;
 class UserLocale;
 class UserNotificationCenters;
 class VolumeCatalog;
@@ -38,6 +39,8 @@ class MountTable;
 /// The one view of the mount table that the volume catalogue and disk arbitration share.
 [[nodiscard]] std::shared_ptr<MountTable> makeMountTable();
 
+[[nodiscard]] std::unique_ptr<ApplicationStorage> makeApplicationStorage(PrivateFiles& files,
+                                                                         SystemLog& systemLog);
 [[nodiscard]] std::unique_ptr<DeviceRegistry> makeDeviceRegistry();
 [[nodiscard]] std::unique_ptr<DiskArbitration> makeDiskArbitration(
     std::shared_ptr<MountTable> table);
@@ -49,7 +52,6 @@ class MountTable;
 [[nodiscard]] std::unique_ptr<ProcessLauncher> makeProcessLauncher();
 /// `root` is the folder below which /etc/localtime lies.
 [[nodiscard]] std::unique_ptr<TimeZones> makeTimeZones(const std::string& root = "/");
-[[nodiscard]] std::unique_ptr<UserDefaults> makeUserDefaults();
 [[nodiscard]] std::unique_ptr<MainQueue> makeMainQueue();
 [[nodiscard]] std::unique_ptr<StandardOutput> makeStandardOutput();
 [[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog,

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/Ports/AppendFiles.h>
 #include <Varnel/Platform/Ports/Application.h>
+#include <Varnel/Platform/Ports/ApplicationStorage.h>
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/CookieStorage.h>
 #include <Varnel/Platform/Ports/DeviceRegistry.h>
@@ -19,7 +20,6 @@
 #include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/Ports/TimeZones.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
-#include <Varnel/Platform/Ports/UserDefaults.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
 #include <Varnel/Platform/Ports/VolumeCatalog.h>
@@ -42,8 +42,8 @@ Port& keep(std::unique_ptr<Port> adapter) {
 }
 
 std::unique_ptr<CookieStorage> makeCookieStorage(const Clock& clock) {
-  return std::make_unique<SQLiteCookieStorage>(Linux::userDataFolder(),
-                                               Linux::applicationFolderName(), clock);
+  return std::make_unique<SQLiteCookieStorage>(Linux::userDataFolder(), Linux::executableName(),
+                                               clock);
 }
 
 }  // namespace
@@ -52,6 +52,7 @@ const Ports& systemPorts() {
   // The adapters share it, and they are never destroyed.
   static const auto mountTable = Linux::makeMountTable();
   static Clock& clock = keep(POSIX::makeClock());
+  static PrivateFiles& privateFiles = keep(POSIX::makePrivateFiles());
   static SystemLog& systemLog = keep(POSIX::makeSystemLog());
   static MainQueue& mainQueue = *new WatchedMainQueue(Linux::makeMainQueue(), systemLog);
   static TimeZones& timeZones = keep(Linux::makeTimeZones());
@@ -59,6 +60,7 @@ const Ports& systemPorts() {
   static const Ports& ports = *new Ports{
       .appendFiles = keep(POSIX::makeAppendFiles()),
       .application = *new HostedApplication,
+      .applicationStorage = keep(Linux::makeApplicationStorage(privateFiles, systemLog)),
       .clock = clock,
       .cookieStorage = keep(makeCookieStorage(clock)),
       .deviceRegistry = keep(Linux::makeDeviceRegistry()),
@@ -67,7 +69,7 @@ const Ports& systemPorts() {
       .httpClient = keep(POSIX::makeHTTPClient()),
       .machineIdentity = keep(Linux::makeMachineIdentity()),
       .mainQueue = mainQueue,
-      .privateFiles = keep(POSIX::makePrivateFiles()),
+      .privateFiles = privateFiles,
       .processInfo = keep(Linux::makeProcessInfo()),
       .processLauncher = keep(Linux::makeProcessLauncher()),
       .securityScope = keep(POSIX::makeSecurityScope()),
@@ -76,7 +78,6 @@ const Ports& systemPorts() {
       .systemLog = systemLog,
       .timeZones = timeZones,
       .userAccount = keep(POSIX::makeUserAccount()),
-      .userDefaults = keep(Linux::makeUserDefaults()),
       .userLocale = userLocale,
       .userNotificationCenters = keep(
           Linux::makeUserNotificationCenters({clock, userLocale, timeZones, mainQueue, systemLog})),

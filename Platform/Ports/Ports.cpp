@@ -20,6 +20,7 @@ Ports Ports::withStandardOutput(StandardOutput& output) const {
   return {
       .appendFiles = appendFiles,
       .application = application,
+      .applicationStorage = applicationStorage,
       .clock = clock,
       .cookieStorage = cookieStorage,
       .deviceRegistry = deviceRegistry,
@@ -37,7 +38,6 @@ Ports Ports::withStandardOutput(StandardOutput& output) const {
       .systemLog = systemLog,
       .timeZones = timeZones,
       .userAccount = userAccount,
-      .userDefaults = userDefaults,
       .userLocale = userLocale,
       .userNotificationCenters = userNotificationCenters,
       .volumeCatalog = volumeCatalog,

@@ -7,6 +7,7 @@ namespace Varnel::Platform {
 
 class AppendFiles;
 class Application;
+class ApplicationStorage;
 class Clock;
 class CookieStorage;
 class DeviceRegistry;
@@ -24,7 +25,6 @@ class StandardOutput;
 class SystemLog;
 class TimeZones;
 class UserAccount;
-class UserDefaults;
 class UserLocale;
 class UserNotificationCenters;
 class VolumeCatalog;
@@ -39,6 +39,7 @@ class Workspace;
 struct Ports {
   AppendFiles& appendFiles;
   Application& application;
+  ApplicationStorage& applicationStorage;
   Clock& clock;
   CookieStorage& cookieStorage;
   DeviceRegistry& deviceRegistry;
@@ -56,7 +57,6 @@ struct Ports {
   SystemLog& systemLog;
   TimeZones& timeZones;
   UserAccount& userAccount;
-  UserDefaults& userDefaults;
   UserLocale& userLocale;
   UserNotificationCenters& userNotificationCenters;
   VolumeCatalog& volumeCatalog;

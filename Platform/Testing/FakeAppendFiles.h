@@ -11,43 +11,32 @@
 #include <system_error>
 
 #include <Varnel/Platform/Ports/AppendFiles.h>
+#include <Varnel/Platform/Testing/FaultPlan.h>
 
 namespace Varnel::Platform::Testing {
 
-/// Files in memory whose disk fails, or hangs, when the test says so. Any thread; it must outlive
+/// Files in memory whose disk fails, or hangs, by plan. Any thread; it must outlive
 /// the files that it opened.
 ///
 ///     FakeAppendFiles files;
-///     files.failNextAppends(2, std::errc::no_space_on_device);
+///     files.failure = std::errc::no_space_on_device;
+///     files.faults->plan(Fault::fails, 2, 2);  // opening is the first call
 ///     …
 ///     files.waitForAppends(3);
 ///     EXPECT_EQ(files.text("/log"), "what the third one wrote");
 class FakeAppendFiles final : public AppendFiles {
  public:
+  /// Openings and appends. What fails writes nothing and answers with `failure`.
+  std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
+  std::errc failure = std::errc::io_error;
+
   [[nodiscard]] Result<std::unique_ptr<AppendFile>, std::error_code> open(
       const std::string& path) override {
-    const std::lock_guard lock(mutex_);
-    if (openFailure_ != std::errc()) return std::make_error_code(openFailure_);
+    const Fault fault = faults->nextInTime();
+    if (fault == Fault::fails) return std::make_error_code(failure);
+    if (fault == Fault::absent) return std::make_error_code(std::errc::no_such_file_or_directory);
     return std::unique_ptr<AppendFile>(std::make_unique<File>(*this, path));
   }
-
-  /// From now on no file can be opened; with `std::errc()`, files can be opened again. Open files
-  /// stay open.
-  void failOpening(std::errc failure) {
-    const std::lock_guard lock(mutex_);
-    openFailure_ = failure;
-  }
-
-  /// The next `count` appends write nothing and answer with this error.
-  void failNextAppends(std::size_t count, std::errc failure) {
-    const std::lock_guard lock(mutex_);
-    failingAppends_ = count;
-    appendFailure_ = failure;
-  }
-
-  /// Makes appends wait, as on a disk that has gone to sleep, until `release`.
-  void hold() { setHeld(true); }
-  void release() { setHeld(false); }
 
   /// Returns when `count` appends have ended since the beginning, failed ones included.
   void waitForAppends(std::size_t count) {
@@ -81,33 +70,21 @@ class FakeAppendFiles final : public AppendFiles {
     const std::string path_;
   };
 
-  void setHeld(bool isHeld) {
-    const std::lock_guard lock(mutex_);
-    isHeld_ = isHeld;
-    changed_.notify_all();
-  }
-
   std::error_code append(const std::string& path, std::string_view bytes) {
-    std::unique_lock lock(mutex_);
-    changed_.wait(lock, [&] { return !isHeld_; });
+    const Fault fault = faults->nextInTime();
+    const std::lock_guard lock(mutex_);
     ++appends_;
     changed_.notify_all();
-    if (failingAppends_ > 0) {
-      --failingAppends_;
-      return std::make_error_code(appendFailure_);
-    }
+    if (fault == Fault::fails) return std::make_error_code(failure);
+    if (fault == Fault::absent) return std::make_error_code(std::errc::no_such_device);
     texts_[path] += bytes;
     return {};
   }
 
-  mutable std::mutex mutex_;  ///< Owns everything below.
+  mutable std::mutex mutex_;  ///< Owns all below.
   std::condition_variable changed_;
   std::map<std::string, std::string> texts_;
-  std::errc openFailure_{};
-  std::errc appendFailure_{};
-  std::size_t failingAppends_ = 0;
   std::size_t appends_ = 0;
-  bool isHeld_ = false;
 };
 
 }  // namespace Varnel::Platform::Testing

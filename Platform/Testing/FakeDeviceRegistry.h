@@ -11,6 +11,7 @@
 #include <vector>
 
 #include <Varnel/Platform/Ports/DeviceRegistry.h>
+#include <Varnel/Platform/Testing/FaultPlan.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -27,6 +28,44 @@ class FakeDeviceRegistry final : public DeviceRegistry {
  public:
   using Device = int;
   static constexpr Device root = 0;
+
+ private:
+  struct Node {
+    PropertyDictionary properties;
+    Device parent = root;
+    std::vector<Device> children;
+    bool propertiesBroken = false;
+    bool parentBroken = false;
+  };
+
+  struct State {
+    std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
+    std::mutex mutex;  ///< Owns the rest.
+    std::map<Device, Node> nodes{{root, {}}};
+    Device last = root;
+    int live = 0;
+    bool readable = true;
+
+    Node* find(Device device) {
+      const auto found = nodes.find(device);
+      return found == nodes.end() ? nullptr : &found->second;
+    }
+
+    void remove(Device device) {
+      const auto found = nodes.find(device);
+      if (found == nodes.end()) return;
+      const std::vector<Device> below = std::move(found->second.children);
+      nodes.erase(found);
+      for (auto& [other, node] : nodes) std::erase(node.children, device);
+      for (const Device child : below) remove(child);
+    }
+  };
+
+  const std::shared_ptr<State> state_ = std::make_shared<State>();
+
+ public:
+  /// The look-up, and the questions to its entries. What goes wrong finds nothing.
+  std::shared_ptr<FaultPlan>& faults = state_->faults;
 
   /// Adds a device below another. The order of plugging is the registry's order.
   Device plug(PropertyDictionary properties, Device parent = root) {
@@ -79,6 +118,7 @@ class FakeDeviceRegistry final : public DeviceRegistry {
 
   std::optional<Entries> entriesMatchingProperty(std::string_view name,
                                                  const PropertyValue& value) override {
+    if (faults->strikes()) return std::nullopt;
     std::vector<Device> matching;
     {
       const std::lock_guard lock(state_->mutex);
@@ -92,36 +132,6 @@ class FakeDeviceRegistry final : public DeviceRegistry {
   }
 
  private:
-  struct Node {
-    PropertyDictionary properties;
-    Device parent = root;
-    std::vector<Device> children;
-    bool propertiesBroken = false;
-    bool parentBroken = false;
-  };
-
-  struct State {
-    std::mutex mutex;  ///< Owns the rest.
-    std::map<Device, Node> nodes{{root, {}}};
-    Device last = root;
-    int live = 0;
-    bool readable = true;
-
-    Node* find(Device device) {
-      const auto found = nodes.find(device);
-      return found == nodes.end() ? nullptr : &found->second;
-    }
-
-    void remove(Device device) {
-      const auto found = nodes.find(device);
-      if (found == nodes.end()) return;
-      const std::vector<Device> below = std::move(found->second.children);
-      nodes.erase(found);
-      for (auto& [other, node] : nodes) std::erase(node.children, device);
-      for (const Device child : below) remove(child);
-    }
-  };
-
   // Shares the state, and so may outlive the registry.
   class Entry final : public RegistryEntry {
    public:
@@ -135,6 +145,7 @@ class FakeDeviceRegistry final : public DeviceRegistry {
     }
 
     std::optional<PropertyValue> property(std::string_view name) const override {
+      if (state_->faults->strikes()) return std::nullopt;
       const std::lock_guard lock(state_->mutex);
       const Node* node = state_->find(device_);
       const PropertyValue* value = node ? find(node->properties, name) : nullptr;
@@ -142,6 +153,7 @@ class FakeDeviceRegistry final : public DeviceRegistry {
     }
 
     std::optional<PropertyDictionary> properties() const override {
+      if (state_->faults->strikes()) return std::nullopt;
       const std::lock_guard lock(state_->mutex);
       const Node* node = state_->find(device_);
       if (!node || node->propertiesBroken) return std::nullopt;
@@ -149,6 +161,7 @@ class FakeDeviceRegistry final : public DeviceRegistry {
     }
 
     std::unique_ptr<RegistryEntry> parent() const override {
+      if (state_->faults->strikes()) return nullptr;
       Device parent = root;
       {
         const std::lock_guard lock(state_->mutex);
@@ -160,6 +173,7 @@ class FakeDeviceRegistry final : public DeviceRegistry {
     }
 
     DeviceRegistry::Entries children() const override {
+      if (state_->faults->strikes()) return {};
       std::vector<Device> devices;
       {
         const std::lock_guard lock(state_->mutex);
@@ -179,8 +193,6 @@ class FakeDeviceRegistry final : public DeviceRegistry {
     for (const Device device : devices) entries.push_back(std::make_unique<Entry>(state, device));
     return entries;
   }
-
-  const std::shared_ptr<State> state_ = std::make_shared<State>();
 };
 
 }  // namespace Varnel::Platform::Testing

@@ -10,6 +10,7 @@
 #include <vector>
 
 #include <Varnel/Platform/Ports/DiskArbitration.h>
+#include <Varnel/Platform/Testing/FaultPlan.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -19,6 +20,9 @@ namespace Varnel::Platform::Testing {
 ///     disks.setMountURLs("sda1", {URL::fileURLWithPath("/home/")});
 class FakeDiskArbitration final : public DiskArbitration {
  public:
+  /// The opening of sessions, and their questions: wrong ones find nothing.
+  std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
+
   /// Mounts the device at these places from now on. Open sessions keep the view that they began
   /// with.
   void setMountURLs(const std::string& deviceName, std::vector<URL> urls) {
@@ -37,9 +41,10 @@ class FakeDiskArbitration final : public DiskArbitration {
   [[nodiscard]] int openedSessions() const { return counts_->opened; }
 
   std::unique_ptr<Session> openSession() override {
+    if (faults->strikes()) return nullptr;
     const std::lock_guard lock(mutex_);
     if (!reachable_) return nullptr;
-    return std::make_unique<FakeSession>(mounts_, counts_);
+    return std::make_unique<FakeSession>(mounts_, counts_, faults);
   }
 
  private:
@@ -52,14 +57,15 @@ class FakeDiskArbitration final : public DiskArbitration {
 
   class FakeSession final : public Session {
    public:
-    FakeSession(Mounts mounts, std::shared_ptr<Counts> counts)
-        : mounts_(std::move(mounts)), counts_(std::move(counts)) {
+    FakeSession(Mounts mounts, std::shared_ptr<Counts> counts, std::shared_ptr<FaultPlan> faults)
+        : mounts_(std::move(mounts)), counts_(std::move(counts)), faults_(std::move(faults)) {
       ++counts_->live;
       ++counts_->opened;
     }
     ~FakeSession() override { --counts_->live; }
 
     std::vector<URL> mountURLs(const std::string& deviceName) override {
+      if (faults_->strikes()) return {};
       const auto found = mounts_.find(deviceName);
       return found == mounts_.end() ? std::vector<URL>() : found->second;
     }
@@ -67,6 +73,7 @@ class FakeDiskArbitration final : public DiskArbitration {
    private:
     const Mounts mounts_;
     const std::shared_ptr<Counts> counts_;
+    const std::shared_ptr<FaultPlan> faults_;
   };
 
   const std::shared_ptr<Counts> counts_ = std::make_shared<Counts>();

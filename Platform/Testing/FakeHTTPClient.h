@@ -2,11 +2,13 @@
 #pragma once
 
 #include <functional>
+#include <memory>
 #include <mutex>
 #include <utility>
 #include <vector>
 
 #include <Varnel/Platform/Ports/HTTPClient.h>
+#include <Varnel/Platform/Testing/FaultPlan.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -19,6 +21,9 @@ class FakeHTTPClient final : public HTTPClient {
   using Answer = Result<HTTPResponse, HTTPFailure>;
   using Server = std::function<Answer(const HTTPPost&)>;
 
+  /// Posts that go wrong never reach the server.
+  std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
+
   /// At first every post is answered with 200.
   void setServer(Server server) {
     const std::lock_guard lock(mutex_);
@@ -26,7 +31,10 @@ class FakeHTTPClient final : public HTTPClient {
   }
 
   [[nodiscard]] Answer post(const HTTPPost& request, std::stop_token stop) override {
+    const Fault fault = faults->nextInTime(stop);
     if (stop.stop_requested()) return HTTPFailure{"cancelled"};
+    if (fault != Fault::none)
+      return HTTPFailure{fault == Fault::absent ? "no server" : "no answer"};
     Server server;
     {
       const std::lock_guard lock(mutex_);

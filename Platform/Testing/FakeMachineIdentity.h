@@ -2,17 +2,21 @@
 #pragma once
 
 #include <atomic>
+#include <memory>
 #include <optional>
 #include <string_view>
 #include <vector>
 
 #include <Varnel/Platform/Ports/MachineIdentity.h>
+#include <Varnel/Platform/Testing/FaultPlan.h>
 
 namespace Varnel::Platform::Testing {
 
 /// A machine whose identity the test sets. Set it before other threads read.
 class FakeMachineIdentity final : public MachineIdentity {
  public:
+  /// Questions. One that goes wrong finds nothing.
+  std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
   PropertyDictionary properties = {{"IOPlatformUUID", "0f1e2d3c4b5a69788796a5b4c3d2e1f0"},
                                    {"IOPlatformSerialNumber", "C02XL0FAKE"}};
   std::vector<PropertyData> addresses;
@@ -21,12 +25,13 @@ class FakeMachineIdentity final : public MachineIdentity {
   [[nodiscard]] std::optional<PropertyValue> platformProperty(
       std::string_view name) const override {
     ++questions;
+    if (faults->strikes()) return std::nullopt;
     const PropertyValue* value = find(properties, name);
     if (!value) return std::nullopt;
     return *value;
   }
   [[nodiscard]] std::vector<PropertyData> primaryInterfaceAddresses() const override {
-    return addresses;
+    return faults->strikes() ? std::vector<PropertyData>() : addresses;
   }
 };
 

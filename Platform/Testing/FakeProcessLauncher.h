@@ -7,6 +7,7 @@
 #include <vector>
 
 #include <Varnel/Platform/Ports/ProcessLauncher.h>
+#include <Varnel/Platform/Testing/FaultPlan.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -22,6 +23,8 @@ class FakeProcessLauncher final : public ProcessLauncher {
     std::error_code launchError = {};  ///< Why it cannot be launched, if so.
   };
 
+  /// Launches. A delayed program runs until it was asked a few times more.
+  std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
   Script script;
   std::vector<std::vector<std::string>> launches;  ///< Path and arguments of each launch.
   int terminations = 0;                            ///< How many were ended while they ran.
@@ -31,7 +34,19 @@ class FakeProcessLauncher final : public ProcessLauncher {
     launches.push_back({path});
     launches.back().insert(launches.back().end(), arguments.begin(), arguments.end());
     if (script.launchError) return script.launchError;
-    return std::unique_ptr<LaunchedProcess>(std::make_unique<Process>(*this, script));
+    Script played = script;
+    switch (faults->next()) {
+      case Fault::fails:
+        return std::make_error_code(std::errc::resource_unavailable_try_again);
+      case Fault::absent:
+        return std::make_error_code(std::errc::no_such_file_or_directory);
+      case Fault::delays:
+        if (played.questions >= 0) played.questions += 3;
+        break;
+      case Fault::none:
+        break;
+    }
+    return std::unique_ptr<LaunchedProcess>(std::make_unique<Process>(*this, std::move(played)));
   }
 
  private:

@@ -2,10 +2,12 @@
 #pragma once
 
 #include <map>
+#include <memory>
 #include <mutex>
 #include <set>
 
 #include <Varnel/Platform/Ports/SecurityScope.h>
+#include <Varnel/Platform/Testing/FaultPlan.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -17,6 +19,9 @@ namespace Varnel::Platform::Testing {
 ///     EXPECT_EQ(scope.openAccesses(file), 0);  // what was started was stopped
 class FakeSecurityScope final : public SecurityScope {
  public:
+  /// The calls of `startAccessing`, which a fault forbids.
+  std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
+
   void forbid(const URL& url) {
     const std::lock_guard lock(mutex_);
     forbidden_.insert(url);
@@ -36,9 +41,10 @@ class FakeSecurityScope final : public SecurityScope {
   }
 
   bool startAccessing(const URL& url) override {
+    const bool isForbidden = faults->strikes();
     const std::lock_guard lock(mutex_);
     ++starts_;
-    if (forbidden_.contains(url)) return false;
+    if (isForbidden || forbidden_.contains(url)) return false;
     ++open_[url];
     return true;
   }

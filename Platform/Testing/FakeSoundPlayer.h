@@ -8,6 +8,7 @@
 #include <vector>
 
 #include <Varnel/Platform/Ports/SoundPlayer.h>
+#include <Varnel/Platform/Testing/FaultPlan.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -42,10 +43,13 @@ class FakeSound final : public PlayableSound {
 /// A sound player that remembers what it loaded. It refuses the bytes "broken".
 class FakeSoundPlayer final : public SoundPlayer {
  public:
+  /// The calls of `load`, which never waits.
+  std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
   std::vector<std::shared_ptr<FakeSound>> sounds;  ///< Every sound loaded, in order.
 
   [[nodiscard]] std::shared_ptr<PlayableSound> load(std::string bytes) override {
-    if (bytes == "broken") return nullptr;
+    const Fault fault = faults->next();
+    if (bytes == "broken" || fault == Fault::fails || fault == Fault::absent) return nullptr;
     return sounds.emplace_back(std::make_shared<FakeSound>(std::move(bytes)));
   }
   [[nodiscard]] std::optional<std::string> missingPart() const override { return std::nullopt; }

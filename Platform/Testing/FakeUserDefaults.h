@@ -3,11 +3,13 @@
 
 #include <cstdint>
 #include <map>
+#include <memory>
 #include <mutex>
 #include <optional>
 #include <string>
 
 #include <Varnel/Platform/Ports/UserDefaults.h>
+#include <Varnel/Platform/Testing/FaultPlan.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -15,6 +17,9 @@ namespace Varnel::Platform::Testing {
 /// as no other. Any thread.
 class FakeUserDefaults final : public UserDefaults {
  public:
+  /// A reading that goes wrong finds nothing; a change is refused.
+  std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
+
   [[nodiscard]] std::optional<bool> truthValue(const std::string& key) const override {
     return read<bool>(key);
   }
@@ -27,18 +32,28 @@ class FakeUserDefaults final : public UserDefaults {
   [[nodiscard]] std::optional<std::string> text(const std::string& key) const override {
     return read<std::string>(key);
   }
-  void set(const std::string& key, const Value& value) override {
+  [[nodiscard]] std::optional<PlatformError> set(const std::string& key,
+                                                 const Value& value) override {
+    if (faults->strikes()) return failure();
     const std::lock_guard lock(mutex_);
     values_[key] = value;
+    return std::nullopt;
   }
-  void remove(const std::string& key) override {
+  [[nodiscard]] std::optional<PlatformError> remove(const std::string& key) override {
+    if (faults->strikes()) return failure();
     const std::lock_guard lock(mutex_);
     values_.erase(key);
+    return std::nullopt;
   }
 
  private:
+  static PlatformError failure() {
+    return PlatformError(std::make_error_code(std::errc::io_error));
+  }
+
   template <typename Type>
   std::optional<Type> read(const std::string& key) const {
+    if (faults->strikes()) return std::nullopt;
     const std::lock_guard lock(mutex_);
     const auto found = values_.find(key);
     const auto* value = found == values_.end() ? nullptr : std::get_if<Type>(&found->second);

@@ -11,6 +11,7 @@
 #include <vector>
 
 #include <Varnel/Platform/Ports/VolumeCatalog.h>
+#include <Varnel/Platform/Testing/FaultPlan.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -24,6 +25,9 @@ namespace Varnel::Platform::Testing {
 /// catalogue, but must not subscribe nor end a subscription.
 class FakeVolumeCatalog final : public VolumeCatalog {
  public:
+  /// Questions and subscriptions. A list that goes wrong is empty.
+  std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
+
   /// Replaces the list without telling anybody.
   void setVolumes(std::vector<MountedVolume> volumes) {
     const std::lock_guard lock(mutex_);
@@ -76,12 +80,16 @@ class FakeVolumeCatalog final : public VolumeCatalog {
   }
 
   std::vector<MountedVolume> mountedVolumes() override {
+    if (faults->strikes()) return {};
     const std::lock_guard lock(mutex_);
     return volumes_;
   }
 
   /// The volume with the longest path that is a folder above the URL, or the URL itself.
   Result<std::optional<URL>> volumeURL(const URL& url) override {
+    const Fault fault = faults->nextInTime();
+    if (fault == Fault::fails) return PlatformError(std::make_error_code(std::errc::io_error));
+    if (fault == Fault::absent) return std::optional<URL>();
     const std::lock_guard lock(mutex_);
     if (lookupError_) return *lookupError_;
     const std::string path = withSlash(url.path());
@@ -97,6 +105,7 @@ class FakeVolumeCatalog final : public VolumeCatalog {
   }
 
   std::optional<std::string> volumeName(const URL& volumeURL) override {
+    if (faults->strikes()) return std::nullopt;
     const std::lock_guard lock(mutex_);
     for (const MountedVolume& volume : volumes_) {
       if (volume.url != volumeURL) continue;
@@ -107,6 +116,7 @@ class FakeVolumeCatalog final : public VolumeCatalog {
   }
 
   std::unique_ptr<Subscription> subscribe(ChangeHandler handler) override {
+    if (faults->strikes()) return nullptr;
     {
       const std::lock_guard lock(mutex_);
       if (!offersEvents_) return nullptr;

@@ -3,10 +3,12 @@
 
 #include <algorithm>
 #include <functional>
+#include <memory>
 #include <optional>
 #include <utility>
 
 #include <Varnel/Platform/Ports/WallClockTimer.h>
+#include <Varnel/Platform/Testing/FaultPlan.h>
 #include <Varnel/Platform/Testing/SimulatedClock.h>
 
 namespace Varnel::Platform::Testing {
@@ -19,10 +21,18 @@ namespace Varnel::Platform::Testing {
 /// One thread.
 class FakeWallClockTimer final : public WallClockTimer {
  public:
+  /// The calls of `arm`: one that goes wrong arms nothing, a delayed one rings only at the end of
+  /// `advanceTo`.
+  std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
+
   explicit FakeWallClockTimer(SimulatedClock& clock) : clock_(clock) {}
 
   void setHandler(std::function<void()> handler) override { handler_ = std::move(handler); }
-  void arm(Date date) override { armed_ = date; }
+  void arm(Date date) override {
+    const Fault fault = faults->next();
+    isLate_ = fault == Fault::delays;
+    armed_ = fault == Fault::none || isLate_ ? std::optional(date) : std::nullopt;
+  }
   void disarm() override { armed_.reset(); }
 
   /// The date that the timer waits for.
@@ -30,7 +40,7 @@ class FakeWallClockTimer final : public WallClockTimer {
 
   void advanceTo(Date date) {
     while (armed_ && *armed_ <= date) {
-      clock_.set(std::max(clock_.now(), *armed_));
+      clock_.set(isLate_ ? date : std::max(clock_.now(), *armed_));
       fire();
     }
     clock_.set(date);
@@ -51,6 +61,7 @@ class FakeWallClockTimer final : public WallClockTimer {
   SimulatedClock& clock_;
   std::function<void()> handler_;
   std::optional<Date> armed_;
+  bool isLate_ = false;
 };
 
 }  // namespace Varnel::Platform::Testing

@@ -10,6 +10,7 @@
 #include <vector>
 
 #include <Varnel/Context/BuildSwitches.h>
+#include <orvane/AnalyticsCommand.h>
 #include <orvane/DisksCommand.h>
 #include <orvane/IdentifyCommand.h>
 #include <orvane/LinkCommand.h>
@@ -71,12 +72,32 @@ void addScan(CLI::App& app, Invocation& invocation) {
           "--qos", [scan = command](const std::string& name) { scan->qos = qualityNamed(name); },
           "How urgent reading is: background, utility, user-initiated, user-interactive")
       ->type_name("QUALITY");
-  options->add_option("--analytics", command->analyticsEndpoint, "Send events of the scan there")
+  options
+      ->add_option("--analytics", command->analyticsEndpoint,
+                   "Send events of the scan there, if the user consents")
       ->type_name("URL")
       ->check([](const std::string& text) {
         return ScanAnalytics::isEndpoint(text) ? std::string() : "\"" + text + "\" is no https URL";
       });
   options->add_flag("--print-events", command->printsEvents, "Show events in the log");
+}
+
+Tallyhouse::Consent answerNamed(const std::string& name) {
+  if (name == "yes") return Tallyhouse::Consent::granted;
+  if (name == "no") return Tallyhouse::Consent::refused;
+  throw CLI::ValidationError("ANSWER", "the answer is yes or no, not \"" + name + "\"");
+}
+
+void addAnalytics(CLI::App& app, Invocation& invocation) {
+  auto [options, command] = addCommand<AnalyticsCommand>(
+      app, invocation, "analytics", "Tell whether events of the scans may be sent");
+  CLI::App* consent = options->add_subcommand("consent", "Tell it, or answer the question");
+  addLogFlag(*consent, invocation);
+  consent
+      ->add_option_function<std::string>(
+          "answer", [told = command](const std::string& name) { told->answer = answerNamed(name); },
+          "yes or no; no also throws away what has not been sent")
+      ->type_name("ANSWER");
 }
 
 void addDisks(CLI::App& app, Invocation& invocation) {
@@ -225,6 +246,7 @@ std::variant<Invocation, Information, UsageError> parseCommandLine(int count,
   addLogFlag(app, invocation);
   app.require_subcommand(0, 1);
   addScan(app, invocation);
+  addAnalytics(app, invocation);
   addDisks(app, invocation);
   addIdentify(app, invocation);
   addLink(app, invocation);

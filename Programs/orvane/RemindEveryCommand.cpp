@@ -3,7 +3,6 @@
 
 #include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Ports/Ports.h>
-#include <Varnel/Platform/Ports/UserDefaults.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
 #include <Varnel/Reminders/SchedulerService.h>
 #include <Varnel/Reminders/UserNotificationRouter.h>
@@ -52,12 +51,13 @@ class PlanningCenter final : public Varnel::Platform::UserNotificationCenter {
 
 int RemindEveryCommand::run(Console& console) const {
   const auto& ports = Varnel::Platform::processPorts();
+  // The period first: the plan can be made again from it.
+  if (!storePeriod(period, console)) return 1;
   PlanningCenter center(Varnel::UserNotificationRouter::defaultUserNotificationCenter());
   Varnel::UserNotificationRouter router({center, ports.application, ports.mainQueue});
   Varnel::SchedulerService service(std::make_shared<Tallyhouse::AnalyticsTracker>(), router);
   // Assigning plans anew and clears what was delivered, so only a choice of the user does it.
   service.setSchedulePeriod(period);
-  storePeriod(period);
   awaitDesktop(center, console);
   return console.writeResult(statusText(center)) ? 0 : 1;
 }

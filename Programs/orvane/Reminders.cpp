@@ -5,6 +5,7 @@
 #include <optional>
 
 #include <Varnel/Basalt/JSON.h>
+#include <Varnel/Context/ApplicationData.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/UserDefaults.h>
@@ -33,7 +34,7 @@ std::string textOf(const std::optional<Varnel::Platform::Date>& date) {
 }
 
 Basalt::JSON storedJSON() {
-  const auto text = Varnel::Platform::processPorts().userDefaults.text(periodKey);
+  const auto text = Varnel::ApplicationData::settings().text(periodKey);
   try {
     return Basalt::parseJSON(text.value_or(""));
   } catch (const Basalt::JSONError&) {
@@ -48,9 +49,11 @@ SchedulePeriodOption storedPeriod() {
   return Varnel::SchedulePeriodOptionBox(storedJSON()).boxed();
 }
 
-void storePeriod(SchedulePeriodOption period) {
-  Varnel::Platform::processPorts().userDefaults.set(periodKey,
-                                                    Basalt::jsonText(period.exportJSON()));
+bool storePeriod(SchedulePeriodOption period, Console& console) {
+  const auto error =
+      Varnel::ApplicationData::settings().set(periodKey, Basalt::jsonText(period.exportJSON()));
+  if (error) console.complain("cannot keep the period: " + error->localizedDescription());
+  return !error;
 }
 
 void awaitDesktop(Varnel::Platform::UserNotificationCenter& center, Console& console) {

@@ -17,7 +17,8 @@ class Console;
 /// The period that the user chose, kept in this program's settings; never until then, and where the
 /// setting is damaged.
 [[nodiscard]] Varnel::SchedulePeriodOption storedPeriod();
-void storePeriod(Varnel::SchedulePeriodOption period);
+/// Returns whether the period is kept, and complains where it is not.
+[[nodiscard]] bool storePeriod(Varnel::SchedulePeriodOption period, Console& console);
 
 /// Lets the desktop show and take away what the center told it to. If that takes more than a few
 /// seconds, it complains and does not wait longer.

@@ -3,17 +3,18 @@
 
 #include <chrono>
 
-#include <Varnel/Context/Globals.h>
+#include <Varnel/Context/ApplicationData.h>
 #include <Varnel/Identification/Analytics/CustomDimensionsHolder.h>
 #include <Varnel/Identification/User/KeptDownloadSource.h>
 #include <Varnel/Identification/User/UserIdentificationInfo.h>
 #include <Varnel/Identification/User/UserIdentificator.h>
-#include <Varnel/Platform/Ports/Ports.h>
-#include <Varnel/Platform/Ports/UserAccount.h>
+#include <orvane/AnalyticsConsent.h>
+#include <orvane/Console.h>
 
 namespace Orvane {
 namespace {
 
+using Tallyhouse::Consent;
 using Tallyhouse::SpoolingTransport;
 using Varnel::Platform::URL;
 
@@ -39,15 +40,13 @@ void identifyUser() {
 }
 
 std::shared_ptr<SpoolingTransport> transportTo(const URL& endpoint) {
-  const auto& ports = Varnel::Platform::processPorts();
-  return SpoolingTransport::make(
-      {.endpoint = endpoint,
-       .trackingID = "orvane",
-       .clientID = Varnel::CustomDimensionsHolder::clientIdentifier(),
-       .spoolPath = ports.userAccount.homeFolder() + "/Library/Application Support/" +
-                    Varnel::Globals::baseIdentifier() + "/Analytics.db",
-       .plainHTTP = isOnThisMachine(endpoint) ? SpoolingTransport::PlainHTTP::allowed
-                                              : SpoolingTransport::PlainHTTP::refused});
+  return SpoolingTransport::make({.endpoint = endpoint,
+                                  .trackingID = "orvane",
+                                  .clientID = Varnel::CustomDimensionsHolder::clientIdentifier(),
+                                  .spoolPath = Varnel::ApplicationData::analyticsSpoolPath(),
+                                  .plainHTTP = isOnThisMachine(endpoint)
+                                                   ? SpoolingTransport::PlainHTTP::allowed
+                                                   : SpoolingTransport::PlainHTTP::refused});
 }
 
 }  // namespace
@@ -58,11 +57,29 @@ bool ScanAnalytics::isEndpoint(const std::string& text) {
   return url->hasScheme("https") || (url->hasScheme("http") && isOnThisMachine(*url));
 }
 
-ScanAnalytics::ScanAnalytics(const std::optional<std::string>& endpoint, bool printsEvents) {
-  if (!endpoint && !printsEvents) return;
+void ScanAnalytics::discardEvents() {
+  // A tracker that is refused discards; it sends nothing, wherever that would go.
+  const Tallyhouse::AnalyticsTracker tracker(
+      SpoolingTransport::make({.endpoint = *URL::parse("https://nowhere.invalid/"),
+                               .trackingID = {},
+                               .clientID = {},
+                               .spoolPath = Varnel::ApplicationData::analyticsSpoolPath()}),
+      Consent::refused);
+}
+
+ScanAnalytics::ScanAnalytics(const std::optional<std::string>& endpoint, bool printsEvents,
+                             Console& console) {
+  const Consent consent = storedConsent();
+  const bool sends = endpoint && consent == Consent::granted;
+  if (endpoint && !sends)
+    console.complain("no events are sent: " +
+                     std::string(consent == Consent::refused ? "the user has refused"
+                                                             : "the user has not been asked") +
+                     " (orvane analytics consent yes)");
+  if (!sends && !printsEvents) return;
   identifyUser();
-  if (endpoint) transport_ = transportTo(*URL::parse(*endpoint));
-  auto tracker = std::make_shared<Tallyhouse::AnalyticsTracker>(transport_);
+  if (sends) transport_ = transportTo(*URL::parse(*endpoint));
+  auto tracker = std::make_shared<Tallyhouse::AnalyticsTracker>(transport_, consent);
   tracker->setShouldPrintEvents(printsEvents);
   sender_ = std::make_unique<ScanSender>(std::move(tracker));
 }

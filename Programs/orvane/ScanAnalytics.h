@@ -11,14 +11,19 @@
 
 namespace Orvane {
 
+class Console;
+
 /// The events of a scan. They count folders and groups and never name a file.
 class ScanAnalytics final {
  public:
   /// Whether events can be sent there: by https, or within this machine by http as well.
   [[nodiscard]] static bool isEndpoint(const std::string& text);
 
-  /// Without an endpoint nothing is sent.
-  ScanAnalytics(const std::optional<std::string>& endpoint, bool printsEvents);
+  /// Empties the product's spool.
+  static void discardEvents();
+
+  /// Nothing is sent without an endpoint, nor without the user's consent, which is complained of.
+  ScanAnalytics(const std::optional<std::string>& endpoint, bool printsEvents, Console& console);
   /// Gives events a moment to arrive. Those that do not wait for the next run.
   ~ScanAnalytics();
   ScanAnalytics(const ScanAnalytics&) = delete;

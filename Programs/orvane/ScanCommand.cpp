@@ -98,7 +98,7 @@ int ScanCommand::run(Console& console) const {
   const auto paths = resolved(folders, console);
   if (!paths) return 1;
 
-  ScanAnalytics analytics(analyticsEndpoint, printsEvents);
+  ScanAnalytics analytics(analyticsEndpoint, printsEvents, console);
   analytics.scanStarted(paths->size());
   ScanLog log;
   for (const std::string& path : *paths) log.log("Will scan", URL::fileURLWithPath(path + "/"));

@@ -5,6 +5,7 @@
 #include <utility>
 
 #include <Varnel/Basalt/Executor.h>
+#include <Varnel/Context/ApplicationData.h>
 #include <Varnel/Platform/Ports/ExtendedAttributes.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/ProcessInfo.h>
@@ -38,8 +39,8 @@ Platform::Result<std::string> nameOfVolume(const URL& url, Platform::VolumeCatal
 
 KVDownloadSourceTracker::Ports KVDownloadSourceTracker::Ports::ofProcess() {
   const Platform::Ports& ports = Platform::processPorts();
-  return {ports.extendedAttributes, ports.processInfo,  ports.processLauncher,
-          ports.systemLog,          ports.userDefaults, ports.volumeCatalog};
+  return {ports.extendedAttributes, ports.processInfo,           ports.processLauncher,
+          ports.systemLog,          ApplicationData::settings(), ports.volumeCatalog};
 }
 
 KVDownloadSourceTracker::KVDownloadSourceTracker(std::shared_ptr<KVQuarantine> quarantine,

@@ -12,7 +12,7 @@ namespace Tallyhouse::Testing {
 /// A transport that keeps its events for the test to look at. Any thread.
 ///
 ///     auto sent = std::make_shared<MemoryTransport>();
-///     service(std::make_shared<AnalyticsTracker>(sent)).run();
+///     service(std::make_shared<AnalyticsTracker>(sent, Consent::granted)).run();
 ///     EXPECT_EQ(sent->events().at(0).action, "Notification Clicked");
 class MemoryTransport final : public AnalyticsTransport {
  public:

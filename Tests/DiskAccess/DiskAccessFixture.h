@@ -146,6 +146,11 @@ class DiskAccessFixture : public ::testing::Test {
     return waiters.at(0)->urgencyClass();
   }
 
+  /// The machine's calls from now on count and go wrong by one plan. To be set between inventories.
+  void setFaults(const std::shared_ptr<Platform::Testing::FaultPlan>& faults) {
+    devices_.faults = disks_.faults = volumes_.faults = scope_.faults = faults;
+  }
+
   Platform::Testing::FakeDeviceRegistry devices_;
   InterruptedRegistry registry_{devices_};
   Platform::Testing::FakeDiskArbitration disks_;

@@ -36,6 +36,34 @@ TEST_F(DiskAccessingSessionTest, OpensASecurityScopeOnlyWhenAskedAndOnAVolume) {
   EXPECT_EQ(accessCount(*access->diskData()), 1u);
 }
 
+// A fault may refuse an access. No place, scope or handle stays taken, and later ones are granted.
+TEST(DiskAccessFaults, RefuseAnAccessAndKeepNothing) {
+  struct Machine final : DiskAccessFixture {
+    void TestBody() override {}
+
+    void play(const std::shared_ptr<Platform::Testing::FaultPlan>& faults) {
+      setFaults(faults);
+      mountStick();
+      for (const URL& file : {homeFile, stickFile})
+        for (int access = 0; access < 2; ++access)
+          if (const Session session = begin(file)) session->endAccessing();
+      faults->mend();
+      unmount(stickVolume);
+      mountStick();
+      for (const URL& file : {homeFile, stickFile}) {
+        const DiskAccessGuard access(beginOnKnownDisk(file));
+        EXPECT_TRUE(access) << file.path();
+        EXPECT_EQ(accessCount(*access->diskData()), 1u);
+        EXPECT_EQ(scope_.openAccesses(file), 1);
+      }
+      EXPECT_EQ(scope_.openAccesses(homeFile) + scope_.openAccesses(stickFile), 0);
+      EXPECT_EQ(devices_.liveEntries() + disks_.liveSessions(), 0);
+    }
+  };
+  for (const auto fault : {Platform::Testing::Fault::fails, Platform::Testing::Fault::absent})
+    EXPECT_GE(sweepFaults(fault, [](const auto& faults) { Machine().play(faults); }), 10u);
+}
+
 TEST_F(DiskAccessingSessionTest, ASessionThatIsDroppedKeepsItsPlaceAndItsScope) {
   mountStick();
   std::shared_ptr<DiskData> disk;

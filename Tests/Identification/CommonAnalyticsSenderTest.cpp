@@ -52,7 +52,7 @@ class CommonAnalyticsSenderTest : public Tests::LoggerFixture {
   std::shared_ptr<Tallyhouse::Testing::MemoryTransport> sent_ =
       std::make_shared<Tallyhouse::Testing::MemoryTransport>();
   std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker_ =
-      std::make_shared<Tallyhouse::AnalyticsTracker>(sent_);
+      std::make_shared<Tallyhouse::AnalyticsTracker>(sent_, Tallyhouse::Consent::granted);
   ScannerSender sender_{tracker_, logger()};
 };
 

@@ -184,6 +184,46 @@ TEST_F(UserIdentificatorTest, OnlyTheSitesBuildPrefersCampaignAndCookie) {
   EXPECT_EQ(site.identificator(), provider);
 }
 
+// A fault may hide an identifier. It makes up none, and what is asked for each time is found again.
+TEST_F(UserIdentificatorTest, AFaultHidesAnIdentifierAndChangesNone) {
+  using Platform::Testing::Fault;
+  cookies.ofGroup["Cookies"] = {analyticsCookie("GA1.2.111.222")};
+  machine.addresses = {bytes({1, 2, 3, 4, 5, 6})};
+  download("https://example.org/a.dmg?cid=3");
+  const auto askedEachTime = [](const UserIdentificator& asked) {
+    return std::vector<Text>{asked.primaryMacAddress(), asked.downloadSourceURLString(),
+                             asked.downloadSourceURLCid(), asked.GACookieValue()};
+  };
+  const auto askedOnce = [](const UserIdentificator& asked) {
+    return std::vector<Text>{asked.machineUUID(), asked.serialNumber()};
+  };
+  const auto hides = [](const std::vector<Text>& truth, const std::vector<Text>& answers) {
+    for (std::size_t i = 0; i < truth.size(); ++i)
+      EXPECT_TRUE(answers[i] == truth[i] || !answers[i]) << *answers[i];
+  };
+  const auto changing = askedEachTime(user);
+  const auto stored = askedOnce(user);
+  for (const Fault fault : {Fault::fails, Fault::absent}) {
+    const auto calls = sweepFaults(fault, [&](const auto& faults) {
+      cookies.faults = machine.faults = attributes.faults = volumes.faults = faults;
+      const auto asked = std::make_shared<UserIdentificator>(
+          UserIdentificator::Ports{cookies,
+                                   machine,
+                                   account,
+                                   {attributes, processInfo, launcher, log, userDefaults, volumes}},
+          ".quennel.example");
+      hides(changing, askedEachTime(*asked));
+      hides(stored, askedOnce(*asked));
+      EXPECT_FALSE(
+          UserIdentificationInfo(asked, {.isSiteVersion = true}).uniqueClientIdentifier().empty());
+      EXPECT_EQ(asked->userIdentifier(), userIdentifierOf(asked->machineUUID(), "ada"));
+      faults->mend();
+      EXPECT_EQ(askedEachTime(*asked), changing);
+    });
+    EXPECT_GE(calls, 6u);
+  }
+}
+
 TEST_F(UserIdentificatorTest, AKeptDownloadIsLookedForOnce) {
   const std::shared_ptr<UserIdentificationProvider> provider(std::shared_ptr<void>(), &user);
   for (const char* url : {"", "https://example.org/a.dmg?cid=3"}) {

@@ -141,7 +141,7 @@ class AnalyticsDeliveryTest : public testing::Test {
 
 TEST_F(AnalyticsDeliveryTest, AnEventArrivesWithAllThatItCarries) {
   Server server({"204"});
-  AnalyticsTracker tracker(transport(server.url()));
+  AnalyticsTracker tracker(transport(server.url()), Consent::granted);
   tracker.context()->trackEvent("Scan", "Finished", "100 % \xC3\xA4&=", -5,
                                 {"12.34", std::nullopt, "13.0", "3", "2", "1", "0000001", "null"},
                                 {std::nullopt, 7});
@@ -156,7 +156,7 @@ TEST_F(AnalyticsDeliveryTest, AnEventArrivesWithAllThatItCarries) {
 
 TEST_F(AnalyticsDeliveryTest, NoBehaviourOfAServerLosesOrRenamesAnEvent) {
   Server server({"503/1", "cut", "garbage", "500/99999999999999999999", "429/soon", "302", "200"});
-  AnalyticsTracker tracker(transport(server.url()));
+  AnalyticsTracker tracker(transport(server.url()), Consent::granted);
   const auto start = std::chrono::steady_clock::now();
   tracker.context()->trackEvent("Scan", "Once", std::nullopt, std::nullopt, {}, {});
   std::set<std::string> uuids;
@@ -177,7 +177,7 @@ TEST_F(AnalyticsDeliveryTest, AServerThatHangsDelaysNeitherTheCallerNorTheEnd) {
   Server server({"hang"});
   const auto start = std::chrono::steady_clock::now();
   {
-    AnalyticsTracker tracker(transport(server.url()));
+    AnalyticsTracker tracker(transport(server.url()), Consent::granted);
     tracker.context()->trackEvent("Scan", "First", std::nullopt, std::nullopt, {}, {});
     EXPECT_EQ(server.next().hits.size(), 1u);
     for (int i = 0; i < 100; ++i)
@@ -186,7 +186,7 @@ TEST_F(AnalyticsDeliveryTest, AServerThatHangsDelaysNeitherTheCallerNorTheEnd) {
   EXPECT_LT(std::chrono::steady_clock::now() - start, 10s);
   Server other({"200"});
   const auto repeated = transport(other.url());
-  AnalyticsTracker tracker(repeated);
+  AnalyticsTracker tracker(repeated, Consent::granted);
   EXPECT_TRUE(repeated->drain(30s));
   std::size_t arrived = 0;
   while (arrived < 101) arrived += other.next().hits.size();
@@ -208,7 +208,7 @@ TEST_F(AnalyticsDeliveryTest, AKilledProcessDeliversOnTheNextStart) {
   }
   Server server({"200"});
   const auto transport = this->transport(server.url());
-  AnalyticsTracker tracker(transport);
+  AnalyticsTracker tracker(transport, Consent::granted);
   EXPECT_TRUE(transport->drain(60s));
   std::set<std::string> actions;
   std::set<std::string> uuids = before;
@@ -224,10 +224,33 @@ TEST_F(AnalyticsDeliveryTest, AKilledProcessDeliversOnTheNextStart) {
   EXPECT_EQ(actions.size(), count - before.size());
 }
 
+// The exit status of the host.
+int orvane(std::vector<std::string> arguments) {
+  arguments.insert(arguments.begin(), ORVANE_PROGRAM);
+  return Varnel::Tests::ChildProcess(arguments).wait();
+}
+
+TEST_F(AnalyticsDeliveryTest, ARefusalTakesBackWhatHasNotBeenSent) {
+  ::setenv("HOME", (folder_.path() / "home").c_str(), 1);
+  const std::string scanned = folder_.write("scanned/file", "content").parent_path();
+  Server server({"204"});
+  const std::vector<std::string> away = {"scan", "--analytics", "http://127.0.0.1:1", scanned,
+                                         scanned};
+  EXPECT_EQ(orvane({"scan", "--analytics", server.url(), scanned, scanned}), 0) << "not asked";
+  ASSERT_EQ(orvane({"analytics", "consent", "yes"}), 0);
+  EXPECT_EQ(orvane(away), 0);
+  ASSERT_EQ(orvane({"analytics", "consent", "no"}), 0);
+  EXPECT_EQ(orvane({"scan", "--analytics", server.url(), scanned, scanned}), 0) << "refused";
+  ASSERT_EQ(orvane({"analytics", "consent", "yes"}), 0);
+  EXPECT_EQ(orvane({"scan", "--analytics", server.url(), scanned}), 0);
+  EXPECT_EQ(parameter(server.next().hits.at(0), "ev"), "1") << "the folders of the last scan";
+}
+
 TEST_F(AnalyticsDeliveryTest, AScanSendsItsEventsOnceWhateverItsEnvironment) {
   ::setenv("HOME", (folder_.path() / "home").c_str(), 1);
   const Proxies proxies("http://127.0.0.1:1");
   folder_.write("scanned/file", "content");
+  ASSERT_EQ(orvane({"analytics", "consent", "yes"}), 0);
   Server server({"short"});
   for (int run = 0; run < 2; ++run) {
     Varnel::Tests::ChildProcess orvane({ORVANE_PROGRAM, "scan", "--analytics",

@@ -17,7 +17,8 @@ int main(int count, char** arguments) {
                                .trackingID = "QN-1",
                                .clientID = "12.34",
                                .spoolPath = arguments[2],
-                               .plainHTTP = SpoolingTransport::PlainHTTP::allowed}));
+                               .plainHTTP = SpoolingTransport::PlainHTTP::allowed}),
+      Consent::granted);
   for (int i = 0; i < std::atoi(arguments[3]); ++i)
     tracker.context()->trackEvent("Process", std::to_string(i), std::nullopt, i, {}, {});
   std::puts("tracked");

@@ -113,9 +113,10 @@ class Host final {
       Platform::Linux::makeUserNotificationCenters({*clock, locale, zones, *queue, log});
   Platform::UserNotificationCenter& center;
   UserNotificationRouter router;
-  SchedulerService service{{*clock, locale, zones, *queue, facts, module},
-                           std::make_shared<Tallyhouse::AnalyticsTracker>(sent),
-                           router};
+  SchedulerService service{
+      {*clock, locale, zones, *queue, facts, module},
+      std::make_shared<Tallyhouse::AnalyticsTracker>(sent, Tallyhouse::Consent::granted),
+      router};
 };
 
 TEST(NotificationServer, AReminderAppearsAndItsClicksComeBackOnce) {

@@ -80,6 +80,25 @@ TEST_F(SoundEngineTest, ASoundThatCannotBeLoadedStillEndsTheOneBefore) {
   EXPECT_EQ(player.sounds.size(), 2u);
 }
 
+TEST_F(SoundEngineTest, AFaultSilencesOneSoundAndNoOther) {
+  using Platform::Testing::Fault;
+  const auto calls = Platform::Testing::sweepFaults(Fault::fails, [&](const auto& faults) {
+    player.faults = faults;
+    player.sounds.clear();
+    int heard = 0;
+    for (const Sound sound : {Sound::start, Sound::tutorial, Sound::scanComplete}) {
+      engine.play(sound);
+      heard += engine.currentSound() ? 1 : 0;
+      EXPECT_TRUE(!engine.currentSound() || engine.currentSound()->isPlaying());
+    }
+    EXPECT_GE(heard, 2);
+    EXPECT_EQ(player.sounds.size(), static_cast<std::size_t>(heard));
+    engine.stop();
+    for (const auto& sound : player.sounds) EXPECT_EQ(sound->timesStopped, 1);
+  });
+  EXPECT_EQ(calls, 3u);
+}
+
 TEST_F(SoundEngineTest, MutingLeavesWhatPlaysAlone) {
   engine.play(Sound::start);
   engine.setSoundsEnabled(false);

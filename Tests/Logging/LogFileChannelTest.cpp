@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 #include <sys/syscall.h>
 
+#include <algorithm>
 #include <filesystem>
 #include <fstream>
 #include <thread>
@@ -16,6 +17,8 @@ namespace Varnel {
 namespace {
 
 using namespace std::chrono_literals;
+using Platform::Testing::Fault;
+using Platform::Testing::sweepFaults;
 
 constexpr auto longTime = std::chrono::hours(1);
 const std::string line = std::string(63, 'x') + "\n";
@@ -76,17 +79,18 @@ TEST_F(LogFileChannelTest, WritesByItselfAfterTheIntervalAlsoWhenItHasSlept) {
 
 TEST_F(LogFileChannelTest, NeverMakesAnAuthorWaitForTheDisk) {
   LogFileChannel channel(files, output, "/log");
-  files.hold();
+  files.faults->plan(Fault::delays, 1);
   for (int i = 0; i < 10'000; ++i) channel.append(line);
   EXPECT_EQ(text(), "");
-  files.release();
+  files.faults->mend();
   channel.flush();
   EXPECT_EQ(text().size(), 10'000 * line.size());
 }
 
 TEST_F(LogFileChannelTest, ReportsAFullDiskOnceForEachEntryAndGoesOn) {
   LogFileChannel channel(files, output, "/log", {.interval = longTime});
-  files.failNextAppends(1, std::errc::no_space_on_device);
+  files.failure = std::errc::no_space_on_device;
+  files.faults->plan(Fault::fails, 2, 1);  // after the opening
   channel.append("lost\n");
   channel.append("lost\n");
   channel.flush();
@@ -95,6 +99,28 @@ TEST_F(LogFileChannelTest, ReportsAFullDiskOnceForEachEntryAndGoesOn) {
   const std::string report = "Did fail to write log to file with error No space left on device\n";
   EXPECT_EQ(output.text(), report + report);
   EXPECT_EQ(text(), "kept\n");
+}
+
+// Every entry is in the file, or its author reads on the output that it is not.
+TEST(LogFileChannelFaults, LoseNoEntryUnsaid) {
+  constexpr std::size_t entries = 3;
+  for (const Fault fault : {Fault::fails, Fault::absent}) {
+    const auto calls = sweepFaults(fault, [&](const auto& faults) {
+      Platform::Testing::FakeAppendFiles files;
+      files.faults = faults;
+      Platform::Testing::CapturedOutput output;
+      LogFileChannel channel(files, output, "/log", {.interval = longTime});
+      for (std::size_t entry = 0; entry < entries; ++entry) {
+        channel.append(line);
+        channel.flush();
+      }
+      const std::string said = output.text();
+      if (said.starts_with("Unable to write log to file /log")) return;
+      const auto lost = static_cast<std::size_t>(std::count(said.begin(), said.end(), '\n'));
+      EXPECT_EQ(files.text("/log").size() / line.size() + lost, entries) << said;
+    });
+    EXPECT_EQ(calls, 1 + entries) << "the opening and the appends";
+  }
 }
 
 TEST_F(LogFileChannelTest, WritesAtOnceInAProcessThatMayHaveNoMoreThreads) {

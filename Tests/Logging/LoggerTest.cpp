@@ -154,7 +154,8 @@ TEST_F(LoggerTest, GoesOnWithoutAFolder) {
 }
 
 TEST_F(LoggerTest, GoesOnWithoutAFile) {
-  files.failOpening(std::errc::permission_denied);
+  files.failure = std::errc::permission_denied;
+  files.faults->plan(Platform::Testing::Fault::fails, 1);
   logger().flush();
   EXPECT_EQ(logger().logFileURL(), URL::fileURLWithPath(logPath()));
   const std::string atStart = output.text();

@@ -148,5 +148,19 @@ TEST(UserAccount, RefusesRelativeFolders) {
   }
 }
 
+TEST(UserFolders, HoldTheFilesOfAnIdentifierAndOfNoOther) {
+  ::setenv("HOME", "/home/ada", 1);
+  ::setenv("XDG_CONFIG_HOME", "", 1);
+  ::setenv("XDG_STATE_HOME", "relative", 1);
+  EXPECT_EQ(Linux::settingsFile("com.a.B"), "/home/ada/.config/com.a.B/settings.ini");
+  EXPECT_EQ(Linux::analyticsSpool("com.a.B"), "/home/ada/.local/state/com.a.B/analytics.sqlite");
+  ::setenv("XDG_CONFIG_HOME", "/c", 1);
+  ::setenv("XDG_STATE_HOME", "/s", 1);
+  EXPECT_EQ(Linux::settingsFile("com.a.B"), "/c/com.a.B/settings.ini");
+  for (const char* path : {"..", ".", "", "/"})
+    EXPECT_EQ(Linux::notificationStore(path), "/s/_/notifications.sqlite") << path;
+  EXPECT_EQ(Linux::notificationStore("a/../b"), "/s/a_.._b/notifications.sqlite");
+}
+
 }  // namespace
 }  // namespace Varnel::Platform

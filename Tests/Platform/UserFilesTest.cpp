@@ -5,14 +5,12 @@
 
 #include <cstdlib>
 #include <filesystem>
-#include <fstream>
 
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/Ports/ExtendedAttributes.h>
 #include <Varnel/Platform/Ports/ReadFile.h>
-#include <Varnel/Platform/Ports/UserDefaults.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
 #include <Varnel/Platform/Text/UTF8.h>
 
@@ -56,42 +54,6 @@ TEST(ReadFile, GivesAllBytesOrTheReason) {
   ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
   for (const std::string& path : {pipe, folder.path().string(), std::string("/dev/zero")})
     EXPECT_EQ(readFile(path).error(), std::errc::invalid_argument) << path;
-}
-
-TEST(UserDefaults, KeepValuesFromRunToRun) {
-  const Tests::TemporaryFolder folder;
-  ::setenv("XDG_CONFIG_HOME", folder.path().c_str(), 1);
-  const std::string key = "a [key] = with / odd \n characters";
-  {
-    const auto defaults = Linux::makeUserDefaults();
-    EXPECT_EQ(defaults->text(key), std::nullopt);
-    defaults->set(key, std::string("two\nlines; ünïcode "));
-    defaults->set("truth", true);
-    defaults->set("count", std::int64_t{-9007199254740993});
-    defaults->set("share", 0.1);
-    defaults->set("gone", std::string("x"));
-    defaults->remove("gone");
-  }
-  const auto defaults = Linux::makeUserDefaults();
-  EXPECT_EQ(defaults->text(key), "two\nlines; ünïcode ");
-  EXPECT_EQ(defaults->truthValue("truth"), true);
-  EXPECT_EQ(defaults->integer("count"), -9007199254740993);
-  EXPECT_EQ(defaults->real("share"), 0.1);
-  EXPECT_EQ(defaults->text("gone"), std::nullopt);
-  EXPECT_EQ(defaults->integer(key), std::nullopt);
-  EXPECT_EQ(defaults->truthValue("count"), std::nullopt);
-}
-
-TEST(UserDefaults, ADamagedFileCountsAsEmpty) {
-  const Tests::TemporaryFolder folder;
-  ::setenv("XDG_CONFIG_HOME", folder.path().c_str(), 1);
-  Linux::makeUserDefaults()->set("key", true);
-  for (const auto& entry : fs::recursive_directory_iterator(folder.path()))
-    if (entry.is_regular_file()) std::ofstream(entry.path()) << "\xFF\n[[]=\n";
-  const auto defaults = Linux::makeUserDefaults();
-  EXPECT_EQ(defaults->truthValue("key"), std::nullopt);
-  defaults->set("key", false);
-  EXPECT_EQ(Linux::makeUserDefaults()->truthValue("key"), false);
 }
 
 TEST(UTF8, IsRefusedWhereItIsMalformed) {

@@ -148,6 +148,7 @@ TEST_F(Orvane, RefusesWrongArgumentsInOneLineAndDoesNothing) {
       {{"scan", "--nope", folder.path()}, 2, "--nope"},
       {{"scan", "--qos", "fast\nest", folder.path()}, 2, "fast\\nest"},
       {{"disks", "extra"}, 2, "extra"},
+      {{"analytics", "consent", "maybe"}, 2, "maybe"},
       {{"remind"}, 2, "subcommand"},
       {{"remind", "every", "sometimes"}, 2, "sometimes"},
       {{"remind", "tomorrow", "--found", "-5", "--selected", "1"}, 2, "--found: \"-5\" is no"},
@@ -208,6 +209,52 @@ TEST_F(Orvane, ShowsPathsAndTheMenu) {
             "~/Music/\nx\n");
   EXPECT_THAT(run({"menu"}).output, AllOf(StartsWith("main-menu.orvane.about\n"),
                                           HasSubstr("\nmain-menu.duplicates.putBackAll\n")));
+}
+
+TEST_F(Orvane, SendsEventsOnlyToUsersWhoAgreed) {
+  const std::string spool = home.path(".local/state/com.quennel.Orvane2/analytics.sqlite");
+  const std::string settings = home.path(".config/com.quennel.Orvane2/settings.ini");
+  const std::vector<std::string> scan = {"scan", "--analytics", "https://127.0.0.1:1",
+                                         folder.path()};
+  const auto ask = [&](const char* complaint) {
+    const Outcome outcome = run(scan);
+    EXPECT_EQ(outcome.status, 0);
+    EXPECT_THAT(outcome.errors,
+                StartsWith(std::string("orvane: no events are sent: ") + complaint));
+    EXPECT_THAT(outcome.errors, Not(HasSubstr("Category:")));
+    EXPECT_EQ(outcome.errors.find("no events"), outcome.errors.rfind("no events"));
+  };
+  ask("the user has not been asked");
+  EXPECT_FALSE(std::filesystem::exists(spool));
+  auto printing = scan;
+  printing.push_back("--print-events");
+  EXPECT_THAT(run(printing).errors, HasSubstr("Category: `Scan` Action: `Started`"));
+  EXPECT_EQ(run({"analytics"}).output, "consent: not asked\n");
+  EXPECT_FALSE(std::filesystem::exists(settings)) << "asking is not answering";
+
+  EXPECT_EQ(run({"analytics", "consent", "yes"}).output, "consent: yes\n");
+  EXPECT_EQ(run({"analytics", "consent"}).output, "consent: yes\n");
+  EXPECT_THAT(run(scan).errors, Not(HasSubstr("no events")));
+  EXPECT_TRUE(std::filesystem::exists(spool));
+
+  EXPECT_EQ(run({"analytics", "consent", "no"}).output, "consent: no\n");
+  ask("the user has refused");
+}
+
+// A link where the settings should be is no setting of this program.
+TEST_F(Orvane, SaysThatAnAnswerIsNotKept) {
+  const std::string mine = home.write("mine", "[Defaults]\nanalyticsConsent=true\n");
+  std::filesystem::create_directories(home.path(".config/com.quennel.Orvane2"));
+  std::filesystem::create_symlink(mine, home.path(".config/com.quennel.Orvane2/settings.ini"));
+  for (const auto& command : {std::vector<std::string>{"analytics", "consent", "yes"},
+                              {"analytics", "consent", "no"},
+                              {"remind", "every", "weekly"}}) {
+    const Outcome outcome = run(command);
+    EXPECT_EQ(outcome.status, 1);
+    EXPECT_THAT(outcome.output, IsEmpty());
+    EXPECT_THAT(outcome.errors, HasSubstr("orvane: cannot keep the "));
+  }
+  EXPECT_EQ(run({"analytics"}).output, "consent: not asked\n");
 }
 
 // Without a session bus: planning needs none.

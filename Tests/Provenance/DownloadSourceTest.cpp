@@ -12,8 +12,10 @@
 #include <Tests/Support/QuarantineDatabase.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Basalt/Executor.h>
+#include <Varnel/Context/ApplicationData.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
+#include <Varnel/Platform/Testing/FakeExtendedAttributes.h>
 #include <Varnel/Platform/Testing/FakeProcessInfo.h>
 #include <Varnel/Platform/Testing/FakeProcessLauncher.h>
 #include <Varnel/Platform/Testing/FakeUserDefaults.h>
@@ -230,6 +232,34 @@ TEST_F(DownloadSource, AToolIsAskedUntilItHasEnded) {
   EXPECT_EQ(ofProcess.userDefaults().get(), &userDefaults);
 }
 
+// A fault may lead to a lesser source, as where the better one is not there. It does so once.
+TEST_F(DownloadSource, AFaultLeadsToALesserSourceOnce) {
+  using Platform::Testing::Fault;
+  Platform::Testing::FakeExtendedAttributes attributes;
+  attributes.values[{image.string(), "com.apple.quarantine"}] = "0083;5f3a;Browser;image";
+  attributes.values[{mounted.string(), "com.apple.quarantine"}] = "0083;5f3a;Browser;bundle";
+  for (const Fault fault : {Fault::fails, Fault::absent, Fault::delays}) {
+    const bool isSlow = fault == Fault::delays;
+    Platform::Testing::FakeProcessLauncher launcher;
+    launcher.script.output = propertyList();
+    const KVDownloadSourceTracker tracker(
+        std::make_shared<KVQuarantine>(database.string(), log),
+        {.volumesRoot = (folder.path() / "Volumes").string(), .bundlePath = mounted.string()},
+        {attributes, processInfo, launcher, log, userDefaults, volumes});
+    const auto calls = sweepFaults(fault, [&](const auto& faults) {
+      launcher.faults = faults;
+      if (!isSlow) attributes.faults = volumes.faults = faults;
+      const auto entry = tracker.installSourceEntry();
+      ASSERT_TRUE(entry);
+      EXPECT_THAT(std::string(entry->eventIdentifier().value_or("?")),
+                  testing::AnyOf("image", isSlow ? "image" : "bundle"));
+      faults->mend();
+      EXPECT_EQ(tracker.installSourceEntry()->eventIdentifier(), "image");
+    });
+    EXPECT_GE(calls, isSlow ? 1u : 4u);
+  }
+}
+
 TEST(DownloadSourceFilters, TheProductsNameIsFoundInAnyCaseAndSpacing) {
   const auto passes = [](std::string url) {
     return nameFilter()(
@@ -261,7 +291,7 @@ TEST(SharedTracker, IsOneAndHoldsWhatClientsNeed) {
   const auto tracker = KVDownloadSourceTracker::sharedTracker();
   EXPECT_EQ(tracker, KVDownloadSourceTracker::sharedTracker());
   EXPECT_EQ(tracker->quarantine()->path(), KVQuarantine::systemQuarantinePathV2());
-  EXPECT_EQ(tracker->userDefaults().get(), &Platform::processPorts().userDefaults);
+  EXPECT_EQ(tracker->userDefaults().get(), &ApplicationData::settings());
   std::promise<std::thread::id> ran;
   tracker->privateQueue()->execute([&] { ran.set_value(std::this_thread::get_id()); });
   EXPECT_NE(ran.get_future().get(), std::this_thread::get_id());

@@ -57,9 +57,10 @@ class SchedulerServiceTest : public ::testing::Test {
   const std::shared_ptr<Tallyhouse::Testing::MemoryTransport> sent =
       std::make_shared<Tallyhouse::Testing::MemoryTransport>();
   UserNotificationRouter router{{center, application, queue}};
-  SchedulerService service{{clock, locale, zones, queue, facts, module},
-                           std::make_shared<Tallyhouse::AnalyticsTracker>(sent),
-                           router};
+  SchedulerService service{
+      {clock, locale, zones, queue, facts, module},
+      std::make_shared<Tallyhouse::AnalyticsTracker>(sent, Tallyhouse::Consent::granted),
+      router};
 };
 
 TEST_F(SchedulerServiceTest, StartsWithNeverAndTouchesNothing) {

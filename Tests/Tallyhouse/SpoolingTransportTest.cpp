@@ -49,7 +49,7 @@ TEST_F(SpoolingTransportTest, TakesHTTPSUnlessToldOtherwise) {
 
 TEST_F(SpoolingTransportTest, EventsOfManyThreadsAllArrive) {
   const auto transport = std::shared_ptr(make());
-  AnalyticsTracker tracker({clock}, transport);
+  AnalyticsTracker tracker({clock}, transport, Consent::granted);
   Varnel::Tests::Crew(4, [&](unsigned) {
     for (int n = 0; n < 100; ++n) track(tracker, "Go");
   });
@@ -69,7 +69,7 @@ TEST_F(SpoolingTransportTest, AWithdrawnConsentStopsTransfersAndForgets) {
     return HTTPFailure{"lost"};
   });
   const auto transport = std::shared_ptr(make());
-  AnalyticsTracker tracker({clock}, transport);
+  AnalyticsTracker tracker({clock}, transport, Consent::granted);
   for (int i = 0; i < 40; ++i) track(tracker, "Before");
   isPosting.acquire();
   tracker.context()->setConsent(Consent::refused);
@@ -94,8 +94,10 @@ TEST_F(SpoolingTransportTest, WhatEarlierRunsLeftGoesWithConsentAlone) {
   EXPECT_EQ(namesOf(*openSpool()), "");
 
   append(*openSpool(), {"c"});
+  { AnalyticsTracker tracker({clock}, make()); }
+  EXPECT_TRUE(http.posts().empty());
   const auto transport = std::shared_ptr(make());
-  AnalyticsTracker tracker({clock}, transport);
+  AnalyticsTracker tracker({clock}, transport, Consent::granted);
   EXPECT_TRUE(transport->drain(30s));
   EXPECT_EQ(http.posts().size(), 1u);
 }
@@ -103,7 +105,7 @@ TEST_F(SpoolingTransportTest, WhatEarlierRunsLeftGoesWithConsentAlone) {
 TEST_F(SpoolingTransportTest, ADrainEndsWhenTheServerFails) {
   http.setServer([](const HTTPPost&) { return HTTPResponse{.status = 503, .retryAfter = {}}; });
   const auto transport = std::shared_ptr(make());
-  AnalyticsTracker tracker({clock}, transport);
+  AnalyticsTracker tracker({clock}, transport, Consent::granted);
   track(tracker, "Go");
   EXPECT_FALSE(transport->drain(1h));
   EXPECT_FALSE(transport->drain(1h)) << "nor does it wait for the pause to end";

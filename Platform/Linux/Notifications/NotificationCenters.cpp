@@ -18,19 +18,17 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr const char* storeName = "notifications.sqlite";
-
 // One center with everything that serves it alone. Other processes of the product may change its
 // file; a change of the user's time zone changes the link /etc/localtime.
 class Center final {
  public:
-  Center(const NotificationPorts& ports, const NotificationSource& source, const fs::path& folder)
+  Center(const NotificationPorts& ports, const NotificationSource& source, const fs::path& store)
       : server_(makeNotificationServer(ports.systemLog, source)),
         timer_(makeWallClockTimer(ports.systemLog)),
         center_({ports.clock, ports.userLocale, ports.timeZones, ports.mainQueue, ports.systemLog,
                  *server_, *timer_},
-                folder / storeName),
-        storeWatch_(folder, storeName, [this] { center_.recheck(); }),
+                store),
+        storeWatch_(store.parent_path(), store.filename(), [this] { center_.recheck(); }),
         zoneWatch_("/etc", "localtime", [this] { center_.recheck(); }) {}
 
   UserNotificationCenter& center() { return center_; }
@@ -43,20 +41,12 @@ class Center final {
   const FileWatch zoneWatch_;
 };
 
-// An identifier must be the name of one folder, not a path to another place.
-std::string folderName(std::string identifier) {
-  for (char& character : identifier)
-    if (character == '/' || character == '\0') character = '_';
-  if (identifier.empty() || identifier == "." || identifier == "..") return "_";
-  return identifier;
-}
-
-// The folder must exist before it can be watched. It is for the user alone.
-fs::path privateFolder(const fs::path& folder) {
+// Its folder must exist before it can be watched. It is for the user alone.
+fs::path inPrivateFolder(const fs::path& store) {
   std::error_code ignored;
-  if (fs::create_directories(folder, ignored))
-    fs::permissions(folder, fs::perms::owner_all, ignored);
-  return folder;
+  if (fs::create_directories(store.parent_path(), ignored))
+    fs::permissions(store.parent_path(), fs::perms::owner_all, ignored);
+  return store;
 }
 
 class StoredCenters final : public UserNotificationCenters {
@@ -66,8 +56,8 @@ class StoredCenters final : public UserNotificationCenters {
   UserNotificationCenter& center(const NotificationSource& source) override {
     auto& center = centers_[source.identifier];
     if (!center)
-      center = std::make_unique<Center>(
-          ports_, source, privateFolder(userStateFolder() / folderName(source.identifier)));
+      center = std::make_unique<Center>(ports_, source,
+                                        inPrivateFolder(notificationStore(source.identifier)));
     return center->center();
   }
 

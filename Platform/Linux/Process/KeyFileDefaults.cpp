@@ -1,26 +1,42 @@
 // SPDX-License-Identifier: MIT
+#include <Varnel/Platform/Linux/Process/KeyFileDefaults.h>
+
 #include <glib.h>
 
-#include <filesystem>
-#include <mutex>
+#include <utility>
 
-#include <Varnel/Platform/Linux/Adapters.h>
-#include <Varnel/Platform/Linux/Process/UserFolders.h>
-#include <Varnel/Platform/Ports/UserDefaults.h>
+#include <Varnel/Platform/Ports/PrivateFiles.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Text/UTF8.h>
 #include <Varnel/Platform/Values/UniqueHandle.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
 
-namespace fs = std::filesystem;
 using KeyFile = UniqueHandle<GKeyFile*, g_key_file_unref>;
 using Text = UniqueHandle<char*, g_free>;
 
 constexpr const char* group = "Defaults";
+constexpr auto keepsEverything =
+    static_cast<GKeyFileFlags>(G_KEY_FILE_KEEP_COMMENTS | G_KEY_FILE_KEEP_TRANSLATIONS);
 
 // A key of the file has no "=", no brackets and no blanks around it.
 Text escaped(const std::string& key) {
   return Text(g_uri_escape_string(key.c_str(), nullptr, FALSE));
+}
+
+bool canBeKey(const std::string& text) {
+  return !text.empty() && text.find('\0') == std::string::npos;
+}
+
+// Another text would be cut, or be refused by the reader.
+bool canBeKept(const UserDefaults::Value& value) {
+  const auto* text = std::get_if<std::string>(&value);
+  return !text || (text->find('\0') == std::string::npos && isValidUTF8(*text));
+}
+
+PlatformError invalidArgument() {
+  return PlatformError(std::make_error_code(std::errc::invalid_argument));
 }
 
 struct Setter {
@@ -35,70 +51,80 @@ struct Setter {
   }
 };
 
-class KeyFileDefaults final : public UserDefaults {
- public:
-  std::optional<bool> truthValue(const std::string& key) const override {
-    return read<bool>(key, [](auto... arguments) { return g_key_file_get_boolean(arguments...); });
-  }
-  std::optional<std::int64_t> integer(const std::string& key) const override {
-    return read<std::int64_t>(key, g_key_file_get_int64);
-  }
-  std::optional<double> real(const std::string& key) const override {
-    return read<double>(key, g_key_file_get_double);
-  }
-  std::optional<std::string> text(const std::string& key) const override {
-    const auto value = read<Text>(
-        key, [](auto... arguments) { return Text(g_key_file_get_string(arguments...)); });
-    if (!value) return std::nullopt;
-    return value->get();
-  }
-
-  void set(const std::string& key, const Value& value) override {
-    const std::lock_guard lock(mutex_);
-    std::visit(Setter{loaded(), escaped(key).get()}, value);
-    save();
-  }
-
-  void remove(const std::string& key) override {
-    const std::lock_guard lock(mutex_);
-    if (g_key_file_remove_key(loaded(), group, escaped(key).get(), nullptr)) save();
-  }
-
- private:
-  template <typename Type, typename Get>
-  std::optional<Type> read(const std::string& key, Get get) const {
-    const std::lock_guard lock(mutex_);
-    GError* error = nullptr;
-    std::optional<Type> value(get(loaded(), group, escaped(key).get(), &error));
-    if (!error) return value;
-    g_error_free(error);
-    return std::nullopt;
-  }
-
-  // A file that is missing or damaged counts as empty.
-  GKeyFile* loaded() const {
-    if (!file_) {
-      file_ = KeyFile(g_key_file_new());
-      g_key_file_load_from_file(file_.get(), path_.c_str(), G_KEY_FILE_KEEP_COMMENTS, nullptr);
-    }
-    return file_.get();
-  }
-
-  void save() const {
-    std::error_code ignored;
-    fs::create_directories(path_.parent_path(), ignored);
-    g_key_file_save_to_file(file_.get(), path_.c_str(), nullptr);
-  }
-
-  const fs::path path_ = userConfigurationFolder() / applicationFolderName() / "defaults.ini";
-  mutable std::mutex mutex_;  ///< Owns `file_`.
-  mutable KeyFile file_;
-};
+// None when the text is no key file.
+KeyFile parsed(const std::string& text) {
+  KeyFile file(g_key_file_new());
+  if (!g_key_file_load_from_data(file.get(), text.data(), text.size(), keepsEverything, nullptr))
+    file = KeyFile();
+  return file;
+}
 
 }  // namespace
 
-std::unique_ptr<UserDefaults> makeUserDefaults() {
-  return std::make_unique<KeyFileDefaults>();
+KeyFileDefaults::KeyFileDefaults(PrivateFiles& files, SystemLog& systemLog, std::string path)
+    : systemLog_(systemLog), path_(path), file_(files, std::move(path)) {}
+
+std::optional<bool> KeyFileDefaults::truthValue(const std::string& key) const {
+  return read<bool>(key, [](auto... arguments) { return g_key_file_get_boolean(arguments...); });
+}
+std::optional<std::int64_t> KeyFileDefaults::integer(const std::string& key) const {
+  return read<std::int64_t>(key, g_key_file_get_int64);
+}
+std::optional<double> KeyFileDefaults::real(const std::string& key) const {
+  return read<double>(key, g_key_file_get_double);
+}
+std::optional<std::string> KeyFileDefaults::text(const std::string& key) const {
+  const auto value =
+      read<Text>(key, [](auto... arguments) { return Text(g_key_file_get_string(arguments...)); });
+  if (!value) return std::nullopt;
+  return value->get();
+}
+
+std::optional<PlatformError> KeyFileDefaults::set(const std::string& key, const Value& value) {
+  if (!canBeKey(key) || !canBeKept(value)) return invalidArgument();
+  return change([&](GKeyFile* file) { std::visit(Setter{file, escaped(key).get()}, value); });
+}
+
+std::optional<PlatformError> KeyFileDefaults::remove(const std::string& key) {
+  if (!canBeKey(key)) return invalidArgument();
+  return change(
+      [&](GKeyFile* file) { g_key_file_remove_key(file, group, escaped(key).get(), nullptr); });
+}
+
+template <typename Type, typename Get>
+std::optional<Type> KeyFileDefaults::read(const std::string& key, Get get) const {
+  const auto text = file_.text();
+  if (!text) complain("cannot be read: " + text.error().localizedDescription());
+  if (!text || !*text || !canBeKey(key)) return std::nullopt;
+  const KeyFile file = parsed(**text);
+  if (!file) complain("are damaged, and count as empty");
+  if (!file) return std::nullopt;
+  GError* error = nullptr;
+  std::optional<Type> value(get(file.get(), group, escaped(key).get(), &error));
+  if (!error) return value;
+  g_error_free(error);
+  return std::nullopt;
+}
+
+std::optional<PlatformError> KeyFileDefaults::change(const std::function<void(GKeyFile*)>& edit) {
+  const auto lock = file_.lock();
+  if (!lock) return lock.error();
+  const auto text = file_.text();
+  if (!text) return text.error();
+  KeyFile file = parsed(text->value_or(""));
+  if (!file) {
+    if (auto error = file_.setAside()) return error;
+    complain("were damaged, and are now beside a new file, as .damaged");
+    file = KeyFile(g_key_file_new());
+  }
+  edit(file.get());
+  gsize size = 0;
+  const Text edited(g_key_file_to_data(file.get(), &size, nullptr));
+  return file_.replace({edited.get(), size});
+}
+
+void KeyFileDefaults::complain(const std::string& trouble) const {
+  if (!hasComplained_.exchange(true)) systemLog_.write("The settings in " + path_ + " " + trouble);
 }
 
 }  // namespace Varnel::Platform::Linux

@@ -19,21 +19,36 @@ fs::path folder(const char* variable, const char* belowHome) {
   return fs::path(POSIX::makeUserAccount()->homeFolder()) / belowHome;
 }
 
+std::string folderName(std::string identifier) {
+  for (char& character : identifier)
+    if (character == '/' || character == '\0') character = '_';
+  if (identifier.empty() || identifier == "." || identifier == "..") return "_";
+  return identifier;
+}
+
+fs::path stateFolder(const std::string& identifier) {
+  return folder("XDG_STATE_HOME", ".local/state") / folderName(identifier);
+}
+
 }  // namespace
+
+fs::path settingsFile(const std::string& identifier) {
+  return folder("XDG_CONFIG_HOME", ".config") / folderName(identifier) / "settings.ini";
+}
+
+fs::path notificationStore(const std::string& identifier) {
+  return stateFolder(identifier) / "notifications.sqlite";
+}
+
+fs::path analyticsSpool(const std::string& identifier) {
+  return stateFolder(identifier) / "analytics.sqlite";
+}
 
 fs::path userDataFolder() {
   return folder("XDG_DATA_HOME", ".local/share");
 }
 
-fs::path userConfigurationFolder() {
-  return folder("XDG_CONFIG_HOME", ".config");
-}
-
-fs::path userStateFolder() {
-  return folder("XDG_STATE_HOME", ".local/state");
-}
-
-std::string applicationFolderName() {
+std::string executableName() {
   static const auto& executable = *new fs::path(makeProcessInfo()->executablePath());
   return executable.filename().string();
 }

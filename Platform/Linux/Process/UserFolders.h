@@ -6,13 +6,18 @@
 
 namespace Varnel::Platform::Linux {
 
-/// The folders of the desktop's base-directory convention. The environment may move them, but only
-/// to absolute paths. They need not exist.
-[[nodiscard]] std::filesystem::path userDataFolder();
-[[nodiscard]] std::filesystem::path userConfigurationFolder();
-[[nodiscard]] std::filesystem::path userStateFolder();
+/// The files of one application of this user, by its base identifier, in the folders of the
+/// desktop's base-directory standard. They need not exist.
+///
+/// The environment may move the folders, but only to absolute paths. Whatever an identifier holds,
+/// it names one folder and no path.
+[[nodiscard]] std::filesystem::path settingsFile(const std::string& identifier);
+[[nodiscard]] std::filesystem::path notificationStore(const std::string& identifier);
+[[nodiscard]] std::filesystem::path analyticsSpool(const std::string& identifier);
 
-/// The name of this application's own folder in them: that of its executable.
-[[nodiscard]] std::string applicationFolderName();
+/// Where other programs keep the cookies that are read here, and the name of this program's own
+/// folder there: that of its executable.
+[[nodiscard]] std::filesystem::path userDataFolder();
+[[nodiscard]] std::string executableName();
 
 }  // namespace Varnel::Platform::Linux

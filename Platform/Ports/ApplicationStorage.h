@@ -1,0 +1,29 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <string>
+
+#include <Varnel/Platform/Api.h>
+
+namespace Varnel::Platform {
+
+class UserDefaults;
+
+/// What applications keep in this user's folders from run to run, each under its base identifier.
+/// Processes that name one identifier share what is kept under it. Any thread.
+///
+///     storage.userDefaults("com.example.Fotovia").set("scans", std::int64_t{3});
+class VARNEL_API ApplicationStorage {
+ public:
+  virtual ~ApplicationStorage() = default;
+
+  /// The settings of an application: the same object for the same identifier, as long-lived as
+  /// this one.
+  [[nodiscard]] virtual UserDefaults& userDefaults(const std::string& identifier) = 0;
+
+  /// The absolute path of the file where an application's analytics events wait. Neither the file
+  /// nor its folder need exist.
+  [[nodiscard]] virtual std::string analyticsSpoolPath(const std::string& identifier) const = 0;
+};
+
+}  // namespace Varnel::Platform

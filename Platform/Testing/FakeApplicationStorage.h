@@ -1,0 +1,36 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <map>
+#include <mutex>
+#include <string>
+#include <utility>
+
+#include <Varnel/Platform/Ports/ApplicationStorage.h>
+#include <Varnel/Platform/Testing/FakeUserDefaults.h>
+
+namespace Varnel::Platform::Testing {
+
+/// Settings in memory and files below a folder of the test, by identifier. Any thread.
+///
+///     FakeApplicationStorage storage(temporaryFolder);
+///     storage.userDefaults("com.example.Fotovia").set("scans", std::int64_t{3});
+class FakeApplicationStorage final : public ApplicationStorage {
+ public:
+  explicit FakeApplicationStorage(std::string folder) : folder_(std::move(folder)) {}
+
+  [[nodiscard]] FakeUserDefaults& userDefaults(const std::string& identifier) override {
+    const std::lock_guard lock(mutex_);
+    return userDefaults_[identifier];
+  }
+  [[nodiscard]] std::string analyticsSpoolPath(const std::string& identifier) const override {
+    return folder_ + '/' + identifier + "/analytics.sqlite";
+  }
+
+ private:
+  const std::string folder_;
+  std::mutex mutex_;  ///< Owns `userDefaults_`.
+  std::map<std::string, FakeUserDefaults> userDefaults_;
+};
+
+}  // namespace Varnel::Platform::Testing
