@@ -14,6 +14,7 @@ class ExtendedAttributes;
 class MachineIdentity;
 class MainQueue;
 class NotificationServer;
+class PrivateFiles;
 class ProcessInfo;
 class ProcessLauncher;
 class SoundPlayer;
@@ -67,6 +68,7 @@ struct NotificationPorts {
   UserLocale& userLocale;
   TimeZones& timeZones;
   MainQueue& mainQueue;
+  PrivateFiles& privateFiles;
   SystemLog& systemLog;
 };
 [[nodiscard]] std::unique_ptr<UserNotificationCenters> makeUserNotificationCenters(

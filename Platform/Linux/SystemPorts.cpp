@@ -53,6 +53,7 @@ const Ports& systemPorts() {
   static const auto mountTable = Linux::makeMountTable();
   static Clock& clock = keep(POSIX::makeClock());
   static SystemLog& systemLog = keep(POSIX::makeSystemLog());
+  static PrivateFiles& privateFiles = keep(POSIX::makePrivateFiles());
   static MainQueue& mainQueue = *new WatchedMainQueue(Linux::makeMainQueue(), systemLog);
   static TimeZones& timeZones = keep(Linux::makeTimeZones());
   static UserLocale& userLocale = keep(POSIX::makeUserLocale());
@@ -67,7 +68,7 @@ const Ports& systemPorts() {
       .httpClient = keep(POSIX::makeHTTPClient()),
       .machineIdentity = keep(Linux::makeMachineIdentity()),
       .mainQueue = mainQueue,
-      .privateFiles = keep(POSIX::makePrivateFiles()),
+      .privateFiles = privateFiles,
       .processInfo = keep(Linux::makeProcessInfo()),
       .processLauncher = keep(Linux::makeProcessLauncher()),
       .securityScope = keep(POSIX::makeSecurityScope()),
@@ -78,8 +79,8 @@ const Ports& systemPorts() {
       .userAccount = keep(POSIX::makeUserAccount()),
       .userDefaults = keep(Linux::makeUserDefaults()),
       .userLocale = userLocale,
-      .userNotificationCenters = keep(
-          Linux::makeUserNotificationCenters({clock, userLocale, timeZones, mainQueue, systemLog})),
+      .userNotificationCenters = keep(Linux::makeUserNotificationCenters(
+          {clock, userLocale, timeZones, mainQueue, privateFiles, systemLog})),
       .volumeCatalog = keep(Linux::makeVolumeCatalog(mountTable)),
       .workspace = keep(Linux::makeWorkspace()),
   };

@@ -27,9 +27,9 @@ class Center final {
   Center(const NotificationPorts& ports, const NotificationSource& source, const fs::path& folder)
       : server_(makeNotificationServer(ports.systemLog, source)),
         timer_(makeWallClockTimer(ports.systemLog)),
-        center_({ports.clock, ports.userLocale, ports.timeZones, ports.mainQueue, ports.systemLog,
-                 *server_, *timer_},
-                folder / storeName),
+        center_({ports.clock, ports.userLocale, ports.timeZones, ports.mainQueue,
+                 ports.privateFiles, ports.systemLog, *server_, *timer_},
+                (folder / storeName).string()),
         storeWatch_(folder, storeName, [this] { center_.recheck(); }),
         zoneWatch_("/etc", "localtime", [this] { center_.recheck(); }) {}
 
