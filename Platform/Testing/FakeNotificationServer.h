@@ -34,21 +34,18 @@ class FakeNotificationServer final : public NotificationServer {
 
   void show(const std::string& token, const Banner& banner,
             const std::optional<std::string>& replacedReference) override {
-    if (!isPresent || refuses) return answers_.push_back([token](Observer& told) {
-      told.bannerFailed(token);
-    });
+    if (!isPresent || refuses)
+      return answers_.push_back([token](Observer& told) { told.bannerFailed(token); });
     if (replacedReference) shown_.erase(*replacedReference);
     const std::string reference = std::to_string(++lastReference_);
     shown_[reference] = {token, banner};
     history_.push_back(banner);
-    answers_.push_back(
-        [token, reference](Observer& told) { told.bannerShown(token, reference); });
+    answers_.push_back([token, reference](Observer& told) { told.bannerShown(token, reference); });
   }
 
   void close(const std::string& token, const std::optional<std::string>& reference) override {
-    if (!isPresent) return answers_.push_back([token](Observer& told) {
-      told.bannerFailed(token);
-    });
+    if (!isPresent)
+      return answers_.push_back([token](Observer& told) { told.bannerFailed(token); });
     if (reference) shown_.erase(*reference);
     std::erase_if(shown_, [&](const auto& each) { return each.second.token == token; });
     answers_.push_back([token](Observer& told) { told.bannerGone(token); });
@@ -84,7 +81,9 @@ class FakeNotificationServer final : public NotificationServer {
       if (const auto observer = observer_.lock()) observer->bannerGone(gone.token);
   }
 
-  /// The banners that the user sees, by title.
+  /// How many banners the user sees.
+  [[nodiscard]] std::size_t count() const { return shown_.size(); }
+  /// Those banners, by title.
   [[nodiscard]] std::map<std::string, Banner> banners() const {
     std::map<std::string, Banner> banners;
     for (const auto& [reference, each] : shown_) banners[each.banner.title] = each.banner;
