@@ -2,9 +2,11 @@
 #include <Varnel/Platform/Generic/NotificationStore.h>
 
 #include <fmt/format.h>
+#include <fmt/ranges.h>
 
 #include <algorithm>
-#include <utility>
+#include <array>
+#include <string_view>
 
 #include <Varnel/Platform/Generic/NotificationColumns.h>
 #include <Varnel/Platform/Text/Calendar.h>
@@ -13,22 +15,40 @@
 namespace Varnel::Platform {
 namespace {
 
-using Failure = std::optional<PlatformError>;
+using Failure = NotificationStore::Failure;
+using enum DeliveryState;
 
-// The delivered list keeps the latest notifications, because nobody has to remove any.
-constexpr int maxDelivered = 100;
+// As they stand in the file, in the order of the enumeration.
+constexpr std::array<const char*, 7> stateNames{"planned", "due",     "hidden", "toShow",
+                                                "shown",   "expired", "removed"};
 
-std::string schema() {
-  constexpr const char* content =
-      "key TEXT PRIMARY KEY NOT NULL, identifier TEXT, title TEXT, text TEXT, action TEXT, "
-      "other TEXT, date INTEGER, years INTEGER, months INTEGER, days INTEGER, hours INTEGER, "
-      "minutes INTEGER, seconds INTEGER";
-  return fmt::format(
-      "CREATE TABLE IF NOT EXISTS scheduled ({0}, zone TEXT NOT NULL, count INTEGER NOT NULL);"
-      "CREATE TABLE IF NOT EXISTS delivered ({0}, delivered INTEGER NOT NULL, banner TEXT);"
-      "SELECT key, {1}, zone, count FROM scheduled LIMIT 0;"
-      "SELECT key, {1}, delivered, banner FROM delivered LIMIT 0;",
-      content, notificationColumns);
+// The delivered list keeps the latest, because nobody has to remove any. What has yet to be shown
+// stays.
+constexpr std::int64_t maxDelivered = 100;
+
+DurableFormat format() {
+  // Numbers are random, so that rows which were saved from a lost file meet no others.
+  constexpr const char* schema =
+      "CREATE TABLE deliveries (number INTEGER PRIMARY KEY, state TEXT NOT NULL, key TEXT NOT NULL,"
+      " zone TEXT NOT NULL, count INTEGER NOT NULL, banner TEXT, delivered INTEGER,"
+      " identifier TEXT, title TEXT, text TEXT, action TEXT, other TEXT, date INTEGER,"
+      " years INTEGER, months INTEGER, days INTEGER, hours INTEGER, minutes INTEGER,"
+      " seconds INTEGER);"
+      "CREATE UNIQUE INDEX planned ON deliveries (key) WHERE state = 'planned';"
+      "CREATE UNIQUE INDEX delivered ON deliveries (key)"
+      " WHERE state IN ('due', 'hidden', 'toShow', 'shown', 'expired')";
+  return {.subject = "notifications",
+          .applicationID = 0x564e6f74,
+          .version = {.major = 1, .minor = 0},
+          .schema = schema,
+          .migrations = {},
+          .journal = DurableFormat::Journal::rollback,
+          .synchronisation = DurableFormat::Synchronisation::survivesPowerLoss,
+          .tables = {{.name = "deliveries",
+                      .columns = {"number", "state",  "key",    "zone",      "count",
+                                  "banner", "delivered", "identifier", "title", "text",
+                                  "action", "other",  "date",   "years",     "months",
+                                  "days",   "hours",  "minutes", "seconds"}}}};
 }
 
 // A notification is known by its identifier. One without an identifier gets a unique name.
@@ -37,193 +57,237 @@ std::string keyOf(const UserNotification& notification) {
                                  : "unique " + randomUUIDString();
 }
 
-std::string textOf(SQLiteStatement& row, int column) {
-  return std::string(row.text(column).value_or(std::string_view()));
+std::optional<std::string> textOf(SQLiteStatement& row, int column) {
+  const auto text = row.text(column);
+  return text ? std::optional<std::string>(*text) : std::nullopt;
 }
 
-// Runs a statement, handing each row to `use`.
-template <typename Bind, typename Use>
-Failure run(SQLiteDatabase& database, const std::string& sql, Bind bind, Use use) {
-  auto statement = database.prepare(sql);
+// Runs a statement with these parameters, handing each row to `use`.
+template <typename Use, typename... Parameters>
+Failure select(SQLiteDatabase& database, const std::string& sql, Use use,
+               const Parameters&... parameters) {
+  const auto statement = database.cached(sql);
   if (!statement) return statement.error();
-  bind(*statement);
+  int index = 0;
+  ((*statement)->bind(++index, parameters), ...);
   while (true) {
-    const auto step = statement->step();
+    const auto step = (*statement)->step();
     if (!step) return step.error();
     if (*step == SQLiteStatement::Step::done) return std::nullopt;
-    use(*statement);
+    use(**statement);
   }
 }
 
-template <typename Bind>
-Failure run(SQLiteDatabase& database, const std::string& sql, Bind bind) {
-  return run(database, sql, bind, [](SQLiteStatement&) {});
+template <typename... Parameters>
+Failure run(SQLiteDatabase& database, const std::string& sql, const Parameters&... parameters) {
+  return select(database, sql, [](SQLiteStatement&) {}, parameters...);
 }
 
-constexpr auto nothingToBind = [](SQLiteStatement&) {};
-
-Failure readSchedules(SQLiteDatabase& database, std::vector<NotificationSchedule>& schedules) {
-  schedules.clear();
-  return run(database,
-             fmt::format("SELECT key, zone, count, {} FROM scheduled", notificationColumns),
-             nothingToBind, [&](SQLiteStatement& row) {
-               schedules.push_back({.key = textOf(row, 0),
-                                    .notification = readNotification(row, 3),
-                                    .timeZone = textOf(row, 1),
-                                    .deliveryCount = row.integer(2).value_or(0)});
-             });
+Failure insert(SQLiteDatabase& database, const Delivery& delivery) {
+  static const std::string sql = fmt::format(
+      "INSERT INTO deliveries (state, key, zone, count, banner, delivered, {}, number) VALUES "
+      "(?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, "
+      "coalesce(nullif(?, 0), random()))",
+      notificationColumns);
+  const auto statement = database.cached(sql);
+  if (!statement) return statement.error();
+  SQLiteStatement& row = **statement;
+  const NotificationSchedule& schedule = delivery.schedule;
+  const auto& delivered = schedule.notification.actualDeliveryDate;
+  row.bind(1, stateNames.at(static_cast<std::size_t>(delivery.state)));
+  row.bind(2, schedule.key);
+  row.bind(3, schedule.timeZone);
+  row.bind(4, schedule.deliveryCount);
+  delivery.banner ? row.bind(5, *delivery.banner) : row.bindNull(5);
+  delivered ? row.bind(6, std::int64_t{delivered->time_since_epoch().count()}) : row.bindNull(6);
+  bindNotification(row, 7, schedule.notification);
+  row.bind(7 + notificationColumnCount, delivery.number);
+  const auto step = row.step();
+  return step ? std::nullopt : Failure(step.error());
 }
 
-Failure removeByKey(SQLiteDatabase& database, const std::string& table, const std::string& key) {
-  return run(database, fmt::format("DELETE FROM {} WHERE key = ?", table),
-             [&](SQLiteStatement& statement) { statement.bind(1, key); });
-}
-
-Failure advance(SQLiteDatabase& database, const std::string& key,
-                const std::optional<std::int64_t>& count) {
-  if (!count) return removeByKey(database, "scheduled", key);
-  return run(database, "UPDATE scheduled SET count = ? WHERE key = ?",
-             [&](SQLiteStatement& statement) {
-               statement.bind(1, *count);
-               statement.bind(2, key);
-             });
-}
-
-Failure insertDelivered(SQLiteDatabase& database, DeliveredNotification& delivered, Date now) {
-  const std::int64_t time = now.time_since_epoch().count();
-  delivered.notification.actualDeliveryDate = now;
-  auto failure = run(
-      database, "SELECT banner FROM delivered WHERE key = ?",
-      [&](SQLiteStatement& statement) { statement.bind(1, delivered.key); },
+Failure select(SQLiteDatabase& database, const std::vector<DeliveryState>& states,
+               std::vector<Delivery>& found) {
+  std::vector<std::string> names;
+  for (const DeliveryState state : states)
+    names.push_back(fmt::format("'{}'", stateNames.at(static_cast<std::size_t>(state))));
+  found.clear();
+  return select(
+      database,
+      fmt::format("SELECT number, state, key, zone, count, banner, delivered, {} FROM deliveries "
+                  "WHERE state IN ({}) ORDER BY delivered DESC, date DESC",
+                  notificationColumns, fmt::join(names, ", ")),
       [&](SQLiteStatement& row) {
-        if (const auto banner = row.text(0)) delivered.bannerReference = std::string(*banner);
+        const auto name = std::find(stateNames.begin(), stateNames.end(), row.text(1));
+        Delivery delivery{.number = row.integer(0).value_or(0),
+                          .state = static_cast<DeliveryState>(name - stateNames.begin()),
+                          .schedule = {.key = textOf(row, 2).value_or(""),
+                                       .notification = readNotification(row, 7),
+                                       .timeZone = textOf(row, 3).value_or(""),
+                                       .deliveryCount = row.integer(4).value_or(0)},
+                          .banner = textOf(row, 5)};
+        if (const auto delivered = row.integer(6))
+          delivery.schedule.notification.actualDeliveryDate = Date(Date::duration(*delivered));
+        found.push_back(std::move(delivery));
       });
-  if (failure) return failure;
-  failure = run(database,
-                fmt::format("INSERT OR REPLACE INTO delivered (key, delivered, {}) VALUES "
-                            "(?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?)",
-                            notificationColumns),
-                [&](SQLiteStatement& statement) {
-                  statement.bind(1, delivered.key);
-                  statement.bind(2, time);
-                  bindNotification(statement, 3, delivered.notification);
-                });
-  if (failure) return failure;
-  return run(database,
-             "DELETE FROM delivered WHERE key NOT IN "
-             "(SELECT key FROM delivered ORDER BY delivered DESC, rowid DESC LIMIT ?)",
-             [](SQLiteStatement& statement) { statement.bind(1, std::int64_t{maxDelivered}); });
 }
 
-bool anythingChanges(const NotificationSchedule& schedule, Date now, const Calendar& calendar) {
+Failure forgetRemoved(SQLiteDatabase& database) {
+  return run(database, "DELETE FROM deliveries WHERE state = 'removed' AND banner IS NULL");
+}
+
+// In the place of the last delivery with this key, and of its banner.
+Failure insertDue(SQLiteDatabase& database, Delivery delivery, Date now) {
+  delivery.state = due;
+  delivery.schedule.notification.actualDeliveryDate = now;
+  const std::string predecessor =
+      "FROM deliveries WHERE key = ? AND state NOT IN ('planned', 'removed')";
+  if (auto error = select(
+          database, "SELECT banner " + predecessor,
+          [&](SQLiteStatement& row) { delivery.banner = textOf(row, 0); }, delivery.schedule.key))
+    return error;
+  if (auto error = run(database, "DELETE " + predecessor, delivery.schedule.key)) return error;
+  return insert(database, delivery);
+}
+
+bool changes(const NotificationSchedule& schedule, Date now, const Calendar& calendar) {
   return decide(schedule, now, calendar) !=
          ScheduleDecision{.isDue = false, .deliveryCount = schedule.deliveryCount};
 }
 
+// The delivery itself becomes due; the next one of its schedule is another.
+Failure claim(SQLiteDatabase& database, const Delivery& delivery, Date now,
+              const Calendar& calendar) {
+  const ScheduleDecision decision = decide(delivery.schedule, now, calendar);
+  if (auto error = run(database, "DELETE FROM deliveries WHERE number = ?", delivery.number))
+    return error;
+  if (decision.deliveryCount) {
+    Delivery next{.schedule = delivery.schedule};
+    next.schedule.deliveryCount = *decision.deliveryCount;
+    if (auto error = insert(database, next)) return error;
+  }
+  if (!decision.isDue) return std::nullopt;
+  Delivery claimed = delivery;
+  claimed.schedule.notification.deliveryDate = nextDate(delivery.schedule, calendar);
+  return insertDue(database, std::move(claimed), now);
+}
+
 }  // namespace
 
-NotificationStore::NotificationStore(std::filesystem::path file, SystemLog& systemLog)
-    : file_(std::move(file), schema(), systemLog) {}
+NotificationStore::NotificationStore(DurableFile::Ports ports, const std::string& file)
+    : file_(ports, file, format(), Migrating::allowed) {}
 
-void NotificationStore::schedule(const UserNotification& notification, Date now,
-                                 const Calendar& calendar) {
-  UserNotification content = notification;
-  if (!content.deliveryDate) content.deliveryDate = now;
-  const std::string key = keyOf(notification);
-  file_.change([&](SQLiteDatabase& database) {
-    return run(database,
-               fmt::format("INSERT OR REPLACE INTO scheduled (key, zone, count, {}) VALUES "
-                           "(?, ?, 0, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?)",
-                           notificationColumns),
-               [&](SQLiteStatement& statement) {
-                 statement.bind(1, key);
-                 statement.bind(2, calendar.timeZoneIdentifier());
-                 bindNotification(statement, 3, content);
-               });
+Failure NotificationStore::read(const DurableFile::Work& work) {
+  return open_ ? work(*open_) : file_.read(work);
+}
+
+Failure NotificationStore::write(const DurableFile::Work& work) {
+  return open_ ? work(*open_) : file_.change(work);
+}
+
+Failure NotificationStore::change(const std::function<Failure()>& calls) {
+  if (open_) return calls();
+  return file_.change([&](SQLiteDatabase& database) {
+    open_ = &database;
+    auto error = calls();
+    open_ = nullptr;
+    return error;
   });
 }
 
-std::vector<NotificationSchedule> NotificationStore::schedules() {
-  std::vector<NotificationSchedule> schedules;
-  isOutOfOrder_ =
-      !file_.read([&](SQLiteDatabase& database) { return readSchedules(database, schedules); });
-  return schedules;
+Result<std::vector<Delivery>> NotificationStore::deliveries(
+    const std::vector<DeliveryState>& states) {
+  std::vector<Delivery> found;
+  if (auto error =
+          read([&](SQLiteDatabase& database) { return select(database, states, found); }))
+    return *error;
+  return found;
 }
 
-void NotificationStore::removeSchedule(const std::string& key) {
-  file_.change([&](SQLiteDatabase& database) { return removeByKey(database, "scheduled", key); });
+Failure NotificationStore::plan(const UserNotification& notification, Date now,
+                                const Calendar& calendar) {
+  Delivery delivery{.schedule = {.key = keyOf(notification),
+                                 .notification = notification,
+                                 .timeZone = calendar.timeZoneIdentifier()}};
+  if (!notification.deliveryDate) delivery.schedule.notification.deliveryDate = now;
+  return write([&](SQLiteDatabase& database) {
+    auto error = run(database, "DELETE FROM deliveries WHERE key = ? AND state = 'planned'",
+                     delivery.schedule.key);
+    return error ? error : insert(database, delivery);
+  });
 }
 
-std::vector<DeliveredNotification> NotificationStore::claimDue(Date now, const Calendar& calendar) {
-  std::vector<DeliveredNotification> claimed;
+Failure NotificationStore::claimDue(Date now, const Calendar& calendar) {
   // Processes that watch the file are not woken for nothing.
-  const auto known = schedules();
-  if (std::none_of(known.begin(), known.end(), [&](const NotificationSchedule& schedule) {
-        return anythingChanges(schedule, now, calendar);
-      }))
-    return claimed;
-
-  const auto claim = [&](SQLiteDatabase& database) -> Failure {
-    claimed.clear();
-    std::vector<NotificationSchedule> present;
-    if (auto failure = readSchedules(database, present)) return failure;
-    std::stable_sort(present.begin(), present.end(), [&](const auto& left, const auto& right) {
-      return nextDate(left, calendar) < nextDate(right, calendar);
-    });
-    for (const NotificationSchedule& schedule : present) {
-      const ScheduleDecision decision = decide(schedule, now, calendar);
-      if (decision.deliveryCount != schedule.deliveryCount)
-        if (auto failure = advance(database, schedule.key, decision.deliveryCount)) return failure;
-      if (!decision.isDue) continue;
-      DeliveredNotification delivered{.key = schedule.key, .notification = schedule.notification};
-      delivered.notification.deliveryDate = nextDate(schedule, calendar);
-      if (auto failure = insertDelivered(database, delivered, now)) return failure;
-      claimed.push_back(std::move(delivered));
-    }
+  const auto known = deliveries({planned});
+  if (!known) return known.error();
+  if (std::none_of(known->begin(), known->end(),
+                   [&](const Delivery& each) { return changes(each.schedule, now, calendar); }))
     return std::nullopt;
-  };
-  if (!file_.change(claim)) claimed.clear();
-  return claimed;
-}
-
-DeliveredNotification NotificationStore::addDelivered(const UserNotification& notification,
-                                                      Date now) {
-  DeliveredNotification delivered{.key = keyOf(notification), .notification = notification};
-  file_.change([&](SQLiteDatabase& database) { return insertDelivered(database, delivered, now); });
-  return delivered;
-}
-
-std::vector<DeliveredNotification> NotificationStore::delivered() {
-  std::vector<DeliveredNotification> all;
-  file_.read([&](SQLiteDatabase& database) {
-    all.clear();
-    return run(database,
-               fmt::format("SELECT key, delivered, banner, {} FROM delivered "
-                           "ORDER BY delivered DESC, rowid DESC",
-                           notificationColumns),
-               nothingToBind, [&](SQLiteStatement& row) {
-                 DeliveredNotification each{.key = textOf(row, 0),
-                                            .notification = readNotification(row, 3)};
-                 each.notification.actualDeliveryDate =
-                     Date(Date::duration(row.integer(1).value_or(0)));
-                 if (const auto banner = row.text(2)) each.bannerReference = std::string(*banner);
-                 all.push_back(std::move(each));
-               });
+  return write([&](SQLiteDatabase& database) -> Failure {
+    std::vector<Delivery> present;
+    if (auto error = select(database, {planned}, present)) return error;
+    for (const Delivery& each : present)
+      if (changes(each.schedule, now, calendar))
+        if (auto error = claim(database, each, now, calendar)) return error;
+    return std::nullopt;
   });
-  return all;
 }
 
-void NotificationStore::removeDelivered(const std::string& key) {
-  file_.change([&](SQLiteDatabase& database) { return removeByKey(database, "delivered", key); });
+Failure NotificationStore::makeDue(const UserNotification& notification, Date now) {
+  const Delivery delivery{
+      .schedule = {.key = keyOf(notification), .notification = notification, .timeZone = ""}};
+  return write([&](SQLiteDatabase& database) { return insertDue(database, delivery, now); });
 }
 
-void NotificationStore::setBannerReference(const std::string& key, const std::string& reference) {
-  file_.change([&](SQLiteDatabase& database) {
-    return run(database, "UPDATE delivered SET banner = ? WHERE key = ?",
-               [&](SQLiteStatement& statement) {
-                 statement.bind(1, reference);
-                 statement.bind(2, key);
-               });
+Failure NotificationStore::decideDue(const std::vector<std::pair<std::int64_t, bool>>& isToShow) {
+  return write([&](SQLiteDatabase& database) -> Failure {
+    for (const auto& [number, shows] : isToShow)
+      if (auto error = run(database,
+                           "UPDATE deliveries SET state = ? WHERE number = ? AND state = 'due'",
+                           std::string_view(shows ? "toShow" : "hidden"), number))
+        return error;
+    if (auto error = run(
+            database,
+            "UPDATE deliveries SET state = 'removed' WHERE number IN (SELECT number FROM deliveries "
+            "WHERE state IN ('hidden', 'shown', 'expired') "
+            "ORDER BY delivered DESC, date DESC LIMIT -1 OFFSET ?)",
+            maxDelivered))
+      return error;
+    return forgetRemoved(database);
+  });
+}
+
+Result<bool> NotificationStore::noteShown(std::int64_t number, const std::string& banner) {
+  bool isThere = false;
+  if (auto error = write([&](SQLiteDatabase& database) {
+        auto failure = run(database,
+                           "UPDATE deliveries SET state = 'shown', banner = ? "
+                           "WHERE number = ? AND state IN ('toShow', 'shown')",
+                           banner, number);
+        isThere = database.changedRows() > 0;
+        return failure;
+      }))
+    return *error;
+  return isThere;
+}
+
+Failure NotificationStore::noteGone(std::int64_t number) {
+  return write([&](SQLiteDatabase& database) {
+    auto error = run(database,
+                     "UPDATE deliveries SET banner = NULL, "
+                     "state = CASE state WHEN 'shown' THEN 'expired' ELSE state END "
+                     "WHERE number = ?",
+                     number);
+    return error ? error : forgetRemoved(database);
+  });
+}
+
+Failure NotificationStore::remove(std::int64_t number) {
+  return write([&](SQLiteDatabase& database) {
+    auto error =
+        run(database, "UPDATE deliveries SET state = 'removed' WHERE number = ?", number);
+    return error ? error : forgetRemoved(database);
   });
 }
 

@@ -2,14 +2,18 @@
 #include <Varnel/Platform/Generic/ScheduledNotificationCenter.h>
 
 #include <algorithm>
+#include <charconv>
+#include <deque>
 #include <map>
-#include <string>
+#include <set>
 #include <utility>
 
 #include <Varnel/Platform/Generic/NotificationStore.h>
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Ports/NotificationServer.h>
+#include <Varnel/Platform/Ports/PrivateFiles.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/Ports/TimeZones.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
 #include <Varnel/Platform/Ports/WallClockTimer.h>
@@ -18,7 +22,7 @@
 namespace Varnel::Platform {
 namespace {
 
-constexpr std::chrono::minutes retryDelay(1);
+using enum DeliveryState;
 
 Banner bannerOf(const UserNotification& notification) {
   return {.title = notification.title.value_or(""),
@@ -29,49 +33,133 @@ Banner bannerOf(const UserNotification& notification) {
 
 }  // namespace
 
-// Hears of the banners that this process has shown, by the keys of their notifications. It ends
-// with its center; weak references to it then find it gone.
+// Brings the desktop's banners in step with the store, and notes in the store what becomes of them.
+// What could not be noted is kept and noted later, in order, so that no banner is shown twice. It
+// ends with its center; weak references to it then find it gone.
 class ScheduledNotificationCenter::Banners final : public NotificationServer::Observer {
  public:
   explicit Banners(ScheduledNotificationCenter& center) : center_(center) {}
 
-  void bannerShown(const std::string& key, const std::string& reference) override {
-    center_.store_->setBannerReference(key, reference);
+  void bannerShown(const std::string& token, const std::string& reference) override {
+    const std::int64_t number = numberOf(token);
+    note([this, number, token, reference]() -> Failure {
+      const auto isThere = center_.store_->noteShown(number, reference);
+      if (!isThere) return isThere.error();
+      // It was removed while the server was busy showing it.
+      if (!*isThere) server().close(token, reference);
+      return std::nullopt;
+    });
   }
-  void bannerActivated(const std::string& key) override {
-    const auto shown = shown_.extract(key);
-    const auto delegate = center_.delegate_.lock();
-    if (shown && delegate) delegate->didActivate(center_, shown.mapped());
+  void bannerFailed(const std::string& token) override {
+    const std::int64_t number = numberOf(token);
+    shown_.erase(number);
+    closing_.erase(number);
+    failed_.insert(number);
+    center_.recheck();
   }
-  void bannerDismissed(const std::string& key) override {
-    shown_.erase(key);
-    center_.store_->removeDelivered(key);
+  void bannerActivated(const std::string& token) override {
+    const auto shown = shown_.extract(numberOf(token));
+    if (!shown) return;
+    bannerGone(token);
+    if (const auto delegate = center_.delegate_.lock())
+      delegate->didActivate(center_, shown.mapped());
+  }
+  void bannerDismissed(const std::string& token) override {
+    const std::int64_t number = numberOf(token);
+    shown_.erase(number);
+    note([this, number] {
+      return center_.store_->change([&] {
+        auto error = center_.store_->noteGone(number);
+        return error ? error : center_.store_->remove(number);
+      });
+    });
+  }
+  void bannerGone(const std::string& token) override {
+    const std::int64_t number = numberOf(token);
+    closing_.erase(number);
+    note([this, number] { return center_.store_->noteGone(number); });
+  }
+  void serverAppeared() override {
+    failed_.clear();
+    center_.recheck();
   }
 
-  void show(const DeliveredNotification& delivered) {
-    shown_.insert_or_assign(delivered.key, delivered.notification);
-    center_.ports_.notificationServer.show(delivered.key, bannerOf(delivered.notification),
-                                           delivered.bannerReference);
+  /// Notes what could not be noted before.
+  Failure catchUp() {
+    while (!notes_.empty()) {
+      if (auto error = notes_.front()()) return error;
+      notes_.pop_front();
+    }
+    return std::nullopt;
   }
-  void close(const DeliveredNotification& delivered) {
-    shown_.erase(delivered.key);
-    center_.ports_.notificationServer.close(delivered.key, delivered.bannerReference);
+
+  /// Shows and closes what the store says. Only the deliverer shows.
+  Failure follow() {
+    const auto all = center_.store_->deliveries({hidden, toShow, shown, expired, removed});
+    if (!all) return all.error();
+    std::set<std::int64_t> present;
+    // The earliest first, as they came due.
+    for (auto each = all->rbegin(); each != all->rend(); ++each) {
+      present.insert(each->number);
+      if (failed_.contains(each->number)) continue;
+      if (each->state == toShow && !shown_.contains(each->number)) show(*each);
+      if ((each->state == hidden || each->state == removed) && each->banner) close(*each);
+    }
+    std::erase_if(shown_, [&](const auto& each) {
+      if (present.contains(each.first)) return false;
+      server().close(std::to_string(each.first), std::nullopt);
+      return true;
+    });
+    return std::nullopt;
   }
+
+  bool hasFailed() const { return !failed_.empty(); }
+  void tryFailedAgain() { failed_.clear(); }
 
   ScheduledNotificationCenter& center() const { return center_; }
 
  private:
+  NotificationServer& server() const { return center_.ports_.notificationServer; }
+
+  static std::int64_t numberOf(const std::string& token) {
+    std::int64_t number = 0;
+    std::from_chars(token.data(), token.data() + token.size(), number);
+    return number;
+  }
+
+  void note(std::function<Failure()> work) {
+    notes_.push_back(std::move(work));
+    center_.recheck();
+  }
+
+  void show(const Delivery& delivery) {
+    if (!center_.isDeliverer()) return;
+    shown_.emplace(delivery.number, delivery.schedule.notification);
+    server().show(std::to_string(delivery.number), bannerOf(delivery.schedule.notification),
+                  delivery.banner);
+  }
+
+  void close(const Delivery& delivery) {
+    shown_.erase(delivery.number);
+    if (closing_.insert(delivery.number).second)
+      server().close(std::to_string(delivery.number), delivery.banner);
+  }
+
   ScheduledNotificationCenter& center_;
-  std::map<std::string, UserNotification> shown_;
+  std::map<std::int64_t, UserNotification> shown_;  ///< By this process, or about to be.
+  std::set<std::int64_t> closing_;
+  std::set<std::int64_t> failed_;  ///< Left alone until the next try.
+  std::deque<std::function<Failure()>> notes_;
 };
 
-ScheduledNotificationCenter::ScheduledNotificationCenter(Ports ports,
-                                                         std::filesystem::path storeFile)
+ScheduledNotificationCenter::ScheduledNotificationCenter(Ports ports, const std::string& storeFile)
     : ports_(ports),
-      store_(std::make_unique<NotificationStore>(std::move(storeFile), ports.systemLog)),
+      lockFile_(storeFile + ".deliverer"),
+      store_(std::make_unique<NotificationStore>(
+          DurableFile::Ports{ports.privateFiles, ports.systemLog}, storeFile)),
       banners_(std::make_shared<Banners>(*this)) {
   ports_.notificationServer.setObserver(banners_);
-  ports_.timer.setHandler([this] { recheck(); });
+  ports_.timer.setHandler([this] { tick(); });
 }
 
 ScheduledNotificationCenter::~ScheduledNotificationCenter() {
@@ -85,17 +173,30 @@ void ScheduledNotificationCenter::setDelegate(
   recheck();
 }
 
-void ScheduledNotificationCenter::scheduleNotification(const UserNotification& notification) {
-  store_->schedule(notification, ports_.clock.now(), calendar());
-  recheck();
+UserNotificationCenter::Failure ScheduledNotificationCenter::change(
+    const std::function<Failure()>& calls) {
+  const bool isOutermost = !std::exchange(isOccupied_, true);
+  auto error = store_->change(calls);
+  if (isOutermost) {
+    isOccupied_ = false;
+    recheck();
+  }
+  return error;
 }
 
-std::vector<UserNotification> ScheduledNotificationCenter::scheduledNotifications() {
+UserNotificationCenter::Failure ScheduledNotificationCenter::scheduleNotification(
+    const UserNotification& notification) {
+  return change([&] { return store_->plan(notification, ports_.clock.now(), calendar()); });
+}
+
+UserNotificationCenter::Notifications ScheduledNotificationCenter::scheduledNotifications() {
+  auto scheduled = store_->deliveries({planned});
+  if (!scheduled) return scheduled.error();
   const Calendar present = calendar();
   std::vector<UserNotification> notifications;
-  for (NotificationSchedule& schedule : store_->schedules()) {
-    schedule.notification.deliveryDate = nextDate(schedule, present);
-    notifications.push_back(std::move(schedule.notification));
+  for (Delivery& delivery : *scheduled) {
+    delivery.schedule.notification.deliveryDate = nextDate(delivery.schedule, present);
+    notifications.push_back(std::move(delivery.schedule.notification));
   }
   std::stable_sort(notifications.begin(), notifications.end(),
                    [](const UserNotification& left, const UserNotification& right) {
@@ -105,58 +206,129 @@ std::vector<UserNotification> ScheduledNotificationCenter::scheduledNotification
   return notifications;
 }
 
-void ScheduledNotificationCenter::removeScheduledNotification(
+UserNotificationCenter::Failure ScheduledNotificationCenter::removeScheduledNotification(
     const UserNotification& notification) {
-  const Calendar present = calendar();
-  for (NotificationSchedule& schedule : store_->schedules()) {
-    schedule.notification.deliveryDate = nextDate(schedule, present);
-    if (isSameNotification(schedule.notification, notification))
-      store_->removeSchedule(schedule.key);
-  }
-  awaitNext();
+  return removeThose(notification, false);
 }
 
-void ScheduledNotificationCenter::deliverNotification(const UserNotification& notification) {
-  deliver(store_->addDelivered(notification, ports_.clock.now()));
+UserNotificationCenter::Failure ScheduledNotificationCenter::deliverNotification(
+    const UserNotification& notification) {
+  isAskedToDeliver_ = true;
+  return change([&] { return store_->makeDue(notification, ports_.clock.now()); });
 }
 
-std::vector<UserNotification> ScheduledNotificationCenter::deliveredNotifications() {
+UserNotificationCenter::Notifications ScheduledNotificationCenter::deliveredNotifications() {
+  auto delivered = store_->deliveries({hidden, toShow, shown, expired});
+  if (!delivered) return delivered.error();
   std::vector<UserNotification> notifications;
-  for (DeliveredNotification& delivered : store_->delivered())
-    notifications.push_back(std::move(delivered.notification));
+  for (Delivery& delivery : *delivered)
+    notifications.push_back(std::move(delivery.schedule.notification));
   return notifications;
 }
 
-void ScheduledNotificationCenter::removeDeliveredNotification(
+UserNotificationCenter::Failure ScheduledNotificationCenter::removeDeliveredNotification(
     const UserNotification& notification) {
-  for (const DeliveredNotification& delivered : store_->delivered()) {
-    if (!isSameNotification(delivered.notification, notification)) continue;
-    store_->removeDelivered(delivered.key);
-    banners_->close(delivered);
-  }
+  return removeThose(notification, true);
+}
+
+UserNotificationCenter::Failure ScheduledNotificationCenter::removeThose(
+    const UserNotification& notification, bool isDelivered) {
+  const Calendar present = calendar();
+  return change([&]() -> Failure {
+    // What is due has its delivery ahead as well.
+    const auto candidates =
+        store_->deliveries(isDelivered ? std::vector{hidden, toShow, shown, expired}
+                                       : std::vector{planned, due});
+    if (!candidates) return candidates.error();
+    for (const Delivery& each : *candidates) {
+      UserNotification candidate = each.schedule.notification;
+      if (!isDelivered) candidate.actualDeliveryDate.reset();
+      if (each.state == planned) candidate.deliveryDate = nextDate(each.schedule, present);
+      if (isSameNotification(candidate, notification))
+        if (auto error = store_->remove(each.number)) return error;
+    }
+    return std::nullopt;
+  });
+}
+
+void ScheduledNotificationCenter::retryLater(std::function<void()> retry) {
+  retries_.push_back(std::move(retry));
+  if (!isOccupied_) awaitNext();
+}
+
+void ScheduledNotificationCenter::checkBanners(
+    std::function<void(const Failure& obstacle)> answer) {
+  ports_.notificationServer.check(std::move(answer));
 }
 
 void ScheduledNotificationCenter::recheck() {
-  if (!delegate_.expired())
-    for (const auto& delivered : store_->claimDue(ports_.clock.now(), calendar()))
-      deliver(delivered);
+  if (std::exchange(isOccupied_, true)) return;
+  isBehind_ = false;
+  Failure failure = banners_->catchUp();
+  if (!failure) failure = deliverDue();
+  if (!failure) failure = banners_->follow();
+  report(failure);
+  isBehind_ = isBehind_ || failure || banners_->hasFailed();
+  isOccupied_ = false;
   awaitNext();
 }
 
-void ScheduledNotificationCenter::deliver(const DeliveredNotification& delivered) {
-  const auto delegate = delegate_.lock();
-  if (delegate && !delegate->shouldPresent(*this, delivered.notification))
-    banners_->close(delivered);
-  else
-    banners_->show(delivered);
+// A host whose delegate plans when it is asked finds this busy; the timer comes to that.
+UserNotificationCenter::Failure ScheduledNotificationCenter::deliverDue() {
+  if (!mayDeliver()) {
+    if (!isBusy()) delivererLock_.reset();
+    return std::nullopt;
+  }
+  const auto waiting = store_->deliveries({planned, due});
+  if (!waiting) return waiting.error();
+  const Date now = ports_.clock.now();
+  const Calendar present = calendar();
+  const bool isAnyDue = std::any_of(waiting->begin(), waiting->end(), [&](const Delivery& each) {
+    return each.state == due || nextDate(each.schedule, present).value_or(Date::max()) <= now;
+  });
+  if (isAnyDue && !isDeliverer()) return std::nullopt;
+  if (!delegate_.expired())
+    if (auto error = store_->claimDue(now, present)) return error;
+  return decideDue();
+}
 
-  // Told later, so that a host that makes the delegate at launch can still subscribe to its events.
-  ports_.mainQueue.post([banners = std::weak_ptr(banners_), listener = delegate_,
-                         notification = delivered.notification] {
+UserNotificationCenter::Failure ScheduledNotificationCenter::decideDue() {
+  const auto claimed = store_->deliveries({due});
+  if (!claimed) return claimed.error();
+  if (claimed->empty()) return std::nullopt;
+  std::vector<std::pair<std::int64_t, bool>> isToShow;
+  const auto delegate = delegate_.lock();
+  for (auto each = claimed->rbegin(); each != claimed->rend(); ++each)
+    isToShow.emplace_back(each->number, !delegate || delegate->shouldPresent(
+                                                         *this, each->schedule.notification));
+  if (auto error = store_->decideDue(isToShow)) return error;
+  for (auto each = claimed->rbegin(); each != claimed->rend(); ++each)
+    tellDelivered(each->schedule.notification);
+  return std::nullopt;
+}
+
+// Told later, so that a host that makes the delegate at launch can still subscribe to its events.
+void ScheduledNotificationCenter::tellDelivered(const UserNotification& notification) {
+  ports_.mainQueue.post([banners = std::weak_ptr(banners_), listener = delegate_, notification] {
     const auto center = banners.lock();
     const auto told = listener.lock();
     if (center && told) told->didDeliver(center->center(), notification);
   });
+}
+
+bool ScheduledNotificationCenter::isDeliverer() {
+  if (!delivererLock_ && mayDeliver())
+    if (auto lock = ports_.privateFiles.tryLock(lockFile_)) delivererLock_ = std::move(*lock);
+  // The deliverer may end before it has done everything.
+  if (!delivererLock_ && mayDeliver()) isBehind_ = true;
+  return delivererLock_ != nullptr;
+}
+
+void ScheduledNotificationCenter::report(const Failure& failure) {
+  const std::string text = failure ? failure->localizedDescription() : "";
+  if (failure && text != lastReport_)
+    ports_.systemLog.write("Notifications have to wait: " + text);
+  lastReport_ = text;
 }
 
 // The user's present time zone.
@@ -164,18 +336,39 @@ Calendar ScheduledNotificationCenter::calendar() const {
   return {ports_.userLocale, ports_.timeZones};
 }
 
+void ScheduledNotificationCenter::tick() {
+  const Date now = ports_.clock.now();
+  // A clock that was set back would keep the retry far away.
+  if (retryDate_ && (now >= *retryDate_ || *retryDate_ - now > pause_)) {
+    retryDate_.reset();
+    pause_ = std::min<std::chrono::seconds>(2 * pause_, maxPause);
+    banners_->tryFailedAgain();
+    for (const auto& retry : std::exchange(retries_, {})) retry();
+  }
+  recheck();
+}
+
 void ScheduledNotificationCenter::awaitNext() {
+  const Date now = ports_.clock.now();
   std::optional<Date> next;
   if (!delegate_.expired()) {
+    const auto waiting = store_->deliveries({planned});
+    if (!waiting) isBehind_ = true;
     const Calendar present = calendar();
-    for (const NotificationSchedule& schedule : store_->schedules())
-      if (const auto date = nextDate(schedule, present); date && (!next || *date < *next))
-        next = date;
+    for (const Delivery& each : waiting ? *waiting : std::vector<Delivery>()) {
+      const auto date = nextDate(each.schedule, present);
+      // What is due and was not claimed waits for the next try.
+      if (!date || (*date <= now && isBehind_)) continue;
+      next = std::min(next.value_or(Date::max()), *date);
+    }
   }
-  // What is still due could not be claimed: the store does not work at present.
-  const Date now = ports_.clock.now();
-  const bool isOutOfOrder = !delegate_.expired() && store_->isOutOfOrder();
-  if (isOutOfOrder || (next && *next <= now)) next = now + retryDelay;
+  if (isBehind_ || !retries_.empty()) {
+    if (!retryDate_) retryDate_ = now + pause_;
+    next = std::min(next.value_or(Date::max()), *retryDate_);
+  } else {
+    retryDate_.reset();
+    if (!isBusy()) pause_ = minPause;
+  }
   if (next)
     ports_.timer.arm(*next);
   else

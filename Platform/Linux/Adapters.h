@@ -69,6 +69,7 @@ struct NotificationPorts {
   UserLocale& userLocale;
   TimeZones& timeZones;
   MainQueue& mainQueue;
+  PrivateFiles& privateFiles;
   SystemLog& systemLog;
 };
 [[nodiscard]] std::unique_ptr<UserNotificationCenters> makeUserNotificationCenters(

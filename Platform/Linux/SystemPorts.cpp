@@ -79,8 +79,8 @@ const Ports& systemPorts() {
       .timeZones = timeZones,
       .userAccount = keep(POSIX::makeUserAccount()),
       .userLocale = userLocale,
-      .userNotificationCenters = keep(
-          Linux::makeUserNotificationCenters({clock, userLocale, timeZones, mainQueue, systemLog})),
+      .userNotificationCenters = keep(Linux::makeUserNotificationCenters(
+          {clock, userLocale, timeZones, mainQueue, privateFiles, systemLog})),
       .volumeCatalog = keep(Linux::makeVolumeCatalog(mountTable)),
       .workspace = keep(Linux::makeWorkspace()),
   };

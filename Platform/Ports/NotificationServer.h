@@ -1,11 +1,13 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <optional>
 #include <string>
 
 #include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/PlatformError.h>
 
 namespace Varnel::Platform {
 
@@ -22,8 +24,8 @@ struct Banner final {
 /// The desktop's service that shows banners. A banner is known by the token that its owner gave it,
 /// and by the server's reference, under which later runs of the application know it too.
 ///
-/// Main thread only; no operation waits for the server. A server that is missing, comes late or
-/// restarts costs the banners and nothing else.
+/// Main thread only; no operation waits for the server. A server may be missing, come late or
+/// restart: its owner hears of every request that came to nothing, and when to ask again.
 class VARNEL_API NotificationServer {
  public:
   /// Hears what becomes of banners. Called on the main thread, and never from within an operation.
@@ -33,26 +35,38 @@ class VARNEL_API NotificationServer {
 
     /// The banner is shown and has this reference.
     virtual void bannerShown(const std::string& token, const std::string& reference) = 0;
+    /// What was asked for this banner, to show or to close it, could not be done.
+    virtual void bannerFailed(const std::string& token) = 0;
     /// The user clicked the banner or its action button; the banner is gone. Called at most once
     /// for each banner.
     virtual void bannerActivated(const std::string& token) = 0;
-    /// The user closed the banner. An expired banner is not reported.
+    /// The user closed the banner.
     virtual void bannerDismissed(const std::string& token) = 0;
+    /// The banner is gone otherwise: it was closed as asked, has expired, or its server has ended.
+    /// The user may yet bring an expired one back, and click it.
+    virtual void bannerGone(const std::string& token) = 0;
+    /// There is a server again, or another one.
+    virtual void serverAppeared() = 0;
   };
 
   virtual ~NotificationServer() = default;
 
   virtual void setObserver(std::weak_ptr<Observer> observer) = 0;
 
-  /// Shows a banner, in the place of the one with the same token or of the one with this reference.
+  /// Shows a banner, in the place of the one with this reference, whose token counts no more. Ends
+  /// in `bannerShown` or `bannerFailed`, unless it is closed before.
   virtual void show(const std::string& token, const Banner& banner,
                     const std::optional<std::string>& replacedReference) = 0;
 
-  /// Removes the banner with this token or, if an earlier run showed it, with this reference.
+  /// Removes the banner with this token or, if an earlier run showed it, with this reference. Ends
+  /// in `bannerGone` or `bannerFailed`.
   virtual void close(const std::string& token, const std::optional<std::string>& reference) = 0;
 
-  /// Whether any of these requests is still on its way to the server. Becomes false in the end,
-  /// also without a server.
+  /// Tells, later, why banners cannot be shown at present, or none.
+  virtual void check(std::function<void(const std::optional<PlatformError>& obstacle)> answer) = 0;
+
+  /// Whether any of these requests is still on its way to the server. Becomes false in the end, also
+  /// without a server, but not while one has taken a banner and hangs.
   [[nodiscard]] virtual bool isBusy() const = 0;
 };
 

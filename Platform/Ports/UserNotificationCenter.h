@@ -1,12 +1,15 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
 #include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Values/NotificationSource.h>
+#include <Varnel/Platform/Values/Result.h>
 #include <Varnel/Platform/Values/UserNotification.h>
 
 namespace Varnel::Platform {
@@ -34,39 +37,62 @@ class VARNEL_API UserNotificationCenterDelegate {
 /// Delivers notifications to the user, also those that were scheduled by an earlier run.
 ///
 ///     center.setDelegate(router);
-///     center.scheduleNotification(reminder);
+///     if (const auto error = center.scheduleNotification(reminder)) tell(*error);
 ///
-/// Main thread only. No operation fails visibly: a notification that cannot be kept or shown is
-/// reported to the system's log.
+/// A call that succeeded is a promise that outlives the process. One that failed has changed
+/// nothing; whoever made it may try again (`retryLater`). Main thread only.
 class VARNEL_API UserNotificationCenter {
  public:
+  using Failure = std::optional<PlatformError>;  ///< None when the call was done.
+  using Notifications = Result<std::vector<UserNotification>>;
+
   virtual ~UserNotificationCenter() = default;
 
   /// The only listener from now on; held weakly. Notifications that came due earlier are delivered
-  /// now. Without a delegate nothing is delivered, and due notifications wait.
+  /// now. Without a delegate nothing comes due, and what is scheduled waits.
   virtual void setDelegate(std::weak_ptr<UserNotificationCenterDelegate> delegate) = 0;
 
+  /// Makes several calls on this center together: all are done or, where one fails or `calls`
+  /// answers a failure, none. Nothing is delivered, shown or taken away before that is decided.
+  /// `calls` may be run more than once, each time from the same start; it makes no calls but those
+  /// on this center's two lists.
+  ///
+  ///     center.change([&]() -> UserNotificationCenter::Failure {
+  ///       if (auto error = center.removeScheduledNotification(old)) return error;
+  ///       return center.scheduleNotification(reminder);
+  ///     });
+  [[nodiscard]] virtual Failure change(const std::function<Failure()>& calls) = 0;
+
   /// Keeps the notification until its delivery date, in the place of one with its identifier.
-  virtual void scheduleNotification(const UserNotification& notification) = 0;
+  [[nodiscard]] virtual Failure scheduleNotification(const UserNotification& notification) = 0;
 
   /// The notifications that have a delivery ahead, the next one first.
-  [[nodiscard]] virtual std::vector<UserNotification> scheduledNotifications() = 0;
+  [[nodiscard]] virtual Notifications scheduledNotifications() = 0;
 
   /// Cancels all deliveries to come. The notification stays in the delivered list if it is there.
-  virtual void removeScheduledNotification(const UserNotification& notification) = 0;
+  [[nodiscard]] virtual Failure removeScheduledNotification(
+      const UserNotification& notification) = 0;
 
   /// Delivers now, whatever the dates of the notification say, and replaces its banner.
-  virtual void deliverNotification(const UserNotification& notification) = 0;
+  [[nodiscard]] virtual Failure deliverNotification(const UserNotification& notification) = 0;
 
   /// The delivered notifications that were neither removed nor dismissed by the user, the latest
-  /// first.
-  [[nodiscard]] virtual std::vector<UserNotification> deliveredNotifications() = 0;
+  /// first: also those whose banner was not wanted, has yet to come or has gone.
+  [[nodiscard]] virtual Notifications deliveredNotifications() = 0;
 
   /// Forgets a delivered notification and takes its banner away; deliveries to come stay.
-  virtual void removeDeliveredNotification(const UserNotification& notification) = 0;
+  [[nodiscard]] virtual Failure removeDeliveredNotification(
+      const UserNotification& notification) = 0;
+
+  /// Calls `retry` once, on the main thread, when a call that failed may succeed. The pauses grow
+  /// while calls go on failing.
+  virtual void retryLater(std::function<void()> retry) = 0;
+
+  /// Tells, later and on the main thread, what keeps banners from being shown at present, or none.
+  virtual void checkBanners(std::function<void(const Failure& obstacle)> answer) = 0;
 
   /// Whether banners are still to be shown or taken away. A program that is about to end lets the
-  /// main queue run meanwhile:
+  /// main queue run meanwhile, not for long: what shows the banners may hang.
   ///
   ///     mainQueue.runWhile([&] { return center.isBusy(); }, std::chrono::seconds(3));
   [[nodiscard]] virtual bool isBusy() const = 0;

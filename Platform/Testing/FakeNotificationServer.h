@@ -1,9 +1,12 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <map>
 #include <memory>
+#include <optional>
 #include <string>
+#include <system_error>
 #include <utility>
 #include <vector>
 
@@ -15,68 +18,105 @@ namespace Varnel::Platform::Testing {
 ///
 ///     FakeNotificationServer server;
 ///     …
-///     EXPECT_EQ(server.banners().at("token").title, "Hello");
-///     server.activate("token");
+///     server.report();
+///     EXPECT_EQ(server.banners().at("Hello").text, "How are you?");
+///     server.activate("Hello");
 ///
-/// One thread. Several centers may share one, as several processes share a desktop's.
+/// Banners are told by their titles. One thread.
 class FakeNotificationServer final : public NotificationServer {
  public:
-  /// While false, `show` does nothing, as without a server.
+  /// Whether there is one. `appear` lets the center know of a change.
   bool isPresent = true;
+  /// Whether it answers every request with an error.
+  bool refuses = false;
 
   void setObserver(std::weak_ptr<Observer> observer) override { observer_ = std::move(observer); }
 
   void show(const std::string& token, const Banner& banner,
             const std::optional<std::string>& replacedReference) override {
-    if (!isPresent) return;
-    if (replacedReference) remove(*replacedReference);
+    if (!isPresent || refuses)
+      return answers_.push_back([token](Observer& told) { told.bannerFailed(token); });
+    if (replacedReference) shown_.erase(*replacedReference);
     const std::string reference = std::to_string(++lastReference_);
-    references_[reference] = token;
-    banners_[token] = banner;
+    shown_[reference] = {token, banner};
     history_.push_back(banner);
-    unreported_.emplace_back(token, reference);
+    answers_.push_back([token, reference](Observer& told) { told.bannerShown(token, reference); });
   }
 
   void close(const std::string& token, const std::optional<std::string>& reference) override {
-    if (reference) remove(*reference);
-    banners_.erase(token);
+    if (!isPresent)
+      return answers_.push_back([token](Observer& told) { told.bannerFailed(token); });
+    if (reference) shown_.erase(*reference);
+    std::erase_if(shown_, [&](const auto& each) { return each.second.token == token; });
+    answers_.push_back([token](Observer& told) { told.bannerGone(token); });
   }
 
-  [[nodiscard]] bool isBusy() const override { return !unreported_.empty(); }
+  void check(std::function<void(const std::optional<PlatformError>&)> answer) override {
+    answers_.push_back([answer = std::move(answer), isPresent = isPresent](Observer&) {
+      if (isPresent)
+        answer(std::nullopt);
+      else
+        answer(PlatformError(std::make_error_code(std::errc::no_such_process)));
+    });
+  }
 
-  /// Lets the center know what has been shown since the last call, as a server does, later.
+  [[nodiscard]] bool isBusy() const override { return !answers_.empty(); }
+
+  /// Lets the center know what has been done since the last call, as a server does, later.
   void report() {
-    for (const auto& [token, reference] : std::exchange(unreported_, {}))
-      if (const auto observer = observer_.lock()) observer->bannerShown(token, reference);
+    while (!answers_.empty())
+      for (const auto& answer : std::exchange(answers_, {}))
+        if (const auto observer = observer_.lock()) answer(*observer);
   }
 
-  /// The banners that the user sees, by token.
-  [[nodiscard]] const std::map<std::string, Banner>& banners() const { return banners_; }
+  /// Acts as a server that was started.
+  void appear() {
+    isPresent = true;
+    if (const auto observer = observer_.lock()) observer->serverAppeared();
+  }
+  /// Acts as a server that has ended, and all its banners with it.
+  void disappear() {
+    isPresent = false;
+    for (const auto& [reference, gone] : std::exchange(shown_, {}))
+      if (const auto observer = observer_.lock()) observer->bannerGone(gone.token);
+  }
+
+  /// How many banners the user sees.
+  [[nodiscard]] std::size_t count() const { return shown_.size(); }
+  /// Those banners, by title.
+  [[nodiscard]] std::map<std::string, Banner> banners() const {
+    std::map<std::string, Banner> banners;
+    for (const auto& [reference, each] : shown_) banners[each.banner.title] = each.banner;
+    return banners;
+  }
   /// Every banner that was ever shown, oldest first.
   [[nodiscard]] const std::vector<Banner>& history() const { return history_; }
 
-  void activate(const std::string& token) {
-    if (banners_.erase(token) == 0) return;
-    if (const auto observer = observer_.lock()) observer->bannerActivated(token);
+  void activate(const std::string& title) {
+    if (const auto token = take(title))
+      if (const auto observer = observer_.lock()) observer->bannerActivated(*token);
   }
-  void dismiss(const std::string& token) {
-    if (banners_.erase(token) == 0) return;
-    if (const auto observer = observer_.lock()) observer->bannerDismissed(token);
+  void dismiss(const std::string& title) {
+    if (const auto token = take(title))
+      if (const auto observer = observer_.lock()) observer->bannerDismissed(*token);
   }
 
  private:
-  void remove(const std::string& reference) {
-    const auto found = references_.find(reference);
-    if (found == references_.end()) return;
-    banners_.erase(found->second);
-    references_.erase(found);
+  struct Shown {
+    std::string token;
+    Banner banner;
+  };
+
+  std::optional<std::string> take(const std::string& title) {
+    for (auto each = shown_.begin(); each != shown_.end(); ++each)
+      if (each->second.banner.title == title) return shown_.extract(each).mapped().token;
+    return std::nullopt;
   }
 
   std::weak_ptr<Observer> observer_;
-  std::map<std::string, Banner> banners_;
-  std::map<std::string, std::string> references_;  ///< Tokens by reference.
+  std::map<std::string, Shown> shown_;  ///< By reference.
   std::vector<Banner> history_;
-  std::vector<std::pair<std::string, std::string>> unreported_;
+  std::vector<std::function<void(Observer&)>> answers_;
   int lastReference_ = 0;
 };
 

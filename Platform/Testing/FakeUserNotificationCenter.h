@@ -2,8 +2,11 @@
 #pragma once
 
 #include <algorithm>
+#include <functional>
 #include <memory>
+#include <optional>
 #include <string>
+#include <system_error>
 #include <utility>
 #include <vector>
 
@@ -15,14 +18,18 @@ namespace Varnel::Platform::Testing {
 ///
 ///     FakeUserNotificationCenter center;
 ///     UserNotificationRouter router({center, application, mainQueue});
-///     center.deliverNotification(center.scheduledNotifications().front());
-///     center.activate(center.deliveredNotifications().front());
+///     EXPECT_FALSE(center.deliverNotification(reminder));
+///     center.activate(reminder);
 ///
 /// One thread.
 class FakeUserNotificationCenter final : public UserNotificationCenter {
  public:
   /// The notifications that the delegate wanted to be shown, oldest first.
   std::vector<UserNotification> presented;
+  /// The next calls that may be made; all further ones fail. Absent: any number.
+  std::optional<int> callsLeft;
+  /// What `checkBanners` answers.
+  Failure obstacle;
 
   void setDelegate(std::weak_ptr<UserNotificationCenterDelegate> delegate) override {
     delegate_ = std::move(delegate);
@@ -31,35 +38,62 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
     return delegate_.lock();
   }
 
-  void scheduleNotification(const UserNotification& notification) override {
-    remove(scheduled_, notification);
-    scheduled_.push_back(notification);
-    std::stable_sort(scheduled_.begin(), scheduled_.end(), [](const auto& left, const auto& right) {
-      return left.deliveryDate < right.deliveryDate;
-    });
-  }
-  [[nodiscard]] std::vector<UserNotification> scheduledNotifications() override {
-    return scheduled_;
-  }
-  void removeScheduledNotification(const UserNotification& notification) override {
-    remove(scheduled_, notification);
+  [[nodiscard]] Failure change(const std::function<Failure()>& calls) override {
+    if (isChanging_) return calls();
+    const State start = state_;
+    isChanging_ = true;
+    auto error = calls();
+    isChanging_ = false;
+    if (error) state_ = start;
+    for (const auto& notification : std::exchange(state_.due, {})) deliver(notification);
+    return error;
   }
 
-  void deliverNotification(const UserNotification& notification) override {
-    remove(delivered_, notification);
-    delivered_.insert(delivered_.begin(), notification);
-    const auto listener = delegate_.lock();
-    if (!listener) return;
-    if (listener->shouldPresent(*this, notification)) presented.push_back(notification);
-    listener->didDeliver(*this, notification);
+  [[nodiscard]] Failure scheduleNotification(const UserNotification& notification) override {
+    return call([&] {
+      remove(state_.scheduled, notification);
+      state_.scheduled.push_back(notification);
+      std::stable_sort(state_.scheduled.begin(), state_.scheduled.end(),
+                       [](const auto& left, const auto& right) {
+                         return left.deliveryDate < right.deliveryDate;
+                       });
+    });
   }
-  [[nodiscard]] std::vector<UserNotification> deliveredNotifications() override {
-    return delivered_;
+  [[nodiscard]] Notifications scheduledNotifications() override {
+    if (auto error = fail()) return *error;
+    return state_.scheduled;
   }
-  void removeDeliveredNotification(const UserNotification& notification) override {
-    remove(delivered_, notification);
+  [[nodiscard]] Failure removeScheduledNotification(
+      const UserNotification& notification) override {
+    return call([&] { remove(state_.scheduled, notification); });
   }
+
+  [[nodiscard]] Failure deliverNotification(const UserNotification& notification) override {
+    return call([&] {
+      remove(state_.delivered, notification);
+      state_.delivered.insert(state_.delivered.begin(), notification);
+      state_.due.push_back(notification);
+    });
+  }
+  [[nodiscard]] Notifications deliveredNotifications() override {
+    if (auto error = fail()) return *error;
+    return state_.delivered;
+  }
+  [[nodiscard]] Failure removeDeliveredNotification(
+      const UserNotification& notification) override {
+    return call([&] { remove(state_.delivered, notification); });
+  }
+
+  void retryLater(std::function<void()> retry) override { retries_.push_back(std::move(retry)); }
+  void checkBanners(std::function<void(const Failure&)> answer) override { answer(obstacle); }
   [[nodiscard]] bool isBusy() const override { return false; }
+
+  /// How many wait for `retry`.
+  [[nodiscard]] std::size_t retryCount() const { return retries_.size(); }
+  /// Acts as the end of a pause.
+  void retry() {
+    for (const auto& each : std::exchange(retries_, {})) each();
+  }
 
   /// Acts as a click of the user.
   void activate(const UserNotification& notification) {
@@ -67,14 +101,43 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
   }
 
  private:
+  struct State {
+    std::vector<UserNotification> scheduled;
+    std::vector<UserNotification> delivered;
+    std::vector<UserNotification> due;  ///< Its delegate has not heard of them.
+  };
+
   static void remove(std::vector<UserNotification>& list, const UserNotification& notification) {
     const UserNotification copy = notification;  // It may be an element of the list.
     std::erase_if(list, [&](const auto& each) { return isSameNotification(each, copy); });
   }
 
+  Failure fail() {
+    if (!callsLeft || (*callsLeft)-- > 0) return std::nullopt;
+    callsLeft = 0;
+    return PlatformError(std::make_error_code(std::errc::no_space_on_device));
+  }
+
+  template <typename Call>
+  Failure call(Call made) {
+    return change([&]() -> Failure {
+      if (auto error = fail()) return error;
+      made();
+      return std::nullopt;
+    });
+  }
+
+  void deliver(const UserNotification& notification) {
+    const auto listener = delegate_.lock();
+    if (!listener) return;
+    if (listener->shouldPresent(*this, notification)) presented.push_back(notification);
+    listener->didDeliver(*this, notification);
+  }
+
   std::weak_ptr<UserNotificationCenterDelegate> delegate_;
-  std::vector<UserNotification> scheduled_;
-  std::vector<UserNotification> delivered_;
+  State state_;
+  bool isChanging_ = false;
+  std::vector<std::function<void()>> retries_;
 };
 
 /// Gives every product the same fake center.

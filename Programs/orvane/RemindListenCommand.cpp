@@ -10,6 +10,7 @@
 #include <Varnel/Tallyhouse/AnalyticsTracker.h>
 #include <orvane/Console.h>
 #include <orvane/RemindCommands.h>
+#include <orvane/ReminderPlanner.h>
 #include <orvane/Reminders.h>
 
 namespace Orvane {
@@ -33,8 +34,7 @@ const char* nameOf(Router::EventKind kind) {
 
 int RemindListenCommand::run(Console& console) const {
   Router router;
-  // It only listens: assigning it the stored period would plan the reminder anew.
-  const Varnel::SchedulerService service(std::make_shared<Tallyhouse::AnalyticsTracker>(), router);
+  Varnel::SchedulerService service(std::make_shared<Tallyhouse::AnalyticsTracker>(), router);
   const auto& nextDay = Varnel::NextDayCleanupReminderInfo::userNotificationIdentifier();
   bool isWritten = true;
   auto& mainQueue = Varnel::Platform::processPorts().mainQueue;
@@ -47,8 +47,15 @@ int RemindListenCommand::run(Console& console) const {
   router.register_("SchedulerNotification", tell);
   router.register_(nextDay, tell);
   router.register_(nextDay, [&](const auto& notification, Router::EventKind kind) {
-    if (kind != Router::EventKind::didDeliver)
-      router.userNotificationCenter().removeDeliveredNotification(notification);
+    if (kind == Router::EventKind::didDeliver) return;
+    if (const auto error = router.userNotificationCenter().removeDeliveredNotification(notification))
+      console.complain("the clicked reminder stays listed: " + error->localizedDescription());
+  });
+  // A plan that is right stays: assigning the stored period would move the reminder.
+  repairPlan(service, console);
+  router.userNotificationCenter().checkBanners([&](const auto& obstacle) {
+    if (obstacle)
+      console.complain("no banner can be shown at present: " + obstacle->localizedDescription());
   });
   mainQueue.run();
   return isWritten ? 0 : 1;

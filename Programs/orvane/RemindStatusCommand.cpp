@@ -8,7 +8,7 @@ namespace Orvane {
 
 int RemindStatusCommand::run(Console& console) const {
   auto& center = Varnel::UserNotificationRouter::defaultUserNotificationCenter();
-  return console.writeResult(statusText(center)) ? 0 : 1;
+  return writeStatus(center, console) ? 0 : 1;
 }
 
 }  // namespace Orvane

@@ -1,21 +1,19 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
 #include <Varnel/Reminders/NextDayCleanupReminderInfo.h>
-#include <Varnel/Reminders/UserNotificationRouter.h>
 #include <orvane/Console.h>
 #include <orvane/RemindCommands.h>
+#include <orvane/ReminderPlanner.h>
 #include <orvane/Reminders.h>
 
 namespace Orvane {
 
 int RemindTomorrowCommand::run(Console& console) const {
-  // Without a router: this program ends before it could hear of anything.
-  auto& center = Varnel::UserNotificationRouter::defaultUserNotificationCenter();
+  ReminderPlanner planner(console);
   // The identifier is always the same, so an earlier reminder gives way.
-  center.scheduleNotification(
+  const bool isPlanned = planner.plan(
       Varnel::NextDayCleanupReminderInfo(selectedSize, foundSize).makeUserNotification());
-  awaitDesktop(center, console);
-  return console.writeResult(statusText(center)) ? 0 : 1;
+  return writeStatus(planner.center(), console) && isPlanned ? 0 : 1;
 }
 
 }  // namespace Orvane

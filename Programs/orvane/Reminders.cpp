@@ -1,12 +1,10 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/Reminders.h>
 
-#include <chrono>
 #include <optional>
 
 #include <Varnel/Basalt/JSON.h>
 #include <Varnel/Context/ApplicationData.h>
-#include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/UserDefaults.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
@@ -23,9 +21,6 @@ using Varnel::Platform::UserNotification;
 using Varnel::Platform::visibleText;
 
 constexpr const char* periodKey = "schedulePeriod";
-
-// Servers answer within milliseconds, unless they have yet to be started.
-constexpr std::chrono::seconds patience(3);
 
 std::string textOf(const std::optional<Varnel::Platform::Date>& date) {
   static const Varnel::Platform::DateFormatter formatter(
@@ -56,26 +51,27 @@ bool storePeriod(SchedulePeriodOption period, Console& console) {
   return !error;
 }
 
-void awaitDesktop(Varnel::Platform::UserNotificationCenter& center, Console& console) {
-  auto& mainQueue = Varnel::Platform::processPorts().mainQueue;
-  if (!mainQueue.runWhile([&center] { return center.isBusy(); }, patience))
-    console.complain("the desktop does not answer; the banner of an earlier reminder may stay");
-}
-
 std::string lineOf(const UserNotification& notification) {
   return visibleText(notification.identifier.value_or("(no identifier)") + ": " +
                      notification.title.value_or("") + " - " +
                      notification.informativeText.value_or(""));
 }
 
-std::string statusText(Varnel::Platform::UserNotificationCenter& center) {
+bool writeStatus(Varnel::Platform::UserNotificationCenter& center, Console& console) {
+  const auto scheduled = center.scheduledNotifications();
+  const auto delivered = center.deliveredNotifications();
+  if (!scheduled || !delivered) {
+    const auto& error = scheduled ? delivered.error() : scheduled.error();
+    console.complain("the reminders cannot be read: " + error.localizedDescription());
+    return false;
+  }
   std::string text = "period: " + storedPeriod().description() + "\n";
-  for (const UserNotification& notification : center.scheduledNotifications())
+  for (const UserNotification& notification : *scheduled)
     text += "scheduled " + textOf(notification.deliveryDate) + "  " + lineOf(notification) + "\n";
-  for (const UserNotification& notification : center.deliveredNotifications())
+  for (const UserNotification& notification : *delivered)
     text +=
         "delivered " + textOf(notification.actualDeliveryDate) + "  " + lineOf(notification) + "\n";
-  return text;
+  return console.writeResult(text);
 }
 
 }  // namespace Orvane

@@ -20,12 +20,9 @@ class Console;
 /// Returns whether the period is kept, and complains where it is not.
 [[nodiscard]] bool storePeriod(Varnel::SchedulePeriodOption period, Console& console);
 
-/// Lets the desktop show and take away what the center told it to. If that takes more than a few
-/// seconds, it complains and does not wait longer.
-void awaitDesktop(Varnel::Platform::UserNotificationCenter& center, Console& console);
-
-/// The stored period and the notifications of a center, a line each.
-[[nodiscard]] std::string statusText(Varnel::Platform::UserNotificationCenter& center);
+/// Writes the stored period and the notifications of a center, a line each. False when they cannot
+/// be read or written, which it says.
+[[nodiscard]] bool writeStatus(Varnel::Platform::UserNotificationCenter& center, Console& console);
 
 /// A notification in a line: its identifier, title and text.
 [[nodiscard]] std::string lineOf(const Varnel::Platform::UserNotification& notification);

@@ -23,6 +23,7 @@ namespace Varnel {
 namespace {
 
 using Platform::UserNotification;
+using Notifications = Platform::UserNotificationCenter::Notifications;
 using EventKind = UserNotificationRouter::EventKind;
 
 constexpr const char* notificationIdentifier = "SchedulerNotification";
@@ -32,8 +33,9 @@ constexpr std::int64_t smallestNamedSize = 2'000'000'000;
 constexpr Platform::Date distantFuture =
     std::chrono::sys_days(std::chrono::year(4001) / std::chrono::January / 1);
 
-std::vector<UserNotification> repeating(std::vector<UserNotification> notifications) {
-  std::erase_if(notifications, [](const auto& each) { return !each.deliveryRepeatInterval; });
+Notifications repeating(Notifications notifications) {
+  if (notifications)
+    std::erase_if(*notifications, [](const auto& each) { return !each.deliveryRepeatInterval; });
   return notifications;
 }
 
@@ -57,7 +59,7 @@ SchedulerService::SchedulerService(Ports ports,
       .onUpdate(*this, [this](const UserNotificationRouter::Event& event) {
         if (event.kind == EventKind::didDeliver) return;
         analyticsSender_.trackNotification(event.notification);
-        userNotificationCenter().removeDeliveredNotification(event.notification);
+        removeClicked(event.notification);
       });
 }
 
@@ -71,31 +73,67 @@ Platform::UserNotificationCenter& SchedulerService::userNotificationCenter() con
 
 void SchedulerService::setSchedulePeriod(SchedulePeriodOption period) {
   schedulePeriod_ = period;
-  if (period == SchedulePeriodOption::never)
-    removePreviouslyScheduledNotifications();
-  else
-    rescheduleExistingReminder();
+  rescheduleExistingReminder();
 }
 
-void SchedulerService::scheduleCleanReminder() {
-  scheduleNotification(simpleAlertTile(), simpleAlertSubtitle());
-}
+void SchedulerService::scheduleCleanReminder() { plan(simpleTexts()); }
 
 void SchedulerService::scheduleCleanReminder(std::int64_t sizeLeftToClean) {
   if (sizeLeftToClean < smallestNamedSize) return scheduleCleanReminder();
   const std::string size = Platform::ByteCountFormatter(ports_.userLocale.numberIdentifier())
                                .string(sizeLeftToClean, Platform::ByteCountStyle::file);
-  scheduleNotification(
+  plan(Texts{
       localized("Varnel_CleanReminder_Title_WithSize_Format"),
-      Platform::formatted(localized("Varnel_CleanReminder_Subtitle_WithSize_Format"), {size}));
+      Platform::formatted(localized("Varnel_CleanReminder_Subtitle_WithSize_Format"), {size})});
 }
 
 void SchedulerService::rescheduleExistingReminder() {
+  // The texts of a plan that could not be made yet are those of the present reminder.
+  plan(wish_ ? wish_->texts : std::nullopt);
+}
+
+void SchedulerService::plan(std::optional<Texts> texts) {
+  if (schedulePeriod_ == SchedulePeriodOption::never) texts.reset();
+  wish_ = Wish{.moment = ports_.clock.now(), .texts = std::move(texts)};
+  fulfil();
+}
+
+void SchedulerService::fulfil() {
+  failure_ = userNotificationCenter().change([this] { return fulfil(*wish_); });
+  if (!failure_) return wish_.reset();
+  if (std::exchange(isRetrying_, true)) return;
+  retryLater([this] {
+    isRetrying_ = false;
+    if (wish_) fulfil();
+  });
+}
+
+void SchedulerService::removeClicked(const UserNotification& notification) {
+  if (userNotificationCenter().removeDeliveredNotification(notification))
+    retryLater([this, notification] { removeClicked(notification); });
+}
+
+void SchedulerService::retryLater(std::function<void()> retry) {
+  userNotificationCenter().retryLater([life = lifetime(), retry = std::move(retry)] {
+    if (!life.expired()) retry();
+  });
+}
+
+SchedulerService::Failure SchedulerService::fulfil(const Wish& wish) {
+  if (schedulePeriod_ == SchedulePeriodOption::never)
+    return removePreviouslyScheduledNotifications();
+  if (wish.texts) return scheduleNotification(*wish.texts, wish.moment);
+  const auto texts = existingTexts();
+  return texts ? scheduleNotification(*texts, wish.moment) : texts.error();
+}
+
+Platform::Result<SchedulerService::Texts> SchedulerService::existingTexts() {
   const auto existing = repeating(userNotificationCenter().scheduledNotifications());
-  if (existing.empty()) return scheduleCleanReminder();
-  const UserNotification& first = existing.front();
-  scheduleNotification(first.title ? *first.title : simpleAlertTile(),
-                       first.informativeText ? *first.informativeText : simpleAlertSubtitle());
+  if (!existing) return existing.error();
+  if (existing->empty()) return simpleTexts();
+  const UserNotification& first = existing->front();
+  return Texts{first.title ? *first.title : simpleAlertTile(),
+               first.informativeText ? *first.informativeText : simpleAlertSubtitle()};
 }
 
 std::string SchedulerService::localized(const char* key) const {
@@ -110,34 +148,39 @@ std::string SchedulerService::simpleAlertSubtitle() const {
   return localized("Varnel_CleanReminder_Subtitle_Simple");
 }
 
-void SchedulerService::scheduleNotification(const std::string& title, const std::string& subtitle) {
-  removePreviouslyScheduledNotifications();
-  if (schedulePeriod_ == SchedulePeriodOption::never) return;
+SchedulerService::Failure SchedulerService::scheduleNotification(const Texts& texts,
+                                                                 Platform::Date moment) {
+  if (auto error = removePreviouslyScheduledNotifications()) return error;
   const auto interval =
       schedulePeriod_.repeatInterval(Platform::Calendar(ports_.userLocale, ports_.timeZones));
-  userNotificationCenter().scheduleNotification({
+  return userNotificationCenter().scheduleNotification({
       .identifier = notificationIdentifier,
-      .title = ports_.facts.substitutingApplicationName(title),
-      .informativeText = ports_.facts.substitutingApplicationName(subtitle),
+      .title = ports_.facts.substitutingApplicationName(texts.title),
+      .informativeText = ports_.facts.substitutingApplicationName(texts.subtitle),
       .actionButtonTitle = localized("Varnel_CleanReminder_ActionButton"),
       .otherButtonTitle = localized("Varnel_CleanReminder_OtherButton"),
-      .deliveryDate = calculateDeliveryDate(interval),
+      .deliveryDate = calculateDeliveryDate(interval, moment),
       .deliveryRepeatInterval = interval,
   });
 }
 
-void SchedulerService::removePreviouslyScheduledNotifications() {
+SchedulerService::Failure SchedulerService::removePreviouslyScheduledNotifications() {
   Platform::UserNotificationCenter& center = userNotificationCenter();
-  for (const UserNotification& notification : repeating(center.scheduledNotifications()))
-    center.removeScheduledNotification(notification);
-  for (const UserNotification& notification : repeating(center.deliveredNotifications()))
-    center.removeDeliveredNotification(notification);
+  const auto scheduled = repeating(center.scheduledNotifications());
+  if (!scheduled) return scheduled.error();
+  for (const UserNotification& notification : *scheduled)
+    if (auto error = center.removeScheduledNotification(notification)) return error;
+  const auto delivered = repeating(center.deliveredNotifications());
+  if (!delivered) return delivered.error();
+  for (const UserNotification& notification : *delivered)
+    if (auto error = center.removeDeliveredNotification(notification)) return error;
+  return std::nullopt;
 }
 
 Platform::Date SchedulerService::calculateDeliveryDate(
-    const Platform::DateComponents& repeatInterval) const {
+    const Platform::DateComponents& repeatInterval, Platform::Date moment) const {
   return Platform::Calendar(ports_.userLocale, ports_.timeZones)
-      .adding(repeatInterval, ports_.clock.now())
+      .adding(repeatInterval, moment)
       .value_or(distantFuture);
 }
 

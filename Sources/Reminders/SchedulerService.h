@@ -2,13 +2,17 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <memory>
+#include <optional>
 #include <string>
 
 #include <Varnel/Basalt/ExecutionContext.h>
 #include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Values/Date.h>
 #include <Varnel/Platform/Values/DateComponents.h>
+#include <Varnel/Platform/Values/PlatformError.h>
+#include <Varnel/Platform/Values/Result.h>
 #include <Varnel/Reminders/SchedulePeriodOption.h>
 #include <Varnel/Reminders/SchedulerAnalyticsSender.h>
 
@@ -42,7 +46,11 @@ class UserNotificationRouter;
 /// service has `never`, and changes nothing until it is called.
 ///
 /// Every repeating notification of the application counts as this service's and is swept away with
-/// its reminder: the host schedules none. Main thread only; nothing fails.
+/// its reminder: the host schedules none.
+///
+/// Sweeping and scheduling are one change, which is made wholly or not at all. Where it cannot be
+/// made (a full disk, say), `failure` tells why, and the service tries again for as long as it lives;
+/// what is asked of it meanwhile takes the place of that. Main thread only.
 class VARNEL_API SchedulerService final : public Basalt::ExecutionContext {
  public:
   struct Ports {
@@ -74,19 +82,44 @@ class VARNEL_API SchedulerService final : public Basalt::ExecutionContext {
 
   [[nodiscard]] Platform::UserNotificationCenter& userNotificationCenter() const;
 
+  /// What has kept the last plan from being made; none once it is made.
+  [[nodiscard]] const std::optional<Platform::PlatformError>& failure() const { return failure_; }
+
  private:
+  using Failure = std::optional<Platform::PlatformError>;
+
+  struct Texts {
+    std::string title;
+    std::string subtitle;
+  };
+  /// What the center is to hold, as of the moment when it was asked for.
+  struct Wish {
+    Platform::Date moment;
+    std::optional<Texts> texts;  ///< Those of the present reminder when absent.
+  };
+
   [[nodiscard]] std::string localized(const char* key) const;
   [[nodiscard]] std::string simpleAlertTile() const;
   [[nodiscard]] std::string simpleAlertSubtitle() const;
-  void scheduleNotification(const std::string& title, const std::string& subtitle);
-  void removePreviouslyScheduledNotifications();
-  [[nodiscard]] Platform::Date calculateDeliveryDate(
-      const Platform::DateComponents& repeatInterval) const;
+  [[nodiscard]] Texts simpleTexts() const { return {simpleAlertTile(), simpleAlertSubtitle()}; }
+  void plan(std::optional<Texts> texts);
+  void fulfil();
+  void removeClicked(const Platform::UserNotification& notification);
+  void retryLater(std::function<void()> retry);
+  [[nodiscard]] Failure fulfil(const Wish& wish);
+  [[nodiscard]] Platform::Result<Texts> existingTexts();
+  [[nodiscard]] Failure scheduleNotification(const Texts& texts, Platform::Date moment);
+  [[nodiscard]] Failure removePreviouslyScheduledNotifications();
+  [[nodiscard]] Platform::Date calculateDeliveryDate(const Platform::DateComponents& repeatInterval,
+                                                     Platform::Date moment) const;
 
   const Ports ports_;
   SchedulePeriodOption schedulePeriod_ = SchedulePeriodOption::never;
   SchedulerAnalyticsSender analyticsSender_;
   UserNotificationRouter& userNotificationRouter_;
+  std::optional<Wish> wish_;  ///< Until it is fulfilled.
+  bool isRetrying_ = false;
+  Failure failure_;
 };
 
 }  // namespace Varnel

@@ -112,19 +112,28 @@ void UserNotificationRouter::handleLaunch(const UserNotification& notification) 
   routes_->route(notification, EventKind::didLaunchWith);
 }
 
-void UserNotificationRouter::removeScheduledNotifications(const std::string& identifier) {
-  removeNotifications(identifier, &UserNotificationCenter::removeScheduledNotification);
+std::optional<Platform::PlatformError> UserNotificationRouter::removeScheduledNotifications(
+    const std::string& identifier) {
+  return removeNotifications(identifier, &UserNotificationCenter::removeScheduledNotification);
 }
 
-void UserNotificationRouter::removeDeliveredNotifications(const std::string& identifier) {
-  removeNotifications(identifier, &UserNotificationCenter::removeDeliveredNotification);
+std::optional<Platform::PlatformError> UserNotificationRouter::removeDeliveredNotifications(
+    const std::string& identifier) {
+  return removeNotifications(identifier, &UserNotificationCenter::removeDeliveredNotification);
 }
 
-void UserNotificationRouter::removeNotifications(const std::string& identifier, Removal removal) {
+UserNotificationRouter::Failure UserNotificationRouter::removeNotifications(
+    const std::string& identifier, Removal removal) {
   UserNotificationCenter& center = ports_.userNotificationCenter;
-  // Both removals look for their candidates here: part of the published behaviour.
-  for (const UserNotification& notification : center.deliveredNotifications())
-    if (notification.identifier == identifier) (center.*removal)(notification);
+  return center.change([&]() -> Failure {
+    // Both removals look for their candidates here: part of the published behaviour.
+    const auto delivered = center.deliveredNotifications();
+    if (!delivered) return delivered.error();
+    for (const UserNotification& notification : *delivered)
+      if (notification.identifier == identifier)
+        if (auto error = (center.*removal)(notification)) return error;
+    return std::nullopt;
+  });
 }
 
 }  // namespace Varnel

@@ -9,6 +9,7 @@
 
 #include <Varnel/Basalt/Channel.h>
 #include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/PlatformError.h>
 #include <Varnel/Platform/Values/UserNotification.h>
 
 namespace Varnel::Platform {
@@ -27,7 +28,7 @@ namespace Varnel {
 ///
 /// `register_` and `channel` may be called on any thread, all else on the main thread. Handlers run
 /// on the main queue, never within the call that caused the event. An event for which nobody has
-/// registered is lost. Nothing fails.
+/// registered is lost.
 class VARNEL_API UserNotificationRouter final {
  public:
   enum class EventKind : std::int64_t {
@@ -74,16 +75,19 @@ class VARNEL_API UserNotificationRouter final {
 
   /// Cancels what is scheduled under this identifier, if it has been delivered before and is still
   /// in the delivered list: published behaviour. A notification that was never delivered stays
-  /// scheduled.
-  void removeScheduledNotifications(const std::string& identifier);
-  /// Removes delivered notifications with this identifier.
-  void removeDeliveredNotifications(const std::string& identifier);
+  /// scheduled. Returns what kept it from being done, or none; then nothing has changed.
+  [[nodiscard]] std::optional<Platform::PlatformError> removeScheduledNotifications(
+      const std::string& identifier);
+  /// Removes delivered notifications with this identifier. Fails as the other does.
+  [[nodiscard]] std::optional<Platform::PlatformError> removeDeliveredNotifications(
+      const std::string& identifier);
 
  private:
   class Routes;
+  using Failure = std::optional<Platform::PlatformError>;
   using Removal =
-      void (Platform::UserNotificationCenter::*)(const Platform::UserNotification& notification);
-  void removeNotifications(const std::string& identifier, Removal removal);
+      Failure (Platform::UserNotificationCenter::*)(const Platform::UserNotification& notification);
+  [[nodiscard]] Failure removeNotifications(const std::string& identifier, Removal removal);
 
   const Ports ports_;
   const std::shared_ptr<Routes> routes_;  ///< The center's delegate, for the router's life.

@@ -16,6 +16,7 @@
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Platform/Testing/FakeApplication.h>
@@ -84,14 +85,15 @@ class Host final {
     EXPECT_TRUE(Tests::drainUntil(*queue, [&] { return Server::displayedCount() == "1\n"; }));
   }
 
-  // Until the store knows the server's names for the banners of all that was delivered.
-  void awaitReferences() {
+  // Until the store knows that all banners have come.
+  void awaitShown() {
     const std::string file =
         std::string(getenv("XDG_STATE_HOME")) + "/" + productName + "/notifications.sqlite";
     EXPECT_TRUE(Tests::drainUntil(*queue, [&] {
-      const auto delivered = Platform::NotificationStore(file, log).delivered();
-      return std::all_of(delivered.begin(), delivered.end(),
-                         [](const auto& each) { return each.bannerReference.has_value(); });
+      using enum Platform::DeliveryState;
+      const auto waiting =
+          Platform::NotificationStore({*files, log}, file).deliveries({due, toShow});
+      return waiting && waiting->empty();
     }));
   }
 
@@ -100,6 +102,7 @@ class Host final {
   const std::unique_ptr<Platform::MainQueue> queue = Platform::Linux::makeMainQueue();
   Platform::Testing::FakeUserLocale locale;
   Platform::Testing::FakeTimeZones zones;
+  const std::unique_ptr<Platform::PrivateFiles> files = Platform::POSIX::makePrivateFiles();
   Platform::Testing::CapturedSystemLog log;
   Platform::Testing::FakeApplication application;
   Platform::Testing::FakeProcessInfo processInfo;
@@ -110,7 +113,7 @@ class Host final {
   const std::shared_ptr<Tallyhouse::Testing::MemoryTransport> sent =
       std::make_shared<Tallyhouse::Testing::MemoryTransport>();
   const std::unique_ptr<Platform::UserNotificationCenters> centers =
-      Platform::Linux::makeUserNotificationCenters({*clock, locale, zones, *queue, log});
+      Platform::Linux::makeUserNotificationCenters({*clock, locale, zones, *queue, *files, log});
   Platform::UserNotificationCenter& center;
   UserNotificationRouter router;
   SchedulerService service{
@@ -124,7 +127,7 @@ TEST(NotificationServer, AReminderAppearsAndItsClicksComeBackOnce) {
   Host host("clicks");
   for (const char* click : {"dunstctl action 0", "dunstctl context"}) {
     const std::size_t before = host.sent->events().size();
-    host.center.scheduleNotification(host.reminderIn(300ms));
+    EXPECT_FALSE(host.center.scheduleNotification(host.reminderIn(300ms)));
     host.awaitBanner();
     outputOf(click);
     EXPECT_TRUE(
@@ -133,8 +136,8 @@ TEST(NotificationServer, AReminderAppearsAndItsClicksComeBackOnce) {
     host.queue->drain();
     EXPECT_EQ(host.sent->events().size(), before + 1) << click;
     EXPECT_EQ(host.sent->events().back().action, "Notification Clicked");
-    EXPECT_THAT(host.center.deliveredNotifications(), IsEmpty());
-    EXPECT_THAT(host.center.scheduledNotifications(), SizeIs(1));
+    EXPECT_THAT(*host.center.deliveredNotifications(), IsEmpty());
+    EXPECT_THAT(*host.center.scheduledNotifications(), SizeIs(1));
   }
   const std::string history = outputOf("dunstctl history");
   EXPECT_THAT(history, HasSubstr("Fotovia & 3"));
@@ -146,46 +149,69 @@ TEST(NotificationServer, AReminderAppearsAndItsClicksComeBackOnce) {
 TEST(NotificationServer, ADismissedBannerLeavesTheDeliveredList) {
   Server server;
   Host host("dismissal");
-  host.center.deliverNotification(host.reminderIn(0s));
+  EXPECT_FALSE(host.center.deliverNotification(host.reminderIn(0s)));
   host.awaitBanner();
-  EXPECT_THAT(host.center.deliveredNotifications(), SizeIs(1));
+  EXPECT_THAT(*host.center.deliveredNotifications(), SizeIs(1));
   outputOf("dunstctl close");
-  EXPECT_TRUE(
-      Tests::drainUntil(*host.queue, [&] { return host.center.deliveredNotifications().empty(); }));
+  EXPECT_TRUE(Tests::drainUntil(*host.queue,
+                                [&] { return host.center.deliveredNotifications()->empty(); }));
   EXPECT_THAT(host.sent->events(), IsEmpty());
 }
 
 TEST(NotificationServer, ADeliveryWhileTheLastIsOnItsWayKeepsTheBanner) {
   Server server;
   Host host("rapid");
-  host.center.deliverNotification(host.reminderIn(0s));
-  host.awaitReferences();
+  EXPECT_FALSE(host.center.deliverNotification(host.reminderIn(0s)));
+  host.awaitShown();
   // Each time a step later on the way of the messages.
   for (int steps = 0; steps < 10; ++steps) {
-    host.center.deliverNotification(host.reminderIn(0s));
+    EXPECT_FALSE(host.center.deliverNotification(host.reminderIn(0s)));
     for (int step = 0; step < steps; ++step)
       if (Tests::isReadable(*host.queue->descriptor(), 20ms)) host.queue->drain();
-    host.center.deliverNotification(host.reminderIn(0s));
-    host.awaitReferences();
+    EXPECT_FALSE(host.center.deliverNotification(host.reminderIn(0s)));
+    host.awaitShown();
     ASSERT_EQ(Server::displayedCount(), "1\n") << steps;
     ASSERT_FALSE(testing::Test::HasFailure()) << steps;
   }
 }
 
-TEST(NotificationServer, ALostServerCostsTheBannerAlone) {
+TEST(NotificationServer, ABannerThatFindsNoServerIsShownWhenOneComes) {
   auto server = std::make_unique<Server>();
   Host host("restart");
-  host.center.deliverNotification(host.reminderIn(0s));
-  host.awaitBanner();
+  EXPECT_FALSE(host.center.deliverNotification({.identifier = "seen", .title = "Seen"}));
+  host.awaitShown();
   server.reset();
-  host.center.scheduleNotification(host.reminderIn(0s));
+  EXPECT_FALSE(host.center.scheduleNotification(host.reminderIn(0s)));
   EXPECT_TRUE(Tests::drainUntil(*host.queue, [&] { return !host.log.text().empty(); }));
   EXPECT_THAT(host.log.text(), HasSubstr("Cannot show a notification"));
-  EXPECT_THAT(host.center.deliveredNotifications(), SizeIs(1));
-  EXPECT_THAT(host.center.scheduledNotifications(), SizeIs(1));
+  EXPECT_THAT(*host.center.deliveredNotifications(), SizeIs(2));
   server = std::make_unique<Server>();
-  host.center.scheduleNotification(host.reminderIn(100ms));
-  host.awaitBanner();
+  host.awaitShown();
+  // What had been shown is not shown again.
+  EXPECT_EQ(Server::displayedCount(), "1\n");
+  const std::string said = host.log.text();
+  EXPECT_EQ(std::count(said.begin(), said.end(), '\n'), 1) << said;
+}
+
+TEST(NotificationServer, ABannerThatAHangingServerTookComesOnceAndIsNotLostWithIt) {
+  for (const bool isEnded : {false, true}) {
+    auto server = std::make_unique<Server>();
+    Host host(isEnded ? "hanging" : "ended");
+    EXPECT_FALSE(host.center.deliverNotification({.identifier = "first", .title = "First"}));
+    host.awaitShown();
+    server->signal(SIGSTOP);
+    EXPECT_FALSE(host.center.deliverNotification(host.reminderIn(0s)));
+    host.queue->drain();
+    EXPECT_TRUE(host.center.isBusy());
+    if (isEnded) {
+      server.reset();
+      server = std::make_unique<Server>();
+    } else {
+      server->signal(SIGCONT);
+    }
+    host.awaitShown();
+    EXPECT_EQ(Server::displayedCount(), isEnded ? "1\n" : "2\n");
+  }
 }
 
 TEST(NotificationServer, ABusThatAnswersLateDelaysTheBannerAlone) {
@@ -196,7 +222,7 @@ TEST(NotificationServer, ABusThatAnswersLateDelaysTheBannerAlone) {
   const pid_t bus = std::stoi(answer.substr(answer.find(' ')));
   ASSERT_EQ(::kill(bus, SIGSTOP), 0);
   Host host("late");
-  host.center.scheduleNotification(host.reminderIn(0s));
+  EXPECT_FALSE(host.center.scheduleNotification(host.reminderIn(0s)));
   host.queue->drain();
   EXPECT_TRUE(host.center.isBusy());
   ASSERT_EQ(::kill(bus, SIGCONT), 0);
@@ -208,17 +234,17 @@ TEST(NotificationServer, ANextRunDeliversWhatTheLastOneCouldNotAndTakesItsBanner
   Server server;
   {
     Host host("runs");
-    host.center.deliverNotification({.identifier = "left", .title = "Left behind"});
-    host.awaitReferences();
+    EXPECT_FALSE(host.center.deliverNotification({.identifier = "left", .title = "Left behind"}));
+    host.awaitShown();
     // Due only when the process has gone.
     host.center.setDelegate({});
-    host.center.scheduleNotification(host.reminderIn(0s));
+    EXPECT_FALSE(host.center.scheduleNotification(host.reminderIn(0s)));
   }
   Host next("runs");
-  next.awaitReferences();
+  next.awaitShown();
   EXPECT_EQ(Server::displayedCount(), "2\n");
   const auto settle = [&] { next.queue->runWhile([&] { return next.center.isBusy(); }); };
-  next.router.removeDeliveredNotifications("left");
+  EXPECT_FALSE(next.router.removeDeliveredNotifications("left"));
   settle();
   EXPECT_EQ(Server::displayedCount(), "1\n");
   next.service.setSchedulePeriod(SchedulePeriodOption::never);
@@ -231,17 +257,17 @@ TEST(NotificationServer, OneProcessLearnsAtOnceWhatAnotherSchedules) {
   Host host("watch");
   Host other("watch");
   other.center.setDelegate({});
-  other.center.scheduleNotification(other.reminderIn(100ms));
+  EXPECT_FALSE(other.center.scheduleNotification(other.reminderIn(100ms)));
   host.awaitBanner();
-  EXPECT_THAT(other.center.deliveredNotifications(), SizeIs(1));
+  EXPECT_THAT(*other.center.deliveredNotifications(), SizeIs(1));
 }
 
 TEST(NotificationServer, AProgramThatPlansWaitsForAFrozenServerOnlyAWhile) {
   Server server;
   ::setenv("HOME", getenv("VARNEL_DESKTOP"), 1);
   Host host("com.quennel.Orvane2");
-  host.center.deliverNotification(host.reminderIn(0s));
-  host.awaitReferences();
+  EXPECT_FALSE(host.center.deliverNotification(host.reminderIn(0s)));
+  host.awaitShown();
   server.signal(SIGSTOP);
   const auto start = std::chrono::steady_clock::now();
   EXPECT_THAT(outputOf(std::string(ORVANE_PROGRAM) + " remind every weekly 2>&1"),
@@ -256,7 +282,7 @@ TEST(NotificationServer, AProgramThatListensTellsOfDeliveriesAndClicks) {
   ::setenv("HOME", getenv("VARNEL_DESKTOP"), 1);
   Host host("com.quennel.Orvane2");
   host.center.setDelegate({});
-  host.center.scheduleNotification(host.reminderIn(0s));
+  EXPECT_FALSE(host.center.scheduleNotification(host.reminderIn(0s)));
   Tests::ChildProcess listener({ORVANE_PROGRAM, "remind", "listen"});
   EXPECT_THAT(listener.readLine(),
               StartsWith("delivered  SchedulerNotification: Time to <clean> & go"));

@@ -3,18 +3,19 @@
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-#include <signal.h>
-#include <sys/wait.h>
-#include <unistd.h>
 
-#include <array>
+#include <algorithm>
 #include <atomic>
 #include <barrier>
-#include <fstream>
+#include <filesystem>
+#include <memory>
 #include <thread>
 
 #include <Tests/Support/TemporaryFolder.h>
 #include <Tests/Support/Zones.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/PrivateFiles.h>
+#include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Platform/Text/Calendar.h>
 
@@ -23,7 +24,7 @@ namespace {
 
 namespace fs = std::filesystem;
 using namespace std::chrono_literals;
-using ::testing::HasSubstr;
+using enum DeliveryState;
 using ::testing::IsEmpty;
 using ::testing::SizeIs;
 
@@ -41,170 +42,181 @@ class NotificationStoreTest : public ::testing::Test {
             .deliveryDate = start,
             .deliveryRepeatInterval = DateComponents{.day = 7}};
   }
+  NotificationStore open() { return {{*files, log}, file.string()}; }
+
+  static std::vector<Delivery> all(NotificationStore& store) {
+    return store.deliveries({planned, due, hidden, toShow, shown, expired, removed}).valueOr({});
+  }
+  static Delivery only(NotificationStore& store, DeliveryState state) {
+    const auto found = store.deliveries({state});
+    EXPECT_TRUE(found && found->size() == 1);
+    return found && found->size() == 1 ? found->front() : Delivery();
+  }
+  // Due, and the delegate wants to show it.
+  static Delivery madeToShow(NotificationStore& store, const UserNotification& notification,
+                             Date now = start) {
+    EXPECT_FALSE(store.makeDue(notification, now));
+    const Delivery delivery = only(store, due);
+    EXPECT_FALSE(store.decideDue({{delivery.number, true}}));
+    return delivery;
+  }
 
   const Tests::TemporaryFolder folder;
   const fs::path file = folder.path() / "made" / "store.sqlite";
   const Calendar calendar{"en_US", "UTC", zones};
+  const std::unique_ptr<PrivateFiles> files = POSIX::makePrivateFiles();
   Testing::CapturedSystemLog log;
 };
 
 TEST_F(NotificationStoreTest, KeepsEveryPartOfANotificationForTheNextRun) {
   {
-    NotificationStore store(file, log);
-    store.schedule(weekly(), start, calendar);
-    store.schedule({.title = "Nameless"}, start, calendar);
-    store.schedule({.title = "Nameless"}, start, calendar);
+    NotificationStore store = open();
+    EXPECT_FALSE(store.plan(weekly(), start, calendar));
+    EXPECT_FALSE(store.plan({.title = "Nameless"}, start, calendar));
+    EXPECT_FALSE(store.plan({.title = "Nameless"}, start, calendar));
+    EXPECT_FALSE(store.plan(weekly(), start, calendar));
   }
-  NotificationStore store(file, log);
-  const auto schedules = store.schedules();
+  NotificationStore store = open();
+  const auto schedules = all(store);
   ASSERT_THAT(schedules, SizeIs(3));
-  EXPECT_EQ(schedules[0].notification, weekly());
-  EXPECT_EQ(schedules[0].timeZone, "UTC");
-  EXPECT_EQ(fs::status(file).permissions(), fs::perms::owner_read | fs::perms::owner_write);
-  EXPECT_EQ(fs::status(file.parent_path()).permissions(), fs::perms::owner_all);
+  const auto regular = std::find_if(schedules.begin(), schedules.end(), [](const Delivery& each) {
+    return each.schedule.notification.identifier.has_value();
+  });
+  ASSERT_NE(regular, schedules.end());
+  EXPECT_EQ(regular->schedule.notification, weekly());
+  EXPECT_EQ(regular->schedule.timeZone, "UTC");
 
-  const auto claimed = store.claimDue(start, calendar);
-  ASSERT_THAT(claimed, SizeIs(3));
+  EXPECT_FALSE(store.claimDue(start, calendar));
+  EXPECT_THAT(*store.deliveries({due}), SizeIs(3));
+  EXPECT_EQ(only(store, planned).schedule.deliveryCount, 1);
   auto expected = weekly();
   expected.actualDeliveryDate = start;
-  EXPECT_EQ(store.delivered().back().notification, expected);
-  EXPECT_THAT(store.schedules(), SizeIs(1));
+  const auto claimed = *store.deliveries({due});
+  EXPECT_THAT(claimed, testing::Contains(testing::Truly([&](const Delivery& each) {
+                return each.number == regular->number && each.schedule.notification == expected;
+              })));
   EXPECT_EQ(log.text(), "");
 }
 
 TEST_F(NotificationStoreTest, EachDeliveryIsClaimedOnceAmongMany) {
   constexpr int claimerCount = 4;
   constexpr int weekCount = 15;
-  NotificationStore(file, log).schedule(weekly(), start, calendar);
-  std::array<std::atomic<int>, weekCount> claims{};
+  {
+    NotificationStore store = open();
+    EXPECT_FALSE(store.plan(weekly(), start, calendar));
+  }
+  std::atomic<int> failures = 0;
   std::barrier step(claimerCount);
   const auto claimAll = [&] {
-    NotificationStore store(file, log);  // What a process has of its own.
+    NotificationStore store = open();  // What a process has of its own.
     const Calendar own("en_US", "UTC", zones);
     for (int week = 0; week < weekCount; ++week) {
       step.arrive_and_wait();
-      claims.at(static_cast<std::size_t>(week)) +=
-          static_cast<int>(store.claimDue(start + std::chrono::days(7 * week), own).size());
+      // Somebody else may keep the file for longer than anybody waits.
+      while (store.claimDue(start + std::chrono::days(7 * week), own)) ++failures;
     }
   };
   {
     std::vector<std::jthread> claimers;
     for (int i = 0; i < claimerCount; ++i) claimers.emplace_back(claimAll);
   }
-  for (const auto& count : claims) EXPECT_EQ(count, 1);
-  EXPECT_EQ(log.text(), "");
+  NotificationStore store = open();
+  EXPECT_EQ(only(store, planned).schedule.deliveryCount, weekCount);
+  EXPECT_THAT(*store.deliveries({due}), SizeIs(1));
 }
 
-TEST_F(NotificationStoreTest, SetsADamagedFileAsideAndGoesOn) {
-  const auto damaged = [&] { return file.string() + ".damaged"; };
-  for (const std::string& content :
-       {std::string(4096, 'x'),
-        std::string("SQLite format 3\0\x10\0\1\1\0\x40\x20\x20garbage", 31) +
-            std::string(8000, 'z')}) {
-    fs::create_directories(file.parent_path());
-    std::ofstream(file, std::ios::binary) << content;
-    NotificationStore store(file, log);
-    store.schedule(weekly(), start, calendar);
-    EXPECT_THAT(store.schedules(), SizeIs(1));
-    EXPECT_EQ(fs::file_size(damaged()), content.size());
-    fs::remove(file);
+TEST_F(NotificationStoreTest, ADeliveryGoesFromStateToState) {
+  NotificationStore store = open();
+  const Delivery first = madeToShow(store, weekly());
+  EXPECT_EQ(only(store, toShow).number, first.number);
+  EXPECT_TRUE(*store.noteShown(first.number, "banner 1"));
+  EXPECT_TRUE(*store.noteShown(first.number, "banner 1"));  // As a work that is done again.
+  EXPECT_EQ(only(store, shown).banner, "banner 1");
+
+  // Its successor has a number of its own and inherits its banner, to replace it.
+  const Delivery second = madeToShow(store, weekly(), start + 1h);
+  EXPECT_THAT(all(store), SizeIs(1));
+  EXPECT_NE(second.number, first.number);
+  EXPECT_EQ(only(store, toShow).banner, "banner 1");
+  EXPECT_FALSE(*store.noteShown(first.number, "late"));
+
+  // Removed, it stays until its banner is gone.
+  EXPECT_TRUE(*store.noteShown(second.number, "banner 2"));
+  EXPECT_FALSE(store.remove(second.number));
+  EXPECT_EQ(only(store, removed).banner, "banner 2");
+  EXPECT_FALSE(*store.noteShown(second.number, "late"));
+  EXPECT_FALSE(store.noteGone(second.number));
+  EXPECT_THAT(all(store), IsEmpty());
+
+  const Delivery third = madeToShow(store, weekly());
+  EXPECT_TRUE(*store.noteShown(third.number, "banner 3"));
+  EXPECT_FALSE(store.noteGone(third.number));
+  EXPECT_EQ(only(store, expired).banner, std::nullopt);
+  EXPECT_FALSE(store.makeDue(weekly(), start));
+  EXPECT_FALSE(store.decideDue({{only(store, due).number, false}}));
+  EXPECT_EQ(only(store, hidden).schedule.key, third.schedule.key);
+  EXPECT_FALSE(store.remove(only(store, hidden).number));
+  EXPECT_THAT(all(store), IsEmpty());
+}
+
+TEST_F(NotificationStoreTest, CallsTogetherAreDoneAsAWhole) {
+  NotificationStore store = open();
+  EXPECT_FALSE(store.plan(weekly(), start, calendar));
+  for (const bool isFailing : {true, false}) {
+    const auto failure = store.change([&]() -> NotificationStore::Failure {
+      EXPECT_FALSE(store.remove(only(store, planned).number));
+      EXPECT_FALSE(store.plan(weekly("other"), start, calendar));
+      if (isFailing) return PlatformError("Test", 1);
+      return std::nullopt;
+    });
+    EXPECT_EQ(failure.has_value(), isFailing);
+    EXPECT_EQ(only(store, planned).schedule.notification.identifier,
+              isFailing ? "weekly" : "other");
   }
-  EXPECT_THAT(log.text(),
-              HasSubstr("Set aside the damaged store of notifications as " + damaged()));
-
-  // A sound database with other tables.
-  {
-    auto other = SQLiteDatabase::open(file.string());
-    ASSERT_FALSE(other->execute("CREATE TABLE scheduled (key TEXT)"));
-  }
-  NotificationStore store(file, log);
-  store.schedule(weekly(), start, calendar);
-  EXPECT_THAT(store.schedules(), SizeIs(1));
-
-  // Damage done while it is open.
-  { std::ofstream(file, std::ios::binary | std::ios::trunc) << std::string(20'000, 'y'); }
-  store.schedule(weekly("again"), start, calendar);
-  EXPECT_THAT(NotificationStore(file, log).schedules(), SizeIs(1));
 }
 
-TEST_F(NotificationStoreTest, FollowsAFileThatIsReplacedWhileItIsOpen) {
-  NotificationStore store(file, log);
-  store.schedule(weekly(), start, calendar);
-  fs::rename(file, file.string() + ".damaged");  // As another process sets it aside.
-  NotificationStore other(file, log);
-  other.schedule(weekly("other"), start, calendar);
-  ASSERT_THAT(store.schedules(), SizeIs(1));
-  EXPECT_EQ(store.schedules().front().notification.identifier, "other");
-  EXPECT_EQ(store.claimDue(start, calendar).size() + other.claimDue(start, calendar).size(), 1u);
-  fs::remove(file);
-  store.schedule(weekly(), start, calendar);
-  EXPECT_THAT(other.schedules(), SizeIs(1));
-  EXPECT_EQ(log.text(), "");
-}
-
-TEST_F(NotificationStoreTest, AFileThatIsLockedForLongIsTriedAgain) {
-  NotificationStore(file, log).schedule(weekly(), start, calendar);
-  NotificationStore store(file, log);
+TEST_F(NotificationStoreTest, AFileThatCannotBeReadIsNotAnEmptyList) {
+  NotificationStore store = open();
+  EXPECT_FALSE(store.plan(weekly(), start, calendar));
   auto holder = SQLiteDatabase::open(file.string());
   ASSERT_FALSE(holder->execute("BEGIN EXCLUSIVE"));
-  EXPECT_THAT(store.schedules(), IsEmpty());
-  EXPECT_TRUE(store.isOutOfOrder());
+  EXPECT_FALSE(store.deliveries({planned}));
+  EXPECT_TRUE(store.claimDue(start, calendar));
   ASSERT_FALSE(holder->execute("COMMIT"));
-  EXPECT_THAT(store.schedules(), SizeIs(1));
-  EXPECT_FALSE(store.isOutOfOrder());
-  EXPECT_FALSE(fs::exists(file.string() + ".damaged"));
-}
-
-TEST_F(NotificationStoreTest, AKilledProcessLosesNothingAndLocksNobodyOut) {
-  const pid_t process = ::fork();
-  ASSERT_GE(process, 0);
-  if (process == 0) {
-    NotificationStore(file, log).schedule(weekly(), start, calendar);
-    auto database = SQLiteDatabase::open(file.string());
-    static_cast<void>(database->execute("BEGIN EXCLUSIVE; DELETE FROM scheduled"));
-    ::kill(::getpid(), SIGKILL);
-  }
-  int status = 0;
-  ASSERT_EQ(::waitpid(process, &status, 0), process);
-  ASSERT_TRUE(WIFSIGNALED(status));
-  EXPECT_THAT(NotificationStore(file, log).claimDue(start, calendar), SizeIs(1));
-  EXPECT_EQ(log.text(), "");
-}
-
-TEST_F(NotificationStoreTest, ServesFromMemoryWhereNoFileCanBe) {
-  std::ofstream(folder.path() / "made") << "a file where the folder should be";
-  NotificationStore store(file, log);
-  store.schedule(weekly(), start, calendar);
-  EXPECT_THAT(store.claimDue(start, calendar), SizeIs(1));
-  EXPECT_THAT(log.text(), HasSubstr("Notifications are kept in memory alone"));
+  EXPECT_THAT(all(store), SizeIs(1));
 }
 
 TEST_F(NotificationStoreTest, SurvivesWhateverStandsInItsColumns) {
-  NotificationStore(file, log).schedule(weekly(), start, calendar);
+  NotificationStore store = open();
+  EXPECT_FALSE(store.plan(weekly(), start, calendar));
   {
     auto database = SQLiteDatabase::open(file.string());
     for (const char* sql :
-         {"UPDATE scheduled SET date = 9223372036854775807, months = -1, days = 'x', zone = 'A/B'",
-          "INSERT INTO scheduled (key, date, years, zone, count) VALUES "
-          "('a', -9223372036854775807, 9223372036854775807, '', 9223372036854775807)",
-          "INSERT INTO scheduled (key, date, days, zone, count) VALUES ('b', 'x', 1, x'ff', -9)",
-          "INSERT INTO delivered (key, title, delivered) VALUES ('c', x'00ff', 'never')"})
+         {"UPDATE deliveries SET date = 9223372036854775807, months = -1, days = 'x', zone = 'A/B'",
+          "INSERT INTO deliveries (state, key, date, years, zone, count) VALUES "
+          "('planned', 'a', -9223372036854775807, 9223372036854775807, '', 9223372036854775807)",
+          "INSERT INTO deliveries (state, key, date, days, zone, count) VALUES "
+          "('planned', 'b', 'x', 1, x'ff', -9)",
+          "INSERT INTO deliveries (state, key, title, delivered, zone, count) VALUES "
+          "('shown', 'c', x'00ff', 'never', '', 0), ('of a later version', 'd', '', 1, '', 0)"})
       ASSERT_FALSE(database->execute(sql)) << sql;
   }
-  NotificationStore store(file, log);
-  const auto claimed = store.claimDue(start, Calendar("en_US", "Europe/Berlin", zones));
-  EXPECT_THAT(store.schedules(), SizeIs(testing::Le(3u)));
-  EXPECT_THAT(store.delivered(), SizeIs(1 + claimed.size()));
+  EXPECT_FALSE(store.claimDue(start, Calendar("en_US", "Europe/Berlin", zones)));
+  EXPECT_THAT(*store.deliveries({planned}), SizeIs(testing::Le(3u)));
+  EXPECT_THAT(*store.deliveries({shown}), SizeIs(1));
 }
 
-TEST_F(NotificationStoreTest, KeepsTheLatestHundredDelivered) {
-  NotificationStore store(file, log);
-  for (int i = 0; i < 103; ++i)
-    static_cast<void>(store.addDelivered({.title = std::to_string(i)}, start + i * 1s));
-  const auto delivered = store.delivered();
+TEST_F(NotificationStoreTest, KeepsTheLatestHundredDeliveredAndAllThatAreToBeShown) {
+  NotificationStore store = open();
+  for (int i = 0; i < 103; ++i) {
+    EXPECT_FALSE(store.makeDue({.title = std::to_string(i)}, start + i * 1s));
+    EXPECT_FALSE(store.decideDue({{only(store, due).number, i < 2}}));
+  }
+  const auto delivered = *store.deliveries({hidden});
   ASSERT_THAT(delivered, SizeIs(100));
-  EXPECT_EQ(delivered.front().notification.title, "102");
-  EXPECT_EQ(delivered.back().notification.title, "3");
+  EXPECT_EQ(delivered.front().schedule.notification.title, "102");
+  EXPECT_EQ(delivered.back().schedule.notification.title, "3");
+  EXPECT_THAT(*store.deliveries({toShow}), SizeIs(2));
 }
 
 }  // namespace

@@ -1,12 +1,18 @@
 // SPDX-License-Identifier: MIT
-#include <Varnel/Platform/Generic/NotificationStore.h>
 #include <Varnel/Platform/Generic/ScheduledNotificationCenter.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <functional>
+#include <memory>
+#include <optional>
+
 #include <Tests/Support/TemporaryFolder.h>
 #include <Tests/Support/Zones.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/PrivateFiles.h>
+#include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Platform/Testing/FakeMainQueue.h>
 #include <Varnel/Platform/Testing/FakeNotificationServer.h>
@@ -41,17 +47,39 @@ class Listener final : public UserNotificationCenterDelegate {
 
 // A process of the product, on the store that all share.
 struct Process {
-  explicit Process(const std::filesystem::path& file, Date now)
-      : clock(now), center({clock, locale, zones, queue, log, server, timer}, file) {}
+  using Desktop = std::shared_ptr<Testing::FakeNotificationServer>;
+
+  Process(const std::filesystem::path& file, Date now,
+          Desktop shared = std::make_shared<Testing::FakeNotificationServer>())
+      : clock(now),
+        desktop(std::move(shared)),
+        center({clock, locale, zones, queue, *files, log, server, timer}, file.string()) {}
 
   void listen() { center.setDelegate(listener); }
+  void schedule(const UserNotification& notification) {
+    EXPECT_EQ(textOf(center.scheduleNotification(notification)), "");
+  }
+  void deliver(const UserNotification& notification) {
+    EXPECT_EQ(textOf(center.deliverNotification(notification)), "");
+  }
+  [[nodiscard]] std::vector<UserNotification> scheduled() {
+    return center.scheduledNotifications().valueOr({});
+  }
+  [[nodiscard]] std::vector<UserNotification> delivered() {
+    return center.deliveredNotifications().valueOr({});
+  }
+  static std::string textOf(const std::optional<PlatformError>& error) {
+    return error ? error->localizedDescription() : "";
+  }
 
   Testing::SimulatedClock clock;
   Testing::FakeUserLocale locale;
   Testing::FakeTimeZones zones = Tests::zonesOf2026();
   Testing::FakeMainQueue queue;
+  const std::unique_ptr<PrivateFiles> files = POSIX::makePrivateFiles();
   Testing::CapturedSystemLog log;
-  Testing::FakeNotificationServer server;
+  const Desktop desktop;  ///< It outlives the process.
+  Testing::FakeNotificationServer& server = *desktop;
   Testing::FakeWallClockTimer timer{clock};
   ScheduledNotificationCenter center;
   const std::shared_ptr<Listener> listener = std::make_shared<Listener>();
@@ -68,7 +96,7 @@ class ScheduledNotificationCenterTest : public ::testing::Test {
             .deliveryDate = first,
             .deliveryRepeatInterval = DateComponents{.day = 7}};
   }
-  static constexpr const char* token = "identifier weekly";
+  static constexpr const char* title = "Week";
 
   const Tests::TemporaryFolder folder;
   const std::filesystem::path file = folder.path() / "store.sqlite";
@@ -78,21 +106,21 @@ class ScheduledNotificationCenterTest : public ::testing::Test {
 TEST_F(ScheduledNotificationCenterTest, AYearAwakeDeliversEveryWeek) {
   process.zones.local = "Europe/Berlin";
   process.listen();
-  process.center.scheduleNotification(weekly());
+  process.schedule(weekly());
   process.timer.advanceTo(start + days(364));
   EXPECT_THAT(process.server.history(), SizeIs(52));
-  EXPECT_THAT(process.center.deliveredNotifications(), SizeIs(1));
-  EXPECT_THAT(process.center.scheduledNotifications(), SizeIs(1));
+  EXPECT_THAT(process.delivered(), SizeIs(1));
+  EXPECT_THAT(process.scheduled(), SizeIs(1));
   process.queue.drain();
   EXPECT_THAT(process.listener->events, SizeIs(52));
   EXPECT_EQ(
-      process.server.banners().at(token),
+      process.server.banners().at(title),
       (Banner{.title = "Week", .text = "Text", .actionTitle = "Do", .dismissTitle = "Later"}));
 }
 
 TEST_F(ScheduledNotificationCenterTest, AClockSetBackDeliversNothingTwice) {
   process.listen();
-  process.center.scheduleNotification(weekly());
+  process.schedule(weekly());
   process.timer.advanceTo(start + 2 * week);
   process.timer.setClock(start + week - 1h);
   process.timer.advanceTo(start + 3 * week - 1s);
@@ -104,20 +132,20 @@ TEST_F(ScheduledNotificationCenterTest, AClockSetBackDeliversNothingTwice) {
 TEST_F(ScheduledNotificationCenterTest, AMoveToAnotherZoneKeepsTheTimeOfDay) {
   process.zones.local = "Europe/Berlin";
   process.listen();
-  process.center.scheduleNotification(weekly());
+  process.schedule(weekly());
   process.zones.local = "Asia/Tokyo";
   process.center.recheck();
   EXPECT_EQ(process.timer.armedDate(), start + week - 8h);
-  EXPECT_EQ(process.center.scheduledNotifications().at(0).deliveryDate, start + week - 8h);
+  EXPECT_EQ(process.scheduled().at(0).deliveryDate, start + week - 8h);
 }
 
 TEST_F(ScheduledNotificationCenterTest, WhatCameDueBeforeTheLaunchIsDeliveredOnceToTheDelegate) {
-  process.center.scheduleNotification(weekly());
+  process.schedule(weekly());
   Process next(file, start + 5 * week + 1h);
-  EXPECT_THAT(next.center.deliveredNotifications(), IsEmpty());
+  EXPECT_THAT(next.delivered(), IsEmpty());
   EXPECT_EQ(next.timer.armedDate(), std::nullopt);
   next.listen();
-  EXPECT_THAT(next.center.deliveredNotifications(), SizeIs(1));
+  EXPECT_THAT(next.delivered(), SizeIs(1));
   EXPECT_THAT(next.server.history(), SizeIs(1));
   // The delegate's own subscribers come after it.
   EXPECT_THAT(next.listener->events, IsEmpty());
@@ -131,7 +159,7 @@ TEST_F(ScheduledNotificationCenterTest, TwoProcessesNeverDeliverTheSame) {
   Process other(file, start);
   process.listen();
   other.listen();
-  process.center.scheduleNotification(weekly());
+  process.schedule(weekly());
   other.center.recheck();  // What the watch on the store does.
   ASSERT_EQ(other.timer.armedDate(), start + week);
   for (int i = 1; i <= 10; ++i) {
@@ -145,103 +173,215 @@ TEST_F(ScheduledNotificationCenterTest, TwoProcessesNeverDeliverTheSame) {
 
 TEST_F(ScheduledNotificationCenterTest, ClicksComeBackOnceAndDismissalLeavesTheList) {
   process.listen();
-  process.center.scheduleNotification(weekly());
+  process.schedule(weekly());
   process.timer.advanceTo(start + week);
   process.server.report();
-  process.server.activate(token);
-  process.server.activate(token);
+  process.server.activate(title);
+  process.server.activate(title);
   process.queue.drain();
   EXPECT_THAT(process.listener->events, ElementsAre("activated Week", "delivered Week"));
-  EXPECT_THAT(process.center.deliveredNotifications(), SizeIs(1));
+  EXPECT_THAT(process.delivered(), SizeIs(1));
 
   process.timer.advanceTo(start + 2 * week);
-  process.server.dismiss(token);
-  EXPECT_THAT(process.center.deliveredNotifications(), IsEmpty());
-  EXPECT_THAT(process.center.scheduledNotifications(), SizeIs(1));
+  process.server.dismiss(title);
+  EXPECT_THAT(process.delivered(), IsEmpty());
+  EXPECT_THAT(process.scheduled(), SizeIs(1));
 }
 
-TEST_F(ScheduledNotificationCenterTest, ALaterRunTakesTheBannerOfAnEarlierOneAway) {
-  process.listen();
-  process.center.scheduleNotification(weekly());
-  process.timer.advanceTo(start + week);
-  process.server.report();
-  // The desktop outlives the process.
-  Process next(file, start + week + 1h);
-  const auto delivered = next.center.deliveredNotifications();
-  ASSERT_THAT(delivered, SizeIs(1));
-  ASSERT_THAT(process.server.banners(), SizeIs(1));
-  NotificationStore store(file, process.log);
-  ASSERT_EQ(store.delivered().at(0).bannerReference, "1");
+TEST_F(ScheduledNotificationCenterTest, ANewDeliveryTakesThePlaceOfTheBannerOfAnEarlierRun) {
+  std::optional<Process> run(std::in_place, file, start);
+  run->listen();
+  run->schedule(weekly());
+  run->timer.advanceTo(start + week);
+  run->server.report();
+  const auto desktop = run->desktop;
+  run.emplace(file, start + week + 1h, desktop);
+  run->listen();
   // Its successor takes the place only when it comes.
-  process.center.scheduleNotification(weekly(start + 3 * week));
-  EXPECT_THAT(process.center.deliveredNotifications(), SizeIs(1));
-  EXPECT_THAT(process.server.banners(), SizeIs(1));
-  process.timer.advanceTo(start + 3 * week);
-  EXPECT_THAT(process.center.deliveredNotifications(), SizeIs(1));
-  EXPECT_THAT(process.server.history(), SizeIs(2));
-  process.center.removeDeliveredNotification(weekly());
-  EXPECT_THAT(process.server.banners(), IsEmpty());
+  run->schedule(weekly(start + 3 * week));
+  EXPECT_THAT(run->delivered(), SizeIs(1));
+  run->timer.advanceTo(start + 3 * week);
+  run->server.report();
+  EXPECT_THAT(run->delivered(), SizeIs(1));
+  EXPECT_THAT(run->server.history(), SizeIs(2));
+  EXPECT_EQ(run->server.count(), 1u);
+  // A process that only plans takes the banner away as well.
+  Process planner(file, start + 3 * week, desktop);
+  EXPECT_FALSE(planner.center.removeDeliveredNotification(weekly()));
+  planner.server.report();
+  EXPECT_EQ(planner.server.count(), 0u);
+  EXPECT_EQ(run->log.text(), "");
 }
 
-TEST_F(ScheduledNotificationCenterTest, NotPresentedMeansListedAndToldAllTheSame) {
-  process.listener->presents = false;
+TEST_F(ScheduledNotificationCenterTest, ADeliveryWhileTheLastIsOnItsWayLeavesOneBanner) {
   process.listen();
-  process.center.deliverNotification(weekly());
+  for (int i = 0; i < 3; ++i) process.deliver(weekly());
+  process.server.report();
+  EXPECT_EQ(process.server.count(), 1u);
+  process.deliver(weekly());
+  EXPECT_FALSE(process.center.removeDeliveredNotification(weekly()));
+  process.server.report();
+  EXPECT_EQ(process.server.count(), 0u);
+  EXPECT_THAT(process.delivered(), IsEmpty());
+  EXPECT_FALSE(process.center.isBusy());
+}
+
+TEST_F(ScheduledNotificationCenterTest, NotPresentedMeansListedAndToldAllTheSameButNeverShown) {
+  process.listen();
+  process.deliver(weekly());
+  process.server.report();
   process.queue.drain();
-  EXPECT_THAT(process.server.history(), IsEmpty());
+  process.listener->events.clear();
+  process.listener->presents = false;
+  process.deliver(weekly());
+  process.queue.drain();
+  EXPECT_EQ(process.server.count(), 0u);  // The banner that it would have replaced.
   EXPECT_THAT(process.listener->events, ElementsAre("delivered Week"));
-  EXPECT_THAT(process.center.deliveredNotifications(), SizeIs(1));
+  EXPECT_THAT(process.delivered(), SizeIs(1));
+  process.server.report();
+  process.listener->presents = true;
+  process.server.appear();
+  EXPECT_THAT(process.server.history(), SizeIs(1));
 }
 
-TEST_F(ScheduledNotificationCenterTest, AMissingServerOrAGoneDelegateLosesNoSchedule) {
-  process.server.isPresent = false;
+TEST_F(ScheduledNotificationCenterTest, WithoutADelegateWhatIsDueWaits) {
   process.listen();
-  process.center.scheduleNotification(weekly());
-  process.timer.advanceTo(start + week);
-  EXPECT_THAT(process.center.deliveredNotifications(), SizeIs(1));
-  process.server.isPresent = true;
-  process.timer.advanceTo(start + 2 * week);
-  EXPECT_THAT(process.server.banners(), SizeIs(1));
-
+  process.schedule(weekly());
   process.center.setDelegate({});
   EXPECT_EQ(process.timer.armedDate(), std::nullopt);
-  process.clock.set(start + 3 * week);
+  process.clock.set(start + week);
   process.center.recheck();
-  EXPECT_THAT(process.server.history(), SizeIs(1));
+  EXPECT_THAT(process.server.history(), IsEmpty());
   process.listen();
-  EXPECT_THAT(process.server.history(), SizeIs(2));
+  EXPECT_THAT(process.server.history(), SizeIs(1));
 }
 
-TEST_F(ScheduledNotificationCenterTest, AStoreThatIsLockedWhenTheTimeComesDelaysTheDelivery) {
+// A banner that was promised comes, once, whatever became of the first try.
+TEST_F(ScheduledNotificationCenterTest, ABannerThatDidNotComeIsShownLater) {
+  const struct {
+    const char* name;
+    std::function<void(Testing::FakeNotificationServer&)> fail, mend;
+    bool isRetriedByTime;  ///< Otherwise the server's appearance is enough.
+  } rows[] = {
+      {"no server", [](auto& server) { server.isPresent = false; },
+       [](auto& server) { server.appear(); }, false},
+      {"an error as the answer", [](auto& server) { server.refuses = true; },
+       [](auto& server) { server.refuses = false; }, true},
+  };
+  for (const auto& row : rows)
+    for (const bool isNextRun : {false, true}) {
+      const Tests::TemporaryFolder own;
+      std::optional<Process> run(std::in_place, own.path() / "store.sqlite", start);
+      row.fail(run->server);
+      run->listen();
+      run->schedule(weekly());
+      run->timer.advanceTo(start + week);
+      run->server.report();
+      EXPECT_THAT(run->delivered(), SizeIs(1)) << row.name;
+      // The pauses grow.
+      run->timer.advanceTo(start + week + 1h);
+      run->server.report();
+      if (isNextRun) {
+        run.emplace(own.path() / "store.sqlite", start + week + 1h);
+        run->listen();
+      } else {
+        row.mend(run->server);
+        if (row.isRetriedByTime)
+          run->timer.advanceTo(start + week + 1h + ScheduledNotificationCenter::maxPause);
+      }
+      run->server.report();
+      EXPECT_THAT(run->server.history(), SizeIs(1)) << row.name << isNextRun;
+      run->timer.advanceTo(start + week + 3h);
+      run->server.report();
+      EXPECT_THAT(run->server.history(), SizeIs(1)) << row.name << isNextRun;
+      EXPECT_EQ(run->timer.armedDate(), start + 2 * week) << row.name << isNextRun;
+    }
+}
+
+TEST_F(ScheduledNotificationCenterTest, AHostThatEndsBeforeTheServerHasAnsweredShowsItAgain) {
+  std::optional<Process> run(std::in_place, file, start);
+  run->listen();
+  run->deliver(weekly());
+  ASSERT_THAT(run->server.history(), SizeIs(1));  // And no report: the server hangs.
+  run.emplace(file, start + 1min);
+  run->listen();
+  EXPECT_THAT(run->server.history(), SizeIs(1));
+  run->server.report();
+  // What was shown and expired, or lost its server, is not shown again.
+  run->server.disappear();
+  run->server.appear();
+  run->server.report();
+  EXPECT_THAT(run->server.history(), SizeIs(1));
+  EXPECT_THAT(run->delivered(), SizeIs(1));
+}
+
+// The store is at fault when the banner is up: that is noted later, and no banner comes twice.
+TEST_F(ScheduledNotificationCenterTest, WhatCannotBeNotedIsNotedLater) {
   process.listen();
-  process.center.scheduleNotification(weekly());
+  process.deliver(weekly());
   auto holder = SQLiteDatabase::open(file.string());
   ASSERT_FALSE(holder->execute("BEGIN EXCLUSIVE"));
-  process.timer.advanceTo(start + week);
-  EXPECT_THAT(process.server.history(), IsEmpty());
+  process.server.report();
+  process.server.dismiss(title);
+  process.timer.advanceTo(start + 10s);
   ASSERT_FALSE(holder->execute("COMMIT"));
-  process.timer.advanceTo(start + week + 1min);
+  process.timer.advanceTo(start + 10min);
+  process.server.report();
   EXPECT_THAT(process.server.history(), SizeIs(1));
-  EXPECT_EQ(process.timer.armedDate(), start + 2 * week);
+  EXPECT_THAT(process.delivered(), IsEmpty());
+}
+
+TEST_F(ScheduledNotificationCenterTest, AnotherProcessTakesOverWhenTheDelivererEnds) {
+  std::optional<Process> first(std::in_place, file, start);
+  first->listen();
+  first->deliver(weekly());  // Its banner has yet to come.
+  process.clock.set(start);
+  process.listen();
+  EXPECT_THAT(process.server.history(), IsEmpty());
+  first.reset();
+  process.timer.advanceTo(start + ScheduledNotificationCenter::maxPause);
+  EXPECT_THAT(process.server.history(), SizeIs(1));
+}
+
+TEST_F(ScheduledNotificationCenterTest, CallsTogetherAreDoneAsOneAndNothingIsShownBefore) {
+  process.listen();
+  process.schedule(weekly());
+  const auto fails = [&](bool isFailing) {
+    return process.center.change([&]() -> UserNotificationCenter::Failure {
+      EXPECT_FALSE(process.center.removeScheduledNotification(weekly()));
+      EXPECT_THAT(process.scheduled(), IsEmpty());
+      EXPECT_FALSE(process.center.deliverNotification({.title = "Now"}));
+      EXPECT_THAT(process.server.history(), IsEmpty());
+      if (isFailing) return PlatformError("Test", 1);
+      return std::nullopt;
+    });
+  };
+  EXPECT_TRUE(fails(true));
+  EXPECT_THAT(process.scheduled(), ElementsAre(weekly()));
+  EXPECT_THAT(process.server.history(), IsEmpty());
+  EXPECT_FALSE(fails(false));
+  EXPECT_THAT(process.scheduled(), IsEmpty());
+  EXPECT_THAT(process.server.history(), SizeIs(1));
 }
 
 TEST_F(ScheduledNotificationCenterTest, AnIdentifierStandsForOneNotificationOfEachList) {
   process.listen();
-  process.center.scheduleNotification(weekly());
+  process.schedule(weekly());
   auto again = weekly(start + 1h);
   again.title = "Again";
-  process.center.scheduleNotification(again);
-  process.center.scheduleNotification({.title = "One", .deliveryDate = start + 2h});
-  process.center.scheduleNotification({.title = "Two", .deliveryDate = start + 2h});
-  const auto scheduled = process.center.scheduledNotifications();
+  process.schedule(again);
+  process.schedule({.title = "One", .deliveryDate = start + 2h});
+  process.schedule({.title = "Two", .deliveryDate = start + 2h});
+  const auto scheduled = process.scheduled();
   ASSERT_THAT(scheduled, SizeIs(3));
   EXPECT_EQ(scheduled.at(0), again);
-  process.center.removeScheduledNotification({.title = "One", .deliveryDate = start + 2h});
-  EXPECT_THAT(process.center.scheduledNotifications(), SizeIs(2));
-  process.center.removeScheduledNotification({.identifier = "weekly"});
-  EXPECT_THAT(process.center.scheduledNotifications(), SizeIs(1));
+  EXPECT_FALSE(
+      process.center.removeScheduledNotification({.title = "One", .deliveryDate = start + 2h}));
+  EXPECT_THAT(process.scheduled(), SizeIs(2));
+  EXPECT_FALSE(process.center.removeScheduledNotification({.identifier = "weekly"}));
+  EXPECT_THAT(process.scheduled(), SizeIs(1));
   // Without a date, or with one that is past, it is due at once.
-  process.center.scheduleNotification({.identifier = "now", .title = "Now"});
+  process.schedule({.identifier = "now", .title = "Now"});
   EXPECT_THAT(process.server.history(), SizeIs(1));
 }
 

@@ -37,7 +37,7 @@ class SchedulerServiceTest : public ::testing::Test {
   SchedulerServiceTest() { module->setBundle(Bundle(VARNEL_TEST_RESOURCES, {"en"})); }
 
   [[nodiscard]] UserNotification onlyScheduled() {
-    const auto scheduled = center.scheduledNotifications();
+    const auto scheduled = *center.scheduledNotifications();
     EXPECT_THAT(scheduled, SizeIs(1));
     return scheduled.empty() ? UserNotification() : scheduled.front();
   }
@@ -64,11 +64,12 @@ class SchedulerServiceTest : public ::testing::Test {
 };
 
 TEST_F(SchedulerServiceTest, StartsWithNeverAndTouchesNothing) {
-  center.scheduleNotification({.identifier = "old", .deliveryRepeatInterval = {{.day = 7}}});
+  EXPECT_FALSE(
+      center.scheduleNotification({.identifier = "old", .deliveryRepeatInterval = {{.day = 7}}}));
   EXPECT_EQ(service.schedulePeriod(), SchedulePeriodOption::never);
-  EXPECT_THAT(center.scheduledNotifications(), SizeIs(1));
+  EXPECT_THAT(*center.scheduledNotifications(), SizeIs(1));
   service.scheduleCleanReminder();
-  EXPECT_THAT(center.scheduledNotifications(), IsEmpty());
+  EXPECT_THAT(*center.scheduledNotifications(), IsEmpty());
 }
 
 TEST_F(SchedulerServiceTest, ASettingPlansTheReminderAFullPeriodAhead) {
@@ -87,7 +88,7 @@ TEST_F(SchedulerServiceTest, ASettingPlansTheReminderAFullPeriodAhead) {
   service.setSchedulePeriod(SchedulePeriodOption::monthly);
   EXPECT_EQ(onlyScheduled().deliveryDate, sys_days(2026y / April / 21) + 9h + 41min);
   service.setSchedulePeriod(SchedulePeriodOption::never);
-  EXPECT_THAT(center.scheduledNotifications(), IsEmpty());
+  EXPECT_THAT(*center.scheduledNotifications(), IsEmpty());
 }
 
 TEST_F(SchedulerServiceTest, NamesSizesFromTwoBillionBytesOn) {
@@ -115,8 +116,8 @@ TEST_F(SchedulerServiceTest, AnotherPeriodKeepsTheTextsOfTheFirstRepeatingNotifi
 
   // Texts that are missing are made up for; the default name is replaced wherever it stands.
   service.setSchedulePeriod(SchedulePeriodOption::never);
-  center.scheduleNotification(
-      {.title = "Orvane 2, Orvane 2!", .deliveryRepeatInterval = {{.day = 1}}});
+  EXPECT_FALSE(center.scheduleNotification(
+      {.title = "Orvane 2, Orvane 2!", .deliveryRepeatInterval = {{.day = 1}}}));
   service.setSchedulePeriod(SchedulePeriodOption::weekly);
   EXPECT_EQ(onlyScheduled().title, "Another 3, Another 3!");
   EXPECT_EQ(onlyScheduled().informativeText,
@@ -127,12 +128,69 @@ TEST_F(SchedulerServiceTest, SweepsEveryRepeatingNotificationAndNoOther) {
   const UserNotification once{.identifier = "once"};
   const UserNotification host{.identifier = "host", .deliveryRepeatInterval = {{.hour = 1}}};
   for (const auto& each : {once, host}) {
-    center.scheduleNotification(each);
-    center.deliverNotification(each);
+    EXPECT_FALSE(center.scheduleNotification(each));
+    EXPECT_FALSE(center.deliverNotification(each));
   }
   service.setSchedulePeriod(SchedulePeriodOption::weekly);
-  EXPECT_THAT(center.deliveredNotifications(), testing::ElementsAre(once));
-  EXPECT_THAT(center.scheduledNotifications(), SizeIs(2));
+  EXPECT_THAT(*center.deliveredNotifications(), testing::ElementsAre(once));
+  EXPECT_THAT(*center.scheduledNotifications(), SizeIs(2));
+}
+
+// Whichever call fails: the old reminder or the new one, with the texts and the date that were
+// asked for first.
+TEST_F(SchedulerServiceTest, AFailedPlanChangesNothingAndIsMadeLater) {
+  service.setSchedulePeriod(SchedulePeriodOption::annually);
+  const UserNotification old = onlyScheduled();
+  EXPECT_FALSE(center.deliverNotification(old));
+  constexpr int callCount = 6;  // Two lists, two removals, the schedule; the last fails no more.
+  for (int calls = 0; calls < callCount; ++calls) {
+    SCOPED_TRACE(calls);
+    center.callsLeft = calls;
+    service.scheduleCleanReminder(2'500'000'000);
+    center.callsLeft.reset();
+    if (calls == callCount - 1) break;
+    ASSERT_TRUE(service.failure());
+    EXPECT_EQ(service.failure()->localizedDescription(), "No space left on device");
+    EXPECT_EQ(onlyScheduled(), old);
+    EXPECT_THAT(*center.deliveredNotifications(), SizeIs(1));
+  }
+  EXPECT_FALSE(service.failure());
+  EXPECT_EQ(onlyScheduled().deliveryRepeatInterval, (Platform::DateComponents{.year = 1}));
+
+  center.callsLeft = 0;
+  service.scheduleCleanReminder(3'500'000'000);
+  service.setSchedulePeriod(SchedulePeriodOption::weekly);  // Takes its place, not its texts.
+  clock.advance(1h);
+  center.retry();
+  EXPECT_EQ(center.retryCount(), 1u);
+  center.callsLeft.reset();
+  center.retry();
+  EXPECT_FALSE(service.failure());
+  EXPECT_THAT(*onlyScheduled().informativeText, HasSubstr(" 3.5 GB "));
+  EXPECT_EQ(onlyScheduled().deliveryDate, now + days(7));
+  const UserNotification made = onlyScheduled();
+  center.retry();
+  EXPECT_EQ(onlyScheduled(), made);
+}
+
+TEST_F(SchedulerServiceTest, AClickThatCannotBeNotedIsNotedLaterAndRetriesEndWithTheService) {
+  service.setSchedulePeriod(SchedulePeriodOption::weekly);
+  EXPECT_FALSE(center.deliverNotification(onlyScheduled()));
+  center.callsLeft = 0;
+  center.activate(center.presented.front());
+  queue.drain();
+  center.callsLeft.reset();
+  center.retry();
+  EXPECT_THAT(*center.deliveredNotifications(), IsEmpty());
+  {
+    SchedulerService brief({clock, locale, zones, queue, facts, module},
+                           std::make_shared<Tallyhouse::AnalyticsTracker>(sent), router);
+    center.callsLeft = 0;
+    brief.setSchedulePeriod(SchedulePeriodOption::never);
+    center.callsLeft.reset();
+  }
+  center.retry();
+  EXPECT_THAT(*center.scheduledNotifications(), SizeIs(1));
 }
 
 TEST_F(SchedulerServiceTest, AClickIsReportedOnceAndTakesTheBannerAwayNotTheRepetition) {
@@ -140,7 +198,7 @@ TEST_F(SchedulerServiceTest, AClickIsReportedOnceAndTakesTheBannerAwayNotTheRepe
   CustomDimensionsHolder::setDownloadSourceURL(std::nullopt);
   service.setSchedulePeriod(SchedulePeriodOption::weekly);
   const UserNotification reminder = onlyScheduled();
-  center.deliverNotification(reminder);
+  EXPECT_FALSE(center.deliverNotification(reminder));
   queue.drain();
   EXPECT_THAT(sent->events(), IsEmpty());
 
@@ -152,7 +210,7 @@ TEST_F(SchedulerServiceTest, AClickIsReportedOnceAndTakesTheBannerAwayNotTheRepe
   EXPECT_EQ(event.action, "Notification Clicked");
   EXPECT_EQ(event.label, "09:41");
   EXPECT_EQ(event.value, std::nullopt);
-  EXPECT_THAT(center.deliveredNotifications(), IsEmpty());
+  EXPECT_THAT(*center.deliveredNotifications(), IsEmpty());
   EXPECT_EQ(onlyScheduled(), reminder);
 
   router.handleLaunch(reminder);

@@ -43,7 +43,7 @@ TEST_F(UserNotificationRouterTest, ReachesAllHandlersOfTheIdentifierInTheirOrder
   router.register_("b", note("other"));
   router.register_("a", note("second"));
   EXPECT_EQ(router.channel("a"), router.channel("a"));
-  center.deliverNotification(notification);
+  EXPECT_FALSE(center.deliverNotification(notification));
   center.activate(notification);
   router.handleLaunch(notification);
   EXPECT_THAT(events, IsEmpty());
@@ -101,27 +101,29 @@ TEST_F(UserNotificationRouterTest, ASubscriptionEndsWithItsContextAlsoForEventsO
 }
 
 TEST_F(UserNotificationRouterTest, ShowsBannersOnlyWhileTheUserIsElsewhere) {
-  center.deliverNotification(notification);
+  EXPECT_FALSE(center.deliverNotification(notification));
   application.setActive(true);
-  center.deliverNotification(notification);
+  EXPECT_FALSE(center.deliverNotification(notification));
   EXPECT_THAT(center.presented, SizeIs(1));
   application.setActive(false);
-  center.deliverNotification(notification);
+  EXPECT_FALSE(center.deliverNotification(notification));
   EXPECT_THAT(center.presented, SizeIs(2));
 }
 
 TEST_F(UserNotificationRouterTest, BothRemovalsTakeTheirCandidatesFromTheDeliveredList) {
   const UserNotification other{.identifier = "b"};
-  for (const auto& each : {notification, other}) center.scheduleNotification(each);
-  router.removeScheduledNotifications("a");
-  EXPECT_THAT(center.scheduledNotifications(), SizeIs(2));
-  for (const auto& each : {notification, other}) center.deliverNotification(each);
-  router.removeScheduledNotifications("a");
-  EXPECT_THAT(center.scheduledNotifications(), ElementsAre(other));
-  EXPECT_THAT(center.deliveredNotifications(), SizeIs(2));
-  router.removeDeliveredNotifications("a");
-  EXPECT_THAT(center.deliveredNotifications(), ElementsAre(other));
-  EXPECT_THAT(center.scheduledNotifications(), ElementsAre(other));
+  for (const auto& each : {notification, other}) EXPECT_FALSE(center.scheduleNotification(each));
+  EXPECT_FALSE(router.removeScheduledNotifications("a"));
+  EXPECT_THAT(*center.scheduledNotifications(), SizeIs(2));
+  for (const auto& each : {notification, other}) EXPECT_FALSE(center.deliverNotification(each));
+  EXPECT_FALSE(router.removeScheduledNotifications("a"));
+  EXPECT_THAT(*center.scheduledNotifications(), ElementsAre(other));
+  EXPECT_THAT(*center.deliveredNotifications(), SizeIs(2));
+  EXPECT_FALSE(router.removeDeliveredNotifications("a"));
+  EXPECT_THAT(*center.deliveredNotifications(), ElementsAre(other));
+  EXPECT_THAT(*center.scheduledNotifications(), ElementsAre(other));
+  center.callsLeft = 1;
+  EXPECT_TRUE(router.removeDeliveredNotifications("b"));
 }
 
 TEST_F(UserNotificationRouterTest, IsHeldWeakly) {
@@ -130,7 +132,7 @@ TEST_F(UserNotificationRouterTest, IsHeldWeakly) {
     EXPECT_TRUE(center.delegate());
   }
   EXPECT_FALSE(center.delegate());
-  center.deliverNotification(notification);
+  EXPECT_FALSE(center.deliverNotification(notification));
   EXPECT_THAT(center.presented, IsEmpty());
 }
 

@@ -25,9 +25,9 @@ class Center final {
   Center(const NotificationPorts& ports, const NotificationSource& source, const fs::path& store)
       : server_(makeNotificationServer(ports.systemLog, source)),
         timer_(makeWallClockTimer(ports.systemLog)),
-        center_({ports.clock, ports.userLocale, ports.timeZones, ports.mainQueue, ports.systemLog,
-                 *server_, *timer_},
-                store),
+        center_({ports.clock, ports.userLocale, ports.timeZones, ports.mainQueue,
+                 ports.privateFiles, ports.systemLog, *server_, *timer_},
+                store.string()),
         storeWatch_(store.parent_path(), store.filename(), [this] { center_.recheck(); }),
         zoneWatch_("/etc", "localtime", [this] { center_.recheck(); }) {}
 

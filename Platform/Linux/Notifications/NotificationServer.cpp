@@ -2,9 +2,11 @@
 #include <Varnel/Platform/Ports/NotificationServer.h>
 
 #include <cstdint>
+#include <functional>
 #include <map>
 #include <string_view>
 #include <utility>
+#include <vector>
 
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
@@ -29,19 +31,18 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
 
   void show(const std::string& token, const Banner& banner,
             const std::optional<std::string>& replacedReference) {
-    Shown& shown = shown_[token];
-    if (!shown.address && replacedReference)
-      shown.address = BannerAddress::parse(*replacedReference);
-    shown.version = ++lastVersion_;
-    bus_->connect([weak = weak_from_this(), key = Key{token, shown.version},
-                   banner](const std::string& error) {
+    const auto replaced =
+        replacedReference ? BannerAddress::parse(*replacedReference) : std::nullopt;
+    if (replaced) take(*replaced);
+    shown_.insert_or_assign(token, std::nullopt);
+    bus_->connect([weak = weak_from_this(), token, banner, replaced](const std::string& error) {
       const auto self = weak.lock();
-      if (!self || !self->isCurrent(key)) return;
-      if (!error.empty()) return self->fail(key, error);
+      if (!self || !self->shown_.contains(token)) return;
+      if (!error.empty()) return self->fail(token, error);
       // Asked each time, because another server may have taken its place.
-      self->send(capabilitiesRequest(), key,
-                 [banner](Desktop& desktop, GDBusMessage* reply, const Key& asked) {
-                   desktop.notify(asked, banner, g_dbus_message_get_sender(reply),
+      self->send(capabilitiesRequest(), token, SessionBus::Waiting::limited,
+                 [token, banner, replaced](Desktop& desktop, GDBusMessage* reply) {
+                   desktop.notify(token, banner, replaced, g_dbus_message_get_sender(reply),
                                   capabilitiesIn(reply));
                  });
     });
@@ -49,75 +50,94 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
 
   void close(const std::string& token, const std::optional<std::string>& reference) {
     auto address = reference ? BannerAddress::parse(*reference) : std::nullopt;
-    if (const auto shown = shown_.extract(token); shown && shown.mapped().address)
-      address = shown.mapped().address;
-    if (!address) return;
-    bus_->connect([weak = weak_from_this(), address](const std::string& error) {
+    if (const auto shown = shown_.extract(token); shown && shown.mapped())
+      address = *shown.mapped();
+    bus_->connect([weak = weak_from_this(), token, address](const std::string& error) {
       const auto self = weak.lock();
-      if (self && error.empty() && address->bus == self->bus_->name()) self->close(*address);
+      if (!self) return;
+      // The server of another session has gone with its banners. A question takes as long as a
+      // closing does, so that the answer never comes too early.
+      if (!error.empty()) return self->tell(&NotificationServer::Observer::bannerFailed, token);
+      const bool isHere = address && address->bus == self->bus_->name();
+      self->bus_->send(isHere ? closeRequest(*address) : capabilitiesRequest(),
+                       SessionBus::Waiting::limited,
+                       [weak, token](GDBusMessage*, const std::string&) {
+                         // Whatever the server says: it does not matter whether it was still there.
+                         if (const auto asked = weak.lock())
+                           asked->tell(&NotificationServer::Observer::bannerGone, token);
+                       });
+    });
+  }
+
+  void check(std::function<void(const std::optional<PlatformError>&)> answer) {
+    const auto tell = [answer = std::move(answer)](const std::string& error) {
+      if (error.empty()) return answer(std::nullopt);
+      answer(PlatformError(notificationService, 0,
+                           {{std::string(localizedDescriptionKey), error}}));
+    };
+    bus_->connect([weak = weak_from_this(), tell](const std::string& error) {
+      const auto self = weak.lock();
+      if (!self) return;
+      if (!error.empty()) return tell(error);
+      self->bus_->send(capabilitiesRequest(), SessionBus::Waiting::limited,
+                       [tell](GDBusMessage*, const std::string& refusal) { tell(refusal); });
     });
   }
 
   bool isBusy() const { return bus_->isBusy(); }
 
  private:
-  struct Shown {
-    std::optional<BannerAddress> address;
-    std::uint64_t version = 0;  ///< Tells the latest banner of a token from earlier ones.
-  };
-  struct Key {
-    std::string token;
-    std::uint64_t version;
-  };
+  using Event = void (NotificationServer::Observer::*)(const std::string& token);
 
-  bool isCurrent(const Key& key) const {
-    const auto shown = shown_.find(key.token);
-    return shown != shown_.end() && shown->second.version == key.version;
+  void tell(Event event, const std::string& token) const {
+    if (const auto told = observer.lock()) ((*told).*event)(token);
   }
 
   template <typename Use>
-  void send(const BusMessage& message, const Key& key, Use use) {
-    bus_->send(message,
-               [weak = weak_from_this(), key, use](GDBusMessage* reply, const std::string& error) {
+  void send(const BusMessage& message, const std::string& token, SessionBus::Waiting waiting,
+            Use use) {
+    bus_->send(message, waiting,
+               [weak = weak_from_this(), token, use](GDBusMessage* reply,
+                                                     const std::string& error) {
                  const auto self = weak.lock();
                  if (!self) return;
-                 reply ? use(*self, reply, key) : self->fail(key, error);
+                 reply ? use(*self, reply) : self->fail(token, error);
                });
   }
 
-  // It does not matter whether the banner was still there.
-  void close(const BannerAddress& address) {
-    bus_->send(closeRequest(address), [](GDBusMessage*, const std::string&) {});
+  void fail(const std::string& token, const std::string& error) {
+    // Said once, not at each new try.
+    if (error != std::exchange(lastError_, error))
+      systemLog_.write("Cannot show a notification: " + error);
+    if (shown_.erase(token) > 0) tell(&NotificationServer::Observer::bannerFailed, token);
   }
 
-  void fail(const Key& key, const std::string& error) {
-    systemLog_.write("Cannot show a notification: " + error);
-    if (isCurrent(key)) shown_.erase(key.token);
-  }
-
-  void notify(const Key& key, const Banner& banner, const std::string& server,
+  // A server that hangs has taken the banner and shows it when it goes on. So nobody gives up
+  // waiting: the bus answers when the server ends.
+  void notify(const std::string& token, const Banner& banner,
+              const std::optional<BannerAddress>& replaced, const std::string& server,
               ServerCapabilities capabilities) {
-    if (!isCurrent(key)) return;
-    const auto& replaced = shown_[key.token].address;
+    if (!shown_.contains(token)) return;
     const bool knowsIt = replaced && replaced->bus == bus_->name() && replaced->server == server;
-    send(notifyRequest(server, source_, banner, capabilities, knowsIt ? replaced->number : 0), key,
-         [server](Desktop& self, GDBusMessage* reply, const Key& shown) {
-           if (const auto number = bannerNumberIn(reply))
-             self.hasShown(shown, {self.bus_->name(), server, *number});
+    send(notifyRequest(server, source_, banner, capabilities, knowsIt ? replaced->number : 0),
+         token, SessionBus::Waiting::unlimited, [token, server](Desktop& self, GDBusMessage* reply) {
+           const auto number = bannerNumberIn(reply);
+           if (!number) return self.fail(token, "The notification server gives no number.");
+           self.hasShown(token, {self.bus_->name(), server, *number});
          });
   }
 
-  void hasShown(const Key& key, const BannerAddress& address) {
-    const auto shown = shown_.find(key.token);
-    // The banner was closed before the server had answered.
-    if (shown == shown_.end()) return close(address);
-    const auto earlier = std::exchange(shown->second.address, address);
-    if (earlier && earlier->bus == address.bus && earlier->server == address.server &&
-        earlier->number != address.number)
-      close(*earlier);
-    // The banner is being replaced by a newer one.
-    if (!isCurrent(key)) return;
-    if (const auto told = observer.lock()) told->bannerShown(key.token, address.reference());
+  void hasShown(const std::string& token, const BannerAddress& address) {
+    lastError_.clear();
+    const auto shown = shown_.find(token);
+    if (shown == shown_.end()) {
+      // The banner was closed before the server had answered.
+      bus_->send(closeRequest(address), SessionBus::Waiting::limited,
+                 [](GDBusMessage*, const std::string&) {});
+      return;
+    }
+    shown->second = address;
+    if (const auto told = observer.lock()) told->bannerShown(token, address.reference());
   }
 
   void receive(const char* sender, std::string_view name, GVariant* body) {
@@ -130,15 +150,20 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     if (name == "NotificationClosed" && g_variant_is_of_type(body, G_VARIANT_TYPE("(uu)"))) {
       guint32 reason = 0;
       g_variant_get(body, "(uu)", &number, &reason);
-      // The user may bring an expired banner back from the server's history.
-      if (reason != expired) forget({bus_->name(), sender, number}, reason == dismissedByUser);
+      close({bus_->name(), sender, number}, reason);
+    }
+    if (name == "NameOwnerChanged" && g_variant_is_of_type(body, G_VARIANT_TYPE("(sss)"))) {
+      const char* before = nullptr;
+      const char* after = nullptr;
+      g_variant_get(body, "(&s&s&s)", nullptr, &before, &after);
+      replaceServer(before, *after != 0);
     }
   }
 
   // The banner's token, once: further signals for the same banner are ignored.
   std::optional<std::string> take(const BannerAddress& address) {
     for (auto shown = shown_.begin(); shown != shown_.end(); ++shown)
-      if (shown->second.address == address) return shown_.extract(shown).key();
+      if (shown->second == address) return shown_.extract(shown).key();
     return std::nullopt;
   }
 
@@ -146,26 +171,40 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     const auto token = take(address);
     if (!token) return;
     // Not every server closes the banner by itself.
-    close(address);
-    const auto told = observer.lock();
-    if (!told) return;
-    if (action == dismissAction)
-      told->bannerDismissed(*token);
-    else
-      told->bannerActivated(*token);
+    bus_->send(closeRequest(address), SessionBus::Waiting::limited,
+               [](GDBusMessage*, const std::string&) {});
+    using Observer = NotificationServer::Observer;
+    tell(action == dismissAction ? &Observer::bannerDismissed : &Observer::bannerActivated, *token);
   }
 
-  void forget(const BannerAddress& address, bool isDismissed) {
+  void close(const BannerAddress& address, guint32 reason) {
     const auto token = take(address);
+    if (!token) return;
+    // The user may bring an expired banner back from the server's history.
+    if (reason == expired) shown_[*token] = address;
+    using Observer = NotificationServer::Observer;
+    tell(reason == dismissedByUser ? &Observer::bannerDismissed : &Observer::bannerGone, *token);
+  }
+
+  // What is on its way to the server that has ended is answered by the bus.
+  void replaceServer(const std::string& before, bool isThere) {
+    std::vector<std::string> gone;
+    for (const auto& [token, address] : shown_)
+      if (address && address->server == before) gone.push_back(token);
+    for (const std::string& token : gone) {
+      shown_.erase(token);
+      tell(&NotificationServer::Observer::bannerGone, token);
+    }
     const auto told = observer.lock();
-    if (token && told && isDismissed) told->bannerDismissed(*token);
+    if (told && isThere) told->serverAppeared();
   }
 
   SystemLog& systemLog_;
   const NotificationSource source_;
   const std::shared_ptr<SessionBus> bus_;
-  std::map<std::string, Shown> shown_;
-  std::uint64_t lastVersion_ = 0;
+  /// The banners' addresses by token; none while the server has yet to answer.
+  std::map<std::string, std::optional<BannerAddress>> shown_;
+  std::string lastError_;
 };
 
 class BusNotificationServer final : public NotificationServer {
@@ -183,6 +222,9 @@ class BusNotificationServer final : public NotificationServer {
   }
   void close(const std::string& token, const std::optional<std::string>& reference) override {
     desktop_->close(token, reference);
+  }
+  void check(std::function<void(const std::optional<PlatformError>&)> answer) override {
+    desktop_->check(std::move(answer));
   }
   bool isBusy() const override { return desktop_->isBusy(); }
 

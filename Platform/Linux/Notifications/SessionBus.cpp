@@ -155,18 +155,27 @@ void SessionBus::adopt(Connection connection) {
   unsubscribe();
   connection_ = std::move(connection);
   const OnMainContext here;
-  subscription_ = g_dbus_connection_signal_subscribe(
-      connection_.get(), notificationService, notificationService, nullptr, notificationPath,
-      nullptr, G_DBUS_SIGNAL_FLAGS_NONE, &dispatch, new Signal(signal_), &release);
+  const auto subscribe = [this](const char* sender, const char* interface, const char* name,
+                                const char* path, const char* argument) {
+    return g_dbus_connection_signal_subscribe(connection_.get(), sender, interface, name, path,
+                                              argument, G_DBUS_SIGNAL_FLAGS_NONE, &dispatch,
+                                              new Signal(signal_), &release);
+  };
+  constexpr const char* bus = "org.freedesktop.DBus";
+  subscriptions_[0] =
+      subscribe(notificationService, notificationService, nullptr, notificationPath, nullptr);
+  subscriptions_[1] =
+      subscribe(bus, bus, "NameOwnerChanged", "/org/freedesktop/DBus", notificationService);
 }
 
-void SessionBus::send(const BusMessage& message, Reply reply) {
+void SessionBus::send(const BusMessage& message, Waiting waiting, Reply reply) {
   constexpr int defaultTimeout = -1;
   const OnMainContext here;
   ++awaitedReplies_;
   g_dbus_connection_send_message_with_reply(
-      connection_.get(), message.get(), G_DBUS_SEND_MESSAGE_FLAGS_NONE, defaultTimeout, nullptr,
-      nullptr, &replied, new AwaitedReply{weak_from_this(), std::move(reply)});
+      connection_.get(), message.get(), G_DBUS_SEND_MESSAGE_FLAGS_NONE,
+      waiting == Waiting::limited ? defaultTimeout : G_MAXINT, nullptr, nullptr, &replied,
+      new AwaitedReply{weak_from_this(), std::move(reply)});
 }
 
 void SessionBus::replied(GObject* connection, GAsyncResult* result, gpointer data) noexcept {
@@ -192,7 +201,9 @@ std::string SessionBus::name() const {
 }
 
 void SessionBus::unsubscribe() {
-  if (connection_) g_dbus_connection_signal_unsubscribe(connection_.get(), subscription_);
+  if (!connection_) return;
+  for (const guint subscription : subscriptions_)
+    g_dbus_connection_signal_unsubscribe(connection_.get(), subscription);
 }
 
 void SessionBus::disconnect(GDBusConnection* connection) {

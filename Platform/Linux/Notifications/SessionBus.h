@@ -18,8 +18,8 @@ namespace Varnel::Platform::Linux {
 /// The host's connection, whose end may end the host, is left alone. Main thread only; nothing
 /// waits for the bus, which may be there without answering. Owned by a shared pointer.
 ///
-///     bus->connect([bus](const std::string& error) { if (error.empty()) bus->send(message, use);
-///     });
+///     bus->connect([bus](const std::string& error) { if (error.empty()) bus->send(message,
+///         SessionBus::Waiting::limited, use); });
 class SessionBus final : public std::enable_shared_from_this<SessionBus> {
  public:
   /// Given the error, or an empty text. Must not throw.
@@ -29,7 +29,14 @@ class SessionBus final : public std::enable_shared_from_this<SessionBus> {
   /// Given the sender, the member and the body of a signal. Must not throw.
   using Signal = std::function<void(const char* sender, const char* name, GVariant* body)>;
 
-  /// Signals of the notification service go to `signal`, as long as the object lives. `patience` is
+  /// How long to wait for a reply.
+  enum class Waiting {
+    limited,   ///< As long as GIO does by default: 25 seconds.
+    unlimited  ///< As long as the other side is there.
+  };
+
+  /// Signals of the notification service, and those of the bus about who serves it, go to `signal`,
+  /// as long as the object lives. `patience` is
   /// how long a connection may take.
   SessionBus(Signal signal, std::chrono::milliseconds patience);
   ~SessionBus();
@@ -41,7 +48,7 @@ class SessionBus final : public std::enable_shared_from_this<SessionBus> {
   void connect(Connected use);
 
   /// Sends a message over the present connection, without waiting for the reply. There must be one.
-  void send(const BusMessage& message, Reply reply);
+  void send(const BusMessage& message, Waiting waiting, Reply reply);
 
   /// Whether a connection or a reply is still to come.
   [[nodiscard]] bool isBusy() const { return attempt_ || awaitedReplies_ > 0; }
@@ -71,7 +78,7 @@ class SessionBus final : public std::enable_shared_from_this<SessionBus> {
   Timer timer_;                       // Ends the attempt.
   std::vector<Connected> waiting_;    // Called at the end of the attempt.
   Connection connection_;
-  guint subscription_ = 0;
+  guint subscriptions_[2] = {};
   int awaitedReplies_ = 0;
 };
 

@@ -1,0 +1,143 @@
+// SPDX-License-Identifier: MIT
+#include <orvane/ReminderPlanner.h>
+
+#include <algorithm>
+#include <chrono>
+#include <vector>
+
+#include <Varnel/Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/UserNotificationCenter.h>
+#include <Varnel/Platform/Text/Calendar.h>
+#include <Varnel/Reminders/SchedulerService.h>
+#include <Varnel/Reminders/UserNotificationRouter.h>
+#include <Varnel/Tallyhouse/AnalyticsTracker.h>
+#include <orvane/Console.h>
+#include <orvane/Reminders.h>
+
+namespace Orvane {
+namespace {
+
+using Varnel::SchedulePeriodOption;
+using Varnel::Platform::UserNotification;
+using Varnel::Platform::UserNotificationCenter;
+
+// Servers answer within milliseconds, unless they have yet to be started, and other processes keep
+// the store no longer.
+constexpr std::chrono::seconds patience(3);
+
+/// The product's center for a program that only plans: it never becomes the delegate.
+class PlanningCenter final : public UserNotificationCenter {
+ public:
+  explicit PlanningCenter(UserNotificationCenter& center) : center_(center) {}
+
+  void setDelegate(std::weak_ptr<Varnel::Platform::UserNotificationCenterDelegate>) override {}
+  Failure change(const std::function<Failure()>& calls) override { return center_.change(calls); }
+  Failure scheduleNotification(const UserNotification& notification) override {
+    return center_.scheduleNotification(notification);
+  }
+  Notifications scheduledNotifications() override { return center_.scheduledNotifications(); }
+  Failure removeScheduledNotification(const UserNotification& notification) override {
+    return center_.removeScheduledNotification(notification);
+  }
+  Failure deliverNotification(const UserNotification& notification) override {
+    return center_.deliverNotification(notification);
+  }
+  Notifications deliveredNotifications() override { return center_.deliveredNotifications(); }
+  Failure removeDeliveredNotification(const UserNotification& notification) override {
+    return center_.removeDeliveredNotification(notification);
+  }
+  void retryLater(std::function<void()> retry) override { center_.retryLater(std::move(retry)); }
+  void checkBanners(std::function<void(const Failure&)> answer) override {
+    center_.checkBanners(std::move(answer));
+  }
+  bool isBusy() const override { return center_.isBusy(); }
+
+ private:
+  UserNotificationCenter& center_;
+};
+
+// Whether exactly the reminder of this period is planned.
+Varnel::Platform::Result<bool> isPlanned(UserNotificationCenter& center,
+                                         SchedulePeriodOption period) {
+  auto planned = center.scheduledNotifications();
+  if (!planned) return planned.error();
+  std::erase_if(*planned, [](const auto& each) { return !each.deliveryRepeatInterval; });
+  if (period == SchedulePeriodOption::never) return planned->empty();
+  const auto& ports = Varnel::Platform::processPorts();
+  const auto interval =
+      period.repeatInterval(Varnel::Platform::Calendar(ports.userLocale, ports.timeZones));
+  return planned->size() == 1 && planned->front().deliveryRepeatInterval == interval;
+}
+
+std::string reasonOf(const std::optional<Varnel::Platform::PlatformError>& failure) {
+  return failure ? failure->localizedDescription() : "it is not in the store";
+}
+
+}  // namespace
+
+struct ReminderPlanner::Parts {
+  PlanningCenter center{Varnel::UserNotificationRouter::defaultUserNotificationCenter()};
+  Varnel::UserNotificationRouter router{{center, Varnel::Platform::processPorts().application,
+                                         Varnel::Platform::processPorts().mainQueue}};
+  Varnel::SchedulerService service{std::make_shared<Tallyhouse::AnalyticsTracker>(), router};
+};
+
+void repairPlan(Varnel::SchedulerService& service, Console& console) {
+  const SchedulePeriodOption period = storedPeriod();
+  const auto planned = isPlanned(service.userNotificationCenter(), period);
+  if (planned && *planned) return;
+  service.setSchedulePeriod(period);
+  if (service.failure())
+    console.complain("the regular reminder is not planned yet: " + reasonOf(service.failure()));
+}
+
+ReminderPlanner::ReminderPlanner(Console& console)
+    : console_(console), parts_(std::make_unique<Parts>()) {}
+
+ReminderPlanner::~ReminderPlanner() = default;
+
+UserNotificationCenter& ReminderPlanner::center() const {
+  return parts_->center;
+}
+
+bool ReminderPlanner::planRegular(SchedulePeriodOption period) {
+  Varnel::SchedulerService& service = parts_->service;
+  // Assigning plans anew and clears what was delivered, so only a choice of the user does it.
+  service.setSchedulePeriod(period);
+  awaitDesktop([&] { return service.failure().has_value(); });
+  const auto planned = isPlanned(parts_->center, period);
+  if (planned && *planned) return true;
+  const Failure failure = planned ? service.failure() : Failure(planned.error());
+  console_.complain("the period is kept, but the reminder is not planned: " + reasonOf(failure) +
+                    "; the next remind command tries again");
+  return false;
+}
+
+bool ReminderPlanner::plan(const UserNotification& notification) {
+  repairPlan(parts_->service, console_);
+  UserNotificationCenter& center = parts_->center;
+  Failure failure;
+  const std::function<void()> tryIt = [&] {
+    failure = center.scheduleNotification(notification);
+    if (failure) center.retryLater(tryIt);
+  };
+  tryIt();
+  awaitDesktop([&] { return failure.has_value(); });
+  const auto planned = center.scheduledNotifications();
+  if (!planned) failure = planned.error();
+  if (planned && std::find(planned->begin(), planned->end(), notification) != planned->end())
+    return true;
+  console_.complain("the reminder is not planned: " + reasonOf(failure));
+  return false;
+}
+
+void ReminderPlanner::awaitDesktop(const std::function<bool()>& isWaiting) const {
+  auto& mainQueue = Varnel::Platform::processPorts().mainQueue;
+  const UserNotificationCenter& center = parts_->center;
+  mainQueue.runWhile([&] { return isWaiting() || center.isBusy(); }, patience);
+  if (center.isBusy())
+    console_.complain("the desktop does not answer; the banner of an earlier reminder may stay");
+}
+
+}  // namespace Orvane

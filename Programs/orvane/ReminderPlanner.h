@@ -1,0 +1,58 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <functional>
+#include <memory>
+#include <optional>
+
+#include <Varnel/Platform/Values/PlatformError.h>
+#include <Varnel/Reminders/SchedulePeriodOption.h>
+
+namespace Varnel {
+class SchedulerService;
+}
+namespace Varnel::Platform {
+class UserNotificationCenter;
+struct UserNotification;
+}  // namespace Varnel::Platform
+
+namespace Orvane {
+
+class Console;
+
+/// Plans anew where the stored period is not the planned one: a program was killed between storing
+/// and planning, or could not plan. Says what is in its way.
+void repairPlan(Varnel::SchedulerService& service, Console& console);
+
+/// Plans for a program that ends when it has planned. It is not told of deliveries: what is due
+/// waits for a program that listens. Each operation lets the desktop follow, a few seconds at most,
+/// and answers whether what it was asked for is found again in the store; where it is not, it
+/// complains.
+///
+///     ReminderPlanner planner(console);
+///     if (!planner.planRegular(period)) return 1;
+class ReminderPlanner final {
+ public:
+  explicit ReminderPlanner(Console& console);
+  ~ReminderPlanner();
+  ReminderPlanner(const ReminderPlanner&) = delete;
+  ReminderPlanner& operator=(const ReminderPlanner&) = delete;
+
+  /// The reminder of this period, which is stored.
+  [[nodiscard]] bool planRegular(Varnel::SchedulePeriodOption period);
+  /// A notification of its own, beside the reminder of the stored period.
+  [[nodiscard]] bool plan(const Varnel::Platform::UserNotification& notification);
+
+  [[nodiscard]] Varnel::Platform::UserNotificationCenter& center() const;
+
+ private:
+  using Failure = std::optional<Varnel::Platform::PlatformError>;
+  struct Parts;
+
+  void awaitDesktop(const std::function<bool()>& isWaiting) const;
+
+  Console& console_;
+  const std::unique_ptr<Parts> parts_;
+};
+
+}  // namespace Orvane
