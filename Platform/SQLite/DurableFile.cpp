@@ -48,6 +48,13 @@ bool keepsLog(SQLiteDatabase& database) {
   return mode && mode->step() && mode->text(0) == "wal";
 }
 
+bool isOfAnotherFormat(const std::optional<PlatformError>& error) {
+  if (!error) return false;
+  const SQLiteFailure meaning = meaningOf(*error);
+  return meaning == SQLiteFailure::newer || meaning == SQLiteFailure::older ||
+         meaning == SQLiteFailure::refused;
+}
+
 bool isDamage(const std::optional<PlatformError>& error) {
   return error && meaningOf(*error) == SQLiteFailure::damaged;
 }
@@ -94,13 +101,14 @@ DurableFile::~DurableFile() {
 }
 
 DurableFile::Failure DurableFile::read(const Work& work) {
-  return attempt(Look::byPath,
-                 [&](SQLiteDatabase& database) { return database.transaction("BEGIN", work); });
+  return attempt(Look::byPath, [&](SQLiteDatabase& database) {
+    return database.transaction("BEGIN", ofThisFormat(work));
+  });
 }
 
 DurableFile::Failure DurableFile::change(const Work& work) {
   return attempt(Look::byPath, [&](SQLiteDatabase& database) {
-    return database.transaction("BEGIN IMMEDIATE", work);
+    return database.transaction("BEGIN IMMEDIATE", ofThisFormat(work));
   });
 }
 
@@ -108,8 +116,19 @@ DurableFile::Failure DurableFile::changeByOneStatement(const Work& work) {
   return attempt(Look::atFiles, [&](SQLiteDatabase& database) {
     auto error = work(database);
     database.finishCached();
+    // The tables may be those of a later version by now.
+    if (error && meaningOf(*error) == SQLiteFailure::other)
+      if (auto objection = judgeFormat(database, format_, Migrating::never)) return objection;
     return error;
   });
+}
+
+// Another process may have migrated the file since it was opened.
+DurableFile::Work DurableFile::ofThisFormat(const Work& work) const {
+  return [&](SQLiteDatabase& database) {
+    auto objection = judgeFormat(database, format_, Migrating::never);
+    return objection ? objection : work(database);
+  };
 }
 
 void DurableFile::checkpoint() {
@@ -152,8 +171,8 @@ DurableFile::Failure DurableFile::attempt(Look look, const Work& operation) {
       error = setAside(*error);
     } else {
       if (loggedPages_ >= maxLoggedPages) checkpoint();
-      if (connection_->isImmutable) connection_.reset();
-      return error;
+      if (connection_->isImmutable || isOfAnotherFormat(error)) connection_.reset();
+      return error ? said(*error) : error;
     }
     if (error) return said(*error);
   }

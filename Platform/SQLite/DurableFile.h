@@ -89,6 +89,7 @@ class DurableFile final {
   enum class Look { byPath, atFiles };  ///< How to find out whether the file was taken away.
 
   [[nodiscard]] Failure attempt(Look look, const Work& operation);
+  [[nodiscard]] Work ofThisFormat(const Work& work) const;
   [[nodiscard]] bool isFromBeforeFork() const;
   [[nodiscard]] bool isLost();
   [[nodiscard]] bool looksUntouched() const;

@@ -172,7 +172,7 @@ TEST_P(DurableFileTest, FourProcessesThatFindDamageAtOnceLoseNothing) {
       char byte = 0;
       static_cast<void>(::read(start[0], &byte, 1));
       auto book = open();
-      for (char number = 'a'; number < 'z'; ++number)
+      for (char number = 'a'; number < 'i'; ++number)
         while (book->add(std::string{name, number}) == "busy") continue;
       ::_exit(static_cast<int>(book->log.lines.size()));
     }
@@ -187,9 +187,100 @@ TEST_P(DurableFileTest, FourProcessesThatFindDamageAtOnceLoseNothing) {
     EXPECT_EQ(lines, 1);
     inChild(::geteuid(), [&] {
       auto book = open();
-      EXPECT_EQ(book->keys().size(), 4u * 25 * 2);
+      EXPECT_EQ(book->keys().size(), 4u * 8 * 2);
       EXPECT_EQ(book->file.damageCount(), 1);
     });
+  }
+}
+
+TEST_P(DurableFileTest, AKillWhileDamageIsMendedLosesNothing) {
+  int call = 0;
+  for (bool isKilled = true; isKilled;) {
+    SCOPED_TRACE(++call);
+    fs::remove_all(path_.parent_path());
+    inChild(::geteuid(), [&] {
+      EXPECT_EQ(open()->add("a"), "kept");
+      emptyLog();
+      auto database = SQLiteDatabase::open(path_, SQLiteDatabase::Access::existing);
+      EXPECT_FALSE(
+          database->execute("CREATE TABLE more(data); INSERT INTO more VALUES("
+                            "zeroblob(30000))"));
+      emptyLog();
+      // Rows behind the damage are in the log alone.
+      EXPECT_EQ(open()->add("b"), "kept");
+    });
+    fs::resize_file(path_, fs::file_size(path_) - 8192);
+    const pid_t child = ::fork();
+    if (child == 0) {
+      MortalFiles files(call);
+      Notebook book(path_, notes(GetParam()), Migrating::allowed, &files);
+      ::_exit(book.add("c") == "kept" ? 0 : 1);
+    }
+    int status = 0;
+    ::waitpid(child, &status, 0);
+    isKilled = WIFSIGNALED(status);
+    EXPECT_TRUE(isKilled || WEXITSTATUS(status) == 0);
+    inChild(::geteuid(), [&] {
+      auto book = open();
+      EXPECT_EQ(book->add("d"), "kept");
+      EXPECT_EQ(book->keys(), isKilled && book->keys() == "abd" ? "abd" : "abcd");
+      EXPECT_EQ(open()->keys(), book->keys());
+      EXPECT_FALSE(fs::exists(beside(".salvage")));
+      const auto times = book->file.damageCount();
+      EXPECT_TRUE(times == 1 || (isKilled && times == 2)) << times;
+    });
+  }
+  EXPECT_GT(call, 20);
+}
+
+// One file of each format that ever was lies in Data.
+TEST(DurableFormatTest, OnlyTheProductsOwnHostMigrates) {
+  const auto later = [](FormatVersion version) {
+    DurableFormat format = notes(Journal::rollback);
+    format.version = version;
+    format.migrations = {
+        {{1, 0}, "ALTER TABLE note ADD COLUMN text TEXT NOT NULL DEFAULT 'none'"},
+        {{1, 1}, "CREATE TABLE place(name TEXT); DELETE FROM note WHERE key = 'b'"}};
+    return format;
+  };
+  auto broken = later({2, 0});
+  broken.migrations[1].sql += "; nonsense";
+  struct Case {
+    const char* what;
+    DurableFormat format;
+    Migrating migrating;
+    const char* keys;
+    std::int64_t version;
+  };
+  const std::vector<Case> cases{
+      {"the same", later({1, 0}), Migrating::allowed, "abc", 1000},
+      {"a later minor, its own host", later({1, 1}), Migrating::allowed, "abc", 1001},
+      {"a later minor, another", later({1, 1}), Migrating::never, "abc", 1000},
+      {"a later major, its own host", later({2, 0}), Migrating::allowed, "ac", 2000},
+      {"a later major, another", later({2, 0}), Migrating::never, "older", 1000},
+      {"an earlier major", later({0, 9}), Migrating::allowed, "newer", 1000},
+      {"a migration that fails", broken, Migrating::allowed, nullptr, 1000},
+  };
+  const fs::path golden = fs::path(VARNEL_TEST_DATA) / "notes-1.0.sqlite";
+  for (const Case& one : cases) {
+    SCOPED_TRACE(one.what);
+    const TemporaryFolder folder;
+    const fs::path path = folder.path() / "notes.sqlite";
+    fs::copy_file(golden, path);
+    Notebook book(path, one.format, one.migrating);
+    const std::string keys = book.keys();
+    EXPECT_TRUE(one.keys ? keys == one.keys : keys.find("nonsense") != keys.npos) << keys;
+    auto database = SQLiteDatabase::open(path, SQLiteDatabase::Access::readOnly);
+    EXPECT_EQ(*database->integer("PRAGMA user_version"), one.version);
+    EXPECT_EQ(*database->integer("SELECT count(*) FROM note"), one.version == 2000 ? 2 : 3);
+    EXPECT_FALSE(fs::exists(path.string() + ".damaged"));
+    // One who has the file open meanwhile notices, and one of an earlier minor version goes on.
+    Notebook old(path, notes(Journal::rollback), Migrating::never);
+    Notebook(path, later({1, 1}), Migrating::allowed).keys();
+    EXPECT_EQ(old.change("e"), one.version == 2000 ? "newer" : "kept");
+    Notebook(path, later({2, 0}), Migrating::allowed).keys();
+    for (int time = 0; time < 3; ++time) EXPECT_EQ(old.change("f"), "newer");
+    EXPECT_EQ(old.log.lines.size(), 1u);
   }
 }
 
