@@ -7,6 +7,7 @@
 
 #include <array>
 #include <cerrno>
+#include <chrono>
 #include <cstdio>
 #include <filesystem>
 
@@ -47,7 +48,8 @@ const char* objection(const struct stat& facts) {
   return nullptr;
 }
 
-// The user's mask of modes may take the rights away that a new folder is given.
+// The process's mask of modes may take rights away that a new folder or file is given. Some file
+// systems know no modes.
 Failure makeFolders(const fs::path& folder) {
   struct stat facts {};
   if (::lstat(folder.c_str(), &facts) == 0) return std::nullopt;
@@ -55,7 +57,7 @@ Failure makeFolders(const fs::path& folder) {
     if (auto error = makeFolders(folder.parent_path())) return error;
   if (::mkdir(folder.c_str(), folderMode) != 0)
     return errno == EEXIST ? std::nullopt : Failure(systemError(folder));
-  if (::chmod(folder.c_str(), folderMode) != 0) return systemError(folder);
+  static_cast<void>(::chmod(folder.c_str(), folderMode));
   return std::nullopt;
 }
 
@@ -87,7 +89,7 @@ Failure makeFile(const std::string& path) {
   const FileDescriptor made(
       ::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, fileMode));
   if (!made) return errno == EEXIST ? std::nullopt : Failure(systemError(path));
-  if (::fchmod(made.get(), fileMode) != 0) return systemError(path);
+  static_cast<void>(::fchmod(made.get(), fileMode));
   return std::nullopt;
 }
 
@@ -99,12 +101,13 @@ std::error_code protectFile(const std::string& path) {
   if (!file) return errno == ENOENT ? std::error_code() : lastError();
   struct stat facts {};
   if (::fstat(file.get(), &facts) != 0) return lastError();
-  if (objection(facts)) return std::make_error_code(std::errc::operation_not_permitted);
+  if (objection(facts)) return std::make_error_code(std::errc::invalid_argument);
   if ((facts.st_mode & modeBits) == fileMode) return {};
   const std::string name = "/proc/self/fd/" + std::to_string(file.get());
   if (::chmod(name.c_str(), fileMode) == 0) return {};
   if (errno == ENOENT && ::chmod(path.c_str(), fileMode) == 0) return {};
-  return lastError();
+  // A file system without modes, or one that cannot be written.
+  return errno == EPERM || errno == EROFS || errno == ENOTSUP ? std::error_code() : lastError();
 }
 
 // A lock of the open file description: unlike one of the process, it outlives the closing of other
@@ -132,6 +135,24 @@ class DescriptionLock final : public FileLock {
     return ::fcntl(file_.get(), F_OFD_SETLK, &lock) == 0;
   }
 
+  FileDescriptor file_;
+};
+
+class PathDescriptor final : public HeldFile {
+ public:
+  explicit PathDescriptor(FileDescriptor file) : file_(std::move(file)) {}
+
+  [[nodiscard]] State state() const override {
+    struct stat facts {};
+    if (::fstat(file_.get(), &facts) != 0) return {};
+    const std::chrono::nanoseconds change = std::chrono::seconds(facts.st_ctim.tv_sec) +
+                                            std::chrono::nanoseconds(facts.st_ctim.tv_nsec);
+    return {.isRemoved = facts.st_nlink == 0,
+            .isEmpty = facts.st_size == 0,
+            .lastChange = change.count()};
+  }
+
+ private:
   FileDescriptor file_;
 };
 
@@ -163,6 +184,12 @@ class OwnFiles final : public PrivateFiles {
     if (::lstat(path.c_str(), &facts) != 0) return std::nullopt;
     return FileIdentity{
         .device = facts.st_dev, .inode = facts.st_ino, .isEmpty = facts.st_size == 0};
+  }
+
+  std::unique_ptr<HeldFile> hold(const std::string& path) override {
+    FileDescriptor file(::open(path.c_str(), O_PATH | O_NOFOLLOW | O_CLOEXEC));
+    if (!file) return nullptr;
+    return std::make_unique<PathDescriptor>(std::move(file));
   }
 
   Result<std::unique_ptr<FileLock>> tryLock(const std::string& path) override {

@@ -15,9 +15,7 @@ namespace Varnel::Platform {
 
 // What lies beside the file PATH:
 //   PATH-journal, PATH-wal, PATH-shm    the library's
-//   PATH.lock                           held while the file is opened, set aside or replaced, so
-//   that
-//                                       no two processes do that at once
+//   PATH.opening                        locked by the one who opens the file, or sets it aside
 //   PATH.salvage                        was set aside, and its rows are not taken over yet
 //   PATH.damaged                        was set aside, and its rows are taken over
 // A process may be killed after each step: the next one to open the file goes on from there.
@@ -29,7 +27,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr const char* lockSuffix = ".lock";
+constexpr const char* turnSuffix = ".opening";
 constexpr const char* pendingSuffix = ".salvage";
 constexpr const char* asideSuffix = ".damaged";
 constexpr std::array<const char*, 3> journalSuffixes{"-wal", "-shm", "-journal"};
@@ -45,9 +43,16 @@ bool isWorthALine(SQLiteFailure meaning) {
 }
 
 // Whether the connection keeps a write-ahead log.
-bool loggedMode(SQLiteDatabase& database) {
+bool keepsLog(SQLiteDatabase& database) {
   auto mode = database.prepare("PRAGMA journal_mode");
   return mode && mode->step() && mode->text(0) == "wal";
+}
+
+bool isOfAnotherFormat(const std::optional<PlatformError>& error) {
+  if (!error) return false;
+  const SQLiteFailure meaning = meaningOf(*error);
+  return meaning == SQLiteFailure::newer || meaning == SQLiteFailure::older ||
+         meaning == SQLiteFailure::refused;
 }
 
 bool isDamage(const std::optional<PlatformError>& error) {
@@ -67,11 +72,19 @@ int forksSoFar() {
 
 }  // namespace
 
+// The write-ahead log and its index, if there are any, belong to a connection as the file does.
 struct DurableFile::Connection {
+  explicit Connection(SQLiteDatabase opened) : database(std::move(opened)) {}
+
   SQLiteDatabase database;
   FileIdentity file;
-  std::optional<FileIdentity> journal;  ///< The write-ahead log, if there is one.
-  int forksBefore = forksSoFar();
+  std::optional<FileIdentity> log;
+  std::optional<FileIdentity> index;
+  std::unique_ptr<HeldFile> heldFile;
+  std::unique_ptr<HeldFile> heldLog;
+  std::int64_t lastChange = 0;  ///< Of the file, when it was last found in its place.
+  bool isImmutable = false;
+  const int forksBefore = forksSoFar();
 };
 
 DurableFile::DurableFile(Ports ports, const std::string& path, DurableFormat format,
@@ -79,6 +92,7 @@ DurableFile::DurableFile(Ports ports, const std::string& path, DurableFormat for
     : ports_(ports),
       path_(fs::absolute(path).string()),
       logPath_(path_ + "-wal"),
+      indexPath_(path_ + "-shm"),
       format_(std::move(format)),
       migrating_(migrating) {}
 
@@ -87,20 +101,34 @@ DurableFile::~DurableFile() {
 }
 
 DurableFile::Failure DurableFile::read(const Work& work) {
-  return attempt([&](SQLiteDatabase& database) { return database.transaction("BEGIN", work); });
+  return attempt(Look::byPath, [&](SQLiteDatabase& database) {
+    return database.transaction("BEGIN", ofThisFormat(work));
+  });
 }
 
 DurableFile::Failure DurableFile::change(const Work& work) {
-  return attempt(
-      [&](SQLiteDatabase& database) { return database.transaction("BEGIN IMMEDIATE", work); });
+  return attempt(Look::byPath, [&](SQLiteDatabase& database) {
+    return database.transaction("BEGIN IMMEDIATE", ofThisFormat(work));
+  });
 }
 
 DurableFile::Failure DurableFile::changeByOneStatement(const Work& work) {
-  return attempt([&](SQLiteDatabase& database) {
+  return attempt(Look::atFiles, [&](SQLiteDatabase& database) {
     auto error = work(database);
     database.finishCached();
+    // The tables may be those of a later version by now.
+    if (error && meaningOf(*error) == SQLiteFailure::other)
+      if (auto objection = judgeFormat(database, format_, Migrating::never)) return objection;
     return error;
   });
+}
+
+// Another process may have migrated the file since it was opened.
+DurableFile::Work DurableFile::ofThisFormat(const Work& work) const {
+  return [&](SQLiteDatabase& database) {
+    auto objection = judgeFormat(database, format_, Migrating::never);
+    return objection ? objection : work(database);
+  };
 }
 
 void DurableFile::checkpoint() {
@@ -129,20 +157,22 @@ void DurableFile::removeSetAside() {
   }
 }
 
-DurableFile::Failure DurableFile::attempt(const Work& operation) {
+DurableFile::Failure DurableFile::attempt(Look look, const Work& operation) {
   if (isFromBeforeFork()) return fileError(SQLiteFailure::refused, path_ + " is the parent's");
   deadline_.restart();
   Failure error;
   for (int round = 0; round < maxRounds; ++round) {
     if ((error = ensureOpen())) return said(*error);
     error = operation(connection_->database);
-    if (isLost()) {
+    const bool isUntouched = look == Look::atFiles && !error && looksUntouched();
+    if (!isUntouched && isLost()) {
       error = replaceLost();
     } else if (isDamage(error)) {
       error = setAside(*error);
     } else {
       if (loggedPages_ >= maxLoggedPages) checkpoint();
-      return error;
+      if (connection_->isImmutable || isOfAnotherFormat(error)) connection_.reset();
+      return error ? said(*error) : error;
     }
     if (error) return said(*error);
   }
@@ -153,11 +183,24 @@ bool DurableFile::isFromBeforeFork() const {
   return connection_ && connection_->forksBefore != forksSoFar();
 }
 
-// Whether what the connection writes can still be found by the path.
-bool DurableFile::isLost() const {
-  const auto file = ports_.privateFiles.identity(path_);
+// Whether the path no longer leads to what the connection writes.
+bool DurableFile::isLost() {
+  PrivateFiles& files = ports_.privateFiles;
+  if (connection_->heldFile) connection_->lastChange = connection_->heldFile->state().lastChange;
+  const auto file = files.identity(path_);
   if (!file || file->isEmpty || *file != connection_->file) return true;
-  return connection_->journal && ports_.privateFiles.identity(logPath_) != connection_->journal;
+  return (connection_->log && files.identity(logPath_) != connection_->log) ||
+         (connection_->index && files.identity(indexPath_) != connection_->index);
+}
+
+// Whether nothing has happened to the files themselves since they were last found by their paths:
+// most of what can happen shows there, for a fraction of the time. False when in doubt.
+bool DurableFile::looksUntouched() const {
+  const Connection& open = *connection_;
+  if (!open.heldFile || !open.heldLog) return false;
+  const auto file = open.heldFile->state();
+  return !file.isRemoved && !file.isEmpty && file.lastChange == open.lastChange &&
+         !open.heldLog->state().isRemoved;
 }
 
 DurableFile::Failure DurableFile::ensureOpen() {
@@ -165,7 +208,8 @@ DurableFile::Failure DurableFile::ensureOpen() {
   if (const auto turn = takeTurn(); !turn) {
     // Where nothing can be locked nothing can be changed, by anybody, but perhaps read.
     if (meaningOf(turn.error()) != SQLiteFailure::readOnly) return turn.error();
-    if (open()) return turn.error();
+    if (!ports_.privateFiles.identity(path_)) return turn.error();
+    if (auto error = open()) return error;
   } else {
     auto error = open();
     if (isDamage(error)) error = moveAside(error->localizedDescription());
@@ -183,7 +227,7 @@ DurableFile::Failure DurableFile::ensureOpen() {
 // Only one who holds the lock may open, set aside or replace the file.
 Result<std::unique_ptr<FileLock>> DurableFile::takeTurn() {
   while (true) {
-    auto lock = ports_.privateFiles.tryLock(path_ + lockSuffix);
+    auto lock = ports_.privateFiles.tryLock(path_ + turnSuffix);
     if (!lock || *lock) return lock;
     if (!deadline_.pause())
       return fileError(SQLiteFailure::busy,
@@ -193,41 +237,53 @@ Result<std::unique_ptr<FileLock>> DurableFile::takeTurn() {
 
 DurableFile::Failure DurableFile::open() {
   finishMovingAside();
-  if (!ports_.privateFiles.identity(path_)) removeJournals();
   const auto path = ports_.privateFiles.prepare(path_);
   if (!path) return path.error();
+  if (const auto file = ports_.privateFiles.identity(path_); file && file->isEmpty)
+    removeJournals();
   auto database = SQLiteDatabase::open(*path, SQLiteDatabase::Access::existing);
   if (!database) return database.error();
   const bool isReadOnly = database->isReadOnly();
   const Migrating migrating = isReadOnly ? Migrating::never : migrating_;
   database->waitWithin(deadline_);
   auto error = judgeFormat(*database, format_, migrating);
-  if (error && isReadOnly && meaningOf(*error) != SQLiteFailure::damaged) {
+  bool isImmutable = false;
+  if (error &&
+      (meaningOf(*error) == SQLiteFailure::readOnly || meaningOf(*error) == SQLiteFailure::other)) {
     // A write-ahead log needs files beside it, even for reading. Without a log the file is whole.
     const auto log = ports_.privateFiles.identity(logPath_);
     if (log && !log->isEmpty) return error;
+    isImmutable = true;
     database = SQLiteDatabase::open(*path, SQLiteDatabase::Access::immutable);
     if (!database) return database.error();
     error = judgeFormat(*database, format_, migrating);
   }
-  if (!error && !isReadOnly) error = setUp(*database, *path);
+  if (!error && !database->isReadOnly()) error = setUp(*database, *path);
   if (!error) error = applyFormat(*database, format_, migrating);
   if (error) return error;
-  const auto file = ports_.privateFiles.identity(path_);
-  if (!file || database->hasMoved())
-    return fileError(SQLiteFailure::busy, path_ + " was taken away while it was opened");
-  const bool hasLog = !isReadOnly && loggedMode(*database);
-  connection_ = std::make_unique<Connection>(
-      Connection{.database = std::move(*database),
-                 .file = *file,
-                 .journal = hasLog ? ports_.privateFiles.identity(logPath_) : std::nullopt});
-  return std::nullopt;
+  connection_ = std::make_unique<Connection>(std::move(*database));
+  connection_->isImmutable = isImmutable;
+  if (holdFiles()) return std::nullopt;
+  connection_.reset();
+  return fileError(SQLiteFailure::busy, path_ + " was taken away while it was opened");
+}
+
+bool DurableFile::holdFiles() {
+  PrivateFiles& files = ports_.privateFiles;
+  Connection& open = *connection_;
+  const auto file = files.identity(path_);
+  if (!file || open.database.hasMoved()) return false;
+  open.file = *file;
+  if (open.database.isReadOnly() || !keepsLog(open.database)) return true;
+  open.log = files.identity(logPath_);
+  open.index = files.identity(indexPath_);
+  open.heldFile = files.hold(path_);
+  open.heldLog = files.hold(logPath_);
+  return !isLost();
 }
 
 DurableFile::Failure DurableFile::setUp(SQLiteDatabase& database, const std::string& path) {
-  if (const auto failure = ports_.privateFiles.protect(path);
-      failure && failure != std::errc::read_only_file_system)
-    return PlatformError(failure);
+  if (const auto failure = ports_.privateFiles.protect(path)) return PlatformError(failure);
   if (format_.journal == DurableFormat::Journal::writeAhead) {
     const auto error = database.execute("PRAGMA journal_mode = WAL");
     if (error && meaningOf(*error) != SQLiteFailure::other) return error;
@@ -235,7 +291,7 @@ DurableFile::Failure DurableFile::setUp(SQLiteDatabase& database, const std::str
   loggedPages_ = 0;
   database.countLoggedPages(loggedPages_);
   // A journal that is emptied, not removed, is found again by no name but its own.
-  if (!loggedMode(database))
+  if (!keepsLog(database))
     if (auto error = database.execute("PRAGMA journal_mode = TRUNCATE")) return error;
   const bool isFull = format_.synchronisation == DurableFormat::Synchronisation::survivesPowerLoss;
   return database.execute(isFull ? "PRAGMA synchronous = FULL" : "PRAGMA synchronous = NORMAL");
@@ -277,7 +333,7 @@ DurableFile::Failure DurableFile::replaceLost() {
   Failure error;
   if (there == lost->file)
     error = moveAside("its journal or what it held was taken away");
-  else if (lost->journal && files.identity(logPath_) == lost->journal)
+  else if (lost->log && files.identity(logPath_) == lost->log)
     removeJournals();
   if (!error) error = open();
   if (error) return fail(*error);
@@ -286,7 +342,8 @@ DurableFile::Failure DurableFile::replaceLost() {
   const bool isSetAside = files.identity(path_ + pendingSuffix) == lost->file ||
                           files.identity(path_ + asideSuffix) == lost->file;
   if (there == lost->file || !isSetAside) {
-    if (!there) say("was removed or renamed, and is begun anew");
+    if (there != lost->file)
+      say(there ? "was replaced" : "was removed or renamed, and is begun anew");
     error = takeOver(&lost->database, !there);
     if (error) return fail(*error);
   }
@@ -328,6 +385,8 @@ void DurableFile::takeOverSetAside() {
   if (!resolved) return;
   {
     auto from = SQLiteDatabase::open(*resolved, SQLiteDatabase::Access::existing);
+    // Makes the library read a file that is shorter than it says.
+    if (from) static_cast<void>(from->execute("PRAGMA writable_schema = ON"));
     if (takeOver(from ? &*from : nullptr, true)) return;
   }
   for (const char* suffix : journalSuffixes) {

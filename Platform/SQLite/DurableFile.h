@@ -86,13 +86,18 @@ class DurableFile final {
   struct Connection;
   using Failure = std::optional<PlatformError>;
 
-  [[nodiscard]] Failure attempt(const Work& operation);
+  enum class Look { byPath, atFiles };  ///< How to find out whether the file was taken away.
+
+  [[nodiscard]] Failure attempt(Look look, const Work& operation);
+  [[nodiscard]] Work ofThisFormat(const Work& work) const;
   [[nodiscard]] bool isFromBeforeFork() const;
-  [[nodiscard]] bool isLost() const;
+  [[nodiscard]] bool isLost();
+  [[nodiscard]] bool looksUntouched() const;
   [[nodiscard]] Failure ensureOpen();
   [[nodiscard]] Result<std::unique_ptr<FileLock>> takeTurn();
   // With the turn taken:
   [[nodiscard]] Failure open();
+  [[nodiscard]] bool holdFiles();
   [[nodiscard]] Failure setUp(SQLiteDatabase& database, const std::string& path);
   [[nodiscard]] Failure check();
   [[nodiscard]] Failure moveAside(const std::string& reason);
@@ -109,6 +114,7 @@ class DurableFile final {
   const Ports ports_;
   const std::string path_;
   const std::string logPath_;
+  const std::string indexPath_;
   const DurableFormat format_;
   const Migrating migrating_;
 

@@ -38,14 +38,10 @@ Result<FoundFormat> formatOf(SQLiteDatabase& database) {
                      .isEmpty = applicationID->value_or(0) == 0 && number == 0 && *entries == 0};
 }
 
-auto firstMigration(const DurableFormat& format, FormatVersion version) {
-  return std::find_if(format.migrations.begin(), format.migrations.end(),
-                      [&](const Migration& migration) { return migration.from == version; });
-}
-
 bool canMigrate(const DurableFormat& format, FormatVersion version, Migrating migrating) {
   return migrating == Migrating::allowed && version < format.version &&
-         firstMigration(format, version) != format.migrations.end();
+         std::any_of(format.migrations.begin(), format.migrations.end(),
+                     [&](const Migration& migration) { return migration.from == version; });
 }
 
 // A file that calls itself one of this very version has its tables.
@@ -67,8 +63,10 @@ Failure stamp(SQLiteDatabase& database, const DurableFormat& format) {
 }
 
 Failure migrate(SQLiteDatabase& database, const DurableFormat& format, FormatVersion version) {
-  for (auto next = firstMigration(format, version); next != format.migrations.end(); ++next)
-    if (auto error = database.execute(next->sql)) return error;
+  for (const Migration& migration : format.migrations) {
+    if (migration.from < version || migration.from >= format.version) continue;
+    if (auto error = database.execute(migration.sql)) return error;
+  }
   return stamp(database, format);
 }
 

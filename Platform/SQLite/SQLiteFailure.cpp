@@ -4,6 +4,7 @@
 #include <sqlite3.h>
 
 #include <cerrno>
+#include <system_error>
 
 #include <Varnel/Platform/Ports/PrivateFiles.h>
 
@@ -62,7 +63,10 @@ SQLiteFailure meaningOfSystem(long code) {
 SQLiteFailure meaningOf(const PlatformError& error) {
   if (error.domain() == domain) return static_cast<SQLiteFailure>(error.code());
   if (error.domain() == privateFileRefusalDomain) return SQLiteFailure::refused;
-  return error.domain() == "SQLite" ? meaningOfSQLite(error.code()) : meaningOfSystem(error.code());
+  if (error.domain() == "SQLite") return meaningOfSQLite(error.code());
+  const bool isSystem = error.domain() == std::generic_category().name() ||
+                        error.domain() == std::system_category().name();
+  return isSystem ? meaningOfSystem(error.code()) : SQLiteFailure::other;
 }
 
 PlatformError fileError(SQLiteFailure meaning, const std::string& description) {

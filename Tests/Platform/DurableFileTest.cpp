@@ -1,74 +1,40 @@
 // SPDX-License-Identifier: MIT
-#include <Varnel/Platform/SQLite/DurableFile.h>
+#include <sys/stat.h>
 
-#include <gtest/gtest.h>
+#include <fstream>
 
+#include <Tests/Platform/DurableNotes.h>
+#include <Tests/Support/OtherProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
-#include <Varnel/Platform/POSIX/Adapters.h>
-#include <Varnel/Platform/Ports/SystemLog.h>
 
 namespace Varnel::Tests {
 namespace {
 
 namespace fs = std::filesystem;
 using namespace Platform;
-using Journal = DurableFormat::Journal;
-using Failure = std::optional<PlatformError>;
 
-class Lines final : public SystemLog {
- public:
-  void write(std::string_view line) override { lines.emplace_back(line); }
-  std::vector<std::string> lines;
-};
-
-DurableFormat notes(Journal journal) {
-  return {.subject = "notes",
-          .applicationID = 0x4E4F5445,
-          .version = {1, 0},
-          .schema = "CREATE TABLE note(id INTEGER PRIMARY KEY, key TEXT NOT NULL UNIQUE)",
-          .migrations = {},
-          .journal = journal,
-          .synchronisation = DurableFormat::Synchronisation::survivesKill,
-          .tables = {{"note", {"key"}}}};
+void overwrite(const fs::path& path, std::streamoff at, const std::string& bytes) {
+  std::fstream file(path, std::ios::in | std::ios::out | std::ios::binary);
+  file.seekp(at);
+  file << bytes;
 }
 
 class DurableFileTest : public testing::TestWithParam<Journal> {
  protected:
-  std::unique_ptr<DurableFile> open() {
-    return std::make_unique<DurableFile>(DurableFile::Ports{*files_, log_}, path_.string(),
-                                         notes(GetParam()), Migrating::allowed);
+  static bool hasLog() { return GetParam() == Journal::writeAhead; }
+  fs::path beside(const char* suffix) const { return path_.string() + suffix; }
+  std::unique_ptr<Notebook> open() const {
+    return std::make_unique<Notebook>(path_, notes(GetParam()));
   }
 
-  static Failure add(DurableFile& file, const std::string& key) {
-    return file.changeByOneStatement([&](SQLiteDatabase& database) -> Failure {
-      const auto insert = database.cached("INSERT OR IGNORE INTO note(key) VALUES(?)");
-      if (!insert) return insert.error();
-      (*insert)->bind(1, key);
-      const auto step = (*insert)->step();
-      return step ? Failure() : step.error();
-    });
-  }
-
-  static std::string keys(DurableFile& file) {
-    std::string found;
-    const auto error = file.read([&](SQLiteDatabase& database) -> Failure {
-      found.clear();
-      const auto rows = database.cached("SELECT key FROM note ORDER BY key");
-      if (!rows) return rows.error();
-      while (true) {
-        const auto step = (*rows)->step();
-        if (!step) return step.error();
-        if (*step == SQLiteStatement::Step::done) return std::nullopt;
-        found += (*rows)->text(0).value_or("");
-      }
-    });
-    return error ? error->description() : found;
+  // Moves all of the log into the file, which then stands alone.
+  void emptyLog() const {
+    auto database = SQLiteDatabase::open(path_, SQLiteDatabase::Access::readWrite);
+    EXPECT_FALSE(database->execute("PRAGMA wal_checkpoint(TRUNCATE)"));
   }
 
   TemporaryFolder folder_;
   const fs::path path_ = folder_.path() / "state" / "notes.sqlite";
-  std::unique_ptr<PrivateFiles> files_ = POSIX::makePrivateFiles();
-  Lines log_;
 };
 
 INSTANTIATE_TEST_SUITE_P(, DurableFileTest, testing::Values(Journal::rollback, Journal::writeAhead),
@@ -79,30 +45,308 @@ INSTANTIATE_TEST_SUITE_P(, DurableFileTest, testing::Values(Journal::rollback, J
 TEST_P(DurableFileTest, KeepsWhatIsTakenAwayUnderIt) {
   struct Case {
     const char* what;
-    std::function<void(const fs::path&)> act;
+    std::function<void()> act;
+    bool isCounted = true;
+    bool isSaid = true;
+    std::string left = "abcd";
+  };
+  const fs::path backup = folder_.path() / "backup";
+  const auto remove = [&](std::initializer_list<const char*> suffixes) {
+    for (const char* suffix : suffixes) fs::remove(beside(suffix));
   };
   const std::vector<Case> cases{
-      {"removed", [](const fs::path& path) { fs::remove(path); }},
-      {"renamed", [](const fs::path& path) { fs::rename(path, path.string() + ".away"); }},
-      {"emptied", [](const fs::path& path) { fs::resize_file(path, 0); }},
-      {"removed with its journals",
-       [](const fs::path& path) {
-         for (const char* suffix : {"", "-wal", "-shm", "-journal"})
-           fs::remove(path.string() + suffix);
+      {"the file removed", [&] { remove({""}); }},
+      {"all files removed",
+       [&] {
+         remove({"", "-wal", "-shm", "-journal"});
        }},
+      {"the folder removed", [&] { fs::remove_all(path_.parent_path()); }},
+      {"the file renamed", [&] { fs::rename(path_, beside(".away")); }},
+      {"the file replaced", [&] { fs::rename(backup, path_); }, false, true, "abcdz"},
+      {"the file emptied", [&] { fs::resize_file(path_, 0); }, true, true,
+       hasLog() ? "abcd" : "bcd"},
+      {"the journal removed", [&] { remove({"-wal"}); }, hasLog(), hasLog()},
+      {"the journals removed",
+       [&] {
+         remove({"-wal", "-shm", "-journal"});
+       },
+       hasLog(), hasLog()},
+      {"the journal replaced",
+       [&] {
+         std::ofstream(beside("-new"));
+         fs::rename(beside("-new"), beside("-wal"));
+       },
+       hasLog(), hasLog()},
+  };
+  for (const Case& one : cases) {
+    // By a statement, by a transaction, and between a commit and its answer.
+    for (const int when : {1, 2, 3}) {
+      SCOPED_TRACE(std::string(one.what) + ", found by way " + std::to_string(when));
+      fs::remove_all(path_.parent_path());
+      EXPECT_EQ(Notebook(backup, notes(Journal::rollback)).add("z"), "kept");
+      auto book = open();
+      EXPECT_EQ(book->add("a"), "kept");
+      bool isDone = false;
+      const auto actOnce = [&] {
+        if (!std::exchange(isDone, true)) one.act();
+      };
+      if (when < 3) actOnce();
+      EXPECT_EQ(when == 2 ? book->change("b") : book->add("b", actOnce), "kept");
+      EXPECT_EQ(book->add("c"), "kept");
+      EXPECT_EQ(open()->add("d"), "kept");
+      // Without a log, what a file held is gone with it; nothing accepted since is.
+      EXPECT_EQ(open()->keys(), one.left);
+      EXPECT_EQ(book->file.damageCount(), one.isCounted ? 1 : 0);
+      EXPECT_EQ(book->log.lines.size(), one.isSaid ? 1u : 0u);
+    }
+  }
+}
+
+TEST_P(DurableFileTest, SetsADamagedFileAsideAndSavesItsRows) {
+  struct Case {
+    const char* what;
+    std::function<void()> act;
+    bool isSalvaged;
+  };
+  constexpr int rows = 2000;
+  const std::vector<Case> cases{
+      {"no database", [&] { std::ofstream(path_) << std::string(20000, 'x'); }, false},
+      {"a damaged header", [&] { overwrite(path_, 0, std::string(100, '\0')); }, false},
+      {"damaged pages", [&] { overwrite(path_, 6 * 4096, std::string(2 * 4096, 'x')); }, true},
+      {"half a file", [&] { fs::resize_file(path_, fs::file_size(path_) / 2); }, true},
+      {"without its table",
+       [&] {
+         auto database = SQLiteDatabase::open(path_, SQLiteDatabase::Access::readWrite);
+         EXPECT_FALSE(database->execute("DROP TABLE note"));
+       },
+       false},
   };
   for (const Case& one : cases) {
     SCOPED_TRACE(one.what);
     fs::remove_all(path_.parent_path());
-    auto file = open();
-    EXPECT_FALSE(add(*file, "a"));
-    one.act(path_);
-    EXPECT_FALSE(add(*file, "b"));
-    const bool isReadable = GetParam() == Journal::writeAhead || std::string(one.what) != "emptied";
-    EXPECT_EQ(keys(*file), isReadable ? "ab" : "b");
-    EXPECT_EQ(keys(*open()), isReadable ? "ab" : "b");
-    EXPECT_EQ(file->damageCount(), 1);
+    const auto error = open()->file.change([&](SQLiteDatabase& database) -> Failure {
+      for (int row = 0; row < rows; ++row)
+        if (auto failure = Notebook::insert(database, std::to_string(row) + std::string(40, '.')))
+          return failure;
+      return std::nullopt;
+    });
+    ASSERT_FALSE(error);
+    emptyLog();
+    one.act();
+    auto book = open();
+    EXPECT_EQ(book->add("new"), "kept");
+    EXPECT_EQ(book->log.lines.size(), 1u) << testing::PrintToString(book->log.lines);
+    EXPECT_TRUE(fs::exists(beside(".damaged")));
+    EXPECT_FALSE(fs::exists(beside(".salvage")));
+    const auto count = [](Notebook& asked) {
+      std::int64_t found = 0;
+      EXPECT_FALSE(asked.file.read([&](SQLiteDatabase& database) -> Failure {
+        found = database.integer("SELECT count(*) FROM note")->value_or(0);
+        return std::nullopt;
+      }));
+      return found;
+    };
+    EXPECT_GE(count(*book), one.isSalvaged ? rows / 4 : 1);
+    EXPECT_EQ(count(*open()), count(*book));
+    EXPECT_EQ(open()->file.damageCount(), 1);
+    book->file.removeSetAside();
+    EXPECT_FALSE(fs::exists(beside(".damaged")));
   }
+}
+
+TEST_P(DurableFileTest, FourProcessesThatFindDamageAtOnceLoseNothing) {
+  for (int round = 0; round < (hasLog() ? 10 : 2); ++round) {
+    fs::remove_all(path_.parent_path());
+    inChild(::geteuid(), [&] {
+      EXPECT_EQ(open()->add("old"), "kept");
+      emptyLog();
+    });
+    overwrite(path_, 0, std::string(100, 'x'));
+    int start[2];
+    ASSERT_EQ(::pipe(start), 0);
+    std::vector<pid_t> children;
+    for (char name = 'a'; name < 'e'; ++name) {
+      children.push_back(::fork());
+      if (children.back() != 0) continue;
+      ::close(start[1]);
+      char byte = 0;
+      static_cast<void>(::read(start[0], &byte, 1));
+      auto book = open();
+      for (char number = 'a'; number < 'i'; ++number)
+        while (book->add(std::string{name, number}) == "busy") continue;
+      ::_exit(static_cast<int>(book->log.lines.size()));
+    }
+    ::close(start[0]);
+    ::close(start[1]);
+    int lines = 0;
+    for (const pid_t child : children) {
+      int status = 0;
+      ::waitpid(child, &status, 0);
+      lines += WEXITSTATUS(status);
+    }
+    EXPECT_EQ(lines, 1);
+    inChild(::geteuid(), [&] {
+      auto book = open();
+      EXPECT_EQ(book->keys().size(), 4u * 8 * 2);
+      EXPECT_EQ(book->file.damageCount(), 1);
+    });
+  }
+}
+
+TEST_P(DurableFileTest, AKillWhileDamageIsMendedLosesNothing) {
+  int call = 0;
+  for (bool isKilled = true; isKilled;) {
+    SCOPED_TRACE(++call);
+    fs::remove_all(path_.parent_path());
+    inChild(::geteuid(), [&] {
+      EXPECT_EQ(open()->add("a"), "kept");
+      emptyLog();
+      auto database = SQLiteDatabase::open(path_, SQLiteDatabase::Access::existing);
+      EXPECT_FALSE(
+          database->execute("CREATE TABLE more(data); INSERT INTO more VALUES("
+                            "zeroblob(30000))"));
+      emptyLog();
+      // Rows behind the damage are in the log alone.
+      EXPECT_EQ(open()->add("b"), "kept");
+    });
+    fs::resize_file(path_, fs::file_size(path_) - 8192);
+    const pid_t child = ::fork();
+    if (child == 0) {
+      MortalFiles files(call);
+      Notebook book(path_, notes(GetParam()), Migrating::allowed, &files);
+      ::_exit(book.add("c") == "kept" ? 0 : 1);
+    }
+    int status = 0;
+    ::waitpid(child, &status, 0);
+    isKilled = WIFSIGNALED(status);
+    EXPECT_TRUE(isKilled || WEXITSTATUS(status) == 0);
+    inChild(::geteuid(), [&] {
+      auto book = open();
+      EXPECT_EQ(book->add("d"), "kept");
+      EXPECT_EQ(book->keys(), isKilled && book->keys() == "abd" ? "abd" : "abcd");
+      EXPECT_EQ(open()->keys(), book->keys());
+      EXPECT_FALSE(fs::exists(beside(".salvage")));
+      const auto times = book->file.damageCount();
+      EXPECT_TRUE(times == 1 || (isKilled && times == 2)) << times;
+    });
+  }
+  EXPECT_GT(call, 20);
+}
+
+// One file of each format that ever was lies in Data.
+TEST(DurableFormatTest, OnlyTheProductsOwnHostMigrates) {
+  const auto later = [](FormatVersion version) {
+    DurableFormat format = notes(Journal::rollback);
+    format.version = version;
+    format.migrations = {
+        {{1, 0}, "ALTER TABLE note ADD COLUMN text TEXT NOT NULL DEFAULT 'none'"},
+        {{1, 1}, "CREATE TABLE place(name TEXT); DELETE FROM note WHERE key = 'b'"}};
+    return format;
+  };
+  auto broken = later({2, 0});
+  broken.migrations[1].sql += "; nonsense";
+  struct Case {
+    const char* what;
+    DurableFormat format;
+    Migrating migrating;
+    const char* keys;
+    std::int64_t version;
+  };
+  const std::vector<Case> cases{
+      {"the same", later({1, 0}), Migrating::allowed, "abc", 1000},
+      {"a later minor, its own host", later({1, 1}), Migrating::allowed, "abc", 1001},
+      {"a later minor, another", later({1, 1}), Migrating::never, "abc", 1000},
+      {"a later major, its own host", later({2, 0}), Migrating::allowed, "ac", 2000},
+      {"a later major, another", later({2, 0}), Migrating::never, "older", 1000},
+      {"an earlier major", later({0, 9}), Migrating::allowed, "newer", 1000},
+      {"a migration that fails", broken, Migrating::allowed, nullptr, 1000},
+  };
+  const fs::path golden = fs::path(VARNEL_TEST_DATA) / "notes-1.0.sqlite";
+  for (const Case& one : cases) {
+    SCOPED_TRACE(one.what);
+    const TemporaryFolder folder;
+    const fs::path path = folder.path() / "notes.sqlite";
+    fs::copy_file(golden, path);
+    Notebook book(path, one.format, one.migrating);
+    const std::string keys = book.keys();
+    EXPECT_TRUE(one.keys ? keys == one.keys : keys.find("nonsense") != keys.npos) << keys;
+    auto database = SQLiteDatabase::open(path, SQLiteDatabase::Access::readOnly);
+    EXPECT_EQ(*database->integer("PRAGMA user_version"), one.version);
+    EXPECT_EQ(*database->integer("SELECT count(*) FROM note"), one.version == 2000 ? 2 : 3);
+    EXPECT_FALSE(fs::exists(path.string() + ".damaged"));
+    // One who has the file open meanwhile notices, and one of an earlier minor version goes on.
+    Notebook old(path, notes(Journal::rollback), Migrating::never);
+    Notebook(path, later({1, 1}), Migrating::allowed).keys();
+    EXPECT_EQ(old.change("e"), one.version == 2000 ? "newer" : "kept");
+    Notebook(path, later({2, 0}), Migrating::allowed).keys();
+    for (int time = 0; time < 3; ++time) EXPECT_EQ(old.change("f"), "newer");
+    EXPECT_EQ(old.log.lines.size(), 1u);
+  }
+}
+
+TEST_P(DurableFileTest, NobodyWaitsLongForALockOfAnother) {
+  ASSERT_EQ(open()->add("a"), "kept");
+  std::unique_ptr<FileLock> lock;
+  std::optional<SQLiteDatabase> database;
+  const OtherProcess writer([&] {
+    database = std::move(*SQLiteDatabase::open(path_, SQLiteDatabase::Access::existing));
+    return !database->execute("BEGIN EXCLUSIVE");
+  });
+  ASSERT_TRUE(writer.isReady());
+  auto book = open();
+  const auto begin = std::chrono::steady_clock::now();
+  for (int time = 0; time < 5; ++time) {
+    EXPECT_EQ(book->add("b"), "busy");
+    EXPECT_EQ(book->change("c"), "busy");
+  }
+  const OtherProcess opener([&] {
+    lock = std::move(*POSIX::makePrivateFiles()->tryLock(beside(".opening")));
+    return lock != nullptr;
+  });
+  ASSERT_TRUE(opener.isReady());
+  EXPECT_EQ(open()->add("d"), "busy");
+  // Eleven times 20 ms, and time for a machine that has much to do.
+  EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(2));
+  EXPECT_TRUE(book->log.lines.empty());
+}
+
+TEST_P(DurableFileTest, ASecondObjectOfTheProcessLeavesTheLocksOfTheFirst) {
+  ASSERT_EQ(open()->add("a"), "kept");
+  int ask[2];
+  ASSERT_EQ(::pipe(ask), 0);
+  int answer[2];
+  ASSERT_EQ(::pipe(answer), 0);
+  const pid_t other = ::fork();
+  if (other == 0) {
+    char byte = 0;
+    static_cast<void>(::read(ask[0], &byte, 1));
+    byte = open()->change("x") == "busy" ? 1 : 0;
+    static_cast<void>(::write(answer[1], &byte, 1));
+    ::_exit(0);
+  }
+  char isLocked = 0;
+  EXPECT_FALSE(open()->file.change([&](SQLiteDatabase& database) {
+    open()->keys();
+    EXPECT_EQ(open()->change("c"), "busy");
+    char byte = 0;
+    EXPECT_EQ(::write(ask[1], &byte, 1), 1);
+    EXPECT_EQ(::read(answer[0], &isLocked, 1), 1);
+    return Notebook::insert(database, "b");
+  }));
+  ::waitpid(other, nullptr, 0);
+  EXPECT_EQ(isLocked, 1);
+  EXPECT_EQ(open()->keys(), "ab");
+}
+
+TEST_P(DurableFileTest, AForkedChildLeavesTheFileToItsParent) {
+  auto book = open();
+  ASSERT_EQ(book->add("a"), "kept");
+  inChild(::geteuid(), [&] {
+    EXPECT_EQ(book->add("x"), "refused");
+    book.reset();
+  });
+  EXPECT_EQ(book->add("b"), "kept");
+  EXPECT_EQ(book->keys(), "ab");
 }
 
 }  // namespace

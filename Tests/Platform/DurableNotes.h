@@ -1,0 +1,172 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <signal.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <filesystem>
+#include <functional>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/SQLite/DurableFile.h>
+
+/// A small format, and what tests do with a durable file of it.
+namespace Varnel::Tests {
+
+using Failure = std::optional<Platform::PlatformError>;
+using Journal = Platform::DurableFormat::Journal;
+
+inline Platform::DurableFormat notes(Journal journal) {
+  return {.subject = "notes",
+          .applicationID = 0x4E4F5445,
+          .version = {1, 0},
+          .schema = "CREATE TABLE note(id INTEGER PRIMARY KEY, key TEXT NOT NULL UNIQUE)",
+          .migrations = {},
+          .journal = journal,
+          .synchronisation = Platform::DurableFormat::Synchronisation::survivesKill,
+          .tables = {{"note", {"key"}}}};
+}
+
+/// Keeps what the system's log would be told.
+class Lines final : public Platform::SystemLog {
+ public:
+  void write(std::string_view line) override { lines.emplace_back(line); }
+  std::vector<std::string> lines;
+};
+
+/// A durable file with the log that it writes to.
+struct Notebook final {
+  explicit Notebook(const std::filesystem::path& path, Platform::DurableFormat format,
+                    Platform::Migrating migrating = Platform::Migrating::allowed,
+                    Platform::PrivateFiles* files = nullptr)
+      : file({files ? *files : *ownFiles, log}, path.string(), std::move(format), migrating) {}
+
+  /// By one statement, and whether it was kept: "kept", or what the error means.
+  std::string add(const std::string& key, const std::function<void()>& afterwards = {}) {
+    return meaning(file.changeByOneStatement([&](Platform::SQLiteDatabase& database) {
+      auto error = insert(database, key);
+      if (afterwards) afterwards();
+      return error;
+    }));
+  }
+
+  /// The same in a transaction.
+  std::string change(const std::string& key) {
+    return meaning(
+        file.change([&](Platform::SQLiteDatabase& database) { return insert(database, key); }));
+  }
+
+  /// All keys in a row, or what the error means.
+  std::string keys() {
+    std::string found;
+    const auto error = file.read([&](Platform::SQLiteDatabase& database) -> Failure {
+      found.clear();
+      const auto rows = database.cached("SELECT key FROM note ORDER BY key");
+      if (!rows) return rows.error();
+      while (true) {
+        const auto step = (*rows)->step();
+        if (!step) return step.error();
+        if (*step == Platform::SQLiteStatement::Step::done) return std::nullopt;
+        found += (*rows)->text(0).value_or("");
+      }
+    });
+    return error ? meaning(error) : found;
+  }
+
+  static Failure insert(Platform::SQLiteDatabase& database, const std::string& key) {
+    const auto insert = database.cached("INSERT OR IGNORE INTO note(key) VALUES(?)");
+    if (!insert) return insert.error();
+    (*insert)->bind(1, key);
+    const auto step = (*insert)->step();
+    return step ? Failure() : step.error();
+  }
+
+  static std::string meaning(const Failure& error) {
+    if (!error) return "kept";
+    switch (meaningOf(*error)) {
+      case Platform::SQLiteFailure::busy:
+        return "busy";
+      case Platform::SQLiteFailure::damaged:
+        return "damaged";
+      case Platform::SQLiteFailure::full:
+        return "full";
+      case Platform::SQLiteFailure::readOnly:
+        return "read-only";
+      case Platform::SQLiteFailure::newer:
+        return "newer";
+      case Platform::SQLiteFailure::older:
+        return "older";
+      case Platform::SQLiteFailure::refused:
+        return "refused";
+      case Platform::SQLiteFailure::other:
+        break;
+    }
+    return error->description();
+  }
+
+  std::unique_ptr<Platform::PrivateFiles> ownFiles = Platform::POSIX::makePrivateFiles();
+  Lines log;
+  Platform::DurableFile file;
+};
+
+/// The user's own files, in a process that is killed before call number `lastCall` to them.
+class MortalFiles final : public Platform::PrivateFiles {
+ public:
+  explicit MortalFiles(int lastCall) : left_(lastCall) {}
+
+  Platform::Result<std::string> prepare(const std::string& path) override {
+    return call().prepare(path);
+  }
+  std::error_code protect(const std::string& path) override { return call().protect(path); }
+  std::optional<Platform::FileIdentity> identity(const std::string& path) override {
+    return call().identity(path);
+  }
+  std::unique_ptr<Platform::HeldFile> hold(const std::string& path) override {
+    return call().hold(path);
+  }
+  Platform::Result<std::unique_ptr<Platform::FileLock>> tryLock(const std::string& path) override {
+    return call().tryLock(path);
+  }
+  std::error_code rename(const std::string& from, const std::string& to) override {
+    return call().rename(from, to);
+  }
+  std::error_code remove(const std::string& path) override { return call().remove(path); }
+
+ private:
+  Platform::PrivateFiles& call() {
+    if (--left_ == 0) ::raise(SIGKILL);
+    return *files_;
+  }
+
+  const std::unique_ptr<Platform::PrivateFiles> files_ = Platform::POSIX::makePrivateFiles();
+  int left_;
+};
+
+/// Does the rest of a test in a process of its own, as this user; its failures are the test's.
+inline void inChild(uid_t user, const std::function<void()>& act) {
+  const pid_t child = ::fork();
+  if (child == 0) {
+    if (user != ::geteuid() && (::setgid(user) != 0 || ::setuid(user) != 0)) ::_exit(2);
+    act();
+    ::_exit(testing::Test::HasFailure() ? 1 : 0);
+  }
+  int status = 0;
+  ::waitpid(child, &status, 0);
+  EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0) << "in a process of user " << user;
+}
+
+/// Everybody a test can be: itself and, where that is root, an ordinary user as well.
+inline std::vector<uid_t> users() {
+  constexpr uid_t ordinary = 65534;
+  if (::geteuid() == 0) return {0, ordinary};
+  return {::geteuid()};
+}
+
+}  // namespace Varnel::Tests
