@@ -9,9 +9,14 @@
 #include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Values/URL.h>
 
+namespace Varnel::Platform {
+class ReadingPriority;
+}
+
 namespace Varnel {
 
 class DiskAccessManager;
+class DiskReadingCore;
 class OVDiskInfo;
 
 /// Gives turns on the disks to readers of any number, and never to more at once on a disk than its
@@ -32,7 +37,8 @@ class OVDiskInfo;
 ///
 /// Any thread, callbacks included. No call waits for a disk, and a stop or a time-out is answered
 /// at once, whatever the disk does. A callback that waits for an executor holds no place: one that
-/// the executor does not begin within a turn's time is put off.
+/// the executor does not begin within a turn's time is put off. In a forked child, where its
+/// threads are missing, a queue answers everything with `stopped`, within the call.
 class VARNEL_API DiskReadingQueue final {
  public:
   /// Reads one file inside a place on its disk, at once or, like a task, in several calls.
@@ -40,8 +46,16 @@ class VARNEL_API DiskReadingQueue final {
   /// Is told once for each file how its reading ended.
   using DidEnd = std::function<void(const DiskReadingFile&, DiskReadingResult)>;
 
-  /// The manager outlives the queue.
+  /// What a queue asks beside its manager. The priority outlives the queue.
+  struct Ports {
+    Platform::ReadingPriority& readingPriority;
+    DiskReadingTurn::Now now = DiskReadingTurn::Clock::now;  ///< Measures turns.
+  };
+
+  /// The manager outlives the queue. Both throw `std::system_error` when the system grants no
+  /// thread.
   explicit DiskReadingQueue(DiskAccessManager& manager);
+  DiskReadingQueue(DiskAccessManager& manager, Ports ports);
 
   /// Stops everything, and waits for callbacks that are running on other threads and for look-ups
   /// of volumes. Afterwards nothing is called back but results that an executor still has to
@@ -72,9 +86,8 @@ class VARNEL_API DiskReadingQueue final {
       const Platform::URL& volumeURL) const;
 
  private:
-  class Core;
-
-  const std::shared_ptr<Core> core_;
+  const std::shared_ptr<DiskReadingCore> core_;
+  const unsigned process_;  ///< Grows with each fork.
 };
 
 }  // namespace Varnel

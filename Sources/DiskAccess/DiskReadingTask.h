@@ -134,7 +134,8 @@ struct DiskReadingOptions {
   std::string propose{};
 
   /// The class in which to wait. In the two lowest classes the thread's reading also gives way to
-  /// that of other programs, as far as the system knows how.
+  /// that of other programs, as far as the system knows how, and so does that of threads which a
+  /// callback starts.
   Platform::QualityOfService qos = Platform::QualityOfService::utility;
 
   /// How many seconds a file, or a task, may wait for its first turn. None, not a number or beyond
