@@ -18,6 +18,7 @@ class NotificationServer;
 class PrivateFiles;
 class ProcessInfo;
 class ProcessLauncher;
+class ReadingPriority;
 class SoundPlayer;
 class StandardOutput;
 class SystemLog;
@@ -50,6 +51,7 @@ class MountTable;
 /// `root` is the folder below which /proc lies.
 [[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo(const std::string& root = "/");
 [[nodiscard]] std::unique_ptr<ProcessLauncher> makeProcessLauncher();
+[[nodiscard]] std::unique_ptr<ReadingPriority> makeReadingPriority();
 /// `root` is the folder below which /etc/localtime lies.
 [[nodiscard]] std::unique_ptr<TimeZones> makeTimeZones(const std::string& root = "/");
 [[nodiscard]] std::unique_ptr<MainQueue> makeMainQueue();

@@ -14,6 +14,7 @@
 #include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/ProcessInfo.h>
 #include <Varnel/Platform/Ports/ProcessLauncher.h>
+#include <Varnel/Platform/Ports/ReadingPriority.h>
 #include <Varnel/Platform/Ports/SecurityScope.h>
 #include <Varnel/Platform/Ports/SoundPlayer.h>
 #include <Varnel/Platform/Ports/StandardOutput.h>
@@ -72,6 +73,7 @@ const Ports& systemPorts() {
       .privateFiles = privateFiles,
       .processInfo = keep(Linux::makeProcessInfo()),
       .processLauncher = keep(Linux::makeProcessLauncher()),
+      .readingPriority = keep(Linux::makeReadingPriority()),
       .securityScope = keep(POSIX::makeSecurityScope()),
       .soundPlayer = keep(Linux::makeSoundPlayer(systemLog, mainQueue)),
       .standardOutput = keep(Linux::makeStandardOutput()),

@@ -32,6 +32,7 @@ Ports Ports::withStandardOutput(StandardOutput& output) const {
       .privateFiles = privateFiles,
       .processInfo = processInfo,
       .processLauncher = processLauncher,
+      .readingPriority = readingPriority,
       .securityScope = securityScope,
       .soundPlayer = soundPlayer,
       .standardOutput = output,

@@ -19,6 +19,7 @@ class MainQueue;
 class PrivateFiles;
 class ProcessInfo;
 class ProcessLauncher;
+class ReadingPriority;
 class SecurityScope;
 class SoundPlayer;
 class StandardOutput;
@@ -51,6 +52,7 @@ struct Ports {
   PrivateFiles& privateFiles;
   ProcessInfo& processInfo;
   ProcessLauncher& processLauncher;
+  ReadingPriority& readingPriority;
   SecurityScope& securityScope;
   SoundPlayer& soundPlayer;
   StandardOutput& standardOutput;

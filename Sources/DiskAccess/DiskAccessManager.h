@@ -22,6 +22,8 @@ class VolumeCatalog;
 
 namespace Varnel {
 
+class DiskAccessState;
+
 /// Admits the threads of the process to each physical disk: as many as suit its kind come in at
 /// once, the others wait and come in by quality of service. A place that comes free lets in all
 /// waiting threads, so under a steady rush there are more readers than that.
@@ -86,14 +88,9 @@ class VARNEL_API DiskAccessManager final {
       const std::optional<Platform::URL>& volumeURL = {});
 
  private:
-  class State;
+  friend class DiskReadingQueue;
 
-  [[nodiscard]] std::unique_ptr<DiskAccessingSession> beginAccessingVolume(
-      const Platform::URL& volumeURL, std::string propose, const Platform::URL& url,
-      Platform::QualityOfService qos, bool enableSecureScopedAccess,
-      std::optional<Platform::TimeInterval> accessWaitingTimeout);
-
-  const std::shared_ptr<State> state_;
+  const std::shared_ptr<DiskAccessState> state_;
   std::vector<Basalt::NotificationCenter::Observer> notificationCenterObservers_;
 };
 

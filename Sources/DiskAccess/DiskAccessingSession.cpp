@@ -59,6 +59,16 @@ bool DiskAccessingSession::waitForAdmission(Platform::QualityOfService qos,
   return true;
 }
 
+void DiskAccessingSession::passFrom(Basalt::ThreadID thread) {
+  const Basalt::ThreadID current = Basalt::currentThreadID();
+  diskData_->queue().sync([&] {
+    diskData_->confirmAccess(current);
+    records_->add({current, diskData_, volumeURL_});
+    diskData_->releaseAccess(thread);
+    records_->remove(thread, diskData_, volumeURL_);
+  });
+}
+
 void DiskAccessingSession::endAccessing() {
   isAccessing_ = false;
   const Basalt::ThreadID thread = Basalt::currentThreadID();

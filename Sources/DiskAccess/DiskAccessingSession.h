@@ -5,6 +5,7 @@
 #include <optional>
 #include <string>
 
+#include <Varnel/Basalt/ThreadID.h>
 #include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Values/Date.h>
 #include <Varnel/Platform/Values/QualityOfService.h>
@@ -57,10 +58,13 @@ class VARNEL_API DiskAccessingSession final {
   void endAccessing();
 
  private:
-  friend class DiskAccessManager;
+  friend class DiskAccessState;
+  friend class DiskReadingCore;
 
   [[nodiscard]] bool beginAccessing(Platform::QualityOfService qos,
                                     std::optional<Platform::TimeInterval> waitingTimeout);
+  /// Makes the place, and the session, the calling thread's.
+  void passFrom(Basalt::ThreadID thread);
   [[nodiscard]] bool waitForAdmission(Platform::QualityOfService qos,
                                       std::optional<Platform::TimeInterval> waitingTimeout);
 

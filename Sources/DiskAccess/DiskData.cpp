@@ -8,7 +8,6 @@
 #include <Varnel/DiskAccess/OVDiskInfo.h>
 
 namespace Varnel {
-namespace {
 
 int urgencyClassOf(Platform::QualityOfService qos) {
   switch (qos) {
@@ -24,8 +23,6 @@ int urgencyClassOf(Platform::QualityOfService qos) {
   }
   return 0;
 }
-
-}  // namespace
 
 DiskData::DiskData(std::shared_ptr<const OVDiskInfo> diskInfo, bool isBackgroundMode,
                    std::shared_ptr<Basalt::SerialQueue> queue)

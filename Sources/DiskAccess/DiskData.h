@@ -21,6 +21,10 @@ namespace Varnel {
 
 class OVDiskInfo;
 
+/// The class of urgency in which a quality of service waits: 0 comes first.
+[[nodiscard]] int urgencyClassOf(Platform::QualityOfService qos);
+inline constexpr int urgencyClassCount = 4;
+
 /// The record of one disk: the threads that access it and those that wait. `DiskAccessManager`
 /// keeps one for each disk.
 ///

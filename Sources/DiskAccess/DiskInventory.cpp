@@ -4,10 +4,10 @@
 #include <string_view>
 #include <utility>
 
+#include <Varnel/DiskAccess/InventedIdentifiers.h>
 #include <Varnel/Platform/Ports/DeviceRegistry.h>
 #include <Varnel/Platform/Ports/DiskArbitration.h>
 #include <Varnel/Platform/Ports/VolumeCatalog.h>
-#include <Varnel/Platform/Values/UUID.h>
 
 namespace Varnel::DiskInventory {
 namespace {
@@ -32,15 +32,19 @@ void collectNames(const RegistryEntry& entry, std::set<std::string>& names) {
 }
 
 std::shared_ptr<const OVDiskInfo> diskOfService(std::shared_ptr<const RegistryEntry> service,
-                                                Platform::DiskArbitration& disks) {
+                                                Platform::DiskArbitration& disks,
+                                                InventedIdentifiers& identifiers) {
   const auto device = serviceForDevice(service);
   if (!device) return nullptr;
   const PropertyDictionary characteristics =
       characteristicsForDevice(*service).value_or(PropertyDictionary());
   const auto* medium = findAs<std::string>(characteristics, mediumType);
   const auto* serial = findAs<std::string>(characteristics, serialNumber);
+  auto volumes = volumeURLsForDevice(*device, disks);
+  auto uniqueID =
+      serial ? *serial : identifiers.identifierFor(volumes.value_or(OVDiskInfo::VolumeURLs()));
   return std::make_shared<OVDiskInfo>(
-      serial ? *serial : Platform::randomUUIDString(), volumeURLsForDevice(*device, disks),
+      std::move(uniqueID), std::move(volumes),
       medium && *medium == solidState ? OVDiskKindSolidState : OVDiskKindRotational);
 }
 
@@ -50,26 +54,29 @@ OVDiskKind kindOf(const MountedVolume& volume) {
   return OVDiskKindUnknown;
 }
 
-std::shared_ptr<const OVDiskInfo> diskOfVolume(const MountedVolume& volume) {
-  return std::make_shared<OVDiskInfo>(volume.uuid ? *volume.uuid : Platform::randomUUIDString(),
-                                      OVDiskInfo::VolumeURLs{volume.url}, kindOf(volume));
+std::shared_ptr<const OVDiskInfo> diskOfVolume(const MountedVolume& volume,
+                                               InventedIdentifiers& identifiers) {
+  OVDiskInfo::VolumeURLs volumes{volume.url};
+  auto uniqueID = volume.uuid ? *volume.uuid : identifiers.identifierFor(volumes);
+  return std::make_shared<OVDiskInfo>(std::move(uniqueID), std::move(volumes), kindOf(volume));
 }
 
 }  // namespace
 
-OVDiskInfo::Array take(OVDiskInfo::Ports ports) {
+OVDiskInfo::Array take(OVDiskInfo::Ports ports, InventedIdentifiers& identifiers) {
   OVDiskInfo::Array result;
   OVDiskInfo::VolumeURLs claimed;
   if (auto services = ports.devices.entriesMatchingProperty(smartCapable, true)) {
     for (auto& service : *services) {
-      auto disk = diskOfService(std::move(service), ports.disks);
+      auto disk = diskOfService(std::move(service), ports.disks, identifiers);
       if (!disk) continue;
       if (const auto& urls = disk->volumeURLs()) claimed.insert(urls->begin(), urls->end());
       result.push_back(std::move(disk));
     }
   }
   for (const MountedVolume& volume : ports.volumes.mountedVolumes())
-    if (!claimed.contains(volume.url)) result.push_back(diskOfVolume(volume));
+    if (!claimed.contains(volume.url)) result.push_back(diskOfVolume(volume, identifiers));
+  identifiers.endInventory();
   return result;
 }
 

@@ -8,11 +8,16 @@
 
 #include <Varnel/DiskAccess/OVDiskInfo.h>
 
+namespace Varnel {
+class InventedIdentifiers;
+}
+
 /// How the devices of the registry and the mounted volumes become disks. `OVDiskInfo` is the public
 /// face of these functions and describes them. No state; any thread.
 namespace Varnel::DiskInventory {
 
-[[nodiscard]] OVDiskInfo::Array take(OVDiskInfo::Ports ports);
+/// A disk that tells no identifier gets one from `identifiers`.
+[[nodiscard]] OVDiskInfo::Array take(OVDiskInfo::Ports ports, InventedIdentifiers& identifiers);
 
 [[nodiscard]] std::shared_ptr<const Platform::RegistryEntry> serviceForDevice(
     std::shared_ptr<const Platform::RegistryEntry> entry);

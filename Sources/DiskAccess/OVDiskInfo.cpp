@@ -5,6 +5,7 @@
 #include <utility>
 
 #include <Varnel/DiskAccess/DiskInventory.h>
+#include <Varnel/DiskAccess/InventedIdentifiers.h>
 #include <Varnel/Platform/Ports/DeviceRegistry.h>
 #include <Varnel/Platform/Ports/Ports.h>
 
@@ -41,7 +42,8 @@ OVDiskInfo::Array OVDiskInfo::allDiskInfos() {
 }
 
 OVDiskInfo::Array OVDiskInfo::allDiskInfos(Ports ports) {
-  return DiskInventory::take(ports);
+  InventedIdentifiers identifiers;
+  return DiskInventory::take(ports, identifiers);
 }
 
 std::shared_ptr<const Platform::RegistryEntry> OVDiskInfo::serviceForDevice(

@@ -63,7 +63,8 @@ class VARNEL_API OVDiskInfo final {
   [[nodiscard]] static Array allDiskInfos(Ports ports);
 
   /// Identifies the device; equality and hash use it alone. A device that tells no serial number
-  /// has a new one in each inventory.
+  /// has a new one in each inventory; only a manager's inventories remember it while one of the
+  /// device's volumes stays mounted.
   [[nodiscard]] const std::optional<std::string>& uniqueID() const { return uniqueID_; }
 
   /// The roots of the mounted volumes on this device; absent when they could not be told.

@@ -16,6 +16,11 @@ Basalt::Notification notificationOf(const Platform::VolumeChange& change) {
 
 }  // namespace
 
+std::optional<Platform::URL> volumeURLOf(const Basalt::Notification& notification) {
+  const auto* text = Platform::findAs<std::string>(notification.userInfo, volumeURLKey);
+  return text ? Platform::URL::parse(*text) : std::nullopt;
+}
+
 VolumeChangeRelay::VolumeChangeRelay(Platform::VolumeCatalog& volumes,
                                      const Basalt::NotificationCenter& center)
     : subscription_(volumes.subscribe([&center](const Platform::VolumeChange& change) {

@@ -2,14 +2,17 @@
 #pragma once
 
 #include <memory>
+#include <optional>
 #include <string_view>
 
 #include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Ports/VolumeCatalog.h>
+#include <Varnel/Platform/Values/URL.h>
 
 namespace Basalt {
 class NotificationCenter;
-}
+struct Notification;
+}  // namespace Basalt
 
 namespace Varnel {
 
@@ -19,6 +22,10 @@ inline constexpr std::string_view didUnmountNotification = "NSWorkspaceDidUnmoun
 
 /// The key of the volume's URL, a text, in the user information of either.
 inline constexpr std::string_view volumeURLKey = "NSWorkspaceVolumeURLKey";
+
+/// The volume that such a notification tells of, if it names one.
+[[nodiscard]] VARNEL_API std::optional<Platform::URL> volumeURLOf(
+    const Basalt::Notification& notification);
 
 /// Posts a notification for each volume that comes or goes, on the catalogue's thread, as long as
 /// the relay lives. Both sides must outlive it. The process has one for its default center, which

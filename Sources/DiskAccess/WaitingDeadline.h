@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <optional>
 
 #include <Varnel/Platform/Values/Date.h>
@@ -20,6 +21,17 @@ namespace Varnel {
   // False for what is not a number. Close to the end of time the sum would be inexact.
   if (!(Seconds(*timeout) < rest / 2)) return Platform::Date::max();
   return now + std::chrono::duration_cast<Platform::Date::duration>(Seconds(*timeout));
+}
+
+/// The same as a span of time that a clock which is never set can measure: none for ever.
+[[nodiscard]] inline std::optional<std::chrono::nanoseconds> maxWaitingTime(
+    std::optional<Platform::TimeInterval> timeout) {
+  constexpr Platform::TimeInterval forEver = 1e9;
+  if (!timeout) return std::nullopt;
+  if (*timeout <= 0) return std::chrono::nanoseconds::zero();
+  if (!(*timeout < forEver)) return std::nullopt;
+  using Seconds = std::chrono::duration<Platform::TimeInterval>;
+  return std::chrono::duration_cast<std::chrono::nanoseconds>(Seconds(*timeout));
 }
 
 }  // namespace Varnel

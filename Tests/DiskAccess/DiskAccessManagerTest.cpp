@@ -115,6 +115,31 @@ TEST_F(DiskAccessManagerTest, AVolumeOverTwoDisksBelongsToTheLast) {
   EXPECT_EQ(DiskAccessGuard(begin(homeFile))->diskInfo()->uniqueID(), "HDD-2");
 }
 
+TEST_F(DiskAccessManagerTest, AnInventedIdentifierLastsAsLongAsItsVolumeStaysMounted) {
+  const auto identifier = [&](const URL& volume) {
+    return *DiskAccessGuard(
+                manager_->beginAccessingURL(volume, "test", QoS::utility, false, {}, volume))
+                ->diskInfo()
+                ->uniqueID();
+  };
+  mount(archiveVolume);
+  const std::string invented = identifier(archiveVolume);
+  {
+    const DiskAccessGuard onlyPlace(begin(archiveVolume));
+    mount(stickVolume);
+    EXPECT_EQ(identifier(archiveVolume), invented);
+    EXPECT_NE(identifier(stickVolume), invented);
+    std::thread([&] { EXPECT_FALSE(begin(archiveVolume, 0)) << "it is the same disk"; }).join();
+  }
+  // Another volume comes to the place of the first before an inventory has missed that one.
+  DiskAccessGuard(begin(homeFile))->diskData()->queue().sync([&] {
+    volumes_.unmount(archiveVolume);
+    volumes_.mount({.url = archiveVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  });
+  awaitInventory();
+  EXPECT_NE(identifier(archiveVolume), invented);
+}
+
 TEST_F(DiskAccessManagerTest, BackgroundModeOffWakesWaitersAndOnWakesNobody) {
   const Session holder = begin(homeFile);
   manager_->setIsBackgroundMode(true);

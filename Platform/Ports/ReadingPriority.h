@@ -1,0 +1,34 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <optional>
+
+#include <Varnel/Platform/Api.h>
+
+namespace Varnel::Platform {
+
+/// How much the calling thread's reading of disks gives way to that of other threads and programs.
+/// A thread has the level of the one that started it. Any thread.
+///
+///     const auto normal = priority.current();
+///     if (normal) priority.set(priority.lowered(*normal));
+///     read(file);
+///     if (normal) priority.set(*normal);
+class VARNEL_API ReadingPriority {
+ public:
+  /// A number of the system's own.
+  using Level = int;
+
+  virtual ~ReadingPriority() = default;
+
+  /// The calling thread's level; absent where the system tells none.
+  [[nodiscard]] virtual std::optional<Level> current() = 0;
+
+  /// Does nothing where the system forbids it.
+  virtual void set(Level level) = 0;
+
+  /// The level at which a thread of this level gives way; the same if it does already.
+  [[nodiscard]] virtual Level lowered(Level normal) = 0;
+};
+
+}  // namespace Varnel::Platform

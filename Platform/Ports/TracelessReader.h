@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <span>
+#include <system_error>
+#include <vector>
+
+#include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/Result.h>
+
+namespace Varnel::Platform {
+
+/// Reads an open file and leaves the system's cache as it was: what was not in it before is given
+/// back. For work in the background, which would otherwise crowd out what people work with.
+///
+///     TracelessReader reader(descriptor);
+///     const auto count = reader.read(buffer, offset);
+///
+/// Where the system cannot do that, or does not tell this user what its cache holds, it just reads.
+/// What the system read ahead of a file that is not read to its end may stay. One thread at a time.
+class VARNEL_API TracelessReader final {
+ public:
+  /// The descriptor is that of a regular file, stays the caller's and outlives the reader.
+  explicit TracelessReader(int descriptor) : descriptor_(descriptor) {}
+  ~TracelessReader();
+  TracelessReader(const TracelessReader&) = delete;
+  TracelessReader& operator=(const TracelessReader&) = delete;
+
+  /// Reads as many bytes from `offset` on as the buffer holds, or fewer; 0 at the end of the file.
+  /// Fails with the system's error (generic category).
+  [[nodiscard]] Result<std::size_t, std::error_code> read(std::span<std::byte> buffer,
+                                                          std::uint64_t offset);
+
+ private:
+  /// Part of the file. A size of 0 reaches to the end.
+  struct Range {
+    std::uint64_t offset;
+    std::uint64_t size;
+  };
+  enum class Giver { undecided, system, self };
+
+  void noteAbsentRanges();
+  void noteAbsentRanges(std::uint64_t fileSize);
+
+  const int descriptor_;
+  Giver giver_ = Giver::undecided;  ///< Who gives back.
+  std::vector<Range> absent_;       ///< What was not in the cache before, if this gives back.
+};
+
+}  // namespace Varnel::Platform

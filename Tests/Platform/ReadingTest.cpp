@@ -1,0 +1,131 @@
+// SPDX-License-Identifier: MIT
+#include <fcntl.h>
+#include <gtest/gtest.h>
+#include <sys/mman.h>
+#include <sys/syscall.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <string>
+#include <vector>
+
+#include <Tests/Support/ForbiddenCalls.h>
+#include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Ports/ReadingPriority.h>
+#include <Varnel/Platform/Ports/TracelessReader.h>
+
+namespace Varnel::Platform {
+namespace {
+
+constexpr std::size_t pageSize = 4096;
+constexpr unsigned cachestat = 451;
+
+/// A file of a number of pages, of which the test decides which are in the system's cache.
+class CachedFile final {
+ public:
+  explicit CachedFile(std::size_t pageCount) : pageCount_(pageCount) {
+    const std::string path = folder_.write("file", std::string(pageCount * pageSize, 'x'));
+    descriptor_ = ::open(path.c_str(), O_RDONLY);
+    ::fsync(descriptor_);
+    ::posix_fadvise(descriptor_, 0, 0, POSIX_FADV_DONTNEED);
+  }
+  ~CachedFile() { ::close(descriptor_); }
+  CachedFile(const CachedFile&) = delete;
+  CachedFile& operator=(const CachedFile&) = delete;
+
+  [[nodiscard]] int descriptor() const { return descriptor_; }
+
+  void load(std::size_t page) const {
+    ::posix_fadvise(descriptor_, 0, 0, POSIX_FADV_RANDOM);  // nothing ahead of it
+    char byte = 0;
+    EXPECT_EQ(::pread(descriptor_, &byte, 1, static_cast<off_t>(page * pageSize)), 1);
+    ::posix_fadvise(descriptor_, 0, 0, POSIX_FADV_NORMAL);
+  }
+
+  /// Which pages are in the cache, a digit for each.
+  [[nodiscard]] std::string pages() const {
+    void* mapped = ::mmap(nullptr, pageCount_ * pageSize, PROT_READ, MAP_SHARED, descriptor_, 0);
+    std::vector<unsigned char> present(pageCount_);
+    EXPECT_EQ(::mincore(mapped, pageCount_ * pageSize, present.data()), 0);
+    ::munmap(mapped, pageCount_ * pageSize);
+    std::string result;
+    for (const unsigned char page : present) result += (page & 1) ? '1' : '0';
+    return result;
+  }
+
+ private:
+  const Tests::TemporaryFolder folder_;
+  const std::size_t pageCount_;
+  int descriptor_ = -1;
+};
+
+std::size_t readAll(const CachedFile& file) {
+  TracelessReader reader(file.descriptor());
+  std::vector<std::byte> buffer(3 * pageSize);
+  std::size_t size = 0;
+  while (true) {
+    const auto count = reader.read(buffer, size);
+    if (!count || *count == 0) return size;
+    size += *count;
+  }
+}
+
+TEST(TracelessReader, LeavesInTheCacheWhatWasThere) {
+  // Which of them a kernel, or a file system, does not have.
+  const std::vector<unsigned> withoutAny;
+  for (const auto& missing : {withoutAny, {SYS_preadv2}, {SYS_preadv2, cachestat}}) {
+    const CachedFile cold(40);
+    if (cold.pages().find('1') != std::string::npos)
+      GTEST_SKIP() << "the file system of temporary files is a cache itself";
+    const CachedFile warm(40);
+    const CachedFile mixed(40);
+    for (std::size_t page = 0; page < 40; ++page) warm.load(page);
+    for (const std::size_t page : {0u, 7u, 8u, 39u}) mixed.load(page);
+    const std::string before = mixed.pages();
+    ASSERT_NE(before.find('0'), std::string::npos);
+    const auto readThem = [&] {
+      for (const CachedFile* file : {&cold, &warm, &mixed})
+        EXPECT_EQ(readAll(*file), 40 * pageSize);
+    };
+    missing.empty() ? readThem()
+    : missing.size() == 1
+        ? Tests::onAKernelThatForbids({SYS_preadv2}, EOPNOTSUPP, readThem)
+        : Tests::onAKernelThatForbids({SYS_preadv2, cachestat}, EOPNOTSUPP, readThem);
+    EXPECT_EQ(cold.pages(), std::string(40, '0')) << missing.size();
+    EXPECT_EQ(warm.pages(), std::string(40, '1')) << missing.size();
+    EXPECT_EQ(mixed.pages(), before) << missing.size();
+  }
+}
+
+TEST(TracelessReader, TellsTheSystemsErrors) {
+  std::vector<std::byte> buffer(pageSize);
+  const auto failed = TracelessReader(-1).read(buffer, 0);
+  ASSERT_FALSE(failed);
+  EXPECT_EQ(failed.error(), std::errc::bad_file_descriptor);
+}
+
+TEST(ReadingPriority, IsTheThreadsOwnAndCanBeRestored) {
+  constexpr int lowest = 2 << 13 | 7;
+  constexpr int idle = 3 << 13;
+  const auto priority = Linux::makeReadingPriority();
+  const auto normal = priority->current();
+  ASSERT_TRUE(normal);
+  std::thread([&] {
+    EXPECT_EQ(priority->lowered(*normal), lowest);
+    priority->set(lowest);
+    EXPECT_EQ(priority->current(), lowest);
+    priority->set(*normal);
+    EXPECT_EQ(priority->current(), normal);
+    priority->set(idle);
+    EXPECT_EQ(priority->lowered(*priority->current()) >> 13, 3) << "no less than it was";
+  }).join();
+  Tests::onAKernelThatForbids({SYS_ioprio_set, SYS_ioprio_get}, EPERM, [&] {
+    priority->set(lowest);
+    EXPECT_FALSE(priority->current());
+  });
+  EXPECT_EQ(priority->current(), normal);
+}
+
+}  // namespace
+}  // namespace Varnel::Platform
