@@ -76,6 +76,13 @@ void Delivery::rest() {
   outcome_.reset();
 }
 
+void Delivery::finish() {
+  constexpr int maxTries = 5;
+  for (int tries = 0; tries < maxTries && !saveOutcome(); ++tries) {
+  }
+  rest();
+}
+
 bool Delivery::saveOutcome() {
   if (outcome_ && !spool_.save(*outcome_)) return false;
   outcome_.reset();
@@ -103,7 +110,7 @@ void Delivery::send(std::vector<SpooledEvent> events, int failures, std::stop_to
   outcome_ = {.events = std::move(events),
               .verdict = DeliveryPolicy::verdict(status),
               .date = ports_.clock.now(),
-              .state = {.server = endpoint_.url}};
+              .state = {.server = endpoint_.url, .notBefore = {}}};
   if (outcome_->verdict == Verdict::delivered) return;
   outcome_->state.failures = failures + 1;
   const bool isOffline = !answer && answer.error().isOffline;

@@ -66,8 +66,11 @@ class Delivery final {
   /// Sends a batch if one is due and waits for the answer. After `stop` nothing more is sent.
   [[nodiscard]] Step step(Haste haste, std::stop_token stop);
 
-  /// Lets others deliver, and forgets what it has not noted.
+  /// Lets others deliver, and forgets what it has not noted: the spool is being emptied.
   void rest();
+
+  /// Notes at last what could not be noted yet; others may deliver from then on.
+  void finish();
 
  private:
   [[nodiscard]] std::optional<Varnel::Platform::Date> nextSending(const SpoolOutlook& outlook,

@@ -17,7 +17,7 @@ using State = Delivery::State;
 
 namespace {
 
-// How soon a drain sees that another process has delivered its events, or died.
+// How soon a drain sees that another process has delivered its events, or died, or freed the file.
 constexpr auto drainingPause = std::chrono::milliseconds(50);
 
 std::optional<Date> earlier(std::optional<Date> one, std::optional<Date> other) {
@@ -66,10 +66,7 @@ void DeliveryWorker::wake() {
 bool DeliveryWorker::drain(std::chrono::milliseconds timeout) {
   std::unique_lock lock(mutex_);
   const std::int64_t asked = ++drainsAsked_;
-  const auto isAnswered = [&] {
-    return drainsSeen_ >= asked && state_ != State::due &&
-           (state_ != State::elsewhere || areOwnDelivered_);
-  };
+  const auto isAnswered = [&] { return drainsSeen_ >= asked && (isAtRest_ || areOwnDelivered_); };
   ++drainers_;
   isWoken_ = true;
   changed_.notify_all();
@@ -84,6 +81,8 @@ void DeliveryWorker::run() {
     isWoken_ = false;
     waitForNext(lock, work(lock));
   }
+  lock.unlock();
+  delivery_.finish();
 }
 
 std::optional<Date> DeliveryWorker::work(std::unique_lock<std::mutex>& lock) {
@@ -99,10 +98,12 @@ std::optional<Date> DeliveryWorker::work(std::unique_lock<std::mutex>& lock) {
   const bool areOwnDelivered = this->areOwnDelivered();
   lock.lock();
   drainsSeen_ = drainsAsked;
-  state_ = step.state;
-  areOwnDelivered_ = areOwnDelivered;
+  // Otherwise there is more to be had without the server: from this process, from the one that
+  // delivers, or from the file when it can be had again.
+  isAtRest_ = !unsettled && (step.state == State::idle || step.state == State::later);
+  areOwnDelivered_ = areOwnDelivered && step.state != State::due;
   changed_.notify_all();
-  if (step.state == State::elsewhere && drainers_ > 0) return clock_.now() + drainingPause;
+  if (drainers_ > 0 && !isAtRest_ && step.state != State::due) return clock_.now() + drainingPause;
   return earlier(step.next, unsettled);
 }
 

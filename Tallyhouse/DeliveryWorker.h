@@ -45,8 +45,8 @@ class DeliveryWorker final {
   /// Tells the thread that there is something new in the spool.
   void wake();
 
-  /// Sends without lingering, and waits until no event is left, an attempt fails, or another
-  /// process has delivered what this one recorded. Returns whether all that was delivered.
+  /// Sends without lingering, and waits until no event is left, the server is to be left alone, or
+  /// another process has delivered what this one recorded. Returns whether all that was delivered.
   bool drain(std::chrono::milliseconds timeout);
 
  private:
@@ -66,14 +66,14 @@ class DeliveryWorker final {
 
   std::mutex mutex_;  ///< Owns all below.
   std::condition_variable changed_;
-  Delivery::State state_ = Delivery::State::due;
+  bool isAtRest_ = false;
   bool areOwnDelivered_ = false;
   bool isPaused_ = true;
   bool isEnding_ = false;
   bool isWoken_ = false;
   int drainers_ = 0;
   std::int64_t drainsAsked_ = 0;
-  std::int64_t drainsSeen_ = 0;  ///< How many were asked for before the step that made `state_`.
+  std::int64_t drainsSeen_ = 0;  ///< How many were asked for before the step that set the two.
   std::stop_source transfer_;
   std::thread thread_;
 };

@@ -46,7 +46,7 @@ std::optional<SpoolOutlook> EventSpool::look(const std::string& server, std::siz
                                              int maxRefusals) {
   SpoolOutlook outlook;
   const auto error = file_.read([&](SQLiteDatabase& database) {
-    outlook = {.backlog = {}, .state = {.server = server}};
+    outlook = {.backlog = {}, .state = {.server = server, .notBefore = {}}};
     auto failure = query(
         database,
         "SELECT count(*), min(date) FROM"

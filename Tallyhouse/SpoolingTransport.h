@@ -71,8 +71,9 @@ class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
   void accept(const AnalyticsEvent& event) noexcept override;
   void discardAll() noexcept override;
 
-  /// Sends the waiting events without lingering, and waits until none is left, an attempt fails, or
-  /// the time is over; while another process delivers, until the events of this one are gone.
+  /// Sends the waiting events without lingering, and waits until none is left, the server has to be
+  /// left alone, or the time is over; while another process delivers or has the file locked, until
+  /// the events of this one are gone.
   /// Returns whether all that this process recorded was delivered, by whomever; false without
   /// consent.
   bool drain(std::chrono::milliseconds timeout);

@@ -136,7 +136,7 @@ TEST_F(SpoolingTransportTest, ALockedFileDelaysADrainThatIsGranted) {
   std::optional<Tests::OtherConnection> lock;
   lock.emplace(path(), "BEGIN IMMEDIATE");
   track(tracker, "Held");
-  EXPECT_FALSE(transport->drain(30s));
+  EXPECT_FALSE(transport->drain(100ms));
   EXPECT_TRUE(http.posts().empty());
   lock.reset();
   EXPECT_TRUE(transport->drain(30s));
