@@ -11,8 +11,8 @@
 #include <vector>
 
 #include <Varnel/Platform/POSIX/Adapters.h>
-#include <Varnel/Platform/Ports/AppendFiles.h>
 #include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Platform/Testing/FakeHTTPClient.h>
 #include <Varnel/Tallyhouse/AnalyticsTracker.h>
@@ -100,7 +100,7 @@ class BareInsertion {
 
 int main() {
   const fs::path folder = fs::temp_directory_path() / "varnel-analytics-benchmark";
-  const auto files = POSIX::makeAppendFiles();
+  const auto files = POSIX::makePrivateFiles();
   const auto clock = POSIX::makeClock();
   Testing::CapturedSystemLog log;
   Testing::FakeHTTPClient http;
@@ -112,7 +112,7 @@ int main() {
   patient.linger = std::chrono::hours(1);
   patient.firstRetry = std::chrono::hours(1);
   Tallyhouse::AnalyticsTracker tracker(
-      Tallyhouse::SpoolingTransport::make({*files, *clock, http, log},
+      Tallyhouse::SpoolingTransport::make({*clock, http, *files, log},
                                           {.endpoint = *URL::parse("https://h.example/batch"),
                                            .trackingID = "QN-1",
                                            .clientID = "1234567890.1456789012",

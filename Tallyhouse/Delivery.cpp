@@ -5,7 +5,6 @@
 
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/HTTPClient.h>
-#include <Varnel/Tallyhouse/EventSpool.h>
 #include <Varnel/Tallyhouse/MeasurementProtocol.h>
 
 namespace Tallyhouse {
@@ -15,7 +14,7 @@ using Varnel::Platform::HTTPPost;
 
 namespace {
 
-std::string batchOf(std::span<const SpooledEvent> events, Date now) {
+std::string batchOf(const std::vector<SpooledEvent>& events, Date now) {
   std::string batch;
   for (const SpooledEvent& event : events)
     appendToBatch(batch, event.hit,
@@ -34,26 +33,71 @@ Delivery::Delivery(Ports ports, EventSpool& spool, Endpoint endpoint, DeliveryPo
       policy_(policy),
       random_(std::move(random)) {}
 
-std::optional<Date> Delivery::step(Haste haste, std::stop_token stop) {
-  const auto nextSending = [&] {
-    DeliveryPolicy policy = policy_;
-    if (haste == Haste::none) policy.linger = {};
-    return policy.nextSending(spool_.backlog(policy.maxRefusals), notBefore_, ports_.clock.now());
-  };
-  const auto next = nextSending();
-  if (!next || *next > ports_.clock.now() || stop.stop_requested()) return next;
-  // Fresh events first, so that refused ones do not hold them up.
-  if (const auto waiting = spool_.waiting(policy_.maxBatchEvents, policy_.maxBatchBytes);
-      !waiting.empty())
-    send(waiting, false, stop);
-  else if (const auto refused = spool_.refused(policy_.maxRefusals))
-    send({&*refused, 1}, true, stop);
-  else if (nextSending())
-    backOff({});  // The events cannot be read.
-  return nextSending();
+Delivery::Step Delivery::step(Haste haste, std::stop_token stop) {
+  if (!saveOutcome()) return fileIsAway();
+  for (bool hasSent = false;;) {
+    const auto outlook = spool_.look(endpoint_.url, policy_.maxBatchEvents, policy_.maxRefusals);
+    if (!outlook) return fileIsAway();
+    const auto next = nextSending(*outlook, haste);
+    const bool isDue = next && *next <= ports_.clock.now();
+    Step step{.state = isDue  ? State::due
+                       : next ? State::later
+                              : State::idle,
+              .next = next,
+              .waiting = outlook->backlog.waiting};
+    if (!isDue || stop.stop_requested()) election_.reset();
+    if (!isDue || stop.stop_requested() || hasSent) return step;
+    if (!election_) {
+      election_ = spool_.elect();
+      // Looked at again: the deliverer before may just have sent this.
+      if (election_) continue;
+      step.state = State::elsewhere;
+      step.next = ports_.clock.now() + policy_.electionPause;
+      return step;
+    }
+    // Those in line first, so that refused ones do not hold them up.
+    auto events = spool_.waiting(policy_.maxBatchEvents, policy_.maxBatchBytes);
+    if (events.empty()) events = spool_.refused(policy_.maxRefusals);
+    if (events.empty()) return fileIsAway();
+    send(std::move(events), outlook->state.failures, stop);
+    if (!saveOutcome()) return fileIsAway();
+    hasSent = true;
+  }
 }
 
-void Delivery::send(std::span<const SpooledEvent> events, bool areRefused, std::stop_token stop) {
+std::optional<Date> Delivery::nextSending(const SpoolOutlook& outlook, Haste haste) const {
+  DeliveryPolicy policy = policy_;
+  if (haste == Haste::none) policy.linger = {};
+  return policy.nextSending(outlook.backlog, outlook.state.notBefore, ports_.clock.now());
+}
+
+void Delivery::rest() {
+  election_.reset();
+  outcome_.reset();
+}
+
+void Delivery::finish() {
+  constexpr int maxTries = 5;
+  for (int tries = 0; tries < maxTries && !saveOutcome(); ++tries) {
+  }
+  rest();
+}
+
+bool Delivery::saveOutcome() {
+  if (outcome_ && !spool_.save(*outcome_)) return false;
+  outcome_.reset();
+  return true;
+}
+
+// Whoever holds an outcome that is not noted yet remains the deliverer, so that nobody repeats it.
+Delivery::Step Delivery::fileIsAway() {
+  if (!outcome_) election_.reset();
+  const Date now = ports_.clock.now();
+  if (filePause_.isOver(now)) filePause_.failed(now);
+  return {.state = State::fileAway, .next = filePause_.end(), .waiting = 0};
+}
+
+void Delivery::send(std::vector<SpooledEvent> events, int failures, std::stop_token stop) {
   const auto answer = ports_.httpClient.post(HTTPPost{.url = endpoint_.url,
                                                       .contentType = "text/plain; charset=utf-8",
                                                       .body = batchOf(events, ports_.clock.now()),
@@ -62,29 +106,18 @@ void Delivery::send(std::span<const SpooledEvent> events, bool areRefused, std::
   // An interrupted post says nothing about the server.
   if (!answer && stop.stop_requested()) return;
 
-  const Verdict verdict =
-      DeliveryPolicy::verdict(answer ? std::optional(answer->status) : std::nullopt);
-  if (verdict == Verdict::delivered) {
-    // Events that cannot be removed are sent again. A pause keeps a full disk from making that a
-    // flood.
-    if (!(areRefused ? spool_.removeRefused(events.front()) : spool_.removeWaiting(events)))
-      return backOff({});
-    failures_ = 0;
-    notBefore_.reset();
-    return;
-  }
-  if (verdict == Verdict::refused) {
-    if (areRefused)
-      spool_.countRefusal(events.front());
-    else
-      spool_.moveToRefused(events);
-  }
-  backOff(answer ? answer->retryAfter : std::nullopt);
-}
-
-void Delivery::backOff(std::optional<std::chrono::seconds> retryAfter) {
-  ++failures_;
-  notBefore_ = ports_.clock.now() + policy_.retryDelay(failures_, retryAfter, random_());
+  const auto status = answer ? std::optional(answer->status) : std::nullopt;
+  outcome_ = {.events = std::move(events),
+              .verdict = DeliveryPolicy::verdict(status),
+              .date = ports_.clock.now(),
+              .state = {.server = endpoint_.url, .notBefore = {}}};
+  if (outcome_->verdict == Verdict::delivered) return;
+  outcome_->state.failures = failures + 1;
+  const bool isOffline = !answer && answer.error().isOffline;
+  outcome_->state.notBefore =
+      outcome_->date + policy_.retryDelay(failures + 1,
+                                          isOffline ? Obstacle::network : Obstacle::server,
+                                          answer ? answer->retryAfter : std::nullopt, random_());
 }
 
 }  // namespace Tallyhouse

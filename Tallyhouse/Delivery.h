@@ -1,15 +1,18 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <chrono>
+#include <cstdint>
 #include <functional>
+#include <memory>
 #include <optional>
-#include <span>
 #include <stop_token>
 #include <string>
+#include <vector>
 
 #include <Varnel/Platform/Values/Date.h>
 #include <Varnel/Tallyhouse/DeliveryPolicy.h>
+#include <Varnel/Tallyhouse/EventSpool.h>
+#include <Varnel/Tallyhouse/GrowingPause.h>
 
 namespace Varnel::Platform {
 class Clock;
@@ -17,9 +20,6 @@ class HTTPClient;
 }  // namespace Varnel::Platform
 
 namespace Tallyhouse {
-
-class EventSpool;
-struct SpooledEvent;
 
 /// Where batches go.
 struct Endpoint final {
@@ -29,6 +29,11 @@ struct Endpoint final {
 
 /// Carries events from the spool to the server, one batch for each step. It has no thread of its
 /// own: its caller calls `step` again at the time that `step` returns.
+///
+/// Of all processes that share the spool one delivers: whoever finds something due takes the lock
+/// beside the spool, sends until nothing more is due, and frees it. When it dies, the system frees
+/// it, and the next process that looks takes over. The pauses that the server causes are in the
+/// spool, and hold for all.
 ///
 /// One thread at a time.
 class Delivery final {
@@ -41,29 +46,49 @@ class Delivery final {
     usual,  ///< Events wait a little for others to join their batch.
     none,   ///< Waiting events are sent at once, unless the server has asked for a pause.
   };
+  enum class State {
+    idle,       ///< There is nothing to send.
+    due,        ///< There is more to send now.
+    later,      ///< Events linger, or the server is left alone.
+    elsewhere,  ///< Another process delivers.
+    fileAway    ///< The spool cannot be had.
+  };
+  struct Step {
+    State state = State::idle;
+    std::optional<Varnel::Platform::Date> next;  ///< Absent when idle.
+    std::int64_t waiting = 0;                    ///< Events in line, counted up to a full batch.
+  };
 
   /// `random` gives numbers from 0 to 1.
   Delivery(Ports ports, EventSpool& spool, Endpoint endpoint, DeliveryPolicy policy,
            std::function<double()> random);
 
-  /// Sends a batch if one is due and waits for the answer. Returns when to call again; absent while
-  /// there is nothing to send. After `stop` nothing more is sent.
-  [[nodiscard]] std::optional<Varnel::Platform::Date> step(Haste haste, std::stop_token stop);
+  /// Sends a batch if one is due and waits for the answer. After `stop` nothing more is sent.
+  [[nodiscard]] Step step(Haste haste, std::stop_token stop);
 
-  /// How many attempts in a row have failed.
-  [[nodiscard]] int failures() const { return failures_; }
+  /// Lets others deliver, and forgets what it has not noted: the spool is being emptied.
+  void rest();
+
+  /// Notes at last what could not be noted yet; others may deliver from then on.
+  void finish();
 
  private:
-  void send(std::span<const SpooledEvent> events, bool areRefused, std::stop_token stop);
-  void backOff(std::optional<std::chrono::seconds> retryAfter);
+  [[nodiscard]] std::optional<Varnel::Platform::Date> nextSending(const SpoolOutlook& outlook,
+                                                                  Haste haste) const;
+  [[nodiscard]] bool saveOutcome();
+  [[nodiscard]] Step fileIsAway();
+  void send(std::vector<SpooledEvent> events, int failures, std::stop_token stop);
 
   const Ports ports_;
   EventSpool& spool_;
   const Endpoint endpoint_;
   const DeliveryPolicy policy_;
   const std::function<double()> random_;
-  int failures_ = 0;
-  std::optional<Varnel::Platform::Date> notBefore_;
+  std::unique_ptr<Varnel::Platform::FileLock> election_;  ///< Held by the one deliverer.
+  /// Not in the spool yet. Until it is, nothing more is sent: a batch is not sent again because it
+  /// cannot be noted.
+  std::optional<DeliveryOutcome> outcome_;
+  GrowingPause filePause_;
 };
 
 }  // namespace Tallyhouse

@@ -20,29 +20,38 @@ Verdict DeliveryPolicy::verdict(std::optional<int> status) {
   return *status >= 400 && *status < 500 ? Verdict::refused : Verdict::later;
 }
 
-DeliveryPolicy::Duration DeliveryPolicy::retryDelay(int failures,
+DeliveryPolicy::Duration DeliveryPolicy::retryDelay(int failures, Obstacle obstacle,
                                                     std::optional<std::chrono::seconds> retryAfter,
                                                     double random) const {
-  Duration delay = firstRetry;
+  const double share = std::clamp(random, 0.0, 1.0);
+  const auto part = [](Duration whole, double ratio) {
+    return std::chrono::duration_cast<Duration>(whole * ratio);
+  };
+  Duration delay = obstacle == Obstacle::network ? firstRetryOffline : firstRetry;
   for (int i = 1; i < failures && delay < maxRetryDelay; ++i) delay *= 2;
   delay = std::min(delay, maxRetryDelay);
-  delay -= std::chrono::duration_cast<Duration>(delay * (std::clamp(random, 0.0, 1.0) / 2));
+  delay -= part(delay, share / 2);
   // Compared in the server's own unit, in which its figure cannot overflow.
   const auto maxGranted = std::chrono::duration_cast<std::chrono::seconds>(maxRetryAfter);
-  return std::max<Duration>(delay,
-                            std::min(retryAfter.value_or(std::chrono::seconds(0)), maxGranted));
+  const Duration granted = std::min(retryAfter.value_or(std::chrono::seconds(0)), maxGranted);
+  return std::max(delay, granted + part(granted, share));
 }
 
 std::optional<Date> DeliveryPolicy::nextSending(const Backlog& backlog,
                                                 std::optional<Date> notBefore, Date now) const {
+  // What lies in the future happened before the clock was set back: it has waited enough.
+  const auto after = [now](Date past, Duration wait) { return past > now ? now : past + wait; };
   std::optional<Date> next;
-  if (backlog.hasRefused || backlog.waiting >= static_cast<std::int64_t>(maxBatchEvents))
+  if (backlog.waiting >= static_cast<std::int64_t>(maxBatchEvents))
     next = now;
   else if (backlog.oldest)
-    // An event with a future date was made before the clock was set back: it has lingered enough.
-    next = *backlog.oldest > now ? now : *backlog.oldest + linger;
+    next = after(*backlog.oldest, linger);
+  if (backlog.refused) {
+    const Date again = after(*backlog.refused, refusalDistance);
+    next = next ? std::min(*next, again) : again;
+  }
   if (!next || !notBefore) return next;
-  const Duration maxPause = std::max(maxRetryDelay, maxRetryAfter);
+  const Duration maxPause = std::max(maxRetryDelay, 2 * maxRetryAfter);
   return *notBefore > now + maxPause ? next : std::max(*next, *notBefore);
 }
 

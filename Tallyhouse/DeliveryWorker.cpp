@@ -6,14 +6,29 @@
 
 #include <Varnel/Platform/Concurrency/StartThread.h>
 #include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Tallyhouse/EventRecorder.h>
 #include <Varnel/Tallyhouse/EventSpool.h>
 
 namespace Tallyhouse {
 
 using Varnel::Platform::Date;
+using Haste = Delivery::Haste;
+using State = Delivery::State;
 
-DeliveryWorker::DeliveryWorker(Varnel::Platform::Clock& clock, EventSpool& spool, Delivery delivery)
-    : clock_(clock), spool_(spool), delivery_(std::move(delivery)) {}
+namespace {
+
+// How soon a drain sees that another process has delivered its events, or died, or freed the file.
+constexpr auto drainingPause = std::chrono::milliseconds(50);
+
+std::optional<Date> earlier(std::optional<Date> one, std::optional<Date> other) {
+  return one && other ? std::min(one, other) : one ? one : other;
+}
+
+}  // namespace
+
+DeliveryWorker::DeliveryWorker(Varnel::Platform::Clock& clock, EventRecorder& recorder,
+                               EventSpool& spool, Delivery delivery)
+    : clock_(clock), recorder_(recorder), spool_(spool), delivery_(std::move(delivery)) {}
 
 DeliveryWorker::~DeliveryWorker() {
   {
@@ -51,37 +66,64 @@ void DeliveryWorker::wake() {
 bool DeliveryWorker::drain(std::chrono::milliseconds timeout) {
   std::unique_lock lock(mutex_);
   const std::int64_t asked = ++drainsAsked_;
-  const auto isAnswered = [&] { return drainsSeen_ >= asked && state_ != State::working; };
+  const auto isAnswered = [&] { return drainsSeen_ >= asked && (isAtRest_ || areOwnDelivered_); };
   ++drainers_;
   isWoken_ = true;
   changed_.notify_all();
   changed_.wait_for(lock, timeout, [&] { return isPaused_ || isAnswered(); });
   --drainers_;
-  return isAnswered() && state_ == State::idle;
+  return !isPaused_ && isAnswered() && areOwnDelivered_;
 }
 
 void DeliveryWorker::run() {
   std::unique_lock lock(mutex_);
   while (!isEnding_) {
     isWoken_ = false;
-    std::optional<Date> next;
-    if (!isPaused_) next = step(lock);
-    waitForNext(lock, next);
+    waitForNext(lock, work(lock));
   }
+  lock.unlock();
+  delivery_.finish();
 }
 
-std::optional<Date> DeliveryWorker::step(std::unique_lock<std::mutex>& lock) {
+std::optional<Date> DeliveryWorker::work(std::unique_lock<std::mutex>& lock) {
   const std::stop_token transfer = transfer_.get_token();
-  const auto haste = drainers_ > 0 ? Delivery::Haste::none : Delivery::Haste::usual;
+  const auto haste = drainers_ > 0 ? Haste::none : Haste::usual;
   const std::int64_t drainsAsked = drainsAsked_;
+  const bool isPaused = isPaused_;
   lock.unlock();
-  const std::optional<Date> next = delivery_.step(haste, transfer);
-  const bool isDueLater = next && *next > clock_.now();
+  const auto unsettled =
+      recorder_.settle(spool_.file(), haste == Haste::none ? EventRecorder::Haste::none
+                                                           : EventRecorder::Haste::usual);
+  const Delivery::Step step = deliver(haste, isPaused, transfer);
+  const bool areOwnDelivered = this->areOwnDelivered();
   lock.lock();
   drainsSeen_ = drainsAsked;
-  state_ = !next ? State::idle : isDueLater ? State::blocked : State::working;
+  // Otherwise there is more to be had without the server: from this process, from the one that
+  // delivers, or from the file when it can be had again.
+  isAtRest_ = !unsettled && (step.state == State::idle || step.state == State::later);
+  areOwnDelivered_ = areOwnDelivered && step.state != State::due;
   changed_.notify_all();
-  return next;
+  if (drainers_ > 0 && !isAtRest_ && step.state != State::due) return clock_.now() + drainingPause;
+  return earlier(step.next, unsettled);
+}
+
+Delivery::Step DeliveryWorker::deliver(Haste haste, bool isPaused, std::stop_token transfer) {
+  // What is to be forgotten is not sent.
+  if (isPaused || recorder_.mustEmpty()) {
+    delivery_.rest();
+    return {};
+  }
+  recorder_.looking();
+  const Delivery::Step step = delivery_.step(haste, transfer);
+  recorder_.seen(step.waiting);
+  return step;
+}
+
+bool DeliveryWorker::areOwnDelivered() {
+  const OwnEvents own = recorder_.own();
+  if (!spool_.isDelivered(own)) return false;
+  recorder_.forget(own);
+  return true;
 }
 
 void DeliveryWorker::waitForNext(std::unique_lock<std::mutex>& lock, std::optional<Date> next) {
@@ -92,7 +134,7 @@ void DeliveryWorker::waitForNext(std::unique_lock<std::mutex>& lock, std::option
   if (wait <= Date::duration::zero() || isWoken_ || isEnding_) return;
   // Before a long wait, so that an idle spool is one small file.
   lock.unlock();
-  spool_.checkpoint();
+  spool_.file().checkpoint();
   lock.lock();
   changed_.wait_for(lock, wait, [this] { return isWoken_ || isEnding_; });
 }

@@ -9,6 +9,7 @@
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Tallyhouse/Delivery.h>
 #include <Varnel/Tallyhouse/DeliveryWorker.h>
+#include <Varnel/Tallyhouse/EventRecorder.h>
 #include <Varnel/Tallyhouse/EventSpool.h>
 #include <Varnel/Tallyhouse/MeasurementProtocol.h>
 
@@ -36,9 +37,10 @@ struct SpoolingTransport::Parts {
   Parts(Ports ports, Configuration configuration)
       : identity{std::move(configuration.trackingID), std::move(configuration.clientID)},
         maxBatchEvents(static_cast<std::int64_t>(configuration.policy.maxBatchEvents)),
-        spool({ports.appendFiles, ports.systemLog}, std::move(configuration.spoolPath),
-              {.maxEvents = configuration.maxEvents, .maxBytes = configuration.maxBytes}),
-        worker(ports.clock, spool,
+        recorder({ports.privateFiles, ports.clock, ports.systemLog}, configuration.spoolPath,
+                 {.maxEvents = configuration.maxEvents, .maxBytes = configuration.maxBytes}),
+        spool({ports.privateFiles, ports.systemLog}, configuration.spoolPath),
+        worker(ports.clock, recorder, spool,
                Delivery({ports.clock, ports.httpClient}, spool,
                         {.url = configuration.endpoint.absoluteString(),
                          .allowsPlainHTTP = configuration.plainHTTP == PlainHTTP::allowed},
@@ -46,6 +48,7 @@ struct SpoolingTransport::Parts {
 
   const AnalyticsIdentity identity;
   const std::int64_t maxBatchEvents;
+  EventRecorder recorder;
   EventSpool spool;
   DeliveryWorker worker;
 };
@@ -59,7 +62,7 @@ std::unique_ptr<SpoolingTransport> SpoolingTransport::make(Ports ports,
 
 std::unique_ptr<SpoolingTransport> SpoolingTransport::make(Configuration configuration) {
   const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
-  return make({ports.appendFiles, ports.clock, ports.httpClient, ports.systemLog},
+  return make({ports.clock, ports.httpClient, ports.privateFiles, ports.systemLog},
               std::move(configuration));
 }
 
@@ -68,6 +71,7 @@ SpoolingTransport::SpoolingTransport(std::unique_ptr<Parts> parts) : parts_(std:
 SpoolingTransport::~SpoolingTransport() = default;
 
 void SpoolingTransport::start() noexcept try {
+  parts_->recorder.begin();
   parts_->worker.resume();
 } catch (const std::exception&) {
   // The system grants no thread. The events stay in the spool for a later start.
@@ -76,10 +80,10 @@ void SpoolingTransport::start() noexcept try {
 void SpoolingTransport::accept(const AnalyticsEvent& event) noexcept try {
   const std::string hit = encodedHit(event, parts_->identity);
   if (hit.size() > maxHitBytes) {
-    parts_->spool.countDropped();
+    parts_->recorder.countDropped();
     return;
   }
-  const std::int64_t waiting = parts_->spool.append(event.uuid, event.date, hit);
+  const std::int64_t waiting = parts_->recorder.append(event.uuid, event.date, hit);
   // In between the thread sleeps on, and will send these events with the others.
   if (waiting == 1 || waiting == parts_->maxBatchEvents || waiting % appendsUntilCheckpoint == 0)
     parts_->worker.wake();
@@ -89,7 +93,8 @@ void SpoolingTransport::accept(const AnalyticsEvent& event) noexcept try {
 
 void SpoolingTransport::discardAll() noexcept try {
   parts_->worker.pause();
-  parts_->spool.clear();
+  parts_->recorder.discard();
+  parts_->worker.wake();
 } catch (const std::exception&) {
   // Nothing is sent while the worker is paused; the next start of the process tries again.
 }
@@ -99,7 +104,7 @@ bool SpoolingTransport::drain(std::chrono::milliseconds timeout) {
 }
 
 std::int64_t SpoolingTransport::droppedCount() const {
-  return parts_->spool.droppedCount();
+  return parts_->recorder.droppedCount();
 }
 
 }  // namespace Tallyhouse

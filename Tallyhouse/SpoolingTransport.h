@@ -13,9 +13,9 @@
 #include <Varnel/Tallyhouse/DeliveryPolicy.h>
 
 namespace Varnel::Platform {
-class AppendFiles;
 class Clock;
 class HTTPClient;
+class PrivateFiles;
 class SystemLog;
 }  // namespace Varnel::Platform
 
@@ -31,14 +31,19 @@ namespace Tallyhouse {
 ///         .trackingID = "QN-1", .clientID = id, .spoolPath = support + "/Analytics.db"});
 ///     auto tracker = std::make_shared<AnalyticsTracker>(std::move(transport), consent);
 ///
-/// `accept` costs the insertion of a row and never waits for the network. Destruction interrupts a
-/// transfer, which the next run repeats; call `drain` before it where a process is short-lived.
+/// `accept` costs the insertion of a row and never waits for the network, nor for more than 20 ms
+/// for another process that has the file locked: events that the file does not take now are held in
+/// memory, as far as that is sensible, and written later. Destruction interrupts a transfer, which
+/// the next run repeats; call `drain` before it where a process is short-lived.
+///
+/// Processes may share a spool; one of them delivers at a time. When one of them refuses consent,
+/// the others' events are thrown away as well, and they take none until their next `start`.
 class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
  public:
   struct Ports {
-    Varnel::Platform::AppendFiles& appendFiles;
     Varnel::Platform::Clock& clock;
     Varnel::Platform::HTTPClient& httpClient;
+    Varnel::Platform::PrivateFiles& privateFiles;
     Varnel::Platform::SystemLog& systemLog;
   };
   enum class PlainHTTP { refused, allowed };
@@ -49,8 +54,8 @@ class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
     std::string clientID;    ///< The installation that sends them.
     std::string spoolPath;   ///< The user's alone. Missing folders are made.
     PlainHTTP plainHTTP = PlainHTTP::refused;
-    std::int64_t maxEvents = 10'000;  ///< How many may wait; then the oldest is dropped.
-    std::int64_t maxBytes = 8 << 20;
+    std::int64_t maxEvents = 10'000;  ///< How many may wait; then the oldest are dropped.
+    std::int64_t maxBytes = 8 << 20;  ///< Of the file, without what is free in it.
     DeliveryPolicy policy = {};
   };
 
@@ -66,11 +71,14 @@ class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
   void accept(const AnalyticsEvent& event) noexcept override;
   void discardAll() noexcept override;
 
-  /// Sends the waiting events without lingering, and waits until all are delivered, an attempt
-  /// fails, or the time is over. Returns whether all is delivered; false without consent.
+  /// Sends the waiting events without lingering, and waits until none is left, the server has to be
+  /// left alone, or the time is over; while another process delivers or has the file locked, until
+  /// the events of this one are gone.
+  /// Returns whether all that this process recorded was delivered, by whomever; false without
+  /// consent.
   bool drain(std::chrono::milliseconds timeout);
 
-  /// Events that the spool could not hold, since its file was begun.
+  /// Events of all processes that the spool could not hold, since its file was begun.
   [[nodiscard]] std::int64_t droppedCount() const;
 
  private:

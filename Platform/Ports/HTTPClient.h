@@ -28,6 +28,7 @@ struct HTTPResponse final {
 /// Why there is no answer.
 struct HTTPFailure final {
   std::string message;
+  bool isOffline = false;  ///< There is no network, as far as this machine can tell.
 };
 
 /// Posts to web servers. Any thread; posts wait for each other.

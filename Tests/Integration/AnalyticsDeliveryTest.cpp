@@ -8,9 +8,12 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <cctype>
 #include <chrono>
 #include <cstdlib>
 #include <future>
+#include <map>
+#include <memory>
 #include <optional>
 #include <semaphore>
 #include <set>
@@ -193,6 +196,61 @@ TEST_F(AnalyticsDeliveryTest, AServerThatHangsDelaysNeitherTheCallerNorTheEnd) {
   EXPECT_EQ(arrived, 101u);
 }
 
+using Process = Varnel::Tests::ChildProcess;
+
+// What a process says when it has named all its events.
+std::string lastWord(Process& process) {
+  std::string line = process.readLine();
+  while (!line.empty() && !std::isalpha(line[0])) line = process.readLine();
+  return line;
+}
+
+std::unique_ptr<Process> recording(const Server& server, const std::string& spool) {
+  return std::make_unique<Process>(
+      std::vector<std::string>{VARNEL_ANALYTICS_PROCESS, server.url(), spool, "1000", "drain"});
+}
+
+// How often each event is seen until so many different ones are.
+std::map<std::string, int> seenBy(Server& server, std::size_t different) {
+  std::map<std::string, int> seen;
+  while (seen.size() < different)
+    for (const std::string& hit : server.next().hits) ++seen[parameter(hit, "z")];
+  return seen;
+}
+
+TEST_F(AnalyticsDeliveryTest, OfFourProcessesOneSendsEachEventOnce) {
+  Server server({"200"});
+  std::vector<std::unique_ptr<Process>> processes;
+  for (int i = 0; i < 4; ++i) processes.push_back(recording(server, spoolPath()));
+  for (const auto& [uuid, times] : seenBy(server, 4000)) EXPECT_EQ(times, 1) << uuid;
+  for (const auto& process : processes) {
+    EXPECT_EQ(lastWord(*process), "tracked");
+    EXPECT_EQ(process->readLine(), "delivered");
+  }
+}
+
+TEST_F(AnalyticsDeliveryTest, WhenTheDelivererDiesAnotherTakesOver) {
+  Server server({"200", "200", "hang", "200"});
+  auto deliverer = recording(server, spoolPath());
+  std::map<std::string, int> seen;
+  std::set<std::string> underway;
+  for (int i = 0; i < 3; ++i) {
+    underway.clear();
+    for (const std::string& hit : server.next().hits) underway.insert(parameter(hit, "z"));
+    for (const std::string& uuid : underway) ++seen[uuid];
+  }
+  EXPECT_EQ(lastWord(*deliverer), "tracked");
+  std::vector<std::unique_ptr<Process>> others;
+  for (int i = 0; i < 3; ++i) others.push_back(recording(server, spoolPath()));
+  for (const auto& process : others) EXPECT_EQ(lastWord(*process), "tracked");
+  deliverer->kill();
+  while (seen.size() < 4000)
+    for (const std::string& hit : server.next().hits) ++seen[parameter(hit, "z")];
+  // The server had taken the last batch, but nobody could note that.
+  for (const auto& [uuid, times] : seen) EXPECT_EQ(times, underway.contains(uuid) ? 2 : 1) << uuid;
+  for (const auto& process : others) EXPECT_EQ(process->readLine(), "delivered");
+}
+
 TEST_F(AnalyticsDeliveryTest, AKilledProcessDeliversOnTheNextStart) {
   constexpr std::size_t count = 250;
   std::set<std::string> before;
@@ -200,7 +258,7 @@ TEST_F(AnalyticsDeliveryTest, AKilledProcessDeliversOnTheNextStart) {
     Server server({"200", "hang"});
     Varnel::Tests::ChildProcess process(
         {VARNEL_ANALYTICS_PROCESS, server.url(), spoolPath(), std::to_string(count)});
-    EXPECT_EQ(process.readLine(), "tracked");
+    EXPECT_EQ(lastWord(process), "tracked");
     // Killed in the midst of it: some have arrived, some hang, some have never been sent.
     for (const std::string& hit : server.next().hits) before.insert(parameter(hit, "z"));
     server.next();

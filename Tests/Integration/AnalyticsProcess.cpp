@@ -1,27 +1,41 @@
 // SPDX-License-Identifier: MIT
-// AnalyticsProcess ENDPOINT SPOOL COUNT: tracks that many events, says so, and waits to be killed.
+// AnalyticsProcess ENDPOINT SPOOL COUNT [drain]: tracks that many events, whose names it prints as
+// soon as they are kept, and says "tracked". Then it waits to be killed, or drains the spool, says
+// whether its events were "delivered" or "left", and ends.
 #include <unistd.h>
 
+#include <chrono>
 #include <cstdio>
 #include <cstdlib>
 #include <string>
+#include <string_view>
 
 #include <Varnel/Tallyhouse/AnalyticsTracker.h>
 #include <Varnel/Tallyhouse/SpoolingTransport.h>
 
 int main(int count, char** arguments) {
   using namespace Tallyhouse;
-  if (count != 4) return EXIT_FAILURE;
-  AnalyticsTracker tracker(
+  if (count < 4) return EXIT_FAILURE;
+  const auto say = [](const std::string& line) {
+    std::puts(line.c_str());
+    std::fflush(stdout);
+  };
+  const std::shared_ptr<SpoolingTransport> transport =
       SpoolingTransport::make({.endpoint = *Varnel::Platform::URL::parse(arguments[1]),
                                .trackingID = "QN-1",
                                .clientID = "12.34",
                                .spoolPath = arguments[2],
-                               .plainHTTP = SpoolingTransport::PlainHTTP::allowed}),
-      Consent::granted);
-  for (int i = 0; i < std::atoi(arguments[3]); ++i)
-    tracker.context()->trackEvent("Process", std::to_string(i), std::nullopt, i, {}, {});
-  std::puts("tracked");
-  std::fflush(stdout);
+                               .plainHTTP = SpoolingTransport::PlainHTTP::allowed});
+  AnalyticsTracker tracker(transport, Consent::granted);
+  for (int i = 0; i < std::atoi(arguments[3]); ++i) {
+    const std::string name = std::to_string(::getpid()) + "." + std::to_string(i);
+    tracker.context()->trackEvent("Process", name, std::nullopt, i, {}, {});
+    say(name);
+  }
+  say("tracked");
+  if (count > 4 && arguments[4] == std::string_view("drain")) {
+    say(transport->drain(std::chrono::minutes(1)) ? "delivered" : "left");
+    return EXIT_SUCCESS;
+  }
   for (;;) ::pause();
 }

@@ -1,6 +1,12 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Tallyhouse/DeliveryPolicy.h>
 
+#include <algorithm>
+#include <functional>
+#include <numeric>
+#include <random>
+#include <vector>
+
 #include <gtest/gtest.h>
 
 namespace Tallyhouse {
@@ -25,25 +31,75 @@ TEST(DeliveryPolicy, OnlyAnAnswerOfTheServerItselfSettlesABatch) {
 
 TEST(DeliveryPolicy, RetriesBackOffAndHeedTheServerWithinReason) {
   const DeliveryPolicy policy;
+  using enum Obstacle;
   const struct {
     int failures;
+    Obstacle obstacle;
     std::optional<std::chrono::seconds> retryAfter;
     double random;
     DeliveryPolicy::Duration delay;
   } cases[] = {
-      {1, {}, 0, 5s},
-      {4, {}, 0, 40s},
-      {4, {}, 0.5, 30s},
-      {30, {}, 0, 1h},
-      {1'000'000, {}, 1, 30min},
-      {1, 120s, 0, 120s},
-      {10, 1s, 0, 2560s},
-      {1, std::chrono::seconds::max(), 0, 24h},
-      {1, -5s, 0, 5s},
-      {1, {}, 17, 2500ms},
+      {1, network, {}, 0, 5s},
+      {4, network, {}, 0.5, 30s},
+      {30, network, {}, 0, 2h},
+      {1, server, {}, 0, 30min},
+      {1, server, {}, 1, 15min},
+      {2, server, {}, 0, 1h},
+      {1'000'000, server, {}, 1, 1h},
+      {1, server, 3600s, 0, 1h},
+      {1, server, 3600s, 1, 2h},
+      {1, server, 60s, 0.5, 22min + 30s},
+      {1, server, std::chrono::seconds::max(), 1, 48h},
+      {1, network, -5s, 0, 5s},
+      {1, network, {}, 17, 2500ms},
   };
   for (const auto& c : cases)
-    EXPECT_EQ(policy.retryDelay(c.failures, c.retryAfter, c.random), c.delay) << c.failures;
+    EXPECT_EQ(policy.retryDelay(c.failures, c.obstacle, c.retryAfter, c.random), c.delay)
+        << c.failures << ' ' << c.random;
+}
+
+// How many times more installations send in the busiest minute after an outage of an hour than in
+// the mean of its busiest hour.
+double rushAfterAnHour(const std::function<DeliveryPolicy::Duration(
+                           int failures, DeliveryPolicy::Duration left, double random)>& delay) {
+  constexpr int installations = 200'000;
+  constexpr DeliveryPolicy::Duration outage = 1h;
+  std::minstd_rand engine(1);
+  std::uniform_real_distribution<double> random;
+  std::vector<int> minutes(4 * 60);
+  for (int i = 0; i < installations; ++i) {
+    auto next = std::chrono::duration_cast<DeliveryPolicy::Duration>(outage * random(engine));
+    for (int failures = 1; next < outage; ++failures)
+      next += delay(failures, outage - next, random(engine));
+    const auto minute = static_cast<std::size_t>((next - outage) / 1min);
+    if (minute < minutes.size()) ++minutes[minute];
+  }
+  const auto busiest = std::max_element(minutes.begin(), minutes.end());
+  const auto first = minutes.begin() + std::distance(minutes.begin(), busiest) / 60 * 60;
+  return *busiest * 60.0 / std::accumulate(first, first + 60, 0);
+}
+
+TEST(DeliveryPolicy, AFleetDoesNotComeBackInOneMinute) {
+  const DeliveryPolicy policy;
+  using Duration = DeliveryPolicy::Duration;
+  const auto seconds = [](Duration left) { return std::chrono::ceil<std::chrono::seconds>(left); };
+  const struct {
+    const char* what;
+    std::function<Duration(int failures, Duration left, double random)> delay;
+    double max;
+  } cases[] = {
+      {"it failed",
+       [&](int n, Duration, double r) { return policy.retryDelay(n, Obstacle::server, {}, r); }, 2},
+      {"it named its own end",
+       [&](int n, Duration left, double r) {
+         return policy.retryDelay(n, Obstacle::server, seconds(left), r);
+       },
+       3.2},
+  };
+  for (const auto& c : cases) {
+    const double rush = rushAfterAnHour(c.delay);
+    EXPECT_LT(rush, c.max) << c.what;
+  }
 }
 
 TEST(DeliveryPolicy, EventsWaitForCompanyButNotForAClockThatWasSetBack) {
@@ -54,18 +110,20 @@ TEST(DeliveryPolicy, EventsWaitForCompanyButNotForAClockThatWasSetBack) {
     std::optional<Date> notBefore;
     std::optional<Date> next;
   };
-  const Backlog one{.waiting = 1, .oldest = noon - 2s, .hasRefused = false};
-  const Backlog full{.waiting = 20, .oldest = noon, .hasRefused = false};
-  const Backlog refused{.waiting = 0, .oldest = {}, .hasRefused = true};
+  const Backlog one{.waiting = 1, .oldest = noon - 2s, .refused = {}};
+  const Backlog full{.waiting = 20, .oldest = noon, .refused = {}};
+  const Backlog refused{.waiting = 0, .oldest = {}, .refused = noon - 1s};
   const Case cases[] = {
       {"nothing", {}, noon + 1h, {}},
       {"one event lingers", one, {}, noon + 3s},
-      {"an event of tomorrow would otherwise wait for it", {1, noon + 24h, false}, {}, noon},
+      {"an event of tomorrow would otherwise wait for it", {1, noon + 24h, {}}, {}, noon},
       {"a full batch goes at once", full, {}, noon},
-      {"so does one that was refused", refused, {}, noon},
+      {"one that was refused rests", refused, {}, noon + 1h - 1s},
+      {"and holds up no other", {1, noon - 2s, noon - 1s}, {}, noon + 3s},
+      {"but not until a day that was", {0, {}, noon + 24h}, {}, noon},
       {"unless the server is left alone", full, noon + 10min, noon + 10min},
       {"which may be over", one, noon - 1h, noon + 3s},
-      {"or lie in a future that was", full, noon + 25h, noon},
+      {"or lie in a future that was", full, noon + 49h, noon},
   };
   for (const auto& c : cases)
     EXPECT_EQ(policy.nextSending(c.backlog, c.notBefore, noon), c.next) << c.what;

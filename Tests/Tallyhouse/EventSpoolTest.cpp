@@ -4,180 +4,308 @@
 #include <sys/stat.h>
 
 #include <fstream>
+#include <functional>
 
 #include <Tests/Support/Crew.h>
+#include <Tests/Support/MountNamespace.h>
 #include <Tests/Tallyhouse/SpoolFixture.h>
-#include <Varnel/Platform/Testing/FakeAppendFiles.h>
 
 namespace Tallyhouse {
 namespace {
 
 namespace fs = std::filesystem;
+using namespace std::chrono_literals;
 using EventSpoolTest = Tests::SpoolFixture;
-
-constexpr std::size_t many = 1000;
-
-// What another process does with the file, until its end.
-class Lock final {
- public:
-  using Database = Varnel::Platform::SQLiteDatabase;
-
-  Lock(const std::string& path, const std::string& sql)
-      : database_(Database::open(path, Database::Access::readWrite).value()) {
-    const auto error = database_->execute(sql);
-    EXPECT_FALSE(error) << error->localizedDescription();
-  }
-  void end() { database_.reset(); }
-
- private:
-  std::optional<Database> database_;
-};
+using Haste = EventRecorder::Haste;
+using Tests::OtherConnection;
 
 TEST_F(EventSpoolTest, KeepsWhatItTookInOrderAndForItsOwnerAlone) {
-  {
-    const auto spool = openSpool();
-    append(*spool, {"a", "b", "c"});
-    for (const char* suffix : {"", "-wal", "-shm"}) {
-      struct stat facts {};
-      ASSERT_EQ(::stat((path() + suffix).c_str(), &facts), 0);
-      EXPECT_EQ(facts.st_mode & 0777, 0600u) << suffix;
-    }
-    spool->checkpoint();
-    append(*spool, {"d"});
+  const auto recorder = openRecorder();
+  append(*recorder, {"c", "b", "a"});
+  clock.advance(-1h);
+  append(*recorder, {"d"});
+  for (const char* suffix : {"", "-wal", "-shm"}) {
+    struct stat facts {};
+    ASSERT_EQ(::stat((path() + suffix).c_str(), &facts), 0);
+    EXPECT_EQ(facts.st_mode & 0777, 0600u) << suffix;
   }
   const auto spool = openSpool();
-  EXPECT_EQ(namesOf(*spool), "a b c d ");
+  EXPECT_EQ(namesOf(*spool), "c b a d ");
   EXPECT_EQ(spool->waiting(2, many).size(), 2u);
   EXPECT_EQ(spool->waiting(many, 8).size(), 2u);
   EXPECT_EQ(spool->waiting(many, 1).size(), 1u) << "a large event goes alone";
-  EXPECT_EQ(spool->append("e", clock.now(), "ea=e"), 5);
+  EXPECT_EQ(spool->look("https://h.example", 2, 3)->backlog.waiting, 2);
   EXPECT_EQ(log.text(), "");
 }
 
 TEST_F(EventSpoolTest, WhatIsRefusedLeavesTheLineAndIsSetAsideAtLast) {
+  append(*openRecorder(), {"a", "b", "c"});
   const auto spool = openSpool();
-  append(*spool, {"a", "b", "c"});
-  const auto batch = spool->waiting(2, many);
-  spool->moveToRefused(batch);
+  const auto refuse = [&](std::vector<SpooledEvent> events) {
+    clock.advance(1s);
+    EXPECT_TRUE(spool->save({std::move(events), Verdict::refused, clock.now(), {}}));
+  };
+  refuse(spool->waiting(2, many));
   EXPECT_EQ(namesOf(*spool), "c ");
-  ASSERT_EQ(spool->refused(3)->uuid, "a");
-  spool->countRefusal(*spool->refused(3));
-  EXPECT_EQ(spool->refused(3)->uuid, "b") << "each gets its next try in turn";
-  EXPECT_TRUE(spool->removeRefused(*spool->refused(3)));
-  spool->countRefusal(*spool->refused(3));
-  EXPECT_FALSE(spool->refused(3));
-  EXPECT_FALSE(spool->backlog(3).hasRefused);
-}
-
-TEST_F(EventSpoolTest, DropsAndCountsTheOldestAtEitherLimit) {
-  {
-    const auto spool = openSpool({.maxEvents = 4, .maxBytes = 1000});
-    append(*spool, {"a", "b", "c", "d"});
-    spool->moveToRefused(spool->waiting(1, many));
-    append(*spool, {"e", "f"});
-    EXPECT_EQ(namesOf(*spool), "c d e f ");
-    EXPECT_FALSE(spool->refused(3));
-    EXPECT_EQ(spool->droppedCount(), 2);
-    spool->append("large", clock.now(), std::string(990, 'x'));
-    EXPECT_EQ(namesOf(*spool), "e f large ");
+  EXPECT_EQ(spool->look("https://h.example", 1, 3)->backlog.refused, clock.now());
+  for (const char* turn : {"a", "b", "a", "b"}) {
+    const auto refused = spool->refused(3);
+    ASSERT_EQ(refused.size(), 1u);
+    EXPECT_EQ(refused[0].uuid, turn);
+    refuse(refused);
   }
-  const auto spool = openSpool({.maxEvents = 2, .maxBytes = 1000});
-  EXPECT_EQ(spool->droppedCount(), 4);
-  append(*spool, {"g"});
-  EXPECT_EQ(namesOf(*spool), "large g ");
-  EXPECT_EQ(spool->droppedCount(), 6);
+  EXPECT_TRUE(spool->refused(3).empty());
+  EXPECT_FALSE(spool->look("https://h.example", 1, 3)->backlog.refused);
 }
 
-TEST_F(EventSpoolTest, ABatchThatWasClearedMeanwhileTakesNoNewEventWithIt) {
-  const auto spool = openSpool();
-  append(*spool, {"a", "b"});
-  const auto batch = spool->waiting(many, many);
-  spool->clear();
-  append(*spool, {"c", "d"});
-  EXPECT_TRUE(spool->removeWaiting(batch));
-  spool->moveToRefused(batch);
-  EXPECT_EQ(namesOf(*spool), "c d ");
-  EXPECT_FALSE(spool->refused(3));
-}
-
-TEST_F(EventSpoolTest, ADamagedFileIsPutBesideAndAnUnusableFolderOnlyCounts) {
-  fs::create_directories(folder.path() / "made");
-  std::ofstream(path()) << std::string(5000, 'x');
-  {
-    const auto spool = openSpool();
-    append(*spool, {"a"});
-    EXPECT_EQ(namesOf(*spool), "a ");
-    EXPECT_TRUE(fs::exists(path() + ".damaged"));
-    spool->clear();
-    EXPECT_FALSE(fs::exists(path() + ".damaged"));
-  }
-  std::ofstream(folder.path() / "file") << "no folder";
-  EventSpool lost({*files, log}, (folder.path() / "file/Analytics.db").string(), {});
-  append(lost, {"a", "b"});
-  EXPECT_EQ(lost.droppedCount(), 2);
-  EXPECT_EQ(namesOf(lost), "");
-  const std::string text = log.text();
-  EXPECT_EQ(std::count(text.begin(), text.end(), '\n'), 1) << text;
-}
-
-TEST_F(EventSpoolTest, AFileThatIsLockedOnlyDelays) {
-  append(*openSpool(), {"a", "b"});
-  Lock lock(path(), "PRAGMA locking_mode = EXCLUSIVE; BEGIN EXCLUSIVE");
-  const auto late = openSpool();
-  EXPECT_EQ(namesOf(*late), "");
-  lock.end();
-  append(*late, {"c"});
-  EXPECT_EQ(namesOf(*late), "a b c ") << "the file was not taken for damaged";
-  EXPECT_EQ(late->droppedCount(), 0);
-
-  Lock writing(path(), "BEGIN IMMEDIATE");
-  EXPECT_FALSE(late->removeWaiting(late->waiting(1, many)));
-  late->moveToRefused(late->waiting(1, many));
-  EXPECT_EQ(namesOf(*late), "a b c ");
-  late->clear();
-  EXPECT_FALSE(late->backlog(3).oldest) << "what is to be forgotten is not sent";
-  writing.end();
-  append(*late, {"d"});
-  EXPECT_EQ(namesOf(*late), "d ");
-}
-
-TEST_F(EventSpoolTest, WhatIsRefusedIsNotLostWhenItCannotBeMoved) {
-  const auto spool = openSpool();
-  append(*spool, {"a", "b"});
-  Lock other(path(),
-             "CREATE TRIGGER full BEFORE INSERT ON refused WHEN NEW.uuid = 'b'"
-             " BEGIN SELECT RAISE(ABORT, 'full'); END");
-  spool->moveToRefused(spool->waiting(many, many));
-  EXPECT_EQ(namesOf(*spool), "a b ");
-  EXPECT_FALSE(spool->refused(3));
-}
-
-TEST_F(EventSpoolTest, TheLimitsHoldForAllThatShareAFile) {
-  const auto one = openSpool({.maxEvents = 4, .maxBytes = 1000});
-  const auto other = openSpool({.maxEvents = 4, .maxBytes = 1000});
+TEST_F(EventSpoolTest, DropsAndCountsTheOldestAtEitherLimitWhoeverRecords) {
+  const auto one = openRecorder({.maxEvents = 4});
   append(*one, {"a", "b", "c"});
-  EXPECT_EQ(other->backlog(3).waiting, 3);
-  append(*other, {"d", "e"});
-  EXPECT_EQ(namesOf(*other), "b c d e ");
+  const auto spool = openSpool();
+  EXPECT_TRUE(spool->save({spool->waiting(1, many), Verdict::refused, clock.now(), {}}));
+  clock.advance(1ms);
+  append(*openRecorder({.maxEvents = 4}), {"d", "e", "f"});
+  EXPECT_EQ(namesOf(*spool), "c d e f ");
+  EXPECT_TRUE(spool->refused(3).empty()) << "they count, too";
+  EXPECT_EQ(one->droppedCount(), 2);
+  EXPECT_FALSE(spool->isDelivered(one->own())) << "gone is not delivered";
+
+  const auto small = openRecorder({.maxBytes = 100 << 10});
+  for (int i = 0; i < 200; ++i) small->append("large", clock.now(), std::string(5000, 'x'));
+  EXPECT_LT(fs::file_size(path() + "-wal") + fs::file_size(path()), 8u << 20);
+  const auto kept = spool->waiting(many, many << 20).size();
+  EXPECT_GT(kept, 5u);
+  EXPECT_LT(kept, 20u);
+  EXPECT_EQ(small->droppedCount(), 6 + 200 - static_cast<std::int64_t>(kept));
+}
+
+TEST_F(EventSpoolTest, ARefusalOfConsentReachesWhatOtherProcessesHoldAndDo) {
+  const auto one = openRecorder();
+  const auto other = openRecorder();
+  const auto spool = openSpool();
+  append(*one, {"a"});
+  append(*other, {"b"});
+  const auto batch = spool->waiting(many, many);
+  {
+    OtherConnection lock(path(), "BEGIN IMMEDIATE");
+    append(*other, {"held"});
+    EXPECT_TRUE(other->own().isHeld);
+  }
+  std::ofstream(path() + ".damaged") << "x";
+  one->discard();
+  EXPECT_FALSE(fs::exists(path() + ".damaged"));
+  one->begin();
+  append(*one, {"c"});
+  EXPECT_FALSE(other->settle(spool->file(), Haste::none));
+  append(*other, {"d"});
+  EXPECT_EQ(namesOf(*spool), "c ") << "the other process asks before it records again";
+  EXPECT_FALSE(spool->isDelivered(other->own()));
+  for (const Verdict verdict : {Verdict::delivered, Verdict::refused})
+    EXPECT_TRUE(spool->save({batch, verdict, clock.now(), {}}));
+  EXPECT_EQ(namesOf(*spool), "c ") << "the batch on its way took nothing with it";
+  EXPECT_TRUE(spool->refused(3).empty());
+  other->begin();
+  append(*other, {"e"});
+  EXPECT_EQ(one->droppedCount(), 0);
+
+  const std::string secret = "Secret";
+  append(*one, {secret});
+  one->discard();
+  for (const char* suffix : {"", "-wal"}) {
+    std::ifstream file(path() + suffix, std::ios::binary);
+    const std::string bytes(std::istreambuf_iterator<char>(file), {});
+    EXPECT_EQ(bytes.find(secret), std::string::npos) << suffix;
+  }
+}
+
+TEST_F(EventSpoolTest, ARefusalThatTheFileDoesNotAllowYetIsMadeUpFor) {
+  const auto recorder = openRecorder();
+  const auto spool = openSpool();
+  append(*recorder, {"a"});
+  OtherConnection lock(path(), "BEGIN IMMEDIATE");
+  recorder->discard();
+  EXPECT_TRUE(recorder->mustEmpty());
+  recorder->begin();
+  append(*recorder, {"b"});
+  lock.end();
+  EXPECT_FALSE(recorder->settle(spool->file(), Haste::none));
+  EXPECT_EQ(namesOf(*spool), "b ");
+  append(*recorder, {"c"});
+  EXPECT_EQ(namesOf(*spool), "b c ");
+}
+
+// What keeps the file away while it lives.
+using Obstacle = std::shared_ptr<void>;
+
+Obstacle until(std::function<void()> end) {
+  return {nullptr, [end = std::move(end)](void*) { end(); }};
+}
+
+struct AwayCase {
+  const char* what;
+  bool isSudden;  // Or there before the process is.
+  std::function<Obstacle(const std::string& path)> make;
+};
+
+class AwayTest : public EventSpoolTest {
+ protected:
+  void expectAllIsWrittenLater(const AwayCase& c) {
+    SCOPED_TRACE(c.what);
+    append(*openRecorder(), {"a"});
+    clock.advance(1ms);
+    std::unique_ptr<EventRecorder> recorder;
+    if (c.isSudden) recorder = openRecorder({.maxHeldEvents = 100});
+    if (c.isSudden) append(*recorder, {"b"});
+    Obstacle obstacle = c.make(path());
+    if (!recorder) recorder = openRecorder({.maxHeldEvents = 100});
+    const auto start = std::chrono::steady_clock::now();
+    append(*recorder, {"given up"});
+    for (int i = 0; i < 97; ++i) append(*recorder, {"x"});
+    append(*recorder, {"c", "d", "e"});
+    EXPECT_LT(std::chrono::steady_clock::now() - start, 1s) << "only the first waits";
+    const auto spool = openSpool();
+    EXPECT_TRUE(recorder->settle(spool->file(), Haste::none));
+    EXPECT_TRUE(recorder->own().isHeld);
+    EXPECT_TRUE(recorder->own().hasLost);
+    obstacle.reset();
+    EXPECT_FALSE(recorder->settle(spool->file(), Haste::none));
+    append(*recorder, {"f"});
+    const std::string found = names();
+    EXPECT_TRUE(found.starts_with(c.isSudden ? "a b x " : "a x ")) << found;
+    EXPECT_TRUE(found.ends_with("x c d e f ")) << found;
+    EXPECT_EQ(recorder->droppedCount(), 1);
+  }
+};
+
+TEST_F(AwayTest, WhileTheFileIsLockedOrAnothersEventsAreHeld) {
+  const auto lock = [](const char* sql) {
+    return [sql](const std::string& path) -> Obstacle {
+      return std::make_shared<OtherConnection>(path, sql);
+    };
+  };
+  const auto instead = [](auto make) {
+    return [make](const std::string& path) {
+      const auto rename = [path](const char* from, const char* to) {
+        for (const char* suffix : {"", "-wal"})
+          fs::rename(path + from + suffix, path + to + suffix);
+      };
+      rename("", ".away");
+      make(path);
+      return until([path, rename] {
+        fs::remove_all(path);
+        rename(".away", "");
+      });
+    };
+  };
+  const AwayCase cases[] = {
+      {"written to", true, lock("BEGIN IMMEDIATE")},
+      {"locked as a whole", false, lock("PRAGMA locking_mode = EXCLUSIVE; BEGIN EXCLUSIVE")},
+      {"a folder", false, instead([](const std::string& path) { fs::create_directory(path); })},
+      {"a link", false,
+       instead([](const std::string& path) { fs::create_symlink(path + ".away", path); })},
+      {"another program's", false, instead([](const std::string& path) {
+         OtherConnection(path, "PRAGMA application_id = 7; CREATE TABLE theirs(x)");
+       })},
+      {"of a later format", false,
+       [](const std::string& path) {
+         OtherConnection(path, "PRAGMA user_version = 2000");
+         return until([path] { OtherConnection(path, "PRAGMA user_version = 1000"); });
+       }},
+  };
+  for (const AwayCase& c : cases) {
+    expectAllIsWrittenLater(c);
+    fs::remove_all(fs::path(path()).parent_path());
+  }
+}
+
+TEST_F(AwayTest, WhileTheDiskIsFullOrReadOnlyEventsAreHeld) {
+  if (const std::string reason = Varnel::Tests::enterMountNamespace(); !reason.empty())
+    GTEST_SKIP() << reason;
+  const std::string made = fs::path(path()).parent_path();
+  const auto fill = [](const std::string& path) {
+    std::ofstream(path + ".filler") << std::string(4 << 20, 'x');
+    return until([path] { fs::remove(path + ".filler"); });
+  };
+  const auto protect = [made](const std::string&) {
+    constexpr auto change = MS_REMOUNT | MS_BIND;
+    EXPECT_EQ(::mount("", made.c_str(), nullptr, change | MS_RDONLY, nullptr), 0);
+    return until([made] { EXPECT_EQ(::mount("", made.c_str(), nullptr, change, nullptr), 0); });
+  };
+  const AwayCase cases[] = {
+      {"full", true, fill}, {"full at first", false, fill}, {"read-only", false, protect}};
+  for (const AwayCase& c : cases) {
+    fs::create_directories(made);
+    ASSERT_TRUE(Varnel::Tests::mountMemory(made));
+    expectAllIsWrittenLater(c);
+    ASSERT_EQ(::umount2(made.c_str(), MNT_DETACH), 0);
+  }
+}
+
+TEST_F(AwayTest, WhatIsTakenAwayIsGivenBackByTheProcessesThatLive) {
+  const struct {
+    const char* what;
+    std::function<void(const std::string& path)> take;
+    const char* left;
+  } cases[] = {
+      {"the file is removed", [](const std::string& path) { fs::remove(path); }, "a b c d "},
+      {"or moved", [](const std::string& path) { fs::rename(path, path + ".old"); }, "a b c d "},
+      {"with its journal",
+       [](const std::string& path) {
+         for (const char* suffix : {"", "-wal", "-shm"}) fs::remove(path + suffix);
+       },
+       "a b c d "},
+      {"the journal alone", [](const std::string& path) { fs::remove(path + "-wal"); }, "a b c d "},
+      {"the folder", [](const std::string& path) { fs::remove_all(fs::path(path).parent_path()); },
+       "a b c d "},
+      {"another spool stands there",
+       [this](const std::string& path) {
+         fs::rename(path, path + ".old");
+         fs::rename(path + "-wal", path + ".old-wal");
+         fs::remove(path + "-shm");
+         append(*openRecorder(), {"other"});
+       },
+       "a b other c d "},
+      {"it is overwritten", [](const std::string& path) { std::ofstream(path) << "x"; },
+       "a b c d "},
+  };
+  for (const auto& c : cases) {
+    SCOPED_TRACE(c.what);
+    const auto recorder = openRecorder();
+    const auto spool = openSpool();
+    append(*recorder, {"a", "b"});
+    EXPECT_EQ(namesOf(*spool), "a b ");
+    clock.advance(1ms);
+    c.take(path());
+    clock.advance(1ms);
+    append(*recorder, {"c"});
+    append(*recorder, {"d"});
+    EXPECT_EQ(namesOf(*spool), c.left);
+    EXPECT_EQ(names(), c.left);
+    fs::remove_all(fs::path(path()).parent_path());
+  }
 }
 
 TEST_F(EventSpoolTest, ThreadsAndProcessesMayShareAFile) {
-  const auto one = openSpool();
-  const auto other = openSpool();
+  const auto one = openRecorder();
+  const auto other = openRecorder();
+  const auto spool = openSpool();
   constexpr int each = 200;
   Varnel::Tests::Crew threads(4, [&](unsigned i) {
-    for (int n = 0; n < each; ++n) (i % 2 ? *one : *other).append("x", clock.now(), "ea=x");
+    for (int n = 0; n < each; ++n)
+      (i % 2 ? *one : *other).append(std::to_string(i) + '-' + std::to_string(n), clock.now(), "x");
   });
   std::size_t removed = 0;
   while (removed < 2 * each) {
-    const auto batch = one->waiting(20, many);
-    EXPECT_TRUE(one->removeWaiting(batch));
-    removed += batch.size();
-    one->checkpoint();
+    const auto batch = spool->waiting(20, many);
+    if (spool->save({batch, Verdict::delivered, clock.now(), {}})) removed += batch.size();
+    spool->file().checkpoint();
+    one->settle(spool->file(), Haste::none);
+    other->settle(spool->file(), Haste::none);
   }
   threads.join();
-  const std::size_t left = other->waiting(10'000, 1 << 20).size();
-  EXPECT_EQ(removed + left, 4u * each);
+  for (EventRecorder* recorder : {one.get(), other.get()})
+    EXPECT_FALSE(recorder->settle(spool->file(), Haste::none));
+  EXPECT_EQ(removed + spool->waiting(many, many).size(), 4u * each);
   EXPECT_EQ(one->droppedCount(), 0);
 }
 

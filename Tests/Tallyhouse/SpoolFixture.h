@@ -9,37 +9,66 @@
 
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
-#include <Varnel/Platform/Ports/AppendFiles.h>
+#include <Varnel/Platform/Ports/PrivateFiles.h>
+#include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Platform/Testing/SimulatedClock.h>
+#include <Varnel/Tallyhouse/EventRecorder.h>
 #include <Varnel/Tallyhouse/EventSpool.h>
 
 namespace Tallyhouse::Tests {
 
-/// A spool in a folder of its own, and a clock.
+/// What another process does with a database file, until its end.
+class OtherConnection final {
+ public:
+  using Database = Varnel::Platform::SQLiteDatabase;
+
+  OtherConnection(const std::string& path, const std::string& sql)
+      : database_(Database::open(path, Database::Access::readWrite).value()) {
+    const auto error = database_->execute(sql);
+    EXPECT_FALSE(error) << error->localizedDescription();
+  }
+  void end() { database_.reset(); }
+
+ private:
+  std::optional<Database> database_;
+};
+
+/// A spool in a folder of its own, and a clock. Each recorder stands for a process.
 class SpoolFixture : public testing::Test {
  protected:
-  std::unique_ptr<EventSpool> openSpool(SpoolLimits limits = {}) {
-    return std::make_unique<EventSpool>(EventSpool::Ports{*files, log}, path(), limits);
+  static constexpr std::size_t many = 100'000;
+
+  std::unique_ptr<EventRecorder> openRecorder(SpoolLimits limits = {}) {
+    auto recorder =
+        std::make_unique<EventRecorder>(EventRecorder::Ports{*files, clock, log}, path(), limits);
+    recorder->begin();
+    return recorder;
+  }
+  std::unique_ptr<EventSpool> openSpool() {
+    return std::make_unique<EventSpool>(EventSpool::Ports{*files, log}, path());
   }
 
   [[nodiscard]] std::string path() const { return (folder.path() / "made/Analytics.db").string(); }
 
   /// Appends events whose UUIDs and texts are these.
-  void append(EventSpool& spool, std::initializer_list<std::string_view> names) {
+  void append(EventRecorder& recorder, std::initializer_list<std::string_view> names) {
     for (const std::string_view name : names)
-      spool.append(name, clock.now(), "ea=" + std::string(name));
+      recorder.append(name, clock.now(), "ea=" + std::string(name));
   }
 
   /// The names of what waits, in line.
   static std::string namesOf(EventSpool& spool) {
     std::string names;
-    for (const SpooledEvent& event : spool.waiting(1000, 1 << 20)) names += event.uuid + " ";
+    for (const SpooledEvent& event : spool.waiting(many, many)) names += event.uuid + " ";
     return names;
   }
+  /// What a process finds that opens the spool now.
+  std::string names() { return namesOf(*openSpool()); }
 
   Varnel::Tests::TemporaryFolder folder;
-  std::unique_ptr<Varnel::Platform::AppendFiles> files = Varnel::Platform::POSIX::makeAppendFiles();
+  std::unique_ptr<Varnel::Platform::PrivateFiles> files =
+      Varnel::Platform::POSIX::makePrivateFiles();
   Varnel::Platform::Testing::CapturedSystemLog log;
   Varnel::Platform::Testing::SimulatedClock clock{
       Varnel::Platform::Date(std::chrono::hours(500'000))};

@@ -22,7 +22,7 @@ class SpoolingTransportTest : public Tests::SpoolFixture {
   std::unique_ptr<SpoolingTransport> make(
       const char* endpoint = "https://h.example/batch",
       SpoolingTransport::PlainHTTP plain = SpoolingTransport::PlainHTTP::refused) {
-    return SpoolingTransport::make({*files, clock, http, log}, {.endpoint = *URL::parse(endpoint),
+    return SpoolingTransport::make({clock, http, *files, log}, {.endpoint = *URL::parse(endpoint),
                                                                 .trackingID = "QN-1",
                                                                 .clientID = "12.34",
                                                                 .spoolPath = path(),
@@ -88,16 +88,57 @@ TEST_F(SpoolingTransportTest, AWithdrawnConsentStopsTransfersAndForgets) {
 }
 
 TEST_F(SpoolingTransportTest, WhatEarlierRunsLeftGoesWithConsentAlone) {
-  append(*openSpool(), {"a", "b"});
+  append(*openRecorder(), {"a", "b"});
   { AnalyticsTracker tracker({clock}, make(), Consent::refused); }
   EXPECT_TRUE(http.posts().empty());
-  EXPECT_EQ(namesOf(*openSpool()), "");
+  EXPECT_EQ(names(), "");
 
-  append(*openSpool(), {"c"});
+  append(*openRecorder(), {"c"});
   { AnalyticsTracker tracker({clock}, make()); }
   EXPECT_TRUE(http.posts().empty());
   const auto transport = std::shared_ptr(make());
   AnalyticsTracker tracker({clock}, transport, Consent::granted);
+  EXPECT_TRUE(transport->drain(30s));
+  EXPECT_EQ(http.posts().size(), 1u);
+}
+
+TEST_F(SpoolingTransportTest, ADrainAnswersForItsOwnProcessWhoeverDelivers) {
+  std::binary_semaphore isPosting(0);
+  std::binary_semaphore mayAnswer(0);
+  http.setServer([&](const HTTPPost&) {
+    isPosting.release();
+    mayAnswer.acquire();
+    return HTTPResponse{.status = 200, .retryAfter = {}};
+  });
+  const auto one = std::shared_ptr(make());
+  const auto other = std::shared_ptr(make());
+  AnalyticsTracker tracker({clock}, one, Consent::granted);
+  AnalyticsTracker otherTracker({clock}, other, Consent::granted);
+  track(otherTracker, "Theirs");
+  for (int i = 0; i < 20; ++i) track(tracker, "Ours");
+  isPosting.acquire();
+  // One of the two is at it. Neither can say that its events are delivered, and neither sends any.
+  EXPECT_FALSE(one->drain(1ms));
+  EXPECT_FALSE(other->drain(1ms));
+  http.setServer([](const HTTPPost&) { return HTTPResponse{.status = 200, .retryAfter = {}}; });
+  mayAnswer.release();
+  EXPECT_TRUE(one->drain(30s));
+  EXPECT_TRUE(other->drain(30s));
+  std::ptrdiff_t lines = 0;
+  for (const HTTPPost& post : http.posts())
+    lines += 1 + std::count(post.body.begin(), post.body.end(), '\n');
+  EXPECT_EQ(lines, 21);
+}
+
+TEST_F(SpoolingTransportTest, ALockedFileDelaysADrainThatIsGranted) {
+  const auto transport = std::shared_ptr(make());
+  AnalyticsTracker tracker({clock}, transport, Consent::granted);
+  std::optional<Tests::OtherConnection> lock;
+  lock.emplace(path(), "BEGIN IMMEDIATE");
+  track(tracker, "Held");
+  EXPECT_FALSE(transport->drain(100ms));
+  EXPECT_TRUE(http.posts().empty());
+  lock.reset();
   EXPECT_TRUE(transport->drain(30s));
   EXPECT_EQ(http.posts().size(), 1u);
 }

@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <atomic>
+#include <cerrno>
 #include <chrono>
 #include <condition_variable>
 #include <cstdlib>
@@ -40,8 +41,13 @@ std::size_t ignoreContent(char*, std::size_t size, std::size_t count, void* rece
   return total <= maxContentBytes ? size * count : 0;
 }
 
-HTTPFailure failure(CURLcode code) {
-  return {curl_easy_strerror(code)};
+HTTPFailure failure(CURLcode code, CURL* easy = nullptr) {
+  long reason = 0;
+  if (easy) curl_easy_getinfo(easy, CURLINFO_OS_ERRNO, &reason);
+  const bool isWayMissing = reason == ENETUNREACH || reason == ENETDOWN || reason == EHOSTUNREACH;
+  return {.message = curl_easy_strerror(code),
+          .isOffline = code == CURLE_COULDNT_RESOLVE_HOST || code == CURLE_COULDNT_RESOLVE_PROXY ||
+                       (code == CURLE_COULDNT_CONNECT && isWayMissing)};
 }
 
 // The server's answer so far; absent until its final status has come. A proxy's answer to a request
@@ -89,7 +95,7 @@ class CurlHTTPClient final : public HTTPClient {
     // The final status is the answer, whatever became of the content.
     if (const auto response = responseOf(easy.get())) return *response;
     if (code == CURLE_ABORTED_BY_CALLBACK) return HTTPFailure{"cancelled"};
-    return failure(code == CURLE_OK ? CURLE_GOT_NOTHING : code);
+    return failure(code == CURLE_OK ? CURLE_GOT_NOTHING : code, easy.get());
   }
 
   void close() {

@@ -1,0 +1,320 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Tallyhouse/EventRecorder.h>
+
+#include <algorithm>
+#include <functional>
+#include <utility>
+#include <vector>
+
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
+#include <fmt/format.h>
+
+namespace Tallyhouse {
+
+using Varnel::Platform::Date;
+using Varnel::Platform::DurableFile;
+using Varnel::Platform::SQLiteDatabase;
+using Varnel::Platform::SQLiteStatement;
+using Error = std::optional<Varnel::Platform::PlatformError>;
+
+namespace {
+
+std::int64_t numberOf(Date date) {
+  return date.time_since_epoch().count();
+}
+
+// The first column of the first row, or 0.
+Error readNumber(SQLiteDatabase& database, const char* sql, std::int64_t& number) {
+  const auto found = database.integer(sql);
+  if (!found) return found.error();
+  number = found.value().value_or(0);
+  return std::nullopt;
+}
+
+constexpr const char* selectEpoch = "SELECT epoch FROM state";
+
+Error setEpoch(SQLiteDatabase& database, std::int64_t epoch) {
+  return run(database,
+             "INSERT INTO state(id, epoch) VALUES(1, ?1)"
+             " ON CONFLICT(id) DO UPDATE SET epoch = ?1",
+             epoch);
+}
+
+Error addDropped(SQLiteDatabase& database, std::int64_t count, std::int64_t lastID) {
+  return run(database,
+             "INSERT INTO state(id, dropped, lost_through) VALUES(1, ?1, ?2)"
+             " ON CONFLICT(id) DO UPDATE SET dropped = dropped + ?1,"
+             " lost_through = max(lost_through, ?2)",
+             count, lastID);
+}
+
+// The event may be there already: a change is made again when the file was replaced meanwhile. Or
+// another process's event has the number.
+Error insertOnce(SQLiteDatabase& database, SpooledEvent& event) {
+  for (;; ++event.id) {
+    auto error =
+        run(database, "INSERT OR IGNORE INTO event(id, date, uuid, hit) VALUES(?, ?, ?, ?)",
+            event.id, numberOf(event.date), event.uuid, event.hit);
+    if (error || database.changedRows() > 0) return error;
+    bool isThere = false;
+    error = query(
+        database, "SELECT 1 FROM event WHERE id = ? AND uuid = ?",
+        [&](SQLiteStatement&) { return !(isThere = true); }, event.id, event.uuid);
+    if (error || isThere) return error;
+  }
+}
+
+// Other processes write as well, so nobody takes more than an eighth of what is free. A full spool
+// loses a hundredth at a time, so that most events find room without a count.
+Error trim(SQLiteDatabase& database, const SpoolLimits& limits, SpoolRoom& room) {
+  for (;;) {
+    std::int64_t events = 0;
+    std::int64_t bytes = 0;
+    auto error = readNumber(database, "SELECT count(*) FROM event", events);
+    if (!error)
+      error = readNumber(database,
+                         "SELECT (page_count - freelist_count) * page_size FROM"
+                         " pragma_page_count, pragma_freelist_count, pragma_page_size",
+                         bytes);
+    if (error) return error;
+    if (events == 0 || (events <= limits.maxEvents && bytes <= limits.maxBytes)) {
+      room = {.events = std::max((limits.maxEvents - events) / 8, limits.maxEvents / 100 + 1),
+              .bytes = std::max((limits.maxBytes - bytes) / 8, limits.maxBytes / 100 + 1)};
+      return std::nullopt;
+    }
+    std::int64_t last = 0;
+    error = query(
+        database, "SELECT max(id) FROM (SELECT id FROM event ORDER BY id LIMIT ?)",
+        [&](SQLiteStatement& row) {
+          last = row.integer(0).value_or(0);
+          return false;
+        },
+        events / 100 + 1);
+    if (!error) error = run(database, "DELETE FROM event WHERE id <= ?", last);
+    if (!error) error = addDropped(database, database.changedRows(), last);
+    if (error) return error;
+  }
+}
+
+}  // namespace
+
+// What could not be done yet, and how it went.
+struct EventRecorder::Work final {
+  std::vector<SpooledEvent> events;
+  std::int64_t lastID = 0;
+  std::int64_t dropped = 0;
+  std::optional<std::int64_t> refusal;
+  std::int64_t epoch = 0;  ///< The file's, afterwards.
+  SpoolRoom room;
+
+  Error doIn(SQLiteDatabase& database, const SpoolLimits& limits) {
+    auto error = readNumber(database, selectEpoch, epoch);
+    if (!error && refusal) {
+      epoch = std::max(epoch + 1, *refusal);
+      // What is forgotten must not be found in the free parts of the file.
+      error = database.execute("PRAGMA secure_delete = ON; DELETE FROM event");
+      if (!error) error = setEpoch(database, epoch);
+    }
+    for (SpooledEvent& event : events)
+      if (!error && (refusal || epoch <= event.epoch)) error = insertOnce(database, event);
+    if (!error && dropped > 0) error = addDropped(database, dropped, 0);
+    return error ? error : trim(database, limits, room);
+  }
+};
+
+EventRecorder::EventRecorder(Ports ports, std::string path, SpoolLimits limits)
+    : ports_(ports),
+      path_(path),
+      limits_(limits),
+      file_({ports.privateFiles, ports.systemLog}, path, spoolFormat(),
+            Varnel::Platform::Migrating::allowed) {}
+
+EventRecorder::~EventRecorder() {
+  settle(file_, Haste::none);
+  if (!held_.empty())
+    ports_.systemLog.write(fmt::format("{} events are lost: {}", held_.size(), path_));
+}
+
+void EventRecorder::begin() {
+  const std::lock_guard atFile(fileMutex_);
+  std::int64_t epoch = 0;
+  const auto error = file_.read(
+      [&](SQLiteDatabase& database) { return readNumber(database, selectEpoch, epoch); });
+  const std::lock_guard lock(mutex_);
+  own_.epoch = error ? numberOf(ports_.clock.now()) : epoch;
+  isRevoked_ = false;
+}
+
+std::int64_t EventRecorder::append(std::string_view uuid, Date date, std::string_view hit) {
+  const std::lock_guard atFile(fileMutex_);
+  SpooledEvent event = named(uuid, date, hit);
+  if (event.id == 0) return 0;
+  if (mayInsert() && insert(event)) {
+    const std::lock_guard lock(mutex_);
+    --room_.events;
+    room_.bytes -= static_cast<std::int64_t>(event.hit.size());
+    return ++waiting_;
+  }
+  const std::int64_t held = hold(std::move(event));
+  settle(file_, Haste::usual);
+  return held;
+}
+
+SpooledEvent EventRecorder::named(std::string_view uuid, Date date, std::string_view hit) {
+  constexpr int randomBits = 20;
+  constexpr std::int64_t maxTime = std::int64_t{1} << (62 - randomBits);
+  const auto time = std::chrono::duration_cast<std::chrono::milliseconds>(date.time_since_epoch());
+  const auto random = std::hash<std::string_view>()(uuid) & ((1U << randomBits) - 1);
+  const std::int64_t id = std::clamp<std::int64_t>(time.count(), 0, maxTime) << randomBits |
+                          static_cast<std::int64_t>(random);
+  const std::lock_guard lock(mutex_);
+  if (isRevoked_) return {};
+  lastID_ = std::max(lastID_ + 1, id);
+  if (own_.first == 0) own_.first = lastID_;
+  own_.last = lastID_;
+  return {.id = lastID_,
+          .uuid = std::string(uuid),
+          .date = date,
+          .hit = std::string(hit),
+          .refusals = 0,
+          .epoch = own_.epoch};
+}
+
+bool EventRecorder::mayInsert() const {
+  const std::lock_guard lock(mutex_);
+  return held_.empty() && !mustEmpty_ && room_.events > 0 && room_.bytes > 0;
+}
+
+// The usual way, for little more than the row itself. Whatever is unusual is left to `settle`.
+bool EventRecorder::insert(const SpooledEvent& event) {
+  bool isInserted = false;
+  const auto error = file_.changeByOneStatement([&](SQLiteDatabase& database) {
+    auto failure = run(database,
+                       "INSERT OR IGNORE INTO event(id, date, uuid, hit) SELECT ?, ?, ?, ?"
+                       " WHERE coalesce((SELECT epoch FROM state), 0) <= ?",
+                       event.id, numberOf(event.date), event.uuid, event.hit, event.epoch);
+    isInserted = !failure && database.changedRows() > 0;
+    return failure;
+  });
+  if (error) {
+    const std::lock_guard lock(mutex_);
+    pause_.failed(ports_.clock.now());
+  }
+  return isInserted;
+}
+
+std::int64_t EventRecorder::hold(SpooledEvent event) {
+  const std::lock_guard lock(mutex_);
+  heldBytes_ += event.hit.size();
+  held_.push_back(std::move(event));
+  while (held_.size() > limits_.maxHeldEvents || heldBytes_ > limits_.maxHeldBytes) {
+    heldBytes_ -= held_.front().hit.size();
+    held_.pop_front();
+    ++dropped_;
+    own_.hasLost = true;
+  }
+  return static_cast<std::int64_t>(held_.size());
+}
+
+void EventRecorder::countDropped() {
+  const std::lock_guard lock(mutex_);
+  ++dropped_;
+}
+
+void EventRecorder::discard() {
+  const std::lock_guard atFile(fileMutex_);
+  {
+    const std::lock_guard lock(mutex_);
+    held_.clear();
+    heldBytes_ = 0;
+    own_ = {};
+    mustEmpty_ = true;
+    refusal_ = numberOf(ports_.clock.now());
+  }
+  settle(file_, Haste::none);
+  file_.removeSetAside();
+  // Nor must it be found in the log.
+  static_cast<void>(file_.changeByOneStatement([](SQLiteDatabase& database) {
+    return database.execute("PRAGMA wal_checkpoint(TRUNCATE)");
+  }));
+}
+
+std::optional<Date> EventRecorder::settle(DurableFile& file, Haste haste) {
+  Work work;
+  {
+    const std::lock_guard lock(mutex_);
+    if (!hasWork()) return std::nullopt;
+    const Date now = ports_.clock.now();
+    const bool isTooEarly = haste == Haste::usual && !pause_.isOver(now);
+    if (!isTooEarly) pause_.failed(now);
+    if (isTooEarly || isSettling_) return pause_.end();
+    isSettling_ = true;
+    work.events.assign(held_.begin(), held_.end());
+    work.lastID = lastID_;
+    work.dropped = dropped_;
+    if (mustEmpty_) work.refusal = refusal_;
+  }
+  const auto error =
+      file.change([&](SQLiteDatabase& database) { return work.doIn(database, limits_); });
+  const std::lock_guard lock(mutex_);
+  isSettling_ = false;
+  if (error) return pause_.end();
+  pause_ = {};
+  finish(work);
+  return hasWork() ? std::optional(ports_.clock.now()) : std::nullopt;
+}
+
+void EventRecorder::finish(const Work& work) {
+  dropped_ -= work.dropped;
+  for (; !held_.empty() && held_.front().id <= work.lastID; held_.pop_front())
+    heldBytes_ -= held_.front().hit.size();
+  if (!work.events.empty()) own_.last = lastID_ = std::max(lastID_, work.events.back().id);
+  waiting_ += static_cast<std::int64_t>(work.events.size());
+  room_ = work.room;
+  if (work.refusal) {
+    mustEmpty_ = refusal_ != *work.refusal;
+    own_.epoch = work.epoch;
+  }
+  isRevoked_ = work.epoch > own_.epoch;
+}
+
+bool EventRecorder::mustEmpty() const {
+  const std::lock_guard lock(mutex_);
+  return mustEmpty_;
+}
+
+// An event that comes between the two calls counts from 1, and so wakes who looks.
+void EventRecorder::looking() {
+  const std::lock_guard lock(mutex_);
+  waiting_ = 0;
+}
+
+void EventRecorder::seen(std::int64_t waiting) {
+  const std::lock_guard lock(mutex_);
+  waiting_ += waiting;
+}
+
+OwnEvents EventRecorder::own() const {
+  const std::lock_guard lock(mutex_);
+  OwnEvents own = own_;
+  own.isHeld = !held_.empty();
+  return own;
+}
+
+void EventRecorder::forget(const OwnEvents& delivered) {
+  const std::lock_guard lock(mutex_);
+  own_.first = own_.last == delivered.last ? 0 : delivered.last + 1;
+}
+
+std::int64_t EventRecorder::droppedCount() {
+  const std::lock_guard atFile(fileMutex_);
+  std::int64_t dropped = 0;
+  static_cast<void>(file_.read([&](SQLiteDatabase& database) {
+    return readNumber(database, "SELECT dropped FROM state", dropped);
+  }));
+  const std::lock_guard lock(mutex_);
+  return dropped + dropped_;
+}
+
+}  // namespace Tallyhouse

@@ -1,0 +1,140 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <deque>
+#include <mutex>
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include <Varnel/Platform/SQLite/DurableFile.h>
+#include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Tallyhouse/GrowingPause.h>
+#include <Varnel/Tallyhouse/SpoolFormat.h>
+
+namespace Varnel::Platform {
+class Clock;
+class PrivateFiles;
+class SystemLog;
+}  // namespace Varnel::Platform
+
+namespace Tallyhouse {
+
+/// How much may wait. Further events push out the oldest.
+struct SpoolLimits final {
+  std::int64_t maxEvents = 10'000;
+  std::int64_t maxBytes = 8 << 20;   ///< Of the file, without what is free in it.
+  std::size_t maxHeldEvents = 1000;  ///< In memory, while the file cannot be had.
+  std::size_t maxHeldBytes = 1 << 20;
+};
+
+/// How much may be written before the file's events are counted again.
+struct SpoolRoom final {
+  std::int64_t events = 0;
+  std::int64_t bytes = 0;
+};
+
+/// What a process has recorded and not yet seen delivered: the numbers from first to last.
+struct OwnEvents final {
+  std::int64_t first = 0;  ///< 0: none.
+  std::int64_t last = 0;
+  std::int64_t epoch = 0;
+  bool isHeld = false;   ///< Some are not in the file yet.
+  bool hasLost = false;  ///< Some had to be given up.
+};
+
+/// Writes the events of this process into the spool. What it has taken survives the end of the
+/// process, but not always a loss of power.
+///
+/// While the file cannot be had, be it locked, full, read-only or refused, events are held in
+/// memory, and `settle` writes them as soon as that works. What memory cannot hold is given up, the
+/// oldest first, and counted.
+///
+/// Any thread. Nothing throws but for want of memory. No operation waits more than 20 ms for
+/// somebody else's lock, and none for `settle`, which works on the file of its caller.
+class EventRecorder final {
+ public:
+  struct Ports {
+    Varnel::Platform::PrivateFiles& privateFiles;
+    Varnel::Platform::Clock& clock;
+    Varnel::Platform::SystemLog& systemLog;
+  };
+
+  EventRecorder(Ports ports, std::string path, SpoolLimits limits);
+  /// Tries for the last time to write what is held, and tells the system's log what is lost.
+  ~EventRecorder();
+  EventRecorder(const EventRecorder&) = delete;
+  EventRecorder& operator=(const EventRecorder&) = delete;
+
+  /// The user has consented now. When a process refuses later on, this one takes no more events.
+  void begin();
+
+  /// Takes one event. Returns how many wait now where it was put, in the file or in memory, as far
+  /// as this process knows; 0 when it was not taken.
+  std::int64_t append(std::string_view uuid, Varnel::Platform::Date date, std::string_view hit);
+
+  /// Counts an event that could not even be appended.
+  void countDropped();
+
+  /// Empties the spool and begins a new epoch in it, so that what other processes hold is not
+  /// written either; removes files that were set aside. Where the file does not allow that yet,
+  /// `settle` goes on trying.
+  void discard();
+
+  enum class Haste {
+    usual,  ///< Not before the pause after the last failure is over.
+    none
+  };
+  /// Does in `file`, a connection of the caller's, what could not be done yet. Returns when to call
+  /// again; absent when all is done.
+  std::optional<Varnel::Platform::Date> settle(Varnel::Platform::DurableFile& file, Haste haste);
+
+  /// Whether nothing is to be sent because the spool is not empty yet, though it should be.
+  [[nodiscard]] bool mustEmpty() const;
+
+  /// The file is going to be looked at, and: so many were found waiting.
+  void looking();
+  void seen(std::int64_t waiting);
+
+  [[nodiscard]] OwnEvents own() const;
+  /// They were delivered.
+  void forget(const OwnEvents& delivered);
+
+  /// Events pushed out by the limits, too large, or given up, since the file was begun.
+  [[nodiscard]] std::int64_t droppedCount();
+
+ private:
+  struct Work;
+
+  [[nodiscard]] SpooledEvent named(std::string_view uuid, Varnel::Platform::Date date,
+                                   std::string_view hit);
+  [[nodiscard]] bool mayInsert() const;
+  [[nodiscard]] bool insert(const SpooledEvent& event);
+  std::int64_t hold(SpooledEvent event);
+  [[nodiscard]] bool hasWork() const { return mustEmpty_ || !held_.empty() || dropped_ > 0; }
+  void finish(const Work& work);
+
+  const Ports ports_;
+  const std::string path_;
+  const SpoolLimits limits_;
+
+  std::mutex fileMutex_;  ///< Owns the file. Taken before the other mutex.
+  Varnel::Platform::DurableFile file_;
+
+  mutable std::mutex mutex_;  ///< Owns all below. Nobody keeps it while at a file.
+  std::deque<SpooledEvent> held_;
+  std::size_t heldBytes_ = 0;
+  std::int64_t dropped_ = 0;  ///< Not yet counted in the file.
+  bool mustEmpty_ = false;
+  std::int64_t refusal_ = 0;  ///< When the user refused here for the last time.
+  bool isRevoked_ = false;    ///< Another process has refused since `begin`.
+  bool isSettling_ = false;
+  GrowingPause pause_;
+  SpoolRoom room_;
+  std::int64_t waiting_ = 0;
+  std::int64_t lastID_ = 0;
+  OwnEvents own_;
+};
+
+}  // namespace Tallyhouse

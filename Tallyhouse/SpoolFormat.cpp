@@ -1,0 +1,37 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Tallyhouse/SpoolFormat.h>
+
+namespace Tallyhouse {
+
+using Varnel::Platform::DurableFormat;
+
+// The text comes last, so that a search passes over it. An index of the UUIDs would make an
+// insertion half as dear again.
+const DurableFormat& spoolFormat() {
+  static const DurableFormat format{
+      .subject = "events",
+      .applicationID = 0x54414C59,
+      .version = {.major = 1, .minor = 0},
+      .schema =
+          "CREATE TABLE event(id INTEGER PRIMARY KEY, date INTEGER NOT NULL,"
+          " refusals INTEGER NOT NULL DEFAULT 0, refused_at INTEGER NOT NULL DEFAULT 0,"
+          " uuid TEXT NOT NULL, hit TEXT NOT NULL);"
+          "CREATE INDEX refused ON event(refused_at) WHERE refusals > 0;"
+          // Its row is made by the first who has something to say.
+          "CREATE TABLE state(id INTEGER PRIMARY KEY CHECK (id = 1),"
+          " epoch INTEGER NOT NULL DEFAULT 0,"
+          " dropped INTEGER NOT NULL DEFAULT 0,"       // Events pushed out or given up.
+          " lost_through INTEGER NOT NULL DEFAULT 0,"  // The last of those pushed out.
+          " server TEXT NOT NULL DEFAULT '',"          // Whom the next two are about.
+          " not_before INTEGER NOT NULL DEFAULT 0,"    // The end of the pause; 0: none.
+          " failures INTEGER NOT NULL DEFAULT 0);",    // Of attempts to send, in a row.
+      .migrations = {},
+      .journal = DurableFormat::Journal::writeAhead,
+      .synchronisation = DurableFormat::Synchronisation::survivesKill,
+      .tables = {{"event", {"id", "date", "refusals", "refused_at", "uuid", "hit"}},
+                 {"state",
+                  {"id", "epoch", "dropped", "lost_through", "server", "not_before", "failures"}}}};
+  return format;
+}
+
+}  // namespace Tallyhouse
