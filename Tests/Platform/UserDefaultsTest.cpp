@@ -18,6 +18,7 @@
 #include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Platform/Testing/FakeUserDefaults.h>
+#include <Varnel/Platform/Testing/FaultyPrivateFiles.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -92,6 +93,23 @@ TEST_F(UserDefaultsTest, ProcessesKeepEachOthersKeys) {
   const auto defaults = open();
   for (int key = 0; key < processes * keys; ++key)
     EXPECT_EQ(defaults.integer(std::to_string(key)), key);
+}
+
+TEST_F(UserDefaultsTest, AFaultLeavesTheOldValueOrTheNewAndSaysWhich) {
+  for (const auto fault : {Testing::Fault::fails, Testing::Fault::absent}) {
+    const auto calls = Testing::sweepFaults(fault, [&](const auto& faults) {
+      ASSERT_FALSE(open().set("key", std::int64_t{1}));
+      Testing::FaultyPrivateFiles files(*files_);
+      files.faults = faults;
+      Linux::KeyFileDefaults defaults(files, log, path_.string());
+      const bool isKept = !defaults.set("key", std::int64_t{2});
+      EXPECT_EQ(open().integer("key"), isKept ? 2 : 1);
+      faults->mend();
+      EXPECT_FALSE(defaults.set("key", std::int64_t{3})) << "whatever the fault has left";
+      EXPECT_EQ(open().integer("key"), 3);
+    });
+    EXPECT_GE(calls, 4u);
+  }
 }
 
 TEST_F(UserDefaultsTest, ADamagedFileCountsAsEmptyAndIsSetAside) {
