@@ -12,7 +12,7 @@ class UserDefaults;
 /// What applications keep in this user's folders from run to run, each under its base identifier.
 /// Processes that name one identifier share what is kept under it. Any thread.
 ///
-///     storage.userDefaults("com.example.Fotovia").set("scans", std::int64_t{3});
+///     storage.userDefaults("com.example.Fotovia").integer("scans").value_or(0);
 class VARNEL_API ApplicationStorage {
  public:
   virtual ~ApplicationStorage() = default;

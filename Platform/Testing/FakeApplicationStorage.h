@@ -14,7 +14,7 @@ namespace Varnel::Platform::Testing {
 /// Settings in memory and files below a folder of the test, by identifier. Any thread.
 ///
 ///     FakeApplicationStorage storage(temporaryFolder);
-///     storage.userDefaults("com.example.Fotovia").set("scans", std::int64_t{3});
+///     storage.userDefaults("com.example.Fotovia").integer("scans").value_or(0);
 class FakeApplicationStorage final : public ApplicationStorage {
  public:
   explicit FakeApplicationStorage(std::string folder) : folder_(std::move(folder)) {}

@@ -48,7 +48,8 @@ int RemindListenCommand::run(Console& console) const {
   router.register_(nextDay, tell);
   router.register_(nextDay, [&](const auto& notification, Router::EventKind kind) {
     if (kind == Router::EventKind::didDeliver) return;
-    if (const auto error = router.userNotificationCenter().removeDeliveredNotification(notification))
+    if (const auto error =
+            router.userNotificationCenter().removeDeliveredNotification(notification))
       console.complain("the clicked reminder stays listed: " + error->localizedDescription());
   });
   // A plan that is right stays: assigning the stored period would move the reminder.

@@ -84,10 +84,12 @@ struct ReminderPlanner::Parts {
 };
 
 void repairPlan(Varnel::SchedulerService& service, Console& console) {
-  const SchedulePeriodOption period = storedPeriod();
-  const auto planned = isPlanned(service.userNotificationCenter(), period);
+  const auto period = storedPeriod();
+  // A setting that is lost is no reason to take the user's reminder away.
+  if (!period) return;
+  const auto planned = isPlanned(service.userNotificationCenter(), *period);
   if (planned && *planned) return;
-  service.setSchedulePeriod(period);
+  service.setSchedulePeriod(*period);
   if (service.failure())
     console.complain("the regular reminder is not planned yet: " + reasonOf(service.failure()));
 }

@@ -28,20 +28,17 @@ std::string textOf(const std::optional<Varnel::Platform::Date>& date) {
   return date ? formatter.string(*date) : "no date";
 }
 
-Basalt::JSON storedJSON() {
-  const auto text = Varnel::ApplicationData::settings().text(periodKey);
-  try {
-    return Basalt::parseJSON(text.value_or(""));
-  } catch (const Basalt::JSONError&) {
-    return nullptr;
-  }
-}
-
 }  // namespace
 
-SchedulePeriodOption storedPeriod() {
-  // The box turns any value that is no period into never.
-  return Varnel::SchedulePeriodOptionBox(storedJSON()).boxed();
+std::optional<SchedulePeriodOption> storedPeriod() {
+  const auto text = Varnel::ApplicationData::settings().text(periodKey);
+  if (!text) return std::nullopt;
+  try {
+    // The box turns any value that is no period into never.
+    return Varnel::SchedulePeriodOptionBox(Basalt::parseJSON(*text)).boxed();
+  } catch (const Basalt::JSONError&) {
+    return std::nullopt;
+  }
 }
 
 bool storePeriod(SchedulePeriodOption period, Console& console) {
@@ -65,7 +62,8 @@ bool writeStatus(Varnel::Platform::UserNotificationCenter& center, Console& cons
     console.complain("the reminders cannot be read: " + error.localizedDescription());
     return false;
   }
-  std::string text = "period: " + storedPeriod().description() + "\n";
+  std::string text =
+      "period: " + storedPeriod().value_or(SchedulePeriodOption::never).description() + "\n";
   for (const UserNotification& notification : *scheduled)
     text += "scheduled " + textOf(notification.deliveryDate) + "  " + lineOf(notification) + "\n";
   for (const UserNotification& notification : *delivered)

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <optional>
 #include <string>
 
 #include <Varnel/Platform/Values/UserNotification.h>
@@ -14,9 +15,9 @@ namespace Orvane {
 
 class Console;
 
-/// The period that the user chose, kept in this program's settings; never until then, and where the
-/// setting is damaged.
-[[nodiscard]] Varnel::SchedulePeriodOption storedPeriod();
+/// The period that the user chose, kept in the product's settings; absent until then, and where the
+/// setting cannot be read.
+[[nodiscard]] std::optional<Varnel::SchedulePeriodOption> storedPeriod();
 /// Returns whether the period is kept, and complains where it is not.
 [[nodiscard]] bool storePeriod(Varnel::SchedulePeriodOption period, Console& console);
 

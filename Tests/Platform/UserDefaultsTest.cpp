@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <functional>
@@ -12,12 +13,15 @@
 
 #include <Tests/Support/MountNamespace.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/Process/KeyFileDefaults.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/ApplicationStorage.h>
 #include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
-#include <Varnel/Platform/Testing/FakeUserDefaults.h>
+#include <Varnel/Platform/Testing/FakeApplicationStorage.h>
+#include <Varnel/Platform/Testing/FaultyPrivateFiles.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -94,6 +98,23 @@ TEST_F(UserDefaultsTest, ProcessesKeepEachOthersKeys) {
     EXPECT_EQ(defaults.integer(std::to_string(key)), key);
 }
 
+TEST_F(UserDefaultsTest, AFaultLeavesTheOldValueOrTheNewAndSaysWhich) {
+  for (const auto fault : {Testing::Fault::fails, Testing::Fault::absent}) {
+    const auto calls = Testing::sweepFaults(fault, [&](const auto& faults) {
+      ASSERT_FALSE(open().set("key", std::int64_t{1}));
+      Testing::FaultyPrivateFiles files(*files_);
+      files.faults = faults;
+      Linux::KeyFileDefaults defaults(files, log, path_.string());
+      const bool isKept = !defaults.set("key", std::int64_t{2});
+      EXPECT_EQ(open().integer("key"), isKept ? 2 : 1);
+      faults->mend();
+      EXPECT_FALSE(defaults.set("key", std::int64_t{3})) << "whatever the fault has left";
+      EXPECT_EQ(open().integer("key"), 3);
+    });
+    EXPECT_GE(calls, 4u);
+  }
+}
+
 TEST_F(UserDefaultsTest, ADamagedFileCountsAsEmptyAndIsSetAside) {
   const std::string damaged = "[Defaults]\nkey=true\n\xFF\n[[]=\n";
   folder_.write("new/settings.ini", damaged);
@@ -106,6 +127,21 @@ TEST_F(UserDefaultsTest, ADamagedFileCountsAsEmptyAndIsSetAside) {
   const std::string said = log.text();
   EXPECT_THAT(said, HasSubstr(path_.string() + " are damaged"));
   EXPECT_EQ(std::count(said.begin(), said.end(), '\n'), 1);
+}
+
+TEST_F(UserDefaultsTest, EachIdentifierHasItsOwn) {
+  ::setenv("XDG_CONFIG_HOME", folder_.path().c_str(), 1);
+  const auto system = Linux::makeApplicationStorage(*files_, log);
+  Testing::FakeApplicationStorage fake(folder_.path().string());
+  for (ApplicationStorage* storage : {system.get(), static_cast<ApplicationStorage*>(&fake)}) {
+    UserDefaults& settings = storage->userDefaults("com.a.One");
+    EXPECT_EQ(&storage->userDefaults("com.a.One"), &settings);
+    EXPECT_FALSE(settings.set("key", true));
+    EXPECT_EQ(storage->userDefaults("com.a.Two").truthValue("key"), std::nullopt);
+    EXPECT_NE(storage->analyticsSpoolPath("com.a.One"), storage->analyticsSpoolPath("com.a.Two"));
+    EXPECT_TRUE(fs::path(storage->analyticsSpoolPath("com.a.One")).is_absolute());
+  }
+  EXPECT_TRUE(fs::exists(folder_.path() / "com.a.One" / "settings.ini"));
 }
 
 // Whatever stands in the way: the answer says so, and what was there stays as it was.

@@ -268,6 +268,12 @@ TEST_F(Orvane, PlansReminders) {
   EXPECT_THAT(
       run({"remind", "tomorrow", "--found", "9223372036854775807", "--selected", "010"}).output,
       AllOf(period("Every Week"), regular, found("9.22 EB"), Not(found("1.5 MB"))));
+  // A plan outlives the setting that it was made from.
+  const std::string settings = home.path(".config/com.quennel.Orvane2/settings.ini");
+  std::ofstream(settings) << "damaged";
+  EXPECT_THAT(
+      run({"remind", "tomorrow", "--found", "9223372036854775807", "--selected", "1"}).output,
+      AllOf(period("Never"), regular));
   EXPECT_THAT(run({"remind", "every", "never"}).output, AllOf(period("Never"), Not(regular)));
   const Outcome status = run({"remind", "status"});
   EXPECT_THAT(status.output, AllOf(period("Never"), found("9.22 EB"), Not(regular)));

@@ -13,10 +13,16 @@ namespace Varnel::Tests {
 /// A new empty folder that goes away with the object, whatever is in it.
 class TemporaryFolder final {
  public:
-  TemporaryFolder() {
-    std::string pattern = (std::filesystem::temp_directory_path() / "varnel-XXXXXX").string();
-    path_ = std::filesystem::canonical(::mkdtemp(pattern.data()));
+  TemporaryFolder() : TemporaryFolder(std::filesystem::temp_directory_path()) {}
+
+  /// On a disk in memory, if there is one: for tests that make files durable hundreds of times.
+  static TemporaryFolder inMemory() {
+    const std::filesystem::path memory = "/dev/shm";
+    std::error_code ignored;
+    return std::filesystem::is_directory(memory, ignored) ? TemporaryFolder(memory)
+                                                          : TemporaryFolder();
   }
+
   ~TemporaryFolder() {
     std::error_code ignored;
     std::filesystem::remove_all(path_, ignored);
@@ -35,6 +41,11 @@ class TemporaryFolder final {
   }
 
  private:
+  explicit TemporaryFolder(const std::filesystem::path& parent) {
+    std::string pattern = (parent / "varnel-XXXXXX").string();
+    path_ = std::filesystem::canonical(::mkdtemp(pattern.data()));
+  }
+
   std::filesystem::path path_;
 };
 
