@@ -53,7 +53,6 @@ const Ports& systemPorts() {
   // The adapters share it, and they are never destroyed.
   static const auto mountTable = Linux::makeMountTable();
   static Clock& clock = keep(POSIX::makeClock());
-  static PrivateFiles& privateFiles = keep(POSIX::makePrivateFiles());
   static SystemLog& systemLog = keep(POSIX::makeSystemLog());
   static MainQueue& mainQueue = *new WatchedMainQueue(Linux::makeMainQueue(), systemLog);
   static TimeZones& timeZones = keep(Linux::makeTimeZones());

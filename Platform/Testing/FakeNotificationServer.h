@@ -11,6 +11,7 @@
 #include <vector>
 
 #include <Varnel/Platform/Ports/NotificationServer.h>
+#include <Varnel/Platform/Testing/FaultPlan.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -27,15 +28,15 @@ class FakeNotificationServer final : public NotificationServer {
  public:
   /// Whether there is one. `appear` lets the center know of a change.
   bool isPresent = true;
-  /// Whether it answers every request with an error.
-  bool refuses = false;
+  /// A request to show or to close that goes wrong is answered with an error. All answers are late:
+  /// see `report`.
+  std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
 
   void setObserver(std::weak_ptr<Observer> observer) override { observer_ = std::move(observer); }
 
   void show(const std::string& token, const Banner& banner,
             const std::optional<std::string>& replacedReference) override {
-    if (!isPresent || refuses)
-      return answers_.push_back([token](Observer& told) { told.bannerFailed(token); });
+    if (!works()) return answers_.push_back([token](Observer& told) { told.bannerFailed(token); });
     if (replacedReference) shown_.erase(*replacedReference);
     const std::string reference = std::to_string(++lastReference_);
     shown_[reference] = {token, banner};
@@ -44,8 +45,7 @@ class FakeNotificationServer final : public NotificationServer {
   }
 
   void close(const std::string& token, const std::optional<std::string>& reference) override {
-    if (!isPresent)
-      return answers_.push_back([token](Observer& told) { told.bannerFailed(token); });
+    if (!works()) return answers_.push_back([token](Observer& told) { told.bannerFailed(token); });
     if (reference) shown_.erase(*reference);
     std::erase_if(shown_, [&](const auto& each) { return each.second.token == token; });
     answers_.push_back([token](Observer& told) { told.bannerGone(token); });
@@ -106,6 +106,8 @@ class FakeNotificationServer final : public NotificationServer {
     std::string token;
     Banner banner;
   };
+
+  bool works() { return isPresent && faults->next() == Fault::none; }
 
   std::optional<std::string> take(const std::string& title) {
     for (auto each = shown_.begin(); each != shown_.end(); ++each)

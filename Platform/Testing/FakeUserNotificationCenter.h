@@ -11,6 +11,7 @@
 #include <vector>
 
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
+#include <Varnel/Platform/Testing/FaultPlan.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -26,8 +27,9 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
  public:
   /// The notifications that the delegate wanted to be shown, oldest first.
   std::vector<UserNotification> presented;
-  /// The next calls that may be made; all further ones fail. Absent: any number.
-  std::optional<int> callsLeft;
+  /// The calls on its two lists count, each for itself. One that goes wrong fails, and with it all
+  /// that it is made together with.
+  std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
   /// What `checkBanners` answers.
   Failure obstacle;
 
@@ -63,8 +65,7 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
     if (auto error = fail()) return *error;
     return state_.scheduled;
   }
-  [[nodiscard]] Failure removeScheduledNotification(
-      const UserNotification& notification) override {
+  [[nodiscard]] Failure removeScheduledNotification(const UserNotification& notification) override {
     return call([&] { remove(state_.scheduled, notification); });
   }
 
@@ -79,8 +80,7 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
     if (auto error = fail()) return *error;
     return state_.delivered;
   }
-  [[nodiscard]] Failure removeDeliveredNotification(
-      const UserNotification& notification) override {
+  [[nodiscard]] Failure removeDeliveredNotification(const UserNotification& notification) override {
     return call([&] { remove(state_.delivered, notification); });
   }
 
@@ -113,8 +113,7 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
   }
 
   Failure fail() {
-    if (!callsLeft || (*callsLeft)-- > 0) return std::nullopt;
-    callsLeft = 0;
+    if (faults->next() == Fault::none) return std::nullopt;
     return PlatformError(std::make_error_code(std::errc::no_space_on_device));
   }
 

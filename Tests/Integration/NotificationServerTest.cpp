@@ -280,6 +280,7 @@ TEST(NotificationServer, AProgramThatPlansWaitsForAFrozenServerOnlyAWhile) {
 TEST(NotificationServer, AProgramThatListensTellsOfDeliveriesAndClicks) {
   Server server;
   ::setenv("HOME", getenv("VARNEL_DESKTOP"), 1);
+  outputOf(std::string(ORVANE_PROGRAM) + " remind every weekly");
   Host host("com.quennel.Orvane2");
   host.center.setDelegate({});
   EXPECT_FALSE(host.center.scheduleNotification(host.reminderIn(0s)));

@@ -265,8 +265,9 @@ TEST_F(ScheduledNotificationCenterTest, ABannerThatDidNotComeIsShownLater) {
   } rows[] = {
       {"no server", [](auto& server) { server.isPresent = false; },
        [](auto& server) { server.appear(); }, false},
-      {"an error as the answer", [](auto& server) { server.refuses = true; },
-       [](auto& server) { server.refuses = false; }, true},
+      {"an error as the answer",
+       [](auto& server) { server.faults->plan(Testing::Fault::fails, 1); },
+       [](auto& server) { server.faults->mend(); }, true},
   };
   for (const auto& row : rows)
     for (const bool isNextRun : {false, true}) {

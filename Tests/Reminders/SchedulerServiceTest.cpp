@@ -26,6 +26,7 @@ namespace {
 using namespace std::chrono;
 using namespace std::chrono_literals;
 using Platform::UserNotification;
+using Platform::Testing::Fault;
 using ::testing::HasSubstr;
 using ::testing::IsEmpty;
 using ::testing::SizeIs;
@@ -142,28 +143,29 @@ TEST_F(SchedulerServiceTest, AFailedPlanChangesNothingAndIsMadeLater) {
   service.setSchedulePeriod(SchedulePeriodOption::annually);
   const UserNotification old = onlyScheduled();
   EXPECT_FALSE(center.deliverNotification(old));
-  constexpr int callCount = 6;  // Two lists, two removals, the schedule; the last fails no more.
-  for (int calls = 0; calls < callCount; ++calls) {
-    SCOPED_TRACE(calls);
-    center.callsLeft = calls;
+  // Two lists are read, two removals and the schedule made.
+  for (std::size_t call = 1; call <= 5; ++call) {
+    center.faults->plan(Fault::fails, center.faults->calls() + call);
     service.scheduleCleanReminder(2'500'000'000);
-    center.callsLeft.reset();
-    if (calls == callCount - 1) break;
-    ASSERT_TRUE(service.failure());
+    center.faults->mend();
+    ASSERT_TRUE(service.failure()) << call;
     EXPECT_EQ(service.failure()->localizedDescription(), "No space left on device");
     EXPECT_EQ(onlyScheduled(), old);
     EXPECT_THAT(*center.deliveredNotifications(), SizeIs(1));
   }
+  center.retry();
   EXPECT_FALSE(service.failure());
+  EXPECT_THAT(*onlyScheduled().informativeText, HasSubstr(" 2.5 GB "));
+  EXPECT_THAT(*center.deliveredNotifications(), IsEmpty());
   EXPECT_EQ(onlyScheduled().deliveryRepeatInterval, (Platform::DateComponents{.year = 1}));
 
-  center.callsLeft = 0;
+  center.faults->plan(Fault::fails, 1);
   service.scheduleCleanReminder(3'500'000'000);
   service.setSchedulePeriod(SchedulePeriodOption::weekly);  // Takes its place, not its texts.
   clock.advance(1h);
   center.retry();
   EXPECT_EQ(center.retryCount(), 1u);
-  center.callsLeft.reset();
+  center.faults->mend();
   center.retry();
   EXPECT_FALSE(service.failure());
   EXPECT_THAT(*onlyScheduled().informativeText, HasSubstr(" 3.5 GB "));
@@ -176,18 +178,18 @@ TEST_F(SchedulerServiceTest, AFailedPlanChangesNothingAndIsMadeLater) {
 TEST_F(SchedulerServiceTest, AClickThatCannotBeNotedIsNotedLaterAndRetriesEndWithTheService) {
   service.setSchedulePeriod(SchedulePeriodOption::weekly);
   EXPECT_FALSE(center.deliverNotification(onlyScheduled()));
-  center.callsLeft = 0;
+  center.faults->plan(Fault::fails, 1);
   center.activate(center.presented.front());
   queue.drain();
-  center.callsLeft.reset();
+  center.faults->mend();
   center.retry();
   EXPECT_THAT(*center.deliveredNotifications(), IsEmpty());
   {
     SchedulerService brief({clock, locale, zones, queue, facts, module},
-                           std::make_shared<Tallyhouse::AnalyticsTracker>(sent), router);
-    center.callsLeft = 0;
+                           std::make_shared<Tallyhouse::AnalyticsTracker>(), router);
+    center.faults->plan(Fault::fails, 1);
     brief.setSchedulePeriod(SchedulePeriodOption::never);
-    center.callsLeft.reset();
+    center.faults->mend();
   }
   center.retry();
   EXPECT_THAT(*center.scheduledNotifications(), SizeIs(1));
