@@ -6,7 +6,7 @@
 #include <Tests/Platform/DurableNotes.h>
 #include <Tests/Support/OtherProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
-#include <Varnel/Platform/Testing/FakePrivateFiles.h>
+#include <Varnel/Platform/Testing/FaultyPrivateFiles.h>
 
 namespace Varnel::Tests {
 namespace {
@@ -214,7 +214,7 @@ TEST_P(DurableFileTest, AKillWhileDamageIsMendedLosesNothing) {
     const pid_t child = ::fork();
     if (child == 0) {
       const auto own = POSIX::makePrivateFiles();
-      Platform::Testing::FakePrivateFiles files(*own);
+      Platform::Testing::FaultyPrivateFiles files(*own);
       files.faults->plan(Platform::Testing::Fault::fails, static_cast<std::size_t>(call));
       files.whenStruck = [] { ::raise(SIGKILL); };
       Notebook book(path_, notes(GetParam()), Migrating::allowed, &files);
@@ -244,7 +244,7 @@ TEST_P(DurableFileTest, ACallToTheSystemThatFailsLosesNothing) {
       SCOPED_TRACE(call);
       fs::remove_all(path_.parent_path());
       const auto own = POSIX::makePrivateFiles();
-      Platform::Testing::FakePrivateFiles files(*own);
+      Platform::Testing::FaultyPrivateFiles files(*own);
       Notebook book(path_, notes(GetParam()), Migrating::allowed, &files);
       files.faults->plan(fault, call, 1);
       isStruck = false;
