@@ -55,6 +55,7 @@ const Ports& systemPorts() {
   static Clock& clock = keep(POSIX::makeClock());
   static SystemLog& systemLog = keep(POSIX::makeSystemLog());
   static MainQueue& mainQueue = *new WatchedMainQueue(Linux::makeMainQueue(), systemLog);
+  static PrivateFiles& privateFiles = keep(POSIX::makePrivateFiles());
   static TimeZones& timeZones = keep(Linux::makeTimeZones());
   static UserLocale& userLocale = keep(POSIX::makeUserLocale());
   static const Ports& ports = *new Ports{

@@ -294,7 +294,10 @@ DurableFile::Failure DurableFile::setUp(SQLiteDatabase& database, const std::str
   if (!keepsLog(database))
     if (auto error = database.execute("PRAGMA journal_mode = TRUNCATE")) return error;
   const bool isFull = format_.synchronisation == DurableFormat::Synchronisation::survivesPowerLoss;
-  return database.execute(isFull ? "PRAGMA synchronous = FULL" : "PRAGMA synchronous = NORMAL");
+  auto error =
+      database.execute(isFull ? "PRAGMA synchronous = FULL" : "PRAGMA synchronous = NORMAL");
+  if (!error) error = database.execute("PRAGMA journal_size_limit = 1048576");
+  return error;
 }
 
 DurableFile::Failure DurableFile::check() {

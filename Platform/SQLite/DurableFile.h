@@ -69,7 +69,8 @@ class DurableFile final {
   /// Does the work wholly or not at all, and alone among all who share the file.
   [[nodiscard]] std::optional<PlatformError> change(const Work& work);
 
-  /// Does a work that runs one statement: the same for less.
+  /// Does a work that runs one statement: the same for less. That a folder above the file, or the
+  /// journal alone, was renamed is noticed by the next `read` or `change`.
   [[nodiscard]] std::optional<PlatformError> changeByOneStatement(const Work& work);
 
   /// Moves the write-ahead log into the file. Takes as long as the disk does, and is done now and

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <optional>
 #include <string>
@@ -21,6 +22,8 @@ class FaultyPrivateFiles final : public PrivateFiles {
 
   /// An absent file has no identity, and an absent lock is in somebody else's hands.
   std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
+  /// Called before a call goes wrong: a test may end the process there.
+  std::function<void()> whenStruck = [] {};
 
   [[nodiscard]] Result<std::string> prepare(const std::string& path) override {
     if (const auto code = failure()) return PlatformError(code);
@@ -33,8 +36,11 @@ class FaultyPrivateFiles final : public PrivateFiles {
   [[nodiscard]] std::optional<FileIdentity> identity(const std::string& path) override {
     return failure() ? std::nullopt : files_.identity(path);
   }
+  [[nodiscard]] std::unique_ptr<HeldFile> hold(const std::string& path) override {
+    return failure() ? nullptr : files_.hold(path);
+  }
   [[nodiscard]] Result<std::unique_ptr<FileLock>> tryLock(const std::string& path) override {
-    const Fault fault = faults->nextInTime();
+    const Fault fault = next();
     if (fault == Fault::absent) return std::unique_ptr<FileLock>();
     if (fault == Fault::fails) return PlatformError(std::make_error_code(std::errc::io_error));
     return files_.tryLock(path);
@@ -49,8 +55,14 @@ class FaultyPrivateFiles final : public PrivateFiles {
   }
 
  private:
-  std::error_code failure() const {
+  Fault next() const {
     const Fault fault = faults->nextInTime();
+    if (fault != Fault::none) whenStruck();
+    return fault;
+  }
+
+  std::error_code failure() const {
+    const Fault fault = next();
     if (fault == Fault::none) return {};
     return std::make_error_code(fault == Fault::absent ? std::errc::no_such_file_or_directory
                                                        : std::errc::io_error);

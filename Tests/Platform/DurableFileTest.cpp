@@ -1,11 +1,12 @@
 // SPDX-License-Identifier: MIT
-#include <sys/stat.h>
+#include <signal.h>
 
 #include <fstream>
 
 #include <Tests/Platform/DurableNotes.h>
 #include <Tests/Support/OtherProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Testing/FaultyPrivateFiles.h>
 
 namespace Varnel::Tests {
 namespace {
@@ -212,7 +213,10 @@ TEST_P(DurableFileTest, AKillWhileDamageIsMendedLosesNothing) {
     fs::resize_file(path_, fs::file_size(path_) - 8192);
     const pid_t child = ::fork();
     if (child == 0) {
-      MortalFiles files(call);
+      const auto own = POSIX::makePrivateFiles();
+      Platform::Testing::FaultyPrivateFiles files(*own);
+      files.faults->plan(Platform::Testing::Fault::fails, static_cast<std::size_t>(call));
+      files.whenStruck = [] { ::raise(SIGKILL); };
       Notebook book(path_, notes(GetParam()), Migrating::allowed, &files);
       ::_exit(book.add("c") == "kept" ? 0 : 1);
     }
@@ -231,6 +235,31 @@ TEST_P(DurableFileTest, AKillWhileDamageIsMendedLosesNothing) {
     });
   }
   EXPECT_GT(call, 20);
+}
+
+TEST_P(DurableFileTest, ACallToTheSystemThatFailsLosesNothing) {
+  for (const auto fault : {Platform::Testing::Fault::fails, Platform::Testing::Fault::absent}) {
+    bool isStruck = true;
+    for (std::size_t call = 1; isStruck; ++call) {
+      SCOPED_TRACE(call);
+      fs::remove_all(path_.parent_path());
+      const auto own = POSIX::makePrivateFiles();
+      Platform::Testing::FaultyPrivateFiles files(*own);
+      Notebook book(path_, notes(GetParam()), Migrating::allowed, &files);
+      files.faults->plan(fault, call, 1);
+      isStruck = false;
+      files.whenStruck = [&] { isStruck = true; };
+      std::string kept;
+      for (const char* key : {"a", "b", "c"}) {
+        if (book.add(key) == "kept") kept += key;
+        if (*key == 'a') fs::remove(path_);
+      }
+      EXPECT_EQ(book.add("d"), "kept");
+      const std::string found = book.keys();
+      for (const char key : kept + "d") EXPECT_NE(found.find(key), found.npos) << found;
+      EXPECT_EQ(open()->keys(), found);
+    }
+  }
 }
 
 // One file of each format that ever was lies in Data.

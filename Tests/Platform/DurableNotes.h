@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <signal.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -114,39 +113,6 @@ struct Notebook final {
   std::unique_ptr<Platform::PrivateFiles> ownFiles = Platform::POSIX::makePrivateFiles();
   Lines log;
   Platform::DurableFile file;
-};
-
-/// The user's own files, in a process that is killed before call number `lastCall` to them.
-class MortalFiles final : public Platform::PrivateFiles {
- public:
-  explicit MortalFiles(int lastCall) : left_(lastCall) {}
-
-  Platform::Result<std::string> prepare(const std::string& path) override {
-    return call().prepare(path);
-  }
-  std::error_code protect(const std::string& path) override { return call().protect(path); }
-  std::optional<Platform::FileIdentity> identity(const std::string& path) override {
-    return call().identity(path);
-  }
-  std::unique_ptr<Platform::HeldFile> hold(const std::string& path) override {
-    return call().hold(path);
-  }
-  Platform::Result<std::unique_ptr<Platform::FileLock>> tryLock(const std::string& path) override {
-    return call().tryLock(path);
-  }
-  std::error_code rename(const std::string& from, const std::string& to) override {
-    return call().rename(from, to);
-  }
-  std::error_code remove(const std::string& path) override { return call().remove(path); }
-
- private:
-  Platform::PrivateFiles& call() {
-    if (--left_ == 0) ::raise(SIGKILL);
-    return *files_;
-  }
-
-  const std::unique_ptr<Platform::PrivateFiles> files_ = Platform::POSIX::makePrivateFiles();
-  int left_;
 };
 
 /// Does the rest of a test in a process of its own, as this user; its failures are the test's.
