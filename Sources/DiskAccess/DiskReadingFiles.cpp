@@ -114,7 +114,8 @@ void DiskReadingFiles::lookUp() {
 
 std::optional<Platform::URL> DiskReadingFiles::volumeOf(const DiskReadingFile& file) const {
   if (file.volumeURL) return file.volumeURL;
-  return core_->disks().volumes().volumeURL(file.url).valueOr(std::nullopt);
+  const auto found = core_->disks().volumes().volumeURL(file.url);
+  return found ? *found : std::nullopt;
 }
 
 void DiskReadingFiles::readVolume(std::shared_ptr<Volume> volume) {

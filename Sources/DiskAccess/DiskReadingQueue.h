@@ -46,7 +46,8 @@ class VARNEL_API DiskReadingQueue final {
   /// Is told once for each file how its reading ended.
   using DidEnd = std::function<void(const DiskReadingFile&, DiskReadingResult)>;
 
-  /// What a queue asks beside its manager. The priority outlives the queue.
+  /// What a queue asks beside its manager. The priority outlives the queue, and a callback on an
+  /// executor that destroys it.
   struct Ports {
     Platform::ReadingPriority& readingPriority;
     DiskReadingTurn::Now now = DiskReadingTurn::Clock::now;  ///< Measures turns.

@@ -221,7 +221,9 @@ DiskReadingCore::Request DiskReadingCore::runRequests(Lock& lock, Stay& stay) {
     const bool wantsAnotherTurn = request->state != DiskReadingRequest::State::ended;
     request.reset();
     stay.isTurnEnded = false;
-    if (wantsAnotherTurn || turn.isOver() || stay.lane.running > maxRunning(stay.lane)) break;
+    // A callback that closed the queue was its last, and the ports may be gone.
+    if (isClosed_ || wantsAnotherTurn || turn.isOver() || stay.lane.running > maxRunning(stay.lane))
+      break;
     request = nextRequest(lock, stay, false);
   }
   leaveBusy(stay.thread);
@@ -323,8 +325,8 @@ void DiskReadingCore::runOffered(const Request& request, Stay& stay) {
   DiskReadingTurn turn(ports_.now, stay.isTurnEnded);
   lock.lock();
   run(lock, request, turn, priority);
-  lock.unlock();
   priority.restore();
+  lock.unlock();
   stay.session->endAccessing();
   stay.session.reset();
   lock.lock();
