@@ -189,7 +189,9 @@ UserNotificationCenter::Failure ScheduledNotificationCenter::change(
 
 UserNotificationCenter::Failure ScheduledNotificationCenter::scheduleNotification(
     const UserNotification& notification) {
-  return change([&] { return store_->plan(notification, ports_.clock.now(), calendar()); });
+  auto error = store_->plan(notification, ports_.clock.now(), calendar());
+  recheck();
+  return error;
 }
 
 UserNotificationCenter::Notifications ScheduledNotificationCenter::scheduledNotifications() {
@@ -217,7 +219,9 @@ UserNotificationCenter::Failure ScheduledNotificationCenter::removeScheduledNoti
 UserNotificationCenter::Failure ScheduledNotificationCenter::deliverNotification(
     const UserNotification& notification) {
   isAskedToDeliver_ = true;
-  return change([&] { return store_->makeDue(notification, ports_.clock.now()); });
+  auto error = store_->makeDue(notification, ports_.clock.now());
+  recheck();
+  return error;
 }
 
 UserNotificationCenter::Notifications ScheduledNotificationCenter::deliveredNotifications() {
