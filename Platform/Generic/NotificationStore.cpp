@@ -45,10 +45,9 @@ DurableFormat format() {
           .journal = DurableFormat::Journal::rollback,
           .synchronisation = DurableFormat::Synchronisation::survivesPowerLoss,
           .tables = {{.name = "deliveries",
-                      .columns = {"number", "state",  "key",    "zone",      "count",
-                                  "banner", "delivered", "identifier", "title", "text",
-                                  "action", "other",  "date",   "years",     "months",
-                                  "days",   "hours",  "minutes", "seconds"}}}};
+                      .columns = {"number", "state", "key", "zone", "count", "banner", "delivered",
+                                  "identifier", "title", "text", "action", "other", "date", "years",
+                                  "months", "days", "hours", "minutes", "seconds"}}}};
 }
 
 // A notification is known by its identifier. One without an identifier gets a unique name.
@@ -80,7 +79,8 @@ Failure select(SQLiteDatabase& database, const std::string& sql, Use use,
 
 template <typename... Parameters>
 Failure run(SQLiteDatabase& database, const std::string& sql, const Parameters&... parameters) {
-  return select(database, sql, [](SQLiteStatement&) {}, parameters...);
+  return select(
+      database, sql, [](SQLiteStatement&) {}, parameters...);
 }
 
 Failure insert(SQLiteDatabase& database, const Delivery& delivery) {
@@ -198,8 +198,7 @@ Failure NotificationStore::change(const std::function<Failure()>& calls) {
 Result<std::vector<Delivery>> NotificationStore::deliveries(
     const std::vector<DeliveryState>& states) {
   std::vector<Delivery> found;
-  if (auto error =
-          read([&](SQLiteDatabase& database) { return select(database, states, found); }))
+  if (auto error = read([&](SQLiteDatabase& database) { return select(database, states, found); }))
     return *error;
   return found;
 }
@@ -243,16 +242,16 @@ Failure NotificationStore::makeDue(const UserNotification& notification, Date no
 Failure NotificationStore::decideDue(const std::vector<std::pair<std::int64_t, bool>>& isToShow) {
   return write([&](SQLiteDatabase& database) -> Failure {
     for (const auto& [number, shows] : isToShow)
-      if (auto error = run(database,
-                           "UPDATE deliveries SET state = ? WHERE number = ? AND state = 'due'",
-                           std::string_view(shows ? "toShow" : "hidden"), number))
+      if (auto error =
+              run(database, "UPDATE deliveries SET state = ? WHERE number = ? AND state = 'due'",
+                  std::string_view(shows ? "toShow" : "hidden"), number))
         return error;
-    if (auto error = run(
-            database,
-            "UPDATE deliveries SET state = 'removed' WHERE number IN (SELECT number FROM deliveries "
-            "WHERE state IN ('hidden', 'shown', 'expired') "
-            "ORDER BY delivered DESC, date DESC LIMIT -1 OFFSET ?)",
-            maxDelivered))
+    if (auto error = run(database,
+                         "UPDATE deliveries SET state = 'removed' WHERE number IN (SELECT number "
+                         "FROM deliveries "
+                         "WHERE state IN ('hidden', 'shown', 'expired') "
+                         "ORDER BY delivered DESC, date DESC LIMIT -1 OFFSET ?)",
+                         maxDelivered))
       return error;
     return forgetRemoved(database);
   });
@@ -285,8 +284,7 @@ Failure NotificationStore::noteGone(std::int64_t number) {
 
 Failure NotificationStore::remove(std::int64_t number) {
   return write([&](SQLiteDatabase& database) {
-    auto error =
-        run(database, "UPDATE deliveries SET state = 'removed' WHERE number = ?", number);
+    auto error = run(database, "UPDATE deliveries SET state = 'removed' WHERE number = ?", number);
     return error ? error : forgetRemoved(database);
   });
 }

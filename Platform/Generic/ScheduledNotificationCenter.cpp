@@ -102,7 +102,8 @@ class ScheduledNotificationCenter::Banners final : public NotificationServer::Ob
     for (auto each = all->rbegin(); each != all->rend(); ++each) {
       present.insert(each->number);
       if (failed_.contains(each->number)) continue;
-      if (each->state == toShow && !shown_.contains(each->number)) show(*each);
+      if (each->state == toShow && !shown_.contains(each->number))
+        if (auto error = show(*each)) return error;
       if ((each->state == hidden || each->state == removed) && each->banner) close(*each);
     }
     std::erase_if(shown_, [&](const auto& each) {
@@ -132,11 +133,13 @@ class ScheduledNotificationCenter::Banners final : public NotificationServer::Ob
     center_.recheck();
   }
 
-  void show(const Delivery& delivery) {
-    if (!center_.isDeliverer()) return;
+  Failure show(const Delivery& delivery) {
+    if (auto error = center_.becomeDeliverer()) return error;
+    if (!center_.delivererLock_) return std::nullopt;
     shown_.emplace(delivery.number, delivery.schedule.notification);
     server().show(std::to_string(delivery.number), bannerOf(delivery.schedule.notification),
                   delivery.banner);
+    return std::nullopt;
   }
 
   void close(const Delivery& delivery) {
@@ -186,7 +189,9 @@ UserNotificationCenter::Failure ScheduledNotificationCenter::change(
 
 UserNotificationCenter::Failure ScheduledNotificationCenter::scheduleNotification(
     const UserNotification& notification) {
-  return change([&] { return store_->plan(notification, ports_.clock.now(), calendar()); });
+  auto error = store_->plan(notification, ports_.clock.now(), calendar());
+  recheck();
+  return error;
 }
 
 UserNotificationCenter::Notifications ScheduledNotificationCenter::scheduledNotifications() {
@@ -214,7 +219,9 @@ UserNotificationCenter::Failure ScheduledNotificationCenter::removeScheduledNoti
 UserNotificationCenter::Failure ScheduledNotificationCenter::deliverNotification(
     const UserNotification& notification) {
   isAskedToDeliver_ = true;
-  return change([&] { return store_->makeDue(notification, ports_.clock.now()); });
+  auto error = store_->makeDue(notification, ports_.clock.now());
+  recheck();
+  return error;
 }
 
 UserNotificationCenter::Notifications ScheduledNotificationCenter::deliveredNotifications() {
@@ -236,9 +243,8 @@ UserNotificationCenter::Failure ScheduledNotificationCenter::removeThose(
   const Calendar present = calendar();
   return change([&]() -> Failure {
     // What is due has its delivery ahead as well.
-    const auto candidates =
-        store_->deliveries(isDelivered ? std::vector{hidden, toShow, shown, expired}
-                                       : std::vector{planned, due});
+    const auto candidates = store_->deliveries(
+        isDelivered ? std::vector{hidden, toShow, shown, expired} : std::vector{planned, due});
     if (!candidates) return candidates.error();
     for (const Delivery& each : *candidates) {
       UserNotification candidate = each.schedule.notification;
@@ -286,7 +292,10 @@ UserNotificationCenter::Failure ScheduledNotificationCenter::deliverDue() {
   const bool isAnyDue = std::any_of(waiting->begin(), waiting->end(), [&](const Delivery& each) {
     return each.state == due || nextDate(each.schedule, present).value_or(Date::max()) <= now;
   });
-  if (isAnyDue && !isDeliverer()) return std::nullopt;
+  if (isAnyDue) {
+    if (auto error = becomeDeliverer()) return error;
+    if (!delivererLock_) return std::nullopt;
+  }
   if (!delegate_.expired())
     if (auto error = store_->claimDue(now, present)) return error;
   return decideDue();
@@ -299,8 +308,8 @@ UserNotificationCenter::Failure ScheduledNotificationCenter::decideDue() {
   std::vector<std::pair<std::int64_t, bool>> isToShow;
   const auto delegate = delegate_.lock();
   for (auto each = claimed->rbegin(); each != claimed->rend(); ++each)
-    isToShow.emplace_back(each->number, !delegate || delegate->shouldPresent(
-                                                         *this, each->schedule.notification));
+    isToShow.emplace_back(each->number,
+                          !delegate || delegate->shouldPresent(*this, each->schedule.notification));
   if (auto error = store_->decideDue(isToShow)) return error;
   for (auto each = claimed->rbegin(); each != claimed->rend(); ++each)
     tellDelivered(each->schedule.notification);
@@ -316,18 +325,20 @@ void ScheduledNotificationCenter::tellDelivered(const UserNotification& notifica
   });
 }
 
-bool ScheduledNotificationCenter::isDeliverer() {
-  if (!delivererLock_ && mayDeliver())
-    if (auto lock = ports_.privateFiles.tryLock(lockFile_)) delivererLock_ = std::move(*lock);
-  // The deliverer may end before it has done everything.
-  if (!delivererLock_ && mayDeliver()) isBehind_ = true;
-  return delivererLock_ != nullptr;
+// Succeeds also where another process is the deliverer.
+UserNotificationCenter::Failure ScheduledNotificationCenter::becomeDeliverer() {
+  if (delivererLock_ || !mayDeliver()) return std::nullopt;
+  auto lock = ports_.privateFiles.tryLock(lockFile_);
+  if (!lock) return lock.error();
+  delivererLock_ = std::move(*lock);
+  // The other one may end before it has done everything.
+  if (!delivererLock_) isBehind_ = true;
+  return std::nullopt;
 }
 
 void ScheduledNotificationCenter::report(const Failure& failure) {
   const std::string text = failure ? failure->localizedDescription() : "";
-  if (failure && text != lastReport_)
-    ports_.systemLog.write("Notifications have to wait: " + text);
+  if (failure && text != lastReport_) ports_.systemLog.write("Notifications have to wait: " + text);
   lastReport_ = text;
 }
 

@@ -79,7 +79,7 @@ class VARNEL_API ScheduledNotificationCenter final : public UserNotificationCent
   [[nodiscard]] Failure decideDue();
   void tellDelivered(const UserNotification& notification);
   [[nodiscard]] bool mayDeliver() const { return isAskedToDeliver_ || !delegate_.expired(); }
-  [[nodiscard]] bool isDeliverer();
+  [[nodiscard]] Failure becomeDeliverer();
   void report(const Failure& failure);
   void tick();
   void awaitNext();

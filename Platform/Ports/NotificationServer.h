@@ -65,8 +65,8 @@ class VARNEL_API NotificationServer {
   /// Tells, later, why banners cannot be shown at present, or none.
   virtual void check(std::function<void(const std::optional<PlatformError>& obstacle)> answer) = 0;
 
-  /// Whether any of these requests is still on its way to the server. Becomes false in the end, also
-  /// without a server, but not while one has taken a banner and hangs.
+  /// Whether any of these requests is still on its way to the server. Becomes false in the end,
+  /// also without a server, but not while one has taken a banner and hangs.
   [[nodiscard]] virtual bool isBusy() const = 0;
 };
 

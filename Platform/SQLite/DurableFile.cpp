@@ -107,6 +107,8 @@ DurableFile::Failure DurableFile::read(const Work& work) {
 }
 
 DurableFile::Failure DurableFile::change(const Work& work) {
+  // What could only be read may be writable by now.
+  if (connection_ && !isFromBeforeFork() && connection_->database.isReadOnly()) connection_.reset();
   return attempt(Look::byPath, [&](SQLiteDatabase& database) {
     return database.transaction("BEGIN IMMEDIATE", ofThisFormat(work));
   });

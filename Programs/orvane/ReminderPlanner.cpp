@@ -2,7 +2,6 @@
 #include <orvane/ReminderPlanner.h>
 
 #include <algorithm>
-#include <chrono>
 #include <vector>
 
 #include <Varnel/Platform/Ports/MainQueue.h>
@@ -21,10 +20,6 @@ namespace {
 using Varnel::SchedulePeriodOption;
 using Varnel::Platform::UserNotification;
 using Varnel::Platform::UserNotificationCenter;
-
-// Servers answer within milliseconds, unless they have yet to be started, and other processes keep
-// the store no longer.
-constexpr std::chrono::seconds patience(3);
 
 /// The product's center for a program that only plans: it never becomes the delegate.
 class PlanningCenter final : public UserNotificationCenter {
@@ -60,7 +55,7 @@ class PlanningCenter final : public UserNotificationCenter {
 // Whether exactly the reminder of this period is planned.
 Varnel::Platform::Result<bool> isPlanned(UserNotificationCenter& center,
                                          SchedulePeriodOption period) {
-  auto planned = center.scheduledNotifications();
+  auto planned = readPatiently(center, &UserNotificationCenter::scheduledNotifications);
   if (!planned) return planned.error();
   std::erase_if(*planned, [](const auto& each) { return !each.deliveryRepeatInterval; });
   if (period == SchedulePeriodOption::never) return planned->empty();
@@ -87,8 +82,13 @@ void repairPlan(Varnel::SchedulerService& service, Console& console) {
   const auto period = storedPeriod();
   // A setting that is lost is no reason to take the user's reminder away.
   if (!period) return;
-  const auto planned = isPlanned(service.userNotificationCenter(), *period);
-  if (planned && *planned) return;
+  UserNotificationCenter& center = service.userNotificationCenter();
+  const auto planned = isPlanned(center, *period);
+  if (!planned) {
+    console.complain("the reminders cannot be read yet: " + reasonOf(planned.error()));
+    return center.retryLater([&] { repairPlan(service, console); });
+  }
+  if (*planned) return;
   service.setSchedulePeriod(*period);
   if (service.failure())
     console.complain("the regular reminder is not planned yet: " + reasonOf(service.failure()));
@@ -126,7 +126,7 @@ bool ReminderPlanner::plan(const UserNotification& notification) {
   };
   tryIt();
   awaitDesktop([&] { return failure.has_value(); });
-  const auto planned = center.scheduledNotifications();
+  const auto planned = readPatiently(center, &UserNotificationCenter::scheduledNotifications);
   if (!planned) failure = planned.error();
   if (planned && std::find(planned->begin(), planned->end(), notification) != planned->end())
     return true;
@@ -137,7 +137,7 @@ bool ReminderPlanner::plan(const UserNotification& notification) {
 void ReminderPlanner::awaitDesktop(const std::function<bool()>& isWaiting) const {
   auto& mainQueue = Varnel::Platform::processPorts().mainQueue;
   const UserNotificationCenter& center = parts_->center;
-  mainQueue.runWhile([&] { return isWaiting() || center.isBusy(); }, patience);
+  mainQueue.runWhile([&] { return isWaiting() || center.isBusy(); }, patience());
   if (center.isBusy())
     console_.complain("the desktop does not answer; the banner of an earlier reminder may stay");
 }

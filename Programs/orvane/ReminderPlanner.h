@@ -21,7 +21,8 @@ namespace Orvane {
 class Console;
 
 /// Plans anew where the stored period is not the planned one: a program was killed between storing
-/// and planning, or could not plan. Says what is in its way.
+/// and planning, or could not plan. Says what is in its way, and tries again while the main queue
+/// runs; the service and the console outlive that.
 void repairPlan(Varnel::SchedulerService& service, Console& console);
 
 /// Plans for a program that ends when it has planned. It is not told of deliveries: what is due

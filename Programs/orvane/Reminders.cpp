@@ -1,13 +1,15 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/Reminders.h>
 
+#include <algorithm>
+#include <memory>
 #include <optional>
 
 #include <Varnel/Basalt/JSON.h>
 #include <Varnel/Context/ApplicationData.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/UserDefaults.h>
-#include <Varnel/Platform/Ports/UserNotificationCenter.h>
 #include <Varnel/Platform/Text/DateFormatter.h>
 #include <Varnel/Platform/Text/VisibleText.h>
 #include <Varnel/Reminders/SchedulePeriodOptionBox.h>
@@ -18,6 +20,7 @@ namespace {
 
 using Varnel::SchedulePeriodOption;
 using Varnel::Platform::UserNotification;
+using Varnel::Platform::UserNotificationCenter;
 using Varnel::Platform::visibleText;
 
 constexpr const char* periodKey = "schedulePeriod";
@@ -29,6 +32,13 @@ std::string textOf(const std::optional<Varnel::Platform::Date>& date) {
 }
 
 }  // namespace
+
+std::chrono::milliseconds patience() {
+  using std::chrono::steady_clock;
+  static const auto end = steady_clock::now() + std::chrono::seconds(3);
+  return std::max(std::chrono::ceil<std::chrono::milliseconds>(end - steady_clock::now()),
+                  std::chrono::milliseconds(0));
+}
 
 std::optional<SchedulePeriodOption> storedPeriod() {
   const auto text = Varnel::ApplicationData::settings().text(periodKey);
@@ -54,9 +64,19 @@ std::string lineOf(const UserNotification& notification) {
                      notification.informativeText.value_or(""));
 }
 
-bool writeStatus(Varnel::Platform::UserNotificationCenter& center, Console& console) {
-  const auto scheduled = center.scheduledNotifications();
-  const auto delivered = center.deliveredNotifications();
+UserNotificationCenter::Notifications readPatiently(UserNotificationCenter& center,
+                                                    NotificationList list) {
+  auto found = (center.*list)();
+  if (found) return found;
+  const auto isTime = std::make_shared<bool>(false);
+  center.retryLater([isTime] { *isTime = true; });
+  Varnel::Platform::processPorts().mainQueue.runWhile([&] { return !*isTime; }, patience());
+  return (center.*list)();
+}
+
+bool writeStatus(UserNotificationCenter& center, Console& console) {
+  const auto scheduled = readPatiently(center, &UserNotificationCenter::scheduledNotifications);
+  const auto delivered = readPatiently(center, &UserNotificationCenter::deliveredNotifications);
   if (!scheduled || !delivered) {
     const auto& error = scheduled ? delivered.error() : scheduled.error();
     console.complain("the reminders cannot be read: " + error.localizedDescription());

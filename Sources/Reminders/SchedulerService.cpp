@@ -76,7 +76,9 @@ void SchedulerService::setSchedulePeriod(SchedulePeriodOption period) {
   rescheduleExistingReminder();
 }
 
-void SchedulerService::scheduleCleanReminder() { plan(simpleTexts()); }
+void SchedulerService::scheduleCleanReminder() {
+  plan(simpleTexts());
+}
 
 void SchedulerService::scheduleCleanReminder(std::int64_t sizeLeftToClean) {
   if (sizeLeftToClean < smallestNamedSize) return scheduleCleanReminder();

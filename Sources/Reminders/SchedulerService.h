@@ -49,8 +49,8 @@ class UserNotificationRouter;
 /// its reminder: the host schedules none.
 ///
 /// Sweeping and scheduling are one change, which is made wholly or not at all. Where it cannot be
-/// made (a full disk, say), `failure` tells why, and the service tries again for as long as it lives;
-/// what is asked of it meanwhile takes the place of that. Main thread only.
+/// made (a full disk, say), `failure` tells why, and the service tries again for as long as it
+/// lives; what is asked of it meanwhile takes the place of that. Main thread only.
 class VARNEL_API SchedulerService final : public Basalt::ExecutionContext {
  public:
   struct Ports {

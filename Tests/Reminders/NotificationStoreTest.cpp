@@ -8,7 +8,9 @@
 #include <atomic>
 #include <barrier>
 #include <filesystem>
+#include <fstream>
 #include <memory>
+#include <sstream>
 #include <thread>
 
 #include <Tests/Support/TemporaryFolder.h>
@@ -95,6 +97,36 @@ TEST_F(NotificationStoreTest, KeepsEveryPartOfANotificationForTheNextRun) {
   EXPECT_THAT(claimed, testing::Contains(testing::Truly([&](const Delivery& each) {
                 return each.number == regular->number && each.schedule.notification == expected;
               })));
+  EXPECT_EQ(log.text(), "");
+}
+
+// A change of the schema is a new format, which still reads this one.
+TEST_F(NotificationStoreTest, ReadsItsFirstFormat) {
+  const auto schemaOf = [](const fs::path& path) {
+    auto database = *SQLiteDatabase::open(path.string());
+    auto rows = *database.prepare("SELECT sql FROM sqlite_master ORDER BY name");
+    std::string schema;
+    while (*rows.step() == SQLiteStatement::Step::row) schema += *rows.text(0);
+    return schema;
+  };
+  const fs::path fresh = folder.path() / "fresh.sqlite";
+  EXPECT_TRUE(NotificationStore({*files, log}, fresh.string()).deliveries({planned}));
+  std::ostringstream golden;
+  golden << std::ifstream(VARNEL_TEST_GOLDEN).rdbuf();
+  fs::create_directories(file.parent_path());
+  {
+    auto database = SQLiteDatabase::open(file.string());
+    ASSERT_FALSE(database->execute(golden.str()));
+  }
+  EXPECT_EQ(schemaOf(file), schemaOf(fresh));
+  NotificationStore store = open();
+  std::string found;
+  for (const DeliveryState state : {planned, due, hidden, toShow, shown, expired, removed})
+    found += only(store, state).schedule.notification.title.value_or("?");
+  EXPECT_EQ(found, "ABCDEFG");
+  EXPECT_EQ(only(store, planned).schedule.notification.deliveryRepeatInterval,
+            DateComponents{.day = 7});
+  EXPECT_EQ(only(store, shown).banner, "bus :1.5 7");
   EXPECT_EQ(log.text(), "");
 }
 

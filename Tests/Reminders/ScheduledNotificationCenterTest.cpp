@@ -8,20 +8,14 @@
 #include <memory>
 #include <optional>
 
+#include <Tests/Reminders/CenterProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
-#include <Tests/Support/Zones.h>
-#include <Varnel/Platform/POSIX/Adapters.h>
-#include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/SQLite/SQLiteDatabase.h>
-#include <Varnel/Platform/Testing/CapturedOutput.h>
-#include <Varnel/Platform/Testing/FakeMainQueue.h>
-#include <Varnel/Platform/Testing/FakeNotificationServer.h>
-#include <Varnel/Platform/Testing/FakeUser.h>
-#include <Varnel/Platform/Testing/FakeWallClockTimer.h>
 
 namespace Varnel::Platform {
 namespace {
 
+using Testing::Process;
 using namespace std::chrono;
 using namespace std::chrono_literals;
 using ::testing::ElementsAre;
@@ -30,60 +24,6 @@ using ::testing::SizeIs;
 
 constexpr Date start = sys_days(2026y / March / 1) + 8h;
 constexpr auto week = days(7);
-
-class Listener final : public UserNotificationCenterDelegate {
- public:
-  bool presents = true;
-  std::vector<std::string> events;
-
-  void didDeliver(UserNotificationCenter&, const UserNotification& notification) override {
-    events.push_back("delivered " + *notification.title);
-  }
-  void didActivate(UserNotificationCenter&, const UserNotification& notification) override {
-    events.push_back("activated " + *notification.title);
-  }
-  bool shouldPresent(UserNotificationCenter&, const UserNotification&) override { return presents; }
-};
-
-// A process of the product, on the store that all share.
-struct Process {
-  using Desktop = std::shared_ptr<Testing::FakeNotificationServer>;
-
-  Process(const std::filesystem::path& file, Date now,
-          Desktop shared = std::make_shared<Testing::FakeNotificationServer>())
-      : clock(now),
-        desktop(std::move(shared)),
-        center({clock, locale, zones, queue, *files, log, server, timer}, file.string()) {}
-
-  void listen() { center.setDelegate(listener); }
-  void schedule(const UserNotification& notification) {
-    EXPECT_EQ(textOf(center.scheduleNotification(notification)), "");
-  }
-  void deliver(const UserNotification& notification) {
-    EXPECT_EQ(textOf(center.deliverNotification(notification)), "");
-  }
-  [[nodiscard]] std::vector<UserNotification> scheduled() {
-    return center.scheduledNotifications().valueOr({});
-  }
-  [[nodiscard]] std::vector<UserNotification> delivered() {
-    return center.deliveredNotifications().valueOr({});
-  }
-  static std::string textOf(const std::optional<PlatformError>& error) {
-    return error ? error->localizedDescription() : "";
-  }
-
-  Testing::SimulatedClock clock;
-  Testing::FakeUserLocale locale;
-  Testing::FakeTimeZones zones = Tests::zonesOf2026();
-  Testing::FakeMainQueue queue;
-  const std::unique_ptr<PrivateFiles> files = POSIX::makePrivateFiles();
-  Testing::CapturedSystemLog log;
-  const Desktop desktop;  ///< It outlives the process.
-  Testing::FakeNotificationServer& server = *desktop;
-  Testing::FakeWallClockTimer timer{clock};
-  ScheduledNotificationCenter center;
-  const std::shared_ptr<Listener> listener = std::make_shared<Listener>();
-};
 
 class ScheduledNotificationCenterTest : public ::testing::Test {
  protected:

@@ -118,6 +118,11 @@ BusMessage closeRequest(const BannerAddress& banner) {
                  g_variant_new("(u)", guint32{banner.number}));
 }
 
+BusMessage pingOfBus() {
+  return BusMessage(g_dbus_message_new_method_call("org.freedesktop.DBus", "/org/freedesktop/DBus",
+                                                   "org.freedesktop.DBus.Peer", "Ping"));
+}
+
 std::optional<std::string> errorIn(GDBusMessage* reply) {
   GError* error = nullptr;
   if (!g_dbus_message_to_gerror(reply, &error)) return std::nullopt;

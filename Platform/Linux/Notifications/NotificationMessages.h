@@ -58,6 +58,9 @@ struct BannerAddress final {
 
 [[nodiscard]] BusMessage closeRequest(const BannerAddress& banner);
 
+/// Asks the bus itself for nothing but an answer.
+[[nodiscard]] BusMessage pingOfBus();
+
 /// The error that a reply reports.
 [[nodiscard]] std::optional<std::string> errorIn(GDBusMessage* reply);
 

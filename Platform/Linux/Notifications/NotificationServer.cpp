@@ -55,12 +55,11 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     bus_->connect([weak = weak_from_this(), token, address](const std::string& error) {
       const auto self = weak.lock();
       if (!self) return;
-      // The server of another session has gone with its banners. A question takes as long as a
-      // closing does, so that the answer never comes too early.
       if (!error.empty()) return self->tell(&NotificationServer::Observer::bannerFailed, token);
+      // The server of another session has gone with its banners; then the bus alone is asked, so
+      // that the answer comes later.
       const bool isHere = address && address->bus == self->bus_->name();
-      self->bus_->send(isHere ? closeRequest(*address) : capabilitiesRequest(),
-                       SessionBus::Waiting::limited,
+      self->bus_->send(isHere ? closeRequest(*address) : pingOfBus(), SessionBus::Waiting::limited,
                        [weak, token](GDBusMessage*, const std::string&) {
                          // Whatever the server says: it does not matter whether it was still there.
                          if (const auto asked = weak.lock())
@@ -72,8 +71,8 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
   void check(std::function<void(const std::optional<PlatformError>&)> answer) {
     const auto tell = [answer = std::move(answer)](const std::string& error) {
       if (error.empty()) return answer(std::nullopt);
-      answer(PlatformError(notificationService, 0,
-                           {{std::string(localizedDescriptionKey), error}}));
+      answer(
+          PlatformError(notificationService, 0, {{std::string(localizedDescriptionKey), error}}));
     };
     bus_->connect([weak = weak_from_this(), tell](const std::string& error) {
       const auto self = weak.lock();
@@ -96,13 +95,13 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
   template <typename Use>
   void send(const BusMessage& message, const std::string& token, SessionBus::Waiting waiting,
             Use use) {
-    bus_->send(message, waiting,
-               [weak = weak_from_this(), token, use](GDBusMessage* reply,
-                                                     const std::string& error) {
-                 const auto self = weak.lock();
-                 if (!self) return;
-                 reply ? use(*self, reply) : self->fail(token, error);
-               });
+    bus_->send(
+        message, waiting,
+        [weak = weak_from_this(), token, use](GDBusMessage* reply, const std::string& error) {
+          const auto self = weak.lock();
+          if (!self) return;
+          reply ? use(*self, reply) : self->fail(token, error);
+        });
   }
 
   void fail(const std::string& token, const std::string& error) {
@@ -120,7 +119,8 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     if (!shown_.contains(token)) return;
     const bool knowsIt = replaced && replaced->bus == bus_->name() && replaced->server == server;
     send(notifyRequest(server, source_, banner, capabilities, knowsIt ? replaced->number : 0),
-         token, SessionBus::Waiting::unlimited, [token, server](Desktop& self, GDBusMessage* reply) {
+         token, SessionBus::Waiting::unlimited,
+         [token, server](Desktop& self, GDBusMessage* reply) {
            const auto number = bannerNumberIn(reply);
            if (!number) return self.fail(token, "The notification server gives no number.");
            self.hasShown(token, {self.bus_->name(), server, *number});

@@ -1,0 +1,212 @@
+// SPDX-License-Identifier: MIT
+// What the user sees, and what is left, when the store of notifications cannot be used.
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <sys/mount.h>
+
+#include <filesystem>
+#include <fstream>
+#include <functional>
+#include <optional>
+#include <sstream>
+#include <string>
+
+#include <Tests/Reminders/CenterProcess.h>
+#include <Tests/Support/ChildProcess.h>
+#include <Tests/Support/MountNamespace.h>
+#include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/SQLite/SQLiteDatabase.h>
+
+namespace Varnel::Platform {
+namespace {
+
+namespace fs = std::filesystem;
+using namespace std::chrono_literals;
+using ::testing::AllOf;
+using ::testing::HasSubstr;
+using ::testing::IsEmpty;
+using ::testing::Not;
+using ::testing::SizeIs;
+
+constexpr Date start = std::chrono::sys_days(std::chrono::year(2026) / 3 / 1);
+constexpr auto week = std::chrono::days(7);
+
+std::string contentOf(const fs::path& file) {
+  std::ostringstream text;
+  text << std::ifstream(file, std::ios::binary).rdbuf();
+  return text.str();
+}
+
+// A home folder whose store lies on a small disk of its own.
+class Home final {
+ public:
+  Home() {
+    fs::create_directories(state);
+    fs::permissions(state, fs::perms::owner_all);
+    isReady = Tests::mountMemory(state);
+    fs::permissions(state, fs::perms::owner_all);
+  }
+  ~Home() {
+    lock.reset();
+    ::umount2(state.c_str(), MNT_DETACH);
+  }
+  Home(const Home&) = delete;
+  Home& operator=(const Home&) = delete;
+
+  int orvane(const std::string& arguments) {
+    const int status =
+        Tests::ChildProcess(
+            {"/usr/bin/env", "-i", "HOME=" + folder.path().string(), "/bin/sh", "-c",
+             "exec " ORVANE_PROGRAM " " + arguments + " >$HOME/output 2>$HOME/errors"})
+            .wait();
+    output = contentOf(folder.path() / "output");
+    errors = contentOf(folder.path() / "errors");
+    return status;
+  }
+  void sql(const std::string& statements) const {
+    auto database = SQLiteDatabase::open(store.string());
+    EXPECT_FALSE(database->execute(statements));
+  }
+
+  const Tests::TemporaryFolder folder;
+  const fs::path state = folder.path() / ".local" / "state" / "com.quennel.Orvane2";
+  const fs::path store = state / "notifications.sqlite";
+  const fs::path aside = folder.path() / "aside";
+  bool isReady = false;
+  std::optional<SQLiteDatabase> lock;
+  std::string output, errors;
+};
+
+struct Trouble {
+  std::string name;
+  std::function<void(Home&)> begin, end;
+  const char* complaint;
+  enum { waits, isLeftAlone, isReplaced } store = waits;
+
+  friend void PrintTo(const Trouble& trouble, std::ostream* out) { *out << trouble.name; }
+};
+
+const Trouble troubles[] = {
+    {"locked",
+     [](Home& home) {
+       home.lock = std::move(*SQLiteDatabase::open(home.store.string()));
+       EXPECT_FALSE(home.lock->execute("BEGIN EXCLUSIVE"));
+     },
+     [](Home& home) { home.lock.reset(); }, "database is locked"},
+    {"full disk",
+     [](Home& home) {
+       std::ofstream filler(home.state / "filler", std::ios::binary);
+       while (filler << std::string(1024, 'x') << std::flush) continue;
+     },
+     [](Home& home) { fs::remove(home.state / "filler"); }, "full"},
+    {
+        "read-only",
+        [](Home& home) {
+          ::mount(home.state.c_str(), home.state.c_str(), nullptr, MS_BIND, nullptr);
+          EXPECT_EQ(::mount(nullptr, home.state.c_str(), nullptr, MS_REMOUNT | MS_BIND | MS_RDONLY,
+                            nullptr),
+                    0);
+        },
+        [](Home& home) { ::umount2(home.state.c_str(), MNT_DETACH); },
+        "ead",
+    },
+    {"a link",
+     [](Home& home) {
+       fs::copy(home.store, home.aside);
+       fs::remove(home.store);
+       fs::create_symlink(home.aside, home.store);
+     },
+     [](Home& home) {
+       fs::remove(home.store);
+       fs::copy(home.aside, home.store);
+     },
+     "is a link", Trouble::isLeftAlone},
+    {"another's file", [](Home& home) { home.sql("PRAGMA application_id = 7"); },
+     [](Home& home) { home.sql("PRAGMA application_id = 1447980916"); },
+     "belongs to another application", Trouble::isLeftAlone},
+    {"a newer format", [](Home& home) { home.sql("PRAGMA user_version = 2000"); },
+     [](Home& home) { home.sql("PRAGMA user_version = 1000"); }, "the file's format is 2.0",
+     Trouble::isLeftAlone},
+    {"damage",
+     [](Home& home) { std::ofstream(home.store, std::ios::binary) << std::string(20'000, 'y'); },
+     [](Home&) {}, "", Trouble::isReplaced},
+};
+
+class ReminderTrouble : public ::testing::TestWithParam<Trouble> {
+ protected:
+  void SetUp() override {
+    if (const std::string reason = Tests::enterMountNamespace(); !reason.empty())
+      GTEST_SKIP() << reason;
+    home.emplace();
+    if (!home->isReady) GTEST_SKIP() << "no file system in memory";
+  }
+
+  std::optional<Home> home;
+};
+
+INSTANTIATE_TEST_SUITE_P(, ReminderTrouble, ::testing::ValuesIn(troubles), [](const auto& one) {
+  std::string name = one.param.name;
+  std::erase_if(name, [](char c) { return !std::isalnum(static_cast<unsigned char>(c)); });
+  return name;
+});
+
+// The program says so with its status, keeps the period, and the next one plans it.
+TEST_P(ReminderTrouble, OrvaneSaysSoAndTheNextCommandPlans) {
+  const Trouble& trouble = GetParam();
+  ASSERT_EQ(home->orvane("remind every weekly"), 0) << home->errors;
+  trouble.begin(*home);
+  // To open and close a locked file would free it.
+  const bool isLeftAlone = trouble.store == Trouble::isLeftAlone;
+  const std::string before = isLeftAlone ? contentOf(home->store) : "";
+  const int status = home->orvane("remind every monthly");
+  if (trouble.store == Trouble::isReplaced) {
+    EXPECT_EQ(status, 0);
+    EXPECT_TRUE(fs::exists(home->store.string() + ".damaged"));
+  } else {
+    EXPECT_EQ(status, 1);
+    EXPECT_THAT(home->errors,
+                AllOf(HasSubstr("the reminder is not planned: "), HasSubstr(trouble.complaint)));
+    if (isLeftAlone) {
+      EXPECT_TRUE(contentOf(home->store) == before);
+    }
+  }
+  trouble.end(*home);
+  EXPECT_EQ(home->orvane("remind tomorrow --found 1 --selected 0"), 0) << home->errors;
+  EXPECT_THAT(home->output,
+              AllOf(HasSubstr("period: Every Month\n"), HasSubstr("  SchedulerNotification: ")));
+}
+
+// A banner that is due in a bad moment comes after it, once.
+TEST_P(ReminderTrouble, WhatIsDueComesLater) {
+  const Trouble& trouble = GetParam();
+  Testing::Process(home->store, start)
+      .schedule({.identifier = "weekly",
+                 .title = "Week",
+                 .deliveryDate = start + week,
+                 .deliveryRepeatInterval = DateComponents{.day = 7}});
+  trouble.begin(*home);
+  Testing::Process process(home->store, start + week);
+  process.listen();
+  process.timer.advanceTo(start + week + 1min);
+  EXPECT_THAT(process.server.history(), IsEmpty());
+  // A list that cannot be read is not an empty one.
+  const bool isKnown = process.center.scheduledNotifications().hasValue();
+  if (trouble.store == Trouble::isReplaced) {
+    EXPECT_TRUE(isKnown);
+    EXPECT_THAT(process.scheduled(), IsEmpty());
+    return;
+  }
+  EXPECT_TRUE(!isKnown || process.scheduled().size() == 1);
+  EXPECT_THAT(process.log.text(), HasSubstr(trouble.complaint));
+  EXPECT_THAT(process.log.text(), Not(IsEmpty()));
+  trouble.end(*home);
+  for (auto date = start + week + 2min; date < start + 2 * week; date += 12h) {
+    process.timer.advanceTo(date);
+    process.server.report();
+  }
+  EXPECT_THAT(process.server.history(), SizeIs(1));
+  EXPECT_EQ(process.timer.armedDate(), start + 2 * week);
+}
+
+}  // namespace
+}  // namespace Varnel::Platform
