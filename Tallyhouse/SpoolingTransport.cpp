@@ -103,6 +103,10 @@ bool SpoolingTransport::drain(std::chrono::milliseconds timeout) {
   return parts_->worker.drain(timeout);
 }
 
+bool SpoolingTransport::hasDiscardedAll() const {
+  return !parts_->recorder.mustEmpty();
+}
+
 std::int64_t SpoolingTransport::droppedCount() const {
   return parts_->recorder.droppedCount();
 }

@@ -28,7 +28,7 @@ namespace Tallyhouse {
 ///
 ///     auto transport = SpoolingTransport::make({
 ///         .endpoint = *URL::parse("https://collect.quennel.example/batch"),
-///         .trackingID = "QN-1", .clientID = id, .spoolPath = support + "/Analytics.db"});
+///         .trackingID = "QN-1", .clientID = id, .spoolPath = path});
 ///     auto tracker = std::make_shared<AnalyticsTracker>(std::move(transport), consent);
 ///
 /// `accept` costs the insertion of a row and never waits for the network, nor for more than 20 ms
@@ -77,6 +77,10 @@ class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
   /// Returns whether all that this process recorded was delivered, by whomever; false without
   /// consent.
   bool drain(std::chrono::milliseconds timeout);
+
+  /// Whether all that `discardAll` threw away is gone from the file. Where the file cannot be had
+  /// it is not, and the next `discardAll` tries again.
+  [[nodiscard]] bool hasDiscardedAll() const;
 
   /// Events of all processes that the spool could not hold, since its file was begun.
   [[nodiscard]] std::int64_t droppedCount() const;

@@ -48,6 +48,15 @@ const char* objection(const struct stat& facts) {
   return nullptr;
 }
 
+// Root may make folders anywhere. In another user's home they would lock that user out: of all
+// settings, where the first folder of settings is made so.
+Failure judgeParent(const fs::path& folder) {
+  struct stat facts {};
+  if (::geteuid() != 0 || ::lstat(folder.c_str(), &facts) != 0 || facts.st_uid == 0)
+    return std::nullopt;
+  return refusal(folder, "belongs to another user");
+}
+
 // The process's mask of modes may take rights away that a new folder or file is given. Some file
 // systems know no modes.
 Failure makeFolders(const fs::path& folder) {
@@ -55,6 +64,7 @@ Failure makeFolders(const fs::path& folder) {
   if (::lstat(folder.c_str(), &facts) == 0) return std::nullopt;
   if (folder.has_relative_path())
     if (auto error = makeFolders(folder.parent_path())) return error;
+  if (auto error = judgeParent(folder.parent_path())) return error;
   if (::mkdir(folder.c_str(), folderMode) != 0)
     return errno == EEXIST ? std::nullopt : Failure(systemError(folder));
   static_cast<void>(::chmod(folder.c_str(), folderMode));

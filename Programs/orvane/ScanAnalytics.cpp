@@ -2,6 +2,7 @@
 #include <orvane/ScanAnalytics.h>
 
 #include <chrono>
+#include <thread>
 
 #include <Varnel/Context/ApplicationData.h>
 #include <Varnel/Identification/Analytics/CustomDimensionsHolder.h>
@@ -19,6 +20,7 @@ using Tallyhouse::SpoolingTransport;
 using Varnel::Platform::URL;
 
 constexpr auto maxGoodbye = std::chrono::seconds(2);
+constexpr auto pause = std::chrono::milliseconds(50);
 
 class ScanSender final : public Varnel::CommonAnalyticsSender {
  public:
@@ -57,14 +59,19 @@ bool ScanAnalytics::isEndpoint(const std::string& text) {
   return url->hasScheme("https") || (url->hasScheme("http") && isOnThisMachine(*url));
 }
 
-void ScanAnalytics::discardEvents() {
-  // A tracker that is refused discards; it sends nothing, wherever that would go.
-  const Tallyhouse::AnalyticsTracker tracker(
+bool ScanAnalytics::discardEvents() {
+  // It is never started, and so sends nothing, wherever that would go.
+  const auto transport =
       SpoolingTransport::make({.endpoint = *URL::parse("https://nowhere.invalid/"),
                                .trackingID = {},
                                .clientID = {},
-                               .spoolPath = Varnel::ApplicationData::analyticsSpoolPath()}),
-      Consent::refused);
+                               .spoolPath = Varnel::ApplicationData::analyticsSpoolPath()});
+  for (const auto end = std::chrono::steady_clock::now() + maxGoodbye;;) {
+    transport->discardAll();
+    if (transport->hasDiscardedAll()) return true;
+    if (std::chrono::steady_clock::now() > end) return false;
+    std::this_thread::sleep_for(pause);
+  }
 }
 
 ScanAnalytics::ScanAnalytics(const std::optional<std::string>& endpoint, bool printsEvents,

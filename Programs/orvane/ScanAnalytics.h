@@ -19,8 +19,9 @@ class ScanAnalytics final {
   /// Whether events can be sent there: by https, or within this machine by http as well.
   [[nodiscard]] static bool isEndpoint(const std::string& text);
 
-  /// Empties the product's spool.
-  static void discardEvents();
+  /// Empties the product's spool. Returns whether it is empty: others may keep it for longer than a
+  /// moment, and it may not be had at all.
+  [[nodiscard]] static bool discardEvents();
 
   /// Nothing is sent without an endpoint, nor without the user's consent, which is complained of.
   ScanAnalytics(const std::optional<std::string>& endpoint, bool printsEvents, Console& console);

@@ -144,6 +144,18 @@ TEST_F(UserDefaultsTest, EachIdentifierHasItsOwn) {
   EXPECT_TRUE(fs::exists(folder_.path() / "com.a.One" / "settings.ini"));
 }
 
+// As root with another's home: that user would be locked out of what is made there.
+TEST_F(UserDefaultsTest, NothingIsMadeInTheFoldersOfOthers) {
+  const fs::path home = folder_.path() / "home";
+  fs::create_directory(home);
+  constexpr ::uid_t other = 65534;
+  if (::geteuid() != 0 || ::chown(home.c_str(), other, other) != 0)
+    GTEST_SKIP() << "Only root can write there.";
+  Linux::KeyFileDefaults defaults(*files_, log, (home / ".config/app/settings.ini").string());
+  EXPECT_TRUE(defaults.set("key", true));
+  EXPECT_TRUE(fs::is_empty(home));
+}
+
 // Whatever stands in the way: the answer says so, and what was there stays as it was.
 TEST_F(UserDefaultsTest, AFailureIsToldAndLosesNothing) {
   const fs::path folder = path_.parent_path();

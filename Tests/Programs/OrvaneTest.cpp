@@ -239,6 +239,13 @@ TEST_F(Orvane, SendsEventsOnlyToUsersWhoAgreed) {
 
   EXPECT_EQ(run({"analytics", "consent", "no"}).output, "consent: no\n");
   ask("the user has refused");
+
+  const std::string elsewhere = home.path("elsewhere");
+  std::filesystem::rename(spool, elsewhere);
+  std::filesystem::create_symlink(elsewhere, spool);
+  const Outcome outcome = run({"analytics", "consent", "no"});
+  EXPECT_EQ(outcome.status, 1);
+  EXPECT_THAT(outcome.errors, HasSubstr("orvane: the events that wait cannot be thrown away now"));
 }
 
 // A link where the settings should be is no setting of this program.

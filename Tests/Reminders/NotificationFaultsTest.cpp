@@ -33,7 +33,7 @@ struct Anybody final : UserNotificationCenterDelegate {
 // A process on a machine whose store and desktop go wrong by one plan.
 struct Machine {
   explicit Machine(const std::shared_ptr<Testing::FaultPlan>& faults) {
-    files.faults = faults;
+    files.faults = server.faults = faults;
     center.setDelegate(delegate);
   }
 
