@@ -19,7 +19,7 @@ namespace {
 constexpr std::uint64_t largeLength = 1024 * 1024;
 
 /// A turn that was over after fewer files and bytes than these was spent waiting for the disk.
-constexpr unsigned warmFiles = 16;
+constexpr unsigned warmFiles = 8;
 constexpr std::uint64_t warmBytes = 1024 * 1024;
 
 /// After this many files of a volume without a known place, the others are not asked for theirs.
