@@ -14,8 +14,7 @@
 namespace Orvane {
 namespace {
 
-/// Files from this size on are read one after the other on an ordered disk: two at once would make
-/// it go back and forth between them.
+/// Files from this size on are read one after the other on an ordered disk.
 constexpr std::uint64_t largeLength = 1024 * 1024;
 
 /// A turn that was over after fewer files and bytes than these was spent waiting for the disk.
@@ -64,20 +63,25 @@ class FileReading::DiskPass final {
     startPlacing();
   }
 
-  /// Reads the files from this one on.
+  /// Reads the files from this one on. A disk that must work has one task: two would make its head
+  /// go back and forth between them. Until that shows, only large files have to come singly.
   void read(std::size_t begin, Stage stage) {
     stage_ = stage;
     begin_ = begin;
-    const auto isSmall = [&](const Candidate& file) {
-      return look_ != Look::everything || !disk_.isOrdered || sizeOf(file) < largeLength;
-    };
     const auto rest = files_.subspan(begin);
-    const auto large = std::stable_partition(rest.begin(), rest.end(), isSmall);
     nextSmall_ = begin;
-    nextLarge_ = largeBegin_ = begin + static_cast<std::size_t>(large - rest.begin());
+    largeBegin_ = files_.size();
+    if (look_ == Look::everything && stage == Stage::byInode) {
+      const auto large =
+          std::stable_partition(rest.begin(), rest.end(),
+                                [&](const Candidate& file) { return sizeOf(file) < largeLength; });
+      largeBegin_ = begin + static_cast<std::size_t>(large - rest.begin());
+    }
+    nextLarge_ = largeBegin_;
     isLargeTaken_ = false;
     isInterrupted_ = false;
-    running_ = static_cast<unsigned>(std::min<std::size_t>(disk_.places, rest.size()));
+    const std::size_t max = stage == Stage::byPlace ? 1 : disk_.places;
+    running_ = static_cast<unsigned>(std::min(max, rest.size()));
     startReading(running_);
   }
 

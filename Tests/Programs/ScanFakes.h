@@ -141,7 +141,9 @@ class FaultyFileSystem final : public FileSystem {
   std::function<void(const std::string& path)> beforeOpenFolder;
   std::function<void(const std::string& path)> beforeOpen;
   std::function<void(const std::string& path)> beforeRead;
+  std::map<std::string, FileIdentity> identities;  ///< Of folders that are mounted again.
   int maxOpenFolders = 1000;
+  std::atomic<int> placesAsked{0};
   std::atomic<int> openFolders{0};
   std::atomic<int> faults{0};
   std::vector<Reading> readings;
@@ -167,6 +169,7 @@ class FaultyFileSystem final : public FileSystem {
     FileResult<FileStatus> status() override { return file_->status(); }
 
     std::optional<std::uint64_t> place() override {
+      ++owner_.placesAsked;
       if (owner_.places.empty()) return file_->place();
       const auto place = owner_.places.find(path_);
       return place == owner_.places.end() ? std::nullopt : std::optional(place->second);
@@ -186,7 +189,10 @@ class FaultyFileSystem final : public FileSystem {
     }
     ~Folder() override { --owner_.openFolders; }
 
-    [[nodiscard]] FileIdentity identity() const override { return folder_->identity(); }
+    [[nodiscard]] FileIdentity identity() const override {
+      const auto other = owner_.identities.find(path_);
+      return other == owner_.identities.end() ? folder_->identity() : other->second;
+    }
 
     FileResult<bool> list(const std::function<void(const FolderEntry&)>& visit) override {
       const auto fault = owner_.interruptions.find(path_);
