@@ -2,19 +2,21 @@
 #include <orvane/ManagedDiskTurns.h>
 
 #include <algorithm>
-#include <chrono>
 #include <climits>
-#include <system_error>
+#include <optional>
+#include <utility>
 
-#include <Varnel/DiskAccess/DiskAccessGuard.h>
-#include <Varnel/DiskAccess/DiskAccessManager.h>
+#include <Varnel/DiskAccess/DiskReadingQueue.h>
+#include <Varnel/DiskAccess/OVDiskInfo.h>
 #include <Varnel/Platform/Concurrency/StartThread.h>
 #include <Varnel/Platform/Ports/VolumeCatalog.h>
 
 namespace Orvane {
 namespace {
 
-using Varnel::OVDiskInfo;
+using Varnel::DiskReadingNext;
+using Varnel::DiskReadingResult;
+using Varnel::DiskReadingTurn;
 using Varnel::Platform::URL;
 
 /// The longest part of the path that the system accepts: the path itself or, if that is too long, a
@@ -23,22 +25,44 @@ std::string askablePath(const std::string& path) {
   return path.size() < PATH_MAX ? path : path.substr(0, path.rfind('/', PATH_MAX - 1));
 }
 
-class TimedTurn final : public DiskTurn {
+class QueueTurn final : public DiskTurn {
  public:
-  bool isOver() override { return bytes_ >= maxBytes || Clock::now() >= end_; }
-  void didRead(std::uint64_t bytes) override { bytes_ += bytes; }
+  explicit QueueTurn(DiskReadingTurn& turn) : turn_(turn) {}
+  bool isOver() override { return turn_.isOver(); }
+  void didRead(std::uint64_t bytes) override { turn_.didRead(bytes); }
 
  private:
-  using Clock = std::chrono::steady_clock;
-  static constexpr std::uint64_t maxBytes = 4 << 20;
+  DiskReadingTurn& turn_;
+};
 
-  const Clock::time_point end_ = Clock::now() + std::chrono::milliseconds(20);
-  std::uint64_t bytes_ = 0;
+/// Where there is no disk, nobody waits for it.
+class EndlessTurn final : public DiskTurn {
+ public:
+  bool isOver() override { return false; }
+  void didRead(std::uint64_t) override {}
+};
+
+class QueueTask final : public Varnel::DiskReadingTask {
+ public:
+  explicit QueueTask(std::shared_ptr<DiskTask> task) : task_(std::move(task)) {}
+
+  DiskReadingNext run(DiskReadingTurn& turn) override {
+    QueueTurn scanTurn(turn);
+    const auto place = task_->run(scanTurn);
+    return place ? DiskReadingNext::again(place) : DiskReadingNext::done();
+  }
+
+  void didEnd(DiskReadingResult result) override {
+    if (result != DiskReadingResult::read) task_->refuse();
+  }
+
+ private:
+  const std::shared_ptr<DiskTask> task_;
 };
 
 }  // namespace
 
-/// A disk, and a place on it that stands for all.
+/// A disk, and a file and a volume on it that stand for all.
 struct ManagedDiskTurns::Disk : ScanDisk {
   URL url;
   std::optional<URL> volumeURL;
@@ -46,83 +70,49 @@ struct ManagedDiskTurns::Disk : ScanDisk {
 
 ManagedDiskTurns::ManagedDiskTurns(Ports ports, Varnel::Platform::QualityOfService qos,
                                    unsigned maxTasks)
-    : ports_(ports), qos_(qos), maxTasks_(maxTasks) {}
+    : ports_(ports), qos_(qos), maxTasks_(std::max(maxTasks, 1u)) {}
 
 ManagedDiskTurns::~ManagedDiskTurns() {
-  {
-    const std::lock_guard lock(mutex_);
-    isEnding_ = true;
-  }
-  changed_.notify_all();
   for (std::thread& thread : threads_) thread.join();
 }
 
 const ScanDisk& ManagedDiskTurns::diskOf(const std::string& path) {
   std::string identifier;
-  std::unique_ptr<Disk> found = lookUp(URL::fileURLWithPath(askablePath(path)), identifier);
-  const std::lock_guard lock(mutex_);
-  return *disks_.try_emplace(std::move(identifier), std::move(found)).first->second;
-}
-
-std::unique_ptr<ManagedDiskTurns::Disk> ManagedDiskTurns::lookUp(const URL& url,
-                                                                 std::string& identifier) const {
-  const auto volume = ports_.inventory.volumes.volumeURL(url);
-  if (!volume || !*volume)
-    return std::make_unique<Disk>(Disk{{.isReadable = false}, url, std::nullopt});
-  identifier = (*volume)->absoluteString();
-  auto disk = std::make_unique<Disk>(Disk{{}, url, **volume});
-  for (const auto& info : OVDiskInfo::allDiskInfos(ports_.inventory)) {
-    if (!info->volumeURLs() || !info->volumeURLs()->contains(**volume)) continue;
-    identifier = info->uniqueID().value_or(identifier);
-    disk->places = static_cast<unsigned>(
-        std::clamp<std::int64_t>(info->maxTreads(), 1, std::max(maxTasks_, 1u)));
-    disk->isOrdered = info->kind() != Varnel::OVDiskKindSolidState;
-    break;
+  const URL url = URL::fileURLWithPath(askablePath(path));
+  auto disk = std::make_unique<Disk>(Disk{{}, url, std::nullopt});
+  const auto volume = ports_.volumes.volumeURL(url);
+  if (volume && *volume) {
+    disk->volumeURL = **volume;
+    identifier = (*volume)->absoluteString();
+    if (const auto info = ports_.queue.diskOfVolume(**volume)) {
+      identifier = info->uniqueID().value_or(identifier);
+      disk->places =
+          static_cast<unsigned>(std::clamp<std::int64_t>(info->maxTreads(), 1, maxTasks_));
+      disk->isOrdered = info->kind() != Varnel::OVDiskKindSolidState;
+    }
+  } else {
+    disk->isReadable = false;
   }
-  return disk;
+  const std::lock_guard lock(mutex_);
+  return *disks_.try_emplace(std::move(identifier), std::move(disk)).first->second;
 }
 
 void ManagedDiskTurns::start(const ScanDisk& disk, std::shared_ptr<DiskTask> task) {
-  const std::lock_guard lock(mutex_);
-  waiting_.emplace_back(static_cast<const Disk*>(&disk), std::move(task));
-  if (idle_ >= waiting_.size()) return changed_.notify_one();
-  try {
-    threads_.push_back(Varnel::Platform::startThread("scan", [this] { work(); }));
-  } catch (const std::system_error&) {
-    // Out of threads: those that already run do the work.
-    if (!threads_.empty()) return;
-    waiting_.pop_back();
-    throw;
-  }
-}
-
-void ManagedDiskTurns::work() {
-  std::unique_lock lock(mutex_);
-  for (;;) {
-    ++idle_;
-    changed_.wait(lock, [&] { return isEnding_ || !waiting_.empty(); });
-    --idle_;
-    if (waiting_.empty()) return;
-    const auto [disk, task] = std::move(waiting_.front());
-    waiting_.pop_front();
-    lock.unlock();
-    run(*disk, *task);
-    lock.lock();
-  }
-}
-
-void ManagedDiskTurns::run(const Disk& disk, DiskTask& task) const {
-  for (bool goesOn = true; goesOn;) {
+  const Disk& known = static_cast<const Disk&>(disk);
+  if (known.isReadable) {
     // No security scope to open: the user named the folders, and an unreadable file shows when it
     // is opened.
-    const Varnel::DiskAccessGuard access(
-        disk.volumeURL ? ports_.manager.beginAccessingURL(disk.url, "Search for duplicates", qos_,
-                                                          false, std::nullopt, disk.volumeURL)
-                       : nullptr);
-    if (disk.isReadable && !access) return task.refuse();
-    TimedTurn turn;
-    goesOn = task.run(turn).has_value();
+    return ports_.queue.submit(
+        std::make_shared<QueueTask>(std::move(task)),
+        {.url = known.url, .volumeURL = known.volumeURL, .enableSecureScopedAccess = false},
+        {.propose = "Search for duplicates", .qos = qos_});
   }
+  const std::lock_guard lock(mutex_);
+  threads_.push_back(Varnel::Platform::startThread("scan", [task = std::move(task)] {
+    EndlessTurn turn;
+    while (task->run(turn)) {
+    }
+  }));
 }
 
 }  // namespace Orvane

@@ -10,7 +10,7 @@
 #include <Scan/FileSystem.h>
 #include <Scan/ScanObserver.h>
 #include <Varnel/Context/Globals.h>
-#include <Varnel/DiskAccess/DiskAccessManager.h>
+#include <Varnel/DiskAccess/DiskReadingQueue.h>
 #include <Varnel/Logging/Logger.h>
 #include <Varnel/Logging/LoggingObject.h>
 #include <Varnel/Paths/QNURLResolver.h>
@@ -104,11 +104,9 @@ int ScanCommand::run(Console& console) const {
   for (const std::string& path : *paths) log.log("Will scan", URL::fileURLWithPath(path + "/"));
 
   const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
-  ManagedDiskTurns turns({.manager = Varnel::DiskAccessManager::shared(),
-                          .inventory = {.devices = ports.deviceRegistry,
-                                        .disks = ports.diskArbitration,
-                                        .volumes = ports.volumeCatalog}},
-                         qos, maxReaders());
+  ManagedDiskTurns turns(
+      {.queue = Varnel::DiskReadingQueue::shared(), .volumes = ports.volumeCatalog}, qos,
+      maxReaders());
   DuplicateFinder finder({.fileSystem = systemFileSystem(), .turns = turns, .observer = log});
   ScanControl control;
   ScanResult result;

@@ -8,6 +8,7 @@
 
 #include <Varnel/Basalt/Semaphore.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
+#include <Varnel/DiskAccess/DiskReadingQueue.h>
 #include <Varnel/Platform/Ports/VolumeCatalog.h>
 #include <Varnel/Platform/Testing/FakeDeviceRegistry.h>
 #include <Varnel/Platform/Testing/FakeDiskArbitration.h>
@@ -60,7 +61,8 @@ TEST(ManagedDiskTurns, AShareThatHangsHoldsUpNoReaderOfOtherDisks) {
   Varnel::Platform::Testing::FakeSecurityScope scope;
   Basalt::NotificationCenter center;
   Varnel::DiskAccessManager manager({devices, disks, volumes, scope, center});
-  ManagedDiskTurns turns({manager, {devices, disks, volumes}}, QualityOfService::utility, 2);
+  Varnel::DiskReadingQueue queue(manager);
+  ManagedDiskTurns turns({queue, volumes}, QualityOfService::utility, 2);
   Basalt::Semaphore isDone;
   const auto read = [&](const char* path) {
     return std::thread(
