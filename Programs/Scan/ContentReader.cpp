@@ -4,17 +4,19 @@
 #define XXH_INLINE_ALL
 #include <xxhash.h>
 
+#include <algorithm>
 #include <cstring>
-
-#include <Scan/FileTree.h>
-#include <Scan/ScanObserver.h>
+#include <random>
+#include <utility>
 
 namespace Orvane {
 namespace {
 
-/// Large enough to keep a rotating disk from seeking all the time, small enough to stay near the
-/// processor and to let an urgent reader of the disk in soon.
-constexpr std::size_t blockSize = 512 * 1024;
+/// How much of the middle and of the end is looked at.
+constexpr std::uint64_t sampleLength = 4096;
+
+/// From this size on, telling the system that only parts are read saves more than it costs.
+constexpr std::uint64_t worthAdvice = 64 * 1024;
 
 Digest digestFrom(const XXH128_hash_t& hash) {
   return {hash.high64, hash.low64};
@@ -22,44 +24,122 @@ Digest digestFrom(const XXH128_hash_t& hash) {
 
 }  // namespace
 
-ContentReader::ContentReader(ContentStream::Ports ports, ScanControl& control)
-    : ports_(ports), control_(control), firstBuffer_(blockSize), secondBuffer_(blockSize) {}
-
-ContentReader::DigestResult ContentReader::digest(const FileRecord& file, std::uint64_t length) {
-  ContentStream stream(file, length, ports_);
-  auto block = readBlock(stream, firstBuffer_);
-  if (!block) return block.error();
-  if (stream.isFinished()) return digestFrom(XXH3_128bits(block->data(), block->size()));
-
-  XXH3_state_t state;
-  XXH3_128bits_reset(&state);
-  XXH3_128bits_update(&state, block->data(), block->size());
-  while (!stream.isFinished() && !control_.isCancelled) {
-    block = readBlock(stream, firstBuffer_);
-    if (!block) return block.error();
-    XXH3_128bits_update(&state, block->data(), block->size());
+DigestSecret::DigestSecret() {
+  std::random_device random;
+  for (std::size_t i = 0; i < bytes_.size(); i += sizeof(unsigned)) {
+    const unsigned drawn = random();
+    std::memcpy(bytes_.data() + i, &drawn, sizeof drawn);
   }
-  return digestFrom(XXH3_128bits_digest(&state));
 }
 
-Comparison ContentReader::compare(const FileRecord& first, const FileRecord& second) {
-  ContentStream firstStream(first, first.status.size, ports_);
-  ContentStream secondStream(second, second.status.size, ports_);
-  while (!firstStream.isFinished() && !control_.isCancelled) {
-    const auto firstBlock = readBlock(firstStream, firstBuffer_);
-    if (!firstBlock) return {.firstLoss = firstBlock.error()};
-    const auto secondBlock = readBlock(secondStream, secondBuffer_);
-    if (!secondBlock) return {.secondLoss = secondBlock.error()};
-    if (std::memcmp(firstBlock->data(), secondBlock->data(), firstBlock->size()) != 0) return {};
+/// The digest of all blocks of one file. A single block goes without the state, which costs more
+/// than a small file's digest.
+class ContentReader::Hash final {
+ public:
+  explicit Hash(const DigestSecret& secret) : secret_(secret.bytes()) {}
+
+  [[nodiscard]] Digest of(std::span<const std::byte> bytes) const {
+    return digestFrom(
+        XXH3_128bits_withSecret(bytes.data(), bytes.size(), secret_.data(), secret_.size()));
   }
-  return {.isEqual = firstStream.isFinished()};
+  void reset() { XXH3_128bits_reset_withSecret(&state_, secret_.data(), secret_.size()); }
+  void add(std::span<const std::byte> bytes) {
+    XXH3_128bits_update(&state_, bytes.data(), bytes.size());
+  }
+  [[nodiscard]] Digest digest() const { return digestFrom(XXH3_128bits_digest(&state_)); }
+
+ private:
+  std::span<const std::byte> secret_;
+  XXH3_state_t state_;
+};
+
+ContentReader::ContentReader(const FileTree& tree, FileSystem& fileSystem,
+                             const DigestSecret& secret)
+    : tree_(tree),
+      secret_(secret),
+      folders_(fileSystem),
+      buffer_(blockLength),
+      hash_(std::make_unique<Hash>(secret_)) {}
+
+ContentReader::~ContentReader() = default;
+
+void ContentReader::begin(FileNumber file, Look look) {
+  const std::uint64_t size = tree_.file(file).size;
+  file_ = file;
+  ranges_ = {};
+  switch (look) {
+    case Look::head:
+      ranges_[0] = {0, std::min(size, headLength)};
+      break;
+    case Look::samples:
+      ranges_ = {Range{size / 2, std::min(size, size / 2 + sampleLength)},
+                 Range{size - std::min(size, sampleLength), size}};
+      break;
+    case Look::everything:
+      ranges_[0] = {0, size};
+      break;
+  }
+  isPart_ = look != Look::everything && size > worthAdvice;
+  isFirstBlock_ = true;
+  loss_.reset();
 }
 
-ContentStream::Block ContentReader::readBlock(ContentStream& stream,
-                                              std::vector<std::byte>& buffer) {
-  ContentStream::Block block = stream.next(buffer);
-  if (block) control_.bytesRead.fetch_add(block->size(), std::memory_order_relaxed);
-  return block;
+bool ContentReader::step() {
+  stepLength_ = 0;
+  if (isFirstBlock_) {
+    auto opened = open(isPart_ ? ReadingPlan::parts : ReadingPlan::everything);
+    if (!opened) return lose(Loss::because(opened.error()));
+    open_ = std::move(*opened);
+  }
+  Range& range = ranges_[0];
+  const auto wanted = static_cast<std::size_t>(std::min(blockLength, range.end - range.begin));
+  while (stepLength_ < wanted) {
+    const auto count =
+        open_->read(range.begin, std::span(buffer_).subspan(stepLength_, wanted - stepLength_));
+    if (!count) return lose(Loss::because(count.error()));
+    if (*count == 0) return lose({Loss::Kind::changed, {}});
+    stepLength_ += *count;
+    range.begin += *count;
+  }
+  if (range.begin == range.end) ranges_[0] = std::exchange(ranges_[1], {});
+  const std::span<const std::byte> block(buffer_.data(), wanted);
+  const bool isLast = ranges_[0].begin == ranges_[0].end;
+  if (isFirstBlock_ && isLast) {
+    digest_ = hash_->of(block);
+    headDigest_ = block.size() > headLength ? hash_->of(block.first(headLength)) : digest_;
+  } else {
+    if (isFirstBlock_) hash_->reset();
+    hash_->add(block);
+    if (isLast) digest_ = hash_->digest();
+  }
+  isFirstBlock_ = false;
+  return isLast && finish();
+}
+
+std::optional<std::uint64_t> ContentReader::placeOf(FileNumber file) {
+  file_ = file;
+  const auto opened = open(ReadingPlan::everything);
+  return opened ? (*opened)->place() : std::nullopt;
+}
+
+FileResult<std::unique_ptr<OpenFile>> ContentReader::open(ReadingPlan plan) {
+  const auto folder = folders_.open(tree_.folderOf(file_));
+  if (!folder) return folder.error();
+  return (*folder)->open(tree_.nameOf(file_), plan);
+}
+
+bool ContentReader::lose(const Loss& loss) {
+  loss_ = loss;
+  open_.reset();
+  return true;
+}
+
+bool ContentReader::finish() {
+  const auto status = open_->status();
+  if (!status) return lose(Loss::because(status.error()));
+  if (!tree_.isUnchanged(file_, *status)) return lose({Loss::Kind::changed, {}});
+  open_.reset();
+  return true;
 }
 
 }  // namespace Orvane

@@ -4,49 +4,94 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 #include <optional>
+#include <span>
 #include <vector>
 
-#include <Scan/ContentStream.h>
+#include <Scan/Candidate.h>
+#include <Scan/FileSystem.h>
+#include <Scan/Loss.h>
+#include <Scan/OpenFolders.h>
 
 namespace Orvane {
 
-struct ScanControl;
-
-/// A 128-bit digest of some bytes. Equal digests make equal bytes likely but never certain:
-/// different contents with one digest can be made on purpose.
-using Digest = std::array<std::uint64_t, 2>;
-
-/// The outcome of the comparison of two files.
-struct Comparison {
-  bool isEqual = false;
-  std::optional<Loss> firstLoss{};
-  std::optional<Loss> secondLoss{};
-};
-
-/// Reads contents for one worker, with ports and buffers that it uses over and over. It counts what
-/// it reads. Once asked to stop, it stops at the next block, and its result is of no use. One
-/// thread at a time.
-class ContentReader final {
+/// What digests depend on: random, and another for each scan, so that nobody can make files that
+/// differ but have one digest.
+class DigestSecret final {
  public:
-  using DigestResult = Varnel::Platform::Result<Digest, Loss>;
+  /// Draws a secret.
+  DigestSecret();
 
-  /// `control` outlives the reader.
-  ContentReader(ContentStream::Ports ports, ScanControl& control);
-
-  /// The digest of the file's first `length` bytes, or of all if it has fewer.
-  [[nodiscard]] DigestResult digest(const FileRecord& file, std::uint64_t length);
-
-  /// Compares two files of one size byte by byte, as far as the first difference.
-  [[nodiscard]] Comparison compare(const FileRecord& first, const FileRecord& second);
+  [[nodiscard]] std::span<const std::byte> bytes() const { return bytes_; }
 
  private:
-  ContentStream::Block readBlock(ContentStream& stream, std::vector<std::byte>& buffer);
+  std::array<std::byte, 192> bytes_;
+};
 
-  ContentStream::Ports ports_;
-  ScanControl& control_;
-  std::vector<std::byte> firstBuffer_;
-  std::vector<std::byte> secondBuffer_;
+/// Reads one file after the other, each in as many steps as its caller likes. With the last step it
+/// makes sure that the file is still the one, and in the state, that the walk saw.
+///
+///     reader.begin(file, Look::head);
+///     while (!reader.step()) …
+///     if (const auto& loss = reader.loss()) …
+///     use(reader.digest());
+///
+/// One thread at a time.
+class ContentReader final {
+ public:
+  /// All outlive the reader.
+  ContentReader(const FileTree& tree, FileSystem& fileSystem, const DigestSecret& secret);
+  ~ContentReader();
+  ContentReader(const ContentReader&) = delete;
+  ContentReader& operator=(const ContentReader&) = delete;
+
+  void begin(FileNumber file, Look look);
+
+  /// Reads the next block. True when the file is finished, or lost.
+  [[nodiscard]] bool step();
+
+  /// How many bytes the last step read.
+  [[nodiscard]] std::uint64_t stepLength() const { return stepLength_; }
+
+  /// The next three tell of a file that is finished.
+  [[nodiscard]] const std::optional<Loss>& loss() const { return loss_; }
+  [[nodiscard]] Digest digest() const { return digest_; }
+  /// The digest of the beginning, when everything was read in one block.
+  [[nodiscard]] Digest headDigest() const { return headDigest_; }
+
+  /// How large a file may be to be read in one block.
+  static constexpr std::uint64_t blockLength = 256 * 1024;
+
+  /// Where the file lies on its volume, if that can be told. Reads nothing.
+  [[nodiscard]] std::optional<std::uint64_t> placeOf(FileNumber file);
+
+ private:
+  struct Range {
+    std::uint64_t begin;
+    std::uint64_t end;
+  };
+  class Hash;
+
+  [[nodiscard]] FileResult<std::unique_ptr<OpenFile>> open(ReadingPlan plan);
+  [[nodiscard]] bool lose(const Loss& loss);
+  [[nodiscard]] bool finish();
+
+  const FileTree& tree_;
+  const DigestSecret& secret_;
+  OpenFolders folders_;
+  std::vector<std::byte> buffer_;
+  const std::unique_ptr<Hash> hash_;
+
+  FileNumber file_ = Candidate::lost;
+  std::array<Range, 2> ranges_{};  ///< What is left to read; the second one may be empty.
+  std::unique_ptr<OpenFile> open_;
+  bool isPart_ = false;
+  bool isFirstBlock_ = false;
+  std::uint64_t stepLength_ = 0;
+  std::optional<Loss> loss_;
+  Digest digest_{};
+  Digest headDigest_{};
 };
 
 }  // namespace Orvane

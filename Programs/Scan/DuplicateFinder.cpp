@@ -2,81 +2,90 @@
 #include <Scan/DuplicateFinder.h>
 
 #include <algorithm>
-#include <limits>
-#include <optional>
 #include <tuple>
-#include <unordered_map>
 #include <utility>
 
-#include <Scan/ContentReader.h>
-#include <Scan/FileTree.h>
+#include <Scan/FileReading.h>
+#include <Scan/FolderWalk.h>
+#include <Scan/PathOrder.h>
 #include <Scan/ScanObserver.h>
-#include <Scan/ThreadTeam.h>
 
 namespace Orvane {
 namespace {
 
-/// How much of a file is looked at first. A disk reads this much in one go anyway, and most files
-/// are not larger.
-constexpr std::uint64_t headLength = 4096;
-constexpr std::uint64_t wholeLength = std::numeric_limits<std::uint64_t>::max();
-
-/// A file that may have a duplicate.
-struct Candidate {
-  const FileRecord* file;
-  Digest digest{};
-  std::optional<Loss> loss{};
-};
+/// From this size on, a look at samples costs little beside reading everything.
+constexpr std::uint64_t worthSamples = 1024 * 1024;
 
 using Candidates = std::vector<Candidate>;
-/// Files that are equal as far as they have been looked at, in the order of their paths.
-using Group = std::vector<const FileRecord*>;
 
-using Losses = std::vector<std::pair<std::string, Loss>>;
-
-bool liesBefore(const FileRecord* first, const FileRecord* second) {
-  return first->status.identity < second->status.identity;
+/// Calls `use(begin, end)` for each run of candidates that are equal in the key that is given.
+template <typename Iterator, typename KeyOf, typename Use>
+void forEachRun(Iterator begin, Iterator end, const KeyOf& keyOf, const Use& use) {
+  while (begin != end) {
+    const auto next = std::find_if(
+        begin, end, [&](const Candidate& candidate) { return keyOf(candidate) != keyOf(*begin); });
+    use(begin, next);
+    begin = next;
+  }
 }
 
-/// One scan. Its data belongs to the thread that runs it, but for the item that a worker has drawn.
+auto groupAndKey(const Candidate& candidate) {
+  return std::tie(candidate.group, candidate.key);
+}
+
+/// Leaves the groups of candidates that agree in group and key, at least two, and gives them
+/// numbers of their own.
+void keepAgreeing(Candidates& candidates) {
+  std::sort(candidates.begin(), candidates.end(),
+            [](const Candidate& a, const Candidate& b) { return groupAndKey(a) < groupAndKey(b); });
+  std::uint32_t group = 0;
+  auto kept = candidates.begin();
+  forEachRun(candidates.begin(), candidates.end(), groupAndKey, [&](auto begin, auto end) {
+    if (end - begin == 1) return;
+    ++group;
+    for (; begin != end; ++begin, ++kept) {
+      *kept = *begin;
+      kept->group = group;
+    }
+  });
+  candidates.erase(kept, candidates.end());
+}
+
+/// Takes out the candidates that a condition holds for.
+template <typename Condition>
+Candidates takeOut(Candidates& candidates, const Condition& condition) {
+  const auto middle = std::stable_partition(candidates.begin(), candidates.end(),
+                                            [&](const auto& each) { return !condition(each); });
+  Candidates taken(middle, candidates.end());
+  candidates.erase(middle, candidates.end());
+  return taken;
+}
+
+/// One scan, on the thread that runs it.
 class Scan final {
  public:
-  Scan(DuplicateFinder::Ports ports, unsigned threads, ScanControl& control)
-      : ports_(ports), threads_(threads), control_(control) {}
+  Scan(DuplicateFinder::Ports ports, ScanControl& control) : ports_(ports), control_(control) {}
 
   ScanResult run(const std::vector<std::string>& folders) {
-    tree_ = walkFolders(folders, ports_.fileSystem, threads_, control_);
-    if (!tree_.lostRoots.empty()) return {.lostFolders = std::move(tree_.lostRoots)};
-    reportWalk();
-    Candidates candidates = filesOfSharedSize(distinctFiles());
-    takeDigests(candidates, headLength);
-    std::vector<Group> likely;
-    Candidates undecided;
-    for (Group& group : groupsOfEqualDigest(std::move(candidates))) {
-      // Two files are best compared at once: a digest of each would read just as much.
-      if (group.size() == 2 || group.front()->status.size <= headLength) {
-        likely.push_back(std::move(group));
-      } else {
-        for (const FileRecord* file : group) undecided.push_back({file});
-      }
-    }
-    std::sort(undecided.begin(), undecided.end(),
-              [](const Candidate& a, const Candidate& b) { return liesBefore(a.file, b.file); });
-    takeDigests(undecided, wholeLength);
-    for (Group& group : groupsOfEqualDigest(std::move(undecided)))
-      likely.push_back(std::move(group));
-    while (!likely.empty() && !control_.isCancelled) likely = confirm(std::move(likely));
-    return finish();
+    WalkResult walk = walkFolders(folders, ports_.fileSystem, ports_.turns, control_);
+    if (!walk.lostRoots.empty()) return {.lostFolders = std::move(walk.lostRoots)};
+    tree_ = walk.tree;
+    reportWalk(walk);
+    Candidates candidates = distinctFiles();
+    keepSharedSizes(candidates);
+    std::vector<Candidates> equal = readEqual(std::move(candidates));
+    if (control_.isCancelled) return {};
+    return resultFrom(std::move(equal));
   }
 
  private:
-  void reportWalk() {
-    totals_.folders = tree_.folders.size();
-    totals_.unreadableFolders = tree_.unreadableFolders.size();
-    totals_.files = tree_.files.size() + tree_.unreadableFiles.size();
-    for (const LostPath& lost : tree_.unreadableFolders)
+  void reportWalk(const WalkResult& walk) {
+    totals_.folders = walk.folders;
+    totals_.unreadableFolders = walk.unreadableFolders.size();
+    totals_.files = tree_->fileCount() + walk.unreadableFiles.size();
+    for (const LostPath& lost : walk.unreadableFolders)
       ports_.observer.folderLeftOut(lost.path, lost.loss);
-    for (const LostPath& lost : tree_.unreadableFiles) leaveOut(lost.path, lost.loss);
+    for (const LostPath& lost : walk.unreadableFiles) leaveOut(lost.path, lost.loss);
   }
 
   void leaveOut(const std::string& path, const Loss& loss) {
@@ -95,190 +104,164 @@ class Scan final {
     ports_.observer.fileLeftOut(path, loss);
   }
 
-  void leaveOut(Losses losses) {
-    std::sort(losses.begin(), losses.end(),
-              [](const auto& a, const auto& b) { return a.first < b.first; });
-    for (const auto& [path, loss] : losses) leaveOut(path, loss);
+  [[nodiscard]] std::uint64_t sizeOf(const Candidate& candidate) const {
+    return tree_->file(candidate.file).size;
   }
 
-  /// The files that have content, each under its first path, in the order in which they likely lie
-  /// on their disks.
-  Group distinctFiles() {
-    Group files;
-    files.reserve(tree_.files.size());
-    for (const FileRecord& file : tree_.files) {
-      if (file.status.size == 0) {
+  /// The files that have content, each under its first path, sorted by location.
+  Candidates distinctFiles() {
+    Candidates files;
+    files.reserve(tree_->fileCount());
+    tree_->forEachFile([&](FileNumber number, const FileRecord& record) {
+      if (record.size == 0) {
         ++totals_.emptyFiles;
       } else {
-        files.push_back(&file);
+        files.push_back({.file = number, .key = tree_->locationOf(number)});
       }
-    }
-    std::sort(files.begin(), files.end(), [](const FileRecord* a, const FileRecord* b) {
-      if (a->status.identity != b->status.identity) return liesBefore(a, b);
-      return pathPrecedes(*a, *b);
     });
-    const auto end =
-        std::unique(files.begin(), files.end(), [](const FileRecord* a, const FileRecord* b) {
-          return a->status.identity == b->status.identity;
-        });
-    totals_.hardLinks = static_cast<std::uint64_t>(files.end() - end);
-    files.erase(end, files.end());
-    for (const FileRecord* file : files) totals_.bytes += file->status.size;
+    std::sort(files.begin(), files.end(), [](const Candidate& a, const Candidate& b) {
+      return std::tie(a.key, a.file) < std::tie(b.key, b.file);
+    });
+    keepFirstLinks(files);
+    for (const Candidate& file : files) totals_.bytes += sizeOf(file);
     return files;
   }
 
-  static Candidates filesOfSharedSize(const Group& files) {
-    std::unordered_map<std::uint64_t, std::uint32_t> filesOfSize;
-    filesOfSize.reserve(files.size());
-    for (const FileRecord* file : files) ++filesOfSize[file->status.size];
-    Candidates candidates;
-    for (const FileRecord* file : files)
-      if (filesOfSize[file->status.size] > 1) candidates.push_back({file});
-    return candidates;
-  }
-
-  /// Digests each candidate's first `length` bytes and leaves out those that are lost. The
-  /// candidates are sorted by disk.
-  void takeDigests(Candidates& candidates, std::uint64_t length) {
-    std::vector<std::size_t> ends;
-    for (std::size_t i = 1; i <= candidates.size(); ++i) {
-      if (i == candidates.size() || candidates[i].file->status.identity.device !=
-                                        candidates[i - 1].file->status.identity.device)
-        ends.push_back(i);
-    }
-    readAll(ends, [&](ContentReader& reader, std::size_t index) {
-      Candidate& candidate = candidates[index];
-      auto digest = reader.digest(*candidate.file, length);
-      if (digest) {
-        candidate.digest = *digest;
-      } else {
-        candidate.loss = digest.error();
-      }
+  void keepFirstLinks(Candidates& files) {
+    const auto keyOf = [](const Candidate& candidate) { return candidate.key; };
+    std::vector<FileNumber> links;
+    forEachRun(files.begin(), files.end(), keyOf, [&](auto begin, auto end) {
+      if (end - begin > 1)
+        for (; begin != end; ++begin) links.push_back(begin->file);
     });
-    Losses losses;
-    for (const Candidate& candidate : candidates)
-      if (candidate.loss) losses.emplace_back(candidate.file->path(), *candidate.loss);
-    leaveOut(std::move(losses));
-    std::erase_if(candidates, [](const Candidate& candidate) { return candidate.loss; });
-  }
-
-  /// The groups of candidates that agree in size and digest.
-  static std::vector<Group> groupsOfEqualDigest(Candidates candidates) {
-    const auto key = [](const Candidate& candidate) {
-      return std::tie(candidate.file->status.size, candidate.digest);
-    };
-    std::sort(candidates.begin(), candidates.end(), [&](const Candidate& a, const Candidate& b) {
-      if (key(a) != key(b)) return key(a) < key(b);
-      return pathPrecedes(*a.file, *b.file);
+    if (links.empty()) return;
+    sortByPath(*tree_, links);
+    // Each file's first path comes first now, and the files in the order of the candidates.
+    std::stable_sort(links.begin(), links.end(), [&](FileNumber a, FileNumber b) {
+      return tree_->locationOf(a) < tree_->locationOf(b);
     });
-    std::vector<Group> groups;
-    for (auto begin = candidates.begin(); begin != candidates.end();) {
-      const auto end = std::find_if(begin, candidates.end(), [&](const Candidate& candidate) {
-        return key(candidate) != key(*begin);
-      });
+    auto link = links.begin();
+    auto kept = files.begin();
+    forEachRun(files.begin(), files.end(), keyOf, [&](auto begin, auto end) {
+      *kept = *begin;
       if (end - begin > 1) {
-        Group& group = groups.emplace_back();
-        for (auto member = begin; member != end; ++member) group.push_back(member->file);
+        kept->file = *link;
+        link += end - begin;
       }
+      ++kept;
+    });
+    totals_.hardLinks = static_cast<std::uint64_t>(files.end() - kept);
+    files.erase(kept, files.end());
+  }
+
+  /// Leaves the files whose size others have too, and makes a group of each size.
+  void keepSharedSizes(Candidates& files) const {
+    std::vector<std::uint64_t> sizes;
+    sizes.reserve(files.size());
+    for (const Candidate& file : files) sizes.push_back(sizeOf(file));
+    std::sort(sizes.begin(), sizes.end());
+    auto kept = sizes.begin();
+    for (auto begin = sizes.begin(); begin != sizes.end();) {
+      const auto end = std::upper_bound(begin, sizes.end(), *begin);
+      if (end - begin > 1) *kept++ = *begin;
       begin = end;
     }
-    return groups;
+    sizes.erase(kept, sizes.end());
+    std::erase_if(files, [&](Candidate& file) {
+      const auto found = std::lower_bound(sizes.begin(), sizes.end(), sizeOf(file));
+      file.group = static_cast<std::uint32_t>(found - sizes.begin());
+      return found == sizes.end() || *found != sizeOf(file);
+    });
+    files.shrink_to_fit();
   }
 
-  /// Compares the files of each group with its first. Those that are equal to it go to the result;
-  /// returned are the groups of what is left, each smaller than before.
-  std::vector<Group> confirm(std::vector<Group> groups) {
-    struct Pair {
-      const FileRecord* first;
-      const FileRecord* second;
-      Comparison comparison{};
+  /// The candidates of equal content. Each look is for those that are still alike after the last.
+  std::vector<Candidates> readEqual(Candidates candidates) {
+    FileReading reading({*tree_, ports_.fileSystem, ports_.turns}, control_);
+    const auto look = [&](Look next, Candidates& files) {
+      reading.read(next, files);
+      leaveOut(reading.takeLosses());
     };
-    std::vector<Pair> pairs;
-    for (const Group& group : groups)
-      for (std::size_t i = 1; i < group.size(); ++i) pairs.push_back({group.front(), group[i]});
-    readAll({pairs.size()}, [&](ContentReader& reader, std::size_t index) {
-      pairs[index].comparison = reader.compare(*pairs[index].first, *pairs[index].second);
-    });
+    look(Look::head, candidates);
+    keepAgreeing(candidates);
+    Candidates rest =
+        takeOut(candidates, [&](const auto& file) { return sizeOf(file) > headLength; });
 
-    std::vector<Group> rest;
-    Losses losses;
-    auto pair = pairs.begin();
-    for (const Group& group : groups) {
-      Group equal{group.front()};
-      Group different;
-      std::optional<Loss> loss;
-      for (std::size_t i = 1; i < group.size(); ++i, ++pair) {
-        const Comparison& comparison = pair->comparison;
-        if (comparison.firstLoss) loss = comparison.firstLoss;
-        if (comparison.secondLoss) {
-          losses.emplace_back(group[i]->path(), *comparison.secondLoss);
-        } else {
-          (comparison.isEqual ? equal : different).push_back(group[i]);
-        }
+    Candidates large = takeOut(rest, [&](const auto& file) { return sizeOf(file) > worthSamples; });
+    look(Look::samples, large);
+    keepAgreeing(large);
+    look(Look::everything, large);
+    keepAgreeing(large);
+
+    Candidates known =
+        takeOut(rest, [&](const auto& file) { return reading.wholeDigest(file.file).has_value(); });
+    for (Candidate& file : known) file.key = *reading.wholeDigest(file.file);
+    look(Look::everything, rest);
+    rest.insert(rest.end(), known.begin(), known.end());
+    keepAgreeing(rest);
+    return {std::move(candidates), std::move(large), std::move(rest)};
+  }
+
+  void leaveOut(const FileReading::Losses& losses) {
+    std::vector<LostPath> paths;
+    for (const auto& [file, loss] : losses) paths.push_back({tree_->pathOf(file), loss});
+    std::sort(paths.begin(), paths.end(),
+              [](const LostPath& a, const LostPath& b) { return a.path < b.path; });
+    for (const LostPath& lost : paths) leaveOut(lost.path, lost.loss);
+  }
+
+  /// The result from groups that are numbered from 1 in each part.
+  ScanResult resultFrom(std::vector<Candidates> parts) {
+    std::vector<std::uint32_t> groupOf(tree_->endOfNumbers());
+    std::vector<FileNumber> files;
+    std::vector<DuplicateGroup> groups;
+    for (Candidates& part : parts) {
+      const auto first = static_cast<std::uint32_t>(groups.size());
+      for (const Candidate& candidate : part) {
+        const std::uint32_t group = first + candidate.group - 1;
+        if (group == groups.size()) groups.push_back({.size = sizeOf(candidate)});
+        ++groups[group].count;
+        groupOf[candidate.file] = group;
+        files.push_back(candidate.file);
       }
-      if (loss) {
-        // Comparisons with a first file that was lost do not count.
-        losses.emplace_back(group.front()->path(), *loss);
-        different.insert(different.end(), equal.begin() + 1, equal.end());
-        std::sort(different.begin(), different.end(),
-                  [](const FileRecord* a, const FileRecord* b) { return pathPrecedes(*a, *b); });
-      } else if (equal.size() > 1) {
-        add(equal);
-      }
-      if (different.size() > 1) rest.push_back(std::move(different));
+      Candidates().swap(part);
     }
-    leaveOut(std::move(losses));
-    return rest;
-  }
-
-  void add(const Group& equal) {
-    DuplicateGroup& group = groups_.emplace_back();
-    group.size = equal.front()->status.size;
-    for (const FileRecord* file : equal) group.paths.push_back(file->path());
-  }
-
-  /// Makes the workers run `read` for every index below the end of the last lane.
-  template <typename Read>
-  void readAll(const std::vector<std::size_t>& laneEnds, const Read& read) {
-    if (laneEnds.empty() || laneEnds.back() == 0) return;
-    control_.filesToRead.fetch_add(laneEnds.back(), std::memory_order_relaxed);
-    WorkLanes lanes(laneEnds);
-    runOnThreads(threads_, [&](unsigned worker) {
-      ContentReader reader({ports_.fileSystem, ports_.access}, control_);
-      for (std::size_t index = 0; !control_.isCancelled && lanes.next(worker, index);) {
-        read(reader, index);
-        control_.filesRead.fetch_add(1, std::memory_order_relaxed);
-      }
-    });
-  }
-
-  ScanResult finish() {
-    std::sort(groups_.begin(), groups_.end(), [](const DuplicateGroup& a, const DuplicateGroup& b) {
-      if (a.wastedBytes() != b.wastedBytes()) return a.wastedBytes() > b.wastedBytes();
-      return a.paths.front() < b.paths.front();
-    });
-    for (const DuplicateGroup& group : groups_) {
-      totals_.duplicateFiles += group.paths.size() - 1;
-      totals_.wastedBytes += group.wastedBytes();
+    for (std::uint32_t end = 0; DuplicateGroup & group : groups) {
+      group.begin = end;
+      end += std::exchange(group.count, 0);
     }
-    return {.groups = std::move(groups_), .totals = totals_};
+    sortByPath(*tree_, files);
+    ScanResult result{.totals = totals_, .files = std::vector<FileNumber>(files.size())};
+    std::vector<std::uint32_t> byFirstPath;
+    for (const FileNumber file : files) {
+      DuplicateGroup& group = groups[groupOf[file]];
+      if (group.count == 0) byFirstPath.push_back(groupOf[file]);
+      result.files[group.begin + group.count++] = file;
+    }
+    result.groups.reserve(groups.size());
+    for (const std::uint32_t group : byFirstPath) result.groups.push_back(groups[group]);
+    std::stable_sort(result.groups.begin(), result.groups.end(),
+                     [](const DuplicateGroup& a, const DuplicateGroup& b) {
+                       return a.wastedBytes() > b.wastedBytes();
+                     });
+    for (const DuplicateGroup& group : result.groups) {
+      result.totals.duplicateFiles += group.count - 1;
+      result.totals.wastedBytes += group.wastedBytes();
+    }
+    result.tree = tree_;
+    return result;
   }
 
   DuplicateFinder::Ports ports_;
-  unsigned threads_;
   ScanControl& control_;
-  FileTree tree_;
-  std::vector<DuplicateGroup> groups_;
+  std::shared_ptr<const FileTree> tree_;
   ScanTotals totals_;
 };
 
 }  // namespace
 
-DuplicateFinder::DuplicateFinder(Ports ports, unsigned threads)
-    : ports_(ports), threads_(std::max(threads, 1u)) {}
-
 ScanResult DuplicateFinder::find(const std::vector<std::string>& folders, ScanControl& control) {
-  return Scan(ports_, threads_, control).run(folders);
+  return Scan(ports_, control).run(folders);
 }
 
 }  // namespace Orvane

@@ -8,16 +8,18 @@
 
 namespace Orvane {
 
-class ContentAccess;
+class DiskTurns;
 class FileSystem;
 class ScanObserver;
 struct ScanControl;
 
-/// Finds the files of equal content in some folders. Files are told apart by their size, then by a
-/// digest of their beginning, then by a digest of everything. Files that still agree are compared
-/// byte by byte, so the result holds true duplicates only.
+/// Finds the files of equal content in some folders. Files are told apart by their size, then by
+/// their beginning, large ones by something of their middle and end, and then by everything. What
+/// was read is compared by digests of 128 bits that depend on a secret of each scan, so that equal
+/// digests mean equal contents for all a list of duplicates is good for. Who *removes* a file must
+/// compare its bytes with those of the one that stays.
 ///
-///     DuplicateFinder finder({systemFileSystem(), access, observer}, 4);
+///     DuplicateFinder finder({systemFileSystem(), turns, observer});
 ///     ScanResult result = finder.find({"/home/u/Pictures"}, control);
 ///
 /// All hard links of a file count as one file, known by the first of its paths; symbolic links and
@@ -29,12 +31,11 @@ class DuplicateFinder final {
  public:
   struct Ports {
     FileSystem& fileSystem;
-    ContentAccess& access;
+    DiskTurns& turns;
     ScanObserver& observer;
   };
 
-  /// `threads`: how many read at once, at least 1.
-  DuplicateFinder(Ports ports, unsigned threads);
+  explicit DuplicateFinder(Ports ports) : ports_(ports) {}
 
   /// Scans folders given by absolute paths without symbolic links. Once `control` asks to stop it
   /// returns soon, with a result that is of no use.
@@ -42,7 +43,6 @@ class DuplicateFinder final {
 
  private:
   Ports ports_;
-  unsigned threads_;
 };
 
 }  // namespace Orvane

@@ -3,11 +3,13 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <memory>
+#include <optional>
 #include <span>
 #include <string>
+#include <string_view>
 #include <system_error>
-#include <vector>
 
 #include <Varnel/Platform/Values/Result.h>
 
@@ -33,53 +35,64 @@ struct FileStatus {
   bool operator==(const FileStatus&) const = default;
 };
 
-/// The content of one folder: its regular files and its folders, by name and in no order.
-/// Everything else in it (symbolic links, devices, sockets, pipes) is left out.
-struct FolderListing {
-  struct File {
-    std::string name;
-    FileStatus status;
-  };
-  struct Failure {
-    std::string name;
-    std::error_code error;
-  };
-
-  FileIdentity identity;
-  std::vector<std::string> folders;
-  std::vector<File> files;
-  std::vector<Failure> failures;  ///< Entries whose status could not be had.
-  std::error_code interruption;   ///< Why there may be more in the folder; none when this is all.
-};
-
 /// A regular file that is open for reading. One thread at a time; closed when destroyed.
 class OpenFile {
  public:
   virtual ~OpenFile() = default;
 
-  /// Reads the next bytes, as many as there are and `buffer` holds; 0 at the end of the file.
-  [[nodiscard]] virtual FileResult<std::size_t> read(std::span<std::byte> buffer) = 0;
+  /// Reads from a place of the file as many bytes as there are and `buffer` holds; 0 at its end.
+  [[nodiscard]] virtual FileResult<std::size_t> read(std::uint64_t offset,
+                                                     std::span<std::byte> buffer) = 0;
 
   /// The file's status as it is now.
   [[nodiscard]] virtual FileResult<FileStatus> status() = 0;
+
+  /// Where on the volume the content begins, in bytes; nothing when that cannot be told.
+  [[nodiscard]] virtual std::optional<std::uint64_t> place() = 0;
 };
 
 /// How the reader of a file is going to read.
-enum class ReadingPlan { beginningOnly, everything };
+enum class ReadingPlan { parts, everything };
 
-/// What the scan asks of the file system. Any thread. Paths are absolute runs of bytes, of any
-/// length. No call follows a symbolic link in any part of a path.
+/// A regular file or a folder in a folder, or what could not be looked at.
+struct FolderEntry {
+  enum class Kind { file, folder, failure };
+
+  Kind kind;
+  const char* name;         ///< Valid during the call.
+  std::uint64_t inode;      ///< Of a folder; below a mount, that of the folder under it.
+  FileStatus status{};      ///< Of a file.
+  std::error_code error{};  ///< Of a failure.
+};
+
+/// A folder that is open. Whatever happens to its path meanwhile, it remains the same folder. One
+/// thread at a time; closed when destroyed.
+class OpenFolder {
+ public:
+  virtual ~OpenFolder() = default;
+
+  [[nodiscard]] virtual FileIdentity identity() const = 0;
+
+  /// Calls `visit` for the next few entries; each call goes on where the last one ended. Symbolic
+  /// links, devices, sockets and pipes are left out. False when there are no more.
+  [[nodiscard]] virtual FileResult<bool> list(
+      const std::function<void(const FolderEntry&)>& visit) = 0;
+
+  /// Opens a file in the folder, and never waits for the other end of a pipe that took the file's
+  /// place. The status tells whether it is still a file, and which one.
+  [[nodiscard]] virtual FileResult<std::unique_ptr<OpenFile>> open(const char* name,
+                                                                   ReadingPlan plan) = 0;
+};
+
+/// What the scan asks of the file system. Any thread. Names are runs of bytes, paths of any length.
+/// No call follows a symbolic link in any part of a path.
 class FileSystem {
  public:
   virtual ~FileSystem() = default;
 
-  /// Lists a folder, as far as it can be read.
-  [[nodiscard]] virtual FileResult<FolderListing> list(const std::string& folder) = 0;
-
-  /// Opens a file, and never waits for the other end of a pipe that took the file's place. The
-  /// status tells whether it is still a file, and which one.
-  [[nodiscard]] virtual FileResult<std::unique_ptr<OpenFile>> open(const std::string& path,
-                                                                   ReadingPlan plan) = 0;
+  /// Opens a folder by an absolute path or, with `base`, by the names that lead down from there.
+  [[nodiscard]] virtual FileResult<std::unique_ptr<OpenFolder>> openFolder(
+      OpenFolder* base, const std::string& path) = 0;
 };
 
 /// The file system of the machine. It lives as long as the process.

@@ -2,160 +2,153 @@
 #include <Scan/FileTree.h>
 
 #include <algorithm>
-#include <condition_variable>
-#include <iterator>
-#include <mutex>
-#include <set>
-#include <string_view>
-#include <utility>
-
-#include <Scan/ScanObserver.h>
-#include <Scan/ThreadTeam.h>
+#include <limits>
+#include <stdexcept>
 
 namespace Orvane {
 namespace {
 
-/// The path of the entry with this name in the folder. Works without recursion, however deep the
-/// folder lies.
-std::string pathBelow(const Folder* folder, std::string_view name) {
-  std::size_t size = name.size();
-  for (const Folder* each = folder; each != nullptr; each = each->parent)
-    size += each->name.size() + 1;
-  std::string path(size, '/');
-  auto begin = std::copy_backward(name.begin(), name.end(), path.end());
-  for (; folder != nullptr; folder = folder->parent)
-    begin = std::copy_backward(folder->name.begin(), folder->name.end(), begin - 1);
-  return path;
+std::uint32_t sumOf(std::int64_t moment) {
+  return static_cast<std::uint32_t>(static_cast<std::uint64_t>(moment) * 0x9E37'79B9'7F4A'7C15 >>
+                                    32);
 }
 
-/// Whether the folder is `folder` or one of those above it, up to the root of the walk.
-bool isOnTheWay(const FileIdentity& identity, const Folder* folder) {
-  for (; folder != nullptr; folder = folder->parent)
-    if (folder->identity == identity) return true;
-  return false;
+template <typename Block>
+Block& takeFrom(std::vector<Block*>& free, std::vector<std::unique_ptr<Block>>& all,
+                std::size_t max) {
+  if (!free.empty()) {
+    Block& block = *free.back();
+    free.pop_back();
+    return block;
+  }
+  if (all.size() == max) throw std::length_error("more files than a scan can number");
+  // Its content stays unwritten, and takes no memory, until it is used.
+  all.emplace_back(new Block);
+  return *all.back();
 }
-
-/// The walk in progress. The stack of folders still to be listed, and with it the end of the walk,
-/// is guarded by the mutex; so is the tree, which takes in one folder's files at a time.
-class Walk final {
- public:
-  Walk(const std::vector<std::string>& folders, FileSystem& fileSystem, ScanControl& control)
-      : fileSystem_(fileSystem), control_(control), given_(folders.begin(), folders.end()) {}
-
-  /// Lists the given folders first, so that a scan of a missing folder ends before it begins.
-  [[nodiscard]] bool start() {
-    for (const std::string& path : given_) {
-      ++running_;
-      finish(visit({nullptr, path == "/" ? "" : path}));
-    }
-    return tree_.lostRoots.empty();
-  }
-
-  void work() {
-    try {
-      Folder folder;
-      while (take(folder)) finish(visit(std::move(folder)));
-    } catch (...) {
-      stop();
-      throw;
-    }
-  }
-
-  FileTree takeTree() {
-    const auto byPath = [](const LostPath& a, const LostPath& b) { return a.path < b.path; };
-    std::sort(tree_.unreadableFiles.begin(), tree_.unreadableFiles.end(), byPath);
-    std::sort(tree_.unreadableFolders.begin(), tree_.unreadableFolders.end(), byPath);
-    return std::move(tree_);
-  }
-
- private:
-  bool take(Folder& folder) {
-    std::unique_lock lock(mutex_);
-    changed_.wait(lock, [&] { return isStopped_ || !pending_.empty() || running_ == 0; });
-    if (isStopped_ || pending_.empty()) return false;
-    folder = std::move(pending_.back());
-    pending_.pop_back();
-    ++running_;
-    return true;
-  }
-
-  /// Lists the folder, files its content and returns the folders in it.
-  std::vector<Folder> visit(Folder folder) {
-    const std::string path = folder.path();
-    // A given folder that lies in another one is walked by itself.
-    if (folder.parent != nullptr && given_.contains(path)) return {};
-    FileResult<FolderListing> listing = fileSystem_.list(path);
-    const std::lock_guard lock(mutex_);
-    if (!listing) {
-      (folder.parent != nullptr ? tree_.unreadableFolders : tree_.lostRoots)
-          .push_back({path, Loss::because(listing.error())});
-      return {};
-    }
-    if (isOnTheWay(listing->identity, folder.parent)) return {};
-    folder.identity = listing->identity;
-    const Folder& kept = tree_.folders.emplace_back(std::move(folder));
-    if (listing->interruption)
-      tree_.unreadableFolders.push_back({path, {Loss::Kind::incomplete, listing->interruption}});
-    for (FolderListing::File& file : listing->files)
-      tree_.files.push_back({&kept, std::move(file.name), file.status});
-    for (const FolderListing::Failure& failure : listing->failures)
-      tree_.unreadableFiles.push_back(
-          {pathBelow(&kept, failure.name), Loss::because(failure.error)});
-    control_.filesFound.store(tree_.files.size(), std::memory_order_relaxed);
-
-    std::vector<Folder> folders;
-    for (std::string& name : listing->folders) folders.push_back({&kept, std::move(name)});
-    return folders;
-  }
-
-  void finish(std::vector<Folder> folders) {
-    {
-      const std::lock_guard lock(mutex_);
-      std::move(folders.begin(), folders.end(), std::back_inserter(pending_));
-      --running_;
-      if (control_.isCancelled) isStopped_ = true;
-    }
-    changed_.notify_all();
-  }
-
-  void stop() {
-    {
-      const std::lock_guard lock(mutex_);
-      isStopped_ = true;
-    }
-    changed_.notify_all();
-  }
-
-  FileSystem& fileSystem_;
-  ScanControl& control_;
-  std::mutex mutex_;
-  std::condition_variable changed_;
-  const std::set<std::string> given_;
-  std::vector<Folder> pending_;
-  std::size_t running_ = 0;
-  bool isStopped_ = false;
-  FileTree tree_;
-};
 
 }  // namespace
 
-std::string Folder::path() const {
-  return parent == nullptr && name.empty() ? "/" : pathBelow(parent, name);
+FileTree::FileTree() = default;
+FileTree::~FileTree() = default;
+
+Folder& FileTree::addGiven(const std::string& path) {
+  const std::lock_guard lock(mutex_);
+  const std::string& kept = givenPaths_.emplace_back(path == "/" ? "" : path);
+  return folders_.emplace_back(
+      Folder{nullptr, kept.c_str(), {}, static_cast<std::uint32_t>(folders_.size())});
 }
 
-std::string FileRecord::path() const {
-  return pathBelow(folder, name);
+Folder& FileTree::addFolder(const Folder& parent, const char* name, FileIdentity identity) {
+  const std::lock_guard lock(mutex_);
+  return folders_.emplace_back(
+      Folder{&parent, name, identity, static_cast<std::uint32_t>(folders_.size())});
 }
 
-bool pathPrecedes(const FileRecord& first, const FileRecord& second) {
-  return first.folder == second.folder ? first.name < second.name : first.path() < second.path();
+std::uint32_t FileTree::deviceNumber(std::uint64_t identifier, const ScanDisk& disk) {
+  const std::lock_guard lock(mutex_);
+  const auto known = std::find_if(devices_.begin(), devices_.end(), [&](const Device& device) {
+    return device.identifier == identifier;
+  });
+  if (known == devices_.end()) {
+    devices_.push_back({identifier, &disk});
+    return static_cast<std::uint32_t>(devices_.size() - 1);
+  }
+  return static_cast<std::uint32_t>(known - devices_.begin());
 }
 
-FileTree walkFolders(const std::vector<std::string>& folders, FileSystem& fileSystem,
-                     unsigned threads, ScanControl& control) {
-  Walk walk(folders, fileSystem, control);
-  if (walk.start()) runOnThreads(threads, [&](unsigned) { walk.work(); });
-  return walk.takeTree();
+const char* FileTree::nameOf(FileNumber number) const {
+  const std::uint32_t place = file(number).name;
+  return names_[place / bytesPerBlock]->bytes.data() + place % bytesPerBlock;
+}
+
+std::string FileTree::pathOf(FileNumber number) const {
+  return pathBelow(folderOf(number), nameOf(number));
+}
+
+FileIdentity FileTree::identityOf(FileNumber number) const {
+  const FileRecord& record = file(number);
+  return {.device = devices_[record.device].identifier, .inode = record.inode};
+}
+
+std::array<std::uint64_t, 2> FileTree::locationOf(FileNumber number) const {
+  const FileRecord& record = file(number);
+  std::uint64_t disk = 0;  // The number of its first device.
+  while (devices_[disk].disk != devices_[record.device].disk) ++disk;
+  return {disk << 32 | record.device, record.inode};
+}
+
+bool FileTree::isUnchanged(FileNumber number, const FileStatus& status) const {
+  const FileRecord& record = file(number);
+  return status.size == record.size && status.identity == identityOf(number) &&
+         sumOf(status.modifiedAt) == record.modifiedAt;
+}
+
+std::size_t FileTree::fileCount() const {
+  std::size_t count = 0;
+  for (const auto& block : blocks_) count += block->count;
+  return count;
+}
+
+FileTree::Block& FileTree::takeBlock() {
+  const std::lock_guard lock(mutex_);
+  return takeFrom(freeBlocks_, blocks_, std::numeric_limits<FileNumber>::max() / filesPerBlock);
+}
+
+FileTree::NameBlock& FileTree::takeNameBlock() {
+  const std::lock_guard lock(mutex_);
+  const std::size_t before = names_.size();
+  NameBlock& block =
+      takeFrom(freeNames_, names_, std::numeric_limits<std::uint32_t>::max() / bytesPerBlock);
+  if (names_.size() > before) block.number = static_cast<std::uint32_t>(before);
+  return block;
+}
+
+FileTree::Writer::~Writer() {
+  const std::lock_guard lock(tree_.mutex_);
+  if (files_ && files_->count < filesPerBlock) tree_.freeBlocks_.push_back(files_);
+  if (names_) tree_.freeNames_.push_back(names_);
+}
+
+const char* FileTree::Writer::add(std::string_view name) {
+  // A block that another writer left may be too full as well.
+  while (!names_ || bytesPerBlock - names_->used <= name.size()) names_ = &tree_.takeNameBlock();
+  char* const begin = names_->bytes.data() + names_->used;
+  *std::copy(name.begin(), name.end(), begin) = '\0';
+  names_->used += name.size() + 1;
+  return begin;
+}
+
+void FileTree::Writer::add(const Folder& folder, const char* name, const FileStatus& status,
+                           std::uint32_t device) {
+  const char* const kept = add(name);
+  if (!files_ || files_->count == filesPerBlock) files_ = &tree_.takeBlock();
+  const auto place =
+      names_->number * bytesPerBlock + static_cast<std::size_t>(kept - names_->bytes.data());
+  files_->files[files_->count++] = {.size = status.size,
+                                    .inode = status.identity.inode,
+                                    .name = static_cast<std::uint32_t>(place),
+                                    .folder = folder.number,
+                                    .device = device,
+                                    .modifiedAt = sumOf(status.modifiedAt)};
+}
+
+std::string pathBelow(const Folder& folder, std::string_view name) {
+  std::size_t size = name.size();
+  for (const Folder* each = &folder; each != nullptr; each = each->parent)
+    size += std::string_view(each->name).size() + 1;
+  std::string path(size, '/');
+  auto begin = std::copy_backward(name.begin(), name.end(), path.end());
+  for (const Folder* each = &folder; each != nullptr; each = each->parent) {
+    const std::string_view above = each->name;
+    begin = std::copy_backward(above.begin(), above.end(), begin - 1);
+  }
+  return path;
+}
+
+std::string pathOf(const Folder& folder) {
+  if (folder.parent) return pathBelow(*folder.parent, folder.name);
+  return folder.name[0] == '\0' ? "/" : folder.name;
 }
 
 }  // namespace Orvane

@@ -1,16 +1,21 @@
 // SPDX-License-Identifier: MIT
 #include <dirent.h>
 #include <fcntl.h>
+#include <linux/fiemap.h>
+#include <linux/fs.h>
 #include <linux/openat2.h>
+#include <sys/ioctl.h>
 #include <sys/stat.h>
 #include <sys/syscall.h>
 #include <unistd.h>
 
 #include <algorithm>
+#include <array>
 #include <cerrno>
 #include <climits>
-#include <string_view>
+#include <cstring>
 #include <utility>
+#include <vector>
 
 #include <Scan/FileSystem.h>
 
@@ -24,7 +29,7 @@ std::error_code lastError() {
 class Descriptor final {
  public:
   explicit Descriptor(int number) : number_(number) {}
-  Descriptor(Descriptor&& other) noexcept : number_(other.release()) {}
+  Descriptor(Descriptor&& other) noexcept : number_(std::exchange(other.number_, -1)) {}
   Descriptor& operator=(Descriptor&& other) noexcept {
     std::swap(number_, other.number_);
     return *this;
@@ -34,7 +39,6 @@ class Descriptor final {
   }
 
   [[nodiscard]] int get() const { return number_; }
-  [[nodiscard]] int release() { return std::exchange(number_, -1); }
 
  private:
   int number_;
@@ -58,14 +62,15 @@ int openStep(int folder, const std::string& path, int flags, Stride stride) {
   return static_cast<int>(::syscall(SYS_openat2, folder, path.c_str(), &how, sizeof how));
 }
 
-/// Opens an absolute path of any length and follows no symbolic link in any part of it, so that a
-/// folder that was swapped for one leads nowhere. Goes down by descriptors and holds two at most.
-Descriptor openWithoutLinks(std::string_view path, int flags) {
-  Descriptor reached(AT_FDCWD);
+/// Opens a path of any length, absolute or below the folder `base`, and follows no symbolic link in
+/// any part of it, so that a folder that was swapped for one leads nowhere. Goes down by
+/// descriptors and holds two at most.
+Descriptor openWithoutLinks(int base, std::string_view path, int flags) {
+  Descriptor reached(-1);
   for (Stride stride = Stride::longest;;) {
     const std::size_t end = endOfStep(path, stride);
     const bool isLast = end == path.size();
-    Descriptor next(openStep(reached.get(), std::string(path.substr(0, end)),
+    Descriptor next(openStep(base, std::string(path.substr(0, end)),
                              (isLast ? flags : O_PATH | O_DIRECTORY) | O_CLOEXEC, stride));
     // Kernels before 5.6 do not have the call for more than one name, some sandboxes forbid it.
     if (next.get() < 0 && stride == Stride::longest && (errno == ENOSYS || errno == EPERM)) {
@@ -74,13 +79,10 @@ Descriptor openWithoutLinks(std::string_view path, int flags) {
     }
     if (next.get() < 0 || isLast) return next;
     reached = std::move(next);
+    base = reached.get();
     path.remove_prefix(end + 1);
   }
 }
-
-struct CloseFolder {
-  void operator()(DIR* folder) const { ::closedir(folder); }
-};
 
 FileStatus statusFrom(const struct stat& facts) {
   return {.identity = {.device = facts.st_dev, .inode = facts.st_ino},
@@ -92,14 +94,12 @@ class DescriptorFile final : public OpenFile {
  public:
   explicit DescriptorFile(Descriptor descriptor) : descriptor_(std::move(descriptor)) {}
 
-  FileResult<std::size_t> read(std::span<std::byte> buffer) override {
+  FileResult<std::size_t> read(std::uint64_t offset, std::span<std::byte> buffer) override {
     for (;;) {
       // Unlike a plain read it takes nothing from a pipe that stands where the file was.
-      const ssize_t count = ::pread(descriptor_.get(), buffer.data(), buffer.size(), offset_);
-      if (count >= 0) {
-        offset_ += count;
-        return static_cast<std::size_t>(count);
-      }
+      const ssize_t count =
+          ::pread(descriptor_.get(), buffer.data(), buffer.size(), static_cast<off_t>(offset));
+      if (count >= 0) return static_cast<std::size_t>(count);
       if (errno != EINTR) return lastError();
     }
   }
@@ -110,62 +110,97 @@ class DescriptorFile final : public OpenFile {
     return statusFrom(facts);
   }
 
+  std::optional<std::uint64_t> place() override {
+    // Room for the head of the answer and the one extent that is asked for.
+    alignas(fiemap) std::array<std::byte, sizeof(fiemap) + sizeof(fiemap_extent)> answer{};
+    auto* const map = reinterpret_cast<fiemap*>(answer.data());
+    map->fm_length = FIEMAP_MAX_OFFSET;
+    map->fm_extent_count = 1;
+    if (::ioctl(descriptor_.get(), FS_IOC_FIEMAP, map) != 0 || map->fm_mapped_extents == 0)
+      return std::nullopt;
+    fiemap_extent extent;
+    std::memcpy(&extent, answer.data() + sizeof(fiemap), sizeof extent);
+    if (extent.fe_flags & (FIEMAP_EXTENT_UNKNOWN | FIEMAP_EXTENT_DELALLOC)) return std::nullopt;
+    return extent.fe_physical;
+  }
+
  private:
   Descriptor descriptor_;
-  off_t offset_ = 0;
 };
 
-/// Adds the entry to the listing. The kind that comes with the name saves asking for the status of
-/// anything but regular files.
-void addEntry(FolderListing& listing, int folder, const dirent& entry) {
-  const std::string_view name = entry.d_name;
-  if (name == "." || name == "..") return;
-  if (entry.d_type == DT_DIR) {
-    listing.folders.emplace_back(name);
-    return;
+class DescriptorFolder final : public OpenFolder {
+ public:
+  DescriptorFolder(Descriptor descriptor, FileIdentity identity)
+      : descriptor_(std::move(descriptor)), identity_(identity) {}
+
+  [[nodiscard]] int number() const { return descriptor_.get(); }
+  [[nodiscard]] FileIdentity identity() const override { return identity_; }
+
+  FileResult<bool> list(const std::function<void(const FolderEntry&)>& visit) override {
+    alignas(dirent64) std::array<char, 64 * 1024> buffer;
+    const ssize_t size = ::getdents64(number(), buffer.data(), buffer.size());
+    if (size < 0) return lastError();
+    std::vector<const dirent64*> entries;
+    for (ssize_t at = 0; at < size;) {
+      const auto* const entry = reinterpret_cast<const dirent64*>(buffer.data() + at);
+      at += entry->d_reclen;
+      const std::string_view name = entry->d_name;
+      if (name != "." && name != ".." && mayTakePart(entry->d_type)) entries.push_back(entry);
+    }
+    // As their facts lie on most disks.
+    std::sort(entries.begin(), entries.end(),
+              [](const dirent64* a, const dirent64* b) { return a->d_ino < b->d_ino; });
+    for (const dirent64* entry : entries) visitEntry(*entry, visit);
+    return size > 0;
   }
-  if (entry.d_type != DT_REG && entry.d_type != DT_UNKNOWN) return;
-  struct stat facts;
-  if (::fstatat(folder, entry.d_name, &facts, AT_SYMLINK_NOFOLLOW) != 0) {
-    listing.failures.push_back({std::string(name), lastError()});
-  } else if (S_ISDIR(facts.st_mode)) {
-    listing.folders.emplace_back(name);
-  } else if (S_ISREG(facts.st_mode)) {
-    listing.files.push_back({std::string(name), statusFrom(facts)});
+
+  FileResult<std::unique_ptr<OpenFile>> open(const char* name, ReadingPlan plan) override {
+    Descriptor descriptor(
+        ::openat(number(), name, O_RDONLY | O_NONBLOCK | O_NOCTTY | O_NOFOLLOW | O_CLOEXEC));
+    if (descriptor.get() < 0) return lastError();
+    // Without read-ahead, a cold disk reads only the parts.
+    if (plan == ReadingPlan::parts) ::posix_fadvise(descriptor.get(), 0, 0, POSIX_FADV_RANDOM);
+    std::unique_ptr<OpenFile> file = std::make_unique<DescriptorFile>(std::move(descriptor));
+    return file;
   }
-}
+
+ private:
+  static bool mayTakePart(unsigned char type) {
+    return type == DT_REG || type == DT_DIR || type == DT_UNKNOWN;
+  }
+
+  /// The kind that comes with the name saves asking for the status of folders.
+  void visitEntry(const dirent64& entry,
+                  const std::function<void(const FolderEntry&)>& visit) const {
+    using Kind = FolderEntry::Kind;
+    const char* const name = entry.d_name;
+    struct stat facts;
+    if (entry.d_type == DT_DIR) {
+      visit({.kind = Kind::folder, .name = name, .inode = entry.d_ino});
+    } else if (::fstatat(number(), name, &facts, AT_SYMLINK_NOFOLLOW) != 0) {
+      visit({.kind = Kind::failure, .name = name, .inode = 0, .error = lastError()});
+    } else if (S_ISDIR(facts.st_mode)) {
+      visit({.kind = Kind::folder, .name = name, .inode = facts.st_ino});
+    } else if (S_ISREG(facts.st_mode)) {
+      visit({.kind = Kind::file, .name = name, .inode = 0, .status = statusFrom(facts)});
+    }
+  }
+
+  Descriptor descriptor_;
+  FileIdentity identity_;
+};
 
 class POSIXFileSystem final : public FileSystem {
  public:
-  FileResult<FolderListing> list(const std::string& folder) override {
-    Descriptor descriptor = openWithoutLinks(folder, O_RDONLY | O_DIRECTORY);
-    if (descriptor.get() < 0) return lastError();
+  FileResult<std::unique_ptr<OpenFolder>> openFolder(OpenFolder* base,
+                                                     const std::string& path) override {
+    const int start = base ? static_cast<DescriptorFolder*>(base)->number() : AT_FDCWD;
+    Descriptor descriptor = openWithoutLinks(start, path, O_RDONLY | O_DIRECTORY);
     struct stat facts;
-    if (::fstat(descriptor.get(), &facts) != 0) return lastError();
-    const std::unique_ptr<DIR, CloseFolder> stream(::fdopendir(descriptor.get()));
-    if (!stream) return lastError();
-    const int number = descriptor.release();
-
-    FolderListing listing;
-    listing.identity = statusFrom(facts).identity;
-    for (;;) {
-      errno = 0;
-      const dirent* entry = ::readdir(stream.get());
-      if (entry == nullptr) break;
-      addEntry(listing, number, *entry);
-    }
-    if (errno != 0) listing.interruption = lastError();
-    return listing;
-  }
-
-  FileResult<std::unique_ptr<OpenFile>> open(const std::string& path, ReadingPlan plan) override {
-    Descriptor descriptor = openWithoutLinks(path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
-    if (descriptor.get() < 0) return lastError();
-    // Without read-ahead, a cold disk reads only the beginning.
-    if (plan == ReadingPlan::beginningOnly)
-      ::posix_fadvise(descriptor.get(), 0, 0, POSIX_FADV_RANDOM);
-    std::unique_ptr<OpenFile> file = std::make_unique<DescriptorFile>(std::move(descriptor));
-    return file;
+    if (descriptor.get() < 0 || ::fstat(descriptor.get(), &facts) != 0) return lastError();
+    std::unique_ptr<OpenFolder> folder =
+        std::make_unique<DescriptorFolder>(std::move(descriptor), statusFrom(facts).identity);
+    return folder;
   }
 };
 

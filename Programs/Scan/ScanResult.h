@@ -2,22 +2,23 @@
 #pragma once
 
 #include <cstdint>
+#include <memory>
 #include <string>
 #include <vector>
 
+#include <Scan/FileTree.h>
 #include <Scan/Loss.h>
 
 namespace Orvane {
 
-/// Files of the same content, at least two, by one path each.
+/// Files of the same content, at least two.
 struct DuplicateGroup {
-  std::uint64_t size = 0;          ///< Of each file, in bytes; never 0.
-  std::vector<std::string> paths;  ///< Absolute, in the order of their bytes.
+  std::uint64_t size = 0;   ///< Of each file, in bytes; never 0.
+  std::uint32_t begin = 0;  ///< Among the result's files.
+  std::uint32_t count = 0;
 
   /// The bytes that all files but one take up.
-  [[nodiscard]] std::uint64_t wastedBytes() const { return size * (paths.size() - 1); }
-
-  bool operator==(const DuplicateGroup&) const = default;
+  [[nodiscard]] std::uint64_t wastedBytes() const { return size * (count - 1); }
 };
 
 /// The figures of a scan. Every regular file is counted in `files`; the members below it count
@@ -39,11 +40,22 @@ struct ScanTotals {
 };
 
 /// The groups, most wasted bytes first and then by their first path, and the totals. When a folder
-/// to scan could not be read there are neither: nothing was scanned.
+/// to scan could not be read there are neither: nothing was scanned. Millions of paths take much
+/// memory, so the result holds the files' numbers and makes the paths when they are asked for.
 struct ScanResult {
   std::vector<LostPath> lostFolders{};  ///< Of those to scan.
   std::vector<DuplicateGroup> groups{};
   ScanTotals totals{};
+  std::vector<FileNumber> files{};  ///< Of all groups.
+  std::shared_ptr<const FileTree> tree{};
+
+  /// One path of each of the group's files, absolute, in the order of their bytes.
+  [[nodiscard]] std::vector<std::string> pathsOf(const DuplicateGroup& group) const {
+    std::vector<std::string> paths;
+    for (std::uint32_t i = 0; i < group.count; ++i)
+      paths.push_back(tree->pathOf(files[group.begin + i]));
+    return paths;
+  }
 };
 
 }  // namespace Orvane

@@ -56,7 +56,8 @@ QualityOfService qualityNamed(const std::string& name) {
 
 void addScan(CLI::App& app, Invocation& invocation) {
   auto [options, command] = addCommand<ScanCommand>(
-      app, invocation, "scan", "Find the files of equal content in folders and below them");
+      app, invocation, "scan",
+      "Find the files of equal content, as 128-bit digests tell it, in folders and below them");
   options->add_option("FOLDER", command->folders, "The folders")
       ->type_name("")
       ->required()

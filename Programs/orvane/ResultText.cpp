@@ -3,6 +3,8 @@
 
 #include <algorithm>
 #include <nlohmann/json.hpp>
+#include <string>
+#include <utility>
 
 #include <Scan/ScanResult.h>
 #include <Varnel/Paths/QNURLResolver.h>
@@ -43,37 +45,62 @@ std::string summary(const ScanTotals& totals, std::size_t groups, const std::str
   return text + "\n";
 }
 
-nlohmann::ordered_json jsonOf(const DuplicateGroup& group) {
-  nlohmann::ordered_json json = {{"size", group.size}, {"paths", group.paths}};
-  if (!std::all_of(group.paths.begin(), group.paths.end(), Varnel::Platform::isValidUTF8)) {
+nlohmann::ordered_json jsonOf(const DuplicateGroup& group, const std::vector<std::string>& paths) {
+  nlohmann::ordered_json json = {{"size", group.size}, {"paths", paths}};
+  if (!std::all_of(paths.begin(), paths.end(), Varnel::Platform::isValidUTF8)) {
     nlohmann::ordered_json& urls = json["urls"] = nlohmann::ordered_json::array();
-    for (const std::string& path : group.paths)
+    for (const std::string& path : paths)
       urls.push_back(URL::fileURLWithPath(path).absoluteString());
   }
   return json;
 }
 
+/// Collects text and hands it on in parts.
+class Parts final {
+ public:
+  explicit Parts(const TextWriter& write) : write_(write) {}
+
+  /// False once the writer has failed.
+  [[nodiscard]] bool add(std::string_view text) {
+    part_ += text;
+    return part_.size() < maxPart || flush();
+  }
+
+  [[nodiscard]] bool flush() {
+    const bool isWritten = write_(part_);
+    part_.clear();
+    return isWritten;
+  }
+
+ private:
+  static constexpr std::size_t maxPart = 64 * 1024;
+
+  const TextWriter& write_;
+  std::string part_;
+};
+
 }  // namespace
 
-std::string textOf(const ScanResult& result, const ByteCountFormatter& byteCounts,
-                   const Varnel::QNURLResolver& paths) {
+bool writeText(const ScanResult& result, const ByteCountFormatter& byteCounts,
+               const Varnel::QNURLResolver& paths, const TextWriter& write) {
   const auto size = [&](std::uint64_t bytes) {
     return byteCounts.string(static_cast<std::int64_t>(bytes), ByteCountStyle::file);
   };
-  std::string text;
+  Parts parts(write);
   for (const DuplicateGroup& group : result.groups) {
-    text += std::to_string(group.paths.size()) + " files of " + size(group.size) + ", " +
-            size(group.wastedBytes()) + " wasted\n";
-    for (const std::string& path : group.paths)
+    std::string text = std::to_string(group.count) + " files of " + size(group.size) + ", " +
+                       size(group.wastedBytes()) + " wasted\n";
+    for (const std::string& path : result.pathsOf(group))
       text += "  " + visibleText(paths.abbreviatedPath(path)) + "\n";
-    text += "\n";
+    if (!parts.add(text + "\n")) return false;
   }
-  return text + summary(result.totals, result.groups.size(), size(result.totals.wastedBytes));
+  return parts.add(summary(result.totals, result.groups.size(), size(result.totals.wastedBytes))) &&
+         parts.flush();
 }
 
-std::string jsonOf(const ScanResult& result) {
+bool writeJSON(const ScanResult& result, const TextWriter& write) {
   const ScanTotals& totals = result.totals;
-  nlohmann::ordered_json json = {
+  std::string head = jsonLine({
       {"folders", totals.folders},
       {"files", totals.files},
       {"bytes", totals.bytes},
@@ -86,9 +113,17 @@ std::string jsonOf(const ScanResult& result) {
       {"duplicateFiles", totals.duplicateFiles},
       {"wastedBytes", totals.wastedBytes},
       {"groups", nlohmann::ordered_json::array()},
-  };
-  for (const DuplicateGroup& group : result.groups) json["groups"].push_back(jsonOf(group));
-  return jsonLine(json);
+  });
+  const std::string_view tail = "]}\n";
+  head.resize(head.size() - tail.size());
+  Parts parts(write);
+  if (!parts.add(head)) return false;
+  for (bool isFirst = true; const DuplicateGroup& group : result.groups) {
+    std::string text = jsonLine(jsonOf(group, result.pathsOf(group)));
+    text.pop_back();  // The end of the line.
+    if (!parts.add((std::exchange(isFirst, false) ? "" : ",") + text)) return false;
+  }
+  return parts.add(tail) && parts.flush();
 }
 
 }  // namespace Orvane

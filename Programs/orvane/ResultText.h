@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <string>
+#include <functional>
+#include <string_view>
 
 namespace Varnel {
 class QNURLResolver;
@@ -15,16 +16,22 @@ namespace Orvane {
 
 struct ScanResult;
 
+/// Takes the next part of a text, of some 64 kB; false when it could not be written.
+using TextWriter = std::function<bool(std::string_view)>;
+
+// A result may name millions of files, so its text is never whole in memory. Both functions return
+// whether all of it could be written, and end at the first part that could not.
+
 /// The result for people: each group's files, one path a line, abbreviated and as `visibleText`
 /// shows it, and a summary.
-[[nodiscard]] std::string textOf(const ScanResult& result,
-                                 const Varnel::Platform::ByteCountFormatter& byteCounts,
-                                 const Varnel::QNURLResolver& paths);
+[[nodiscard]] bool writeText(const ScanResult& result,
+                             const Varnel::Platform::ByteCountFormatter& byteCounts,
+                             const Varnel::QNURLResolver& paths, const TextWriter& write);
 
 /// The result for programs: one JSON object on one line. Each of its "groups" has the "size" of a
 /// file in bytes and the "paths"; the totals stand beside them. Where a path is not UTF-8, which
 /// JSON texts must be, its wrong bytes show as U+FFFD, and the group also has "urls": the file URLs
 /// of all its paths, in which no byte is lost.
-[[nodiscard]] std::string jsonOf(const ScanResult& result);
+[[nodiscard]] bool writeJSON(const ScanResult& result, const TextWriter& write);
 
 }  // namespace Orvane

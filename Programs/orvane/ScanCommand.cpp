@@ -10,7 +10,7 @@
 #include <Scan/FileSystem.h>
 #include <Scan/ScanObserver.h>
 #include <Varnel/Context/Globals.h>
-#include <Varnel/DiskAccess/DiskAccessManager.h>
+#include <Varnel/DiskAccess/DiskReadingQueue.h>
 #include <Varnel/Logging/Logger.h>
 #include <Varnel/Logging/LoggingObject.h>
 #include <Varnel/Paths/QNURLResolver.h>
@@ -19,7 +19,7 @@
 #include <Varnel/Platform/Text/ByteCountFormatter.h>
 #include <orvane/Console.h>
 #include <orvane/Interruption.h>
-#include <orvane/ManagedContentAccess.h>
+#include <orvane/ManagedDiskTurns.h>
 #include <orvane/ProgressLine.h>
 #include <orvane/ResultText.h>
 #include <orvane/ScanAnalytics.h>
@@ -87,7 +87,7 @@ std::optional<std::vector<std::string>> resolved(const std::vector<std::string>&
   return paths;
 }
 
-unsigned readerThreads() {
+unsigned maxReaders() {
   const unsigned cores = std::thread::hardware_concurrency();
   return std::max(2u, Globals::canUseAllCores() ? cores : cores / 2);
 }
@@ -104,10 +104,10 @@ int ScanCommand::run(Console& console) const {
   for (const std::string& path : *paths) log.log("Will scan", URL::fileURLWithPath(path + "/"));
 
   const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
-  ManagedContentAccess access(
-      {.manager = Varnel::DiskAccessManager::shared(), .volumes = ports.volumeCatalog}, qos);
-  DuplicateFinder finder({.fileSystem = systemFileSystem(), .access = access, .observer = log},
-                         readerThreads());
+  ManagedDiskTurns turns(
+      {.queue = Varnel::DiskReadingQueue::shared(), .volumes = ports.volumeCatalog}, qos,
+      maxReaders());
+  DuplicateFinder finder({.fileSystem = systemFileSystem(), .turns = turns, .observer = log});
   ScanControl control;
   ScanResult result;
   {
@@ -132,8 +132,10 @@ int ScanCommand::run(Console& console) const {
           std::to_string(result.totals.files) + " files");
   analytics.scanFinished(result.groups.size());
   const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.numberIdentifier());
-  const bool written = console.writeResult(
-      isJSON ? jsonOf(result) : textOf(result, byteCounts, Varnel::QNURLResolver::shared()));
+  const auto write = [&](std::string_view text) { return console.writeResult(text); };
+  const bool written = isJSON
+                           ? writeJSON(result, write)
+                           : writeText(result, byteCounts, Varnel::QNURLResolver::shared(), write);
   // The scan has succeeded even on a machine without sound.
   if (playsSound) playToTheEnd(Varnel::Sound::scanComplete);
   return written ? 0 : 1;

@@ -2,29 +2,54 @@
 #pragma once
 
 #include <atomic>
+#include <condition_variable>
 #include <functional>
 #include <map>
 #include <memory>
+#include <mutex>
 #include <string>
+#include <thread>
 #include <utility>
 #include <vector>
 
-#include <Scan/ContentAccess.h>
+#include <Scan/DiskTurns.h>
 #include <Scan/FileSystem.h>
 #include <Scan/ScanObserver.h>
 
 namespace Orvane::Testing {
 
-/// Lets every reader in, or none, and knows whether the calling thread is inside.
-class OpenAccess final : public ContentAccess {
+/// One disk for everything, whose turns are over after some steps, each task on a thread of its
+/// own. Knows whether the calling thread has a turn. Set up before the scan.
+class FakeTurns final : public DiskTurns {
  public:
-  bool whileAccessing(const std::string&, std::uint64_t,
-                      const std::function<void()>& read) override {
-    if (refuses) return false;
-    if (std::exchange(isInside(), true)) ++faults;
-    read();
-    isInside() = false;
-    return true;
+  ~FakeTurns() override { join(); }
+
+  const ScanDisk& diskOf(const std::string&) override { return disk; }
+
+  void start(const ScanDisk&, std::shared_ptr<DiskTask> task) override {
+    const std::lock_guard lock(mutex_);
+    threads_.emplace_back([this, task = std::move(task)] {
+      if (refuses) return task->refuse();
+      for (bool goesOn = true; goesOn;) {
+        takePlace();
+        Turn turn(stepsPerTurn);
+        goesOn = task->run(turn).has_value();
+        leavePlace();
+      }
+    });
+  }
+
+  /// Waits for the threads of the last scan.
+  void join() {
+    for (;;) {
+      std::vector<std::thread> threads;
+      {
+        const std::lock_guard lock(mutex_);
+        threads.swap(threads_);
+      }
+      if (threads.empty()) return;
+      for (std::thread& thread : threads) thread.join();
+    }
   }
 
   static bool& isInside() {
@@ -32,8 +57,41 @@ class OpenAccess final : public ContentAccess {
     return inside;
   }
 
+  ScanDisk disk{.places = 4, .isOrdered = false};
+  unsigned stepsPerTurn = 1000;
   bool refuses = false;
-  std::atomic<int> faults{0};  ///< Nested accesses.
+
+ private:
+  class Turn final : public DiskTurn {
+   public:
+    explicit Turn(unsigned steps) : steps_(steps) {}
+    bool isOver() override { return --steps_ == 0; }
+    void didRead(std::uint64_t) override {}
+
+   private:
+    unsigned steps_;
+  };
+
+  void takePlace() {
+    std::unique_lock lock(mutex_);
+    left_.wait(lock, [&] { return taken_ < disk.places; });
+    ++taken_;
+    isInside() = true;
+  }
+
+  void leavePlace() {
+    isInside() = false;
+    {
+      const std::lock_guard lock(mutex_);
+      --taken_;
+    }
+    left_.notify_one();
+  }
+
+  std::mutex mutex_;
+  std::condition_variable left_;
+  std::vector<std::thread> threads_;
+  unsigned taken_ = 0;
 };
 
 class LossRecorder final : public ScanObserver {
@@ -49,40 +107,46 @@ class LossRecorder final : public ScanObserver {
   std::vector<std::pair<std::string, Loss::Kind>> folders;
 };
 
-/// The real file system with faults: paths that cannot be listed, not to the end, or opened, files
-/// that fail while they are read, and an action before each of these. Set up before the scan.
-/// Counts content that is touched outside an access.
+/// The real file system with faults: paths that cannot be opened or listed to the end, files that
+/// fail while they are read, few descriptors, and an action before each of these. Set up before the
+/// scan. Counts content that is touched outside a turn, and notes what is read.
 class FaultyFileSystem final : public FileSystem {
  public:
-  FileResult<FolderListing> list(const std::string& folder) override {
-    if (const auto fault = listFaults.find(folder); fault != listFaults.end())
-      return std::make_error_code(fault->second);
-    if (beforeList) beforeList(folder);
-    auto listing = systemFileSystem().list(folder);
-    if (const auto fault = interruptions.find(folder); listing && fault != interruptions.end())
-      listing->interruption = std::make_error_code(fault->second);
-    return listing;
-  }
+  struct Reading {
+    std::string path;
+    std::uint64_t offset;
+    std::size_t length;
+    bool operator==(const Reading&) const = default;
+  };
 
-  FileResult<std::unique_ptr<OpenFile>> open(const std::string& path, ReadingPlan plan) override {
-    if (!OpenAccess::isInside()) ++faults;
-    if (const auto fault = openFaults.find(path); fault != openFaults.end())
+  FileResult<std::unique_ptr<OpenFolder>> openFolder(OpenFolder* base,
+                                                     const std::string& path) override {
+    auto* const above = static_cast<Folder*>(base);
+    const std::string whole = above ? (above->path_ == "/" ? "" : above->path_) + "/" + path : path;
+    if (const auto fault = folderFaults.find(whole); fault != folderFaults.end())
       return std::make_error_code(fault->second);
-    if (beforeOpen) beforeOpen(path);
-    auto opened = systemFileSystem().open(path, plan);
+    if (openFolders >= maxOpenFolders) return std::make_error_code(std::errc::too_many_files_open);
+    if (beforeOpenFolder) beforeOpenFolder(whole);
+    auto opened = systemFileSystem().openFolder(above ? above->folder_.get() : nullptr, path);
     if (!opened) return opened;
-    std::unique_ptr<OpenFile> file = std::make_unique<File>(*this, path, std::move(*opened));
-    return file;
+    std::unique_ptr<OpenFolder> folder = std::make_unique<Folder>(*this, whole, std::move(*opened));
+    return folder;
   }
 
-  std::map<std::string, std::errc> listFaults;
+  std::map<std::string, std::errc> folderFaults;
   std::map<std::string, std::errc> interruptions;  ///< Of listings.
   std::map<std::string, std::errc> openFaults;
   std::map<std::string, std::errc> readFaults;
-  std::function<void(const std::string& path)> beforeList;
+  std::map<std::string, std::uint64_t> places;  ///< Where given, of all files.
+  std::function<void(const std::string& path)> beforeOpenFolder;
   std::function<void(const std::string& path)> beforeOpen;
   std::function<void(const std::string& path)> beforeRead;
+  std::map<std::string, FileIdentity> identities;  ///< Of folders that are mounted again.
+  int maxOpenFolders = 1000;
+  std::atomic<int> placesAsked{0};
+  std::atomic<int> openFolders{0};
   std::atomic<int> faults{0};
+  std::vector<Reading> readings;
 
  private:
   class File final : public OpenFile {
@@ -90,21 +154,74 @@ class FaultyFileSystem final : public FileSystem {
     File(FaultyFileSystem& owner, std::string path, std::unique_ptr<OpenFile> file)
         : owner_(owner), path_(std::move(path)), file_(std::move(file)) {}
 
-    FileResult<std::size_t> read(std::span<std::byte> buffer) override {
-      if (!OpenAccess::isInside()) ++owner_.faults;
+    FileResult<std::size_t> read(std::uint64_t offset, std::span<std::byte> buffer) override {
+      if (!FakeTurns::isInside()) ++owner_.faults;
       if (const auto fault = owner_.readFaults.find(path_); fault != owner_.readFaults.end())
         return std::make_error_code(fault->second);
       if (owner_.beforeRead) owner_.beforeRead(path_);
-      return file_->read(buffer);
+      {
+        const std::lock_guard lock(owner_.mutex_);
+        owner_.readings.push_back({path_, offset, buffer.size()});
+      }
+      return file_->read(offset, buffer);
     }
 
     FileResult<FileStatus> status() override { return file_->status(); }
+
+    std::optional<std::uint64_t> place() override {
+      ++owner_.placesAsked;
+      if (owner_.places.empty()) return file_->place();
+      const auto place = owner_.places.find(path_);
+      return place == owner_.places.end() ? std::nullopt : std::optional(place->second);
+    }
 
    private:
     FaultyFileSystem& owner_;
     std::string path_;
     std::unique_ptr<OpenFile> file_;
   };
+
+  class Folder final : public OpenFolder {
+   public:
+    Folder(FaultyFileSystem& owner, std::string path, std::unique_ptr<OpenFolder> folder)
+        : owner_(owner), path_(std::move(path)), folder_(std::move(folder)) {
+      ++owner_.openFolders;
+    }
+    ~Folder() override { --owner_.openFolders; }
+
+    [[nodiscard]] FileIdentity identity() const override {
+      const auto other = owner_.identities.find(path_);
+      return other == owner_.identities.end() ? folder_->identity() : other->second;
+    }
+
+    FileResult<bool> list(const std::function<void(const FolderEntry&)>& visit) override {
+      const auto fault = owner_.interruptions.find(path_);
+      if (fault != owner_.interruptions.end() && std::exchange(isListed_, true))
+        return std::make_error_code(fault->second);
+      return folder_->list(visit);
+    }
+
+    FileResult<std::unique_ptr<OpenFile>> open(const char* name, ReadingPlan plan) override {
+      const std::string path = path_ + "/" + name;
+      if (!FakeTurns::isInside()) ++owner_.faults;
+      if (const auto fault = owner_.openFaults.find(path); fault != owner_.openFaults.end())
+        return std::make_error_code(fault->second);
+      if (owner_.beforeOpen) owner_.beforeOpen(path);
+      auto opened = folder_->open(name, plan);
+      if (!opened) return opened;
+      std::unique_ptr<OpenFile> file = std::make_unique<File>(owner_, path, std::move(*opened));
+      return file;
+    }
+
+   private:
+    friend FaultyFileSystem;
+    FaultyFileSystem& owner_;
+    std::string path_;
+    std::unique_ptr<OpenFolder> folder_;
+    bool isListed_ = false;
+  };
+
+  std::mutex mutex_;
 };
 
 }  // namespace Orvane::Testing

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <orvane/ManagedContentAccess.h>
+#include <orvane/ManagedDiskTurns.h>
 
 #include <gtest/gtest.h>
 
@@ -8,6 +8,7 @@
 
 #include <Varnel/Basalt/Semaphore.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
+#include <Varnel/DiskAccess/DiskReadingQueue.h>
 #include <Varnel/Platform/Ports/VolumeCatalog.h>
 #include <Varnel/Platform/Testing/FakeDeviceRegistry.h>
 #include <Varnel/Platform/Testing/FakeDiskArbitration.h>
@@ -35,29 +36,50 @@ class HangingCatalog final : public VolumeCatalog {
   std::unique_ptr<Subscription> subscribe(ChangeHandler) override { return nullptr; }
 };
 
-TEST(ManagedContentAccess, AShareThatHangsHoldsUpNoReaderOfOtherDisks) {
+/// A task of some turns that tells when it is done.
+class Turns final : public DiskTask {
+ public:
+  Turns(int count, Basalt::Semaphore& isDone) : left_(count), isDone_(isDone) {}
+
+  std::optional<std::uint64_t> run(DiskTurn& turn) override {
+    while (!turn.isOver()) turn.didRead(1 << 20);
+    if (--left_ > 0) return 0;
+    isDone_.signal();
+    return std::nullopt;
+  }
+  void refuse() override { ADD_FAILURE(); }
+
+ private:
+  int left_;
+  Basalt::Semaphore& isDone_;
+};
+
+TEST(ManagedDiskTurns, AShareThatHangsHoldsUpNoReaderOfOtherDisks) {
   HangingCatalog volumes;
   Varnel::Platform::Testing::FakeDeviceRegistry devices;
   Varnel::Platform::Testing::FakeDiskArbitration disks;
   Varnel::Platform::Testing::FakeSecurityScope scope;
   Basalt::NotificationCenter center;
   Varnel::DiskAccessManager manager({devices, disks, volumes, scope, center});
-  ManagedContentAccess access({manager, volumes}, QualityOfService::utility);
-  Basalt::Semaphore isRead;
-  const auto read = [&](const char* path, std::uint64_t device) {
-    return std::thread([&, path, device] {
-      EXPECT_TRUE(access.whileAccessing(path, device, [&] { isRead.signal(); }));
-    });
+  Varnel::DiskReadingQueue queue(manager);
+  ManagedDiskTurns turns({queue, volumes}, QualityOfService::utility, 2);
+  Basalt::Semaphore isDone;
+  const auto read = [&](const char* path) {
+    return std::thread(
+        [&, path] { turns.start(turns.diskOf(path), std::make_shared<Turns>(3, isDone)); });
   };
-  std::thread onShare = read("/share/file", 1);
+  const auto isDoneInTime = [&] {
+    return isDone.waitUntil(std::chrono::floor<Date::duration>(std::chrono::system_clock::now()) +
+                            std::chrono::seconds(20));
+  };
+  std::thread onShare = read("/share/file");
   volumes.isHanging.wait();
-  std::thread onDisk = read("/home/file", 2);
-  EXPECT_TRUE(
-      isRead.waitUntil(std::chrono::floor<Date::duration>(std::chrono::system_clock::now()) +
-                       std::chrono::seconds(20)));
+  std::thread onDisk = read("/home/file");
+  EXPECT_TRUE(isDoneInTime());
   volumes.goOn.signal();
   onShare.join();
   onDisk.join();
+  EXPECT_TRUE(isDoneInTime());
 }
 
 }  // namespace

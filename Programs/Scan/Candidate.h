@@ -1,0 +1,37 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <array>
+#include <compare>
+#include <cstdint>
+#include <limits>
+
+#include <Scan/FileTree.h>
+
+namespace Orvane {
+
+/// 128 bits that stand for some bytes, under the secret of one scan.
+using Digest = std::array<std::uint64_t, 2>;
+
+/// A file that may have a duplicate. One of the few things there are a million of.
+struct Candidate {
+  static constexpr FileNumber lost = std::numeric_limits<FileNumber>::max();
+
+  FileNumber file;          ///< `lost` once it cannot take part.
+  std::uint32_t group = 0;  ///< Files of different groups are known to differ.
+  /// By turns where the file lies (device and inode, or place), and the digest of what was read.
+  std::array<std::uint64_t, 2> key{};
+};
+
+/// What is read of files, in the order in which files are told apart.
+enum class Look {
+  head,     ///< The beginning.
+  samples,  ///< Some of the middle and the end.
+  everything,
+};
+
+/// How much of a file is looked at first. A disk reads this much in one go anyway, and most files
+/// are not larger.
+constexpr std::uint64_t headLength = 4096;
+
+}  // namespace Orvane

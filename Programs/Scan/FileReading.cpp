@@ -1,0 +1,314 @@
+// SPDX-License-Identifier: MIT
+#include <Scan/FileReading.h>
+
+#include <algorithm>
+#include <atomic>
+#include <map>
+#include <memory>
+#include <span>
+
+#include <Scan/DiskTurns.h>
+#include <Scan/ScanObserver.h>
+#include <Scan/TaskGroup.h>
+
+namespace Orvane {
+namespace {
+
+/// Files from this size on are read one after the other on an ordered disk.
+constexpr std::uint64_t largeLength = 1024 * 1024;
+
+/// A turn that was over after fewer files and bytes than these was spent waiting for the disk.
+constexpr unsigned warmFiles = 8;
+constexpr std::uint64_t warmBytes = 1024 * 1024;
+
+/// After this many files of a volume without a known place, the others are not asked for theirs.
+constexpr unsigned maxUnplaced = 8;
+
+Loss diskIsGone() {
+  return {Loss::Kind::unreadable, std::make_error_code(std::errc::no_such_device)};
+}
+
+}  // namespace
+
+/// One look at the files of one disk. Its stages follow one another as the last task of each ends.
+/// Invariant: the files that have been drawn stand before those that have not.
+class FileReading::DiskPass final {
+ public:
+  DiskPass(FileReading& owner, TaskGroup& group, Look look, const ScanDisk& disk,
+           std::span<Candidate> files)
+      : owner_(owner), group_(group), look_(look), disk_(disk), files_(files) {}
+
+  void start() {
+    if (!disk_.isReadable) {
+      for (Candidate& file : files_) lose(file, diskIsGone());
+    } else if (disk_.isOrdered && owner_.coldDisks_.contains(&disk_)) {
+      place(0);
+    } else {
+      read(0, disk_.isOrdered ? Stage::byInode : Stage::asTheyCome);
+    }
+  }
+
+  [[nodiscard]] bool isCold() const { return stage_ == Stage::byPlace; }
+
+ private:
+  enum class Stage { asTheyCome, byInode, placing, byPlace };
+  class PlacingTask;
+  class ReadingTask;
+
+  /// Finds the places of the files from this one on.
+  void place(std::size_t begin) {
+    stage_ = Stage::placing;
+    begin_ = begin;
+    running_ = 1;
+    startPlacing();
+  }
+
+  /// Reads the files from this one on. A disk that must work has one task: two would make its head
+  /// go back and forth between them. Until that shows, only large files have to come singly.
+  void read(std::size_t begin, Stage stage) {
+    stage_ = stage;
+    begin_ = begin;
+    const auto rest = files_.subspan(begin);
+    nextSmall_ = begin;
+    largeBegin_ = files_.size();
+    if (look_ == Look::everything && stage == Stage::byInode) {
+      const auto large =
+          std::stable_partition(rest.begin(), rest.end(),
+                                [&](const Candidate& file) { return sizeOf(file) < largeLength; });
+      largeBegin_ = begin + static_cast<std::size_t>(large - rest.begin());
+    }
+    nextLarge_ = largeBegin_;
+    isLargeTaken_ = false;
+    isInterrupted_ = false;
+    const std::size_t max = stage == Stage::byPlace ? 1 : disk_.places;
+    running_ = static_cast<unsigned>(std::min(max, rest.size()));
+    startReading(running_);
+  }
+
+  void startPlacing();
+  void startReading(unsigned count);
+
+  /// Called by each task as its last deed.
+  void didEnd() {
+    if (--running_ > 0 || group_.shouldStop()) return;
+    if (stage_ == Stage::placing) {
+      const auto rest = files_.subspan(begin_);
+      std::sort(rest.begin(), rest.end(),
+                [](const Candidate& a, const Candidate& b) { return a.key < b.key; });
+      read(begin_, Stage::byPlace);
+    } else if (isInterrupted_) {
+      const std::size_t drawn = std::min<std::size_t>(nextSmall_, largeBegin_);
+      place(drawn < largeBegin_ ? drawn : std::min<std::size_t>(nextLarge_, files_.size()));
+    }
+  }
+
+  /// The next file for a task, which keeps the right to read large ones.
+  Candidate* draw(bool& mayReadLarge) {
+    if (isInterrupted_.load(std::memory_order_relaxed)) return nullptr;
+    if (nextSmall_.load(std::memory_order_relaxed) < largeBegin_) {
+      const std::size_t index = nextSmall_.fetch_add(1, std::memory_order_relaxed);
+      if (index < largeBegin_) return &files_[index];
+    }
+    if (nextLarge_.load(std::memory_order_relaxed) >= files_.size()) return nullptr;
+    if (!mayReadLarge && isLargeTaken_.exchange(true)) return nullptr;
+    mayReadLarge = true;
+    const std::size_t index = nextLarge_.fetch_add(1, std::memory_order_relaxed);
+    return index < files_.size() ? &files_[index] : nullptr;
+  }
+
+  [[nodiscard]] std::uint64_t sizeOf(const Candidate& file) const {
+    return owner_.ports_.tree.file(file.file).size;
+  }
+
+  /// How much of the file this look reads at this stage.
+  [[nodiscard]] Look lookAt(const Candidate& file) const {
+    const bool isWhole = look_ == Look::head && stage_ == Stage::byPlace &&
+                         sizeOf(file) <= ContentReader::blockLength;
+    return isWhole ? Look::everything : look_;
+  }
+
+  void lose(Candidate& file, const Loss& loss) {
+    const std::lock_guard lock(owner_.mutex_);
+    owner_.losses_.emplace_back(std::exchange(file.file, Candidate::lost), loss);
+  }
+
+  FileReading& owner_;
+  TaskGroup& group_;
+  const Look look_;
+  const ScanDisk& disk_;
+  const std::span<Candidate> files_;
+
+  // What a stage begins with changes while no task runs.
+  Stage stage_ = Stage::asTheyCome;
+  std::size_t begin_ = 0;
+  std::size_t largeBegin_ = 0;
+  std::atomic<std::size_t> nextSmall_ = 0;
+  std::atomic<std::size_t> nextLarge_ = 0;
+  std::atomic<bool> isLargeTaken_ = false;
+  std::atomic<bool> isInterrupted_ = false;  ///< The disk turned out to be cold.
+  std::atomic<unsigned> running_ = 0;
+};
+
+/// Asks where the files lie, and reads none of them.
+class FileReading::DiskPass::PlacingTask final : public TaskGroup::Task {
+ public:
+  explicit PlacingTask(DiskPass& pass)
+      : pass_(pass),
+        reader_(pass.owner_.ports_.tree, pass.owner_.ports_.fileSystem, pass.owner_.secret_),
+        next_(pass.begin_) {}
+
+  std::optional<std::uint64_t> run(DiskTurn& turn) override {
+    while (next_ < pass_.files_.size() && !pass_.group_.shouldStop()) {
+      place(pass_.files_[next_++]);
+      if (turn.isOver()) return 0;
+    }
+    pass_.didEnd();
+    return std::nullopt;
+  }
+
+  void refuse() override { pass_.didEnd(); }
+
+ private:
+  void place(Candidate& file) {
+    file.key = pass_.owner_.ports_.tree.locationOf(file.file);
+    unsigned& unplaced = unplaced_[file.key[0]];
+    if (unplaced == maxUnplaced) return;
+    if (const auto place = reader_.placeOf(file.file)) {
+      file.key[1] = *place;
+      unplaced = 0;
+    } else {
+      ++unplaced;
+    }
+  }
+
+  DiskPass& pass_;
+  ContentReader reader_;
+  std::size_t next_;
+  std::map<std::uint64_t, unsigned> unplaced_;  ///< In a row, by volume.
+};
+
+class FileReading::DiskPass::ReadingTask final : public TaskGroup::Task {
+ public:
+  explicit ReadingTask(DiskPass& pass)
+      : pass_(pass),
+        reader_(pass.owner_.ports_.tree, pass.owner_.ports_.fileSystem, pass.owner_.secret_) {}
+
+  std::optional<std::uint64_t> run(DiskTurn& turn) override {
+    unsigned files = 0;
+    std::uint64_t bytes = 0;
+    bool goesOn = true;
+    do {
+      goesOn = !pass_.group_.shouldStop() && (file_ || begin());
+      if (!goesOn) break;
+      const bool isFinished = reader_.step();
+      bytes += reader_.stepLength();
+      turn.didRead(reader_.stepLength());
+      if (isFinished) {
+        settle();
+        ++files;
+      }
+    } while (!turn.isOver());
+
+    ScanControl& control = pass_.owner_.control_;
+    control.filesRead.fetch_add(files, std::memory_order_relaxed);
+    control.bytesRead.fetch_add(bytes, std::memory_order_relaxed);
+    if (!goesOn) {
+      end();
+      return std::nullopt;
+    }
+    if (pass_.stage_ == Stage::byInode && files < warmFiles && bytes < warmBytes)
+      pass_.isInterrupted_ = true;
+    return place_;
+  }
+
+  void refuse() override {
+    while (file_ || begin()) {
+      pass_.lose(*file_, diskIsGone());
+      file_ = nullptr;
+    }
+    end();
+  }
+
+ private:
+  bool begin() {
+    file_ = pass_.draw(mayReadLarge_);
+    if (!file_) return false;
+    place_ = file_->key[1];
+    look_ = pass_.lookAt(*file_);
+    reader_.begin(file_->file, look_);
+    return true;
+  }
+
+  void settle() {
+    Candidate& file = *std::exchange(file_, nullptr);
+    if (const auto& loss = reader_.loss()) return pass_.lose(file, *loss);
+    if (look_ == pass_.look_) {
+      file.key = reader_.digest();
+    } else {
+      file.key = reader_.headDigest();
+      if (pass_.sizeOf(file) > headLength) whole_.emplace_back(file.file, reader_.digest());
+    }
+  }
+
+  void end() {
+    {
+      const std::lock_guard lock(pass_.owner_.mutex_);
+      Digests& all = pass_.owner_.wholeDigests_;
+      all.insert(all.end(), whole_.begin(), whole_.end());
+    }
+    pass_.didEnd();
+  }
+
+  DiskPass& pass_;
+  ContentReader reader_;
+  Candidate* file_ = nullptr;  ///< The one that is being read.
+  Look look_ = Look::head;
+  std::uint64_t place_ = 0;
+  bool mayReadLarge_ = false;
+  Digests whole_;
+};
+
+void FileReading::DiskPass::startPlacing() {
+  group_.start(disk_, std::make_unique<PlacingTask>(*this));
+}
+
+void FileReading::DiskPass::startReading(unsigned count) {
+  for (; count > 0; --count) group_.start(disk_, std::make_unique<ReadingTask>(*this));
+}
+
+FileReading::~FileReading() = default;
+
+void FileReading::read(Look look, std::vector<Candidate>& candidates) {
+  control_.filesToRead.fetch_add(candidates.size(), std::memory_order_relaxed);
+  for (Candidate& candidate : candidates) candidate.key = ports_.tree.locationOf(candidate.file);
+  const auto liesBefore = [](const Candidate& a, const Candidate& b) { return a.key < b.key; };
+  if (!std::is_sorted(candidates.begin(), candidates.end(), liesBefore))
+    std::sort(candidates.begin(), candidates.end(), liesBefore);
+
+  TaskGroup group(ports_.turns, control_);
+  std::map<const ScanDisk*, std::unique_ptr<DiskPass>> passes;
+  for (auto begin = candidates.begin(); begin != candidates.end();) {
+    const ScanDisk& disk = ports_.tree.diskOf(begin->file);
+    const auto end = std::find_if(begin, candidates.end(), [&](const Candidate& candidate) {
+      return &ports_.tree.diskOf(candidate.file) != &disk;
+    });
+    passes[&disk] = std::make_unique<DiskPass>(*this, group, look, disk, std::span(begin, end));
+    begin = end;
+  }
+  for (const auto& [disk, pass] : passes) pass->start();
+  group.wait();
+  for (const auto& [disk, pass] : passes)
+    if (pass->isCold()) coldDisks_.insert(disk);
+  std::erase_if(candidates, [](const Candidate& file) { return file.file == Candidate::lost; });
+  std::sort(wholeDigests_.begin(), wholeDigests_.end());
+}
+
+std::optional<Digest> FileReading::wholeDigest(FileNumber file) const {
+  const auto found =
+      std::lower_bound(wholeDigests_.begin(), wholeDigests_.end(), file,
+                       [](const auto& digest, FileNumber number) { return digest.first < number; });
+  if (found == wholeDigests_.end() || found->first != file) return std::nullopt;
+  return found->second;
+}
+
+}  // namespace Orvane

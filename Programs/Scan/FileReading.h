@@ -1,0 +1,68 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <mutex>
+#include <optional>
+#include <set>
+#include <utility>
+#include <vector>
+
+#include <Scan/Candidate.h>
+#include <Scan/ContentReader.h>
+#include <Scan/Loss.h>
+
+namespace Orvane {
+
+class DiskTurns;
+class FileSystem;
+struct ScanControl;
+struct ScanDisk;
+
+/// Reads the files of a scan, look by look, in the order that their disks like.
+///
+/// A disk that is not ordered is read as the files come, by as many tasks as it has places. An
+/// ordered one is read from inode to inode at first. That costs nothing while the page cache has
+/// what is read; once a turn shows that the disk works for it, the rest is read by physical place,
+/// and small files whole, as their heads would cost no less.
+///
+///     FileReading reading({tree, fileSystem, turns}, control);
+///     reading.read(Look::head, candidates);
+///
+/// One call at a time.
+class FileReading final {
+ public:
+  struct Ports {
+    const FileTree& tree;
+    FileSystem& fileSystem;
+    DiskTurns& turns;
+  };
+  using Losses = std::vector<std::pair<FileNumber, Loss>>;
+
+  FileReading(Ports ports, ScanControl& control) : ports_(ports), control_(control) {}
+  ~FileReading();
+
+  /// Leaves in each candidate's key the digest of what the look shows. Those that cannot be read
+  /// become `lost`.
+  void read(Look look, std::vector<Candidate>& candidates);
+
+  /// What was lost since the last call, in no order.
+  [[nodiscard]] Losses takeLosses() { return std::exchange(losses_, {}); }
+
+  /// The digest of everything, for a file larger than a head that a look at heads read whole.
+  [[nodiscard]] std::optional<Digest> wholeDigest(FileNumber file) const;
+
+ private:
+  class DiskPass;
+  using Digests = std::vector<std::pair<FileNumber, Digest>>;
+
+  Ports ports_;
+  ScanControl& control_;
+  const DigestSecret secret_;
+  std::set<const ScanDisk*> coldDisks_;  ///< Those that were seen to work for what is read.
+
+  std::mutex mutex_;  ///< Guards these while tasks run.
+  Losses losses_;
+  Digests wholeDigests_;  ///< Sorted when no task runs.
+};
+
+}  // namespace Orvane

@@ -1,0 +1,54 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <map>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include <Scan/DiskTurns.h>
+#include <Varnel/Platform/Values/QualityOfService.h>
+#include <Varnel/Platform/Values/URL.h>
+
+namespace Varnel {
+class DiskReadingQueue;
+}
+namespace Varnel::Platform {
+class VolumeCatalog;
+}
+
+namespace Orvane {
+
+/// Gives the turns of the process's reading queue.
+class ManagedDiskTurns final : public DiskTurns {
+ public:
+  struct Ports {
+    Varnel::DiskReadingQueue& queue;
+    Varnel::Platform::VolumeCatalog& volumes;
+  };
+
+  /// `maxTasks`: how many tasks share a disk, however many it admits.
+  ManagedDiskTurns(Ports ports, Varnel::Platform::QualityOfService qos, unsigned maxTasks);
+  /// Waits for tasks on no known volume. Those on disks must be done.
+  ~ManagedDiskTurns() override;
+
+  const ScanDisk& diskOf(const std::string& path) override;
+  void start(const ScanDisk& disk, std::shared_ptr<DiskTask> task) override;
+
+ private:
+  struct Disk;
+
+  const Ports ports_;
+  const Varnel::Platform::QualityOfService qos_;
+  const unsigned maxTasks_;
+
+  /// Guards what follows. Never held while a volume is looked up, as a file on a dead network share
+  /// can keep its reader for ever.
+  std::mutex mutex_;
+  std::map<std::string, std::unique_ptr<Disk>> disks_;  ///< By identifier.
+  std::vector<std::thread> threads_;                    ///< Of tasks on no known volume.
+};
+
+}  // namespace Orvane
