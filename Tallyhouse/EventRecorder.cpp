@@ -189,14 +189,16 @@ bool EventRecorder::mayInsert() const {
 // The usual way, for little more than the row itself. Whatever is unusual is left to `settle`.
 bool EventRecorder::insert(const SpooledEvent& event) {
   bool isInserted = false;
-  const auto error = file_.changeByOneStatement([&](SQLiteDatabase& database) {
+  const auto write = [&](SQLiteDatabase& database) {
     auto failure = run(database,
                        "INSERT OR IGNORE INTO event(id, date, uuid, hit) SELECT ?, ?, ?, ?"
                        " WHERE coalesce((SELECT epoch FROM state), 0) <= ?",
                        event.id, numberOf(event.date), event.uuid, event.hit, event.epoch);
     isInserted = !failure && database.changedRows() > 0;
     return failure;
-  });
+  };
+  // The next event, or the deliverer, looks again at whether the file is in its place.
+  const auto error = file_.changeByOneStatement(write, DurableFile::Looking::eachMillisecond);
   if (error) {
     const std::lock_guard lock(mutex_);
     pause_.failed(ports_.clock.now());

@@ -34,6 +34,8 @@ constexpr std::array<const char*, 3> journalSuffixes{"-wal", "-shm", "-journal"}
 
 // A file that is taken away this often within one operation is beyond help.
 constexpr int maxRounds = 4;
+// For how long a user who does not look each time trusts that nothing has happened to the files.
+constexpr auto maxUnlooked = std::chrono::milliseconds(1);
 // The log is moved into the file when it has this many pages, unless somebody does so before.
 constexpr int maxLoggedPages = 8000;
 
@@ -82,6 +84,7 @@ struct DurableFile::Connection {
   std::optional<FileIdentity> index;
   std::unique_ptr<HeldFile> heldFile;
   std::unique_ptr<HeldFile> heldLog;
+  std::chrono::steady_clock::time_point lookedAt;
   std::int64_t lastChange = 0;  ///< Of the file, when it was last found in its place.
   bool isImmutable = false;
   const int forksBefore = forksSoFar();
@@ -114,8 +117,9 @@ DurableFile::Failure DurableFile::change(const Work& work) {
   });
 }
 
-DurableFile::Failure DurableFile::changeByOneStatement(const Work& work) {
-  return attempt(Look::atFiles, [&](SQLiteDatabase& database) {
+DurableFile::Failure DurableFile::changeByOneStatement(const Work& work, Looking looking) {
+  const Look look = looking == Looking::eachTime ? Look::atFiles : Look::atFilesAtTimes;
+  return attempt(look, [&](SQLiteDatabase& database) {
     auto error = work(database);
     database.finishCached();
     // The tables may be those of a later version by now.
@@ -166,14 +170,15 @@ DurableFile::Failure DurableFile::attempt(Look look, const Work& operation) {
   for (int round = 0; round < maxRounds; ++round) {
     if ((error = ensureOpen())) return said(*error);
     error = operation(connection_->database);
-    const bool isUntouched = look == Look::atFiles && !error && looksUntouched();
+    const bool isUntouched = look != Look::byPath && !error && looksUntouched(look);
     if (!isUntouched && isLost()) {
       error = replaceLost();
     } else if (isDamage(error)) {
       error = setAside(*error);
     } else {
       if (loggedPages_ >= maxLoggedPages) checkpoint();
-      if (connection_->isImmutable || isOfAnotherFormat(error)) connection_.reset();
+      // What can only be read now may be written later, by a connection of that time.
+      if (connection_->database.isReadOnly() || isOfAnotherFormat(error)) connection_.reset();
       return error ? said(*error) : error;
     }
     if (error) return said(*error);
@@ -188,6 +193,7 @@ bool DurableFile::isFromBeforeFork() const {
 // Whether the path no longer leads to what the connection writes.
 bool DurableFile::isLost() {
   PrivateFiles& files = ports_.privateFiles;
+  connection_->lookedAt = std::chrono::steady_clock::now();
   if (connection_->heldFile) connection_->lastChange = connection_->heldFile->state().lastChange;
   const auto file = files.identity(path_);
   if (!file || file->isEmpty || *file != connection_->file) return true;
@@ -197,9 +203,12 @@ bool DurableFile::isLost() {
 
 // Whether nothing has happened to the files themselves since they were last found by their paths:
 // most of what can happen shows there, for a fraction of the time. False when in doubt.
-bool DurableFile::looksUntouched() const {
-  const Connection& open = *connection_;
+bool DurableFile::looksUntouched(Look look) const {
+  Connection& open = *connection_;
   if (!open.heldFile || !open.heldLog) return false;
+  const auto now = std::chrono::steady_clock::now();
+  if (look == Look::atFilesAtTimes && now - open.lookedAt < maxUnlooked) return true;
+  open.lookedAt = now;
   const auto file = open.heldFile->state();
   return !file.isRemoved && !file.isEmpty && file.lastChange == open.lastChange &&
          !open.heldLog->state().isRemoved;

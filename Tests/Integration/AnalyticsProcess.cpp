@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
-// AnalyticsProcess ENDPOINT SPOOL COUNT [drain]: tracks that many events, whose names it prints as
-// soon as they are kept, and says "tracked". Then it waits to be killed, or drains the spool, says
-// whether its events were "delivered" or "left", and ends.
+// AnalyticsProcess ENDPOINT SPOOL COUNT [drain|end]: tracks that many events, whose names it prints
+// as soon as they are kept, and says "tracked". Then it waits to be killed, or ends; with "drain"
+// it drains the spool before that and says whether its events were "delivered" or "left".
 #include <unistd.h>
 
 #include <chrono>
@@ -33,9 +33,7 @@ int main(int count, char** arguments) {
     say(name);
   }
   say("tracked");
-  if (count > 4 && arguments[4] == std::string_view("drain")) {
+  while (count == 4) ::pause();
+  if (arguments[4] == std::string_view("drain"))
     say(transport->drain(std::chrono::minutes(1)) ? "delivered" : "left");
-    return EXIT_SUCCESS;
-  }
-  for (;;) ::pause();
 }
