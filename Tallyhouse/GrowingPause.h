@@ -27,7 +27,7 @@ class GrowingPause final {
  private:
   static constexpr std::chrono::milliseconds max = std::chrono::seconds(30);
 
-  std::chrono::milliseconds pause_{100};
+  std::chrono::milliseconds pause_{10};
   Varnel::Platform::Date end_;
 };
 
