@@ -17,6 +17,8 @@
 #include <cstdio>
 #include <cstdlib>
 #include <fstream>
+#include <functional>
+#include <latch>
 #include <map>
 #include <string>
 #include <string_view>
@@ -25,6 +27,7 @@
 #include <vector>
 
 #include <Varnel/DiskAccess/DiskAccessManager.h>
+#include <Varnel/DiskAccess/DiskReadingQueue.h>
 #include <Varnel/Platform/Concurrency/StartThread.h>
 
 namespace {
@@ -116,19 +119,19 @@ std::vector<File> listed(const char* path) {
   return files;
 }
 
-void readWhole(const File& file, std::vector<char>& buffer) {
-  const int descriptor = open(file.path.c_str(), O_RDONLY | O_CLOEXEC);
-  if (descriptor < 0) fail(file.path);
+void readWhole(const std::string& path, std::vector<char>& buffer) {
+  const int descriptor = open(path.c_str(), O_RDONLY | O_CLOEXEC);
+  if (descriptor < 0) fail(path);
   ssize_t count = 0;
   while ((count = read(descriptor, buffer.data(), buffer.size())) > 0) {
   }
-  if (count < 0) fail(file.path);
+  if (count < 0) fail(path);
   close(descriptor);
 }
 
 void readPlain(const std::vector<File>& files) {
   std::vector<char> buffer(512 * 1024);
-  for (const File& file : files) readWhole(file, buffer);
+  for (const File& file : files) readWhole(file.path, buffer);
 }
 
 void readWithinSessions(const std::vector<File>& files) {
@@ -138,9 +141,31 @@ void readWithinSessions(const std::vector<File>& files) {
     const auto url = Varnel::Platform::URL::fileURLWithPath(file.path);
     const auto session = manager.beginAccessingURL(url, "Measure");
     if (!session) std::abort();
-    readWhole(file, buffer);
+    readWhole(file.path, buffer);
     session->endAccessing();
   }
+}
+
+void readByQueue(const std::vector<File>& files) {
+  std::vector<Varnel::DiskReadingFile> wanted;
+  for (const File& file : files)
+    wanted.push_back({.url = Varnel::Platform::URL::fileURLWithPath(file.path),
+                      .place = file.place,
+                      .size = file.size});
+  std::latch ended(static_cast<std::ptrdiff_t>(wanted.size()));
+  Varnel::DiskReadingQueue::shared().read(
+      std::move(wanted), {.propose = "Measure"},
+      [](const Varnel::DiskReadingFile& file, Varnel::DiskReadingTurn& turn) {
+        thread_local std::vector<char> buffer(512 * 1024);
+        readWhole(file.url.path(), buffer);  // None is larger than a turn.
+        turn.didRead(*file.size);
+        return Varnel::DiskReadingNext::done();
+      },
+      [&](const Varnel::DiskReadingFile&, Varnel::DiskReadingResult result) {
+        if (result != Varnel::DiskReadingResult::read) std::abort();
+        ended.count_down();
+      });
+  ended.wait();
 }
 
 /// The files of eight threads. Each has the files of some folders, in the order of the list.
@@ -155,12 +180,12 @@ std::vector<std::vector<File>> shares(const std::vector<File>& files) {
   return result;
 }
 
-void readOnThreads(const std::vector<File>& files) {
+void readOnThreads(const std::vector<File>& files,
+                   const std::function<void(const std::vector<File>&)>& readShare) {
   const auto lists = shares(files);
   std::vector<std::thread> threads;
   for (const auto& share : lists)
-    threads.push_back(
-        Varnel::Platform::startThread("reader", [&share] { readWithinSessions(share); }));
+    threads.push_back(Varnel::Platform::startThread("reader", [&] { readShare(share); }));
   for (std::thread& thread : threads) thread.join();
 }
 
@@ -174,9 +199,11 @@ int main(int argc, char** argv) {
   } else if (verb == "read" && how == "plain") {
     readPlain(listed(argv[2]));
   } else if (verb == "read" && how == "sessions") {
-    readOnThreads(listed(argv[2]));
+    readOnThreads(listed(argv[2]), readWithinSessions);
+  } else if (verb == "read" && how == "queue") {
+    readOnThreads(listed(argv[2]), readByQueue);
   } else {
-    std::fprintf(stderr, "usage: ReadingOrder list FOLDER | read LIST plain|sessions\n");
+    std::fprintf(stderr, "usage: ReadingOrder list FOLDER | read LIST plain|sessions|queue\n");
     return 2;
   }
   return 0;
