@@ -246,8 +246,9 @@ DurableFile::Failure DurableFile::open() {
   finishMovingAside();
   const auto path = ports_.privateFiles.prepare(path_);
   if (!path) return path.error();
-  if (const auto file = ports_.privateFiles.identity(path_); file && file->isEmpty)
-    removeJournals();
+  const auto file = ports_.privateFiles.identity(path_);
+  const bool isNew = file && file->isEmpty;
+  if (isNew) removeJournals();
   auto database = SQLiteDatabase::open(*path, SQLiteDatabase::Access::existing);
   if (!database) return database.error();
   const bool isReadOnly = database->isReadOnly();
@@ -265,8 +266,13 @@ DurableFile::Failure DurableFile::open() {
     if (!database) return database.error();
     error = judgeFormat(*database, format_, migrating);
   }
+  // Others wait meanwhile, and the first change brings all of a new file to the disk.
+  if (!error && isNew) error = database->execute("PRAGMA synchronous = OFF");
   if (!error && !database->isReadOnly()) error = setUp(*database, *path);
   if (!error) error = applyFormat(*database, format_, migrating);
+  const bool isFull = format_.synchronisation == DurableFormat::Synchronisation::survivesPowerLoss;
+  if (!error)
+    error = database->execute(isFull ? "PRAGMA synchronous = FULL" : "PRAGMA synchronous = NORMAL");
   if (error) return error;
   connection_ = std::make_unique<Connection>(std::move(*database));
   connection_->isImmutable = isImmutable;
@@ -300,11 +306,7 @@ DurableFile::Failure DurableFile::setUp(SQLiteDatabase& database, const std::str
   // A journal that is emptied, not removed, is found again by no name but its own.
   if (!keepsLog(database))
     if (auto error = database.execute("PRAGMA journal_mode = TRUNCATE")) return error;
-  const bool isFull = format_.synchronisation == DurableFormat::Synchronisation::survivesPowerLoss;
-  auto error =
-      database.execute(isFull ? "PRAGMA synchronous = FULL" : "PRAGMA synchronous = NORMAL");
-  if (!error) error = database.execute("PRAGMA journal_size_limit = 1048576");
-  return error;
+  return database.execute("PRAGMA journal_size_limit = 1048576");
 }
 
 DurableFile::Failure DurableFile::check() {
