@@ -12,7 +12,6 @@
 #include <Varnel/Platform/Values/Date.h>
 #include <Varnel/Tallyhouse/DeliveryPolicy.h>
 #include <Varnel/Tallyhouse/EventSpool.h>
-#include <Varnel/Tallyhouse/GrowingPause.h>
 
 namespace Varnel::Platform {
 class Clock;
@@ -88,7 +87,7 @@ class Delivery final {
   /// Not in the spool yet. Until it is, nothing more is sent: a batch is not sent again because it
   /// cannot be noted.
   std::optional<DeliveryOutcome> outcome_;
-  GrowingPause filePause_;
+  Varnel::Platform::GrowingPause filePause_ = spoolPause;
 };
 
 }  // namespace Tallyhouse

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <functional>
+#include <tuple>
 #include <utility>
 #include <vector>
 
@@ -15,7 +16,6 @@ namespace Tallyhouse {
 using Varnel::Platform::Date;
 using Varnel::Platform::DurableFile;
 using Varnel::Platform::SQLiteDatabase;
-using Varnel::Platform::SQLiteStatement;
 using Error = std::optional<Varnel::Platform::PlatformError>;
 
 namespace {
@@ -24,43 +24,35 @@ std::int64_t numberOf(Date date) {
   return date.time_since_epoch().count();
 }
 
-// The first column of the first row, or 0.
-Error readNumber(SQLiteDatabase& database, const char* sql, std::int64_t& number) {
-  const auto found = database.integer(sql);
-  if (!found) return found.error();
-  number = found.value().value_or(0);
-  return std::nullopt;
+Error readEpoch(SQLiteDatabase& database, std::int64_t& epoch) {
+  epoch = 0;
+  return database.row("SELECT epoch FROM state", std::tie(epoch));
 }
 
-constexpr const char* selectEpoch = "SELECT epoch FROM state";
-
-Error setEpoch(SQLiteDatabase& database, std::int64_t epoch) {
-  return run(database,
-             "INSERT INTO state(id, epoch) VALUES(1, ?1)"
-             " ON CONFLICT(id) DO UPDATE SET epoch = ?1",
-             epoch);
+// What is forgotten must not be found in the free parts of the file.
+Error empty(SQLiteDatabase& database, std::int64_t epoch) {
+  if (auto error = database.execute("PRAGMA secure_delete = ON; DELETE FROM event")) return error;
+  return database.run(
+      "INSERT INTO state(id, epoch) VALUES(1, ?1) ON CONFLICT(id) DO UPDATE SET epoch = ?1", epoch);
 }
 
 Error addDropped(SQLiteDatabase& database, std::int64_t count, std::int64_t lastID) {
-  return run(database,
-             "INSERT INTO state(id, dropped, lost_through) VALUES(1, ?1, ?2)"
-             " ON CONFLICT(id) DO UPDATE SET dropped = dropped + ?1,"
-             " lost_through = max(lost_through, ?2)",
-             count, lastID);
+  return database.run(
+      "INSERT INTO state(id, dropped, lost_through) VALUES(1, ?1, ?2) ON CONFLICT(id)"
+      " DO UPDATE SET dropped = dropped + ?1, lost_through = max(lost_through, ?2)",
+      count, lastID);
 }
 
 // The event may be there already: a change is made again when the file was replaced meanwhile. Or
 // another process's event has the number.
 Error insertOnce(SQLiteDatabase& database, SpooledEvent& event) {
   for (;; ++event.id) {
-    auto error =
-        run(database, "INSERT OR IGNORE INTO event(id, date, uuid, hit) VALUES(?, ?, ?, ?)",
-            event.id, numberOf(event.date), event.uuid, event.hit);
+    auto error = database.run("INSERT OR IGNORE INTO event(id, date, uuid, hit) VALUES(?, ?, ?, ?)",
+                              event.id, event.date, event.uuid, event.hit);
     if (error || database.changedRows() > 0) return error;
     bool isThere = false;
-    error = query(
-        database, "SELECT 1 FROM event WHERE id = ? AND uuid = ?",
-        [&](SQLiteStatement&) { return !(isThere = true); }, event.id, event.uuid);
+    error = database.row("SELECT uuid = ? FROM event WHERE id = ?", std::tie(isThere), event.uuid,
+                         event.id);
     if (error || isThere) return error;
   }
 }
@@ -71,12 +63,12 @@ Error trim(SQLiteDatabase& database, const SpoolLimits& limits, SpoolRoom& room)
   for (;;) {
     std::int64_t events = 0;
     std::int64_t bytes = 0;
-    auto error = readNumber(database, "SELECT count(*) FROM event", events);
+    auto error = database.row("SELECT count(*) FROM event", std::tie(events));
     if (!error)
-      error = readNumber(database,
-                         "SELECT (page_count - freelist_count) * page_size FROM"
-                         " pragma_page_count, pragma_freelist_count, pragma_page_size",
-                         bytes);
+      error = database.row(
+          "SELECT (page_count - freelist_count) * page_size FROM"
+          " pragma_page_count, pragma_freelist_count, pragma_page_size",
+          std::tie(bytes));
     if (error) return error;
     if (events == 0 || (events <= limits.maxEvents && bytes <= limits.maxBytes)) {
       room = {.events = std::max((limits.maxEvents - events) / 8, limits.maxEvents / 100 + 1),
@@ -84,14 +76,9 @@ Error trim(SQLiteDatabase& database, const SpoolLimits& limits, SpoolRoom& room)
       return std::nullopt;
     }
     std::int64_t last = 0;
-    error = query(
-        database, "SELECT max(id) FROM (SELECT id FROM event ORDER BY id LIMIT ?)",
-        [&](SQLiteStatement& row) {
-          last = row.integer(0).value_or(0);
-          return false;
-        },
-        events / 100 + 1);
-    if (!error) error = run(database, "DELETE FROM event WHERE id <= ?", last);
+    error = database.row("SELECT max(id) FROM (SELECT id FROM event ORDER BY id LIMIT ?)",
+                         std::tie(last), events / 100 + 1);
+    if (!error) error = database.run("DELETE FROM event WHERE id <= ?", last);
     if (!error) error = addDropped(database, database.changedRows(), last);
     if (error) return error;
   }
@@ -109,13 +96,8 @@ struct EventRecorder::Work final {
   SpoolRoom room;
 
   Error doIn(SQLiteDatabase& database, const SpoolLimits& limits) {
-    auto error = readNumber(database, selectEpoch, epoch);
-    if (!error && refusal) {
-      epoch = std::max(epoch + 1, *refusal);
-      // What is forgotten must not be found in the free parts of the file.
-      error = database.execute("PRAGMA secure_delete = ON; DELETE FROM event");
-      if (!error) error = setEpoch(database, epoch);
-    }
+    auto error = readEpoch(database, epoch);
+    if (!error && refusal) error = empty(database, epoch = std::max(epoch + 1, *refusal));
     for (SpooledEvent& event : events)
       if (!error && (refusal || epoch <= event.epoch)) error = insertOnce(database, event);
     if (!error && dropped > 0) error = addDropped(database, dropped, 0);
@@ -139,8 +121,8 @@ EventRecorder::~EventRecorder() {
 void EventRecorder::begin() {
   const std::lock_guard atFile(fileMutex_);
   std::int64_t epoch = 0;
-  const auto error = file_.read(
-      [&](SQLiteDatabase& database) { return readNumber(database, selectEpoch, epoch); });
+  const auto error =
+      file_.read([&](SQLiteDatabase& database) { return readEpoch(database, epoch); });
   const std::lock_guard lock(mutex_);
   own_.epoch = error ? numberOf(ports_.clock.now()) : epoch;
   isRevoked_ = false;
@@ -183,17 +165,17 @@ SpooledEvent EventRecorder::named(std::string_view uuid, Date date, std::string_
 
 bool EventRecorder::mayInsert() const {
   const std::lock_guard lock(mutex_);
-  return held_.empty() && !mustEmpty_ && room_.events > 0 && room_.bytes > 0;
+  return held_.empty() && !refusal_ && room_.events > 0 && room_.bytes > 0;
 }
 
 // The usual way, for little more than the row itself. Whatever is unusual is left to `settle`.
 bool EventRecorder::insert(const SpooledEvent& event) {
   bool isInserted = false;
   const auto write = [&](SQLiteDatabase& database) {
-    auto failure = run(database,
-                       "INSERT OR IGNORE INTO event(id, date, uuid, hit) SELECT ?, ?, ?, ?"
-                       " WHERE coalesce((SELECT epoch FROM state), 0) <= ?",
-                       event.id, numberOf(event.date), event.uuid, event.hit, event.epoch);
+    auto failure = database.run(
+        "INSERT OR IGNORE INTO event(id, date, uuid, hit) SELECT ?, ?, ?, ?"
+        " WHERE coalesce((SELECT epoch FROM state), 0) <= ?",
+        event.id, event.date, event.uuid, event.hit, event.epoch);
     isInserted = !failure && database.changedRows() > 0;
     return failure;
   };
@@ -231,7 +213,6 @@ void EventRecorder::discard() {
     held_.clear();
     heldBytes_ = 0;
     own_ = {};
-    mustEmpty_ = true;
     refusal_ = numberOf(ports_.clock.now());
   }
   settle(file_, Haste::none);
@@ -255,14 +236,14 @@ std::optional<Date> EventRecorder::settle(DurableFile& file, Haste haste) {
     work.events.assign(held_.begin(), held_.end());
     work.lastID = lastID_;
     work.dropped = dropped_;
-    if (mustEmpty_) work.refusal = refusal_;
+    work.refusal = refusal_;
   }
   const auto error =
       file.change([&](SQLiteDatabase& database) { return work.doIn(database, limits_); });
   const std::lock_guard lock(mutex_);
   isSettling_ = false;
   if (error) return pause_.end();
-  pause_ = {};
+  pause_.succeeded();
   finish(work);
   return hasWork() ? std::optional(ports_.clock.now()) : std::nullopt;
 }
@@ -275,7 +256,7 @@ void EventRecorder::finish(const Work& work) {
   waiting_ += static_cast<std::int64_t>(work.events.size());
   room_ = work.room;
   if (work.refusal) {
-    mustEmpty_ = refusal_ != *work.refusal;
+    if (refusal_ == work.refusal) refusal_.reset();
     own_.epoch = work.epoch;
   }
   isRevoked_ = work.epoch > own_.epoch;
@@ -283,7 +264,7 @@ void EventRecorder::finish(const Work& work) {
 
 bool EventRecorder::mustEmpty() const {
   const std::lock_guard lock(mutex_);
-  return mustEmpty_;
+  return refusal_.has_value();
 }
 
 // An event that comes between the two calls counts from 1, and so wakes who looks.
@@ -313,7 +294,8 @@ std::int64_t EventRecorder::droppedCount() {
   const std::lock_guard atFile(fileMutex_);
   std::int64_t dropped = 0;
   static_cast<void>(file_.read([&](SQLiteDatabase& database) {
-    return readNumber(database, "SELECT dropped FROM state", dropped);
+    dropped = 0;
+    return database.row("SELECT dropped FROM state", std::tie(dropped));
   }));
   const std::lock_guard lock(mutex_);
   return dropped + dropped_;

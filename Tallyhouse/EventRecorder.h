@@ -10,7 +10,6 @@
 
 #include <Varnel/Platform/SQLite/DurableFile.h>
 #include <Varnel/Platform/Values/Date.h>
-#include <Varnel/Tallyhouse/GrowingPause.h>
 #include <Varnel/Tallyhouse/SpoolFormat.h>
 
 namespace Varnel::Platform {
@@ -112,7 +111,7 @@ class EventRecorder final {
   [[nodiscard]] bool mayInsert() const;
   [[nodiscard]] bool insert(const SpooledEvent& event);
   std::int64_t hold(SpooledEvent event);
-  [[nodiscard]] bool hasWork() const { return mustEmpty_ || !held_.empty() || dropped_ > 0; }
+  [[nodiscard]] bool hasWork() const { return refusal_ || !held_.empty() || dropped_ > 0; }
   void finish(const Work& work);
 
   const Ports ports_;
@@ -125,12 +124,11 @@ class EventRecorder final {
   mutable std::mutex mutex_;  ///< Owns all below. Nobody keeps it while at a file.
   std::deque<SpooledEvent> held_;
   std::size_t heldBytes_ = 0;
-  std::int64_t dropped_ = 0;  ///< Not yet counted in the file.
-  bool mustEmpty_ = false;
-  std::int64_t refusal_ = 0;  ///< When the user refused here for the last time.
-  bool isRevoked_ = false;    ///< Another process has refused since `begin`.
+  std::int64_t dropped_ = 0;             ///< Not yet counted in the file.
+  std::optional<std::int64_t> refusal_;  ///< Of the user, here, for which the file is not emptied.
+  bool isRevoked_ = false;               ///< Another process has refused since `begin`.
   bool isSettling_ = false;
-  GrowingPause pause_;
+  Varnel::Platform::GrowingPause pause_ = spoolPause;
   SpoolRoom room_;
   std::int64_t waiting_ = 0;
   std::int64_t lastID_ = 0;

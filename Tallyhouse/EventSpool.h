@@ -5,6 +5,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include <Varnel/Platform/Ports/PrivateFiles.h>
@@ -76,7 +77,7 @@ class EventSpool final {
   [[nodiscard]] Varnel::Platform::DurableFile& file() { return file_; }
 
  private:
-  [[nodiscard]] std::vector<SpooledEvent> events(const char* sql, std::int64_t parameter,
+  [[nodiscard]] std::vector<SpooledEvent> events(std::string_view which, std::int64_t parameter,
                                                  std::size_t maxBytes);
 
   const Ports ports_;

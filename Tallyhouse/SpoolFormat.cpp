@@ -28,9 +28,7 @@ const DurableFormat& spoolFormat() {
       .migrations = {},
       .journal = DurableFormat::Journal::writeAhead,
       .synchronisation = DurableFormat::Synchronisation::survivesKill,
-      .tables = {{"event", {"id", "date", "refusals", "refused_at", "uuid", "hit"}},
-                 {"state",
-                  {"id", "epoch", "dropped", "lost_through", "server", "not_before", "failures"}}}};
+      .tables = {{.name = "event"}, {.name = "state"}}};
   return format;
 }
 

@@ -1,16 +1,14 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/Generic/NotificationStore.h>
 
-#include <fmt/format.h>
-#include <fmt/ranges.h>
-
 #include <algorithm>
 #include <array>
 #include <string_view>
+#include <tuple>
 
-#include <Varnel/Platform/Generic/NotificationColumns.h>
 #include <Varnel/Platform/Text/Calendar.h>
 #include <Varnel/Platform/Values/UUID.h>
+#include <fmt/format.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -44,11 +42,29 @@ DurableFormat format() {
           .migrations = {},
           .journal = DurableFormat::Journal::rollback,
           .synchronisation = DurableFormat::Synchronisation::survivesPowerLoss,
-          .tables = {{.name = "deliveries",
-                      .columns = {"number", "state", "key", "zone", "count", "banner", "delivered",
-                                  "identifier", "title", "text", "action", "other", "date", "years",
-                                  "months", "days", "hours", "minutes", "seconds"}}}};
+          .tables = {{.name = "deliveries"}}};
 }
+
+constexpr const char* columns =
+    "number, state, key, zone, count, banner, delivered, identifier, title, text, action, other,"
+    " date, years, months, days, hours, minutes, seconds";
+
+/// A delivery as it stands in the table.
+struct Row {
+  Delivery delivery;
+  std::string state;
+  DateComponents interval;  ///< Empty where the notification does not repeat.
+
+  /// In the order of the columns.
+  auto values() {
+    auto& [key, content, zone, count] = delivery.schedule;
+    return std::tie(delivery.number, state, key, zone, count, delivery.banner,
+                    content.actualDeliveryDate, content.identifier, content.title,
+                    content.informativeText, content.actionButtonTitle, content.otherButtonTitle,
+                    content.deliveryDate, interval.year, interval.month, interval.day,
+                    interval.hour, interval.minute, interval.second);
+  }
+};
 
 // A notification is known by its identifier. One without an identifier gets a unique name.
 std::string keyOf(const UserNotification& notification) {
@@ -56,84 +72,39 @@ std::string keyOf(const UserNotification& notification) {
                                  : "unique " + randomUUIDString();
 }
 
-std::optional<std::string> textOf(SQLiteStatement& row, int column) {
-  const auto text = row.text(column);
-  return text ? std::optional<std::string>(*text) : std::nullopt;
-}
-
-// Runs a statement with these parameters, handing each row to `use`.
-template <typename Use, typename... Parameters>
-Failure select(SQLiteDatabase& database, const std::string& sql, Use use,
-               const Parameters&... parameters) {
-  const auto statement = database.cached(sql);
-  if (!statement) return statement.error();
-  int index = 0;
-  ((*statement)->bind(++index, parameters), ...);
-  while (true) {
-    const auto step = (*statement)->step();
-    if (!step) return step.error();
-    if (*step == SQLiteStatement::Step::done) return std::nullopt;
-    use(**statement);
-  }
-}
-
-template <typename... Parameters>
-Failure run(SQLiteDatabase& database, const std::string& sql, const Parameters&... parameters) {
-  return select(
-      database, sql, [](SQLiteStatement&) {}, parameters...);
-}
-
 Failure insert(SQLiteDatabase& database, const Delivery& delivery) {
   static const std::string sql = fmt::format(
-      "INSERT INTO deliveries (state, key, zone, count, banner, delivered, {}, number) VALUES "
-      "(?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, "
-      "coalesce(nullif(?, 0), random()))",
-      notificationColumns);
-  const auto statement = database.cached(sql);
-  if (!statement) return statement.error();
-  SQLiteStatement& row = **statement;
-  const NotificationSchedule& schedule = delivery.schedule;
-  const auto& delivered = schedule.notification.actualDeliveryDate;
-  row.bind(1, stateNames.at(static_cast<std::size_t>(delivery.state)));
-  row.bind(2, schedule.key);
-  row.bind(3, schedule.timeZone);
-  row.bind(4, schedule.deliveryCount);
-  delivery.banner ? row.bind(5, *delivery.banner) : row.bindNull(5);
-  delivered ? row.bind(6, std::int64_t{delivered->time_since_epoch().count()}) : row.bindNull(6);
-  bindNotification(row, 7, schedule.notification);
-  row.bind(7 + notificationColumnCount, delivery.number);
-  const auto step = row.step();
-  return step ? std::nullopt : Failure(step.error());
+      "INSERT INTO deliveries ({}) VALUES (coalesce(nullif(?, 0), random()), "
+      "?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?)",
+      columns);
+  const auto& interval = delivery.schedule.notification.deliveryRepeatInterval;
+  Row row{.delivery = delivery,
+          .state = stateNames.at(static_cast<std::size_t>(delivery.state)),
+          .interval = interval.value_or(DateComponents())};
+  return std::apply([&](const auto&... values) { return database.run(sql, values...); },
+                    row.values());
 }
 
+// Any content gives a notification. A state of another version is passed over.
 Failure select(SQLiteDatabase& database, const std::vector<DeliveryState>& states,
                std::vector<Delivery>& found) {
-  std::vector<std::string> names;
-  for (const DeliveryState state : states)
-    names.push_back(fmt::format("'{}'", stateNames.at(static_cast<std::size_t>(state))));
+  static const std::string sql =
+      fmt::format("SELECT {} FROM deliveries ORDER BY delivered DESC, date DESC", columns);
   found.clear();
-  return select(
-      database,
-      fmt::format("SELECT number, state, key, zone, count, banner, delivered, {} FROM deliveries "
-                  "WHERE state IN ({}) ORDER BY delivered DESC, date DESC",
-                  notificationColumns, fmt::join(names, ", ")),
-      [&](SQLiteStatement& row) {
-        const auto name = std::find(stateNames.begin(), stateNames.end(), row.text(1));
-        Delivery delivery{.number = row.integer(0).value_or(0),
-                          .state = static_cast<DeliveryState>(name - stateNames.begin()),
-                          .schedule = {.key = textOf(row, 2).value_or(""),
-                                       .notification = readNotification(row, 7),
-                                       .timeZone = textOf(row, 3).value_or(""),
-                                       .deliveryCount = row.integer(4).value_or(0)},
-                          .banner = textOf(row, 5)};
-        if (const auto delivered = row.integer(6))
-          delivery.schedule.notification.actualDeliveryDate = Date(Date::duration(*delivered));
-        found.push_back(std::move(delivery));
-      });
+  return database.each(sql, [&](SQLiteStatement& statement) {
+    Row row;
+    statement.read(row.values());
+    const auto name = std::find(stateNames.begin(), stateNames.end(), row.state);
+    row.delivery.state = static_cast<DeliveryState>(name - stateNames.begin());
+    if (std::find(states.begin(), states.end(), row.delivery.state) == states.end()) return;
+    if (row.interval != DateComponents())
+      row.delivery.schedule.notification.deliveryRepeatInterval = row.interval;
+    found.push_back(std::move(row.delivery));
+  });
 }
 
 Failure forgetRemoved(SQLiteDatabase& database) {
-  return run(database, "DELETE FROM deliveries WHERE state = 'removed' AND banner IS NULL");
+  return database.run("DELETE FROM deliveries WHERE state = 'removed' AND banner IS NULL");
 }
 
 // In the place of the last delivery with this key, and of its banner.
@@ -142,12 +113,10 @@ Failure insertDue(SQLiteDatabase& database, Delivery delivery, Date now) {
   delivery.schedule.notification.actualDeliveryDate = now;
   const std::string predecessor =
       "FROM deliveries WHERE key = ? AND state NOT IN ('planned', 'removed')";
-  if (auto error = select(
-          database, "SELECT banner " + predecessor,
-          [&](SQLiteStatement& row) { delivery.banner = textOf(row, 0); }, delivery.schedule.key))
-    return error;
-  if (auto error = run(database, "DELETE " + predecessor, delivery.schedule.key)) return error;
-  return insert(database, delivery);
+  const std::string& key = delivery.schedule.key;
+  auto error = database.row("SELECT banner " + predecessor, std::tie(delivery.banner), key);
+  if (!error) error = database.run("DELETE " + predecessor, key);
+  return error ? error : insert(database, delivery);
 }
 
 bool changes(const NotificationSchedule& schedule, Date now, const Calendar& calendar) {
@@ -159,7 +128,7 @@ bool changes(const NotificationSchedule& schedule, Date now, const Calendar& cal
 Failure claim(SQLiteDatabase& database, const Delivery& delivery, Date now,
               const Calendar& calendar) {
   const ScheduleDecision decision = decide(delivery.schedule, now, calendar);
-  if (auto error = run(database, "DELETE FROM deliveries WHERE number = ?", delivery.number))
+  if (auto error = database.run("DELETE FROM deliveries WHERE number = ?", delivery.number))
     return error;
   if (decision.deliveryCount) {
     Delivery next{.schedule = delivery.schedule};
@@ -210,8 +179,8 @@ Failure NotificationStore::plan(const UserNotification& notification, Date now,
                                  .timeZone = calendar.timeZoneIdentifier()}};
   if (!notification.deliveryDate) delivery.schedule.notification.deliveryDate = now;
   return write([&](SQLiteDatabase& database) {
-    auto error = run(database, "DELETE FROM deliveries WHERE key = ? AND state = 'planned'",
-                     delivery.schedule.key);
+    auto error = database.run("DELETE FROM deliveries WHERE key = ? AND state = 'planned'",
+                              delivery.schedule.key);
     return error ? error : insert(database, delivery);
   });
 }
@@ -243,11 +212,11 @@ Failure NotificationStore::decideDue(const std::vector<std::pair<std::int64_t, b
   return write([&](SQLiteDatabase& database) -> Failure {
     for (const auto& [number, shows] : isToShow)
       if (auto error =
-              run(database, "UPDATE deliveries SET state = ? WHERE number = ? AND state = 'due'",
-                  std::string_view(shows ? "toShow" : "hidden"), number))
+              database.run("UPDATE deliveries SET state = ? WHERE number = ? AND state = 'due'",
+                           std::string_view(shows ? "toShow" : "hidden"), number))
         return error;
-    if (auto error = run(database,
-                         "UPDATE deliveries SET state = 'removed' WHERE number IN (SELECT number "
+    if (auto error =
+            database.run("UPDATE deliveries SET state = 'removed' WHERE number IN (SELECT number "
                          "FROM deliveries "
                          "WHERE state IN ('hidden', 'shown', 'expired') "
                          "ORDER BY delivered DESC, date DESC LIMIT -1 OFFSET ?)",
@@ -260,10 +229,10 @@ Failure NotificationStore::decideDue(const std::vector<std::pair<std::int64_t, b
 Result<bool> NotificationStore::noteShown(std::int64_t number, const std::string& banner) {
   bool isThere = false;
   if (auto error = write([&](SQLiteDatabase& database) {
-        auto failure = run(database,
-                           "UPDATE deliveries SET state = 'shown', banner = ? "
-                           "WHERE number = ? AND state IN ('toShow', 'shown')",
-                           banner, number);
+        auto failure = database.run(
+            "UPDATE deliveries SET state = 'shown', banner = ? "
+            "WHERE number = ? AND state IN ('toShow', 'shown')",
+            banner, number);
         isThere = database.changedRows() > 0;
         return failure;
       }))
@@ -273,18 +242,18 @@ Result<bool> NotificationStore::noteShown(std::int64_t number, const std::string
 
 Failure NotificationStore::noteGone(std::int64_t number) {
   return write([&](SQLiteDatabase& database) {
-    auto error = run(database,
-                     "UPDATE deliveries SET banner = NULL, "
-                     "state = CASE state WHEN 'shown' THEN 'expired' ELSE state END "
-                     "WHERE number = ?",
-                     number);
+    auto error = database.run(
+        "UPDATE deliveries SET banner = NULL, "
+        "state = CASE state WHEN 'shown' THEN 'expired' ELSE state END "
+        "WHERE number = ?",
+        number);
     return error ? error : forgetRemoved(database);
   });
 }
 
 Failure NotificationStore::remove(std::int64_t number) {
   return write([&](SQLiteDatabase& database) {
-    auto error = run(database, "UPDATE deliveries SET state = 'removed' WHERE number = ?", number);
+    auto error = database.run("UPDATE deliveries SET state = 'removed' WHERE number = ?", number);
     return error ? error : forgetRemoved(database);
   });
 }

@@ -348,11 +348,8 @@ Calendar ScheduledNotificationCenter::calendar() const {
 }
 
 void ScheduledNotificationCenter::tick() {
-  const Date now = ports_.clock.now();
-  // A clock that was set back would keep the retry far away.
-  if (retryDate_ && (now >= *retryDate_ || *retryDate_ - now > pause_)) {
-    retryDate_.reset();
-    pause_ = std::min<std::chrono::seconds>(2 * pause_, maxPause);
+  if (isToRetry_ && pause_.isOver(ports_.clock.now())) {
+    isToRetry_ = false;
     banners_->tryFailedAgain();
     for (const auto& retry : std::exchange(retries_, {})) retry();
   }
@@ -374,11 +371,11 @@ void ScheduledNotificationCenter::awaitNext() {
     }
   }
   if (isBehind_ || !retries_.empty()) {
-    if (!retryDate_) retryDate_ = now + pause_;
-    next = std::min(next.value_or(Date::max()), *retryDate_);
+    if (!std::exchange(isToRetry_, true)) pause_.failed(now);
+    next = std::min(next.value_or(Date::max()), pause_.end());
   } else {
-    retryDate_.reset();
-    if (!isBusy()) pause_ = minPause;
+    isToRetry_ = false;
+    if (!isBusy()) pause_.succeeded();
   }
   if (next)
     ports_.timer.arm(*next);

@@ -11,6 +11,7 @@
 #include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Ports/NotificationServer.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
+#include <Varnel/Platform/Values/GrowingPause.h>
 
 namespace Varnel::Platform {
 
@@ -97,8 +98,8 @@ class VARNEL_API ScheduledNotificationCenter final : public UserNotificationCent
   bool isBehind_ = false;    ///< Something is left that the last recheck should have done.
   std::string lastReport_;
   std::vector<std::function<void()>> retries_;
-  std::optional<Date> retryDate_;
-  std::chrono::seconds pause_ = minPause;
+  bool isToRetry_ = false;  ///< When the pause is over.
+  GrowingPause pause_{minPause, maxPause};
 };
 
 }  // namespace Varnel::Platform

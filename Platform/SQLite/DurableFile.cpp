@@ -46,8 +46,8 @@ bool isWorthALine(SQLiteFailure meaning) {
 
 // Whether the connection keeps a write-ahead log.
 bool keepsLog(SQLiteDatabase& database) {
-  auto mode = database.prepare("PRAGMA journal_mode");
-  return mode && mode->step() && mode->text(0) == "wal";
+  std::string mode;
+  return !database.row("PRAGMA journal_mode", std::tie(mode)) && mode == "wal";
 }
 
 bool isOfAnotherFormat(const std::optional<PlatformError>& error) {
@@ -121,7 +121,6 @@ DurableFile::Failure DurableFile::changeByOneStatement(const Work& work, Looking
   const Look look = looking == Looking::eachTime ? Look::atFiles : Look::atFilesAtTimes;
   return attempt(look, [&](SQLiteDatabase& database) {
     auto error = work(database);
-    database.finishCached();
     // The tables may be those of a later version by now.
     if (error && meaningOf(*error) == SQLiteFailure::other)
       if (auto objection = judgeFormat(database, format_, Migrating::never)) return objection;
@@ -146,11 +145,8 @@ void DurableFile::checkpoint() {
 
 std::int64_t DurableFile::damageCount() {
   std::int64_t count = 0;
-  static_cast<void>(read([&](SQLiteDatabase& database) -> Failure {
-    const auto found = database.integer("SELECT damages FROM durable_file");
-    if (!found) return found.error();
-    count = found->value_or(0);
-    return std::nullopt;
+  static_cast<void>(read([&](SQLiteDatabase& database) {
+    return database.row("SELECT damages FROM durable_file", std::tie(count));
   }));
   return count;
 }
@@ -312,13 +308,11 @@ DurableFile::Failure DurableFile::setUp(SQLiteDatabase& database, const std::str
 }
 
 DurableFile::Failure DurableFile::check() {
-  auto verdict = connection_->database.prepare("PRAGMA quick_check(1)");
-  if (!verdict) return verdict.error();
-  const auto step = verdict->step();
-  if (!step) return step.error();
-  const std::string found(verdict->text(0).value_or("no verdict"));
-  if (found == "ok") return std::nullopt;
-  return fileError(SQLiteFailure::damaged, found);
+  std::string verdict = "no verdict";
+  if (auto error = connection_->database.row("PRAGMA quick_check(1)", std::tie(verdict)))
+    return error;
+  if (verdict == "ok") return std::nullopt;
+  return fileError(SQLiteFailure::damaged, verdict);
 }
 
 DurableFile::Failure DurableFile::setAside(const PlatformError& damage) {

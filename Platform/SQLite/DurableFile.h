@@ -23,10 +23,8 @@ class SystemLog;
 /// whatever happens to the process, and as far as possible whatever happens to the file.
 ///
 ///     DurableFile file({files, systemLog}, path, format, Migrating::allowed);
-///     auto error = file.change([&](SQLiteDatabase& database) -> std::optional<PlatformError> {
-///       auto insert = database.cached("INSERT OR IGNORE INTO note(uuid, text) VALUES(?, ?)");
-///       if (!insert) return insert.error();
-///       …
+///     auto error = file.change([&](SQLiteDatabase& database) {
+///       return database.run("INSERT OR IGNORE INTO note(uuid, text) VALUES(?, ?)", uuid, text);
 ///     });
 ///     if (error) tryLater(meaningOf(*error));
 ///

@@ -26,16 +26,16 @@ struct FoundFormat {
 };
 
 Result<FoundFormat> formatOf(SQLiteDatabase& database) {
-  const auto applicationID = database.integer("PRAGMA application_id");
-  if (!applicationID) return applicationID.error();
-  const auto version = database.integer("PRAGMA user_version");
-  if (!version) return version.error();
-  const auto entries = database.integer("SELECT count(*) FROM sqlite_master");
-  if (!entries) return entries.error();
-  const auto number = static_cast<int>(version->value_or(0));
-  return FoundFormat{.applicationID = applicationID->value_or(0),
-                     .version = {number / minorsPerMajor, number % minorsPerMajor},
-                     .isEmpty = applicationID->value_or(0) == 0 && number == 0 && *entries == 0};
+  std::int64_t applicationID = 0;
+  int version = 0;
+  std::int64_t entries = 0;
+  auto error = database.row("PRAGMA application_id", std::tie(applicationID));
+  if (!error) error = database.row("PRAGMA user_version", std::tie(version));
+  if (!error) error = database.row("SELECT count(*) FROM sqlite_master", std::tie(entries));
+  if (error) return *error;
+  return FoundFormat{.applicationID = applicationID,
+                     .version = {version / minorsPerMajor, version % minorsPerMajor},
+                     .isEmpty = applicationID == 0 && version == 0 && entries == 0};
 }
 
 bool canMigrate(const DurableFormat& format, FormatVersion version, Migrating migrating) {
@@ -47,10 +47,11 @@ bool canMigrate(const DurableFormat& format, FormatVersion version, Migrating mi
 // A file that calls itself one of this very version has its tables.
 Failure missingTable(SQLiteDatabase& database, const DurableFormat& format) {
   for (const SavedTable& table : format.tables) {
-    const auto found = database.integer(fmt::format(
-        "SELECT count(*) FROM sqlite_master WHERE type = 'table' AND name = '{}'", table.name));
-    if (!found) return found.error();
-    if (*found == 0)
+    bool isThere = false;
+    if (auto error = database.row("SELECT 1 FROM sqlite_master WHERE type = 'table' AND name = ?",
+                                  std::tie(isThere), table.name))
+      return error;
+    if (!isThere)
       return fileError(SQLiteFailure::damaged, fmt::format("there is no table {}", table.name));
   }
   return std::nullopt;

@@ -30,10 +30,11 @@ struct Migration final {
 
 /// A table whose rows are saved when the file that holds them is lost or damaged. Rows are inserted
 /// where no row with the same key exists: a row of the schema itself stays, and so does one that
-/// was written since. Leave out a row number that the file gives itself.
+/// was written since.
 struct SavedTable final {
   std::string name;
-  std::vector<std::string> columns;
+  /// A number by which the file itself counts the rows: a saved row gets a new one.
+  std::string ownNumber = {};
 };
 
 /// Whether a file of an earlier version may be changed into one of this.

@@ -106,32 +106,31 @@ Result<SQLiteStatement> SQLiteDatabase::prepare(std::string_view sql) {
 }
 
 Result<SQLiteStatement*> SQLiteDatabase::cached(std::string_view sql) {
-  if (const auto found = cached_.find(sql); found != cached_.end()) {
-    found->second.reset();
-    return &found->second;
-  }
+  if (const auto found = cached_.find(sql); found != cached_.end()) return &found->second;
   auto statement = prepare(sql);
   if (!statement) return statement.error();
   return &cached_.emplace(sql, std::move(*statement)).first->second;
 }
 
-void SQLiteDatabase::finishCached() {
-  for (auto& [sql, statement] : cached_) statement.reset();
-}
-
-Result<std::optional<std::int64_t>> SQLiteDatabase::integer(std::string_view sql) {
-  auto statement = prepare(sql);
-  if (!statement) return statement.error();
-  const auto step = statement->step();
-  if (!step) return step.error();
-  return *step == SQLiteStatement::Step::row ? statement->integer(0) : std::nullopt;
+// A statement that is not run to its end would hold locks.
+std::optional<PlatformError> SQLiteDatabase::runToEnd(SQLiteStatement& statement,
+                                                      const TakeRow& take) {
+  struct Reset {
+    SQLiteStatement& statement;
+    ~Reset() { statement.reset(); }
+  } const reset{statement};
+  while (true) {
+    const auto step = statement.step();
+    if (!step) return step.error();
+    if (*step == SQLiteStatement::Step::done) return std::nullopt;
+    if (take) take(statement);
+  }
 }
 
 std::optional<PlatformError> SQLiteDatabase::transaction(
     const char* begin, const std::function<std::optional<PlatformError>(SQLiteDatabase&)>& work) {
   if (auto error = execute(begin)) return error;
   auto error = work(*this);
-  finishCached();
   if (!error) error = execute("COMMIT");
   // This fails if the error has already ended the transaction.
   if (error) static_cast<void>(execute("ROLLBACK"));

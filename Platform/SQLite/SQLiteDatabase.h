@@ -23,8 +23,13 @@ class LockDeadline;
 ///
 ///     auto database = SQLiteDatabase::open(path);
 ///     if (!database) return report(database.error());
-///     auto statement = database->prepare("SELECT name FROM person WHERE age > ?");
-///     …
+///     auto error = database->run("INSERT INTO person(name, born) VALUES(?, ?)", name, date);
+///     error = database->each("SELECT name FROM person WHERE born > ?", [&](SQLiteStatement& row) {
+///       row.read(std::tie(names.emplace_back()));
+///     }, date);
+///     error = database->row("SELECT count(*), min(born) FROM person", std::tie(count, oldest));
+///
+/// Parameters are what `SQLiteStatement::bind` takes, results what its `read` gives.
 ///
 /// One thread at a time. Statements must be gone before their database. An error has the domain
 /// "SQLite", the library's extended result code, and its message; `meaningOf` tells what to make of
@@ -54,14 +59,34 @@ class SQLiteDatabase final {
   /// Compiles one statement.
   [[nodiscard]] Result<SQLiteStatement> prepare(std::string_view sql);
 
-  /// The statement, compiled once and kept as long as the connection, ready to run.
-  [[nodiscard]] Result<SQLiteStatement*> cached(std::string_view sql);
+  using TakeRow = std::function<void(SQLiteStatement& row)>;
 
-  /// Ends what kept statements have begun and not finished: it would hold locks.
-  void finishCached();
+  /// The next three run one statement with these parameters to its end, and return the error, or
+  /// none. It is compiled once, and kept as long as the connection.
+  template <typename... Parameters>
+  [[nodiscard]] std::optional<PlatformError> run(std::string_view sql,
+                                                 const Parameters&... parameters) {
+    return each(sql, nullptr, parameters...);
+  }
 
-  /// The first column of the first row; absent for NULL and where there is no row.
-  [[nodiscard]] Result<std::optional<std::int64_t>> integer(std::string_view sql);
+  /// Hands each row to `take`, which must not run the same statement.
+  template <typename... Parameters>
+  [[nodiscard]] std::optional<PlatformError> each(std::string_view sql, const TakeRow& take,
+                                                  const Parameters&... parameters) {
+    const auto statement = cached(sql);
+    if (!statement) return statement.error();
+    int index = 0;
+    ((*statement)->bind(++index, parameters), ...);
+    return runToEnd(**statement, take);
+  }
+
+  /// Reads the only row into variables, which keep what they hold where there is none.
+  template <typename... Values, typename... Parameters>
+  [[nodiscard]] std::optional<PlatformError> row(std::string_view sql, std::tuple<Values&...> into,
+                                                 const Parameters&... parameters) {
+    return each(
+        sql, [&](SQLiteStatement& row) { row.read(into); }, parameters...);
+  }
 
   /// Does the work between BEGIN and COMMIT; when either or the work fails, nothing is changed.
   [[nodiscard]] std::optional<PlatformError> transaction(
@@ -89,6 +114,9 @@ class SQLiteDatabase final {
 
   using Connection = UniqueHandle<sqlite3*, close>;
   explicit SQLiteDatabase(Connection connection) : connection_(std::move(connection)) {}
+  [[nodiscard]] Result<SQLiteStatement*> cached(std::string_view sql);
+  [[nodiscard]] static std::optional<PlatformError> runToEnd(SQLiteStatement& statement,
+                                                             const TakeRow& take);
 
   Connection connection_;
   std::map<std::string, SQLiteStatement, std::less<>> cached_;

@@ -30,7 +30,7 @@ void SQLiteStatement::bind(int index, std::string_view text) {
                                  text.size(), SQLITE_TRANSIENT, SQLITE_UTF8));
 }
 
-void SQLiteStatement::bindNull(int index) {
+void SQLiteStatement::bind(int index, std::nullopt_t) {
   expectOK(::sqlite3_bind_null(statement_.get(), index));
 }
 

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/SQLite/Salvage.h>
 
-#include <algorithm>
+#include <set>
 
 #include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 #include <Varnel/Platform/SQLite/SQLiteFailure.h>
@@ -14,17 +14,22 @@ namespace {
 using Failure = std::optional<PlatformError>;
 using Step = SQLiteStatement::Step;
 
-// Those columns that the damaged file has, too: it may be of an earlier version.
-std::vector<std::string> columnsIn(SQLiteDatabase& from, const SavedTable& table) {
+// None where the table cannot be read at all.
+std::set<std::string> columnsOf(SQLiteDatabase& database, const std::string& table) {
+  std::set<std::string> columns;
+  static_cast<void>(database.each(
+      "SELECT name FROM pragma_table_info(?)",
+      [&](SQLiteStatement& row) { columns.emplace(row.text(0).value_or("")); }, table));
+  return columns;
+}
+
+// Those columns that both files have: the damaged one may be of another version.
+std::vector<std::string> sharedColumns(SQLiteDatabase& from, SQLiteDatabase& to,
+                                       const SavedTable& table) {
+  const std::set<std::string> there = columnsOf(to, table.name);
   std::vector<std::string> columns;
-  auto rows = from.prepare("SELECT name FROM pragma_table_info(?)");
-  if (!rows) return columns;
-  rows->bind(1, table.name);
-  for (auto step = rows->step(); step && *step == Step::row; step = rows->step()) {
-    const std::string name(rows->text(0).value_or(""));
-    if (std::find(table.columns.begin(), table.columns.end(), name) != table.columns.end())
-      columns.push_back(name);
-  }
+  for (const std::string& column : columnsOf(from, table.name))
+    if (there.contains(column) && column != table.ownNumber) columns.push_back(column);
   return columns;
 }
 
@@ -55,7 +60,7 @@ Result<Reading> copyRows(SQLiteDatabase& from, SQLiteStatement& insert, const st
 
 Failure salvage(SQLiteDatabase& from, SQLiteDatabase& to, std::span<const SavedTable> tables) {
   for (const SavedTable& table : tables) {
-    const auto columns = columnsIn(from, table);
+    const auto columns = sharedColumns(from, to, table);
     if (columns.empty()) continue;
     const auto names = fmt::format("{}", fmt::join(columns, ", "));
     const std::vector<std::string_view> marks(columns.size(), "?");

@@ -30,7 +30,7 @@ inline Platform::DurableFormat notes(Journal journal) {
           .migrations = {},
           .journal = journal,
           .synchronisation = Platform::DurableFormat::Synchronisation::survivesKill,
-          .tables = {{"note", {"key"}}}};
+          .tables = {{.name = "note", .ownNumber = "id"}}};
 }
 
 /// Keeps what the system's log would be told.
@@ -65,26 +65,16 @@ struct Notebook final {
   /// All keys in a row, or what the error means.
   std::string keys() {
     std::string found;
-    const auto error = file.read([&](Platform::SQLiteDatabase& database) -> Failure {
+    const auto error = file.read([&](Platform::SQLiteDatabase& database) {
       found.clear();
-      const auto rows = database.cached("SELECT key FROM note ORDER BY key");
-      if (!rows) return rows.error();
-      while (true) {
-        const auto step = (*rows)->step();
-        if (!step) return step.error();
-        if (*step == Platform::SQLiteStatement::Step::done) return std::nullopt;
-        found += (*rows)->text(0).value_or("");
-      }
+      return database.each("SELECT key FROM note ORDER BY key",
+                           [&](auto& row) { found += row.text(0).value_or(""); });
     });
     return error ? meaning(error) : found;
   }
 
   static Failure insert(Platform::SQLiteDatabase& database, const std::string& key) {
-    const auto insert = database.cached("INSERT OR IGNORE INTO note(key) VALUES(?)");
-    if (!insert) return insert.error();
-    (*insert)->bind(1, key);
-    const auto step = (*insert)->step();
-    return step ? Failure() : step.error();
+    return database.run("INSERT OR IGNORE INTO note(key) VALUES(?)", key);
   }
 
   static std::string meaning(const Failure& error) {
