@@ -48,7 +48,9 @@ Delivery::Step Delivery::step(Haste haste, std::stop_token stop) {
     if (!isDue || stop.stop_requested()) election_.reset();
     if (!isDue || stop.stop_requested() || hasSent) return step;
     if (!election_) {
-      election_ = spool_.elect();
+      auto elected = spool_.elect();
+      if (!elected) return fileIsAway();
+      election_ = std::move(*elected);
       // Looked at again: the deliverer before may just have sent this.
       if (election_) continue;
       step.state = State::elsewhere;
@@ -59,7 +61,7 @@ Delivery::Step Delivery::step(Haste haste, std::stop_token stop) {
     auto events = spool_.waiting(policy_.maxBatchEvents, policy_.maxBatchBytes);
     if (events.empty()) events = spool_.refused(policy_.maxRefusals);
     if (events.empty()) return fileIsAway();
-    send(std::move(events), outlook->state.failures, stop);
+    send(std::move(events), outlook->state, stop);
     if (!saveOutcome()) return fileIsAway();
     hasSent = true;
   }
@@ -97,7 +99,8 @@ Delivery::Step Delivery::fileIsAway() {
   return {.state = State::fileAway, .next = filePause_.end(), .waiting = 0};
 }
 
-void Delivery::send(std::vector<SpooledEvent> events, int failures, std::stop_token stop) {
+void Delivery::send(std::vector<SpooledEvent> events, const DeliveryState& before,
+                    std::stop_token stop) {
   const auto answer = ports_.httpClient.post(HTTPPost{.url = endpoint_.url,
                                                       .contentType = "text/plain; charset=utf-8",
                                                       .body = batchOf(events, ports_.clock.now()),
@@ -112,11 +115,11 @@ void Delivery::send(std::vector<SpooledEvent> events, int failures, std::stop_to
               .date = ports_.clock.now(),
               .state = {.server = endpoint_.url, .notBefore = {}}};
   if (outcome_->verdict == Verdict::delivered) return;
-  outcome_->state.failures = failures + 1;
-  const bool isOffline = !answer && answer.error().isOffline;
-  outcome_->state.notBefore =
-      outcome_->date + policy_.retryDelay(failures + 1,
-                                          isOffline ? Obstacle::network : Obstacle::server,
+  DeliveryState& state = outcome_->state;
+  state.obstacle = !answer && answer.error().isOffline ? Obstacle::network : Obstacle::server;
+  state.failures = state.obstacle == before.obstacle ? before.failures + 1 : 1;
+  state.notBefore =
+      outcome_->date + policy_.retryDelay(state.failures, state.obstacle,
                                           answer ? answer->retryAfter : std::nullopt, random_());
 }
 

@@ -76,7 +76,7 @@ class Delivery final {
                                                                   Haste haste) const;
   [[nodiscard]] bool saveOutcome();
   [[nodiscard]] Step fileIsAway();
-  void send(std::vector<SpooledEvent> events, int failures, std::stop_token stop);
+  void send(std::vector<SpooledEvent> events, const DeliveryState& before, std::stop_token stop);
 
   const Ports ports_;
   EventSpool& spool_;

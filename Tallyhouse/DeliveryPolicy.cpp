@@ -27,9 +27,11 @@ DeliveryPolicy::Duration DeliveryPolicy::retryDelay(int failures, Obstacle obsta
   const auto part = [](Duration whole, double ratio) {
     return std::chrono::duration_cast<Duration>(whole * ratio);
   };
-  Duration delay = obstacle == Obstacle::network ? firstRetryOffline : firstRetry;
-  for (int i = 1; i < failures && delay < maxRetryDelay; ++i) delay *= 2;
-  delay = std::min(delay, maxRetryDelay);
+  const bool isOffline = obstacle == Obstacle::network;
+  const Duration max = isOffline ? maxRetryOffline : maxRetryDelay;
+  Duration delay = isOffline ? firstRetryOffline : firstRetry;
+  for (int i = 1; i < failures && delay < max; ++i) delay *= 2;
+  delay = std::min(delay, max);
   delay -= part(delay, share / 2);
   // Compared in the server's own unit, in which its figure cannot overflow.
   const auto maxGranted = std::chrono::duration_cast<std::chrono::seconds>(maxRetryAfter);

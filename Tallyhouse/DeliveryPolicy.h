@@ -43,6 +43,7 @@ struct VARNEL_API DeliveryPolicy final {
   Duration linger = std::chrono::seconds(5);  ///< For how long an event waits for company.
   Duration firstRetryOffline = std::chrono::seconds(5);  ///< Installations are offline one by one.
   Duration firstRetry = std::chrono::minutes(30);        ///< A server fails all of them together.
+  Duration maxRetryOffline = std::chrono::minutes(1);
   Duration maxRetryDelay = std::chrono::hours(2);
   Duration maxRetryAfter = std::chrono::hours(24);  ///< The longest pause that is granted.
   int maxRefusals = 3;  ///< After this many refusals an event is set aside.
@@ -55,9 +56,10 @@ struct VARNEL_API DeliveryPolicy final {
   /// What an HTTP status means; no status means that there was no answer.
   [[nodiscard]] static Verdict verdict(std::optional<int> status);
 
-  /// How long to leave the server alone after the last of `failures` (1 or more) in a row. The
-  /// pause doubles each time, and is shortened by up to half at random (0 to 1). A server that asks
-  /// for a pause gets that one, lengthened by up to itself at random, if it is the longer.
+  /// How long to leave the server alone after the last of `failures` (1 or more) in a row by this
+  /// obstacle. The pause doubles each time, and is shortened by up to half at random (0 to 1). A
+  /// server that asks for a pause gets that one, lengthened by up to itself at random, if it is the
+  /// longer.
   [[nodiscard]] Duration retryDelay(int failures, Obstacle obstacle,
                                     std::optional<std::chrono::seconds> retryAfter,
                                     double random) const;

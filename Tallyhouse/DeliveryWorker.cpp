@@ -44,7 +44,7 @@ void DeliveryWorker::resume() {
   const std::lock_guard lock(mutex_);
   if (!isPaused_) return;
   transfer_ = std::stop_source();
-  if (!thread_.joinable()) thread_ = Varnel::Platform::startThread("analytics", [this] { run(); });
+  start();
   isPaused_ = false;
   isWoken_ = true;
   changed_.notify_all();
@@ -57,8 +57,13 @@ void DeliveryWorker::pause() {
   changed_.notify_all();
 }
 
+void DeliveryWorker::start() {
+  if (!thread_.joinable()) thread_ = Varnel::Platform::startThread("analytics", [this] { run(); });
+}
+
 void DeliveryWorker::wake() {
   const std::lock_guard lock(mutex_);
+  if (recorder_.mustEmpty()) start();
   isWoken_ = true;
   changed_.notify_all();
 }

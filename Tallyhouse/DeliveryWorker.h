@@ -26,8 +26,8 @@ class EventRecorder;
 /// While another process delivers, it looks again after the policy's pause as long as events wait,
 /// and every ten minutes when none did.
 ///
-/// Any thread. The thread starts with the first `resume`; destruction interrupts a transfer and
-/// ends it.
+/// Any thread. The thread starts with the first `resume`, or to empty the spool; destruction
+/// interrupts a transfer and ends it.
 class DeliveryWorker final {
  public:
   DeliveryWorker(Varnel::Platform::Clock& clock, EventRecorder& recorder, EventSpool& spool,
@@ -50,6 +50,7 @@ class DeliveryWorker final {
   bool drain(std::chrono::milliseconds timeout);
 
  private:
+  void start();
   void run();
   // The next two are called with the lock held, which is held again on return. Absent: nothing is
   // to be done until something new comes.

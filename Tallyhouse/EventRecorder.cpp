@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <functional>
+#include <random>
 #include <tuple>
 #include <utility>
 #include <vector>
@@ -47,8 +48,9 @@ Error addDropped(SQLiteDatabase& database, std::int64_t count, std::int64_t last
 // another process's event has the number.
 Error insertOnce(SQLiteDatabase& database, SpooledEvent& event) {
   for (;; ++event.id) {
-    auto error = database.run("INSERT OR IGNORE INTO event(id, date, uuid, hit) VALUES(?, ?, ?, ?)",
-                              event.id, event.date, event.uuid, event.hit);
+    auto error = database.run(
+        "INSERT OR IGNORE INTO event(id, date, origin, uuid, hit) VALUES(?, ?, ?, ?, ?)", event.id,
+        event.date, event.origin, event.uuid, event.hit);
     if (error || database.changedRows() > 0) return error;
     bool isThere = false;
     error = database.row("SELECT uuid = ? FROM event WHERE id = ?", std::tie(isThere), event.uuid,
@@ -109,6 +111,7 @@ EventRecorder::EventRecorder(Ports ports, std::string path, SpoolLimits limits)
     : ports_(ports),
       path_(path),
       limits_(limits),
+      origin_(std::random_device()()),
       file_({ports.privateFiles, ports.systemLog}, path, spoolFormat(),
             Varnel::Platform::Migrating::allowed) {}
 
@@ -151,7 +154,10 @@ SpooledEvent EventRecorder::named(std::string_view uuid, Date date, std::string_
   const std::int64_t id = std::clamp<std::int64_t>(time.count(), 0, maxTime) << randomBits |
                           static_cast<std::int64_t>(random);
   const std::lock_guard lock(mutex_);
-  if (isRevoked_) return {};
+  if (isRevoked_) {
+    own_.hasLost = true;
+    return {};
+  }
   lastID_ = std::max(lastID_ + 1, id);
   if (own_.first == 0) own_.first = lastID_;
   own_.last = lastID_;
@@ -160,6 +166,7 @@ SpooledEvent EventRecorder::named(std::string_view uuid, Date date, std::string_
           .date = date,
           .hit = std::string(hit),
           .refusals = 0,
+          .origin = origin_,
           .epoch = own_.epoch};
 }
 
@@ -173,9 +180,9 @@ bool EventRecorder::insert(const SpooledEvent& event) {
   bool isInserted = false;
   const auto write = [&](SQLiteDatabase& database) {
     auto failure = database.run(
-        "INSERT OR IGNORE INTO event(id, date, uuid, hit) SELECT ?, ?, ?, ?"
+        "INSERT OR IGNORE INTO event(id, date, origin, uuid, hit) SELECT ?, ?, ?, ?, ?"
         " WHERE coalesce((SELECT epoch FROM state), 0) <= ?",
-        event.id, event.date, event.uuid, event.hit, event.epoch);
+        event.id, event.date, event.origin, event.uuid, event.hit, event.epoch);
     isInserted = !failure && database.changedRows() > 0;
     return failure;
   };
@@ -204,23 +211,22 @@ std::int64_t EventRecorder::hold(SpooledEvent event) {
 void EventRecorder::countDropped() {
   const std::lock_guard lock(mutex_);
   ++dropped_;
+  own_.hasLost = true;
 }
 
 void EventRecorder::discard() {
   const std::lock_guard atFile(fileMutex_);
+  const bool isThere = file_.isThere();
   {
     const std::lock_guard lock(mutex_);
     held_.clear();
     heldBytes_ = 0;
     own_ = {};
-    refusal_ = numberOf(ports_.clock.now());
+    refusal_.reset();
+    if (isThere) refusal_ = numberOf(ports_.clock.now());
   }
   settle(file_, Haste::none);
   file_.removeSetAside();
-  // Nor must it be found in the log.
-  static_cast<void>(file_.changeByOneStatement([](SQLiteDatabase& database) {
-    return database.execute("PRAGMA wal_checkpoint(TRUNCATE)");
-  }));
 }
 
 std::optional<Date> EventRecorder::settle(DurableFile& file, Haste haste) {
@@ -240,6 +246,11 @@ std::optional<Date> EventRecorder::settle(DurableFile& file, Haste haste) {
   }
   const auto error =
       file.change([&](SQLiteDatabase& database) { return work.doIn(database, limits_); });
+  // What is forgotten must not be found in the log either.
+  if (!error && work.refusal)
+    static_cast<void>(file.changeByOneStatement([](SQLiteDatabase& database) {
+      return database.execute("PRAGMA wal_checkpoint(TRUNCATE)");
+    }));
   const std::lock_guard lock(mutex_);
   isSettling_ = false;
   if (error) return pause_.end();
@@ -281,6 +292,7 @@ void EventRecorder::seen(std::int64_t waiting) {
 OwnEvents EventRecorder::own() const {
   const std::lock_guard lock(mutex_);
   OwnEvents own = own_;
+  own.origin = origin_;
   own.isHeld = !held_.empty();
   return own;
 }

@@ -39,6 +39,7 @@ struct OwnEvents final {
   std::int64_t first = 0;  ///< 0: none.
   std::int64_t last = 0;
   std::int64_t epoch = 0;
+  std::int64_t origin = 0;
   bool isHeld = false;   ///< Some are not in the file yet.
   bool hasLost = false;  ///< Some had to be given up.
 };
@@ -78,7 +79,7 @@ class EventRecorder final {
 
   /// Empties the spool and begins a new epoch in it, so that what other processes hold is not
   /// written either; removes files that were set aside. Where the file does not allow that yet,
-  /// `settle` goes on trying.
+  /// `settle` goes on trying. Where nothing was ever kept no file is made.
   void discard();
 
   enum class Haste {
@@ -117,6 +118,7 @@ class EventRecorder final {
   const Ports ports_;
   const std::string path_;
   const SpoolLimits limits_;
+  const std::int64_t origin_;  ///< Tells its events from those of others.
 
   std::mutex fileMutex_;  ///< Owns the file. Taken before the other mutex.
   Varnel::Platform::DurableFile file_;

@@ -3,7 +3,9 @@
 
 #include <limits>
 #include <tuple>
+#include <utility>
 
+#include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Tallyhouse/EventRecorder.h>
 #include <fmt/format.h>
 
@@ -34,8 +36,12 @@ EventSpool::EventSpool(Ports ports, std::string path)
       path_(std::move(path)),
       file_(ports, path_, spoolFormat(), Varnel::Platform::Migrating::allowed) {}
 
-std::unique_ptr<Varnel::Platform::FileLock> EventSpool::elect() {
-  return ports_.privateFiles.tryLock(path_ + ".deliverer").valueOr(nullptr);
+Varnel::Platform::Result<std::unique_ptr<Varnel::Platform::FileLock>> EventSpool::elect() {
+  auto lock = ports_.privateFiles.tryLock(path_ + ".deliverer");
+  if (!lock && !std::exchange(hasSaid_, true))
+    ports_.systemLog.write(
+        fmt::format("Events cannot be delivered: {}", lock.error().localizedDescription()));
+  return lock;
 }
 
 std::optional<SpoolOutlook> EventSpool::look(const std::string& server, std::size_t maxEvents,
@@ -52,8 +58,9 @@ std::optional<SpoolOutlook> EventSpool::look(const std::string& server, std::siz
     failure = database.row("SELECT min(refused_at) FROM event WHERE refusals > 0 AND refusals < ?",
                            std::tie(refused), maxRefusals);
     if (failure) return failure;
-    return database.row("SELECT nullif(not_before, 0), failures FROM state WHERE server = ?",
-                        std::tie(outlook.state.notBefore, outlook.state.failures), server);
+    return database.row(
+        "SELECT nullif(not_before, 0), obstacle, failures FROM state WHERE server = ?",
+        std::tie(outlook.state.notBefore, outlook.state.obstacle, outlook.state.failures), server);
   });
   return error ? std::nullopt : std::optional(outlook);
 }
@@ -92,9 +99,10 @@ bool EventSpool::save(const DeliveryOutcome& outcome) {
     for (const SpooledEvent& event : outcome.events)
       if (auto failure = settle(database, event, outcome)) return failure;
     return database.run(
-        "INSERT INTO state(id, server, not_before, failures) VALUES(1, ?1, ?2, ?3)"
-        " ON CONFLICT(id) DO UPDATE SET server = ?1, not_before = ?2, failures = ?3",
-        outcome.state.server, outcome.state.notBefore.value_or(Date()), outcome.state.failures);
+        "INSERT INTO state(id, server, not_before, obstacle, failures) VALUES(1, ?1, ?2, ?3, ?4)"
+        " ON CONFLICT(id) DO UPDATE SET server = ?1, not_before = ?2, obstacle = ?3, failures = ?4",
+        outcome.state.server, outcome.state.notBefore.value_or(Date()),
+        static_cast<int>(outcome.state.obstacle), outcome.state.failures);
   });
 }
 
@@ -105,9 +113,9 @@ bool EventSpool::isDelivered(const OwnEvents& events) {
   // Those that are gone may also have been pushed out, or have been discarded by another process.
   const auto error = file_.read([&](SQLiteDatabase& database) {
     return database.row(
-        "SELECT NOT EXISTS (SELECT 1 FROM event WHERE id BETWEEN ?1 AND ?2)"
+        "SELECT NOT EXISTS (SELECT 1 FROM event WHERE id BETWEEN ?1 AND ?2 AND origin = ?4)"
         " AND NOT EXISTS (SELECT 1 FROM state WHERE lost_through >= ?1 OR epoch > ?3)",
-        std::tie(isDelivered), events.first, events.last, events.epoch);
+        std::tie(isDelivered), events.first, events.last, events.epoch, events.origin);
   });
   return !error && isDelivered;
 }

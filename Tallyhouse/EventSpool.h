@@ -23,7 +23,8 @@ struct OwnEvents;
 struct DeliveryState final {
   std::string server;
   std::optional<Varnel::Platform::Date> notBefore;  ///< The end of the pause, if there is one.
-  int failures = 0;                                 ///< In a row.
+  Obstacle obstacle = Obstacle::network;            ///< Of the last failure.
+  int failures = 0;                                 ///< In a row by this obstacle.
 };
 
 /// What a deliverer has to know before it sends.
@@ -52,8 +53,9 @@ class EventSpool final {
 
   EventSpool(Ports ports, std::string path);
 
-  /// Makes this the one deliverer, until the lock goes. Null when there is another.
-  [[nodiscard]] std::unique_ptr<Varnel::Platform::FileLock> elect();
+  /// Makes this the one deliverer, until the lock goes. Null when there is another. The system's
+  /// log is told once of an error: nobody delivers then.
+  [[nodiscard]] Varnel::Platform::Result<std::unique_ptr<Varnel::Platform::FileLock>> elect();
 
   /// Absent when the file cannot be had. Counts the waiting events up to `maxEvents`; the state is
   /// that of the server.
@@ -83,6 +85,7 @@ class EventSpool final {
   const Ports ports_;
   const std::string path_;
   Varnel::Platform::DurableFile file_;
+  bool hasSaid_ = false;
 };
 
 }  // namespace Tallyhouse

@@ -15,6 +15,7 @@ const DurableFormat& spoolFormat() {
       .schema =
           "CREATE TABLE event(id INTEGER PRIMARY KEY, date INTEGER NOT NULL,"
           " refusals INTEGER NOT NULL DEFAULT 0, refused_at INTEGER NOT NULL DEFAULT 0,"
+          " origin INTEGER NOT NULL,"  // Which recorder took it.
           " uuid TEXT NOT NULL, hit TEXT NOT NULL);"
           "CREATE INDEX refused ON event(refused_at) WHERE refusals > 0;"
           // Its row is made by the first who has something to say.
@@ -22,9 +23,10 @@ const DurableFormat& spoolFormat() {
           " epoch INTEGER NOT NULL DEFAULT 0,"
           " dropped INTEGER NOT NULL DEFAULT 0,"       // Events pushed out or given up.
           " lost_through INTEGER NOT NULL DEFAULT 0,"  // The last of those pushed out.
-          " server TEXT NOT NULL DEFAULT '',"          // Whom the next two are about.
+          " server TEXT NOT NULL DEFAULT '',"          // Whom the next three are about.
           " not_before INTEGER NOT NULL DEFAULT 0,"    // The end of the pause; 0: none.
-          " failures INTEGER NOT NULL DEFAULT 0);",    // Of attempts to send, in a row.
+          " obstacle INTEGER NOT NULL DEFAULT 0,"      // Why the last attempts failed,
+          " failures INTEGER NOT NULL DEFAULT 0);",    // and how many in a row.
       .migrations = {},
       .journal = DurableFormat::Journal::writeAhead,
       .synchronisation = DurableFormat::Synchronisation::survivesKill,

@@ -151,6 +151,13 @@ std::int64_t DurableFile::damageCount() {
   return count;
 }
 
+bool DurableFile::isThere() const {
+  bool isThere = connection_ != nullptr;
+  for (const char* suffix : {"", "-wal", "-journal", turnSuffix, pendingSuffix})
+    isThere = isThere || ports_.privateFiles.identity(path_ + suffix);
+  return isThere;
+}
+
 void DurableFile::removeSetAside() {
   for (const char* aside : {pendingSuffix, asideSuffix}) {
     static_cast<void>(ports_.privateFiles.remove(path_ + aside));

@@ -87,6 +87,9 @@ class DurableFile final {
   /// How often the file was damaged or taken away; 0 also when that cannot be told.
   [[nodiscard]] std::int64_t damageCount();
 
+  /// Whether it is open, or it, a journal or a sign that it was opened once lies there.
+  [[nodiscard]] bool isThere() const;
+
   /// Removes what was set aside.
   void removeSetAside();
 

@@ -8,10 +8,14 @@
 namespace Orvane {
 
 int AnalyticsCommand::run(Console& console) const {
-  const bool isKept = !answer || storeConsent(*answer, console);
-  // Whether it is kept or not: the user wants these events gone.
-  const bool isDone = answer != Tallyhouse::Consent::refused || ScanAnalytics::discardEvents();
+  using enum Tallyhouse::Consent;
+  bool isKept = answer != refused || storeConsent(refused, console);
+  // Whether it is kept or not: the user wants these events gone. And what an earlier refusal could
+  // not throw away must not be sent by a later consent.
+  const bool mustDiscard = answer == refused || (answer && storedConsent() == refused);
+  const bool isDone = !mustDiscard || ScanAnalytics::discardEvents();
   if (!isDone) console.complain("the events that wait cannot be thrown away now; try again");
+  if (isDone && answer == granted) isKept = storeConsent(granted, console);
   if (!isKept || !isDone) return 1;
   return console.writeResult("consent: " + textOf(storedConsent()) + "\n") ? 0 : 1;
 }

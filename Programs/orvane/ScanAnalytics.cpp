@@ -59,14 +59,14 @@ bool ScanAnalytics::isEndpoint(const std::string& text) {
   return url->hasScheme("https") || (url->hasScheme("http") && isOnThisMachine(*url));
 }
 
-bool ScanAnalytics::discardEvents() {
+bool ScanAnalytics::discardEvents(std::chrono::milliseconds patience) {
   // It is never started, and so sends nothing, wherever that would go.
   const auto transport =
       SpoolingTransport::make({.endpoint = *URL::parse("https://nowhere.invalid/"),
                                .trackingID = {},
                                .clientID = {},
                                .spoolPath = Varnel::ApplicationData::analyticsSpoolPath()});
-  for (const auto end = std::chrono::steady_clock::now() + maxGoodbye;;) {
+  for (const auto end = std::chrono::steady_clock::now() + patience;;) {
     transport->discardAll();
     if (transport->hasDiscardedAll()) return true;
     if (std::chrono::steady_clock::now() > end) return false;
@@ -83,6 +83,8 @@ ScanAnalytics::ScanAnalytics(const std::optional<std::string>& endpoint, bool pr
                      std::string(consent == Consent::refused ? "the user has refused"
                                                              : "the user has not been asked") +
                      " (orvane analytics consent yes)");
+  // The command that kept the refusal may have been killed before it came to that.
+  if (endpoint && consent == Consent::refused) discardEvents(std::chrono::milliseconds(0));
   if (!sends && !printsEvents) return;
   identifyUser();
   if (sends) transport_ = transportTo(*URL::parse(*endpoint));

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <cstdint>
 #include <memory>
 #include <optional>
@@ -19,11 +20,12 @@ class ScanAnalytics final {
   /// Whether events can be sent there: by https, or within this machine by http as well.
   [[nodiscard]] static bool isEndpoint(const std::string& text);
 
-  /// Empties the product's spool. Returns whether it is empty: others may keep it for longer than a
-  /// moment, and it may not be had at all.
-  [[nodiscard]] static bool discardEvents();
+  /// Empties the product's spool. Returns whether it is empty: others may keep it for longer than
+  /// that, and it may not be had at all.
+  static bool discardEvents(std::chrono::milliseconds patience = std::chrono::seconds(2));
 
   /// Nothing is sent without an endpoint, nor without the user's consent, which is complained of.
+  /// Where that was refused, what waits is thrown away.
   ScanAnalytics(const std::optional<std::string>& endpoint, bool printsEvents, Console& console);
   /// Gives events a moment to arrive. Those that do not wait for the next run.
   ~ScanAnalytics();

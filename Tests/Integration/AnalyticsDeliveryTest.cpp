@@ -11,6 +11,8 @@
 #include <cctype>
 #include <chrono>
 #include <cstdlib>
+#include <filesystem>
+#include <fstream>
 #include <future>
 #include <map>
 #include <memory>
@@ -290,6 +292,11 @@ int orvane(std::vector<std::string> arguments) {
 
 TEST_F(AnalyticsDeliveryTest, ARefusalTakesBackWhatHasNotBeenSent) {
   ::setenv("HOME", (folder_.path() / "home").c_str(), 1);
+  const std::filesystem::path settings =
+      folder_.path() / "home/.config/com.quennel.Orvane2/settings.ini";
+  const auto keepAnswer = [&](const char* isGranted) {
+    std::ofstream(settings) << "[Defaults]\nanalyticsConsent=" << isGranted << '\n';
+  };
   const std::string scanned = folder_.write("scanned/file", "content").parent_path();
   Server server({"204"});
   const std::vector<std::string> away = {"scan", "--analytics", "http://127.0.0.1:1", scanned,
@@ -300,6 +307,14 @@ TEST_F(AnalyticsDeliveryTest, ARefusalTakesBackWhatHasNotBeenSent) {
   ASSERT_EQ(orvane({"analytics", "consent", "no"}), 0);
   EXPECT_EQ(orvane({"scan", "--analytics", server.url(), scanned, scanned}), 0) << "refused";
   ASSERT_EQ(orvane({"analytics", "consent", "yes"}), 0);
+  // A command that was killed when it had kept the answer leaves the rest to the next.
+  EXPECT_EQ(orvane(away), 0);
+  keepAnswer("false");
+  ASSERT_EQ(orvane({"analytics", "consent", "yes"}), 0);
+  EXPECT_EQ(orvane(away), 0);
+  keepAnswer("false");
+  EXPECT_EQ(orvane(away), 0);
+  keepAnswer("true");
   EXPECT_EQ(orvane({"scan", "--analytics", server.url(), scanned}), 0);
   EXPECT_EQ(parameter(server.next().hits.at(0), "ev"), "1") << "the folders of the last scan";
 }

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Tallyhouse/Delivery.h>
 
+#include <filesystem>
 #include <map>
 #include <vector>
 
@@ -10,6 +11,7 @@
 namespace Tallyhouse {
 namespace {
 
+namespace fs = std::filesystem;
 using namespace std::chrono_literals;
 using Varnel::Platform::Date;
 using Varnel::Platform::HTTPFailure;
@@ -91,6 +93,26 @@ TEST_F(DeliveryTest, AWeekOfOutagesLosesNothing) {
   EXPECT_NE(http.posts().back().body.find("&qt=6"), std::string::npos) << "the age is told";
 }
 
+TEST_F(DeliveryTest, ATimeOfflineEndsWithinAMinuteAndIsNotTheServersFault) {
+  append(20);
+  int offline = 0;
+  std::vector<Date> reached;
+  http.setServer([&, start = clock.now()](const HTTPPost&) -> Server::Answer {
+    if (clock.now() - start < 1h) {
+      ++offline;
+      return HTTPFailure{.message = "no route", .isOffline = true};
+    }
+    reached.push_back(clock.now());
+    return HTTPResponse{.status = 503, .retryAfter = {}};
+  });
+  const Date end = clock.now() + 1h;
+  run(3h);
+  EXPECT_GE(offline, 60);
+  ASSERT_GE(reached.size(), 2u);
+  EXPECT_LE(reached[0] - end, 1min);
+  EXPECT_LE(reached[1] - reached[0], 30min);
+}
+
 TEST_F(DeliveryTest, WhatGotLostOnTheWayBackIsRepeatedUnderTheSameName) {
   append(30);
   int answers = 0;
@@ -160,6 +182,24 @@ TEST_F(DeliveryTest, OneProcessDeliversUntilItHasNothingToDoOrDies) {
   append(20);
   EXPECT_EQ(one->step(), Delivery::State::idle);
   EXPECT_EQ(http.posts().size(), 4u);
+}
+
+TEST_F(DeliveryTest, ALockThatNobodyCanTakeIsSaidOnce) {
+  append(20);
+  const std::string lock = path() + ".deliverer";
+  const auto makers = {+[](const std::string& at) { fs::create_directory(at); },
+                       +[](const std::string& at) { fs::create_symlink("elsewhere", at); }};
+  for (const auto make : makers) {
+    make(lock);
+    Process process(*this);
+    const std::size_t before = log.text().size();
+    for (int i = 0; i < 2; ++i) EXPECT_EQ(process.step(), Delivery::State::fileAway);
+    const std::string said = log.text().substr(before);
+    EXPECT_NE(said.find(lock), std::string::npos) << said;
+    EXPECT_EQ(std::count(said.begin(), said.end(), '\n'), 1) << said;
+    fs::remove(lock);
+  }
+  EXPECT_EQ(Process(*this).step(), Delivery::State::idle);
 }
 
 TEST_F(DeliveryTest, ThePauseThatAServerAsksForOutlivesTheProcess) {

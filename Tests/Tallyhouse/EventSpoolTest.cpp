@@ -19,6 +19,15 @@ using EventSpoolTest = Tests::SpoolFixture;
 using Haste = EventRecorder::Haste;
 using Tests::OtherConnection;
 
+bool isFound(const std::string& secret, const fs::path& folder) {
+  for (const auto& entry : fs::directory_iterator(folder)) {
+    std::ifstream file(entry.path(), std::ios::binary);
+    const std::string bytes(std::istreambuf_iterator<char>(file), {});
+    if (bytes.find(secret) != std::string::npos) return true;
+  }
+  return false;
+}
+
 TEST_F(EventSpoolTest, KeepsWhatItTookInOrderAndForItsOwnerAlone) {
   const auto recorder = openRecorder();
   append(*recorder, {"c", "b", "a"});
@@ -56,6 +65,24 @@ TEST_F(EventSpoolTest, WhatIsRefusedLeavesTheLineAndIsSetAsideAtLast) {
   }
   EXPECT_TRUE(spool->refused(3).empty());
   EXPECT_FALSE(spool->look("https://h.example", 1, 3)->backlog.refused);
+}
+
+TEST_F(EventSpoolTest, WhatIsDeliveredIsToldOfEachProcessAlone) {
+  const auto one = openRecorder();
+  const auto other = openRecorder();
+  const auto spool = openSpool();
+  append(*other, {"first"});
+  clock.advance(1ms);
+  append(*one, {"refused"});
+  clock.advance(1ms);
+  append(*other, {"last"});
+  const auto events = spool->waiting(many, many);
+  ASSERT_EQ(events.size(), 3u);
+  EXPECT_FALSE(spool->isDelivered(other->own()));
+  EXPECT_TRUE(spool->save({{events[1]}, Verdict::refused, clock.now(), {}}));
+  EXPECT_TRUE(spool->save({{events[0], events[2]}, Verdict::delivered, clock.now(), {}}));
+  EXPECT_TRUE(spool->isDelivered(other->own()));
+  EXPECT_FALSE(spool->isDelivered(one->own()));
 }
 
 TEST_F(EventSpoolTest, DropsAndCountsTheOldestAtEitherLimitWhoeverRecords) {
@@ -106,22 +133,44 @@ TEST_F(EventSpoolTest, ARefusalOfConsentReachesWhatOtherProcessesHoldAndDo) {
   EXPECT_TRUE(spool->refused(3).empty());
   other->begin();
   append(*other, {"e"});
+  EXPECT_TRUE(spool->save({spool->waiting(many, many), Verdict::delivered, clock.now(), {}}));
+  EXPECT_TRUE(spool->isDelivered(one->own()));
+  EXPECT_FALSE(spool->isDelivered(other->own())) << "\"d\" was given up";
   EXPECT_EQ(one->droppedCount(), 0);
 
   const std::string secret = "Secret";
   append(*one, {secret});
   one->discard();
-  for (const char* suffix : {"", "-wal"}) {
-    std::ifstream file(path() + suffix, std::ios::binary);
-    const std::string bytes(std::istreambuf_iterator<char>(file), {});
-    EXPECT_EQ(bytes.find(secret), std::string::npos) << suffix;
+  EXPECT_FALSE(isFound(secret, fs::path(path()).parent_path()));
+}
+
+TEST_F(EventSpoolTest, ARefusalForgetsWhatIsThereAndMakesNothing) {
+  const fs::path made = fs::path(path()).parent_path();
+  const auto discard = [&] {
+    EventRecorder recorder({*files, clock, log}, path(), {});
+    recorder.discard();
+    EXPECT_FALSE(recorder.mustEmpty());
+  };
+  discard();
+  EXPECT_FALSE(fs::exists(made));
+  for (const char* left : {"", "-wal", ".salvage", ".damaged"}) {
+    fs::create_directory(made);
+    std::ofstream(path() + left) << "Secret";
+    discard();
+    EXPECT_FALSE(isFound("Secret", made)) << left;
+    fs::remove_all(made);
   }
+  const auto recorder = openRecorder();
+  append(*recorder, {"a"});
+  fs::remove_all(made);
+  recorder->discard();
+  EXPECT_EQ(names(), "") << "nor is it given back";
 }
 
 TEST_F(EventSpoolTest, ARefusalThatTheFileDoesNotAllowYetIsMadeUpFor) {
   const auto recorder = openRecorder();
   const auto spool = openSpool();
-  append(*recorder, {"a"});
+  append(*recorder, {"Secret"});
   OtherConnection lock(path(), "BEGIN IMMEDIATE");
   recorder->discard();
   EXPECT_TRUE(recorder->mustEmpty());
@@ -129,6 +178,7 @@ TEST_F(EventSpoolTest, ARefusalThatTheFileDoesNotAllowYetIsMadeUpFor) {
   append(*recorder, {"b"});
   lock.end();
   EXPECT_FALSE(recorder->settle(spool->file(), Haste::none));
+  EXPECT_FALSE(isFound("Secret", fs::path(path()).parent_path()));
   EXPECT_EQ(namesOf(*spool), "b ");
   append(*recorder, {"c"});
   EXPECT_EQ(namesOf(*spool), "b c ");

@@ -58,6 +58,8 @@ TEST_F(SpoolingTransportTest, EventsOfManyThreadsAllArrive) {
   for (const HTTPPost& post : http.posts())
     lines += 1 + std::count(post.body.begin(), post.body.end(), '\n');
   EXPECT_EQ(lines, 400);
+  track(tracker, std::string(10'000, 'x'));
+  EXPECT_FALSE(transport->drain(30s)) << "one was given up";
 }
 
 TEST_F(SpoolingTransportTest, AWithdrawnConsentStopsTransfersAndForgets) {
@@ -100,6 +102,19 @@ TEST_F(SpoolingTransportTest, WhatEarlierRunsLeftGoesWithConsentAlone) {
   AnalyticsTracker tracker({clock}, transport, Consent::granted);
   EXPECT_TRUE(transport->drain(30s));
   EXPECT_EQ(http.posts().size(), 1u);
+}
+
+TEST_F(SpoolingTransportTest, ARefusalGoesOnUntilALockedSpoolIsEmpty) {
+  append(*openRecorder(), {"a"});
+  Tests::OtherConnection lock(path(), "BEGIN IMMEDIATE");
+  const auto transport = std::shared_ptr(make());
+  const AnalyticsTracker tracker({clock}, transport, Consent::refused);
+  EXPECT_FALSE(transport->hasDiscardedAll());
+  lock.end();
+  const auto end = std::chrono::steady_clock::now() + 30s;
+  while (!transport->hasDiscardedAll() && std::chrono::steady_clock::now() < end) clock.advance(1s);
+  EXPECT_TRUE(transport->hasDiscardedAll());
+  EXPECT_EQ(names(), "");
 }
 
 TEST_F(SpoolingTransportTest, ADrainAnswersForItsOwnProcessWhoeverDelivers) {
