@@ -398,10 +398,10 @@ TEST_F(Scan, NeverReadsTwoLargeFilesOfAnOrderedDiskByTurns) {
 }
 
 TEST_F(Scan, TellsLargeFilesApartByTheirMiddleOrEnd) {
-  for (const std::size_t place : {1'500'000u, 2'999'999u}) {
+  for (const std::size_t place : {5'000'000u, 9'999'999u}) {
     const ScanFolder large;
     for (const char letter : {'a', 'b', 'c'}) {
-      std::string content(3'000'000, 'x');
+      std::string content(10'000'000, 'x');
       content[place] = letter;
       large.write(std::string(1, letter), content);
     }
