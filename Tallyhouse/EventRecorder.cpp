@@ -21,17 +21,13 @@ using Error = std::optional<Varnel::Platform::PlatformError>;
 
 namespace {
 
-std::int64_t numberOf(Date date) {
-  return date.time_since_epoch().count();
-}
-
-Error readEpoch(SQLiteDatabase& database, std::int64_t& epoch) {
-  epoch = 0;
+Error readEpoch(SQLiteDatabase& database, Date& epoch) {
+  epoch = {};
   return database.row("SELECT epoch FROM state", std::tie(epoch));
 }
 
 // What is forgotten must not be found in the free parts of the file.
-Error empty(SQLiteDatabase& database, std::int64_t epoch) {
+Error empty(SQLiteDatabase& database, Date epoch) {
   if (auto error = database.execute("PRAGMA secure_delete = ON; DELETE FROM event")) return error;
   return database.run(
       "INSERT INTO state(id, epoch) VALUES(1, ?1) ON CONFLICT(id) DO UPDATE SET epoch = ?1", epoch);
@@ -93,13 +89,14 @@ struct EventRecorder::Work final {
   std::vector<SpooledEvent> events;
   std::int64_t lastID = 0;
   std::int64_t dropped = 0;
-  std::optional<std::int64_t> refusal;
-  std::int64_t epoch = 0;  ///< The file's, afterwards.
+  std::optional<Date> refusal;
+  Date epoch;  ///< The file's, afterwards.
   SpoolRoom room;
 
   Error doIn(SQLiteDatabase& database, const SpoolLimits& limits) {
     auto error = readEpoch(database, epoch);
-    if (!error && refusal) error = empty(database, epoch = std::max(epoch + 1, *refusal));
+    if (!error && refusal)
+      error = empty(database, epoch = std::max(epoch + Date::duration(1), *refusal));
     for (SpooledEvent& event : events)
       if (!error && (refusal || epoch <= event.epoch)) error = insertOnce(database, event);
     if (!error && dropped > 0) error = addDropped(database, dropped, 0);
@@ -123,11 +120,11 @@ EventRecorder::~EventRecorder() {
 
 void EventRecorder::begin() {
   const std::lock_guard atFile(fileMutex_);
-  std::int64_t epoch = 0;
+  Date epoch;
   const auto error =
       file_.read([&](SQLiteDatabase& database) { return readEpoch(database, epoch); });
   const std::lock_guard lock(mutex_);
-  own_.epoch = error ? numberOf(ports_.clock.now()) : epoch;
+  own_.epoch = error ? ports_.clock.now() : epoch;
   isRevoked_ = false;
 }
 
@@ -222,8 +219,7 @@ void EventRecorder::discard() {
     held_.clear();
     heldBytes_ = 0;
     own_ = {};
-    refusal_.reset();
-    if (isThere) refusal_ = numberOf(ports_.clock.now());
+    refusal_ = isThere ? std::optional(ports_.clock.now()) : std::nullopt;
   }
   settle(file_, Haste::none);
   file_.removeSetAside();

@@ -38,7 +38,7 @@ struct SpoolRoom final {
 struct OwnEvents final {
   std::int64_t first = 0;  ///< 0: none.
   std::int64_t last = 0;
-  std::int64_t epoch = 0;
+  Varnel::Platform::Date epoch;
   std::int64_t origin = 0;
   bool isHeld = false;   ///< Some are not in the file yet.
   bool hasLost = false;  ///< Some had to be given up.
@@ -126,9 +126,10 @@ class EventRecorder final {
   mutable std::mutex mutex_;  ///< Owns all below. Nobody keeps it while at a file.
   std::deque<SpooledEvent> held_;
   std::size_t heldBytes_ = 0;
-  std::int64_t dropped_ = 0;             ///< Not yet counted in the file.
-  std::optional<std::int64_t> refusal_;  ///< Of the user, here, for which the file is not emptied.
-  bool isRevoked_ = false;               ///< Another process has refused since `begin`.
+  std::int64_t dropped_ = 0;  ///< Not yet counted in the file.
+  std::optional<Varnel::Platform::Date>
+      refusal_;             ///< Of the user, here, for which the file is not emptied.
+  bool isRevoked_ = false;  ///< Another process has refused since `begin`.
   bool isSettling_ = false;
   Varnel::Platform::GrowingPause pause_ = spoolPause;
   SpoolRoom room_;

@@ -18,9 +18,9 @@ struct SpooledEvent final {
   std::string uuid;
   Varnel::Platform::Date date;
   std::string hit;
-  int refusals = 0;         ///< How often the server would not have it. 0: it waits in line.
-  std::int64_t origin = 0;  ///< Which recorder took it. Not read from the file.
-  std::int64_t epoch = 0;   ///< In which it was recorded. Not kept in the file.
+  int refusals = 0;              ///< How often the server would not have it. 0: it waits in line.
+  std::int64_t origin = 0;       ///< Which recorder took it. Not read from the file.
+  Varnel::Platform::Date epoch;  ///< In which it was recorded. Not kept in the file.
 };
 
 /// Between two attempts at a file that cannot be had.

@@ -103,7 +103,10 @@ Failure select(SQLiteDatabase& database, const std::vector<DeliveryState>& state
   });
 }
 
-Failure forgetRemoved(SQLiteDatabase& database) {
+// Runs a statement, and forgets what is removed and has no banner any more.
+template <typename... Parameters>
+Failure update(SQLiteDatabase& database, std::string_view sql, const Parameters&... parameters) {
+  if (auto error = database.run(sql, parameters...)) return error;
   return database.run("DELETE FROM deliveries WHERE state = 'removed' AND banner IS NULL");
 }
 
@@ -215,14 +218,11 @@ Failure NotificationStore::decideDue(const std::vector<std::pair<std::int64_t, b
               database.run("UPDATE deliveries SET state = ? WHERE number = ? AND state = 'due'",
                            std::string_view(shows ? "toShow" : "hidden"), number))
         return error;
-    if (auto error =
-            database.run("UPDATE deliveries SET state = 'removed' WHERE number IN (SELECT number "
-                         "FROM deliveries "
-                         "WHERE state IN ('hidden', 'shown', 'expired') "
-                         "ORDER BY delivered DESC, date DESC LIMIT -1 OFFSET ?)",
-                         maxDelivered))
-      return error;
-    return forgetRemoved(database);
+    return update(database,
+                  "UPDATE deliveries SET state = 'removed' WHERE number IN (SELECT number"
+                  " FROM deliveries WHERE state IN ('hidden', 'shown', 'expired')"
+                  " ORDER BY delivered DESC, date DESC LIMIT -1 OFFSET ?)",
+                  maxDelivered);
   });
 }
 
@@ -242,19 +242,16 @@ Result<bool> NotificationStore::noteShown(std::int64_t number, const std::string
 
 Failure NotificationStore::noteGone(std::int64_t number) {
   return write([&](SQLiteDatabase& database) {
-    auto error = database.run(
-        "UPDATE deliveries SET banner = NULL, "
-        "state = CASE state WHEN 'shown' THEN 'expired' ELSE state END "
-        "WHERE number = ?",
-        number);
-    return error ? error : forgetRemoved(database);
+    return update(database,
+                  "UPDATE deliveries SET banner = NULL,"
+                  " state = CASE state WHEN 'shown' THEN 'expired' ELSE state END WHERE number = ?",
+                  number);
   });
 }
 
 Failure NotificationStore::remove(std::int64_t number) {
   return write([&](SQLiteDatabase& database) {
-    auto error = database.run("UPDATE deliveries SET state = 'removed' WHERE number = ?", number);
-    return error ? error : forgetRemoved(database);
+    return update(database, "UPDATE deliveries SET state = 'removed' WHERE number = ?", number);
   });
 }
 

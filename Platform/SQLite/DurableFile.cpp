@@ -1,36 +1,19 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/SQLite/DurableFile.h>
 
-#include <array>
 #include <atomic>
 #include <filesystem>
 #include <utility>
 
 #include <Varnel/Platform/Concurrency/ForkedChild.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
-#include <Varnel/Platform/SQLite/Salvage.h>
+#include <Varnel/Platform/SQLite/DurableConnection.h>
 #include <fmt/format.h>
 
 namespace Varnel::Platform {
-
-// What lies beside the file PATH:
-//   PATH-journal, PATH-wal, PATH-shm    the library's
-//   PATH.opening                        locked by the one who opens the file, or sets it aside
-//   PATH.salvage                        was set aside, and its rows are not taken over yet
-//   PATH.damaged                        was set aside, and its rows are taken over
-// A process may be killed after each step: the next one to open the file goes on from there.
-//
-// A file that has lost its journal is set aside as well. A new one has another identity, so that
-// all other connections notice, and shares nothing with what they still have in memory.
-
 namespace {
 
 namespace fs = std::filesystem;
-
-constexpr const char* turnSuffix = ".opening";
-constexpr const char* pendingSuffix = ".salvage";
-constexpr const char* asideSuffix = ".damaged";
-constexpr std::array<const char*, 3> journalSuffixes{"-wal", "-shm", "-journal"};
 
 // A file that is taken away this often within one operation is beyond help.
 constexpr int maxRounds = 4;
@@ -73,22 +56,6 @@ int forksSoFar() {
 }
 
 }  // namespace
-
-// The write-ahead log and its index, if there are any, belong to a connection as the file does.
-struct DurableFile::Connection {
-  explicit Connection(SQLiteDatabase opened) : database(std::move(opened)) {}
-
-  SQLiteDatabase database;
-  FileIdentity file;
-  std::optional<FileIdentity> log;
-  std::optional<FileIdentity> index;
-  std::unique_ptr<HeldFile> heldFile;
-  std::unique_ptr<HeldFile> heldLog;
-  std::chrono::steady_clock::time_point lookedAt;
-  std::int64_t lastChange = 0;  ///< Of the file, when it was last found in its place.
-  bool isImmutable = false;
-  const int forksBefore = forksSoFar();
-};
 
 DurableFile::DurableFile(Ports ports, const std::string& path, DurableFormat format,
                          Migrating migrating)
@@ -156,14 +123,6 @@ bool DurableFile::isThere() const {
   for (const char* suffix : {"", "-wal", "-journal", turnSuffix, pendingSuffix})
     isThere = isThere || ports_.privateFiles.identity(path_ + suffix);
   return isThere;
-}
-
-void DurableFile::removeSetAside() {
-  for (const char* aside : {pendingSuffix, asideSuffix}) {
-    static_cast<void>(ports_.privateFiles.remove(path_ + aside));
-    for (const char* suffix : journalSuffixes)
-      static_cast<void>(ports_.privateFiles.remove(path_ + aside + suffix));
-  }
 }
 
 DurableFile::Failure DurableFile::attempt(Look look, const Work& operation) {
@@ -262,13 +221,11 @@ DurableFile::Failure DurableFile::open() {
   const Migrating migrating = isReadOnly ? Migrating::never : migrating_;
   database->waitWithin(deadline_);
   auto error = judgeFormat(*database, format_, migrating);
-  bool isImmutable = false;
   if (error &&
       (meaningOf(*error) == SQLiteFailure::readOnly || meaningOf(*error) == SQLiteFailure::other)) {
     // A write-ahead log needs files beside it, even for reading. Without a log the file is whole.
     const auto log = ports_.privateFiles.identity(logPath_);
     if (log && !log->isEmpty) return error;
-    isImmutable = true;
     database = SQLiteDatabase::open(*path, SQLiteDatabase::Access::immutable);
     if (!database) return database.error();
     error = judgeFormat(*database, format_, migrating);
@@ -281,8 +238,7 @@ DurableFile::Failure DurableFile::open() {
   if (!error)
     error = database->execute(isFull ? "PRAGMA synchronous = FULL" : "PRAGMA synchronous = NORMAL");
   if (error) return error;
-  connection_ = std::make_unique<Connection>(std::move(*database));
-  connection_->isImmutable = isImmutable;
+  connection_ = std::make_unique<Connection>(std::move(*database), forksSoFar());
   if (holdFiles()) return std::nullopt;
   connection_.reset();
   return fileError(SQLiteFailure::busy, path_ + " was taken away while it was opened");
@@ -322,104 +278,6 @@ DurableFile::Failure DurableFile::check() {
     return error;
   if (verdict == "ok") return std::nullopt;
   return fileError(SQLiteFailure::damaged, verdict);
-}
-
-DurableFile::Failure DurableFile::setAside(const PlatformError& damage) {
-  const auto damaged = std::move(connection_);
-  const auto turn = takeTurn();
-  if (!turn) return meaningOf(turn.error()) == SQLiteFailure::readOnly ? damage : turn.error();
-  // Another process may have done so meanwhile.
-  if (ports_.privateFiles.identity(path_) == damaged->file)
-    if (auto error = moveAside(damage.localizedDescription())) return error;
-  auto error = open();
-  if (!error) takeOverSetAside();
-  return error;
-}
-
-DurableFile::Failure DurableFile::replaceLost() {
-  auto lost = std::move(connection_);
-  const auto turn = takeTurn();
-  const auto fail = [&](const PlatformError& error) {
-    // Its rows may be nowhere else.
-    connection_ = std::move(lost);
-    return error;
-  };
-  if (!turn) return fail(turn.error());
-  PrivateFiles& files = ports_.privateFiles;
-  const auto there = files.identity(path_);
-  Failure error;
-  if (there == lost->file)
-    error = moveAside("its journal or what it held was taken away");
-  else if (lost->log && files.identity(logPath_) == lost->log)
-    removeJournals();
-  if (!error) error = open();
-  if (error) return fail(*error);
-  // Whoever has set the file aside takes its rows over, and what was written after that is done
-  // again.
-  const bool isSetAside = files.identity(path_ + pendingSuffix) == lost->file ||
-                          files.identity(path_ + asideSuffix) == lost->file;
-  if (there == lost->file || !isSetAside) {
-    if (there != lost->file)
-      say(there ? "was replaced" : "was removed or renamed, and is begun anew");
-    error = takeOver(&lost->database, !there);
-    if (error) return fail(*error);
-  }
-  // Two connections to one file would share what they know about its log.
-  lost.reset();
-  takeOverSetAside();
-  return std::nullopt;
-}
-
-// The file goes first: without it nobody takes the journals for those of another.
-DurableFile::Failure DurableFile::moveAside(const std::string& reason) {
-  if (const auto failure = ports_.privateFiles.rename(path_, path_ + pendingSuffix))
-    return PlatformError(failure);
-  finishMovingAside();
-  say("is set aside as " + path_ + asideSuffix + ": " + reason);
-  return std::nullopt;
-}
-
-void DurableFile::finishMovingAside() {
-  PrivateFiles& files = ports_.privateFiles;
-  if (files.identity(path_) || !files.identity(path_ + pendingSuffix)) return;
-  for (const char* suffix : journalSuffixes)
-    static_cast<void>(files.rename(path_ + suffix, path_ + pendingSuffix + suffix));
-}
-
-// Journals whose file is gone would be taken for those of the file that comes in its place. Those
-// who have them open keep what is in them.
-void DurableFile::removeJournals() {
-  for (const char* suffix : journalSuffixes)
-    static_cast<void>(ports_.privateFiles.remove(path_ + suffix));
-}
-
-// What fails here is tried again when the file is opened next.
-void DurableFile::takeOverSetAside() {
-  PrivateFiles& files = ports_.privateFiles;
-  const std::string pending = path_ + pendingSuffix;
-  if (!files.identity(pending)) return;
-  const auto resolved = files.prepare(pending);
-  if (!resolved) return;
-  {
-    auto from = SQLiteDatabase::open(*resolved, SQLiteDatabase::Access::existing);
-    // Makes the library read a file that is shorter than it says.
-    if (from) static_cast<void>(from->execute("PRAGMA writable_schema = ON"));
-    if (takeOver(from ? &*from : nullptr, true)) return;
-  }
-  for (const char* suffix : journalSuffixes) {
-    static_cast<void>(files.remove(path_ + asideSuffix + suffix));
-    static_cast<void>(files.rename(pending + suffix, path_ + asideSuffix + suffix));
-  }
-  static_cast<void>(files.rename(pending, path_ + asideSuffix));
-}
-
-DurableFile::Failure DurableFile::takeOver(SQLiteDatabase* from, bool isCounted) {
-  return connection_->database.transaction("BEGIN IMMEDIATE", [&](SQLiteDatabase& to) -> Failure {
-    if (from)
-      if (auto error = salvage(*from, to, format_.tables)) return error;
-    if (!isCounted) return std::nullopt;
-    return to.execute("UPDATE durable_file SET damages = damages + 1");
-  });
 }
 
 PlatformError DurableFile::said(const PlatformError& error) {
