@@ -2,7 +2,6 @@
 #include <Varnel/Tallyhouse/EventRecorder.h>
 
 #include <algorithm>
-#include <functional>
 #include <random>
 #include <tuple>
 #include <utility>
@@ -43,10 +42,9 @@ Error addDropped(SQLiteDatabase& database, std::int64_t count, std::int64_t last
 // The event may be there already: a change is made again when the file was replaced meanwhile. Or
 // another process's event has the number.
 Error insertOnce(SQLiteDatabase& database, SpooledEvent& event) {
-  for (;; ++event.id) {
-    auto error = database.run(
-        "INSERT OR IGNORE INTO event(id, date, origin, uuid, hit) VALUES(?, ?, ?, ?, ?)", event.id,
-        event.date, event.origin, event.uuid, event.hit);
+  for (;; event.id += idStep) {
+    auto error = database.run("INSERT OR IGNORE INTO event(id, date, uuid, hit) VALUES(?, ?, ?, ?)",
+                              event.id, event.date, event.uuid, event.hit);
     if (error || database.changedRows() > 0) return error;
     bool isThere = false;
     error = database.row("SELECT uuid = ? FROM event WHERE id = ?", std::tie(isThere), event.uuid,
@@ -108,7 +106,7 @@ EventRecorder::EventRecorder(Ports ports, std::string path, SpoolLimits limits)
     : ports_(ports),
       path_(path),
       limits_(limits),
-      origin_(std::random_device()()),
+      origin_(std::random_device()() % idStep),
       file_({ports.privateFiles, ports.systemLog}, path, spoolFormat(),
             Varnel::Platform::Migrating::allowed) {}
 
@@ -144,18 +142,16 @@ std::int64_t EventRecorder::append(std::string_view uuid, Date date, std::string
 }
 
 SpooledEvent EventRecorder::named(std::string_view uuid, Date date, std::string_view hit) {
-  constexpr int randomBits = 20;
-  constexpr std::int64_t maxTime = std::int64_t{1} << (62 - randomBits);
-  const auto time = std::chrono::duration_cast<std::chrono::milliseconds>(date.time_since_epoch());
-  const auto random = std::hash<std::string_view>()(uuid) & ((1U << randomBits) - 1);
-  const std::int64_t id = std::clamp<std::int64_t>(time.count(), 0, maxTime) << randomBits |
-                          static_cast<std::int64_t>(random);
+  constexpr std::int64_t maxTime = (std::int64_t{1} << 62) / idStep;
+  using Tick = std::chrono::duration<std::int64_t, std::ratio<64, 1'000'000>>;
+  const auto time = std::chrono::duration_cast<Tick>(date.time_since_epoch());
+  const auto id = std::clamp<std::int64_t>(time.count(), 0, maxTime) * idStep + origin_;
   const std::lock_guard lock(mutex_);
   if (isRevoked_) {
     own_.hasLost = true;
     return {};
   }
-  lastID_ = std::max(lastID_ + 1, id);
+  lastID_ = std::max(lastID_ + idStep, id);
   if (own_.first == 0) own_.first = lastID_;
   own_.last = lastID_;
   return {.id = lastID_,
@@ -163,7 +159,6 @@ SpooledEvent EventRecorder::named(std::string_view uuid, Date date, std::string_
           .date = date,
           .hit = std::string(hit),
           .refusals = 0,
-          .origin = origin_,
           .epoch = own_.epoch};
 }
 
@@ -177,9 +172,9 @@ bool EventRecorder::insert(const SpooledEvent& event) {
   bool isInserted = false;
   const auto write = [&](SQLiteDatabase& database) {
     auto failure = database.run(
-        "INSERT OR IGNORE INTO event(id, date, origin, uuid, hit) SELECT ?, ?, ?, ?, ?"
+        "INSERT OR IGNORE INTO event(id, date, uuid, hit) SELECT ?, ?, ?, ?"
         " WHERE coalesce((SELECT epoch FROM state), 0) <= ?",
-        event.id, event.date, event.origin, event.uuid, event.hit, event.epoch);
+        event.id, event.date, event.uuid, event.hit, event.epoch);
     isInserted = !failure && database.changedRows() > 0;
     return failure;
   };
@@ -288,14 +283,13 @@ void EventRecorder::seen(std::int64_t waiting) {
 OwnEvents EventRecorder::own() const {
   const std::lock_guard lock(mutex_);
   OwnEvents own = own_;
-  own.origin = origin_;
   own.isHeld = !held_.empty();
   return own;
 }
 
 void EventRecorder::forget(const OwnEvents& delivered) {
   const std::lock_guard lock(mutex_);
-  own_.first = own_.last == delivered.last ? 0 : delivered.last + 1;
+  own_.first = own_.last == delivered.last ? 0 : delivered.last + idStep;
 }
 
 std::int64_t EventRecorder::droppedCount() {

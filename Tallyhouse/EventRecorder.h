@@ -39,7 +39,6 @@ struct OwnEvents final {
   std::int64_t first = 0;  ///< 0: none.
   std::int64_t last = 0;
   Varnel::Platform::Date epoch;
-  std::int64_t origin = 0;
   bool isHeld = false;   ///< Some are not in the file yet.
   bool hasLost = false;  ///< Some had to be given up.
 };
@@ -118,7 +117,7 @@ class EventRecorder final {
   const Ports ports_;
   const std::string path_;
   const SpoolLimits limits_;
-  const std::int64_t origin_;  ///< Tells its events from those of others.
+  const std::int64_t origin_;  ///< The last bits of its events' numbers.
 
   std::mutex fileMutex_;  ///< Owns the file. Taken before the other mutex.
   Varnel::Platform::DurableFile file_;
@@ -134,7 +133,7 @@ class EventRecorder final {
   Varnel::Platform::GrowingPause pause_ = spoolPause;
   SpoolRoom room_;
   std::int64_t waiting_ = 0;
-  std::int64_t lastID_ = 0;
+  std::int64_t lastID_ = origin_;
   OwnEvents own_;
 };
 

@@ -113,9 +113,9 @@ bool EventSpool::isDelivered(const OwnEvents& events) {
   // Those that are gone may also have been pushed out, or have been discarded by another process.
   const auto error = file_.read([&](SQLiteDatabase& database) {
     return database.row(
-        "SELECT NOT EXISTS (SELECT 1 FROM event WHERE id BETWEEN ?1 AND ?2 AND origin = ?4)"
+        "SELECT NOT EXISTS (SELECT 1 FROM event WHERE id BETWEEN ?1 AND ?2 AND (id - ?1) % ?4 = 0)"
         " AND NOT EXISTS (SELECT 1 FROM state WHERE lost_through >= ?1 OR epoch > ?3)",
-        std::tie(isDelivered), events.first, events.last, events.epoch, events.origin);
+        std::tie(isDelivered), events.first, events.last, events.epoch, idStep);
   });
   return !error && isDelivered;
 }

@@ -15,7 +15,6 @@ const DurableFormat& spoolFormat() {
       .schema =
           "CREATE TABLE event(id INTEGER PRIMARY KEY, date INTEGER NOT NULL,"
           " refusals INTEGER NOT NULL DEFAULT 0, refused_at INTEGER NOT NULL DEFAULT 0,"
-          " origin INTEGER NOT NULL,"  // Which recorder took it.
           " uuid TEXT NOT NULL, hit TEXT NOT NULL);"
           "CREATE INDEX refused ON event(refused_at) WHERE refusals > 0;"
           // Its row is made by the first who has something to say.

@@ -12,16 +12,18 @@ namespace Tallyhouse {
 
 /// An event in the spool.
 struct SpooledEvent final {
-  /// Made of the event's date and UUID, so that it grows with time, differs between files, and
-  /// tells an insertion that is repeated.
+  /// The time and, in the last bits, a random number of its recorder's: so it grows with time,
+  /// differs between files, and tells who recorded it.
   std::int64_t id = 0;
   std::string uuid;
   Varnel::Platform::Date date;
   std::string hit;
   int refusals = 0;              ///< How often the server would not have it. 0: it waits in line.
-  std::int64_t origin = 0;       ///< Which recorder took it. Not read from the file.
   Varnel::Platform::Date epoch;  ///< In which it was recorded. Not kept in the file.
 };
+
+/// Between two events of one recorder their numbers differ by a multiple of this.
+inline constexpr std::int64_t idStep = 1 << 16;
 
 /// Between two attempts at a file that cannot be had.
 inline const Varnel::Platform::GrowingPause spoolPause{std::chrono::milliseconds(10),
