@@ -161,6 +161,8 @@ ScheduledNotificationCenter::ScheduledNotificationCenter(Ports ports, const std:
       store_(std::make_unique<NotificationStore>(
           DurableFile::Ports{ports.privateFiles, ports.systemLog}, storeFile)),
       banners_(std::make_shared<Banners>(*this)) {
+  // The folder is there from now on, so that somebody may watch it.
+  static_cast<void>(ports_.privateFiles.prepare(lockFile_));
   ports_.notificationServer.setObserver(banners_);
   ports_.timer.setHandler([this] { tick(); });
 }
