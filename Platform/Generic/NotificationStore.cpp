@@ -7,6 +7,7 @@
 #include <tuple>
 
 #include <Varnel/Platform/Text/Calendar.h>
+#include <Varnel/Platform/Values/Restorer.h>
 #include <Varnel/Platform/Values/UUID.h>
 #include <fmt/format.h>
 
@@ -160,10 +161,9 @@ Failure NotificationStore::write(const DurableFile::Work& work) {
 Failure NotificationStore::change(const std::function<Failure()>& calls) {
   if (open_) return calls();
   return file_.change([&](SQLiteDatabase& database) {
+    const Restorer before(open_);
     open_ = &database;
-    auto error = calls();
-    open_ = nullptr;
-    return error;
+    return calls();
   });
 }
 

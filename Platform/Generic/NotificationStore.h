@@ -54,7 +54,8 @@ class NotificationStore final {
 
   NotificationStore(DurableFile::Ports ports, const std::string& file);
 
-  /// Does the calls on this store as one. They may be run more than once.
+  /// Does the calls on this store as one. They may be run more than once. What they throw comes out
+  /// of this, and nothing is changed.
   [[nodiscard]] Failure change(const std::function<Failure()>& calls);
 
   /// The deliveries in these states, the latest first.

@@ -18,6 +18,7 @@
 #include <Varnel/Platform/Ports/UserLocale.h>
 #include <Varnel/Platform/Ports/WallClockTimer.h>
 #include <Varnel/Platform/Text/Calendar.h>
+#include <Varnel/Platform/Values/Restorer.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -161,6 +162,8 @@ ScheduledNotificationCenter::ScheduledNotificationCenter(Ports ports, const std:
       store_(std::make_unique<NotificationStore>(
           DurableFile::Ports{ports.privateFiles, ports.systemLog}, storeFile)),
       banners_(std::make_shared<Banners>(*this)) {
+  // The folder is there from now on, so that somebody may watch it.
+  static_cast<void>(ports_.privateFiles.prepare(lockFile_));
   ports_.notificationServer.setObserver(banners_);
   ports_.timer.setHandler([this] { tick(); });
 }
@@ -178,12 +181,15 @@ void ScheduledNotificationCenter::setDelegate(
 
 UserNotificationCenter::Failure ScheduledNotificationCenter::change(
     const std::function<Failure()>& calls) {
-  const bool isOutermost = !std::exchange(isOccupied_, true);
-  auto error = store_->change(calls);
-  if (isOutermost) {
-    isOccupied_ = false;
-    recheck();
+  Failure error;
+  {
+    const Restorer occupied(isOccupied_);
+    Restorer asked(isAskedToDeliver_);
+    isOccupied_ = true;
+    error = store_->change(calls);
+    if (!error) asked.dismiss();
   }
+  recheck();
   return error;
 }
 
@@ -218,8 +224,8 @@ UserNotificationCenter::Failure ScheduledNotificationCenter::removeScheduledNoti
 
 UserNotificationCenter::Failure ScheduledNotificationCenter::deliverNotification(
     const UserNotification& notification) {
-  isAskedToDeliver_ = true;
   auto error = store_->makeDue(notification, ports_.clock.now());
+  if (!error) isAskedToDeliver_ = true;
   recheck();
   return error;
 }
@@ -268,14 +274,17 @@ void ScheduledNotificationCenter::checkBanners(
 }
 
 void ScheduledNotificationCenter::recheck() {
-  if (std::exchange(isOccupied_, true)) return;
-  isBehind_ = false;
-  Failure failure = banners_->catchUp();
-  if (!failure) failure = deliverDue();
-  if (!failure) failure = banners_->follow();
-  report(failure);
-  isBehind_ = isBehind_ || failure || banners_->hasFailed();
-  isOccupied_ = false;
+  if (isOccupied_) return;
+  {
+    const Restorer occupied(isOccupied_);
+    isOccupied_ = true;
+    isBehind_ = false;
+    Failure failure = banners_->catchUp();
+    if (!failure) failure = deliverDue();
+    if (!failure) failure = banners_->follow();
+    report(failure);
+    isBehind_ = isBehind_ || failure || banners_->hasFailed();
+  }
   awaitNext();
 }
 

@@ -50,7 +50,7 @@ class VARNEL_API ScheduledNotificationCenter final : public UserNotificationCent
     WallClockTimer& timer;
   };
 
-  /// The store's file is made, with its folder, on first use.
+  /// The store's folder is made now, its file on first use.
   ScheduledNotificationCenter(Ports ports, const std::string& storeFile);
   ~ScheduledNotificationCenter() override;
   ScheduledNotificationCenter(const ScheduledNotificationCenter&) = delete;

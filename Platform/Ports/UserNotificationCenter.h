@@ -55,7 +55,7 @@ class VARNEL_API UserNotificationCenter {
   /// Makes several calls on this center together: all are done or, where one fails or `calls`
   /// answers a failure, none. Nothing is delivered, shown or taken away before that is decided.
   /// `calls` may be run more than once, each time from the same start; it makes no calls but those
-  /// on this center's two lists.
+  /// on this center's two lists. What it throws comes out of this, and none is done.
   ///
   ///     center.change([&]() -> UserNotificationCenter::Failure {
   ///       if (auto error = center.removeScheduledNotification(old)) return error;

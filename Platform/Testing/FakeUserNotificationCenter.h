@@ -43,8 +43,15 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
   [[nodiscard]] Failure change(const std::function<Failure()>& calls) override {
     if (isChanging_) return calls();
     const State start = state_;
+    Failure error;
     isChanging_ = true;
-    auto error = calls();
+    try {
+      error = calls();
+    } catch (...) {
+      isChanging_ = false;
+      state_ = start;
+      throw;
+    }
     isChanging_ = false;
     if (error) state_ = start;
     for (const auto& notification : std::exchange(state_.due, {})) deliver(notification);

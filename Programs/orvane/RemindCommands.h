@@ -16,7 +16,8 @@ struct RemindEveryCommand {
   [[nodiscard]] int run(Console& console) const;
 };
 
-/// `orvane remind status`: tells the chosen period and lists the notifications.
+/// `orvane remind status`: tells the chosen period, whether its reminder is planned, and lists the
+/// notifications.
 struct RemindStatusCommand {
   [[nodiscard]] int run(Console& console) const;
 };

@@ -52,19 +52,6 @@ class PlanningCenter final : public UserNotificationCenter {
   UserNotificationCenter& center_;
 };
 
-// Whether exactly the reminder of this period is planned.
-Varnel::Platform::Result<bool> isPlanned(UserNotificationCenter& center,
-                                         SchedulePeriodOption period) {
-  auto planned = readPatiently(center, &UserNotificationCenter::scheduledNotifications);
-  if (!planned) return planned.error();
-  std::erase_if(*planned, [](const auto& each) { return !each.deliveryRepeatInterval; });
-  if (period == SchedulePeriodOption::never) return planned->empty();
-  const auto& ports = Varnel::Platform::processPorts();
-  const auto interval =
-      period.repeatInterval(Varnel::Platform::Calendar(ports.userLocale, ports.timeZones));
-  return planned->size() == 1 && planned->front().deliveryRepeatInterval == interval;
-}
-
 std::string reasonOf(const std::optional<Varnel::Platform::PlatformError>& failure) {
   return failure ? failure->localizedDescription() : "it is not in the store";
 }
@@ -77,6 +64,18 @@ struct ReminderPlanner::Parts {
                                          Varnel::Platform::processPorts().mainQueue}};
   Varnel::SchedulerService service{std::make_shared<Tallyhouse::AnalyticsTracker>(), router};
 };
+
+Varnel::Platform::Result<bool> isPlanned(UserNotificationCenter& center,
+                                         SchedulePeriodOption period) {
+  auto planned = readPatiently(center, &UserNotificationCenter::scheduledNotifications);
+  if (!planned) return planned.error();
+  std::erase_if(*planned, [](const auto& each) { return !each.deliveryRepeatInterval; });
+  if (period == SchedulePeriodOption::never) return planned->empty();
+  const auto& ports = Varnel::Platform::processPorts();
+  const auto interval =
+      period.repeatInterval(Varnel::Platform::Calendar(ports.userLocale, ports.timeZones));
+  return planned->size() == 1 && planned->front().deliveryRepeatInterval == interval;
+}
 
 void repairPlan(Varnel::SchedulerService& service, Console& console) {
   const auto period = storedPeriod();
@@ -109,10 +108,15 @@ bool ReminderPlanner::planRegular(SchedulePeriodOption period) {
   service.setSchedulePeriod(period);
   awaitDesktop([&] { return service.failure().has_value(); });
   const auto planned = isPlanned(parts_->center, period);
-  if (planned && *planned) return true;
   const Failure failure = planned ? service.failure() : Failure(planned.error());
+  if (planned && *planned) {
+    if (!failure) return true;
+    // It is of an earlier time, and nobody mends what looks right.
+    console_.complain("the plan stays as it was: " + reasonOf(failure));
+    return false;
+  }
   console_.complain("the period is kept, but the reminder is not planned: " + reasonOf(failure) +
-                    "; the next remind command tries again");
+                    "; the next command that plans or listens tries again");
   return false;
 }
 

@@ -6,6 +6,7 @@
 #include <optional>
 
 #include <Varnel/Platform/Values/PlatformError.h>
+#include <Varnel/Platform/Values/Result.h>
 #include <Varnel/Reminders/SchedulePeriodOption.h>
 
 namespace Varnel {
@@ -19,6 +20,10 @@ struct UserNotification;
 namespace Orvane {
 
 class Console;
+
+/// Whether exactly the reminder of this period is planned.
+[[nodiscard]] Varnel::Platform::Result<bool> isPlanned(
+    Varnel::Platform::UserNotificationCenter& center, Varnel::SchedulePeriodOption period);
 
 /// Plans anew where the stored period is not the planned one: a program was killed between storing
 /// and planning, or could not plan. Says what is in its way, and tries again while the main queue
@@ -39,7 +44,7 @@ class ReminderPlanner final {
   ReminderPlanner(const ReminderPlanner&) = delete;
   ReminderPlanner& operator=(const ReminderPlanner&) = delete;
 
-  /// The reminder of this period, which is stored.
+  /// The reminder of this period, which is stored; anew also where it is planned already.
   [[nodiscard]] bool planRegular(Varnel::SchedulePeriodOption period);
   /// A notification of its own, beside the reminder of the stored period.
   [[nodiscard]] bool plan(const Varnel::Platform::UserNotification& notification);

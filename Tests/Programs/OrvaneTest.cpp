@@ -60,9 +60,9 @@ class Orvane : public ::testing::Test {
 
   ScanFolder folder;
   ScanFolder home;
+  /// A program that runs another may follow.
   std::vector<std::string> moreEnvironment;
 
- private:
   static std::string read(const std::string& path) {
     std::ostringstream text;
     text << std::ifstream(path, std::ios::binary).rdbuf();
@@ -285,6 +285,36 @@ TEST_F(Orvane, PlansReminders) {
   const Outcome status = run({"remind", "status"});
   EXPECT_THAT(status.output, AllOf(period("Never"), found("9.22 EB"), Not(regular)));
   EXPECT_EQ(status.status, 0);
+}
+
+// Whatever the mask of modes, and not in the home of another, who could not use them.
+TEST_F(Orvane, MakesTheFoldersOfItsStoresForItsUserAlone) {
+  namespace fs = std::filesystem;
+  moreEnvironment = {"/bin/sh", "-c", "umask 0; exec \"$@\"", "sh"};
+  const std::vector<std::string> plan = {"remind", "tomorrow", "--found", "1", "--selected", "0"};
+  EXPECT_EQ(run(plan).status, 0);
+  for (const char* made : {".local", ".local/state", ".local/state/com.quennel.Orvane2"})
+    EXPECT_EQ(fs::status(home.path(made)).permissions(), fs::perms::owner_all) << made;
+  fs::remove_all(home.path(".local"));
+  if (::chown(home.path().c_str(), 1234, static_cast<gid_t>(-1)) != 0) GTEST_SKIP() << "not root";
+  EXPECT_EQ(run(plan).status, 1);
+  EXPECT_FALSE(fs::exists(home.path(".local")));
+}
+
+// All that lies beside the settings and the stores is told to the user.
+TEST_F(Orvane, KeepsItsFilesWhereTheDocumentsSay) {
+  run({"analytics", "consent", "yes"});
+  run({"scan", "--analytics", "https://127.0.0.1:1", folder.path()});
+  run({"remind", "every", "weekly"});
+  const std::string documents = read(VARNEL_DOCUMENTS "/context.md");
+  for (const char* place : {".config", ".local/state"})
+    for (const auto& entry : std::filesystem::directory_iterator(
+             home.path(std::string(place) + "/com.quennel.Orvane2"))) {
+      const std::string name = entry.path().filename();
+      const std::size_t end = name.find_first_of("-.", name.find('.') + 1);
+      EXPECT_THAT(documents,
+                  HasSubstr(end == std::string::npos ? name : "`" + name.substr(end) + "`"));
+    }
 }
 
 TEST_F(Orvane, PlaysTheFrameworksSoundsToTheirEnd) {

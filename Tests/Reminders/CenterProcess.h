@@ -26,6 +26,7 @@ namespace Varnel::Platform::Testing {
 class Listener final : public UserNotificationCenterDelegate {
  public:
   bool presents = true;
+  bool throws = false;
   std::vector<std::string> events;
 
   void didDeliver(UserNotificationCenter&, const UserNotification& notification) override {
@@ -34,7 +35,10 @@ class Listener final : public UserNotificationCenterDelegate {
   void didActivate(UserNotificationCenter&, const UserNotification& notification) override {
     events.push_back("activated " + *notification.title);
   }
-  bool shouldPresent(UserNotificationCenter&, const UserNotification&) override { return presents; }
+  bool shouldPresent(UserNotificationCenter&, const UserNotification&) override {
+    if (throws) throw 1;
+    return presents;
+  }
 };
 
 /// A process of the product, on the store that all share.

@@ -158,22 +158,27 @@ TEST_P(ReminderTrouble, OrvaneSaysSoAndTheNextCommandPlans) {
   // To open and close a locked file would free it.
   const bool isLeftAlone = trouble.store == Trouble::isLeftAlone;
   const std::string before = isLeftAlone ? contentOf(home->store) : "";
-  const int status = home->orvane("remind every monthly");
-  if (trouble.store == Trouble::isReplaced) {
-    EXPECT_EQ(status, 0);
-    EXPECT_TRUE(fs::exists(home->store.string() + ".damaged"));
-  } else {
-    EXPECT_EQ(status, 1);
-    EXPECT_THAT(home->errors,
-                AllOf(HasSubstr("the reminder is not planned: "), HasSubstr(trouble.complaint)));
-    if (isLeftAlone) {
-      EXPECT_TRUE(contentOf(home->store) == before);
-    }
+  const bool isReplaced = trouble.store == Trouble::isReplaced;
+  // Also where the plan of before is one of the same period.
+  for (const char* period : {"weekly", "monthly"}) {
+    const int status = home->orvane(std::string("remind every ") + period);
+    EXPECT_EQ(status, isReplaced ? 0 : 1) << period;
+    EXPECT_THAT(home->errors, HasSubstr(isReplaced ? "" : "orvane: the "));
+    EXPECT_THAT(home->errors, HasSubstr(trouble.complaint));
+  }
+  EXPECT_EQ(fs::exists(home->store.string() + ".damaged"), isReplaced);
+  if (isLeftAlone) {
+    EXPECT_TRUE(contentOf(home->store) == before);
   }
   trouble.end(*home);
+  const auto saysSo = HasSubstr("the plan is not that of the period");
+  EXPECT_EQ(home->orvane("remind status"), 0);
+  EXPECT_EQ(testing::Matches(saysSo)(home->errors), !isReplaced) << home->errors;
   EXPECT_EQ(home->orvane("remind tomorrow --found 1 --selected 0"), 0) << home->errors;
   EXPECT_THAT(home->output,
               AllOf(HasSubstr("period: Every Month\n"), HasSubstr("  SchedulerNotification: ")));
+  EXPECT_EQ(home->orvane("remind status"), 0);
+  EXPECT_THAT(home->errors, Not(saysSo));
 }
 
 // A banner that is due in a bad moment comes after it, once.

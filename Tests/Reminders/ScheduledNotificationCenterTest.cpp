@@ -11,6 +11,7 @@
 #include <Tests/Reminders/CenterProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/SQLite/SQLiteDatabase.h>
+#include <Varnel/Platform/Testing/FakeUserNotificationCenter.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -286,22 +287,63 @@ TEST_F(ScheduledNotificationCenterTest, AnotherProcessTakesOverWhenTheDelivererE
 
 TEST_F(ScheduledNotificationCenterTest, CallsTogetherAreDoneAsOneAndNothingIsShownBefore) {
   process.listen();
-  process.schedule(weekly());
-  const auto fails = [&](bool isFailing) {
-    return process.center.change([&]() -> UserNotificationCenter::Failure {
-      EXPECT_FALSE(process.center.removeScheduledNotification(weekly()));
-      EXPECT_THAT(process.scheduled(), IsEmpty());
-      EXPECT_FALSE(process.center.deliverNotification({.title = "Now"}));
-      EXPECT_THAT(process.server.history(), IsEmpty());
-      if (isFailing) return PlatformError("Test", 1);
-      return std::nullopt;
+  Testing::FakeUserNotificationCenter fake;
+  const auto listener = std::make_shared<Testing::Listener>();
+  fake.setDelegate(listener);
+  const auto check = [](UserNotificationCenter& center, const auto& shownCount) {
+    EXPECT_FALSE(center.scheduleNotification(weekly()));
+    const auto change = [&](const std::function<UserNotificationCenter::Failure()>& end) {
+      return center.change([&]() -> UserNotificationCenter::Failure {
+        EXPECT_FALSE(center.removeScheduledNotification(weekly()));
+        EXPECT_THAT(center.scheduledNotifications().valueOr({weekly()}), IsEmpty());
+        EXPECT_FALSE(center.deliverNotification({.title = "Now"}));
+        EXPECT_EQ(shownCount(), 0u);
+        return end();
+      });
+    };
+    EXPECT_TRUE(change([] { return PlatformError("Test", 1); }));
+    EXPECT_THROW(static_cast<void>(change([]() -> UserNotificationCenter::Failure { throw 1; })),
+                 int);
+    EXPECT_THAT(center.scheduledNotifications().valueOr({}), ElementsAre(weekly()));
+    EXPECT_EQ(shownCount(), 0u);
+    EXPECT_FALSE(change([] { return std::nullopt; }));
+    EXPECT_THAT(center.scheduledNotifications().valueOr({weekly()}), IsEmpty());
+    EXPECT_EQ(shownCount(), 1u);
+  };
+  check(process.center, [this] { return process.server.history().size(); });
+  check(fake, [&] { return fake.presented.size(); });
+  // Nor is a center lost with what its delegate throws.
+  process.listener->throws = true;
+  EXPECT_THROW(process.deliver(weekly()), int);
+  process.listener->throws = false;
+  process.center.recheck();
+  EXPECT_THAT(process.server.history(), SizeIs(2));
+}
+
+// Only a delivery that was promised makes a program without a delegate show banners.
+TEST_F(ScheduledNotificationCenterTest, ADeliveryThatFailsMakesNoDeliverer) {
+  {
+    Process other(file, start);
+    other.listen();
+    other.deliver(weekly());  // Its banner has yet to come.
+  }
+  const auto deliver = [&] { return process.center.deliverNotification(weekly()); };
+  auto holder = SQLiteDatabase::open(file.string());
+  ASSERT_FALSE(holder->execute("BEGIN EXCLUSIVE"));
+  EXPECT_TRUE(deliver());
+  ASSERT_FALSE(holder->execute("COMMIT"));
+  const auto change = [&](const std::function<UserNotificationCenter::Failure()>& end) {
+    return process.center.change([&] {
+      EXPECT_FALSE(deliver());
+      return end();
     });
   };
-  EXPECT_TRUE(fails(true));
-  EXPECT_THAT(process.scheduled(), ElementsAre(weekly()));
+  EXPECT_TRUE(change([] { return PlatformError("Test", 1); }));
+  EXPECT_THROW(static_cast<void>(change([]() -> UserNotificationCenter::Failure { throw 1; })),
+               int);
+  process.timer.advanceTo(start + 1h);
   EXPECT_THAT(process.server.history(), IsEmpty());
-  EXPECT_FALSE(fails(false));
-  EXPECT_THAT(process.scheduled(), IsEmpty());
+  EXPECT_FALSE(change([] { return std::nullopt; }));
   EXPECT_THAT(process.server.history(), SizeIs(1));
 }
 

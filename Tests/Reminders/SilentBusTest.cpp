@@ -5,11 +5,14 @@
 #include <sys/socket.h>
 #include <sys/un.h>
 
+#include <atomic>
 #include <chrono>
 #include <latch>
+#include <optional>
 #include <stop_token>
 #include <string>
 #include <thread>
+#include <vector>
 
 #include <Tests/Support/DrainUntil.h>
 #include <Tests/Support/TemporaryFolder.h>
@@ -41,7 +44,7 @@ class SilentBus final {
   const POSIX::FileDescriptor socket_{::socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0)};
 };
 
-// Answers all that it is asked at once, but never says who does.
+// Answers all that it is asked at once, or nothing any more, but never says who does.
 class NamelessBus final {
  public:
   NamelessBus() {
@@ -52,30 +55,36 @@ class NamelessBus final {
       const Guid guid(g_dbus_generate_guid());
       const Server server(g_dbus_server_new_sync(address_.c_str(), G_DBUS_SERVER_FLAGS_NONE,
                                                  guid.get(), nullptr, nullptr, nullptr));
-      g_signal_connect(server.get(), "new-connection", G_CALLBACK(&accept), nullptr);
+      g_signal_connect(server.get(), "new-connection", G_CALLBACK(&accept), this);
       g_dbus_server_start(server.get());
       isReady.count_down();
       const std::stop_callback wake(stop, [this] { g_main_context_wakeup(context_.get()); });
       while (!stop.stop_requested()) g_main_context_iteration(context_.get(), TRUE);
+      if (connection_) g_dbus_connection_close_sync(connection_.get(), nullptr, nullptr);
       g_main_context_pop_thread_default(context_.get());
     });
     isReady.wait();
   }
 
+  std::atomic<bool> isMute = false;
+
  private:
   using Guid = UniqueHandle<char*, g_free>;
   using Server = UniqueHandle<GDBusServer*, g_object_unref>;
   using Context = UniqueHandle<GMainContext*, g_main_context_unref>;
+  using Connection = UniqueHandle<GDBusConnection*, g_object_unref>;
 
-  static gboolean accept(GDBusServer*, GDBusConnection* connection, gpointer) {
-    g_dbus_connection_add_filter(connection, &answer, nullptr, nullptr);
-    g_object_ref(connection);
+  static gboolean accept(GDBusServer*, GDBusConnection* connection, gpointer bus) {
+    g_dbus_connection_add_filter(connection, &answer, bus, nullptr);
+    static_cast<NamelessBus*>(bus)->connection_ =
+        Connection(G_DBUS_CONNECTION(g_object_ref(connection)));
     return TRUE;
   }
   static GDBusMessage* answer(GDBusConnection* connection, GDBusMessage* message, gboolean incoming,
-                              gpointer) {
+                              gpointer bus) {
     if (!incoming) return message;
     const Linux::BusMessage call(message);
+    if (static_cast<NamelessBus*>(bus)->isMute) return nullptr;
     const Linux::BusMessage reply(g_dbus_message_new_method_reply(call.get()));
     const char* const services[] = {"actions", nullptr};
     const bool asksForServices =
@@ -90,6 +99,7 @@ class NamelessBus final {
   const Tests::TemporaryFolder folder_;
   const std::string address_ = "unix:path=" + (folder_.path() / "bus").string();
   const Context context_{g_main_context_new()};
+  Connection connection_;  // The thread's.
   std::jthread thread_;
 };
 
@@ -105,6 +115,32 @@ TEST(NotificationServer, ABusThatDoesNotTellWhoAnswersCostsTheBannerAlone) {
   EXPECT_TRUE(mainQueue->runWhile([&] { return server->isBusy(); }, std::chrono::seconds(10)));
   EXPECT_THAT(log.text(), testing::HasSubstr("does not tell who answers"));
   g_main_context_pop_thread_default(own.get());
+}
+
+TEST(NotificationServer, ABusThatIsLostKeepsNobodyWaitingAndTheNextTakesItsPlace) {
+  std::optional<NamelessBus> bus(std::in_place);
+  const auto mainQueue = Linux::makeMainQueue();
+  Testing::CapturedSystemLog log;
+  const auto server = Linux::makeNotificationServer(log, {});
+  std::vector<bool> hasAnswered;
+  const auto ask = [&] {
+    server->check([&](const auto& obstacle) {
+      hasAnswered.push_back(obstacle->localizedDescription().find("does not tell who") !=
+                            std::string::npos);
+    });
+  };
+  const auto await = [&] {
+    return mainQueue->runWhile([&] { return server->isBusy(); }, std::chrono::seconds(10));
+  };
+  ask();
+  EXPECT_TRUE(await());
+  bus->isMute = true;
+  ask();
+  bus.emplace();
+  EXPECT_TRUE(await());
+  ask();
+  EXPECT_TRUE(await());
+  EXPECT_THAT(hasAnswered, testing::ElementsAre(true, false, true));
 }
 
 TEST(NotificationServer, AMainLoopThatComesLateFindsTheConnection) {

@@ -19,7 +19,8 @@ namespace {
 namespace fs = std::filesystem;
 
 // One center with everything that serves it alone. Other processes of the product may change its
-// file; a change of the user's time zone changes the link /etc/localtime.
+// file, whose folder the center makes; a change of the user's time zone changes the link
+// /etc/localtime.
 class Center final {
  public:
   Center(const NotificationPorts& ports, const NotificationSource& source, const fs::path& store)
@@ -41,14 +42,6 @@ class Center final {
   const FileWatch zoneWatch_;
 };
 
-// Its folder must exist before it can be watched. It is for the user alone.
-fs::path inPrivateFolder(const fs::path& store) {
-  std::error_code ignored;
-  if (fs::create_directories(store.parent_path(), ignored))
-    fs::permissions(store.parent_path(), fs::perms::owner_all, ignored);
-  return store;
-}
-
 class StoredCenters final : public UserNotificationCenters {
  public:
   explicit StoredCenters(const NotificationPorts& ports) : ports_(ports) {}
@@ -56,8 +49,7 @@ class StoredCenters final : public UserNotificationCenters {
   UserNotificationCenter& center(const NotificationSource& source) override {
     auto& center = centers_[source.identifier];
     if (!center)
-      center = std::make_unique<Center>(ports_, source,
-                                        inPrivateFolder(notificationStore(source.identifier)));
+      center = std::make_unique<Center>(ports_, source, notificationStore(source.identifier));
     return center->center();
   }
 
