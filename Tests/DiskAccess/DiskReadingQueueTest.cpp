@@ -232,15 +232,18 @@ TEST_F(DiskReadingQueueTest, AnswersAStopAtOnceInEachState) {
 
   std::stop_source inTurn;
   std::latch isIn(1);
+  std::latch mayLeave(1);
   const Task running = submit(onStick(), {.stop = inTurn.get_token()}, [&](Turn& turn) {
     isIn.count_down();
     while (!turn.isOver()) std::this_thread::yield();
+    mayLeave.wait();
     return Next::again();
   });
   isIn.wait();
   inTurn.request_stop();
-  EXPECT_EQ(running->result(), Result::stopped);
-  awaitFreeStick();
+  unmount(stickVolume);
+  mayLeave.count_down();
+  EXPECT_EQ(running->result(), Result::stopped) << "the first reason counts";
 }
 
 TEST_F(DiskReadingQueueTest, SaysWhyNothingWasRead) {

@@ -3,6 +3,7 @@
 #include <sqlite3.h>
 #include <sys/stat.h>
 
+#include <csignal>
 #include <fstream>
 
 #include <Tests/Platform/DurableNotes.h>
@@ -167,6 +168,19 @@ TEST_F(DurableFilePlacesTest, OnlyTheUserCanReadWhateverTheMaskAndLinksAre) {
       }
     }
   }
+}
+
+TEST_F(DurableFilePlacesTest, ALockEndsWithItsOwnerThoughAForkedChildLives) {
+  const auto files = POSIX::makePrivateFiles();
+  auto lock = files->tryLock(path_).value();
+  ASSERT_TRUE(lock);
+  EXPECT_FALSE(files->tryLock(path_).value());
+  const pid_t child = ::fork();
+  if (child == 0) ::_exit(::pause());
+  lock.reset();
+  EXPECT_TRUE(files->tryLock(path_).value());
+  ::kill(child, SIGKILL);
+  ::waitpid(child, nullptr, 0);
 }
 
 TEST_F(DurableFilePlacesTest, AFullDiskRefusesAndLaterTakes) {

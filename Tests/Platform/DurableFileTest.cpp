@@ -370,6 +370,14 @@ TEST_P(DurableFileTest, ASecondObjectOfTheProcessLeavesTheLocksOfTheFirst) {
   EXPECT_EQ(open()->keys(), "ab");
 }
 
+TEST_P(DurableFileTest, AStatementNoticesThatAnotherHasMigratedTheFile) {
+  auto book = open();
+  ASSERT_EQ(book->add("a"), "kept");
+  auto other = SQLiteDatabase::open(path_, SQLiteDatabase::Access::readWrite);
+  EXPECT_FALSE(other->execute("ALTER TABLE note RENAME TO page; PRAGMA user_version = 2000"));
+  EXPECT_EQ(book->add("b"), "newer");
+}
+
 TEST_P(DurableFileTest, AForkedChildLeavesTheFileToItsParent) {
   auto book = open();
   ASSERT_EQ(book->add("a"), "kept");

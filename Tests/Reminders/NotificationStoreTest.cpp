@@ -164,6 +164,8 @@ TEST_F(NotificationStoreTest, ADeliveryGoesFromStateToState) {
   EXPECT_TRUE(*store.noteShown(first.number, "banner 1"));
   EXPECT_TRUE(*store.noteShown(first.number, "banner 1"));  // As a work that is done again.
   EXPECT_EQ(only(store, shown).banner, "banner 1");
+  EXPECT_FALSE(store.decideDue({{first.number, true}}));
+  EXPECT_EQ(only(store, shown).number, first.number) << "it was decided already";
 
   // Its successor has a number of its own and inherits its banner, to replace it.
   const Delivery second = madeToShow(store, weekly(), start + 1h);

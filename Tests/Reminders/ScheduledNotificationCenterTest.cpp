@@ -193,8 +193,10 @@ TEST_F(ScheduledNotificationCenterTest, WithoutADelegateWhatIsDueWaits) {
   process.clock.set(start + week);
   process.center.recheck();
   EXPECT_THAT(process.server.history(), IsEmpty());
-  process.listen();
+  process.deliver({.title = "Now"});
   EXPECT_THAT(process.server.history(), SizeIs(1));
+  process.listen();
+  EXPECT_THAT(process.server.history(), SizeIs(2));
 }
 
 // A banner that was promised comes, once, whatever became of the first try.
@@ -238,6 +240,18 @@ TEST_F(ScheduledNotificationCenterTest, ABannerThatDidNotComeIsShownLater) {
       EXPECT_THAT(run->server.history(), SizeIs(1)) << row.name << isNextRun;
       EXPECT_EQ(run->timer.armedDate(), start + 2 * week) << row.name << isNextRun;
     }
+}
+
+TEST_F(ScheduledNotificationCenterTest, AClockSetBackPutsNoRetryOff) {
+  process.listen();
+  process.schedule(weekly());
+  process.server.faults->plan(Testing::Fault::fails, 1);
+  process.timer.advanceTo(start + week);
+  process.server.report();
+  process.server.faults->mend();
+  process.timer.setClock(start);
+  process.server.report();
+  EXPECT_THAT(process.server.history(), SizeIs(1));
 }
 
 TEST_F(ScheduledNotificationCenterTest, AHostThatEndsBeforeTheServerHasAnsweredShowsItAgain) {
@@ -344,6 +358,12 @@ TEST_F(ScheduledNotificationCenterTest, ADeliveryThatFailsMakesNoDeliverer) {
   process.timer.advanceTo(start + 1h);
   EXPECT_THAT(process.server.history(), IsEmpty());
   EXPECT_FALSE(change([] { return std::nullopt; }));
+  EXPECT_THAT(process.server.history(), SizeIs(1));
+  // What is due can still be called off.
+  EXPECT_FALSE(process.center.change([&] {
+    EXPECT_FALSE(process.center.deliverNotification({.title = "Never"}));
+    return process.center.removeScheduledNotification({.title = "Never"});
+  }));
   EXPECT_THAT(process.server.history(), SizeIs(1));
 }
 

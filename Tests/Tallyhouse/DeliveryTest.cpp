@@ -167,6 +167,11 @@ TEST_F(DeliveryTest, WhatArrivedButCannotBeNotedIsNotRepeated) {
   EXPECT_EQ(process.step(), Delivery::State::idle);
   EXPECT_EQ(http.posts().size(), 1u);
   EXPECT_EQ(names(), "");
+  append(20);
+  EXPECT_EQ(process.step(), Delivery::State::fileAway);
+  lock.reset();
+  process.delivery.finish();
+  EXPECT_EQ(names(), "") << "nor by the next run";
 }
 
 TEST_F(DeliveryTest, OneProcessDeliversUntilItHasNothingToDoOrDies) {
@@ -216,6 +221,7 @@ TEST_F(DeliveryTest, ThePauseThatAServerAsksForOutlivesTheProcess) {
   EXPECT_EQ(Process(*this).step(), Delivery::State::later);
   EXPECT_EQ(http.posts().size(), 2u);
   EXPECT_EQ(openSpool()->look("https://h.example/batch", 1, 3)->state.failures, 2);
+  EXPECT_FALSE(openSpool()->look("https://other.example", 1, 3)->state.notBefore);
 }
 
 TEST_F(DeliveryTest, AfterAStopNothingIsSent) {

@@ -79,10 +79,27 @@ TEST_F(EventSpoolTest, WhatIsDeliveredIsToldOfEachProcessAlone) {
   const auto events = spool->waiting(many, many);
   ASSERT_EQ(events.size(), 3u);
   EXPECT_FALSE(spool->isDelivered(other->own()));
+  auto others = events;
+  for (SpooledEvent& event : others) event.uuid = "has this number now";
+  for (const Verdict verdict : {Verdict::delivered, Verdict::refused})
+    EXPECT_TRUE(spool->save({others, verdict, clock.now(), {}}));
+  EXPECT_EQ(namesOf(*spool), "first refused last ");
   EXPECT_TRUE(spool->save({{events[1]}, Verdict::refused, clock.now(), {}}));
   EXPECT_TRUE(spool->save({{events[0], events[2]}, Verdict::delivered, clock.now(), {}}));
   EXPECT_TRUE(spool->isDelivered(other->own()));
   EXPECT_FALSE(spool->isDelivered(one->own()));
+}
+
+TEST_F(EventSpoolTest, WhatComesWhileTheDelivererLooksIsNotOverlooked) {
+  const auto recorder = openRecorder();
+  append(*recorder, {"a"});
+  const OwnEvents delivered = recorder->own();
+  recorder->looking();
+  EXPECT_EQ(recorder->append("b", clock.now(), "x"), 1) << "which wakes it";
+  recorder->seen(30);
+  EXPECT_EQ(recorder->append("c", clock.now(), "x"), 32);
+  recorder->forget(delivered);
+  EXPECT_FALSE(openSpool()->isDelivered(recorder->own()));
 }
 
 TEST_F(EventSpoolTest, DropsAndCountsTheOldestAtEitherLimitWhoeverRecords) {
@@ -95,7 +112,6 @@ TEST_F(EventSpoolTest, DropsAndCountsTheOldestAtEitherLimitWhoeverRecords) {
   EXPECT_EQ(namesOf(*spool), "c d e f ");
   EXPECT_TRUE(spool->refused(3).empty()) << "they count, too";
   EXPECT_EQ(one->droppedCount(), 2);
-  EXPECT_FALSE(spool->isDelivered(one->own())) << "gone is not delivered";
 
   const auto small = openRecorder({.maxBytes = 100 << 10});
   for (int i = 0; i < 200; ++i) small->append("large", clock.now(), std::string(5000, 'x'));
@@ -104,6 +120,7 @@ TEST_F(EventSpoolTest, DropsAndCountsTheOldestAtEitherLimitWhoeverRecords) {
   EXPECT_GT(kept, 5u);
   EXPECT_LT(kept, 20u);
   EXPECT_EQ(small->droppedCount(), 6 + 200 - static_cast<std::int64_t>(kept));
+  EXPECT_FALSE(spool->isDelivered(one->own())) << "gone is not delivered";
 }
 
 TEST_F(EventSpoolTest, ARefusalOfConsentReachesWhatOtherProcessesHoldAndDo) {
@@ -137,6 +154,11 @@ TEST_F(EventSpoolTest, ARefusalOfConsentReachesWhatOtherProcessesHoldAndDo) {
   EXPECT_TRUE(spool->isDelivered(one->own()));
   EXPECT_FALSE(spool->isDelivered(other->own())) << "\"d\" was given up";
   EXPECT_EQ(one->droppedCount(), 0);
+  one->discard();
+  append(*other, {"f"});
+  EXPECT_EQ(namesOf(*spool), "") << "nor is there a short way past a refusal";
+  EXPECT_EQ(other->append("g", clock.now(), "x"), 0);
+  one->begin();
 
   const std::string secret = "Secret";
   append(*one, {secret});
@@ -175,8 +197,8 @@ TEST_F(EventSpoolTest, ARefusalThatTheFileDoesNotAllowYetIsMadeUpFor) {
   recorder->discard();
   EXPECT_TRUE(recorder->mustEmpty());
   recorder->begin();
-  append(*recorder, {"b"});
   lock.end();
+  append(*recorder, {"b"});
   EXPECT_FALSE(recorder->settle(spool->file(), Haste::none));
   EXPECT_FALSE(isFound("Secret", fs::path(path()).parent_path()));
   EXPECT_EQ(namesOf(*spool), "b ");
