@@ -130,10 +130,16 @@ std::optional<PlatformError> SQLiteDatabase::runToEnd(SQLiteStatement& statement
 std::optional<PlatformError> SQLiteDatabase::transaction(
     const char* begin, const std::function<std::optional<PlatformError>(SQLiteDatabase&)>& work) {
   if (auto error = execute(begin)) return error;
+  // Also when the work throws. This fails if an error has already ended the transaction.
+  struct Rollback {
+    sqlite3* connection;
+    ~Rollback() {
+      if (connection) ::sqlite3_exec(connection, "ROLLBACK", nullptr, nullptr, nullptr);
+    }
+  } rollback{connection_.get()};
   auto error = work(*this);
   if (!error) error = execute("COMMIT");
-  // This fails if the error has already ended the transaction.
-  if (error) static_cast<void>(execute("ROLLBACK"));
+  if (!error) rollback.connection = nullptr;
   return error;
 }
 
