@@ -126,6 +126,7 @@ Delivery::Step DeliveryWorker::deliver(Haste haste, bool isPaused, std::stop_tok
 
 bool DeliveryWorker::areOwnDelivered() {
   const OwnEvents own = recorder_.own();
+  if (own.first != 0 && !recorder_.isInPlace()) return false;
   if (!spool_.isDelivered(own)) return false;
   recorder_.forget(own);
   return true;

@@ -112,6 +112,7 @@ EventRecorder::EventRecorder(Ports ports, std::string path, SpoolLimits limits)
 
 EventRecorder::~EventRecorder() {
   settle(file_, Haste::none);
+  if (lastID_ != 0) static_cast<void>(isInPlace());
   if (!held_.empty())
     ports_.systemLog.write(fmt::format("{} events are lost: {}", held_.size(), path_));
 }
@@ -285,6 +286,11 @@ OwnEvents EventRecorder::own() const {
   OwnEvents own = own_;
   own.isHeld = !held_.empty();
   return own;
+}
+
+bool EventRecorder::isInPlace() {
+  const std::lock_guard atFile(fileMutex_);
+  return !file_.read([](SQLiteDatabase&) { return Error(); });
 }
 
 void EventRecorder::forget(const OwnEvents& delivered) {

@@ -61,7 +61,8 @@ class EventRecorder final {
   };
 
   EventRecorder(Ports ports, std::string path, SpoolLimits limits);
-  /// Tries for the last time to write what is held, and tells the system's log what is lost.
+  /// Tries for the last time to write what is held, and what lies in a spool that was taken away,
+  /// and tells the system's log what is lost.
   ~EventRecorder();
   EventRecorder(const EventRecorder&) = delete;
   EventRecorder& operator=(const EventRecorder&) = delete;
@@ -97,6 +98,9 @@ class EventRecorder final {
   void seen(std::int64_t waiting);
 
   [[nodiscard]] OwnEvents own() const;
+  /// Whether those, as asked for before, lie where others find them: carries over what was appended
+  /// to a spool that has been taken away.
+  [[nodiscard]] bool isInPlace();
   /// They were delivered.
   void forget(const OwnEvents& delivered);
 

@@ -7,7 +7,6 @@
 
 #include <array>
 #include <cerrno>
-#include <chrono>
 #include <cstdio>
 #include <filesystem>
 
@@ -148,24 +147,6 @@ class DescriptionLock final : public FileLock {
   FileDescriptor file_;
 };
 
-class PathDescriptor final : public HeldFile {
- public:
-  explicit PathDescriptor(FileDescriptor file) : file_(std::move(file)) {}
-
-  [[nodiscard]] State state() const override {
-    struct stat facts {};
-    if (::fstat(file_.get(), &facts) != 0) return {};
-    const std::chrono::nanoseconds change = std::chrono::seconds(facts.st_ctim.tv_sec) +
-                                            std::chrono::nanoseconds(facts.st_ctim.tv_nsec);
-    return {.isRemoved = facts.st_nlink == 0,
-            .isEmpty = facts.st_size == 0,
-            .lastChange = change.count()};
-  }
-
- private:
-  FileDescriptor file_;
-};
-
 class OwnFiles final : public PrivateFiles {
  public:
   Result<std::string> prepare(const std::string& path) override {
@@ -194,12 +175,6 @@ class OwnFiles final : public PrivateFiles {
     if (::lstat(path.c_str(), &facts) != 0) return std::nullopt;
     return FileIdentity{
         .device = facts.st_dev, .inode = facts.st_ino, .isEmpty = facts.st_size == 0};
-  }
-
-  std::unique_ptr<HeldFile> hold(const std::string& path) override {
-    FileDescriptor file(::open(path.c_str(), O_PATH | O_NOFOLLOW | O_CLOEXEC));
-    if (!file) return nullptr;
-    return std::make_unique<PathDescriptor>(std::move(file));
   }
 
   Result<std::unique_ptr<FileLock>> tryLock(const std::string& path) override {

@@ -24,20 +24,6 @@ struct FileIdentity final {
   }
 };
 
-/// A file that is held on to without being opened. Looking at it is cheaper than finding it by its
-/// path, but does not tell whether a folder above it was moved.
-class VARNEL_API HeldFile {
- public:
-  virtual ~HeldFile() = default;
-
-  struct State final {
-    bool isRemoved = true;  ///< No path leads to it any more, or nothing can be told.
-    bool isEmpty = true;
-    std::int64_t lastChange = 0;  ///< Differs after the file was written, emptied or renamed.
-  };
-  [[nodiscard]] virtual State state() const = 0;
-};
-
 /// A lock that is held. Destruction frees it, and so does the end of the process, however it ends.
 class VARNEL_API FileLock {
  public:
@@ -73,9 +59,6 @@ class VARNEL_API PrivateFiles {
 
   /// The file at the path, which is not opened; absent when there is none.
   [[nodiscard]] virtual std::optional<FileIdentity> identity(const std::string& path) = 0;
-
-  /// The file at the path, held on to; null when there is none.
-  [[nodiscard]] virtual std::unique_ptr<HeldFile> hold(const std::string& path) = 0;
 
   /// Locks a file that serves as a lock alone and is prepared first; null when somebody has it,
   /// this process included. Never waits. A program that the process starts does not hold it.

@@ -40,7 +40,9 @@ class VARNEL_API UserNotificationCenterDelegate {
 ///     if (const auto error = center.scheduleNotification(reminder)) tell(*error);
 ///
 /// A call that succeeded is a promise that outlives the process. One that failed has changed
-/// nothing; whoever made it may try again (`retryLater`). Main thread only.
+/// nothing; whoever made it may try again (`retryLater`). Only a call in whose last moment somebody
+/// takes the center's file away, so that no other can be put there, may have been done all the
+/// same. Main thread only.
 class VARNEL_API UserNotificationCenter {
  public:
   using Failure = std::optional<PlatformError>;  ///< None when the call was done.

@@ -14,7 +14,8 @@ namespace Varnel::Platform {
 // What lies beside the file PATH:
 //   PATH-journal, PATH-wal, PATH-shm    the library's
 //   PATH.opening                        locked by the one who opens the file, or sets it aside
-//   PATH.salvage                        was set aside, and its rows are not taken over yet
+//   PATH.salvage                        was set aside, and its rows are not taken over yet: until
+//                                       they are, nobody uses the file
 //   PATH.damaged                        was set aside, and its rows are taken over
 // A process may be killed after each step: the next one to open the file goes on from there.
 inline constexpr const char* turnSuffix = ".opening";
@@ -30,11 +31,8 @@ struct DurableFile::Connection {
   FileIdentity file;
   std::optional<FileIdentity> log;
   std::optional<FileIdentity> index;
-  std::unique_ptr<HeldFile> heldFile;
-  std::unique_ptr<HeldFile> heldLog;
   std::chrono::steady_clock::time_point lookedAt;
-  std::int64_t lastChange = 0;  ///< Of the file, when it was last found in its place.
-  const int forksBefore;        ///< How often the process had forked until then.
+  const int forksBefore;  ///< How often the process had forked until then.
 };
 
 }  // namespace Varnel::Platform

@@ -17,7 +17,7 @@ namespace fs = std::filesystem;
 
 // A file that is taken away this often within one operation is beyond help.
 constexpr int maxRounds = 4;
-// For how long a user who does not look each time trusts that nothing has happened to the files.
+// For how long a user who does not look each time trusts that the files are in their places.
 constexpr auto maxUnlooked = std::chrono::milliseconds(1);
 // The log is moved into the file when it has this many pages, unless somebody does so before.
 constexpr int maxLoggedPages = 8000;
@@ -71,7 +71,7 @@ DurableFile::~DurableFile() {
 }
 
 DurableFile::Failure DurableFile::read(const Work& work) {
-  return attempt(Look::byPath, [&](SQLiteDatabase& database) {
+  return attempt(Looking::eachTime, [&](SQLiteDatabase& database) {
     return database.transaction("BEGIN", ofThisFormat(work));
   });
 }
@@ -79,14 +79,18 @@ DurableFile::Failure DurableFile::read(const Work& work) {
 DurableFile::Failure DurableFile::change(const Work& work) {
   // What could only be read may be writable by now.
   if (connection_ && !isFromBeforeFork() && connection_->database.isReadOnly()) connection_.reset();
-  return attempt(Look::byPath, [&](SQLiteDatabase& database) {
-    return database.transaction("BEGIN IMMEDIATE", ofThisFormat(work));
+  return attempt(Looking::eachTime, [&](SQLiteDatabase& database) {
+    return database.transaction("BEGIN IMMEDIATE", [&](SQLiteDatabase&) -> Failure {
+      if (auto error = ofThisFormat(work)(database)) return error;
+      // What is committed to a lost file may be found later, though it could not be carried over.
+      if (isLost()) return fileError(SQLiteFailure::busy, path_ + " was taken away meanwhile");
+      return std::nullopt;
+    });
   });
 }
 
 DurableFile::Failure DurableFile::changeByOneStatement(const Work& work, Looking looking) {
-  const Look look = looking == Looking::eachTime ? Look::atFiles : Look::atFilesAtTimes;
-  return attempt(look, [&](SQLiteDatabase& database) {
+  return attempt(looking, [&](SQLiteDatabase& database) {
     auto error = work(database);
     // The tables may be those of a later version by now.
     if (error && meaningOf(*error) == SQLiteFailure::other)
@@ -125,15 +129,15 @@ bool DurableFile::isThere() const {
   return isThere;
 }
 
-DurableFile::Failure DurableFile::attempt(Look look, const Work& operation) {
+DurableFile::Failure DurableFile::attempt(Looking looking, const Work& operation) {
   if (isFromBeforeFork()) return fileError(SQLiteFailure::refused, path_ + " is the parent's");
   deadline_.restart();
   Failure error;
   for (int round = 0; round < maxRounds; ++round) {
     if ((error = ensureOpen())) return said(*error);
     error = operation(connection_->database);
-    const bool isUntouched = look != Look::byPath && !error && looksUntouched(look);
-    if (!isUntouched && isLost()) {
+    const bool looks = error || looking == Looking::eachTime || isTimeToLook();
+    if (looks && isLost()) {
       error = replaceLost();
     } else if (isDamage(error)) {
       error = setAside(*error);
@@ -152,28 +156,19 @@ bool DurableFile::isFromBeforeFork() const {
   return connection_ && connection_->forksBefore != forksSoFar();
 }
 
-// Whether the path no longer leads to what the connection writes.
+bool DurableFile::isTimeToLook() const {
+  return std::chrono::steady_clock::now() - connection_->lookedAt >= maxUnlooked;
+}
+
+// Whether the path no longer leads to what the connection writes. Only the path can tell: when a
+// folder above it is renamed, nothing changes at the file.
 bool DurableFile::isLost() {
   PrivateFiles& files = ports_.privateFiles;
   connection_->lookedAt = std::chrono::steady_clock::now();
-  if (connection_->heldFile) connection_->lastChange = connection_->heldFile->state().lastChange;
   const auto file = files.identity(path_);
   if (!file || file->isEmpty || *file != connection_->file) return true;
   return (connection_->log && files.identity(logPath_) != connection_->log) ||
          (connection_->index && files.identity(indexPath_) != connection_->index);
-}
-
-// Whether nothing has happened to the files themselves since they were last found by their paths:
-// most of what can happen shows there, for a fraction of the time. False when in doubt.
-bool DurableFile::looksUntouched(Look look) const {
-  Connection& open = *connection_;
-  if (!open.heldFile || !open.heldLog) return false;
-  const auto now = std::chrono::steady_clock::now();
-  if (look == Look::atFilesAtTimes && now - open.lookedAt < maxUnlooked) return true;
-  open.lookedAt = now;
-  const auto file = open.heldFile->state();
-  return !file.isRemoved && !file.isEmpty && file.lastChange == open.lastChange &&
-         !open.heldLog->state().isRemoved;
 }
 
 DurableFile::Failure DurableFile::ensureOpen() {
@@ -181,14 +176,17 @@ DurableFile::Failure DurableFile::ensureOpen() {
   if (const auto turn = takeTurn(); !turn) {
     // Where nothing can be locked nothing can be changed, by anybody, but perhaps read.
     if (meaningOf(turn.error()) != SQLiteFailure::readOnly) return turn.error();
-    if (!ports_.privateFiles.identity(path_)) return turn.error();
+    const bool isWhole = !ports_.privateFiles.identity(path_ + pendingSuffix);
+    if (!isWhole || !ports_.privateFiles.identity(path_)) return turn.error();
     if (auto error = open()) return error;
   } else {
-    auto error = open();
-    if (isDamage(error)) error = moveAside(error->localizedDescription());
-    if (!error && !connection_) error = open();
+    auto error = openWhole();
+    if (isDamage(error)) {
+      connection_.reset();
+      error = moveAside(error->localizedDescription());
+      if (!error) error = openWhole();
+    }
     if (error) return error;
-    takeOverSetAside();
   }
   // A large file takes its time, which others need not wait for.
   const auto error = check();
@@ -206,6 +204,11 @@ Result<std::unique_ptr<FileLock>> DurableFile::takeTurn() {
       return fileError(SQLiteFailure::busy,
                        path_ + " is being opened or mended by another process");
   }
+}
+
+DurableFile::Failure DurableFile::openWhole() {
+  auto error = open();
+  return error ? error : takeOverSetAside();
 }
 
 DurableFile::Failure DurableFile::open() {
@@ -239,12 +242,12 @@ DurableFile::Failure DurableFile::open() {
     error = database->execute(isFull ? "PRAGMA synchronous = FULL" : "PRAGMA synchronous = NORMAL");
   if (error) return error;
   connection_ = std::make_unique<Connection>(std::move(*database), forksSoFar());
-  if (holdFiles()) return std::nullopt;
+  if (noteFiles()) return std::nullopt;
   connection_.reset();
   return fileError(SQLiteFailure::busy, path_ + " was taken away while it was opened");
 }
 
-bool DurableFile::holdFiles() {
+bool DurableFile::noteFiles() {
   PrivateFiles& files = ports_.privateFiles;
   Connection& open = *connection_;
   const auto file = files.identity(path_);
@@ -253,8 +256,6 @@ bool DurableFile::holdFiles() {
   if (open.database.isReadOnly() || !keepsLog(open.database)) return true;
   open.log = files.identity(logPath_);
   open.index = files.identity(indexPath_);
-  open.heldFile = files.hold(path_);
-  open.heldLog = files.hold(logPath_);
   return !isLost();
 }
 

@@ -35,8 +35,10 @@ class SystemLog;
 ///
 /// A damaged file is set aside (".damaged" behind its name) by one process alone, and a new one
 /// begun, which takes over every row that can still be read; so it does from a connection whose
-/// file was taken away. Both are said in the system's log and counted. A file that is not the
-/// user's own or of a later format is left alone; that is said once by each object.
+/// file was taken away. Both are said in the system's log and counted. Until the rows are taken
+/// over, for want of room perhaps, every operation fails. With a write-ahead log, rows that were
+/// taken over from a file that was moved are removed from it. A file that is not the user's own or
+/// of a later format is left alone; that is said once by each object.
 ///
 /// No operation waits longer than `maxLockWait` for the locks of others, all its waits together;
 /// then it fails as busy. Nothing is kept in memory: what has failed is not done later. The file is
@@ -64,19 +66,22 @@ class DurableFile final {
   /// Does a work that only reads, on one state of the file.
   [[nodiscard]] std::optional<PlatformError> read(const Work& work);
 
-  /// Does the work wholly or not at all, and alone among all who share the file.
+  /// Does the work wholly or not at all, and alone among all who share the file. When it fails
+  /// nothing has changed, but for one case: if the file is taken away during the commit itself and
+  /// cannot be replaced at once, the change goes into the next file if this object lives to see it.
   [[nodiscard]] std::optional<PlatformError> change(const Work& work);
 
   /// How often the file is looked at, whether it is still in its place.
   enum class Looking {
     eachTime,
-    /// For a sixth of an insertion less. What was written into a file that had been taken away
-    /// within the last millisecond is carried over by the next operation, not by this one.
+    /// For less. What was written into a file that had been taken away within the last millisecond
+    /// is carried over by the next operation that looks, not by this one: the last one of all
+    /// should be a `read`.
     eachMillisecond
   };
 
-  /// Does a work that runs one statement: the same for less. That a folder above the file, or the
-  /// journal alone, was renamed is noticed by the next `read` or `change`.
+  /// Does a work that runs one statement: the same for less. When it fails for want of a file in
+  /// the place of one that was taken away, the change may still go into that one later.
   [[nodiscard]] std::optional<PlatformError> changeByOneStatement(
       const Work& work, Looking looking = Looking::eachTime);
 
@@ -97,29 +102,26 @@ class DurableFile final {
   struct Connection;
   using Failure = std::optional<PlatformError>;
 
-  enum class Look {
-    byPath,
-    atFiles,
-    atFilesAtTimes
-  };  ///< How to find out whether the file was taken away.
-
-  [[nodiscard]] Failure attempt(Look look, const Work& operation);
+  [[nodiscard]] Failure attempt(Looking looking, const Work& operation);
   [[nodiscard]] Work ofThisFormat(const Work& work) const;
   [[nodiscard]] bool isFromBeforeFork() const;
   [[nodiscard]] bool isLost();
-  [[nodiscard]] bool looksUntouched(Look look) const;
+  [[nodiscard]] bool isTimeToLook() const;
   [[nodiscard]] Failure ensureOpen();
   [[nodiscard]] Result<std::unique_ptr<FileLock>> takeTurn();
   // With the turn taken:
   [[nodiscard]] Failure open();
-  [[nodiscard]] bool holdFiles();
+  [[nodiscard]] Failure openWhole();
+  [[nodiscard]] bool noteFiles();
   [[nodiscard]] Failure setUp(SQLiteDatabase& database, const std::string& path);
   [[nodiscard]] Failure check();
   [[nodiscard]] Failure moveAside(const std::string& reason);
   void finishMovingAside();
   void removeJournals();
-  void takeOverSetAside();
-  [[nodiscard]] Failure takeOver(SQLiteDatabase* from, bool isCounted);
+  [[nodiscard]] Failure takeOverSetAside();
+  [[nodiscard]] Failure putAway(const std::string& file);
+  [[nodiscard]] Failure takeOverLost(SQLiteDatabase& lost, bool isCounted);
+  [[nodiscard]] Failure takeOver(SQLiteDatabase& from, bool isCounted);
   // These take the turn:
   [[nodiscard]] Failure setAside(const PlatformError& damage);
   [[nodiscard]] Failure replaceLost();

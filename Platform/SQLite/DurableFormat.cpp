@@ -14,10 +14,12 @@ using Failure = std::optional<PlatformError>;
 
 constexpr int minorsPerMajor = 1000;
 
-// How often the file was damaged or lost.
+// How often the file was damaged or lost, and a name that no other file has. The first files had
+// none.
 constexpr const char* ownSchema =
-    "CREATE TABLE durable_file(damages INTEGER NOT NULL);"
-    "INSERT INTO durable_file VALUES(0);";
+    "CREATE TABLE durable_file(damages INTEGER NOT NULL,"
+    " name INTEGER NOT NULL DEFAULT (random()));"
+    "INSERT INTO durable_file(damages) VALUES(0);";
 
 struct FoundFormat {
   std::int64_t applicationID = 0;

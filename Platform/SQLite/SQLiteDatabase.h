@@ -88,7 +88,8 @@ class SQLiteDatabase final {
         sql, [&](SQLiteStatement& row) { row.read(into); }, parameters...);
   }
 
-  /// Does the work between BEGIN and COMMIT; when either or the work fails, nothing is changed.
+  /// Does the work between BEGIN and COMMIT; when either or the work fails or throws, nothing is
+  /// changed.
   [[nodiscard]] std::optional<PlatformError> transaction(
       const char* begin, const std::function<std::optional<PlatformError>(SQLiteDatabase&)>& work);
 

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/SQLite/Salvage.h>
 
+#include <sqlite3.h>
+
 #include <set>
 
 #include <Varnel/Platform/SQLite/SQLiteDatabase.h>
@@ -14,22 +16,34 @@ namespace {
 using Failure = std::optional<PlatformError>;
 using Step = SQLiteStatement::Step;
 
+// Whether it is the file that cannot be read: a lock, a lack of room, memory or descriptors passes.
+bool showsDamage(const PlatformError& error) {
+  const SQLiteFailure meaning = meaningOf(error);
+  const long code = error.code() & 0xff;
+  return meaning == SQLiteFailure::damaged ||
+         (meaning == SQLiteFailure::other && (code == SQLITE_ERROR || code == SQLITE_IOERR));
+}
+
 // None where the table cannot be read at all.
-std::set<std::string> columnsOf(SQLiteDatabase& database, const std::string& table) {
+Result<std::set<std::string>> columnsOf(SQLiteDatabase& database, const std::string& table) {
   std::set<std::string> columns;
-  static_cast<void>(database.each(
+  const auto error = database.each(
       "SELECT name FROM pragma_table_info(?)",
-      [&](SQLiteStatement& row) { columns.emplace(row.text(0).value_or("")); }, table));
+      [&](SQLiteStatement& row) { columns.emplace(row.text(0).value_or("")); }, table);
+  if (error && !showsDamage(*error)) return *error;
   return columns;
 }
 
 // Those columns that both files have: the damaged one may be of another version.
-std::vector<std::string> sharedColumns(SQLiteDatabase& from, SQLiteDatabase& to,
-                                       const SavedTable& table) {
-  const std::set<std::string> there = columnsOf(to, table.name);
+Result<std::vector<std::string>> sharedColumns(SQLiteDatabase& from, SQLiteDatabase& to,
+                                               const SavedTable& table) {
+  const auto here = columnsOf(from, table.name);
+  if (!here) return here.error();
+  const auto there = columnsOf(to, table.name);
+  if (!there) return there.error();
   std::vector<std::string> columns;
-  for (const std::string& column : columnsOf(from, table.name))
-    if (there.contains(column) && column != table.ownNumber) columns.push_back(column);
+  for (const std::string& column : *here)
+    if (there->contains(column) && column != table.ownNumber) columns.push_back(column);
   return columns;
 }
 
@@ -43,11 +57,14 @@ enum class Reading { ended, broken };
 // Copies in the given order up to the end or the first row that cannot be read.
 Result<Reading> copyRows(SQLiteDatabase& from, SQLiteStatement& insert, const std::string& query,
                          int columns) {
+  const auto broken = [](const PlatformError& error) {
+    return showsDamage(error) ? Result<Reading>(Reading::broken) : error;
+  };
   auto rows = from.prepare(query);
-  if (!rows) return Reading::broken;
+  if (!rows) return broken(rows.error());
   while (true) {
     const auto step = rows->step();
-    if (!step) return Reading::broken;
+    if (!step) return broken(step.error());
     if (*step == Step::done) return Reading::ended;
     for (int column = 0; column < columns; ++column) insert.bind(column + 1, *rows, column);
     const auto inserted = insert.step();
@@ -61,9 +78,10 @@ Result<Reading> copyRows(SQLiteDatabase& from, SQLiteStatement& insert, const st
 Failure salvage(SQLiteDatabase& from, SQLiteDatabase& to, std::span<const SavedTable> tables) {
   for (const SavedTable& table : tables) {
     const auto columns = sharedColumns(from, to, table);
-    if (columns.empty()) continue;
-    const auto names = fmt::format("{}", fmt::join(columns, ", "));
-    const std::vector<std::string_view> marks(columns.size(), "?");
+    if (!columns) return columns.error();
+    if (columns->empty()) continue;
+    const auto names = fmt::format("{}", fmt::join(*columns, ", "));
+    const std::vector<std::string_view> marks(columns->size(), "?");
     auto insert = to.prepare(fmt::format("INSERT OR IGNORE INTO {}({}) VALUES({})", table.name,
                                          names, fmt::join(marks, ", ")));
     if (!insert) return insert.error();
@@ -73,7 +91,7 @@ Failure salvage(SQLiteDatabase& from, SQLiteDatabase& to, std::span<const SavedT
       const auto reading = copyRows(
           from, *insert,
           fmt::format("SELECT {} FROM {} NOT INDEXED ORDER BY {}", names, table.name, order),
-          static_cast<int>(columns.size()));
+          static_cast<int>(columns->size()));
       if (!reading) return reading.error();
       if (*reading == Reading::ended) break;
     }

@@ -36,9 +36,6 @@ class FaultyPrivateFiles final : public PrivateFiles {
   [[nodiscard]] std::optional<FileIdentity> identity(const std::string& path) override {
     return failure() ? std::nullopt : files_.identity(path);
   }
-  [[nodiscard]] std::unique_ptr<HeldFile> hold(const std::string& path) override {
-    return failure() ? nullptr : files_.hold(path);
-  }
   [[nodiscard]] Result<std::unique_ptr<FileLock>> tryLock(const std::string& path) override {
     const Fault fault = next();
     if (fault == Fault::absent) return std::unique_ptr<FileLock>();

@@ -214,6 +214,46 @@ TEST_F(DurableFilePlacesTest, AFullDiskRefusesAndLaterTakes) {
   }
 }
 
+TEST_F(DurableFilePlacesTest, RowsForWhichThereIsNoRoomYetAreNotForgotten) {
+  for (const Journal journal : {Journal::rollback, Journal::writeAhead}) {
+    beginFor(::geteuid());
+    inChild(::geteuid(), [&] {
+      if (!enterMountNamespace().empty() || !mountMemory(home_)) return;
+      std::string all;
+      {
+        Notebook book(path_, notes(journal));
+        EXPECT_FALSE(book.file.change([](SQLiteDatabase& database) {
+          Failure error;
+          for (char key = 'a'; key < 'q' && !error; ++key)
+            error = Notebook::insert(database, std::string(5000, key));
+          return error;
+        }));
+        all = book.keys();
+      }
+      const fs::path pending = path_.string() + ".salvage";
+      fs::rename(path_, pending);
+      for (const char* suffix : {"-wal", "-shm", "-journal"})
+        if (fs::exists(path_.string() + suffix))
+          fs::rename(path_.string() + suffix, pending.string() + suffix);
+      const fs::path ballast = home_ / "ballast";
+      {
+        std::ofstream file(ballast, std::ios::binary);
+        while (file << std::string(1 << 12, 'x') << std::flush) continue;
+      }
+      fs::resize_file(ballast, fs::file_size(ballast) - (80 << 10));
+      for (int time = 0; time < 2; ++time)
+        EXPECT_EQ(Notebook(path_, notes(journal)).keys(), "full");
+      // The new file may be damaged before it is used.
+      std::ofstream(path_) << std::string(5000, 'x');
+      EXPECT_EQ(Notebook(path_, notes(journal)).keys(), "full");
+      fs::remove(ballast);
+      Notebook book(path_, notes(journal));
+      EXPECT_TRUE(book.keys() == all) << book.keys().substr(0, 100);
+      EXPECT_FALSE(fs::exists(pending));
+    });
+  }
+}
+
 TEST_F(DurableFilePlacesTest, WhatCanOnlyBeReadIsRead) {
   for (const Journal journal : {Journal::rollback, Journal::writeAhead}) {
     for (const bool hasJournals : {true, false}) {

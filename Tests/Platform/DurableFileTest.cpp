@@ -13,6 +13,7 @@ namespace {
 
 namespace fs = std::filesystem;
 using namespace Platform;
+using Looking = DurableFile::Looking;
 
 void overwrite(const fs::path& path, std::streamoff at, const std::string& bytes) {
   std::fstream file(path, std::ios::in | std::ios::out | std::ios::binary);
@@ -52,6 +53,7 @@ TEST_P(DurableFileTest, KeepsWhatIsTakenAwayUnderIt) {
     std::string left = "abcd";
   };
   const fs::path backup = folder_.path() / "backup";
+  const fs::path moved = folder_.path() / "moved";
   const auto remove = [&](std::initializer_list<const char*> suffixes) {
     for (const char* suffix : suffixes) fs::remove(beside(suffix));
   };
@@ -62,11 +64,17 @@ TEST_P(DurableFileTest, KeepsWhatIsTakenAwayUnderIt) {
          remove({"", "-wal", "-shm", "-journal"});
        }},
       {"the folder removed", [&] { fs::remove_all(path_.parent_path()); }},
+      {"the folder renamed", [&] { fs::rename(path_.parent_path(), moved); }},
       {"the file renamed", [&] { fs::rename(path_, beside(".away")); }},
       {"the file replaced", [&] { fs::rename(backup, path_); }, false, true, "abcdz"},
       {"the file emptied", [&] { fs::resize_file(path_, 0); }, true, true,
        hasLog() ? "abcd" : "bcd"},
       {"the journal removed", [&] { remove({"-wal"}); }, hasLog(), hasLog()},
+      {"the journal renamed",
+       [&] {
+         if (hasLog()) fs::rename(beside("-wal"), beside(".away"));
+       },
+       hasLog(), hasLog()},
       {"the journals removed",
        [&] {
          remove({"-wal", "-shm", "-journal"});
@@ -80,10 +88,12 @@ TEST_P(DurableFileTest, KeepsWhatIsTakenAwayUnderIt) {
        hasLog(), hasLog()},
   };
   for (const Case& one : cases) {
-    // By a statement, by a transaction, and between a commit and its answer.
-    for (const int when : {1, 2, 3}) {
+    // By a statement, by a transaction, between a commit and its answer, and after an answer that
+    // was given without a look.
+    for (const int when : {1, 2, 3, 4}) {
       SCOPED_TRACE(std::string(one.what) + ", found by way " + std::to_string(when));
       fs::remove_all(path_.parent_path());
+      fs::remove_all(moved);
       EXPECT_EQ(Notebook(backup, notes(Journal::rollback)).add("z"), "kept");
       auto book = open();
       EXPECT_EQ(book->add("a"), "kept");
@@ -92,7 +102,8 @@ TEST_P(DurableFileTest, KeepsWhatIsTakenAwayUnderIt) {
         if (!std::exchange(isDone, true)) one.act();
       };
       if (when < 3) actOnce();
-      EXPECT_EQ(when == 2 ? book->change("b") : book->add("b", actOnce), "kept");
+      const auto looking = when == 4 ? Looking::eachMillisecond : Looking::eachTime;
+      EXPECT_EQ(when == 2 ? book->change("b") : book->add("b", actOnce, looking), "kept");
       EXPECT_EQ(book->add("c"), "kept");
       EXPECT_EQ(open()->add("d"), "kept");
       // Without a log, what a file held is gone with it; nothing accepted since is.
@@ -101,6 +112,71 @@ TEST_P(DurableFileTest, KeepsWhatIsTakenAwayUnderIt) {
       EXPECT_EQ(book->log.lines.size(), one.isSaid ? 1u : 0u);
     }
   }
+}
+
+TEST_P(DurableFileTest, WhatOneConnectionHasTakenOverAnotherDoesNotBringBack) {
+  const fs::path moved = folder_.path() / "moved";
+  const std::vector<std::function<void()>> ways{
+      [&] { fs::rename(path_.parent_path(), moved); },
+      [&] { fs::remove(path_); },
+      [&] { fs::remove(beside("-wal")); },
+  };
+  for (std::size_t way = 0; way < ways.size(); ++way) {
+    SCOPED_TRACE(way);
+    fs::remove_all(path_.parent_path());
+    fs::remove_all(moved);
+    auto one = open();
+    auto other = open();
+    EXPECT_EQ(one->add("a"), "kept");
+    EXPECT_EQ(other->add("b"), "kept");
+    // The other's statement is run into the old file, and once more into the new one.
+    std::vector<std::string> keys{"c", "d"};
+    EXPECT_FALSE(other->file.changeByOneStatement([&](SQLiteDatabase& database) {
+      if (keys.size() == 2) {
+        ways[way]();
+        EXPECT_EQ(one->keys(), "ab");
+        EXPECT_EQ(one->clear(), "kept");
+      }
+      auto error = Notebook::insert(database, keys.front());
+      keys.erase(keys.begin());
+      return error;
+    }));
+    // Without a log nothing can be written into the old file, and nothing is lost with a journal.
+    EXPECT_EQ(other->keys(), hasLog() ? "cd" : way == 2 ? "c" : "d");
+    EXPECT_EQ(open()->keys(), one->keys());
+    EXPECT_LE(one->file.damageCount(), 1);
+  }
+}
+
+TEST_P(DurableFileTest, AChangeThatFailsIsNotFoundLater) {
+  const auto own = POSIX::makePrivateFiles();
+  Platform::Testing::FaultyPrivateFiles files(*own);
+  Notebook book(path_, notes(GetParam()), Migrating::allowed, &files);
+  ASSERT_EQ(book.add("a"), "kept");
+  const auto lose = [&] {
+    fs::rename(path_, beside(".away"));
+    files.faults->plan(Platform::Testing::Fault::absent, files.faults->calls() + 1);
+  };
+  EXPECT_EQ(book.change("lost", lose), "busy");
+  files.faults->mend();
+  EXPECT_EQ(book.keys(), "a");
+  EXPECT_THROW(static_cast<void>(book.change("thrown", [] { throw std::bad_alloc(); })),
+               std::bad_alloc);
+  EXPECT_EQ(open()->change("b"), "kept");
+  EXPECT_EQ(book.keys(), "ab");
+}
+
+TEST_P(DurableFileTest, WhatCannotBePutAwayIsNotTakenOverAgain) {
+  EXPECT_EQ(open()->add("a"), "kept");
+  emptyLog();
+  fs::create_directory(beside(".damaged"));
+  fs::rename(path_, beside(".salvage"));
+  EXPECT_EQ(open()->add("b"), "kept");
+  EXPECT_EQ(open()->keys(), "ab");
+  EXPECT_EQ(open()->clear(), "kept");
+  EXPECT_EQ(open()->keys(), "");
+  EXPECT_EQ(open()->file.damageCount(), 1);
+  EXPECT_FALSE(fs::exists(beside(".salvage")));
 }
 
 TEST_P(DurableFileTest, SetsADamagedFileAsideAndSavesItsRows) {

@@ -48,18 +48,30 @@ struct Notebook final {
       : file({files ? *files : *ownFiles, log}, path.string(), std::move(format), migrating) {}
 
   /// By one statement, and whether it was kept: "kept", or what the error means.
-  std::string add(const std::string& key, const std::function<void()>& afterwards = {}) {
-    return meaning(file.changeByOneStatement([&](Platform::SQLiteDatabase& database) {
+  std::string add(
+      const std::string& key, const std::function<void()>& afterwards = {},
+      Platform::DurableFile::Looking looking = Platform::DurableFile::Looking::eachTime) {
+    const auto work = [&](Platform::SQLiteDatabase& database) {
+      auto error = insert(database, key);
+      if (afterwards) afterwards();
+      return error;
+    };
+    return meaning(file.changeByOneStatement(work, looking));
+  }
+
+  /// The same in a transaction.
+  std::string change(const std::string& key, const std::function<void()>& afterwards = {}) {
+    return meaning(file.change([&](Platform::SQLiteDatabase& database) {
       auto error = insert(database, key);
       if (afterwards) afterwards();
       return error;
     }));
   }
 
-  /// The same in a transaction.
-  std::string change(const std::string& key) {
-    return meaning(
-        file.change([&](Platform::SQLiteDatabase& database) { return insert(database, key); }));
+  /// Removes all keys.
+  std::string clear() {
+    return meaning(file.change(
+        [](Platform::SQLiteDatabase& database) { return database.run("DELETE FROM note"); }));
   }
 
   /// All keys in a row, or what the error means.

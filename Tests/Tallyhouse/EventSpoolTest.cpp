@@ -329,6 +329,13 @@ TEST_F(AwayTest, WhatIsTakenAwayIsGivenBackByTheProcessesThatLive) {
       {"the journal alone", [](const std::string& path) { fs::remove(path + "-wal"); }, "a b c d "},
       {"the folder", [](const std::string& path) { fs::remove_all(fs::path(path).parent_path()); },
        "a b c d "},
+      {"or moved",
+       [](const std::string& path) {
+         const fs::path made = fs::path(path).parent_path();
+         fs::remove_all(made.string() + ".old");
+         fs::rename(made, made.string() + ".old");
+       },
+       "a b c d "},
       {"another spool stands there",
        [this](const std::string& path) {
          fs::rename(path, path + ".old");
