@@ -137,7 +137,7 @@ DurableFile::Failure DurableFile::takeOverLost(SQLiteDatabase& lost, bool isCoun
     if ((error = takeOver(lost, isCounted))) return error;
     for (const SavedTable& table : format_.tables)
       if (auto failure = lost.execute("DELETE FROM " + table.name)) return failure;
-    return lost.execute("UPDATE durable_file SET name = random()");
+    return lost.execute("UPDATE durable_file SET rowid = random()");
   });
   if (isTried) return error;
   return meaningOf(*obstacle) == SQLiteFailure::busy ? obstacle : takeOver(lost, isCounted);
@@ -146,9 +146,9 @@ DurableFile::Failure DurableFile::takeOverLost(SQLiteDatabase& lost, bool isCoun
 DurableFile::Failure DurableFile::takeOver(SQLiteDatabase& from, bool isCounted) {
   // Makes the library read a file that is shorter than it says.
   static_cast<void>(from.execute("PRAGMA writable_schema = ON"));
-  // A file whose name cannot be read is taken over each time.
+  // A file without a name that can be read is taken over each time.
   std::optional<std::int64_t> name;
-  static_cast<void>(from.row("SELECT name FROM durable_file", std::tie(name)));
+  static_cast<void>(from.row("SELECT rowid FROM durable_file WHERE rowid <> 1", std::tie(name)));
   return connection_->database.transaction("BEGIN IMMEDIATE", [&](SQLiteDatabase& to) -> Failure {
     if (auto error = to.execute("CREATE TABLE IF NOT EXISTS durable_predecessor"
                                 "(name INTEGER PRIMARY KEY)"))

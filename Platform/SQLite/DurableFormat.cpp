@@ -14,12 +14,11 @@ using Failure = std::optional<PlatformError>;
 
 constexpr int minorsPerMajor = 1000;
 
-// How often the file was damaged or lost, and a name that no other file has. The first files had
-// none.
+// How often the file was damaged or lost. The number of the row is a name that no other file has;
+// the first files had none, but the number 1.
 constexpr const char* ownSchema =
-    "CREATE TABLE durable_file(damages INTEGER NOT NULL,"
-    " name INTEGER NOT NULL DEFAULT (random()));"
-    "INSERT INTO durable_file(damages) VALUES(0);";
+    "CREATE TABLE durable_file(damages INTEGER NOT NULL);"
+    "INSERT INTO durable_file(rowid, damages) VALUES(random(), 0);";
 
 struct FoundFormat {
   std::int64_t applicationID = 0;

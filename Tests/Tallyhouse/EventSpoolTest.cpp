@@ -362,6 +362,21 @@ TEST_F(AwayTest, WhatIsTakenAwayIsGivenBackByTheProcessesThatLive) {
   }
 }
 
+TEST_F(EventSpoolTest, TheLastEventsAreCarriedOverWhenAskedForAndAtTheEnd) {
+  const fs::path made = fs::path(path()).parent_path();
+  auto recorder = openRecorder();
+  append(*recorder, {"a"});
+  fs::rename(made, made.string() + ".1");
+  append(*recorder, {"b"});
+  EXPECT_TRUE(recorder->isInPlace());
+  EXPECT_EQ(names(), "a b ");
+  clock.advance(1ms);
+  fs::rename(made, made.string() + ".2");
+  append(*recorder, {"c"});
+  recorder.reset();
+  EXPECT_EQ(names(), "a b c ");
+}
+
 TEST_F(EventSpoolTest, ThreadsAndProcessesMayShareAFile) {
   const auto one = openRecorder();
   const auto other = openRecorder();
