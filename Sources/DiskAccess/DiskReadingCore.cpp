@@ -134,6 +134,7 @@ void DiskReadingCore::enqueue(const Request& request, std::shared_ptr<DiskData> 
   }
   request->state = DiskReadingRequest::State::waiting;
   lane.line.add(request);
+  offerChanged_.notify_all();
   callWorkers(lane);
 }
 

@@ -111,6 +111,7 @@ class DiskReadingCore final : public std::enable_shared_from_this<DiskReadingCor
   void run(Lock& lock, const Request& request, DiskReadingTurn& turn, PriorityOfThread& priority);
   void leaveBusy(Basalt::ThreadID thread);
   void offer(Lock& lock, const Request& request, Stay& stay);
+  void enqueueAfterPause(const Request& request);
   void runOffered(const Request& request, Stay& stay);
 
   const std::shared_ptr<DiskAccessState> disks_;

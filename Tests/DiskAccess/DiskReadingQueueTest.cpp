@@ -17,6 +17,7 @@ using DiskReadingQueueTest = DiskReadingFixture;
 TEST_F(DiskReadingQueueTest, NeverHasMoreReadersOnADiskThanItAdmits) {
   plugDisk("HDD-1", "sda1", "Rotational", archiveVolume);
   mount(archiveVolume);
+  const auto disk = DiskAccessGuard(begin(archiveVolume))->diskData();
   std::mutex mutex;
   std::condition_variable changed;
   int inside = 0;
@@ -35,12 +36,25 @@ TEST_F(DiskReadingQueueTest, NeverHasMoreReadersOnADiskThanItAdmits) {
   for (int i = 0; i < 8; ++i)
     tasks.push_back(submit({.url = archiveVolume, .volumeURL = archiveVolume}, visit));
   awaitLines();
+  const auto hasTwoInside = [&] {
+    const std::lock_guard lock(mutex);
+    return inside == 2 && mayLeave == 0;
+  };
+  while (!hasTwoInside()) std::this_thread::yield();
+  manager_->setIsBackgroundMode(true);
+  {
+    const std::lock_guard lock(mutex);
+    mayLeave = 1;
+    changed.notify_all();
+  }
+  // One that came before the mode leaves, and nobody takes its place.
+  while (accessCount(*disk) > 1) {
+    ASSERT_FALSE(hasTwoInside());
+    std::this_thread::yield();
+  }
   {
     std::unique_lock lock(mutex);
-    changed.wait(lock, [&] { return inside == 2; });
-    manager_->setIsBackgroundMode(true);
-    maxInside = 0;
-    mayLeave = 2;  // Those that came before the mode.
+    mayLeave = 1;
     changed.notify_all();
     changed.wait(lock, [&] { return inside == 1 && mayLeave == 0; });
     mayLeave = 5;
@@ -201,6 +215,42 @@ TEST_F(DiskReadingQueueTest, ABlockedMainQueueKeepsNoPlace) {
   source.request_stop();
   mainQueue.runWhile([&] { return !stopped->hasEnded(); });
   EXPECT_EQ(stopped->result(), Result::stopped);
+}
+
+/// Begins blocks when the test says so.
+class LateExecutor final : public Basalt::Executor {
+ public:
+  void execute(Basalt::Block block) override {
+    const std::lock_guard lock(mutex_);
+    block_ = std::move(block);
+    arrived_.notify_all();
+  }
+  Basalt::Block next() {
+    std::unique_lock lock(mutex_);
+    arrived_.wait(lock, [this] { return bool(block_); });
+    return std::exchange(block_, {});
+  }
+
+ private:
+  std::mutex mutex_;
+  std::condition_variable arrived_;
+  Basalt::Block block_;
+};
+
+TEST_F(DiskReadingQueueTest, AnExecutorThatIsAlwaysLateKeepsAPlaceNoLongerThanATurn) {
+  const auto executor = std::make_shared<LateExecutor>();
+  const Task late = submit(onStick(), {.executor = executor}, [](Turn&) { return Next::done(); });
+  std::chrono::steady_clock::duration kept{};
+  for (int offer = 0; offer < 6; ++offer) {
+    Basalt::Block block = executor->next();
+    const auto begin = std::chrono::steady_clock::now();
+    awaitFreeStick();
+    kept = std::chrono::steady_clock::now() - begin;
+    block();
+  }
+  EXPECT_LT(kept, 25 * Turn::maxTime);
+  while (!late->hasEnded()) executor->next()();
+  EXPECT_EQ(late->result(), Result::read);
 }
 
 TEST_F(DiskReadingQueueTest, AnswersAStopAtOnceInEachState) {
