@@ -14,7 +14,7 @@ namespace Varnel {
 DiskReadingCore::DiskReadingCore(std::shared_ptr<DiskAccessState> disks, Ports ports)
     : disks_(std::move(disks)),
       ports_(std::move(ports)),
-      normalPriority_(ports_.readingPriority.current()) {}
+      normalPriority_(ports_.readingPriority.ofMainThread()) {}
 
 void DiskReadingCore::observeUnmounts() {
   unmounts_ = disks_->notificationCenter().addObserver(

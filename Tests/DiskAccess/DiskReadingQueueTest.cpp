@@ -181,6 +181,10 @@ TEST_F(DiskReadingQueueTest, LowClassesGiveWayToOtherPrograms) {
   for (const QoS qos : {QoS::default_, QoS::userInitiated, QoS::userInteractive})
     EXPECT_FALSE(isLoweredIn(qos, nullptr));
   EXPECT_TRUE(isLoweredIn(QoS::background, Basalt::globalConcurrentQueue()));
+  // The normal priority is not that of the thread which made the queue.
+  priority_.set(priority_.lowered(0));
+  queue_.emplace(*manager_, DiskReadingQueue::Ports{.readingPriority = priority_});
+  EXPECT_FALSE(isLoweredIn(QoS::userInteractive, nullptr));
 }
 
 TEST_F(DiskReadingQueueTest, ATaskOnTheMainQueueHasThePlaceThere) {
