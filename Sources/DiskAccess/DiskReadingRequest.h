@@ -51,6 +51,7 @@ struct DiskReadingRequest {
   State state = State::placing;
   std::optional<Platform::URL> volumeURL;
   std::optional<std::uint64_t> place;
+  std::uint64_t sweep = 0;           ///< In which the line takes it.
   std::shared_ptr<DiskData> record;  ///< The disk in whose line it stands, or last stood.
   bool hasBegun = false;
   std::optional<DiskReadingResult> verdict;  ///< Why it gets no further turn, while it runs.

@@ -108,6 +108,49 @@ TEST_F(DiskReadingQueueTest, ReadsOnItsWayUpTheDiskOrInTheOrderOfComing) {
   EXPECT_EQ(orderOn(homeVolume, 40), asTheyCame);
 }
 
+// On a disk that seeks and on one that does not, in one class.
+TEST_F(DiskReadingQueueTest, NobodyWaitsForTheLastTurnOfAnother) {
+  struct Case {
+    URL volume;
+    std::optional<std::uint64_t> place;  ///< Of both that need many turns.
+    std::optional<std::uint64_t> placeOfOther;
+  };
+  const Case cases[] = {{stickVolume, std::nullopt, 10},
+                        {stickVolume, 50, 10},
+                        {homeVolume, std::nullopt, std::nullopt}};
+  manager_->setIsBackgroundMode(true);
+  for (const auto& [volume, place, placeOfOther] : cases) {
+    const auto at = [&](std::optional<std::uint64_t> where) {
+      return DiskReadingFile{.url = volume, .volumeURL = volume, .place = where};
+    };
+    std::latch isIn(1);
+    std::latch mayGo(1);
+    std::atomic<bool> hasOtherRun = false;
+    std::atomic<int> turns = 0;
+    const auto longOne = [&](Turn&) {
+      isIn.count_down(isIn.try_wait() ? 0 : 1);
+      mayGo.wait();
+      return hasOtherRun || ++turns == 1000 ? Next::done() : Next::again(place);
+    };
+    const Task one = submit(at(place), longOne);
+    isIn.wait();
+    const Task two = submit(at(place), longOne);
+    const Task other = submit(at(placeOfOther), [&](Turn&) {
+      hasOtherRun = true;
+      return Next::done();
+    });
+    const bool isHome = volume == homeVolume;
+    EXPECT_EQ(submit({.url = isHome ? stickFile : homeFile,
+                      .volumeURL = isHome ? stickVolume : homeVolume},
+                     [](Turn&) { return Next::done(); })
+                  ->result(),
+              Result::read);
+    mayGo.count_down();
+    for (const Task& task : {one, two, other}) EXPECT_EQ(task->result(), Result::read);
+    EXPECT_LE(turns, 4) << volume.path();
+  }
+}
+
 TEST_F(DiskReadingQueueTest, AMoreUrgentReaderWaitsForOneTurn) {
   // A reader of the queue, and a session of the process.
   std::atomic<bool> hasUrgentRun = false;
