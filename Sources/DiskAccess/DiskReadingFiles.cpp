@@ -96,6 +96,7 @@ void DiskReadingFiles::start() {
 }
 
 void DiskReadingFiles::lookUp() {
+  const std::uint64_t unmountCount = core_->unmountCount();
   std::unordered_map<Platform::URL, std::shared_ptr<Volume>> volumes;
   std::vector<std::shared_ptr<Volume>> inOrder;
   for (Index file = 0; file < files_.size(); ++file) {
@@ -109,7 +110,7 @@ void DiskReadingFiles::lookUp() {
     if (!volume) inOrder.push_back(volume = std::make_shared<Volume>(Volume{.url = *url}));
     volume->files.push_back(file);
   }
-  for (auto& volume : inOrder) readVolume(std::move(volume));
+  for (auto& volume : inOrder) readVolume(std::move(volume), unmountCount);
 }
 
 std::optional<Platform::URL> DiskReadingFiles::volumeOf(const DiskReadingFile& file) const {
@@ -118,7 +119,7 @@ std::optional<Platform::URL> DiskReadingFiles::volumeOf(const DiskReadingFile& f
   return found ? *found : std::nullopt;
 }
 
-void DiskReadingFiles::readVolume(std::shared_ptr<Volume> volume) {
+void DiskReadingFiles::readVolume(std::shared_ptr<Volume> volume, std::uint64_t unmountCount) {
   const auto disk = core_->disks().settledRecordOfVolume(volume->url)->diskInfo();
   if (disk->kind() != OVDiskKindSolidState)
     std::stable_sort(volume->files.begin(), volume->files.end(), [this](Index one, Index other) {
@@ -138,7 +139,8 @@ void DiskReadingFiles::readVolume(std::shared_ptr<Volume> volume) {
   options.stop = readers_.get_token();
   if (!isImpatient()) options.accessWaitingTimeout.reset();
   for (std::int64_t reader = 0; reader < readers; ++reader)
-    core_->submit(std::make_shared<Reader>(shared_from_this(), volume), first, options);
+    core_->submit(std::make_shared<Reader>(shared_from_this(), volume), first, options,
+                  unmountCount);
 }
 
 bool DiskReadingFiles::isImpatient() const {

@@ -43,7 +43,7 @@ class DiskReadingFiles final : public std::enable_shared_from_this<DiskReadingFi
 
   void lookUp();
   [[nodiscard]] std::optional<Platform::URL> volumeOf(const DiskReadingFile& file) const;
-  void readVolume(std::shared_ptr<Volume> volume);
+  void readVolume(std::shared_ptr<Volume> volume, std::uint64_t unmountCount);
   [[nodiscard]] bool isImpatient() const;
 
   // Any thread.

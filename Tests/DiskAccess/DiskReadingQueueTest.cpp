@@ -340,6 +340,28 @@ TEST_F(DiskReadingQueueTest, AnswersAStopAtOnceInEachState) {
   awaitFreeStick();
 }
 
+TEST_F(DiskReadingQueueTest, ASlowResultKeepsNoTimeOutWaiting) {
+  struct SlowToEnd final : DiskReadingTask {
+    std::latch isTold{1};
+    std::latch mayEnd{1};
+    DiskReadingNext run(Turn&) override { return Next::done(); }
+    void didEnd(Result) override {
+      isTold.count_down();
+      mayEnd.wait();
+    }
+  };
+  const Holder holder = holdStick();
+  const auto slow = std::make_shared<SlowToEnd>();
+  queue_->submit(slow, onStick(), {.accessWaitingTimeout = 0.001});
+  slow->isTold.wait();
+  const Task other = submit(
+      onStick(), {.accessWaitingTimeout = 0.001, .executor = Basalt::globalConcurrentQueue()},
+      [](Turn&) { return Next::done(); });
+  EXPECT_EQ(other->result(), Result::timedOut);
+  slow->mayEnd.count_down();
+  holder.letGo();
+}
+
 TEST_F(DiskReadingQueueTest, SaysWhyNothingWasRead) {
   const Session session = begin(stickFile);
   const auto never = [](Turn&) {
