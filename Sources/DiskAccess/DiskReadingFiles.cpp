@@ -2,9 +2,10 @@
 #include <Varnel/DiskAccess/DiskReadingFiles.h>
 
 #include <algorithm>
+#include <chrono>
 #include <limits>
 #include <numeric>
-#include <unordered_map>
+#include <system_error>
 #include <utility>
 
 #include <Varnel/Basalt/SecurityScopeBookkeeping.h>
@@ -97,20 +98,57 @@ void DiskReadingFiles::start() {
 
 void DiskReadingFiles::lookUp() {
   const std::uint64_t unmountCount = core_->unmountCount();
-  std::unordered_map<Platform::URL, std::shared_ptr<Volume>> volumes;
-  std::vector<std::shared_ptr<Volume>> inOrder;
+  readFoundLater(unmountCount);
   for (Index file = 0; file < files_.size(); ++file) {
     if (readers_.stop_requested()) return;
     const auto url = volumeOf(files_[file]);
-    if (!url) {
+    if (url)
+      addFound(file, *url);
+    else
       callBack(endWaiting({file}), DiskReadingResult::unknownVolume);
-      continue;
-    }
-    std::shared_ptr<Volume>& volume = volumes[*url];
-    if (!volume) inOrder.push_back(volume = std::make_shared<Volume>(Volume{.url = *url}));
-    volume->files.push_back(file);
   }
-  for (auto& volume : inOrder) readVolume(std::move(volume), unmountCount);
+  {
+    const std::lock_guard lock(mutex_);
+    isLookedUp_ = true;
+  }
+  readFound(unmountCount);
+}
+
+void DiskReadingFiles::addFound(Index file, const Platform::URL& volumeURL) {
+  const std::lock_guard lock(mutex_);
+  const auto [place, isNew] = foundVolumes_.try_emplace(volumeURL, found_.size());
+  if (isNew) found_.push_back(std::make_shared<Volume>(Volume{.url = volumeURL}));
+  found_[place->second]->files.push_back(file);
+}
+
+// A look-up on a dead share keeps the other files waiting no longer than this.
+void DiskReadingFiles::readFoundLater(std::uint64_t unmountCount) {
+  constexpr std::chrono::milliseconds patience{100};
+  (void)core_->watch().at(
+      DiskReadingWatch::Time::clock::now() + patience, [weak = weak_from_this(), unmountCount] {
+        const auto self = weak.lock();
+        if (!self || self->readers_.stop_requested()) return;
+        {
+          const std::lock_guard lock(self->mutex_);
+          if (self->isLookedUp_) return;
+        }
+        self->readFoundLater(unmountCount);
+        try {
+          self->core_->plan([self, unmountCount] { self->readFound(unmountCount); });
+        } catch (const std::system_error&) {
+          return;  // The next time, perhaps.
+        }
+      });
+}
+
+void DiskReadingFiles::readFound(std::uint64_t unmountCount) {
+  std::vector<std::shared_ptr<Volume>> found;
+  {
+    const std::lock_guard lock(mutex_);
+    found.swap(found_);
+    foundVolumes_.clear();
+  }
+  for (auto& volume : found) readVolume(std::move(volume), unmountCount);
 }
 
 std::optional<Platform::URL> DiskReadingFiles::volumeOf(const DiskReadingFile& file) const {

@@ -248,6 +248,19 @@ TEST_F(DiskReadingFilesTest, AStopIsAnsweredWhileALookUpIsStuck) {
   stuck.catalog.mayAnswer.count_down();
 }
 
+TEST_F(DiskReadingFilesTest, OneStuckLookUpKeepsNoOtherFileWaiting) {
+  StuckQueue stuck({devices_, disks_, volumes_, scope_, center_}, {.readingPriority = priority_},
+                   stickFile);
+  Results results(3);
+  stuck.queue.read(
+      {{.url = URL::fileURLWithPath("/home/a")}, {.url = stickFile}, stickNamed("b")}, {},
+      [](const DiskReadingFile&, Turn&) { return Next::done(); }, results.recorder());
+  EXPECT_EQ(results.await(1), (Told{{"a", Result::read}}));
+  stuck.catalog.mayAnswer.count_down();
+  EXPECT_EQ(results.await(),
+            (Told{{"a", Result::read}, {"b", Result::read}, {"file", Result::read}}));
+}
+
 TEST_F(DiskReadingFilesTest, AVolumeUnmountedDuringItsLookUpHasVanished) {
   StuckQueue stuck({devices_, disks_, volumes_, scope_, center_}, {.readingPriority = priority_},
                    stickFile);
