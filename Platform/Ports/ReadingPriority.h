@@ -24,10 +24,14 @@ class VARNEL_API ReadingPriority {
   /// The calling thread's level; absent where the system tells none.
   [[nodiscard]] virtual std::optional<Level> current() = 0;
 
+  /// The level of the process's main thread; absent likewise.
+  [[nodiscard]] virtual std::optional<Level> ofMainThread() = 0;
+
   /// Does nothing where the system forbids it.
   virtual void set(Level level) = 0;
 
-  /// The level at which a thread of this level gives way; the same if it does already.
+  /// The level at which a thread of this level gives way; the same if it does already, or could not
+  /// come back.
   [[nodiscard]] virtual Level lowered(Level normal) = 0;
 };
 

@@ -23,6 +23,7 @@ class FakeReadingPriority final : public ReadingPriority {
   }
 
   std::optional<Level> current() override { return isLowered() ? 1 : 0; }
+  std::optional<Level> ofMainThread() override { return 0; }
 
   void set(Level level) override {
     const std::lock_guard lock(mutex_);

@@ -14,7 +14,7 @@ namespace Varnel {
 DiskReadingCore::DiskReadingCore(std::shared_ptr<DiskAccessState> disks, Ports ports)
     : disks_(std::move(disks)),
       ports_(std::move(ports)),
-      normalPriority_(ports_.readingPriority.current()) {}
+      normalPriority_(ports_.readingPriority.ofMainThread()) {}
 
 void DiskReadingCore::observeUnmounts() {
   unmounts_ = disks_->notificationCenter().addObserver(
@@ -43,12 +43,13 @@ void DiskReadingCore::add(DiskReadingJobs& jobs, Basalt::Block block) {
 
 void DiskReadingCore::callBack(const std::shared_ptr<Basalt::Executor>& executor,
                                Basalt::Block block) {
-  watch_.soon([executor, block = std::make_shared<Basalt::Block>(std::move(block))] {
-    if (!executor) return (*block)();
+  if (!executor) return results_.soon(std::move(block));
+  watch_.soon([self = shared_from_this(), executor,
+               block = std::make_shared<Basalt::Block>(std::move(block))] {
     try {
       executor->execute([block] { (*block)(); });
     } catch (const std::system_error&) {
-      (*block)();
+      self->results_.soon([block] { (*block)(); });
     }
   });
 }
@@ -56,7 +57,8 @@ void DiskReadingCore::callBack(const std::shared_ptr<Basalt::Executor>& executor
 // From submission to the line of a disk.
 
 void DiskReadingCore::submit(std::shared_ptr<DiskReadingTask> task, DiskReadingFile file,
-                             DiskReadingOptions options) {
+                             DiskReadingOptions options,
+                             std::optional<std::uint64_t> unmountCount) {
   Request request;
   bool isAccepted = false;
   {
@@ -80,6 +82,8 @@ void DiskReadingCore::submit(std::shared_ptr<DiskReadingTask> task, DiskReadingF
     };
   };
   request->stopCallback.emplace(request->options.stop, stopper(DiskReadingResult::stopped));
+  if (unmountCount && isUnmountedSince(*request->file.volumeURL, *unmountCount))
+    return stopper(DiskReadingResult::vanished)();
   try {
     if (request->file.volumeURL)
       plan([self = shared_from_this(), request] { self->place(request); });
@@ -98,6 +102,17 @@ void DiskReadingCore::submit(std::shared_ptr<DiskReadingTask> task, DiskReadingF
     return;
   request->timer = watch_.at(DiskReadingWatch::Time::clock::now() + *maxWaiting,
                              stopper(DiskReadingResult::timedOut));
+}
+
+std::uint64_t DiskReadingCore::unmountCount() {
+  const Lock lock(mutex_);
+  return unmountCount_;
+}
+
+bool DiskReadingCore::isUnmountedSince(const Platform::URL& volumeURL, std::uint64_t count) {
+  const Lock lock(mutex_);
+  const auto last = lastUnmounts_.find(volumeURL);
+  return last != lastUnmounts_.end() && last->second > count;
 }
 
 void DiskReadingCore::lookUpVolume(const Request& request) {
@@ -134,6 +149,7 @@ void DiskReadingCore::enqueue(const Request& request, std::shared_ptr<DiskData> 
   }
   request->state = DiskReadingRequest::State::waiting;
   lane.line.add(request);
+  offerChanged_.notify_all();
   callWorkers(lane);
 }
 
@@ -168,7 +184,7 @@ void DiskReadingCore::settle(const Request& request) {
 
 void DiskReadingCore::endRequestsOf(const Platform::URL& volumeURL) {
   const Lock lock(mutex_);
-  ++unmountCount_;
+  lastUnmounts_[volumeURL] = ++unmountCount_;
   const std::vector<Request> all(requests_.begin(), requests_.end());
   for (const Request& request : all)
     if (request->volumeURL == volumeURL) stop(request, DiskReadingResult::vanished);
@@ -188,6 +204,7 @@ void DiskReadingCore::close() {
   lock.unlock();
   unmounts_.reset();
   watch_.close();
+  results_.close();
 }
 
 }  // namespace Varnel

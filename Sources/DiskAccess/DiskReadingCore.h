@@ -10,6 +10,7 @@
 #include <mutex>
 #include <optional>
 #include <stop_token>
+#include <unordered_map>
 #include <unordered_set>
 #include <vector>
 
@@ -52,9 +53,11 @@ class DiskReadingCore final : public std::enable_shared_from_this<DiskReadingCor
   /// Once, before anything else.
   void observeUnmounts();
 
-  /// See `DiskReadingQueue::submit`.
+  /// See `DiskReadingQueue::submit`. A request for a volume that was looked up at such a count of
+  /// unmounts ends as `vanished` when the volume has been unmounted since.
   void submit(std::shared_ptr<DiskReadingTask> task, DiskReadingFile file,
-              DiskReadingOptions options);
+              DiskReadingOptions options, std::optional<std::uint64_t> unmountCount = {});
+  [[nodiscard]] std::uint64_t unmountCount();
 
   /// Runs a block that asks the file system, and may get stuck in it, or one that waits for the
   /// manager at most. `close` waits for a block that runs and drops one that does not. Both throw
@@ -62,7 +65,8 @@ class DiskReadingCore final : public std::enable_shared_from_this<DiskReadingCor
   void lookUp(Basalt::Block block) { add(*lookups_, std::move(block)); }
   void plan(Basalt::Block block) { add(*plans_, std::move(block)); }
 
-  /// Calls back, later: on the executor or, without one that can, on the watch's thread.
+  /// Calls back, later: on the executor or, without one that can, one after another on a thread
+  /// that does nothing else, so that a slow one keeps no time-out waiting.
   void callBack(const std::shared_ptr<Basalt::Executor>& executor, Basalt::Block block);
 
   /// See `~DiskReadingQueue`.
@@ -82,6 +86,7 @@ class DiskReadingCore final : public std::enable_shared_from_this<DiskReadingCor
   void add(DiskReadingJobs& jobs, Basalt::Block block);
 
   // From submission to the line of a disk. What follows runs under the lock where it gets none.
+  [[nodiscard]] bool isUnmountedSince(const Platform::URL& volumeURL, std::uint64_t count);
   void lookUpVolume(const Request& request);
   void place(const Request& request);
   void enqueue(const Request& request, std::shared_ptr<DiskData> record);
@@ -111,6 +116,7 @@ class DiskReadingCore final : public std::enable_shared_from_this<DiskReadingCor
   void run(Lock& lock, const Request& request, DiskReadingTurn& turn, PriorityOfThread& priority);
   void leaveBusy(Basalt::ThreadID thread);
   void offer(Lock& lock, const Request& request, Stay& stay);
+  void enqueueAfterPause(const Request& request);
   void runOffered(const Request& request, Stay& stay);
 
   const std::shared_ptr<DiskAccessState> disks_;
@@ -128,12 +134,14 @@ class DiskReadingCore final : public std::enable_shared_from_this<DiskReadingCor
   std::map<const DiskData*, DiskReadingLane> lanes_;
   std::uint64_t lastNumber_ = 0;
   std::uint64_t unmountCount_ = 0;
+  std::unordered_map<Platform::URL, std::uint64_t> lastUnmounts_;  ///< Their counts.
   std::vector<Basalt::ThreadID> busy_;  ///< In a callback, a look-up or a plan.
   std::condition_variable busyChanged_;
   std::condition_variable offerChanged_;
   bool isClosed_ = false;
 
-  DiskReadingWatch watch_;
+  DiskReadingWatch watch_{"disk-reading-watch"};
+  DiskReadingWatch results_{"disk-results"};
 };
 
 }  // namespace Varnel

@@ -2,9 +2,10 @@
 #include <Varnel/DiskAccess/DiskReadingFiles.h>
 
 #include <algorithm>
+#include <chrono>
 #include <limits>
 #include <numeric>
-#include <unordered_map>
+#include <system_error>
 #include <utility>
 
 #include <Varnel/Basalt/SecurityScopeBookkeeping.h>
@@ -96,20 +97,58 @@ void DiskReadingFiles::start() {
 }
 
 void DiskReadingFiles::lookUp() {
-  std::unordered_map<Platform::URL, std::shared_ptr<Volume>> volumes;
-  std::vector<std::shared_ptr<Volume>> inOrder;
+  const std::uint64_t unmountCount = core_->unmountCount();
+  readFoundLater(unmountCount);
   for (Index file = 0; file < files_.size(); ++file) {
     if (readers_.stop_requested()) return;
     const auto url = volumeOf(files_[file]);
-    if (!url) {
+    if (url)
+      addFound(file, *url);
+    else
       callBack(endWaiting({file}), DiskReadingResult::unknownVolume);
-      continue;
-    }
-    std::shared_ptr<Volume>& volume = volumes[*url];
-    if (!volume) inOrder.push_back(volume = std::make_shared<Volume>(Volume{.url = *url}));
-    volume->files.push_back(file);
   }
-  for (auto& volume : inOrder) readVolume(std::move(volume));
+  {
+    const std::lock_guard lock(mutex_);
+    isLookedUp_ = true;
+  }
+  readFound(unmountCount);
+}
+
+void DiskReadingFiles::addFound(Index file, const Platform::URL& volumeURL) {
+  const std::lock_guard lock(mutex_);
+  const auto [place, isNew] = foundVolumes_.try_emplace(volumeURL, found_.size());
+  if (isNew) found_.push_back(std::make_shared<Volume>(Volume{.url = volumeURL}));
+  found_[place->second]->files.push_back(file);
+}
+
+// A look-up on a dead share keeps the other files waiting no longer than this.
+void DiskReadingFiles::readFoundLater(std::uint64_t unmountCount) {
+  constexpr std::chrono::milliseconds patience{100};
+  (void)core_->watch().at(
+      DiskReadingWatch::Time::clock::now() + patience, [weak = weak_from_this(), unmountCount] {
+        const auto self = weak.lock();
+        if (!self || self->readers_.stop_requested()) return;
+        {
+          const std::lock_guard lock(self->mutex_);
+          if (self->isLookedUp_) return;
+        }
+        self->readFoundLater(unmountCount);
+        try {
+          self->core_->plan([self, unmountCount] { self->readFound(unmountCount); });
+        } catch (const std::system_error&) {
+          return;  // The next time, perhaps.
+        }
+      });
+}
+
+void DiskReadingFiles::readFound(std::uint64_t unmountCount) {
+  std::vector<std::shared_ptr<Volume>> found;
+  {
+    const std::lock_guard lock(mutex_);
+    found.swap(found_);
+    foundVolumes_.clear();
+  }
+  for (auto& volume : found) readVolume(std::move(volume), unmountCount);
 }
 
 std::optional<Platform::URL> DiskReadingFiles::volumeOf(const DiskReadingFile& file) const {
@@ -118,7 +157,7 @@ std::optional<Platform::URL> DiskReadingFiles::volumeOf(const DiskReadingFile& f
   return found ? *found : std::nullopt;
 }
 
-void DiskReadingFiles::readVolume(std::shared_ptr<Volume> volume) {
+void DiskReadingFiles::readVolume(std::shared_ptr<Volume> volume, std::uint64_t unmountCount) {
   const auto disk = core_->disks().settledRecordOfVolume(volume->url)->diskInfo();
   if (disk->kind() != OVDiskKindSolidState)
     std::stable_sort(volume->files.begin(), volume->files.end(), [this](Index one, Index other) {
@@ -138,7 +177,8 @@ void DiskReadingFiles::readVolume(std::shared_ptr<Volume> volume) {
   options.stop = readers_.get_token();
   if (!isImpatient()) options.accessWaitingTimeout.reset();
   for (std::int64_t reader = 0; reader < readers; ++reader)
-    core_->submit(std::make_shared<Reader>(shared_from_this(), volume), first, options);
+    core_->submit(std::make_shared<Reader>(shared_from_this(), volume), first, options,
+                  unmountCount);
 }
 
 bool DiskReadingFiles::isImpatient() const {

@@ -8,6 +8,7 @@
 #include <mutex>
 #include <optional>
 #include <stop_token>
+#include <unordered_map>
 #include <vector>
 
 #include <Varnel/DiskAccess/DiskReadingQueue.h>
@@ -34,7 +35,7 @@ class DiskReadingFiles final : public std::enable_shared_from_this<DiskReadingFi
   enum class State : std::uint8_t { waiting, begun, ended };
   using Index = std::size_t;
 
-  /// The files of one volume, in the order in which they are to be read.
+  /// Files of one volume, in the order in which they are to be read.
   struct Volume {
     Platform::URL url;
     std::vector<Index> files{};
@@ -42,8 +43,11 @@ class DiskReadingFiles final : public std::enable_shared_from_this<DiskReadingFi
   };
 
   void lookUp();
+  void addFound(Index file, const Platform::URL& volumeURL);
+  void readFoundLater(std::uint64_t unmountCount);
+  void readFound(std::uint64_t unmountCount);
   [[nodiscard]] std::optional<Platform::URL> volumeOf(const DiskReadingFile& file) const;
-  void readVolume(std::shared_ptr<Volume> volume);
+  void readVolume(std::shared_ptr<Volume> volume, std::uint64_t unmountCount);
   [[nodiscard]] bool isImpatient() const;
 
   // Any thread.
@@ -70,6 +74,9 @@ class DiskReadingFiles final : public std::enable_shared_from_this<DiskReadingFi
   std::mutex mutex_;  ///< Owns what follows, and what is next of each volume.
   std::vector<State> states_;
   std::size_t begun_ = 0;
+  std::vector<std::shared_ptr<Volume>> found_;                   ///< Those that nobody reads yet.
+  std::unordered_map<Platform::URL, std::size_t> foundVolumes_;  ///< Where they stand there.
+  bool isLookedUp_ = false;
 
   // The rest is set by `start` alone.
   DiskReadingWatch::Timer timer_{};

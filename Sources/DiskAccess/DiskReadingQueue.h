@@ -22,7 +22,7 @@ class OVDiskInfo;
 /// Gives turns on the disks to readers of any number, and never to more at once on a disk than its
 /// record admits (one in background mode). The more urgent class comes first; within a class, the
 /// reader that is next on the way up the disk or, where a seek costs nothing, the one that came
-/// first. Disks are read side by side.
+/// first. Those that need many turns take them in rotation. Disks are read side by side.
 ///
 ///     DiskReadingQueue::shared().read(
 ///         {{.url = file}}, {.propose = "preview", .executor = mainQueue},

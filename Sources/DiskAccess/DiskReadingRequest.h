@@ -22,7 +22,7 @@ struct DiskReadingRequest {
     placing,  ///< Its volume, or the record of that, is being looked up.
     waiting,  ///< In the line of its lane.
     offered,  ///< A worker holds a place for it and waits for its executor.
-    putOff,   ///< The executor took too long. It goes back to its lane when the executor begins.
+    putOff,   ///< The executor took too long. It goes back to its lane after the executor begins.
     running,
     ended,  ///< Its result is settled.
   };
@@ -51,12 +51,13 @@ struct DiskReadingRequest {
   State state = State::placing;
   std::optional<Platform::URL> volumeURL;
   std::optional<std::uint64_t> place;
+  std::uint64_t sweep = 0;           ///< In which the line takes it.
   std::shared_ptr<DiskData> record;  ///< The disk in whose line it stands, or last stood.
   bool hasBegun = false;
   std::optional<DiskReadingResult> verdict;  ///< Why it gets no further turn, while it runs.
   std::atomic<bool>* isTurnEnded = nullptr;  ///< While it runs.
   DiskReadingWatch::Timer timer;             ///< Until its first turn.
-  std::chrono::milliseconds patience = DiskReadingTurn::maxTime;  ///< With its executor.
+  std::chrono::milliseconds pause{};         ///< Before the next offer to its executor.
 
   /// Made before anybody else knows of the request, and destroyed with it.
   std::optional<std::stop_callback<std::function<void()>>> stopCallback;

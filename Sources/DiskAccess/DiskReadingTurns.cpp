@@ -18,9 +18,9 @@ using namespace std::chrono_literals;
 /// Beyond these, readers of one disk only cost threads, whatever a kind of the host's own admits.
 constexpr std::int64_t maxWorkers = 64;
 
-/// How long an executor that is slow to begin may keep a place at last. It starts with the time of
-/// a turn, and doubles.
-constexpr std::chrono::milliseconds maxPatience = 1s;
+/// How long a request whose executor is slow to begin stays out of the line at last. It starts with
+/// the time of a turn, and doubles.
+constexpr std::chrono::milliseconds maxPause = 1s;
 
 constexpr std::chrono::milliseconds timeWithoutThreads = 100ms;
 
@@ -284,7 +284,8 @@ void DiskReadingCore::leaveBusy(Basalt::ThreadID thread) {
 
 // Turns on an executor.
 
-// A place is not kept for long while the executor is busy: it might be waiting for that very place.
+// No place is kept beyond a turn's time while the executor is busy: it might be waiting for that
+// very place. Nor is it kept from somebody more urgent.
 void DiskReadingCore::offer(Lock& lock, const Request& request, Stay& stay) {
   request->state = DiskReadingRequest::State::offered;
   stay.offer = Stay::Offer::open;
@@ -297,22 +298,43 @@ void DiskReadingCore::offer(Lock& lock, const Request& request, Stay& stay) {
     isAccepted = false;
   }
   lock.lock();
-  const auto isSettled = [&] {
-    return stay.offer != Stay::Offer::open || request->state == DiskReadingRequest::State::ended;
+  const auto isOpen = [&] {
+    return stay.offer == Stay::Offer::open && request->state != DiskReadingRequest::State::ended;
   };
-  if (!offerChanged_.wait_for(lock, request->patience, isSettled)) {
-    request->patience = std::min(2 * request->patience, maxPatience);
+  const auto isOutranked = [&] {
+    const auto urgency = stay.lane.line.urgency();
+    return urgency && *urgency < request->urgency && stay.lane.running >= maxRunning(stay.lane);
+  };
+  if (isAccepted)
+    offerChanged_.wait_for(lock, DiskReadingTurn::maxTime,
+                           [&] { return !isOpen() || isOutranked(); });
+  if (isOpen()) {
+    if (!isOutranked())
+      request->pause = std::clamp(2 * request->pause, DiskReadingTurn::maxTime, maxPause);
     request->state = DiskReadingRequest::State::putOff;
-    if (!isAccepted) enqueue(request, request->record);
+    if (!isAccepted) enqueueAfterPause(request);
   } else if (stay.offer == Stay::Offer::taken) {
+    request->pause = {};
     offerChanged_.wait(lock, [&] { return stay.offer == Stay::Offer::done; });
   }
+}
+
+void DiskReadingCore::enqueueAfterPause(const Request& request) {
+  if (request->pause == 0ms) return enqueue(request, request->record);
+  (void)watch_.at(DiskReadingWatch::Time::clock::now() + request->pause,
+                  [weak = weak_from_this(), request] {
+                    const auto self = weak.lock();
+                    if (!self) return;
+                    const Lock lock(self->mutex_);
+                    if (request->state == DiskReadingRequest::State::putOff)
+                      self->enqueue(request, request->record);
+                  });
 }
 
 // On the executor. The stay is still there only if the offer is.
 void DiskReadingCore::runOffered(const Request& request, Stay& stay) {
   Lock lock(mutex_);
-  if (request->state == DiskReadingRequest::State::putOff) return enqueue(request, request->record);
+  if (request->state == DiskReadingRequest::State::putOff) return enqueueAfterPause(request);
   if (request->state != DiskReadingRequest::State::offered) return;
   const Basalt::ThreadID thread = Basalt::currentThreadID();
   busy_.push_back(thread);

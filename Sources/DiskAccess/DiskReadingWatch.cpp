@@ -47,9 +47,9 @@ Basalt::Block DiskReadingWatch::State::nextBlock() {
   }
 }
 
-DiskReadingWatch::DiskReadingWatch()
+DiskReadingWatch::DiskReadingWatch(const char* threadName)
     : state_(std::make_shared<State>()),
-      thread_(Platform::startThread("disk-reading-watch", [state = state_] { state->run(); })) {}
+      thread_(Platform::startThread(threadName, [state = state_] { state->run(); })) {}
 
 void DiskReadingWatch::soon(Basalt::Block block) {
   {

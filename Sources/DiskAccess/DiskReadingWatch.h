@@ -12,6 +12,7 @@ namespace Varnel {
 
 /// A thread that runs blocks at once, in order, or at a time. Any thread. Blocks must not throw.
 ///
+///     DiskReadingWatch watch("deadlines");
 ///     const auto timer = watch.at(deadline, [this] { giveUp(); });
 ///     …
 ///     watch.cancel(timer);
@@ -25,7 +26,7 @@ class DiskReadingWatch final {
   };
 
   /// Throws `std::system_error` when the system grants no thread.
-  DiskReadingWatch();
+  explicit DiskReadingWatch(const char* threadName);
   ~DiskReadingWatch() { close(); }
   DiskReadingWatch(const DiskReadingWatch&) = delete;
   DiskReadingWatch& operator=(const DiskReadingWatch&) = delete;

@@ -191,37 +191,87 @@ TEST_F(DiskReadingFilesTest, CallsBackOnTheExecutorAlone) {
   mainQueue.runWhile([&] { return !results.isComplete(); });
 }
 
-/// A catalogue whose look-ups wait, as on a dead share.
+/// A catalogue in which one look-up waits before it answers, as on a dead share.
 class StuckCatalog final : public Platform::VolumeCatalog {
  public:
+  StuckCatalog(Platform::VolumeCatalog& volumes, URL stuck)
+      : volumes_(volumes), stuck_(std::move(stuck)) {}
+
   std::latch isAsked{1};
   std::latch mayAnswer{1};
 
-  std::vector<Platform::MountedVolume> mountedVolumes() override { return {}; }
-  Platform::Result<std::optional<URL>> volumeURL(const URL&) override {
-    isAsked.count_down();
-    mayAnswer.wait();
-    return std::optional(homeVolume);
+  std::vector<Platform::MountedVolume> mountedVolumes() override {
+    return volumes_.mountedVolumes();
+  }
+  Platform::Result<std::optional<URL>> volumeURL(const URL& url) override {
+    auto volume = volumes_.volumeURL(url);
+    if (url == stuck_) {
+      isAsked.count_down();
+      mayAnswer.wait();
+    }
+    return volume;
   }
   std::optional<std::string> volumeName(const URL&) override { return {}; }
   std::unique_ptr<Subscription> subscribe(ChangeHandler) override { return nullptr; }
+
+ private:
+  Platform::VolumeCatalog& volumes_;
+  const URL stuck_;
+};
+
+/// A queue whose look-up of one file waits.
+struct StuckQueue {
+  StuckCatalog catalog;
+  DiskAccessManager manager;
+  DiskReadingQueue queue;
+
+  StuckQueue(DiskAccessManager::Ports ports, DiskReadingQueue::Ports queuePorts, URL stuck)
+      : catalog(ports.volumes, std::move(stuck)),
+        manager(
+            {ports.devices, ports.disks, catalog, ports.securityScope, ports.notificationCenter}),
+        queue(manager, std::move(queuePorts)) {}
 };
 
 TEST_F(DiskReadingFilesTest, AStopIsAnsweredWhileALookUpIsStuck) {
-  StuckCatalog catalog;
-  DiskAccessManager manager({devices_, disks_, catalog, scope_, center_});
-  DiskReadingQueue queue(manager, {.readingPriority = priority_});
+  StuckQueue stuck({devices_, disks_, volumes_, scope_, center_}, {.readingPriority = priority_},
+                   homeFile);
   std::stop_source source;
   Results results(1);
   const auto never = [](const DiskReadingFile&, Turn&) {
     ADD_FAILURE();
     return Next::done();
   };
-  queue.read({{.url = homeFile}}, {.stop = source.get_token()}, never, results.recorder());
-  catalog.isAsked.wait();
+  stuck.queue.read({{.url = homeFile}}, {.stop = source.get_token()}, never, results.recorder());
+  stuck.catalog.isAsked.wait();
   source.request_stop();
   EXPECT_EQ(results.await(), (Told{{"file", Result::stopped}}));
-  catalog.mayAnswer.count_down();
+  stuck.catalog.mayAnswer.count_down();
+}
+
+TEST_F(DiskReadingFilesTest, OneStuckLookUpKeepsNoOtherFileWaiting) {
+  StuckQueue stuck({devices_, disks_, volumes_, scope_, center_}, {.readingPriority = priority_},
+                   stickFile);
+  Results results(3);
+  stuck.queue.read(
+      {{.url = URL::fileURLWithPath("/home/a")}, {.url = stickFile}, stickNamed("b")}, {},
+      [](const DiskReadingFile&, Turn&) { return Next::done(); }, results.recorder());
+  EXPECT_EQ(results.await(1), (Told{{"a", Result::read}}));
+  stuck.catalog.mayAnswer.count_down();
+  EXPECT_EQ(results.await(),
+            (Told{{"a", Result::read}, {"b", Result::read}, {"file", Result::read}}));
+}
+
+TEST_F(DiskReadingFilesTest, AVolumeUnmountedDuringItsLookUpHasVanished) {
+  StuckQueue stuck({devices_, disks_, volumes_, scope_, center_}, {.readingPriority = priority_},
+                   stickFile);
+  Results results(2);
+  stuck.queue.read(
+      {{.url = URL::fileURLWithPath("/home/a")}, {.url = stickFile}}, {},
+      [](const DiskReadingFile&, Turn&) { return Next::done(); }, results.recorder());
+  stuck.catalog.isAsked.wait();
+  unmount(stickVolume);
+  stuck.catalog.mayAnswer.count_down();
+  EXPECT_EQ(results.await(), (Told{{"a", Result::read}, {"file", Result::vanished}}));
 }
 
 // Readings of all classes with stops, time-outs and executors, while the stick comes and goes and

@@ -17,6 +17,7 @@ using DiskReadingQueueTest = DiskReadingFixture;
 TEST_F(DiskReadingQueueTest, NeverHasMoreReadersOnADiskThanItAdmits) {
   plugDisk("HDD-1", "sda1", "Rotational", archiveVolume);
   mount(archiveVolume);
+  const auto disk = DiskAccessGuard(begin(archiveVolume))->diskData();
   std::mutex mutex;
   std::condition_variable changed;
   int inside = 0;
@@ -35,12 +36,25 @@ TEST_F(DiskReadingQueueTest, NeverHasMoreReadersOnADiskThanItAdmits) {
   for (int i = 0; i < 8; ++i)
     tasks.push_back(submit({.url = archiveVolume, .volumeURL = archiveVolume}, visit));
   awaitLines();
+  const auto hasTwoInside = [&] {
+    const std::lock_guard lock(mutex);
+    return inside == 2 && mayLeave == 0;
+  };
+  while (!hasTwoInside()) std::this_thread::yield();
+  manager_->setIsBackgroundMode(true);
+  {
+    const std::lock_guard lock(mutex);
+    mayLeave = 1;
+    changed.notify_all();
+  }
+  // One that came before the mode leaves, and nobody takes its place.
+  while (accessCount(*disk) > 1) {
+    ASSERT_FALSE(hasTwoInside());
+    std::this_thread::yield();
+  }
   {
     std::unique_lock lock(mutex);
-    changed.wait(lock, [&] { return inside == 2; });
-    manager_->setIsBackgroundMode(true);
-    maxInside = 0;
-    mayLeave = 2;  // Those that came before the mode.
+    mayLeave = 1;
     changed.notify_all();
     changed.wait(lock, [&] { return inside == 1 && mayLeave == 0; });
     mayLeave = 5;
@@ -92,6 +106,49 @@ TEST_F(DiskReadingQueueTest, ReadsOnItsWayUpTheDiskOrInTheOrderOfComing) {
   Places asTheyCame = places;
   asTheyCame.insert(asTheyCame.begin(), 40);
   EXPECT_EQ(orderOn(homeVolume, 40), asTheyCame);
+}
+
+// On a disk that seeks and on one that does not, in one class.
+TEST_F(DiskReadingQueueTest, NobodyWaitsForTheLastTurnOfAnother) {
+  struct Case {
+    URL volume;
+    std::optional<std::uint64_t> place;  ///< Of both that need many turns.
+    std::optional<std::uint64_t> placeOfOther;
+  };
+  const Case cases[] = {{stickVolume, std::nullopt, 10},
+                        {stickVolume, 50, 10},
+                        {homeVolume, std::nullopt, std::nullopt}};
+  manager_->setIsBackgroundMode(true);
+  for (const auto& [volume, place, placeOfOther] : cases) {
+    const auto at = [&](std::optional<std::uint64_t> where) {
+      return DiskReadingFile{.url = volume, .volumeURL = volume, .place = where};
+    };
+    std::latch isIn(1);
+    std::latch mayGo(1);
+    std::atomic<bool> hasOtherRun = false;
+    std::atomic<int> turns = 0;
+    const auto longOne = [&](Turn&) {
+      isIn.count_down(isIn.try_wait() ? 0 : 1);
+      mayGo.wait();
+      return hasOtherRun || ++turns == 1000 ? Next::done() : Next::again(place);
+    };
+    const Task one = submit(at(place), longOne);
+    isIn.wait();
+    const Task two = submit(at(place), longOne);
+    const Task other = submit(at(placeOfOther), [&](Turn&) {
+      hasOtherRun = true;
+      return Next::done();
+    });
+    const bool isHome = volume == homeVolume;
+    EXPECT_EQ(submit({.url = isHome ? stickFile : homeFile,
+                      .volumeURL = isHome ? stickVolume : homeVolume},
+                     [](Turn&) { return Next::done(); })
+                  ->result(),
+              Result::read);
+    mayGo.count_down();
+    for (const Task& task : {one, two, other}) EXPECT_EQ(task->result(), Result::read);
+    EXPECT_LE(turns, 4) << volume.path();
+  }
 }
 
 TEST_F(DiskReadingQueueTest, AMoreUrgentReaderWaitsForOneTurn) {
@@ -167,6 +224,10 @@ TEST_F(DiskReadingQueueTest, LowClassesGiveWayToOtherPrograms) {
   for (const QoS qos : {QoS::default_, QoS::userInitiated, QoS::userInteractive})
     EXPECT_FALSE(isLoweredIn(qos, nullptr));
   EXPECT_TRUE(isLoweredIn(QoS::background, Basalt::globalConcurrentQueue()));
+  // The normal priority is not that of the thread which made the queue.
+  priority_.set(priority_.lowered(0));
+  queue_.emplace(*manager_, DiskReadingQueue::Ports{.readingPriority = priority_});
+  EXPECT_FALSE(isLoweredIn(QoS::userInteractive, nullptr));
 }
 
 TEST_F(DiskReadingQueueTest, ATaskOnTheMainQueueHasThePlaceThere) {
@@ -201,6 +262,42 @@ TEST_F(DiskReadingQueueTest, ABlockedMainQueueKeepsNoPlace) {
   source.request_stop();
   mainQueue.runWhile([&] { return !stopped->hasEnded(); });
   EXPECT_EQ(stopped->result(), Result::stopped);
+}
+
+/// Begins blocks when the test says so.
+class LateExecutor final : public Basalt::Executor {
+ public:
+  void execute(Basalt::Block block) override {
+    const std::lock_guard lock(mutex_);
+    block_ = std::move(block);
+    arrived_.notify_all();
+  }
+  Basalt::Block next() {
+    std::unique_lock lock(mutex_);
+    arrived_.wait(lock, [this] { return bool(block_); });
+    return std::exchange(block_, {});
+  }
+
+ private:
+  std::mutex mutex_;
+  std::condition_variable arrived_;
+  Basalt::Block block_;
+};
+
+TEST_F(DiskReadingQueueTest, AnExecutorThatIsAlwaysLateKeepsAPlaceNoLongerThanATurn) {
+  const auto executor = std::make_shared<LateExecutor>();
+  const Task late = submit(onStick(), {.executor = executor}, [](Turn&) { return Next::done(); });
+  std::chrono::steady_clock::duration kept{};
+  for (int offer = 0; offer < 6; ++offer) {
+    Basalt::Block block = executor->next();
+    const auto begin = std::chrono::steady_clock::now();
+    awaitFreeStick();
+    kept = std::chrono::steady_clock::now() - begin;
+    block();
+  }
+  EXPECT_LT(kept, 25 * Turn::maxTime);
+  while (!late->hasEnded()) executor->next()();
+  EXPECT_EQ(late->result(), Result::read);
 }
 
 TEST_F(DiskReadingQueueTest, AnswersAStopAtOnceInEachState) {
@@ -244,6 +341,28 @@ TEST_F(DiskReadingQueueTest, AnswersAStopAtOnceInEachState) {
   unmount(stickVolume);
   mayLeave.count_down();
   EXPECT_EQ(running->result(), Result::stopped) << "the first reason counts";
+}
+
+TEST_F(DiskReadingQueueTest, ASlowResultKeepsNoTimeOutWaiting) {
+  struct SlowToEnd final : DiskReadingTask {
+    std::latch isTold{1};
+    std::latch mayEnd{1};
+    DiskReadingNext run(Turn&) override { return Next::done(); }
+    void didEnd(Result) override {
+      isTold.count_down();
+      mayEnd.wait();
+    }
+  };
+  const Holder holder = holdStick();
+  const auto slow = std::make_shared<SlowToEnd>();
+  queue_->submit(slow, onStick(), {.accessWaitingTimeout = 0.001});
+  slow->isTold.wait();
+  const Task other = submit(
+      onStick(), {.accessWaitingTimeout = 0.001, .executor = Basalt::globalConcurrentQueue()},
+      [](Turn&) { return Next::done(); });
+  EXPECT_EQ(other->result(), Result::timedOut);
+  slow->mayEnd.count_down();
+  holder.letGo();
 }
 
 TEST_F(DiskReadingQueueTest, SaysWhyNothingWasRead) {

@@ -108,13 +108,20 @@ TEST(TracelessReader, TellsTheSystemsErrors) {
 TEST(ReadingPriority, IsTheThreadsOwnAndCanBeRestored) {
   constexpr int lowest = 2 << 13 | 7;
   constexpr int idle = 3 << 13;
+  constexpr int realTime = 1 << 13 | 4;
+  constexpr int unsetOnOldKernels = 4;
   const auto priority = Linux::makeReadingPriority();
   const auto normal = priority->current();
   ASSERT_TRUE(normal);
   std::thread([&] {
     EXPECT_EQ(priority->lowered(*normal), lowest);
+    EXPECT_EQ(priority->lowered(realTime), realTime) << "nobody else may take it up again";
     priority->set(lowest);
     EXPECT_EQ(priority->current(), lowest);
+    EXPECT_EQ(priority->ofMainThread(), normal);
+    priority->set(unsetOnOldKernels);
+    EXPECT_NE(priority->current(), lowest);
+    priority->set(lowest);
     priority->set(*normal);
     EXPECT_EQ(priority->current(), normal);
     priority->set(idle);
