@@ -124,10 +124,12 @@ TEST_F(Scan, CountsEveryKindOfFileOnce) {
 
 TEST_F(Scan, WalksOverlappingFoldersOnce) {
   folder.write("one/a", "same");
-  folder.write("one/two/b", "same");
+  for (const char* name : {"one/two/b", "one/two/z/c", "one/two!/d", "one/zoo/e", "f", "x"})
+    folder.write(name, "same");
   const ScanResult once = scan();
   const ScanResult twice =
-      scan({folder.path("one/two"), folder.path(), folder.path("one"), folder.path()});
+      scan({folder.path("one/two"), folder.path(), folder.path("one"), folder.path("one/two!"),
+            folder.path("one/two/z"), folder.path("one/zoo"), folder.path()});
   EXPECT_EQ(paths(twice), paths(once));
   EXPECT_EQ(twice.totals, once.totals);
 }
