@@ -143,6 +143,7 @@ class FaultyFileSystem final : public FileSystem {
   std::function<void(const std::string& path)> beforeRead;
   std::map<std::string, FileIdentity> identities;  ///< Of folders that are mounted again.
   int maxOpenFolders = 1000;
+  int maxFoldersBesideAFile = 1000;
   std::atomic<int> placesAsked{0};
   std::atomic<int> openFolders{0};
   std::atomic<int> faults{0};
@@ -206,6 +207,8 @@ class FaultyFileSystem final : public FileSystem {
       if (!FakeTurns::isInside()) ++owner_.faults;
       if (const auto fault = owner_.openFaults.find(path); fault != owner_.openFaults.end())
         return std::make_error_code(fault->second);
+      if (owner_.openFolders > owner_.maxFoldersBesideAFile)
+        return std::make_error_code(std::errc::too_many_files_open);
       if (owner_.beforeOpen) owner_.beforeOpen(path);
       auto opened = folder_->open(name, plan);
       if (!opened) return opened;
