@@ -183,6 +183,7 @@ TEST_F(Scan, LeavesOutFilesThatVanishOrChangeMeanwhile) {
   const std::string shrinks = folder.write("shrinks", bytes(10'000, 'a'));
   const std::string touched = folder.write("touched", bytes(10'000, 'a'));
   const std::string replaced = folder.write("replaced", bytes(10'000, 'a'));
+  const std::string foldered = folder.write("foldered", bytes(10'000, 'a'));
   const std::string piped = folder.write("piped", bytes(10'000, 'a'));
   const std::string unwritten = folder.write("unwritten", bytes(10'000, 'a'));
   const std::string swapped = folder.write("swapped", bytes(10'000, 'a'));
@@ -199,6 +200,10 @@ TEST_F(Scan, LeavesOutFilesThatVanishOrChangeMeanwhile) {
     if (path == replaced) {
       fs::remove(path);
       fs::create_symlink(first, path);
+    }
+    if (path == foldered) {
+      fs::remove(path);
+      fs::create_directory(path);
     }
     if (path == piped || path == unwritten) {
       fs::remove(path);
@@ -218,8 +223,8 @@ TEST_F(Scan, LeavesOutFilesThatVanishOrChangeMeanwhile) {
   const ScanResult result = scan();
   EXPECT_THAT(paths(result), ElementsAre(ElementsAre(first, second)));
   EXPECT_EQ(result.totals.vanishedFiles, 1u);
-  EXPECT_EQ(result.totals.changedFiles, 7u);
-  EXPECT_EQ(losses.files.size(), 8u);
+  EXPECT_EQ(result.totals.changedFiles, 8u);
+  EXPECT_EQ(losses.files.size(), 9u);
   EXPECT_EQ(::read(pipe, content.data(), content.size()), std::ssize(content));
   ::close(pipe);
 }
