@@ -18,6 +18,7 @@
 #include <vector>
 
 #include <Scan/FileSystem.h>
+#include <Varnel/Platform/Ports/TracelessReader.h>
 
 namespace Orvane {
 namespace {
@@ -92,9 +93,12 @@ FileStatus statusFrom(const struct stat& facts) {
 
 class DescriptorFile final : public OpenFile {
  public:
-  explicit DescriptorFile(Descriptor descriptor) : descriptor_(std::move(descriptor)) {}
+  DescriptorFile(Descriptor descriptor, CacheUse cacheUse) : descriptor_(std::move(descriptor)) {
+    if (cacheUse == CacheUse::traceless) traceless_.emplace(descriptor_.get());
+  }
 
   FileResult<std::size_t> read(std::uint64_t offset, std::span<std::byte> buffer) override {
+    if (traceless_) return traceless_->read(buffer, offset);
     for (;;) {
       // Unlike a plain read it takes nothing from a pipe that stands where the file was.
       const ssize_t count =
@@ -126,12 +130,13 @@ class DescriptorFile final : public OpenFile {
 
  private:
   Descriptor descriptor_;
+  std::optional<Varnel::Platform::TracelessReader> traceless_;
 };
 
 class DescriptorFolder final : public OpenFolder {
  public:
-  DescriptorFolder(Descriptor descriptor, FileIdentity identity)
-      : descriptor_(std::move(descriptor)), identity_(identity) {}
+  DescriptorFolder(Descriptor descriptor, FileIdentity identity, CacheUse cacheUse)
+      : descriptor_(std::move(descriptor)), identity_(identity), cacheUse_(cacheUse) {}
 
   [[nodiscard]] int number() const { return descriptor_.get(); }
   [[nodiscard]] FileIdentity identity() const override { return identity_; }
@@ -160,7 +165,8 @@ class DescriptorFolder final : public OpenFolder {
     if (descriptor.get() < 0) return lastError();
     // Without read-ahead, a cold disk reads only the parts.
     if (plan == ReadingPlan::parts) ::posix_fadvise(descriptor.get(), 0, 0, POSIX_FADV_RANDOM);
-    std::unique_ptr<OpenFile> file = std::make_unique<DescriptorFile>(std::move(descriptor));
+    std::unique_ptr<OpenFile> file =
+        std::make_unique<DescriptorFile>(std::move(descriptor), cacheUse_);
     return file;
   }
 
@@ -188,27 +194,37 @@ class DescriptorFolder final : public OpenFolder {
 
   Descriptor descriptor_;
   FileIdentity identity_;
+  CacheUse cacheUse_;
+  std::unique_ptr<char[]> buffer_;  ///< While the folder is listed.
+  std::vector<const dirent64*> entries_;
+  std::size_t next_ = 0;  ///< Of the entries.
 };
 
 class POSIXFileSystem final : public FileSystem {
  public:
+  explicit POSIXFileSystem(CacheUse cacheUse) : cacheUse_(cacheUse) {}
+
   FileResult<std::unique_ptr<OpenFolder>> openFolder(OpenFolder* base,
                                                      const std::string& path) override {
     const int start = base ? static_cast<DescriptorFolder*>(base)->number() : AT_FDCWD;
     Descriptor descriptor = openWithoutLinks(start, path, O_RDONLY | O_DIRECTORY);
     struct stat facts;
     if (descriptor.get() < 0 || ::fstat(descriptor.get(), &facts) != 0) return lastError();
-    std::unique_ptr<OpenFolder> folder =
-        std::make_unique<DescriptorFolder>(std::move(descriptor), statusFrom(facts).identity);
+    std::unique_ptr<OpenFolder> folder = std::make_unique<DescriptorFolder>(
+        std::move(descriptor), statusFrom(facts).identity, cacheUse_);
     return folder;
   }
+
+ private:
+  const CacheUse cacheUse_;
 };
 
 }  // namespace
 
-FileSystem& systemFileSystem() {
-  static POSIXFileSystem fileSystem;
-  return fileSystem;
+FileSystem& systemFileSystem(CacheUse cacheUse) {
+  static POSIXFileSystem normal(CacheUse::normal);
+  static POSIXFileSystem traceless(CacheUse::traceless);
+  return cacheUse == CacheUse::normal ? normal : traceless;
 }
 
 }  // namespace Orvane

@@ -3,6 +3,7 @@
 #include <dlfcn.h>
 #include <fcntl.h>
 #include <gmock/gmock.h>
+#include <sys/mman.h>
 #include <sys/stat.h>
 #include <sys/syscall.h>
 #include <unistd.h>
@@ -227,6 +228,38 @@ TEST_F(Scan, LeavesOutFilesThatVanishOrChangeMeanwhile) {
   EXPECT_EQ(losses.files.size(), 9u);
   EXPECT_EQ(::read(pipe, content.data(), content.size()), std::ssize(content));
   ::close(pipe);
+}
+
+/// How many pages of the file are in the system's cache.
+long cachedPages(const std::string& path) {
+  const int file = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
+  const std::size_t size = fs::file_size(path);
+  std::vector<unsigned char> pages((size + 4095) / 4096);
+  void* const mapped = ::mmap(nullptr, size, PROT_READ, MAP_SHARED, file, 0);
+  EXPECT_EQ(::mincore(mapped, size, pages.data()), 0);
+  ::munmap(mapped, size);
+  ::close(file);
+  return std::count_if(pages.begin(), pages.end(), [](auto page) { return page & 1; });
+}
+
+TEST_F(Scan, LeavesThePageCacheAloneWhereItShould) {
+  const std::vector<std::string> files = {folder.write("1", bytes(1'000'000, 'a')),
+                                          folder.write("2", bytes(1'000'000, 'a'))};
+  for (const std::string& path : files) {
+    const int file = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
+    ::fsync(file);
+    ::posix_fadvise(file, 0, 0, POSIX_FADV_DONTNEED);
+    ::close(file);
+    if (cachedPages(path) > 0) GTEST_SKIP() << "their file system is a cache itself";
+  }
+  const auto scanAs = [&](CacheUse use) {
+    const ScanResult result =
+        DuplicateFinder({systemFileSystem(use), turns, losses}).find({folder.path()}, control);
+    EXPECT_THAT(paths(result), ElementsAre(files));
+    return cachedPages(files[0]) + cachedPages(files[1]);
+  };
+  EXPECT_EQ(scanAs(CacheUse::traceless), 0);
+  EXPECT_EQ(scanAs(CacheUse::normal), 2 * 245);
 }
 
 /// Runs the work with every means of the system and without the call that opens a path of many
