@@ -91,6 +91,19 @@ FileStatus statusFrom(const struct stat& facts) {
           .modifiedAt = std::int64_t{facts.st_mtim.tv_sec} * 1'000'000'000 + facts.st_mtim.tv_nsec};
 }
 
+/// Opens what another program writes under a lease, once that has given the lease back: the system
+/// makes it. Only of a regular file is there nobody else to wait for.
+Descriptor openLeased(int folder, const char* name) {
+  const Descriptor found(::openat(folder, name, O_PATH | O_NOFOLLOW | O_CLOEXEC));
+  struct stat facts;
+  const bool isFile =
+      found.get() >= 0 && ::fstat(found.get(), &facts) == 0 && S_ISREG(facts.st_mode);
+  const std::string path = "/proc/self/fd/" + std::to_string(found.get());
+  Descriptor opened(isFile ? ::open(path.c_str(), O_RDONLY | O_CLOEXEC) : -1);
+  if (opened.get() < 0) errno = EAGAIN;
+  return opened;
+}
+
 class DescriptorFile final : public OpenFile {
  public:
   DescriptorFile(Descriptor descriptor, CacheUse cacheUse) : descriptor_(std::move(descriptor)) {
@@ -162,6 +175,7 @@ class DescriptorFolder final : public OpenFolder {
   FileResult<std::unique_ptr<OpenFile>> open(const char* name, ReadingPlan plan) override {
     Descriptor descriptor(
         ::openat(number(), name, O_RDONLY | O_NONBLOCK | O_NOCTTY | O_NOFOLLOW | O_CLOEXEC));
+    if (descriptor.get() < 0 && errno == EAGAIN) descriptor = openLeased(number(), name);
     if (descriptor.get() < 0) return lastError();
     // Without read-ahead, a cold disk reads only the parts.
     if (plan == ReadingPlan::parts) ::posix_fadvise(descriptor.get(), 0, 0, POSIX_FADV_RANDOM);

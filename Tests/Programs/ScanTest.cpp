@@ -11,6 +11,7 @@
 #include <cerrno>
 #include <chrono>
 #include <climits>
+#include <csignal>
 #include <filesystem>
 #include <map>
 #include <random>
@@ -228,6 +229,23 @@ TEST_F(Scan, LeavesOutFilesThatVanishOrChangeMeanwhile) {
   EXPECT_EQ(losses.files.size(), 9u);
   EXPECT_EQ(::read(pipe, content.data(), content.size()), std::ssize(content));
   ::close(pipe);
+}
+
+std::atomic<int> leased{-1};
+
+TEST_F(Scan, WaitsForALeaseToBeGivenBack) {
+  const std::string first = folder.write("1", "same");
+  const std::string second = folder.write("2", "same");
+  leased = ::open(second.c_str(), O_RDWR | O_CLOEXEC);
+  struct sigaction giveBack {
+  }, before{};
+  giveBack.sa_handler = [](int) { ::fcntl(leased, F_SETLEASE, F_UNLCK); };
+  ::sigaction(SIGIO, &giveBack, &before);
+  const bool hasLeases = ::fcntl(leased, F_SETLEASE, F_WRLCK) == 0;
+  EXPECT_THAT(paths(scan()), ElementsAre(ElementsAre(first, second)));
+  ::sigaction(SIGIO, &before, nullptr);
+  ::close(leased);
+  if (!hasLeases) GTEST_SKIP() << "the file system of temporary files grants no leases";
 }
 
 /// How many pages of the file are in the system's cache.
