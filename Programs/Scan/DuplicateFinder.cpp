@@ -69,6 +69,7 @@ class Scan final {
 
   ScanResult run(const std::vector<std::string>& folders) {
     WalkResult walk = walkFolders(folders, ports_.fileSystem, ports_.turns, control_);
+    if (control_.isCancelled) return {};
     if (!walk.lostRoots.empty()) return {.lostFolders = std::move(walk.lostRoots)};
     tree_ = walk.tree;
     reportWalk(walk);

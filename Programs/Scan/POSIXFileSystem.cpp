@@ -155,21 +155,13 @@ class DescriptorFolder final : public OpenFolder {
   [[nodiscard]] FileIdentity identity() const override { return identity_; }
 
   FileResult<bool> list(const std::function<void(const FolderEntry&)>& visit) override {
-    alignas(dirent64) std::array<char, 64 * 1024> buffer;
-    const ssize_t size = ::getdents64(number(), buffer.data(), buffer.size());
-    if (size < 0) return lastError();
-    std::vector<const dirent64*> entries;
-    for (ssize_t at = 0; at < size;) {
-      const auto* const entry = reinterpret_cast<const dirent64*>(buffer.data() + at);
-      at += entry->d_reclen;
-      const std::string_view name = entry->d_name;
-      if (name != "." && name != ".." && mayTakePart(entry->d_type)) entries.push_back(entry);
+    if (next_ == entries_.size()) {
+      const auto more = readEntries();
+      if (!more || !*more) return more;
     }
-    // As their facts lie on most disks.
-    std::sort(entries.begin(), entries.end(),
-              [](const dirent64* a, const dirent64* b) { return a->d_ino < b->d_ino; });
-    for (const dirent64* entry : entries) visitEntry(*entry, visit);
-    return size > 0;
+    for (const std::size_t end = std::min(next_ + maxVisits, entries_.size()); next_ < end; ++next_)
+      visitEntry(*entries_[next_], visit);
+    return true;
   }
 
   FileResult<std::unique_ptr<OpenFile>> open(const char* name, ReadingPlan plan) override {
@@ -185,6 +177,29 @@ class DescriptorFolder final : public OpenFolder {
   }
 
  private:
+  /// Each may cost a disk that must work, or a share, some milliseconds.
+  static constexpr std::size_t maxVisits = 32;
+  static constexpr std::size_t bufferLength = 64 * 1024;
+
+  /// Fetches the next entries from the system, in the order in which their facts lie on most disks.
+  FileResult<bool> readEntries() {
+    if (!buffer_) buffer_ = std::make_unique_for_overwrite<char[]>(bufferLength);
+    entries_.clear();
+    next_ = 0;
+    const ssize_t size = ::getdents64(number(), buffer_.get(), bufferLength);
+    if (size <= 0) buffer_.reset();
+    if (size < 0) return lastError();
+    for (ssize_t at = 0; at < size;) {
+      const auto* const entry = reinterpret_cast<const dirent64*>(buffer_.get() + at);
+      at += entry->d_reclen;
+      const std::string_view name = entry->d_name;
+      if (name != "." && name != ".." && mayTakePart(entry->d_type)) entries_.push_back(entry);
+    }
+    std::sort(entries_.begin(), entries_.end(),
+              [](const dirent64* a, const dirent64* b) { return a->d_ino < b->d_ino; });
+    return size > 0;
+  }
+
   static bool mayTakePart(unsigned char type) {
     return type == DT_REG || type == DT_DIR || type == DT_UNKNOWN;
   }

@@ -139,6 +139,7 @@ class FaultyFileSystem final : public FileSystem {
   std::map<std::string, std::errc> readFaults;
   std::map<std::string, std::uint64_t> places;  ///< Where given, of all files.
   std::function<void(const std::string& path)> beforeOpenFolder;
+  std::function<void(const std::string& path)> beforeList;
   std::function<void(const std::string& path)> beforeOpen;
   std::function<void(const std::string& path)> beforeRead;
   std::map<std::string, FileIdentity> identities;  ///< Of folders that are mounted again.
@@ -196,6 +197,7 @@ class FaultyFileSystem final : public FileSystem {
     }
 
     FileResult<bool> list(const std::function<void(const FolderEntry&)>& visit) override {
+      if (owner_.beforeList) owner_.beforeList(path_);
       const auto fault = owner_.interruptions.find(path_);
       if (fault != owner_.interruptions.end() && std::exchange(isListed_, true))
         return std::make_error_code(fault->second);

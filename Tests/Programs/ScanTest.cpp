@@ -376,6 +376,15 @@ TEST_F(Scan, StopsWhenAskedTo) {
   }
 }
 
+TEST_F(Scan, StopsWithinAFolderWhenAskedTo) {
+  for (int i = 0; i < 1000; ++i) folder.write(std::to_string(i), "same");
+  int times = 0;
+  fileSystem.beforeList = [&](const std::string&) { control.isCancelled = ++times == 2; };
+  (void)scan();
+  EXPECT_LE(control.filesFound, 64u);
+  EXPECT_EQ(control.filesToRead, 0u) << "nobody asks for them any more";
+}
+
 TEST_F(Scan, StopsWithinAFileWhenAskedTo) {
   for (int i = 0; i < 3; ++i) fs::resize_file(folder.write(std::to_string(i), ""), 1'000'000'000);
   std::atomic<int> blocks{0};
