@@ -79,7 +79,7 @@ void ContentReader::begin(FileNumber file, Look look) {
       ranges_[0] = {0, size};
       break;
   }
-  isPart_ = look != Look::everything && size > worthAdvice;
+  isPart_ = look != Look::everything && size >= worthAdvice;
   isFirstBlock_ = true;
   loss_.reset();
 }

@@ -189,7 +189,8 @@ class Scan final {
     Candidates rest =
         takeOut(candidates, [&](const auto& file) { return sizeOf(file) > headLength; });
 
-    Candidates large = takeOut(rest, [&](const auto& file) { return sizeOf(file) > worthSamples; });
+    Candidates large =
+        takeOut(rest, [&](const auto& file) { return sizeOf(file) >= worthSamples; });
     look(Look::samples, large);
     keepAgreeing(large);
     look(Look::everything, large);

@@ -465,10 +465,10 @@ TEST_F(Scan, NeverReadsTwoLargeFilesOfAnOrderedDiskByTurns) {
 }
 
 TEST_F(Scan, TellsLargeFilesApartByTheirMiddleOrEnd) {
-  for (const std::size_t place : {1'500'000u, 2'999'999u}) {
+  for (const std::size_t place : {4'500'000u, 8'999'999u}) {
     const ScanFolder large;
     for (const char letter : {'a', 'b', 'c'}) {
-      std::string content(3'000'000, 'x');
+      std::string content(9'000'000, 'x');
       content[place] = letter;
       large.write(std::string(1, letter), content);
     }
