@@ -79,7 +79,7 @@ void ContentReader::begin(FileNumber file, Look look) {
       ranges_[0] = {0, size};
       break;
   }
-  isPart_ = look != Look::everything && size > worthAdvice;
+  isPart_ = look != Look::everything && size >= worthAdvice;
   isFirstBlock_ = true;
   loss_.reset();
 }
@@ -125,6 +125,9 @@ std::optional<std::uint64_t> ContentReader::placeOf(FileNumber file) {
 FileResult<std::unique_ptr<OpenFile>> ContentReader::open(ReadingPlan plan) {
   const auto folder = folders_.open(tree_.folderOf(file_));
   if (!folder) return folder.error();
+  auto opened = (*folder)->open(tree_.nameOf(file_), plan);
+  if (opened || opened.error() != std::errc::too_many_files_open) return opened;
+  folders_.doWithFew();
   return (*folder)->open(tree_.nameOf(file_), plan);
 }
 

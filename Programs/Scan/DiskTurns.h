@@ -46,8 +46,9 @@ class DiskTurns {
  public:
   virtual ~DiskTurns() = default;
 
-  /// The disk that holds the folder or file; the same object for all that lie on one disk. May wait
-  /// for a share that does not answer. Lives as long as this object.
+  /// The disk that holds the folder or file; the same object for all that lie on one disk. A disk
+  /// remains as long as one volume remains that was asked about. May wait for a share that does not
+  /// answer. Lives as long as this object.
   [[nodiscard]] virtual const ScanDisk& diskOf(const std::string& path) = 0;
 
   /// Runs the task, in turns, on a thread of its own choice until it is done, and drops it. Does

@@ -69,6 +69,7 @@ class Scan final {
 
   ScanResult run(const std::vector<std::string>& folders) {
     WalkResult walk = walkFolders(folders, ports_.fileSystem, ports_.turns, control_);
+    if (control_.isCancelled) return {};
     if (!walk.lostRoots.empty()) return {.lostFolders = std::move(walk.lostRoots)};
     tree_ = walk.tree;
     reportWalk(walk);
@@ -188,7 +189,8 @@ class Scan final {
     Candidates rest =
         takeOut(candidates, [&](const auto& file) { return sizeOf(file) > headLength; });
 
-    Candidates large = takeOut(rest, [&](const auto& file) { return sizeOf(file) > worthSamples; });
+    Candidates large =
+        takeOut(rest, [&](const auto& file) { return sizeOf(file) >= worthSamples; });
     look(Look::samples, large);
     keepAgreeing(large);
     look(Look::everything, large);

@@ -95,7 +95,10 @@ class FileSystem {
       OpenFolder* base, const std::string& path) = 0;
 };
 
+/// What reading leaves in the system's page cache: what it read, or what was there before.
+enum class CacheUse { normal, traceless };
+
 /// The file system of the machine. It lives as long as the process.
-[[nodiscard]] FileSystem& systemFileSystem();
+[[nodiscard]] FileSystem& systemFileSystem(CacheUse cacheUse = CacheUse::normal);
 
 }  // namespace Orvane

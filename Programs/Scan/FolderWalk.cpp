@@ -58,7 +58,12 @@ class Walk final {
       }
     }
     if (result_.lostRoots.empty()) {
-      for (Folder* root : roots) enqueue(workAt(root->identity.device, pathOf(*root)), {root});
+      for (Folder* root : roots) {
+        const std::string path = pathOf(*root);
+        // A device that is known already may be mounted here once more, and stay so longer.
+        (void)turns_.diskOf(path);
+        enqueue(workAt(root->identity.device, path), {root});
+      }
       group_.wait();
     }
     const auto byPath = [](const LostPath& a, const LostPath& b) { return a.path < b.path; };

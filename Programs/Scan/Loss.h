@@ -21,9 +21,11 @@ struct Loss {
   /// The loss that an error of the file system stands for.
   [[nodiscard]] static Loss because(std::error_code error) {
     if (error == std::errc::no_such_file_or_directory) return {Kind::vanished, error};
-    // A symbolic link, a socket, a pipe or another thing took the place of what the walk saw.
+    // A symbolic link, a socket, a pipe, a folder or another thing took the place of what the walk
+    // saw.
     if (error == std::errc::too_many_symbolic_link_levels || error == std::errc::not_a_directory ||
-        error == std::errc::invalid_seek || error == std::errc::no_such_device_or_address)
+        error == std::errc::is_a_directory || error == std::errc::invalid_seek ||
+        error == std::errc::no_such_device_or_address)
       return {Kind::changed, {}};
     return {Kind::unreadable, error};
   }

@@ -35,14 +35,19 @@ FileResult<OpenFolder*> OpenFolders::open(const Folder& folder) {
   while (above && !(base = find(above))) above = above->parent;
   auto opened = fileSystem_.openFolder(base ? base->open.get() : nullptr, wayDown(above, folder));
   if (!opened && opened.error() == std::errc::too_many_files_open) {
-    // The host leaves us few descriptors: do with one.
+    doWithFew();
     entries_.clear();
     opened = fileSystem_.openFolder(nullptr, pathOf(folder));
   }
   if (!opened) return opened.error();
-  if (entries_.size() == maxCount) entries_.erase(entries_.begin());
+  if (entries_.size() == maxCount_) entries_.erase(entries_.begin());
   entries_.push_back({&folder, std::move(*opened)});
   return entries_.back().open.get();
+}
+
+void OpenFolders::doWithFew() {
+  maxCount_ = 1;
+  if (entries_.size() > 1) entries_.erase(entries_.begin(), entries_.end() - 1);
 }
 
 OpenFolders::Entry* OpenFolders::find(const Folder* folder) {

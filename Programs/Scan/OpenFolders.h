@@ -20,16 +20,20 @@ class OpenFolders final {
   /// The folder, opened if it is not open yet. It stays open until the next call at least.
   [[nodiscard]] FileResult<OpenFolder*> open(const Folder& folder);
 
+  /// Closes all but the last one opened, and keeps no more from now on: the host leaves us few
+  /// descriptors.
+  void doWithFew();
+
  private:
   struct Entry {
     const Folder* folder;
     std::unique_ptr<OpenFolder> open;
   };
-  static constexpr std::size_t maxCount = 16;
 
   [[nodiscard]] Entry* find(const Folder* folder);
 
   FileSystem& fileSystem_;
+  std::size_t maxCount_ = 16;
   std::vector<Entry> entries_;  ///< The one used last is the last.
 };
 

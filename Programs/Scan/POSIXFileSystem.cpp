@@ -18,6 +18,7 @@
 #include <vector>
 
 #include <Scan/FileSystem.h>
+#include <Varnel/Platform/Ports/TracelessReader.h>
 
 namespace Orvane {
 namespace {
@@ -90,11 +91,27 @@ FileStatus statusFrom(const struct stat& facts) {
           .modifiedAt = std::int64_t{facts.st_mtim.tv_sec} * 1'000'000'000 + facts.st_mtim.tv_nsec};
 }
 
+/// Opens what another program writes under a lease, once that has given the lease back: the system
+/// makes it. Only of a regular file is there nobody else to wait for.
+Descriptor openLeased(int folder, const char* name) {
+  const Descriptor found(::openat(folder, name, O_PATH | O_NOFOLLOW | O_CLOEXEC));
+  struct stat facts;
+  const bool isFile =
+      found.get() >= 0 && ::fstat(found.get(), &facts) == 0 && S_ISREG(facts.st_mode);
+  const std::string path = "/proc/self/fd/" + std::to_string(found.get());
+  Descriptor opened(isFile ? ::open(path.c_str(), O_RDONLY | O_CLOEXEC) : -1);
+  if (opened.get() < 0) errno = EAGAIN;
+  return opened;
+}
+
 class DescriptorFile final : public OpenFile {
  public:
-  explicit DescriptorFile(Descriptor descriptor) : descriptor_(std::move(descriptor)) {}
+  DescriptorFile(Descriptor descriptor, CacheUse cacheUse) : descriptor_(std::move(descriptor)) {
+    if (cacheUse == CacheUse::traceless) traceless_.emplace(descriptor_.get());
+  }
 
   FileResult<std::size_t> read(std::uint64_t offset, std::span<std::byte> buffer) override {
+    if (traceless_) return traceless_->read(buffer, offset);
     for (;;) {
       // Unlike a plain read it takes nothing from a pipe that stands where the file was.
       const ssize_t count =
@@ -126,45 +143,63 @@ class DescriptorFile final : public OpenFile {
 
  private:
   Descriptor descriptor_;
+  std::optional<Varnel::Platform::TracelessReader> traceless_;
 };
 
 class DescriptorFolder final : public OpenFolder {
  public:
-  DescriptorFolder(Descriptor descriptor, FileIdentity identity)
-      : descriptor_(std::move(descriptor)), identity_(identity) {}
+  DescriptorFolder(Descriptor descriptor, FileIdentity identity, CacheUse cacheUse)
+      : descriptor_(std::move(descriptor)), identity_(identity), cacheUse_(cacheUse) {}
 
   [[nodiscard]] int number() const { return descriptor_.get(); }
   [[nodiscard]] FileIdentity identity() const override { return identity_; }
 
   FileResult<bool> list(const std::function<void(const FolderEntry&)>& visit) override {
-    alignas(dirent64) std::array<char, 64 * 1024> buffer;
-    const ssize_t size = ::getdents64(number(), buffer.data(), buffer.size());
-    if (size < 0) return lastError();
-    std::vector<const dirent64*> entries;
-    for (ssize_t at = 0; at < size;) {
-      const auto* const entry = reinterpret_cast<const dirent64*>(buffer.data() + at);
-      at += entry->d_reclen;
-      const std::string_view name = entry->d_name;
-      if (name != "." && name != ".." && mayTakePart(entry->d_type)) entries.push_back(entry);
+    if (next_ == entries_.size()) {
+      const auto more = readEntries();
+      if (!more || !*more) return more;
     }
-    // As their facts lie on most disks.
-    std::sort(entries.begin(), entries.end(),
-              [](const dirent64* a, const dirent64* b) { return a->d_ino < b->d_ino; });
-    for (const dirent64* entry : entries) visitEntry(*entry, visit);
-    return size > 0;
+    for (const std::size_t end = std::min(next_ + maxVisits, entries_.size()); next_ < end; ++next_)
+      visitEntry(*entries_[next_], visit);
+    return true;
   }
 
   FileResult<std::unique_ptr<OpenFile>> open(const char* name, ReadingPlan plan) override {
     Descriptor descriptor(
         ::openat(number(), name, O_RDONLY | O_NONBLOCK | O_NOCTTY | O_NOFOLLOW | O_CLOEXEC));
+    if (descriptor.get() < 0 && errno == EAGAIN) descriptor = openLeased(number(), name);
     if (descriptor.get() < 0) return lastError();
     // Without read-ahead, a cold disk reads only the parts.
     if (plan == ReadingPlan::parts) ::posix_fadvise(descriptor.get(), 0, 0, POSIX_FADV_RANDOM);
-    std::unique_ptr<OpenFile> file = std::make_unique<DescriptorFile>(std::move(descriptor));
+    std::unique_ptr<OpenFile> file =
+        std::make_unique<DescriptorFile>(std::move(descriptor), cacheUse_);
     return file;
   }
 
  private:
+  /// Each may cost a disk that must work, or a share, some milliseconds.
+  static constexpr std::size_t maxVisits = 32;
+  static constexpr std::size_t bufferLength = 64 * 1024;
+
+  /// Fetches the next entries from the system, in the order in which their facts lie on most disks.
+  FileResult<bool> readEntries() {
+    if (!buffer_) buffer_ = std::make_unique_for_overwrite<char[]>(bufferLength);
+    entries_.clear();
+    next_ = 0;
+    const ssize_t size = ::getdents64(number(), buffer_.get(), bufferLength);
+    if (size <= 0) buffer_.reset();
+    if (size < 0) return lastError();
+    for (ssize_t at = 0; at < size;) {
+      const auto* const entry = reinterpret_cast<const dirent64*>(buffer_.get() + at);
+      at += entry->d_reclen;
+      const std::string_view name = entry->d_name;
+      if (name != "." && name != ".." && mayTakePart(entry->d_type)) entries_.push_back(entry);
+    }
+    std::sort(entries_.begin(), entries_.end(),
+              [](const dirent64* a, const dirent64* b) { return a->d_ino < b->d_ino; });
+    return size > 0;
+  }
+
   static bool mayTakePart(unsigned char type) {
     return type == DT_REG || type == DT_DIR || type == DT_UNKNOWN;
   }
@@ -188,27 +223,37 @@ class DescriptorFolder final : public OpenFolder {
 
   Descriptor descriptor_;
   FileIdentity identity_;
+  CacheUse cacheUse_;
+  std::unique_ptr<char[]> buffer_;  ///< While the folder is listed.
+  std::vector<const dirent64*> entries_;
+  std::size_t next_ = 0;  ///< Of the entries.
 };
 
 class POSIXFileSystem final : public FileSystem {
  public:
+  explicit POSIXFileSystem(CacheUse cacheUse) : cacheUse_(cacheUse) {}
+
   FileResult<std::unique_ptr<OpenFolder>> openFolder(OpenFolder* base,
                                                      const std::string& path) override {
     const int start = base ? static_cast<DescriptorFolder*>(base)->number() : AT_FDCWD;
     Descriptor descriptor = openWithoutLinks(start, path, O_RDONLY | O_DIRECTORY);
     struct stat facts;
     if (descriptor.get() < 0 || ::fstat(descriptor.get(), &facts) != 0) return lastError();
-    std::unique_ptr<OpenFolder> folder =
-        std::make_unique<DescriptorFolder>(std::move(descriptor), statusFrom(facts).identity);
+    std::unique_ptr<OpenFolder> folder = std::make_unique<DescriptorFolder>(
+        std::move(descriptor), statusFrom(facts).identity, cacheUse_);
     return folder;
   }
+
+ private:
+  const CacheUse cacheUse_;
 };
 
 }  // namespace
 
-FileSystem& systemFileSystem() {
-  static POSIXFileSystem fileSystem;
-  return fileSystem;
+FileSystem& systemFileSystem(CacheUse cacheUse) {
+  static POSIXFileSystem normal(CacheUse::normal);
+  static POSIXFileSystem traceless(CacheUse::traceless);
+  return cacheUse == CacheUse::normal ? normal : traceless;
 }
 
 }  // namespace Orvane

@@ -4,24 +4,35 @@
 #include <algorithm>
 #include <cstring>
 #include <span>
+#include <string>
 #include <string_view>
+#include <utility>
+#include <vector>
 
 namespace Orvane {
 namespace {
 
 /// Whether a path with the first name precedes one with the second in its place. A folder's name
-/// goes on with "/", which a byte of a longer name may precede.
+/// goes on with "/", which a byte of a longer name may precede. Of two given folders the one around
+/// the other comes first.
 bool namePrecedes(const char* first, char afterFirst, const char* second, char afterSecond) {
   while (*first != '\0' && *first == *second) ++first, ++second;
   const auto byte = [](const char* at, char after) {
     return static_cast<unsigned char>(*at != '\0' ? *at : after);
   };
-  return byte(first, afterFirst) < byte(second, afterSecond);
+  const auto ofFirst = byte(first, afterFirst), ofSecond = byte(second, afterSecond);
+  return ofFirst < ofSecond || (ofFirst == ofSecond && *first == '\0' && *second != '\0');
 }
 
 bool folderPrecedes(const Folder* first, const Folder* second) {
   return namePrecedes(first->name, '/', second->name, '/');
 }
+
+/// The files below a given folder, sorted.
+struct Part {
+  const Folder* root;
+  std::vector<FileNumber> files;
+};
 
 /// The way down the tree. Invariant: what was put out precedes all that is left.
 class Descent final {
@@ -35,14 +46,14 @@ class Descent final {
     collectFolders();
   }
 
-  /// The files below each given folder, one after the other.
-  std::vector<std::vector<FileNumber>> run() {
-    std::vector<std::vector<FileNumber>> sorted;
+  /// A part for each given folder that has files, sorted by its path with a "/" at the end.
+  std::vector<Part> run() {
+    std::vector<Part> parts;
     for (const Folder* root : childrenOf(nullptr)) {
-      sorted.emplace_back();
-      descend(*root, sorted.back());
+      parts.push_back({root, {}});
+      descend(*root, parts.back().files);
     }
-    return sorted;
+    return parts;
   }
 
  private:
@@ -113,32 +124,41 @@ class Descent final {
   std::vector<const Folder*> folders_;
 };
 
-/// Whether the given folder of the second file lies in that of the first.
-bool liesIn(const FileTree& tree, FileNumber outer, FileNumber inner) {
-  const auto rootOf = [&](FileNumber file) {
-    const Folder* folder = &tree.folderOf(file);
-    while (folder->parent) folder = folder->parent;
-    return std::string_view(folder->name);
+/// Merges runs of files that stand one after the other; the last of the ends is that of all.
+void mergeRuns(const FileTree& tree, std::vector<FileNumber>& files, std::vector<std::size_t> ends,
+               std::size_t begin) {
+  const auto at = [&](std::size_t index) {
+    return files.begin() + static_cast<std::ptrdiff_t>(index);
   };
-  return rootOf(inner).starts_with(std::string(rootOf(outer)) + "/");
+  while (ends.size() > 1) {
+    std::vector<std::size_t> merged;
+    for (std::size_t i = 0; i < ends.size(); i += 2) {
+      const std::size_t first = merged.empty() ? begin : merged.back();
+      merged.push_back(ends[std::min(i + 1, ends.size() - 1)]);
+      std::inplace_merge(
+          at(first), at(ends[i]), at(merged.back()),
+          [&](FileNumber a, FileNumber b) { return tree.pathOf(a) < tree.pathOf(b); });
+    }
+    ends = std::move(merged);
+  }
 }
 
 }  // namespace
 
 void sortByPath(const FileTree& tree, std::vector<FileNumber>& files) {
-  std::vector<std::vector<FileNumber>> parts = Descent(tree, files).run();
-  std::erase_if(parts, [](const auto& part) { return part.empty(); });
+  const std::vector<Part> parts = Descent(tree, files).run();
   files.clear();
-  for (const std::vector<FileNumber>& part : parts) {
-    const auto middle = files.insert(files.end(), part.begin(), part.end());
-    // The files of a given folder stand amid those of another one around it.
-    const bool isNested = std::any_of(parts.begin(), parts.end(), [&](const auto& other) {
-      return liesIn(tree, other.front(), part.front()) || liesIn(tree, part.front(), other.front());
-    });
-    if (isNested)
-      std::inplace_merge(files.begin(), middle, files.end(), [&](FileNumber a, FileNumber b) {
-        return tree.pathOf(a) < tree.pathOf(b);
-      });
+  // The files of a given folder stand amid those of another one around it, which comes before.
+  for (auto part = parts.begin(); part != parts.end();) {
+    const std::string around = part->root->name + std::string("/");
+    const std::size_t begin = files.size();
+    std::vector<std::size_t> ends;
+    do {
+      files.insert(files.end(), part->files.begin(), part->files.end());
+      ends.push_back(files.size());
+      ++part;
+    } while (part != parts.end() && std::string_view(part->root->name).starts_with(around));
+    mergeRuns(tree, files, std::move(ends), begin);
   }
 }
 

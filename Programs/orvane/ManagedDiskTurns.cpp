@@ -3,7 +3,7 @@
 
 #include <algorithm>
 #include <climits>
-#include <optional>
+#include <system_error>
 #include <utility>
 
 #include <Varnel/DiskAccess/DiskReadingQueue.h>
@@ -14,6 +14,7 @@
 namespace Orvane {
 namespace {
 
+using Varnel::DiskReadingFile;
 using Varnel::DiskReadingNext;
 using Varnel::DiskReadingResult;
 using Varnel::DiskReadingTurn;
@@ -23,6 +24,11 @@ using Varnel::Platform::URL;
 /// folder above.
 std::string askablePath(const std::string& path) {
   return path.size() < PATH_MAX ? path : path.substr(0, path.rfind('/', PATH_MAX - 1));
+}
+
+bool isAmong(const std::vector<DiskReadingFile>& files, const DiskReadingFile& sought) {
+  return std::any_of(files.begin(), files.end(),
+                     [&](const auto& file) { return file.volumeURL == sought.volumeURL; });
 }
 
 class QueueTurn final : public DiskTurn {
@@ -42,9 +48,20 @@ class EndlessTurn final : public DiskTurn {
   void didRead(std::uint64_t) override {}
 };
 
-class QueueTask final : public Varnel::DiskReadingTask {
+}  // namespace
+
+/// A disk, and a file on each of its volumes that were seen. A task is submitted for one of them,
+/// and goes on under another when that volume is unmounted.
+struct ManagedDiskTurns::Disk : ScanDisk {
+  /// Of different volumes; one at least, or none ever. Guarded by the lock of the turns.
+  mutable std::vector<DiskReadingFile> files;
+};
+
+class ManagedDiskTurns::QueueTask final : public Varnel::DiskReadingTask {
  public:
-  explicit QueueTask(std::shared_ptr<DiskTask> task) : task_(std::move(task)) {}
+  QueueTask(ManagedDiskTurns& turns, const Disk& disk, std::shared_ptr<DiskTask> task,
+            DiskReadingFile file)
+      : turns_(turns), disk_(disk), task_(std::move(task)), file_(std::move(file)) {}
 
   DiskReadingNext run(DiskReadingTurn& turn) override {
     QueueTurn scanTurn(turn);
@@ -53,19 +70,17 @@ class QueueTask final : public Varnel::DiskReadingTask {
   }
 
   void didEnd(DiskReadingResult result) override {
-    if (result != DiskReadingResult::read) task_->refuse();
+    if (result == DiskReadingResult::vanished)
+      turns_.goOnWithout(file_, disk_, task_);
+    else if (result != DiskReadingResult::read)
+      task_->refuse();
   }
 
  private:
+  ManagedDiskTurns& turns_;
+  const Disk& disk_;
   const std::shared_ptr<DiskTask> task_;
-};
-
-}  // namespace
-
-/// A disk, and a file and a volume on it that stand for all.
-struct ManagedDiskTurns::Disk : ScanDisk {
-  URL url;
-  std::optional<URL> volumeURL;
+  const DiskReadingFile file_;
 };
 
 ManagedDiskTurns::ManagedDiskTurns(Ports ports, Varnel::Platform::QualityOfService qos,
@@ -79,10 +94,12 @@ ManagedDiskTurns::~ManagedDiskTurns() {
 const ScanDisk& ManagedDiskTurns::diskOf(const std::string& path) {
   std::string identifier;
   const URL url = URL::fileURLWithPath(askablePath(path));
-  auto disk = std::make_unique<Disk>(Disk{{}, url, std::nullopt});
+  auto disk = std::make_unique<Disk>();
   const auto volume = ports_.volumes.volumeURL(url);
   if (volume && *volume) {
-    disk->volumeURL = **volume;
+    // No security scope to open: the user named the folders, and an unreadable file shows when it
+    // is opened.
+    disk->files.push_back({.url = url, .volumeURL = **volume, .enableSecureScopedAccess = false});
     identifier = (*volume)->absoluteString();
     if (const auto info = ports_.queue.diskOfVolume(**volume)) {
       identifier = info->uniqueID().value_or(identifier);
@@ -94,25 +111,52 @@ const ScanDisk& ManagedDiskTurns::diskOf(const std::string& path) {
     disk->isReadable = false;
   }
   const std::lock_guard lock(mutex_);
-  return *disks_.try_emplace(std::move(identifier), std::move(disk)).first->second;
+  const auto [known, isNew] = disks_.try_emplace(std::move(identifier), std::move(disk));
+  if (!isNew) {
+    std::vector<DiskReadingFile>& files = known->second->files;
+    for (DiskReadingFile& file : disk->files)
+      if (!isAmong(files, file)) files.push_back(std::move(file));
+  }
+  return *known->second;
 }
 
 void ManagedDiskTurns::start(const ScanDisk& disk, std::shared_ptr<DiskTask> task) {
-  const Disk& known = static_cast<const Disk&>(disk);
-  if (known.isReadable) {
-    // No security scope to open: the user named the folders, and an unreadable file shows when it
-    // is opened.
-    return ports_.queue.submit(
-        std::make_shared<QueueTask>(std::move(task)),
-        {.url = known.url, .volumeURL = known.volumeURL, .enableSecureScopedAccess = false},
-        {.propose = "Search for duplicates", .qos = qos_});
+  std::unique_lock lock(mutex_);
+  if (disk.isReadable) {
+    const Disk& known = static_cast<const Disk&>(disk);
+    const DiskReadingFile file = known.files.front();
+    lock.unlock();
+    return submit(known, std::move(task), file);
   }
-  const std::lock_guard lock(mutex_);
   threads_.push_back(Varnel::Platform::startThread("scan", [task = std::move(task)] {
     EndlessTurn turn;
     while (task->run(turn)) {
     }
   }));
+}
+
+void ManagedDiskTurns::submit(const Disk& disk, std::shared_ptr<DiskTask> task,
+                              const DiskReadingFile& file) {
+  ports_.queue.submit(std::make_shared<QueueTask>(*this, disk, std::move(task), file), file,
+                      {.propose = "Search for duplicates", .qos = qos_});
+}
+
+// What the task reads may lie on any volume of the disk. What lay on the one that is gone shows
+// when it is opened.
+void ManagedDiskTurns::goOnWithout(const DiskReadingFile& vanished, const Disk& disk,
+                                   std::shared_ptr<DiskTask> task) {
+  std::unique_lock lock(mutex_);
+  std::vector<DiskReadingFile>& files = disk.files;
+  if (files.size() > 1)
+    std::erase_if(files, [&](const auto& file) { return file.volumeURL == vanished.volumeURL; });
+  const DiskReadingFile next = files.front();
+  lock.unlock();
+  if (next.volumeURL == vanished.volumeURL) return task->refuse();
+  try {
+    submit(disk, task, next);
+  } catch (const std::system_error&) {
+    task->refuse();
+  }
 }
 
 }  // namespace Orvane

@@ -14,7 +14,8 @@
 
 namespace Varnel {
 class DiskReadingQueue;
-}
+struct DiskReadingFile;
+}  // namespace Varnel
 namespace Varnel::Platform {
 class VolumeCatalog;
 }
@@ -39,6 +40,12 @@ class ManagedDiskTurns final : public DiskTurns {
 
  private:
   struct Disk;
+  class QueueTask;
+
+  void submit(const Disk& disk, std::shared_ptr<DiskTask> task,
+              const Varnel::DiskReadingFile& file);
+  void goOnWithout(const Varnel::DiskReadingFile& vanished, const Disk& disk,
+                   std::shared_ptr<DiskTask> task);
 
   const Ports ports_;
   const Varnel::Platform::QualityOfService qos_;

@@ -107,7 +107,11 @@ int ScanCommand::run(Console& console) const {
   ManagedDiskTurns turns(
       {.queue = Varnel::DiskReadingQueue::shared(), .volumes = ports.volumeCatalog}, qos,
       maxReaders());
-  DuplicateFinder finder({.fileSystem = systemFileSystem(), .turns = turns, .observer = log});
+  const CacheUse cacheUse = qos == Varnel::Platform::QualityOfService::background
+                                ? CacheUse::traceless
+                                : CacheUse::normal;
+  DuplicateFinder finder(
+      {.fileSystem = systemFileSystem(cacheUse), .turns = turns, .observer = log});
   ScanControl control;
   ScanResult result;
   {

@@ -98,6 +98,13 @@ TEST(TracelessReader, LeavesInTheCacheWhatWasThere) {
   }
 }
 
+TEST(TracelessReader, JustReadsWhereTheSystemDoesNotHelp) {
+  const CachedFile file(3);
+  for (const int refusal : {EOPNOTSUPP, ENOSYS, EPERM, EINVAL})
+    Tests::onAKernelThatForbids({SYS_preadv2, cachestat}, refusal,
+                                [&] { EXPECT_EQ(readAll(file), 3 * pageSize) << refusal; });
+}
+
 TEST(TracelessReader, TellsTheSystemsErrors) {
   std::vector<std::byte> buffer(pageSize);
   const auto failed = TracelessReader(-1).read(buffer, 0);

@@ -139,10 +139,12 @@ class FaultyFileSystem final : public FileSystem {
   std::map<std::string, std::errc> readFaults;
   std::map<std::string, std::uint64_t> places;  ///< Where given, of all files.
   std::function<void(const std::string& path)> beforeOpenFolder;
+  std::function<void(const std::string& path)> beforeList;
   std::function<void(const std::string& path)> beforeOpen;
   std::function<void(const std::string& path)> beforeRead;
   std::map<std::string, FileIdentity> identities;  ///< Of folders that are mounted again.
   int maxOpenFolders = 1000;
+  int maxFoldersBesideAFile = 1000;
   std::atomic<int> placesAsked{0};
   std::atomic<int> openFolders{0};
   std::atomic<int> faults{0};
@@ -195,6 +197,7 @@ class FaultyFileSystem final : public FileSystem {
     }
 
     FileResult<bool> list(const std::function<void(const FolderEntry&)>& visit) override {
+      if (owner_.beforeList) owner_.beforeList(path_);
       const auto fault = owner_.interruptions.find(path_);
       if (fault != owner_.interruptions.end() && std::exchange(isListed_, true))
         return std::make_error_code(fault->second);
@@ -206,6 +209,8 @@ class FaultyFileSystem final : public FileSystem {
       if (!FakeTurns::isInside()) ++owner_.faults;
       if (const auto fault = owner_.openFaults.find(path); fault != owner_.openFaults.end())
         return std::make_error_code(fault->second);
+      if (owner_.openFolders > owner_.maxFoldersBesideAFile)
+        return std::make_error_code(std::errc::too_many_files_open);
       if (owner_.beforeOpen) owner_.beforeOpen(path);
       auto opened = folder_->open(name, plan);
       if (!opened) return opened;

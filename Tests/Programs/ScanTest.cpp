@@ -3,6 +3,7 @@
 #include <dlfcn.h>
 #include <fcntl.h>
 #include <gmock/gmock.h>
+#include <sys/mman.h>
 #include <sys/stat.h>
 #include <sys/syscall.h>
 #include <unistd.h>
@@ -10,6 +11,7 @@
 #include <cerrno>
 #include <chrono>
 #include <climits>
+#include <csignal>
 #include <filesystem>
 #include <map>
 #include <random>
@@ -129,10 +131,12 @@ TEST_F(Scan, CountsEveryKindOfFileOnce) {
 
 TEST_F(Scan, WalksOverlappingFoldersOnce) {
   folder.write("one/a", "same");
-  folder.write("one/two/b", "same");
+  for (const char* name : {"one/two/b", "one/two/z/c", "one/two!/d", "one/zoo/e", "f", "x"})
+    folder.write(name, "same");
   const ScanResult once = scan();
   const ScanResult twice =
-      scan({folder.path("one/two"), folder.path(), folder.path("one"), folder.path()});
+      scan({folder.path("one/two"), folder.path(), folder.path("one"), folder.path("one/two!"),
+            folder.path("one/two/z"), folder.path("one/zoo"), folder.path()});
   EXPECT_EQ(paths(twice), paths(once));
   EXPECT_EQ(twice.totals, once.totals);
 }
@@ -186,6 +190,7 @@ TEST_F(Scan, LeavesOutFilesThatVanishOrChangeMeanwhile) {
   const std::string shrinks = folder.write("shrinks", bytes(10'000, 'a'));
   const std::string touched = folder.write("touched", bytes(10'000, 'a'));
   const std::string replaced = folder.write("replaced", bytes(10'000, 'a'));
+  const std::string foldered = folder.write("foldered", bytes(10'000, 'a'));
   const std::string piped = folder.write("piped", bytes(10'000, 'a'));
   const std::string unwritten = folder.write("unwritten", bytes(10'000, 'a'));
   const std::string swapped = folder.write("swapped", bytes(10'000, 'a'));
@@ -202,6 +207,10 @@ TEST_F(Scan, LeavesOutFilesThatVanishOrChangeMeanwhile) {
     if (path == replaced) {
       fs::remove(path);
       fs::create_symlink(first, path);
+    }
+    if (path == foldered) {
+      fs::remove(path);
+      fs::create_directory(path);
     }
     if (path == piped || path == unwritten) {
       fs::remove(path);
@@ -221,10 +230,59 @@ TEST_F(Scan, LeavesOutFilesThatVanishOrChangeMeanwhile) {
   const ScanResult result = scan();
   EXPECT_THAT(paths(result), ElementsAre(ElementsAre(first, second)));
   EXPECT_EQ(result.totals.vanishedFiles, 1u);
-  EXPECT_EQ(result.totals.changedFiles, 7u);
-  EXPECT_EQ(losses.files.size(), 8u);
+  EXPECT_EQ(result.totals.changedFiles, 8u);
+  EXPECT_EQ(losses.files.size(), 9u);
   EXPECT_EQ(::read(pipe, content.data(), content.size()), std::ssize(content));
   ::close(pipe);
+}
+
+std::atomic<int> leased{-1};
+
+TEST_F(Scan, WaitsForALeaseToBeGivenBack) {
+  const std::string first = folder.write("1", "same");
+  const std::string second = folder.write("2", "same");
+  leased = ::open(second.c_str(), O_RDWR | O_CLOEXEC);
+  struct sigaction giveBack {
+  }, before{};
+  giveBack.sa_handler = [](int) { ::fcntl(leased, F_SETLEASE, F_UNLCK); };
+  ::sigaction(SIGIO, &giveBack, &before);
+  const bool hasLeases = ::fcntl(leased, F_SETLEASE, F_WRLCK) == 0;
+  EXPECT_THAT(paths(scan()), ElementsAre(ElementsAre(first, second)));
+  ::sigaction(SIGIO, &before, nullptr);
+  ::close(leased);
+  if (!hasLeases) GTEST_SKIP() << "the file system of temporary files grants no leases";
+}
+
+/// How many pages of the file are in the system's cache.
+long cachedPages(const std::string& path) {
+  const int file = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
+  const std::size_t size = fs::file_size(path);
+  std::vector<unsigned char> pages((size + 4095) / 4096);
+  void* const mapped = ::mmap(nullptr, size, PROT_READ, MAP_SHARED, file, 0);
+  EXPECT_EQ(::mincore(mapped, size, pages.data()), 0);
+  ::munmap(mapped, size);
+  ::close(file);
+  return std::count_if(pages.begin(), pages.end(), [](auto page) { return page & 1; });
+}
+
+TEST_F(Scan, LeavesThePageCacheAloneWhereItShould) {
+  const std::vector<std::string> files = {folder.write("1", bytes(1'000'000, 'a')),
+                                          folder.write("2", bytes(1'000'000, 'a'))};
+  for (const std::string& path : files) {
+    const int file = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
+    ::fsync(file);
+    ::posix_fadvise(file, 0, 0, POSIX_FADV_DONTNEED);
+    ::close(file);
+    if (cachedPages(path) > 0) GTEST_SKIP() << "their file system is a cache itself";
+  }
+  const auto scanAs = [&](CacheUse use) {
+    const ScanResult result =
+        DuplicateFinder({systemFileSystem(use), turns, losses}).find({folder.path()}, control);
+    EXPECT_THAT(paths(result), ElementsAre(files));
+    return cachedPages(files[0]) + cachedPages(files[1]);
+  };
+  EXPECT_EQ(scanAs(CacheUse::traceless), 0);
+  EXPECT_EQ(scanAs(CacheUse::normal), 2 * 245);
 }
 
 /// Runs the work with every means of the system and without the call that opens a path of many
@@ -323,6 +381,15 @@ TEST_F(Scan, StopsWhenAskedTo) {
   }
 }
 
+TEST_F(Scan, StopsWithinAFolderWhenAskedTo) {
+  for (int i = 0; i < 1000; ++i) folder.write(std::to_string(i), "same");
+  int times = 0;
+  fileSystem.beforeList = [&](const std::string&) { control.isCancelled = ++times == 2; };
+  (void)scan();
+  EXPECT_LE(control.filesFound, 64u);
+  EXPECT_EQ(control.filesToRead, 0u) << "nobody asks for them any more";
+}
+
 TEST_F(Scan, StopsWithinAFileWhenAskedTo) {
   for (int i = 0; i < 3; ++i) fs::resize_file(folder.write(std::to_string(i), ""), 1'000'000'000);
   std::atomic<int> blocks{0};
@@ -417,11 +484,14 @@ TEST_F(Scan, TellsLargeFilesApartByTheirMiddleOrEnd) {
 }
 
 TEST_F(Scan, DoesWithFewDescriptors) {
-  fileSystem.maxOpenFolders = 1;
   turns.disk.places = 1;
   const std::string first = folder.write("a/b/c/1", "same");
   const std::string second = folder.write("a/d/2", "same");
-  EXPECT_THAT(paths(scan()), ElementsAre(ElementsAre(first, second)));
+  for (int* const max : {&fileSystem.maxOpenFolders, &fileSystem.maxFoldersBesideAFile}) {
+    const int many = std::exchange(*max, 1);
+    EXPECT_THAT(paths(scan()), ElementsAre(ElementsAre(first, second)));
+    *max = many;
+  }
 }
 
 /// What the scan must find, by reading everything and looking at nothing else.

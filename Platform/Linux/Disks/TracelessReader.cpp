@@ -31,6 +31,11 @@ std::error_code lastError() {
   return {errno, std::generic_category()};
 }
 
+/// Older kernels and file systems lack the call or its flag, some sandboxes forbid it.
+bool saysThatItIsNotToBeHad(int error) {
+  return error == EOPNOTSUPP || error == ENOSYS || error == EPERM || error == EINVAL;
+}
+
 template <typename Call>
 ssize_t uninterrupted(Call call) {
   ssize_t count = 0;
@@ -59,7 +64,7 @@ Result<std::size_t, std::error_code> TracelessReader::read(std::span<std::byte> 
       giver_ = Giver::system;
       return static_cast<std::size_t>(count);
     }
-    if (giver_ == Giver::system || errno != EOPNOTSUPP) return lastError();
+    if (giver_ == Giver::system || !saysThatItIsNotToBeHad(errno)) return lastError();
     giver_ = Giver::self;
     noteAbsentRanges();
   }
