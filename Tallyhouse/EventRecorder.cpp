@@ -112,7 +112,7 @@ EventRecorder::EventRecorder(Ports ports, std::string path, SpoolLimits limits)
 
 EventRecorder::~EventRecorder() {
   settle(file_, Haste::none);
-  if (lastID_ != 0) static_cast<void>(isInPlace());
+  if (lastID_ != origin_) static_cast<void>(isInPlace());
   if (!held_.empty())
     ports_.systemLog.write(fmt::format("{} events are lost: {}", held_.size(), path_));
 }
