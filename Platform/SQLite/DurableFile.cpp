@@ -156,8 +156,10 @@ bool DurableFile::isFromBeforeFork() const {
   return connection_ && connection_->forksBefore != forksSoFar();
 }
 
+// Without a log, what is written into a file that was emptied cannot be carried over.
 bool DurableFile::isTimeToLook() const {
-  return std::chrono::steady_clock::now() - connection_->lookedAt >= maxUnlooked;
+  return !connection_->log ||
+         std::chrono::steady_clock::now() - connection_->lookedAt >= maxUnlooked;
 }
 
 // Whether the path no longer leads to what the connection writes. Only the path can tell: when a
