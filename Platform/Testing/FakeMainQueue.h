@@ -22,10 +22,9 @@ namespace Varnel::Platform::Testing {
 class FakeMainQueue final : public MainQueue {
  public:
   void post(Block block) override {
-    {
-      const std::lock_guard lock(mutex_);
-      blocks_.push_back(std::move(block));
-    }
+    // Told within the lock: a test that has seen the block run may destroy the queue at once.
+    const std::lock_guard lock(mutex_);
+    blocks_.push_back(std::move(block));
     posted_.notify_one();
   }
 
