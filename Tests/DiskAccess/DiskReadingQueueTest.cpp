@@ -119,9 +119,9 @@ TEST_F(DiskReadingQueueTest, NobodyWaitsForTheLastTurnOfAnother) {
                         {stickVolume, 50, 10},
                         {homeVolume, std::nullopt, std::nullopt}};
   manager_->setIsBackgroundMode(true);
-  for (const auto& [volume, place, placeOfOther] : cases) {
+  for (const Case& one : cases) {
     const auto at = [&](std::optional<std::uint64_t> where) {
-      return DiskReadingFile{.url = volume, .volumeURL = volume, .place = where};
+      return DiskReadingFile{.url = one.volume, .volumeURL = one.volume, .place = where};
     };
     std::latch isIn(1);
     std::latch mayGo(1);
@@ -130,24 +130,24 @@ TEST_F(DiskReadingQueueTest, NobodyWaitsForTheLastTurnOfAnother) {
     const auto longOne = [&](Turn&) {
       isIn.count_down(isIn.try_wait() ? 0 : 1);
       mayGo.wait();
-      return hasOtherRun || ++turns == 1000 ? Next::done() : Next::again(place);
+      return hasOtherRun || ++turns == 1000 ? Next::done() : Next::again(one.place);
     };
-    const Task one = submit(at(place), longOne);
+    const Task first = submit(at(one.place), longOne);
     isIn.wait();
-    const Task two = submit(at(place), longOne);
-    const Task other = submit(at(placeOfOther), [&](Turn&) {
+    const Task second = submit(at(one.place), longOne);
+    const Task other = submit(at(one.placeOfOther), [&](Turn&) {
       hasOtherRun = true;
       return Next::done();
     });
-    const bool isHome = volume == homeVolume;
+    const bool isHome = one.volume == homeVolume;
     EXPECT_EQ(submit({.url = isHome ? stickFile : homeFile,
                       .volumeURL = isHome ? stickVolume : homeVolume},
                      [](Turn&) { return Next::done(); })
                   ->result(),
               Result::read);
     mayGo.count_down();
-    for (const Task& task : {one, two, other}) EXPECT_EQ(task->result(), Result::read);
-    EXPECT_LE(turns, 4) << volume.path();
+    for (const Task& task : {first, second, other}) EXPECT_EQ(task->result(), Result::read);
+    EXPECT_LE(turns, 4) << one.volume.path();
   }
 }
 
