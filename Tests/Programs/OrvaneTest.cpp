@@ -37,10 +37,10 @@ class Orvane : public ::testing::Test {
   Outcome run(const std::vector<std::string>& arguments,
               const std::string& redirection = ">\"$HOME/output\"") {
     std::vector<std::string> words = {"/usr/bin/env", "-i", "HOME=" + home.path()};
-    words.insert(words.end(), moreEnvironment.begin(), moreEnvironment.end());
     // A sanitizer keeps to the settings of the test in the program too.
     for (const char* name : {"TSAN_OPTIONS", "ASAN_OPTIONS", "LSAN_OPTIONS"})
       if (const char* value = std::getenv(name)) words.push_back(std::string(name) + "=" + value);
+    words.insert(words.end(), moreEnvironment.begin(), moreEnvironment.end());
     words.insert(
         words.end(),
         {"/bin/sh", "-c", "exec \"$0\" \"$@\" 2>\"$HOME/errors\" " + redirection, ORVANE_PROGRAM});

@@ -347,6 +347,8 @@ TEST_F(AwayTest, WhatIsTakenAwayIsGivenBackByTheProcessesThatLive) {
   };
   for (const auto& c : cases) {
     SCOPED_TRACE(c.what);
+    // What is left of the case before, and was given back at its recorder's end.
+    fs::remove_all(fs::path(path()).parent_path());
     const auto recorder = openRecorder();
     const auto spool = openSpool();
     append(*recorder, {"a", "b"});
@@ -358,7 +360,6 @@ TEST_F(AwayTest, WhatIsTakenAwayIsGivenBackByTheProcessesThatLive) {
     append(*recorder, {"d"});
     EXPECT_EQ(namesOf(*spool), c.left);
     EXPECT_EQ(names(), c.left);
-    fs::remove_all(fs::path(path()).parent_path());
   }
 }
 
