@@ -8,6 +8,19 @@
 #include <Varnel/Platform/Concurrency/StartThread.h>
 
 namespace Varnel {
+namespace {
+
+// Runs the first block without the lock, and lets go of what it owns before it is taken again.
+void runFirst(std::deque<Basalt::Block>& waiting, std::unique_lock<std::mutex>& lock) {
+  Basalt::Block block = std::move(waiting.front());
+  waiting.pop_front();
+  lock.unlock();
+  block();
+  block = {};
+  lock.lock();
+}
+
+}  // namespace
 
 void DiskReadingWorkers::run(Basalt::Block block) {
   const std::lock_guard lock(mutex_);
@@ -35,12 +48,7 @@ void DiskReadingWorkers::work() {
         arrived_.wait_for(lock, maxIdleTime, [this] { return !waiting_.empty(); });
     --idle_;
     if (!isNeeded) break;
-    Basalt::Block block = std::move(waiting_.front());
-    waiting_.pop_front();
-    lock.unlock();
-    block();
-    block = {};
-    lock.lock();
+    runFirst(waiting_, lock);
   }
   --threads_;
 }
@@ -61,12 +69,7 @@ void DiskReadingJobs::add(Basalt::Block block) {
 void DiskReadingJobs::work() {
   std::unique_lock lock(mutex_);
   while (!waiting_.empty()) {
-    Basalt::Block block = std::move(waiting_.front());
-    waiting_.pop_front();
-    lock.unlock();
-    block();
-    block = {};
-    lock.lock();
+    runFirst(waiting_, lock);
   }
   --running_;
 }
