@@ -16,6 +16,7 @@ class UserDefaults;
 class VARNEL_API ApplicationStorage {
  public:
   virtual ~ApplicationStorage() = default;
+  ApplicationStorage& operator=(const ApplicationStorage&) = delete;
 
   /// The settings of an application: the same object for the same identifier, as long-lived as
   /// this one.

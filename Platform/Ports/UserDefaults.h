@@ -23,6 +23,7 @@ class VARNEL_API UserDefaults {
   using Value = std::variant<bool, std::int64_t, double, std::string>;
 
   virtual ~UserDefaults() = default;
+  UserDefaults& operator=(const UserDefaults&) = delete;
 
   /// The value under a key; absent when there is none, or when it cannot be read as this type.
   [[nodiscard]] virtual std::optional<bool> truthValue(const std::string& key) const = 0;

@@ -44,6 +44,7 @@ class VARNEL_API VolumeCatalog {
   };
 
   virtual ~VolumeCatalog() = default;
+  VolumeCatalog& operator=(const VolumeCatalog&) = delete;
 
   /// All mounted volumes in the system's order, without the kernel's own pseudo file systems.
   [[nodiscard]] virtual std::vector<MountedVolume> mountedVolumes() = 0;

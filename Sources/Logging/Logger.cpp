@@ -31,7 +31,8 @@ constexpr std::string_view fileNameDatePattern = "YYYY-MM-dd";
 // Never destroyed, like the process's logger.
 const Platform::DateFormatter& makeDateFormatter(std::string_view pattern) {
   const Platform::Ports& ports = Platform::processPorts();
-  return *new Platform::DateFormatter(pattern, ports.userLocale.identifier(), ports.timeZones);
+  return *new Platform::DateFormatter(pattern, ports.userLocale.get().identifier(),
+                                      ports.timeZones);
 }
 
 bool isFolder(const Platform::URL& url) {

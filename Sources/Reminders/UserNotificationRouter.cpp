@@ -84,7 +84,7 @@ UserNotificationRouter::~UserNotificationRouter() = default;
 
 UserNotificationCenter& UserNotificationRouter::defaultUserNotificationCenter() {
   const BuildSwitches& product = BuildSwitches::ofThisProduct();
-  return Platform::processPorts().userNotificationCenters.center(
+  return Platform::processPorts().userNotificationCenters.get().center(
       {.identifier = Globals::baseIdentifier(),
        .name = Globals::applicationName(),
        .desktopEntry = product.desktopEntry,
