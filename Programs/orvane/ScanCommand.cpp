@@ -107,9 +107,9 @@ int ScanCommand::run(Console& console) const {
   ManagedDiskTurns turns(
       {.queue = Varnel::DiskReadingQueue::shared(), .volumes = ports.volumeCatalog}, qos,
       maxReaders());
-  const CacheUse cacheUse = qos == Varnel::Platform::QualityOfService::background
-                                ? CacheUse::traceless
-                                : CacheUse::normal;
+  using QoS = Varnel::Platform::QualityOfService;
+  const CacheUse cacheUse =
+      qos == QoS::background || qos == QoS::utility ? CacheUse::traceless : CacheUse::normal;
   DuplicateFinder finder(
       {.fileSystem = systemFileSystem(cacheUse), .turns = turns, .observer = log});
   ScanControl control;
