@@ -4,9 +4,9 @@
 #include <algorithm>
 
 #include <Varnel/Basalt/Digest.h>
-#include <Varnel/Platform/Text/UTF8.h>
 #include <Varnel/Platform/Values/URL.h>
 #include <Varnel/Platform/Values/URLQuery.h>
+#include <Varnel/Platform/Values/UTF8.h>
 
 namespace Varnel {
 namespace {

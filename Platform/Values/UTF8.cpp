@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Varnel/Platform/Text/UTF8.h>
+#include <Varnel/Platform/Values/UTF8.h>
 
 #include <cstdint>
 #include <cstring>
