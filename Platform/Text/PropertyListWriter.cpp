@@ -7,7 +7,7 @@
 #include <limits>
 
 #include <Varnel/Platform/Text/NeutralLocale.h>
-#include <Varnel/Platform/Text/UTF8.h>
+#include <Varnel/Platform/Values/UTF8.h>
 #include <Varnel/Platform/Values/UniqueHandle.h>
 
 namespace Varnel::Platform {
