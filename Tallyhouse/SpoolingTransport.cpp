@@ -61,7 +61,11 @@ std::unique_ptr<SpoolingTransport> SpoolingTransport::make(Ports ports,
 }
 
 std::unique_ptr<SpoolingTransport> SpoolingTransport::make(Configuration configuration) {
-  const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
+  return make(Varnel::Platform::processPorts(), std::move(configuration));
+}
+
+std::unique_ptr<SpoolingTransport> SpoolingTransport::make(const Varnel::Platform::Ports& ports,
+                                                           Configuration configuration) {
   return make({ports.clock, ports.httpClient, ports.privateFiles, ports.systemLog},
               std::move(configuration));
 }

@@ -17,6 +17,7 @@ class Clock;
 class HTTPClient;
 class PrivateFiles;
 class SystemLog;
+struct Ports;
 }  // namespace Varnel::Platform
 
 namespace Tallyhouse {
@@ -61,6 +62,8 @@ class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
 
   /// None when the endpoint is no https URL (or http, where that is allowed).
   [[nodiscard]] static std::unique_ptr<SpoolingTransport> make(Ports ports,
+                                                               Configuration configuration);
+  [[nodiscard]] static std::unique_ptr<SpoolingTransport> make(const Varnel::Platform::Ports& ports,
                                                                Configuration configuration);
   [[nodiscard]] static std::unique_ptr<SpoolingTransport> make(Configuration configuration);
   ~SpoolingTransport() override;

@@ -50,15 +50,8 @@ LoggingContextTags locationTags(const std::optional<Platform::URL>& location) {
 
 Logger& Logger::instance() {
   static Logger& shared = []() -> Logger& {
-    const Platform::Ports& ports = Platform::processPorts();
     // Never destroyed: threads and destructors may log until the very end.
-    static Logger& logger = *new Logger({.appendFiles = ports.appendFiles,
-                                         .clock = ports.clock,
-                                         .standardOutput = ports.standardOutput,
-                                         .timeZones = ports.timeZones,
-                                         .userAccount = ports.userAccount,
-                                         .userLocale = ports.userLocale},
-                                        Globals::baseIdentifier());
+    static Logger& logger = *new Logger(Platform::processPorts(), Globals::baseIdentifier());
     const auto endGathering = [] {
       if (logger.fileChannel_) logger.fileChannel_->writeThrough();
     };
@@ -69,6 +62,15 @@ Logger& Logger::instance() {
   }();
   return shared;
 }
+
+Logger::Logger(const Platform::Ports& ports, std::string_view baseIdentifier)
+    : Logger({.appendFiles = ports.appendFiles,
+              .clock = ports.clock,
+              .standardOutput = ports.standardOutput,
+              .timeZones = ports.timeZones,
+              .userAccount = ports.userAccount,
+              .userLocale = ports.userLocale},
+             baseIdentifier) {}
 
 Logger::Logger(Ports ports, std::string_view baseIdentifier)
     : ports_(ports),

@@ -56,5 +56,9 @@ TEST(Products, AHostPutsItsOwnServiceInThePlaceOfOne) {
                                           "one replaced"));
 }
 
+TEST(Products, AHostsTestRunsOnFakesAndTheFrameworksTexts) {
+  EXPECT_EQ(linesOf("HostTestWithFakes"), Lines{"done"});
+}
+
 }  // namespace
 }  // namespace Varnel::Tests
