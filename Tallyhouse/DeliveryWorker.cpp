@@ -63,7 +63,7 @@ void DeliveryWorker::start() {
 
 void DeliveryWorker::wake() {
   const std::lock_guard lock(mutex_);
-  if (recorder_.mustEmpty()) start();
+  if (!thread_.joinable() && recorder_.mustEmpty()) start();
   isWoken_ = true;
   changed_.notify_all();
 }
@@ -96,9 +96,8 @@ std::optional<Date> DeliveryWorker::work(std::unique_lock<std::mutex>& lock) {
   const std::int64_t drainsAsked = drainsAsked_;
   const bool isPaused = isPaused_;
   lock.unlock();
-  const auto unsettled =
-      recorder_.settle(spool_.file(), haste == Haste::none ? EventRecorder::Haste::none
-                                                           : EventRecorder::Haste::usual);
+  const auto unsettled = recorder_.settle(haste == Haste::none ? EventRecorder::Haste::none
+                                                               : EventRecorder::Haste::usual);
   const Delivery::Step step = deliver(haste, isPaused, transfer);
   const bool areOwnDelivered = this->areOwnDelivered();
   lock.lock();

@@ -10,6 +10,7 @@
 
 #include <Varnel/Platform/SQLite/DurableFile.h>
 #include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Tallyhouse/SpoolCounts.h>
 #include <Varnel/Tallyhouse/SpoolFormat.h>
 
 namespace Varnel::Platform {
@@ -43,15 +44,15 @@ struct OwnEvents final {
   bool hasLost = false;  ///< Some had to be given up.
 };
 
-/// Writes the events of this process into the spool. What it has taken survives the end of the
+/// Writes the events of this process into the spool. What it has written survives the end of the
 /// process, but not always a loss of power.
 ///
 /// While the file cannot be had, be it locked, full, read-only or refused, events are held in
-/// memory, and `settle` writes them as soon as that works. What memory cannot hold is given up, the
-/// oldest first, and counted.
+/// memory, and `append` and `settle` write them as soon as that works. What memory cannot hold is
+/// given up, the oldest first, and counted.
 ///
-/// Any thread. Nothing throws but for want of memory. No operation waits more than 20 ms for
-/// somebody else's lock, and none for `settle`, which works on the file of its caller.
+/// Any thread. Nothing throws but for want of memory. No operation waits more than 20 ms for the
+/// locks of other processes.
 class EventRecorder final {
  public:
   struct Ports {
@@ -60,7 +61,7 @@ class EventRecorder final {
     Varnel::Platform::SystemLog& systemLog;
   };
 
-  EventRecorder(Ports ports, std::string path, SpoolLimits limits);
+  EventRecorder(Ports ports, const std::string& path, SpoolLimits limits);
   /// Tries for the last time to write what is held, and what lies in a spool that was taken away,
   /// and tells the system's log what is lost.
   ~EventRecorder();
@@ -86,9 +87,8 @@ class EventRecorder final {
     usual,  ///< Not before the pause after the last failure is over.
     none
   };
-  /// Does in `file`, a connection of the caller's, what could not be done yet. Returns when to call
-  /// again; absent when all is done.
-  std::optional<Varnel::Platform::Date> settle(Varnel::Platform::DurableFile& file, Haste haste);
+  /// Does what could not be done yet. Returns when to call again; absent when all is done.
+  std::optional<Varnel::Platform::Date> settle(Haste haste);
 
   /// Whether nothing is to be sent because the spool is not empty yet, though it should be.
   [[nodiscard]] bool mustEmpty() const;
@@ -104,36 +104,30 @@ class EventRecorder final {
   /// They were delivered.
   void forget(const OwnEvents& delivered);
 
-  /// Events pushed out by the limits, too large, or given up, since the file was begun.
-  [[nodiscard]] std::int64_t droppedCount();
+  /// Events wait that were refused less than `maxRefusals` times.
+  [[nodiscard]] SpoolCounts counts(int maxRefusals);
 
  private:
-  struct Work;
-
-  [[nodiscard]] SpooledEvent named(std::string_view uuid, Varnel::Platform::Date date,
-                                   std::string_view hit);
-  [[nodiscard]] bool mayInsert() const;
+  // All with the lock held:
+  void hold(std::string_view uuid, Varnel::Platform::Date date, std::string_view hit);
   [[nodiscard]] bool insert(const SpooledEvent& event);
-  std::int64_t hold(SpooledEvent event);
-  [[nodiscard]] bool hasWork() const { return refusal_ || !held_.empty() || dropped_ > 0; }
-  void finish(const Work& work);
+  void giveUp(std::size_t maxEvents, std::size_t maxBytes);
+  std::optional<Varnel::Platform::Date> doAll(Haste haste);
 
   const Ports ports_;
   const std::string path_;
   const SpoolLimits limits_;
   const std::int64_t origin_;  ///< The last bits of its events' numbers.
 
-  std::mutex fileMutex_;  ///< Owns the file. Taken before the other mutex.
+  mutable std::mutex mutex_;  ///< Owns all below, also while it is at the file: so what one thread
+                              ///< holds cannot stay in memory for what another one does there.
   Varnel::Platform::DurableFile file_;
-
-  mutable std::mutex mutex_;  ///< Owns all below. Nobody keeps it while at a file.
   std::deque<SpooledEvent> held_;
   std::size_t heldBytes_ = 0;
   std::int64_t dropped_ = 0;  ///< Not yet counted in the file.
   std::optional<Varnel::Platform::Date>
       refusal_;             ///< Of the user, here, for which the file is not emptied.
   bool isRevoked_ = false;  ///< Another process has refused since `begin`.
-  bool isSettling_ = false;
   Varnel::Platform::GrowingPause pause_ = spoolPause;
   SpoolRoom room_;
   std::int64_t waiting_ = 0;
