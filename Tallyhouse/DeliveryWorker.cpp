@@ -11,7 +11,6 @@
 
 namespace Tallyhouse {
 
-using Varnel::Platform::Date;
 using Haste = Delivery::Haste;
 using State = Delivery::State;
 
@@ -99,7 +98,7 @@ std::optional<Date> DeliveryWorker::work(std::unique_lock<std::mutex>& lock) {
   const auto unsettled = recorder_.settle(haste == Haste::none ? EventRecorder::Haste::none
                                                                : EventRecorder::Haste::usual);
   const Delivery::Step step = deliver(haste, isPaused, transfer);
-  const bool areOwnDelivered = this->areOwnDelivered();
+  const bool areOwnDelivered = recorder_.isAllDelivered();
   lock.lock();
   drainsSeen_ = drainsAsked;
   // Otherwise there is more to be had without the server: from this process, from the one that
@@ -121,14 +120,6 @@ Delivery::Step DeliveryWorker::deliver(Haste haste, bool isPaused, std::stop_tok
   const Delivery::Step step = delivery_.step(haste, transfer);
   recorder_.seen(step.waiting);
   return step;
-}
-
-bool DeliveryWorker::areOwnDelivered() {
-  const OwnEvents own = recorder_.own();
-  if (own.first != 0 && !recorder_.isInPlace()) return false;
-  if (!spool_.isDelivered(own)) return false;
-  recorder_.forget(own);
-  return true;
 }
 
 void DeliveryWorker::waitForNext(std::unique_lock<std::mutex>& lock, std::optional<Date> next) {

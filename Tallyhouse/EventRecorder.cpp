@@ -12,26 +12,21 @@
 
 namespace Tallyhouse {
 
-using Varnel::Platform::Date;
-using Varnel::Platform::DurableFile;
-using Varnel::Platform::SQLiteDatabase;
-using Error = std::optional<Varnel::Platform::PlatformError>;
-
 namespace {
 
-Error readEpoch(SQLiteDatabase& database, Date& epoch) {
+Failure readEpoch(SQLiteDatabase& database, Date& epoch) {
   epoch = {};
   return database.row("SELECT epoch FROM state", std::tie(epoch));
 }
 
 // What is forgotten must not be found in the free parts of the file.
-Error empty(SQLiteDatabase& database, Date epoch) {
+Failure empty(SQLiteDatabase& database, Date epoch) {
   if (auto error = database.execute("PRAGMA secure_delete = ON; DELETE FROM event")) return error;
   return database.run(
       "INSERT INTO state(id, epoch) VALUES(1, ?1) ON CONFLICT(id) DO UPDATE SET epoch = ?1", epoch);
 }
 
-Error addDropped(SQLiteDatabase& database, std::int64_t count, std::int64_t lastID) {
+Failure addDropped(SQLiteDatabase& database, std::int64_t count, std::int64_t lastID) {
   return database.run(
       "INSERT INTO state(id, dropped, lost_through) VALUES(1, ?1, ?2) ON CONFLICT(id)"
       " DO UPDATE SET dropped = dropped + ?1, lost_through = max(lost_through, ?2)",
@@ -40,7 +35,7 @@ Error addDropped(SQLiteDatabase& database, std::int64_t count, std::int64_t last
 
 // The event may be there already: a change is made again when the file was replaced meanwhile. Or
 // another process's event has the number.
-Error insertOnce(SQLiteDatabase& database, SpooledEvent& event) {
+Failure insertOnce(SQLiteDatabase& database, SpooledEvent& event) {
   for (;; event.id += idStep) {
     auto error = database.run("INSERT OR IGNORE INTO event(id, date, uuid, hit) VALUES(?, ?, ?, ?)",
                               event.id, event.date, event.uuid, event.hit);
@@ -54,16 +49,14 @@ Error insertOnce(SQLiteDatabase& database, SpooledEvent& event) {
 
 // Other processes write as well, so nobody takes more than an eighth of what is free. A full spool
 // loses a hundredth at a time, so that most events find room without a count.
-Error trim(SQLiteDatabase& database, const SpoolLimits& limits, SpoolRoom& room) {
+Failure trim(SQLiteDatabase& database, const SpoolLimits& limits, SpoolRoom& room) {
   for (;;) {
     std::int64_t events = 0;
     std::int64_t bytes = 0;
-    auto error = database.row("SELECT count(*) FROM event", std::tie(events));
-    if (!error)
-      error = database.row(
-          "SELECT (page_count - freelist_count) * page_size FROM"
-          " pragma_page_count, pragma_freelist_count, pragma_page_size",
-          std::tie(bytes));
+    auto error = database.row(
+        "SELECT (SELECT count(*) FROM event), (page_count - freelist_count) * page_size"
+        " FROM pragma_page_count, pragma_freelist_count, pragma_page_size",
+        std::tie(events, bytes));
     if (error) return error;
     if (events == 0 || (events <= limits.maxEvents && bytes <= limits.maxBytes)) {
       room = {.events = std::max((limits.maxEvents - events) / 8, limits.maxEvents / 100 + 1),
@@ -91,7 +84,7 @@ EventRecorder::EventRecorder(Ports ports, const std::string& path, SpoolLimits l
 
 EventRecorder::~EventRecorder() {
   settle(Haste::none);
-  if (lastID_ != origin_) static_cast<void>(isInPlace());
+  if (firstID_ != 0) static_cast<void>(isAllDelivered());
   if (!held_.empty())
     ports_.systemLog.write(fmt::format("{} events are lost: {}", held_.size(), path_));
 }
@@ -99,27 +92,30 @@ EventRecorder::~EventRecorder() {
 void EventRecorder::begin() {
   const std::lock_guard lock(mutex_);
   const auto error =
-      file_.read([&](SQLiteDatabase& database) { return readEpoch(database, own_.epoch); });
-  if (error) own_.epoch = ports_.clock.now();
+      file_.read([&](SQLiteDatabase& database) { return readEpoch(database, epoch_); });
+  if (error) epoch_ = ports_.clock.now();
   isRevoked_ = false;
 }
 
 std::int64_t EventRecorder::append(std::string_view uuid, Date date, std::string_view hit) {
   const std::lock_guard lock(mutex_);
   if (isRevoked_) {
-    own_.hasLost = true;
+    hasLost_ = true;
     return 0;
   }
   const bool isAlone = held_.empty() && !refusal_;
   hold(uuid, date, hit);
   if (isAlone && room_.events > 0 && room_.bytes > 0 && insert(held_.back())) {
     held_.clear();
-    heldBytes_ = 0;
     --room_.events;
     room_.bytes -= static_cast<std::int64_t>(hit.size());
     return ++waiting_;
   }
-  giveUp(limits_.maxHeldEvents, limits_.maxHeldBytes);
+  if (held_.size() > limits_.maxHeldEvents) {
+    held_.pop_front();
+    ++dropped_;
+    hasLost_ = true;
+  }
   doAll(Haste::usual);
   return held_.empty() ? waiting_ : static_cast<std::int64_t>(held_.size());
 }
@@ -134,10 +130,9 @@ void EventRecorder::hold(std::string_view uuid, Date date, std::string_view hit)
                    .date = date,
                    .hit = std::string(hit),
                    .refusals = 0,
-                   .epoch = own_.epoch});
-  heldBytes_ += hit.size();
-  own_.last = lastID_ = held_.back().id;
-  if (own_.first == 0) own_.first = lastID_;
+                   .epoch = epoch_});
+  lastID_ = held_.back().id;
+  if (firstID_ == 0) firstID_ = lastID_;
 }
 
 // The usual way, for little more than the row itself. Whatever is unusual is left to `doAll`.
@@ -157,25 +152,18 @@ bool EventRecorder::insert(const SpooledEvent& event) {
   return isInserted;
 }
 
-void EventRecorder::giveUp(std::size_t maxEvents, std::size_t maxBytes) {
-  for (; held_.size() > maxEvents || heldBytes_ > maxBytes; held_.pop_front()) {
-    heldBytes_ -= held_.front().hit.size();
-    ++dropped_;
-    own_.hasLost = true;
-  }
-}
-
 void EventRecorder::countDropped() {
   const std::lock_guard lock(mutex_);
   ++dropped_;
-  own_.hasLost = true;
+  hasLost_ = true;
 }
 
 void EventRecorder::discard() {
   const std::lock_guard lock(mutex_);
   held_.clear();
-  heldBytes_ = 0;
-  own_ = {};
+  firstID_ = 0;
+  hasLost_ = false;
+  epoch_ = {};
   refusal_ = file_.isThere() ? std::optional(ports_.clock.now()) : std::nullopt;
   doAll(Haste::none);
   file_.removeSetAside();
@@ -205,18 +193,17 @@ std::optional<Date> EventRecorder::doAll(Haste haste) {
   }
   pause_.succeeded();
   if (refusal_) {
-    own_.epoch = epoch;
+    epoch_ = epoch;
     refusal_.reset();
     // What is forgotten must not be found in the log either.
     static_cast<void>(file_.changeByOneStatement([](SQLiteDatabase& database) {
       return database.execute("PRAGMA wal_checkpoint(TRUNCATE)");
     }));
   }
-  isRevoked_ = epoch > own_.epoch;
-  if (!held_.empty()) own_.last = lastID_ = held_.back().id;
+  isRevoked_ = epoch > epoch_;
+  if (!held_.empty()) lastID_ = held_.back().id;
   waiting_ += static_cast<std::int64_t>(held_.size());
   held_.clear();
-  heldBytes_ = 0;
   dropped_ = 0;
   return std::nullopt;
 }
@@ -237,21 +224,21 @@ void EventRecorder::seen(std::int64_t waiting) {
   waiting_ += waiting;
 }
 
-OwnEvents EventRecorder::own() const {
+bool EventRecorder::isAllDelivered() {
   const std::lock_guard lock(mutex_);
-  OwnEvents own = own_;
-  own.isHeld = !held_.empty();
-  return own;
-}
-
-bool EventRecorder::isInPlace() {
-  const std::lock_guard lock(mutex_);
-  return !file_.read([](SQLiteDatabase&) { return Error(); });
-}
-
-void EventRecorder::forget(const OwnEvents& delivered) {
-  const std::lock_guard lock(mutex_);
-  own_.first = own_.last == delivered.last ? 0 : delivered.last + idStep;
+  if (hasLost_ || !held_.empty()) return false;
+  if (firstID_ == 0) return true;
+  bool isDelivered = false;
+  // Those that are gone may also have been pushed out, or have been discarded by another process.
+  const auto error = file_.read([&](SQLiteDatabase& database) {
+    return database.row(
+        "SELECT NOT EXISTS (SELECT 1 FROM event WHERE id BETWEEN ?1 AND ?2 AND (id - ?1) % ?4 = 0)"
+        " AND NOT EXISTS (SELECT 1 FROM state WHERE lost_through >= ?1 OR epoch > ?3)",
+        std::tie(isDelivered), firstID_, lastID_, epoch_, idStep);
+  });
+  if (error || !isDelivered) return false;
+  firstID_ = 0;
+  return true;
 }
 
 SpoolCounts EventRecorder::counts(int maxRefusals) {

@@ -8,8 +8,6 @@
 #include <string>
 #include <string_view>
 
-#include <Varnel/Platform/SQLite/DurableFile.h>
-#include <Varnel/Platform/Values/Date.h>
 #include <Varnel/Tallyhouse/SpoolCounts.h>
 #include <Varnel/Tallyhouse/SpoolFormat.h>
 
@@ -26,22 +24,12 @@ struct SpoolLimits final {
   std::int64_t maxEvents = 10'000;
   std::int64_t maxBytes = 8 << 20;   ///< Of the file, without what is free in it.
   std::size_t maxHeldEvents = 1000;  ///< In memory, while the file cannot be had.
-  std::size_t maxHeldBytes = 1 << 20;
 };
 
 /// How much may be written before the file's events are counted again.
 struct SpoolRoom final {
   std::int64_t events = 0;
   std::int64_t bytes = 0;
-};
-
-/// What a process has recorded and not yet seen delivered: the numbers from first to last.
-struct OwnEvents final {
-  std::int64_t first = 0;  ///< 0: none.
-  std::int64_t last = 0;
-  Varnel::Platform::Date epoch;
-  bool isHeld = false;   ///< Some are not in the file yet.
-  bool hasLost = false;  ///< Some had to be given up.
 };
 
 /// Writes the events of this process into the spool. What it has written survives the end of the
@@ -73,7 +61,7 @@ class EventRecorder final {
 
   /// Takes one event. Returns how many wait now where it was put, in the file or in memory, as far
   /// as this process knows; 0 when it was not taken.
-  std::int64_t append(std::string_view uuid, Varnel::Platform::Date date, std::string_view hit);
+  std::int64_t append(std::string_view uuid, Date date, std::string_view hit);
 
   /// Counts an event that could not even be appended.
   void countDropped();
@@ -88,7 +76,7 @@ class EventRecorder final {
     none
   };
   /// Does what could not be done yet. Returns when to call again; absent when all is done.
-  std::optional<Varnel::Platform::Date> settle(Haste haste);
+  std::optional<Date> settle(Haste haste);
 
   /// Whether nothing is to be sent because the spool is not empty yet, though it should be.
   [[nodiscard]] bool mustEmpty() const;
@@ -97,22 +85,18 @@ class EventRecorder final {
   void looking();
   void seen(std::int64_t waiting);
 
-  [[nodiscard]] OwnEvents own() const;
-  /// Whether those, as asked for before, lie where others find them: carries over what was appended
-  /// to a spool that has been taken away.
-  [[nodiscard]] bool isInPlace();
-  /// They were delivered.
-  void forget(const OwnEvents& delivered);
+  /// Whether all that this process has recorded arrived, whoever delivered it. Carries over what
+  /// was appended to a spool that has been taken away.
+  [[nodiscard]] bool isAllDelivered();
 
   /// Events wait that were refused less than `maxRefusals` times.
   [[nodiscard]] SpoolCounts counts(int maxRefusals);
 
  private:
   // All with the lock held:
-  void hold(std::string_view uuid, Varnel::Platform::Date date, std::string_view hit);
+  void hold(std::string_view uuid, Date date, std::string_view hit);
   [[nodiscard]] bool insert(const SpooledEvent& event);
-  void giveUp(std::size_t maxEvents, std::size_t maxBytes);
-  std::optional<Varnel::Platform::Date> doAll(Haste haste);
+  std::optional<Date> doAll(Haste haste);
 
   const Ports ports_;
   const std::string path_;
@@ -121,18 +105,18 @@ class EventRecorder final {
 
   mutable std::mutex mutex_;  ///< Owns all below, also while it is at the file: so what one thread
                               ///< holds cannot stay in memory for what another one does there.
-  Varnel::Platform::DurableFile file_;
+  DurableFile file_;
   std::deque<SpooledEvent> held_;
-  std::size_t heldBytes_ = 0;
-  std::int64_t dropped_ = 0;  ///< Not yet counted in the file.
-  std::optional<Varnel::Platform::Date>
-      refusal_;             ///< Of the user, here, for which the file is not emptied.
-  bool isRevoked_ = false;  ///< Another process has refused since `begin`.
+  std::int64_t dropped_ = 0;     ///< Not yet counted in the file.
+  std::optional<Date> refusal_;  ///< Of the user, here, for which the file is not emptied yet.
+  Date epoch_;                   ///< In which it records.
+  bool isRevoked_ = false;       ///< Another process has refused since `begin`.
   Varnel::Platform::GrowingPause pause_ = spoolPause;
   SpoolRoom room_;
   std::int64_t waiting_ = 0;
+  std::int64_t firstID_ = 0;  ///< Of the events that were not yet seen delivered; 0: none.
   std::int64_t lastID_ = origin_;
-  OwnEvents own_;
+  bool hasLost_ = false;  ///< Some had to be given up.
 };
 
 }  // namespace Tallyhouse
