@@ -1,0 +1,27 @@
+// SPDX-License-Identifier: MIT
+#include <Tests/Contract/ProcessLauncherContract.h>
+#include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Linux/Adapters.h>
+
+namespace Varnel::Platform::Contract {
+namespace {
+
+class SpawnedPrograms final : public ProcessLauncherWorld {
+ public:
+  ProcessLauncher& launcher() override { return *launcher_; }
+  Program thatPrints(const std::string& text) override {
+    return {"/bin/cat", {folder_.write("text", text)}};
+  }
+  // For its input, which stays open.
+  Program thatWaits() override { return {"/bin/cat", {}}; }
+  Program thatDoesNotExist() override { return {folder_.path() / "missing", {}}; }
+
+ private:
+  const Tests::TemporaryFolder folder_;
+  const std::unique_ptr<ProcessLauncher> launcher_ = Linux::makeProcessLauncher();
+};
+INSTANTIATE_TEST_SUITE_P(Linux, ProcessLauncherContract,
+                         ProcessLauncherContract::on<SpawnedPrograms>());
+
+}  // namespace
+}  // namespace Varnel::Platform::Contract
