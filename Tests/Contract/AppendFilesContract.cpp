@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/AppendFilesContract.h>
+#include <Tests/Contract/FilesWorlds.h>
 
 #include <Varnel/Platform/Testing/FakeAppendFiles.h>
 

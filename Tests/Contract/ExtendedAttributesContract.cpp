@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/ExtendedAttributesContract.h>
+#include <Tests/Contract/FilesWorlds.h>
 
 #include <Varnel/Platform/Testing/FakeExtendedAttributes.h>
 

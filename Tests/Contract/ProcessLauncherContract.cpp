@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/ProcessLauncherContract.h>
+#include <Tests/Contract/ProcessWorlds.h>
 
 #include <thread>
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/ReadingPriorityContract.h>
+#include <Tests/Contract/ProcessWorlds.h>
 
 #include <thread>
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/SecurityScopeContract.h>
+#include <Tests/Contract/FilesWorlds.h>
 
 #include <Varnel/Platform/Testing/FakeSecurityScope.h>
 

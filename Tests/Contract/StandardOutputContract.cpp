@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/StandardOutputContract.h>
+#include <Tests/Contract/ProcessWorlds.h>
 
 #include <map>
 #include <sstream>

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/SystemLogContract.h>
+#include <Tests/Contract/ProcessWorlds.h>
 
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 

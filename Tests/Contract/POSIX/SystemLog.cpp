@@ -4,7 +4,7 @@
 #include <cstdarg>
 #include <cstdio>
 
-#include <Tests/Contract/SystemLogContract.h>
+#include <Tests/Contract/ProcessWorlds.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 
 namespace {
