@@ -11,6 +11,7 @@
 #include <Varnel/Platform/Generic/BundleFolders.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/POSIX/ImageFile.h>
+#include <Varnel/Platform/Values/SystemText.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {
@@ -50,6 +51,8 @@ class UnameProcessInfo final : public ProcessInfo {
   explicit UnameProcessInfo(fs::path executable) : executable_(std::move(executable)) {}
 
   std::optional<std::string> environmentVariable(std::string_view name) const override {
+    // The system would find the variable A where "A=B" is asked for.
+    if (name.find('=') != std::string_view::npos || isCutShort(name)) return std::nullopt;
     const char* value = std::getenv(std::string(name).c_str());
     if (!value) return std::nullopt;
     return value;

@@ -5,7 +5,6 @@
 #include <pthread.h>
 #include <signal.h>
 #include <stdlib.h>
-#include <syslog.h>
 #include <unistd.h>
 
 #include <future>
@@ -20,21 +19,7 @@
 #include <Varnel/Platform/POSIX/ImageFile.h>
 #include <Varnel/Platform/POSIX/UserFolders.h>
 #include <Varnel/Platform/Ports/ProcessInfo.h>
-#include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
-
-namespace {
-int openedLogs = 0;
-int lastPriority = 0;
-}  // namespace
-
-// In place of the C library's.
-extern "C" void openlog(const char*, int, int) {
-  ++openedLogs;
-}
-extern "C" void syslog(int priority, const char*, ...) {
-  lastPriority = priority;
-}
 
 namespace Varnel::Platform {
 namespace {
@@ -95,12 +80,6 @@ TEST(FileDescriptor, IsNoStandardStream) {
   EXPECT_EQ(::fcntl(file.get(), F_GETFD), FD_CLOEXEC);
   EXPECT_EQ(::fcntl(STDIN_FILENO, F_GETFD), -1);
   ::dup2(input.get(), STDIN_FILENO);
-}
-
-TEST(SystemLog, LeavesTheProcessesLogToTheHost) {
-  POSIX::makeSystemLog()->write("line");
-  EXPECT_EQ(openedLogs, 0);
-  EXPECT_EQ(lastPriority, LOG_USER | LOG_NOTICE);
 }
 
 TEST(ProcessInfo, KnowsItsExecutable) {
