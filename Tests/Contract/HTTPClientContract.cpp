@@ -17,15 +17,15 @@ HTTPPost postTo(const std::string& url, const std::string& body = "x") {
 }
 
 TEST_P(HTTPClientContract, PostsTheWholeBodyAndTellsTheServersAnswer) {
-  const std::string url = world->serve({"204", "503/7", "302>/elsewhere", "cut", "201"});
+  const std::string url = world->serve({"cut", "204", "503/7", "302>/elsewhere", "201"});
   const struct {
     std::string body;
     int status;
     std::optional<std::chrono::seconds> pause;
-  } rows[] = {{"a\0\xFF\r\n"s, 204, {}},
+  } rows[] = {{"unanswered", 0, {}},
+              {"a\0\xFF\r\n"s, 204, {}},
               {"", 503, 7s},
-              {std::string(300'000, 'x'), 302, {}},
-              {"unanswered", 0, {}},
+              {std::string(50'000, 'x'), 302, {}},
               {"last", 201, {}}};
   for (const auto& row : rows) {
     const auto answer = world->client().post(postTo(url, row.body), {});
