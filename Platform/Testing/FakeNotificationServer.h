@@ -110,8 +110,14 @@ class FakeNotificationServer final : public NotificationServer {
 
   /// Acts as the user, who may also click a banner that has expired. What the server has done until
   /// now is reported before.
-  void activate(const std::string& title) { take(title, &Observer::bannerActivated); }
-  void dismiss(const std::string& title) { take(title, &Observer::bannerDismissed); }
+  void activate(const std::string& title) {
+    if (const auto token = take(title))
+      if (const auto observer = observer_.lock()) observer->bannerActivated(*token);
+  }
+  void dismiss(const std::string& title) {
+    if (const auto token = take(title))
+      if (const auto observer = observer_.lock()) observer->bannerDismissed(*token);
+  }
 
   /// Acts as a server whose banner has been there long enough.
   void expire(const std::string& title) {
@@ -143,10 +149,11 @@ class FakeNotificationServer final : public NotificationServer {
     return std::find_if(banners_.begin(), banners_.end(),
                         [&](const auto& each) { return each.second.banner.title == title; });
   }
-  void take(const std::string& title, Event event) {
+  std::optional<std::string> take(const std::string& title) {
     report();
     const auto found = find(title);
-    if (found != banners_.end()) tell(event, banners_.extract(found).mapped().token);
+    if (found == banners_.end()) return std::nullopt;
+    return banners_.extract(found).mapped().token;
   }
 
   std::weak_ptr<Observer> observer_;
