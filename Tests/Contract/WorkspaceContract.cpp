@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/WorkspaceContract.h>
+#include <Tests/Contract/UserWorlds.h>
 
 #include <Varnel/Platform/Testing/FakeWorkspace.h>
 
