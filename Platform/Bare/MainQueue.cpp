@@ -4,8 +4,10 @@
 #include <fcntl.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <array>
 #include <condition_variable>
+#include <cstddef>
 #include <deque>
 #include <mutex>
 #include <thread>
@@ -72,7 +74,12 @@ class OwnQueue final : public MainQueue {
   }
 
   void stop() override {
-    post([this] { (running_.empty() ? stopsNextRun_ : *running_.back()) = true; });
+    post([this] {
+      // A block that drains may run several stops before a run looks at its end.
+      const auto innermost = std::find_if(running_.rbegin(), running_.rend(),
+                                          [](const bool* stops) { return !*stops; });
+      (innermost == running_.rend() ? stopsNextRun_ : **innermost) = true;
+    });
   }
 
   void runWhile(const std::function<bool()>& condition) override {
@@ -87,13 +94,17 @@ class OwnQueue final : public MainQueue {
 
   bool runWhile(const std::function<bool()>& condition,
                 std::chrono::milliseconds patience) override {
-    const auto end = std::chrono::steady_clock::now() + patience;
+    constexpr std::chrono::milliseconds forEver = std::chrono::hours(24 * 365);
+    const auto end = std::chrono::steady_clock::now() + std::min(patience, forEver);
+    std::size_t left = postedCount();
     while (condition()) {
       {
         std::unique_lock lock(mutex_);
         posted_.wait_until(lock, end, [this] { return !blocks_.empty(); });
       }
-      if (!runNext() || std::chrono::steady_clock::now() >= end) return !condition();
+      if (left == 0 && std::chrono::steady_clock::now() >= end) return false;
+      if (!runNext()) return !condition();
+      if (left > 0) --left;
     }
     return true;
   }
@@ -111,6 +122,11 @@ class OwnQueue final : public MainQueue {
   }
 
  private:
+  std::size_t postedCount() {
+    const std::lock_guard lock(mutex_);
+    return blocks_.size();
+  }
+
   bool runNext() {
     std::unique_lock lock(mutex_);
     if (blocks_.empty()) return false;
