@@ -58,7 +58,7 @@ class ScheduledNotificationCenter::Banners final : public NotificationServer::Ob
     failed_.insert(number);
     center_.recheck();
   }
-  void bannerActivated(const std::string& token) override {
+  void bannerActivated(const std::string& token, const BannerActivation&) override {
     const auto shown = shown_.extract(numberOf(token));
     if (!shown) return;
     bannerGone(token);
@@ -174,7 +174,7 @@ ScheduledNotificationCenter::~ScheduledNotificationCenter() {
 }
 
 void ScheduledNotificationCenter::setDelegate(
-    std::weak_ptr<UserNotificationCenterDelegate> delegate) {
+    std::weak_ptr<UserNotificationCenterDelegate> delegate, Standing) {
   delegate_ = std::move(delegate);
   recheck();
 }

@@ -56,7 +56,11 @@ class VARNEL_API ScheduledNotificationCenter final : public UserNotificationCent
   ScheduledNotificationCenter(const ScheduledNotificationCenter&) = delete;
   ScheduledNotificationCenter& operator=(const ScheduledNotificationCenter&) = delete;
 
-  void setDelegate(std::weak_ptr<UserNotificationCenterDelegate> delegate) override;
+  void setDelegate(std::weak_ptr<UserNotificationCenterDelegate> delegate,
+                   Standing standing = Standing::application) override;
+  [[nodiscard]] Result<std::optional<UserNotification>> takeLaunchNotification() override {
+    return std::optional<UserNotification>();
+  }
   [[nodiscard]] Failure change(const std::function<Failure()>& calls) override;
   [[nodiscard]] Failure scheduleNotification(const UserNotification& notification) override;
   [[nodiscard]] Notifications scheduledNotifications() override;

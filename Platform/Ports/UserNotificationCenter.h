@@ -48,11 +48,25 @@ class VARNEL_API UserNotificationCenter {
   using Failure = std::optional<PlatformError>;  ///< None when the call was done.
   using Notifications = Result<std::vector<UserNotification>>;
 
+  /// As what a delegate listens.
+  enum class Standing {
+    application,  ///< The application that the user knows.
+    onlooker      ///< Somebody who gives way where the application listens itself.
+  };
+
   virtual ~UserNotificationCenter() = default;
 
   /// The only listener from now on; held weakly. Notifications that came due earlier are delivered
   /// now. Without a delegate nothing comes due, and what is scheduled waits.
-  virtual void setDelegate(std::weak_ptr<UserNotificationCenterDelegate> delegate) = 0;
+  virtual void setDelegate(std::weak_ptr<UserNotificationCenterDelegate> delegate,
+                           Standing standing = Standing::application) = 0;
+
+  /// The notification for which the application was started, because the user clicked it while it
+  /// did not run: once, and no later than five minutes after the click. None otherwise.
+  ///
+  ///     const auto launch = center.takeLaunchNotification();
+  ///     if (launch && *launch) router.handleLaunch(**launch);
+  [[nodiscard]] virtual Result<std::optional<UserNotification>> takeLaunchNotification() = 0;
 
   /// Makes several calls on this center together: all are done or, where one fails or `calls`
   /// answers a failure, none. Nothing is delivered, shown or taken away before that is decided.

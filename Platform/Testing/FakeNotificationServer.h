@@ -32,7 +32,11 @@ class FakeNotificationServer final : public NotificationServer {
   /// see `report`.
   std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
 
+  /// The product that its banners come from.
+  NotificationSource source;
+
   void setObserver(std::weak_ptr<Observer> observer) override { observer_ = std::move(observer); }
+  void setSource(const NotificationSource& present) override { source = present; }
 
   void show(const std::string& token, const Banner& banner,
             const std::optional<std::string>& replacedReference) override {
@@ -92,9 +96,9 @@ class FakeNotificationServer final : public NotificationServer {
   /// Every banner that was ever shown, oldest first.
   [[nodiscard]] const std::vector<Banner>& history() const { return history_; }
 
-  void activate(const std::string& title) {
+  void activate(const std::string& title, const BannerActivation& activation = {}) {
     if (const auto token = take(title))
-      if (const auto observer = observer_.lock()) observer->bannerActivated(*token);
+      if (const auto observer = observer_.lock()) observer->bannerActivated(*token, activation);
   }
   void dismiss(const std::string& title) {
     if (const auto token = take(title))

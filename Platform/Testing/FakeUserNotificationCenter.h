@@ -30,11 +30,18 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
   /// The calls on its two lists count, each for itself. One that goes wrong fails, and with it all
   /// that it is made together with.
   std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
+  /// For what the application was started; taken once.
+  std::optional<UserNotification> launch;
   /// What `checkBanners` answers.
   Failure obstacle;
 
-  void setDelegate(std::weak_ptr<UserNotificationCenterDelegate> delegate) override {
+  void setDelegate(std::weak_ptr<UserNotificationCenterDelegate> delegate,
+                   Standing = Standing::application) override {
     delegate_ = std::move(delegate);
+  }
+  [[nodiscard]] Result<std::optional<UserNotification>> takeLaunchNotification() override {
+    if (auto error = fail()) return *error;
+    return std::exchange(launch, std::nullopt);
   }
   [[nodiscard]] std::shared_ptr<UserNotificationCenterDelegate> delegate() const {
     return delegate_.lock();

@@ -1,0 +1,106 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <chrono>
+#include <functional>
+#include <map>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include <Varnel/Platform/Generic/NotificationHosts.h>
+#include <Varnel/Platform/Generic/NotificationStore.h>
+#include <Varnel/Platform/Values/GrowingPause.h>
+
+namespace Varnel::Platform {
+
+class Banners;
+class Clock;
+class FileLock;
+class MainQueue;
+class NotificationServer;
+class PrivateFiles;
+class SystemLog;
+class TimeZones;
+class UserLocale;
+class WallClockTimer;
+
+/// Delivers the notifications of one product: makes due what its store has planned, asks whether to
+/// show it, and keeps the desktop's banners in step with the store.
+///
+///     NotificationDeliverer deliverer(ports, storeFile, Migrating::never, hosts);
+///     deliverer.setDuty(NotificationDeliverer::Duty::everything);
+///     …
+///     deliverer.recheck();  // the store has changed
+///
+/// Of several on one store the first with something to deliver does so until it ends; it holds a
+/// lock on a file beside the store. What cannot be done, because of the store, of the lock or of
+/// the server, is tried again, after pauses that grow from `minPause` to `maxPause`, and at once
+/// when a server appears or `recheck` is called. Main thread only.
+class NotificationDeliverer final {
+ public:
+  using Failure = NotificationStore::Failure;
+
+  static constexpr std::chrono::seconds minPause{1};
+  static constexpr std::chrono::minutes maxPause{5};
+  /// How long a host may think about whether to show a notification, which is then shown.
+  static constexpr std::chrono::seconds maxQuestion{2};
+  /// How many banners are on their way to the server at once. So many may come twice when the
+  /// process is killed.
+  static constexpr std::size_t maxOnTheirWay = 20;
+
+  /// All outlive the deliverer. No one else uses the server and the timer.
+  struct Ports {
+    Clock& clock;
+    UserLocale& userLocale;
+    TimeZones& timeZones;
+    MainQueue& mainQueue;
+    PrivateFiles& privateFiles;
+    SystemLog& systemLog;
+    NotificationServer& notificationServer;
+    WallClockTimer& timer;
+  };
+
+  /// What it does, beyond taking away the banners of what was removed.
+  enum class Duty {
+    nothing,
+    due,        ///< Delivers what is due already.
+    everything  ///< Makes due what is planned, too.
+  };
+
+  /// `hosts` outlives the deliverer. Nothing is done, nor the store opened, before the first call.
+  NotificationDeliverer(const Ports& ports, const std::string& storeFile, Migrating migrating,
+                        NotificationHosts& hosts);
+  ~NotificationDeliverer();
+  NotificationDeliverer(const NotificationDeliverer&) = delete;
+  NotificationDeliverer& operator=(const NotificationDeliverer&) = delete;
+
+  /// `nothing` until this is called. Rechecks.
+  void setDuty(Duty duty);
+
+  /// To be called when something outside may have changed what is to be done: the store, or the
+  /// user's time zone.
+  void recheck();
+
+  /// Whether nothing is left for it to do, now or later: nothing is planned, due or to be shown, no
+  /// banner of it is up, and nothing is under way. So it is, too, where the store is not its to
+  /// use: of another format, or not the user's.
+  [[nodiscard]] bool isIdle() const;
+  /// Whether something is on its way to the server or the store. Becomes false in the end, also
+  /// without a server, but not while one has taken a banner and hangs.
+  [[nodiscard]] bool isBusy() const;
+  /// When it wants to go on, if nothing else happens; its timer waits for that.
+  [[nodiscard]] const std::optional<Date>& earliestDate() const { return next_; }
+
+  /// Keeps a click for the application that is about to be started for it.
+  [[nodiscard]] Failure keepLaunch(const NotificationActivation& activation);
+
+  /// Who plans in this store; none before anything was planned.
+  [[nodiscard]] Result<std::optional<NotificationSource>> source();
+
+ private:
+  std::optional<Date> next_;
+};
+
+}  // namespace Varnel::Platform
