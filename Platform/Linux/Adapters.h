@@ -42,7 +42,9 @@ class MountTable;
 
 [[nodiscard]] std::unique_ptr<ApplicationStorage> makeApplicationStorage(PrivateFiles& files,
                                                                          SystemLog& systemLog);
-[[nodiscard]] std::unique_ptr<DeviceRegistry> makeDeviceRegistry();
+/// `folder` is where the kernel lists its block devices.
+[[nodiscard]] std::unique_ptr<DeviceRegistry> makeDeviceRegistry(
+    const std::string& folder = "/sys/class/block");
 [[nodiscard]] std::unique_ptr<DiskArbitration> makeDiskArbitration(
     std::shared_ptr<MountTable> table);
 [[nodiscard]] std::unique_ptr<ExtendedAttributes> makeExtendedAttributes();

@@ -5,7 +5,7 @@
 #include <Varnel/Platform/Generic/ScheduledNotificationCenter.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/MainLoop/FileWatch.h>
-#include <Varnel/Platform/Linux/Process/UserFolders.h>
+#include <Varnel/Platform/POSIX/UserFolders.h>
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Ports/NotificationServer.h>
@@ -69,7 +69,8 @@ class StoredCenters final : public UserNotificationCenters {
   UserNotificationCenter& center(const NotificationSource& source) override {
     auto& center = centers_[source.identifier];
     if (!center)
-      center = std::make_unique<Center>(ports_, source, notificationStore(source.identifier));
+      center =
+          std::make_unique<Center>(ports_, source, POSIX::notificationStore(source.identifier));
     return center->center();
   }
 
