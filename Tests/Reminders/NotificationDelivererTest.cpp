@@ -213,7 +213,28 @@ TEST_F(NotificationDelivererTest, LeavesAProcessThatDeliversItselfAloneUntilItEn
   EXPECT_THAT(notifier.hosts.questions, SizeIs(2));
 }
 
+TEST_F(NotificationDelivererTest, AStoreThatTheUserRemovesStaysRemoved) {
+  host.schedule(at(start));
+  host.schedule(at(start + 1h, "old"));
+  Notifier notifier(file, start);
+  notifier.hosts.questions.at("A")(true);
+  notifier.settle();
+  ASSERT_EQ(notifier.server.count(), 1u);
+  std::filesystem::remove(file);
+  notifier.timer.advanceTo(start + 1h);
+  EXPECT_FALSE(notifier.deliverer->keepLaunch({at(start)}));
+  notifier.settle();
+  EXPECT_TRUE(notifier.deliverer->isIdle());
+  EXPECT_EQ(notifier.server.count(), 0u);
+  EXPECT_FALSE(std::filesystem::exists(file));
+  Testing::Process(file, start + 1h).schedule(at(start + 2h, "new"));
+  notifier.deliverer->recheck();
+  notifier.timer.advanceTo(start + 2h);
+  EXPECT_THAT(notifier.hosts.questions, SizeIs(2)) << "that of A, and of the new one";
+}
+
 TEST_F(NotificationDelivererTest, KeepsAClickForOneStartOnly) {
+  host.schedule(at(start + 1h));
   Notifier notifier(file, start);
   const UserNotification clicked = at(start);
   EXPECT_FALSE(notifier.deliverer->keepLaunch({clicked}));
