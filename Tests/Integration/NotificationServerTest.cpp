@@ -109,7 +109,8 @@ class Host final {
   Platform::Testing::FakeProcessInfo processInfo;
   Platform::Testing::FakeUserAccount account;
   Platform::Testing::FakeWorkspace workspace;
-  const ProcessFacts facts{{*clock, processInfo, account, workspace}, {.isSiteVersion = true}};
+  const ProcessFacts facts{{*clock, *files, processInfo, account, workspace},
+                           {.isSiteVersion = true}};
   const std::shared_ptr<VarnelModule> module = std::make_shared<VarnelModule>();
   const std::shared_ptr<Tallyhouse::Testing::MemoryTransport> sent =
       std::make_shared<Tallyhouse::Testing::MemoryTransport>();

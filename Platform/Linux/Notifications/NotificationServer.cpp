@@ -35,7 +35,7 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     const auto replaced =
         replacedReference ? BannerAddress::parse(*replacedReference) : std::nullopt;
     if (replaced) take(*replaced);
-    shown_.insert_or_assign(token, std::nullopt);
+    shown_.insert_or_assign(token, Shown());
     bus_->connect([weak = weak_from_this(), token, banner, replaced](const std::string& error) {
       const auto self = weak.lock();
       if (!self || !self->shown_.contains(token)) return;
@@ -51,8 +51,8 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
 
   void close(const std::string& token, const std::optional<std::string>& reference) {
     auto address = reference ? BannerAddress::parse(*reference) : std::nullopt;
-    if (const auto shown = shown_.extract(token); shown && shown.mapped())
-      address = *shown.mapped();
+    if (const auto shown = shown_.extract(token); shown && shown.mapped().address)
+      address = *shown.mapped().address;
     bus_->connect([weak = weak_from_this(), token, address](const std::string& error) {
       const auto self = weak.lock();
       if (!self) return;
@@ -88,6 +88,10 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
 
  private:
   using Event = void (NotificationServer::Observer::*)(const std::string& token);
+  struct Shown {
+    std::optional<BannerAddress> address;  // None while the server has yet to answer.
+    bool isExpired = false;
+  };
 
   void tell(Event event, const std::string& token) const {
     if (const auto told = observer.lock()) ((*told).*event)(token);
@@ -136,7 +140,7 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
                  [](GDBusMessage*, const std::string&) {});
       return;
     }
-    shown->second = address;
+    shown->second.address = address;
     if (const auto told = observer.lock()) told->bannerShown(token, address.reference());
   }
 
@@ -163,7 +167,7 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
   // The banner's token, once: further signals for the same banner are ignored.
   std::optional<std::string> take(const BannerAddress& address) {
     for (auto shown = shown_.begin(); shown != shown_.end(); ++shown)
-      if (shown->second == address) return shown_.extract(shown).key();
+      if (shown->second.address == address) return shown_.extract(shown).key();
     return std::nullopt;
   }
 
@@ -183,7 +187,7 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     const auto token = take(address);
     if (!token) return;
     // The user may bring an expired banner back from the server's history.
-    if (reason == expired) shown_[*token] = address;
+    if (reason == expired) shown_[*token] = {.address = address, .isExpired = true};
     using Observer = NotificationServer::Observer;
     tell(reason == dismissedByUser ? &Observer::bannerDismissed : &Observer::bannerGone, *token);
   }
@@ -191,20 +195,20 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
   // What is on its way to the server that has ended is answered by the bus.
   void replaceServer(const std::string& before, bool isThere) {
     std::vector<std::string> gone;
-    for (const auto& [token, address] : shown_)
-      if (address && address->server == before) gone.push_back(token);
-    for (const std::string& token : gone) {
-      shown_.erase(token);
-      tell(&NotificationServer::Observer::bannerGone, token);
-    }
+    std::erase_if(shown_, [&](const auto& each) {
+      const Shown& shown = each.second;
+      if (!shown.address || shown.address->server != before) return false;
+      if (!shown.isExpired) gone.push_back(each.first);
+      return true;
+    });
+    for (const std::string& token : gone) tell(&NotificationServer::Observer::bannerGone, token);
     const auto told = observer.lock();
     if (told && isThere) told->serverAppeared();
   }
 
   SystemLog& systemLog_;
   const std::shared_ptr<SessionBus> bus_;
-  /// The banners' addresses by token; none while the server has yet to answer.
-  std::map<std::string, std::optional<BannerAddress>> shown_;
+  std::map<std::string, Shown> shown_;  // By token.
   std::string lastError_;
 };
 
