@@ -14,7 +14,10 @@ class NoCenter final : public UserNotificationCenter {
  public:
   explicit NoCenter(MainQueue& queue) : queue_(queue) {}
 
-  void setDelegate(std::weak_ptr<UserNotificationCenterDelegate>) override {}
+  void setDelegate(std::weak_ptr<UserNotificationCenterDelegate>, Standing) override {}
+  Result<std::optional<UserNotification>> takeLaunchNotification() override {
+    return std::optional<UserNotification>();
+  }
   Failure change(const std::function<Failure()>& calls) override { return calls(); }
   Failure scheduleNotification(const UserNotification&) override { return refusal(); }
   Notifications scheduledNotifications() override { return std::vector<UserNotification>(); }

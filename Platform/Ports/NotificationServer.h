@@ -7,6 +7,7 @@
 #include <string>
 
 #include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/NotificationSource.h>
 #include <Varnel/Platform/Values/PlatformError.h>
 
 namespace Varnel::Platform {
@@ -19,6 +20,12 @@ struct Banner final {
   std::string dismissTitle = {};
 
   bool operator==(const Banner&) const = default;
+};
+
+/// How the user clicked a banner. A plain value.
+struct BannerActivation final {
+  bool isActionButton = false;       ///< Otherwise it was the banner itself.
+  std::string activationToken = {};  ///< For a window that is to come to the front; may be empty.
 };
 
 /// The desktop's service that shows banners. A banner is known by the token that its owner gave it,
@@ -39,7 +46,7 @@ class VARNEL_API NotificationServer {
     virtual void bannerFailed(const std::string& token) = 0;
     /// The user clicked the banner or its action button; the banner is gone. Called at most once
     /// for each banner.
-    virtual void bannerActivated(const std::string& token) = 0;
+    virtual void bannerActivated(const std::string& token, const BannerActivation& activation) = 0;
     /// The user closed the banner.
     virtual void bannerDismissed(const std::string& token) = 0;
     /// The banner is gone otherwise: it was closed as asked, has expired, or its server has ended.
@@ -53,6 +60,9 @@ class VARNEL_API NotificationServer {
   NotificationServer& operator=(const NotificationServer&) = delete;
 
   virtual void setObserver(std::weak_ptr<Observer> observer) = 0;
+
+  /// The product that banners come from, from now on.
+  virtual void setSource(const NotificationSource& source) = 0;
 
   /// Shows a banner, in the place of the one with this reference, whose token counts no more. A
   /// reference that the server does not know replaces nothing. Ends in `bannerShown` or

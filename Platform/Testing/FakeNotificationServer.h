@@ -34,7 +34,11 @@ class FakeNotificationServer final : public NotificationServer {
   /// see `report`.
   std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
 
+  /// The product that its banners come from.
+  NotificationSource source;
+
   void setObserver(std::weak_ptr<Observer> observer) override { observer_ = std::move(observer); }
+  void setSource(const NotificationSource& present) override { source = present; }
 
   void show(const std::string& token, const Banner& banner,
             const std::optional<std::string>& replacedReference) override {
@@ -110,9 +114,9 @@ class FakeNotificationServer final : public NotificationServer {
 
   /// Acts as the user, who may also click a banner that has expired. What the server has done until
   /// now is reported before.
-  void activate(const std::string& title) {
+  void activate(const std::string& title, const BannerActivation& activation = {}) {
     if (const auto token = take(title))
-      if (const auto observer = observer_.lock()) observer->bannerActivated(*token);
+      if (const auto observer = observer_.lock()) observer->bannerActivated(*token, activation);
   }
   void dismiss(const std::string& title) {
     if (const auto token = take(title))

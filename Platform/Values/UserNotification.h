@@ -18,7 +18,8 @@ namespace Varnel::Platform {
 /// Texts are plain and UTF-8; a button without a title is not shown. A plain value.
 struct UserNotification final {
   /// Tells the notification from others: a center holds one scheduled and one delivered with the
-  /// same identifier. Notifications without one are equal only if all their members are.
+  /// same identifier. Notifications without one are the same if all is equal that the application
+  /// has set.
   std::optional<std::string> identifier = std::nullopt;
   std::optional<std::string> title = std::nullopt;
   std::optional<std::string> informativeText = std::nullopt;
@@ -32,14 +33,19 @@ struct UserNotification final {
   std::optional<DateComponents> deliveryRepeatInterval = std::nullopt;
   /// When it was delivered; set by the center.
   std::optional<Date> actualDeliveryDate = std::nullopt;
+  /// With which a window of the application may come to the front; set by the center where the user
+  /// has clicked the notification and the desktop gave one.
+  std::optional<std::string> activationToken = std::nullopt;
 
   bool operator==(const UserNotification&) const = default;
 };
 
 /// Whether the two stand for the same notification of a center.
-[[nodiscard]] inline bool isSameNotification(const UserNotification& left,
-                                             const UserNotification& right) {
-  return left.identifier || right.identifier ? left.identifier == right.identifier : left == right;
+[[nodiscard]] inline bool isSameNotification(UserNotification left, const UserNotification& right) {
+  if (left.identifier || right.identifier) return left.identifier == right.identifier;
+  left.actualDeliveryDate = right.actualDeliveryDate;
+  left.activationToken = right.activationToken;
+  return left == right;
 }
 
 }  // namespace Varnel::Platform

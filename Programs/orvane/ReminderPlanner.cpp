@@ -27,7 +27,11 @@ class PlanningCenter final : public UserNotificationCenter {
  public:
   explicit PlanningCenter(UserNotificationCenter& center) : center_(center) {}
 
-  void setDelegate(std::weak_ptr<Varnel::Platform::UserNotificationCenterDelegate>) override {}
+  void setDelegate(std::weak_ptr<Varnel::Platform::UserNotificationCenterDelegate>,
+                   Standing) override {}
+  Varnel::Platform::Result<std::optional<UserNotification>> takeLaunchNotification() override {
+    return std::optional<UserNotification>();
+  }
   Failure change(const std::function<Failure()>& calls) override { return center_.change(calls); }
   Failure scheduleNotification(const UserNotification& notification) override {
     return center_.scheduleNotification(notification);

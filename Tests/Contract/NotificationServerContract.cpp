@@ -25,7 +25,9 @@ struct Listener final : NotificationServer::Observer {
     onShown(token);
   }
   void bannerFailed(const std::string& token) override { heard.push_back("failed " + token); }
-  void bannerActivated(const std::string& token) override { heard.push_back("clicked " + token); }
+  void bannerActivated(const std::string& token, const BannerActivation&) override {
+    heard.push_back("clicked " + token);
+  }
   void bannerDismissed(const std::string& token) override { heard.push_back("dismissed " + token); }
   void bannerGone(const std::string& token) override { heard.push_back("gone " + token); }
   void serverAppeared() override { heard.emplace_back("appeared"); }

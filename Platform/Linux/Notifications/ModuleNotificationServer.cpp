@@ -41,6 +41,11 @@ class LoadedServer final : public std::enable_shared_from_this<LoadedServer> {
     if (server_) server_->setObserver(observer_);
   }
 
+  void setSource(const NotificationSource& source) {
+    source_ = source;
+    if (server_) server_->setSource(source);
+  }
+
   void request(Request request) {
     if (server_) return request.ask(*server_);
     waiting_.push_back(std::move(request));
@@ -89,7 +94,7 @@ class LoadedServer final : public std::enable_shared_from_this<LoadedServer> {
   }
 
   SystemLog& systemLog_;
-  const NotificationSource source_;
+  NotificationSource source_;
   const std::chrono::milliseconds patience_;
   std::weak_ptr<Observer> observer_;
   std::unique_ptr<NotificationServer> server_;
@@ -106,6 +111,8 @@ class ModuleNotificationServer final : public NotificationServer {
   void setObserver(std::weak_ptr<Observer> observer) override {
     server_->setObserver(std::move(observer));
   }
+
+  void setSource(const NotificationSource& source) override { server_->setSource(source); }
 
   void show(const std::string& token, const Banner& banner,
             const std::optional<std::string>& replacedReference) override {

@@ -20,14 +20,15 @@ namespace {
 // What the server's replies and signals refer to. Replies may outlive the adapter.
 class Desktop final : public std::enable_shared_from_this<Desktop> {
  public:
-  Desktop(SystemLog& systemLog, NotificationSource source, std::chrono::milliseconds patience)
-      : systemLog_(systemLog),
-        source_(std::move(source)),
+  Desktop(SystemLog& systemLog, NotificationSource first, std::chrono::milliseconds patience)
+      : source(std::move(first)),
+        systemLog_(systemLog),
         bus_(std::make_shared<SessionBus>([this](const char* sender, const char* name,
                                                  GVariant* body) { receive(sender, name, body); },
                                           patience)) {}
 
   std::weak_ptr<NotificationServer::Observer> observer;
+  NotificationSource source;
 
   void show(const std::string& token, const Banner& banner,
             const std::optional<std::string>& replacedReference) {
@@ -122,9 +123,8 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
               ServerCapabilities capabilities) {
     if (!shown_.contains(token)) return;
     const bool knowsIt = replaced && replaced->bus == bus_->name() && replaced->server == server;
-    send(notifyRequest(server, source_, banner, capabilities, knowsIt ? replaced->number : 0),
-         token, SessionBus::Waiting::unlimited,
-         [token, server](Desktop& self, GDBusMessage* reply) {
+    send(notifyRequest(server, source, banner, capabilities, knowsIt ? replaced->number : 0), token,
+         SessionBus::Waiting::unlimited, [token, server](Desktop& self, GDBusMessage* reply) {
            const auto number = bannerNumberIn(reply);
            if (!number) return self.fail(token, "The notification server gives no number.");
            self.hasShown(token, {self.bus_->name(), server, *number});
@@ -177,8 +177,10 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     // Not every server closes the banner by itself.
     bus_->send(closeRequest(address), SessionBus::Waiting::limited,
                [](GDBusMessage*, const std::string&) {});
-    using Observer = NotificationServer::Observer;
-    tell(action == dismissAction ? &Observer::bannerDismissed : &Observer::bannerActivated, *token);
+    if (action == dismissAction)
+      return tell(&NotificationServer::Observer::bannerDismissed, *token);
+    if (const auto told = observer.lock())
+      told->bannerActivated(*token, {.isActionButton = action == buttonAction});
   }
 
   void close(const BannerAddress& address, guint32 reason) {
@@ -205,7 +207,6 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
   }
 
   SystemLog& systemLog_;
-  const NotificationSource source_;
   const std::shared_ptr<SessionBus> bus_;
   std::map<std::string, Shown> shown_;  // By token.
   std::string lastError_;
@@ -220,6 +221,7 @@ class BusNotificationServer final : public NotificationServer {
   void setObserver(std::weak_ptr<Observer> observer) override {
     desktop_->observer = std::move(observer);
   }
+  void setSource(const NotificationSource& source) override { desktop_->source = source; }
   void show(const std::string& token, const Banner& banner,
             const std::optional<std::string>& replacedReference) override {
     desktop_->show(token, banner, replacedReference);
