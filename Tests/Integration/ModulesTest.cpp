@@ -111,7 +111,7 @@ TEST(Modules, WithoutThatOfTheBusEveryRequestFailsInItsTimeAndALaterOneTriesAgai
     std::vector<std::string> failed;
     void bannerShown(const std::string&, const std::string&) override {}
     void bannerFailed(const std::string& token) override { failed.push_back(token); }
-    void bannerActivated(const std::string&) override {}
+    void bannerActivated(const std::string&, const BannerActivation&) override {}
     void bannerDismissed(const std::string&) override {}
     void bannerGone(const std::string&) override {}
     void serverAppeared() override {}
