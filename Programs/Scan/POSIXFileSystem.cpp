@@ -3,10 +3,12 @@
 #include <fcntl.h>
 #include <linux/fiemap.h>
 #include <linux/fs.h>
+#include <linux/magic.h>
 #include <linux/openat2.h>
 #include <sys/ioctl.h>
 #include <sys/stat.h>
 #include <sys/syscall.h>
+#include <sys/vfs.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -102,6 +104,13 @@ Descriptor openLeased(int folder, const char* name) {
   Descriptor opened(isFile ? ::open(path.c_str(), O_RDONLY | O_CLOEXEC) : -1);
   if (opened.get() < 0) errno = EAGAIN;
   return opened;
+}
+
+/// Whether the files in the folder are in memory alone, so that no cache holds anything of them.
+bool isInMemory(int folder) {
+  struct statfs facts;
+  return ::fstatfs(folder, &facts) == 0 &&
+         (facts.f_type == TMPFS_MAGIC || facts.f_type == RAMFS_MAGIC);
 }
 
 class DescriptorFile final : public OpenFile {
@@ -239,8 +248,9 @@ class POSIXFileSystem final : public FileSystem {
     Descriptor descriptor = openWithoutLinks(start, path, O_RDONLY | O_DIRECTORY);
     struct stat facts;
     if (descriptor.get() < 0 || ::fstat(descriptor.get(), &facts) != 0) return lastError();
+    const CacheUse cacheUse = isInMemory(descriptor.get()) ? CacheUse::normal : cacheUse_;
     std::unique_ptr<OpenFolder> folder = std::make_unique<DescriptorFolder>(
-        std::move(descriptor), statusFrom(facts).identity, cacheUse_);
+        std::move(descriptor), statusFrom(facts).identity, cacheUse);
     return folder;
   }
 
