@@ -2,10 +2,12 @@
 #include <fcntl.h>
 #include <linux/fiemap.h>
 #include <linux/fs.h>
+#include <linux/magic.h>
 #include <linux/openat2.h>
 #include <sys/ioctl.h>
 #include <sys/stat.h>
 #include <sys/syscall.h>
+#include <sys/vfs.h>
 #include <unistd.h>
 
 #include <array>
@@ -39,6 +41,12 @@ int openLeased(int folder, const char* name) {
   if (found >= 0) ::close(found);
   if (opened < 0) errno = EAGAIN;
   return opened;
+}
+
+bool isInMemory(int folder) {
+  struct statfs facts;
+  return ::fstatfs(folder, &facts) == 0 &&
+         (facts.f_type == TMPFS_MAGIC || facts.f_type == RAMFS_MAGIC);
 }
 
 std::optional<std::uint64_t> placeOf(int descriptor) {

@@ -20,6 +20,10 @@ int openLeased(int, const char*) {
   return -1;
 }
 
+bool isInMemory(int) {
+  return false;
+}
+
 std::optional<std::uint64_t> placeOf(int) {
   return std::nullopt;
 }

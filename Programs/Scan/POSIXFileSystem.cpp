@@ -206,8 +206,9 @@ class POSIXFileSystem final : public FileSystem {
     Descriptor descriptor = openWithoutLinks(start, path, O_RDONLY | O_DIRECTORY);
     struct stat facts;
     if (descriptor.get() < 0 || ::fstat(descriptor.get(), &facts) != 0) return lastError();
+    const CacheUse cacheUse = isInMemory(descriptor.get()) ? CacheUse::normal : cacheUse_;
     std::unique_ptr<OpenFolder> folder = std::make_unique<DescriptorFolder>(
-        std::move(descriptor), statusFrom(facts).identity, cacheUse_);
+        std::move(descriptor), statusFrom(facts).identity, cacheUse);
     return folder;
   }
 

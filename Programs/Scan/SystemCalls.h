@@ -20,6 +20,10 @@ extern const int openToPassThrough;
 /// -1, with EAGAIN.
 [[nodiscard]] int openLeased(int folder, const char* name);
 
+/// Whether the files in the folder are known to be in memory alone, so that no cache holds anything
+/// of them.
+[[nodiscard]] bool isInMemory(int folder);
+
 /// Where on its disk the file begins, if the system tells.
 [[nodiscard]] std::optional<std::uint64_t> placeOf(int descriptor);
 
