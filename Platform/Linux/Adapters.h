@@ -7,6 +7,7 @@
 
 namespace Varnel::Platform {
 
+class ApplicationLauncher;
 class ApplicationStorage;
 class Clock;
 class DeviceRegistry;
@@ -36,6 +37,7 @@ struct NotificationSource;
 namespace Varnel::Platform::Linux {
 
 class MountTable;
+class SessionBus;
 
 /// The one view of the mount table that the volume catalogue and disk arbitration share.
 [[nodiscard]] std::shared_ptr<MountTable> makeMountTable();
@@ -58,11 +60,15 @@ class MountTable;
 [[nodiscard]] std::unique_ptr<StandardOutput> makeStandardOutput();
 [[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog,
                                                            MainQueue& mainQueue);
-/// The desktop shows the banners under the source's name. `patience` is how long a connection to
-/// the session bus may take.
-[[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(
-    SystemLog& systemLog, const NotificationSource& source,
+/// A connection to the user's session bus, which may take as long as `patience`.
+[[nodiscard]] std::shared_ptr<SessionBus> makeSessionBus(
     std::chrono::milliseconds patience = std::chrono::seconds(10));
+/// The desktop shows the banners under the source's name.
+[[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(
+    SystemLog& systemLog, const NotificationSource& source, std::shared_ptr<SessionBus> bus);
+/// Starts applications by the desktop entries installed for the user.
+[[nodiscard]] std::unique_ptr<ApplicationLauncher> makeApplicationLauncher(
+    std::shared_ptr<SessionBus> bus);
 [[nodiscard]] std::unique_ptr<WallClockTimer> makeWallClockTimer(SystemLog& systemLog);
 
 /// What notification centers are made with, beyond a server and a timer each.

@@ -108,7 +108,7 @@ TEST(NotificationServer, ABusThatDoesNotTellWhoAnswersCostsTheBannerAlone) {
   const NamelessBus bus;
   const auto mainQueue = Linux::makeMainQueue();
   Testing::CapturedSystemLog log;
-  const auto server = Linux::makeNotificationServer(log, {});
+  const auto server = Linux::makeNotificationServer(log, {}, Linux::makeSessionBus());
   const UniqueHandle<GMainContext*, g_main_context_unref> own(g_main_context_new());
   g_main_context_push_thread_default(own.get());
   server->show("token", Banner(), {});
@@ -121,7 +121,7 @@ TEST(NotificationServer, ABusThatIsLostKeepsNobodyWaitingAndTheNextTakesItsPlace
   std::optional<NamelessBus> bus(std::in_place);
   const auto mainQueue = Linux::makeMainQueue();
   Testing::CapturedSystemLog log;
-  const auto server = Linux::makeNotificationServer(log, {});
+  const auto server = Linux::makeNotificationServer(log, {}, Linux::makeSessionBus());
   std::vector<bool> hasAnswered;
   const auto ask = [&] {
     server->check([&](const auto& obstacle) {
@@ -149,7 +149,7 @@ TEST(NotificationServer, AMainLoopThatComesLateFindsTheConnection) {
   const NamelessBus bus;
   const auto mainQueue = Linux::makeMainQueue();
   Testing::CapturedSystemLog log;
-  const auto server = Linux::makeNotificationServer(log, {}, patience);
+  const auto server = Linux::makeNotificationServer(log, {}, Linux::makeSessionBus(patience));
   server->show("token", Banner(), {});
   const auto end = Clock::now() + patience;
   while (!g_main_context_pending(nullptr)) std::this_thread::yield();
@@ -166,11 +166,12 @@ TEST(NotificationServer, ABusThatNeverAnswersCostsTheBannersAndNoWaiting) {
   const auto mainQueue = Linux::makeMainQueue();
   Testing::CapturedSystemLog log;
   {
-    const auto ended = Linux::makeNotificationServer(log, {});
+    const auto ended = Linux::makeNotificationServer(log, {}, Linux::makeSessionBus());
     ended->show("token", banner, {});
     EXPECT_TRUE(ended->isBusy());
   }
-  const auto server = Linux::makeNotificationServer(log, {}, std::chrono::milliseconds(50));
+  const auto server =
+      Linux::makeNotificationServer(log, {}, Linux::makeSessionBus(std::chrono::milliseconds(50)));
   // Each attempt comes to an end, and the next banner makes another. The reason is said once.
   for (int attempt = 0; attempt < 2; ++attempt) {
     server->show("token", banner, {});
@@ -190,11 +191,12 @@ TEST(NotificationServer, ABannerCarriesWhoseItIs) {
   } rows[] = {
       {{.name = "Fotovia \xff", .desktopEntry = "com.example.Fotovia", .icon = "/icons/a b.png"},
        "('Fotovia \uFFFD', uint32 7, 'file:///icons/a%20b.png', ",
-       "{'desktop-entry': <'com.example.Fotovia'>}, -1)"},
+       "{'desktop-entry': <'com.example.Fotovia'>, 'category': <'x-quennel.reminder'>, "
+       "'urgency': <byte 0x01>}, -1)"},
       {{.name = "Fotovia", .icon = "fotovia"},
        "('Fotovia', uint32 7, 'fotovia', ",
-       "@a{sv} {}, -1)"},
-      {{}, "('', uint32 7, '', ", "@a{sv} {}, -1)"},
+       "[], {'category': <'x-quennel.reminder'>, 'urgency': <byte 0x01>}, -1)"},
+      {{}, "('', uint32 7, '', ", "'urgency': <byte 0x01>}, -1)"},
   };
   for (const auto& row : rows) {
     const auto message = Linux::notifyRequest(":1.5", row.source, Banner(), {}, 7);

@@ -24,7 +24,7 @@ namespace fs = std::filesystem;
 class Center final {
  public:
   Center(const NotificationPorts& ports, const NotificationSource& source, const fs::path& store)
-      : server_(makeNotificationServer(ports.systemLog, source)),
+      : server_(makeNotificationServer(ports.systemLog, source, makeSessionBus())),
         timer_(makeWallClockTimer(ports.systemLog)),
         center_({ports.clock, ports.userLocale, ports.timeZones, ports.mainQueue,
                  ports.privateFiles, ports.systemLog, *server_, *timer_},
