@@ -2,6 +2,7 @@
 #include <Varnel/Platform/Linux/Process/UserFolders.h>
 
 #include <cstdlib>
+#include <system_error>
 
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
@@ -26,8 +27,14 @@ std::string folderName(std::string identifier) {
   return identifier;
 }
 
+constexpr const char* notifications = "notifications.sqlite";
+
+fs::path stateFolders() {
+  return folder("XDG_STATE_HOME", ".local/state");
+}
+
 fs::path stateFolder(const std::string& identifier) {
-  return folder("XDG_STATE_HOME", ".local/state") / folderName(identifier);
+  return stateFolders() / folderName(identifier);
 }
 
 }  // namespace
@@ -37,7 +44,17 @@ fs::path settingsFile(const std::string& identifier) {
 }
 
 fs::path notificationStore(const std::string& identifier) {
-  return stateFolder(identifier) / "notifications.sqlite";
+  return stateFolder(identifier) / notifications;
+}
+
+std::vector<fs::path> notificationStores() {
+  std::vector<fs::path> stores;
+  std::error_code error;
+  for (fs::directory_iterator each(stateFolders(), error), end; !error && each != end;
+       each.increment(error))
+    if (std::error_code unreadable; fs::exists(each->path() / notifications, unreadable))
+      stores.push_back(each->path() / notifications);
+  return stores;
 }
 
 fs::path analyticsSpool(const std::string& identifier) {
