@@ -1,18 +1,19 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Basalt/Digest.h>
 
-#include <array>
+#include <sys/types.h>
 
-#include <openssl/evp.h>
+#include <sha256.h>
 
 namespace Basalt {
 
-std::optional<std::string> sha256(std::string_view bytes) {
-  std::array<unsigned char, EVP_MAX_MD_SIZE> digest{};
-  unsigned length = 0;
-  if (EVP_Digest(bytes.data(), bytes.size(), digest.data(), &length, EVP_sha256(), nullptr) != 1)
-    return std::nullopt;
-  return std::string(digest.begin(), digest.begin() + length);
+std::string sha256(std::string_view bytes) {
+  SHA256_CTX state;
+  SHA256_Init(&state);
+  SHA256_Update(&state, reinterpret_cast<const std::uint8_t*>(bytes.data()), bytes.size());
+  std::string digest(SHA256_DIGEST_LENGTH, '\0');
+  SHA256_Final(reinterpret_cast<std::uint8_t*>(digest.data()), &state);
+  return digest;
 }
 
 std::string hexadecimal(std::string_view bytes) {

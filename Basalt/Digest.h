@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <optional>
 #include <string>
 #include <string_view>
 
@@ -9,9 +8,8 @@
 
 namespace Basalt {
 
-/// The SHA-256 digest of the bytes: 32 bytes. Absent when the cryptographic library refuses. Any
-/// thread.
-[[nodiscard]] VARNEL_API std::optional<std::string> sha256(std::string_view bytes);
+/// The SHA-256 digest of the bytes: 32 bytes. Any thread.
+[[nodiscard]] VARNEL_API std::string sha256(std::string_view bytes);
 
 /// Two lower-case hexadecimal digits for each byte. Any thread.
 [[nodiscard]] VARNEL_API std::string hexadecimal(std::string_view bytes);

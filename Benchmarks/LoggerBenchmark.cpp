@@ -89,7 +89,7 @@ Log openRequiredWork(const fs::path& folder) {
   const auto file =
       std::make_shared<File>(std::fopen((folder / "required.log").c_str(), "a"), &std::fclose);
   return [file](const std::string& text) {
-    const auto now = Varnel::Platform::processPorts().clock.now();
+    const auto now = Varnel::Platform::processPorts().clock.get().now();
     fmt::memory_buffer entry;
     fmt::format_to(std::back_inserter(entry), "[{}] {}:  {}\n",
                    Varnel::Logger::logMessageDateFormatter().string(now), author, text);

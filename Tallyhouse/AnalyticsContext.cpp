@@ -17,7 +17,11 @@ AnalyticsContext::AnalyticsContext(Ports ports, std::shared_ptr<AnalyticsTranspo
 }
 
 AnalyticsContext::AnalyticsContext(std::shared_ptr<AnalyticsTransport> transport, Consent consent)
-    : AnalyticsContext({Varnel::Platform::processPorts().clock}, std::move(transport), consent) {}
+    : AnalyticsContext(Varnel::Platform::processPorts(), std::move(transport), consent) {}
+
+AnalyticsContext::AnalyticsContext(const Varnel::Platform::Ports& ports,
+                                   std::shared_ptr<AnalyticsTransport> transport, Consent consent)
+    : AnalyticsContext({.clock = ports.clock}, std::move(transport), consent) {}
 
 void AnalyticsContext::trackEvent(std::string_view category, std::string_view action,
                                   const std::optional<std::string>& label,

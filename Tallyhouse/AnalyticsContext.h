@@ -13,6 +13,7 @@
 
 namespace Varnel::Platform {
 class Clock;
+struct Ports;
 }  // namespace Varnel::Platform
 
 namespace Tallyhouse {
@@ -38,6 +39,9 @@ class VARNEL_API AnalyticsContext final {
 
   /// Without a transport, events go nowhere.
   AnalyticsContext(Ports ports, std::shared_ptr<AnalyticsTransport> transport,
+                   Consent consent = Consent::notAsked);
+  AnalyticsContext(const Varnel::Platform::Ports& ports,
+                   std::shared_ptr<AnalyticsTransport> transport,
                    Consent consent = Consent::notAsked);
   explicit AnalyticsContext(std::shared_ptr<AnalyticsTransport> transport,
                             Consent consent = Consent::notAsked);

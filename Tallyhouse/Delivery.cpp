@@ -9,7 +9,6 @@
 
 namespace Tallyhouse {
 
-using Varnel::Platform::Date;
 using Varnel::Platform::HTTPPost;
 
 namespace {

@@ -11,7 +11,6 @@
 
 namespace Tallyhouse {
 
-using Varnel::Platform::Date;
 using Haste = Delivery::Haste;
 using State = Delivery::State;
 
@@ -63,7 +62,7 @@ void DeliveryWorker::start() {
 
 void DeliveryWorker::wake() {
   const std::lock_guard lock(mutex_);
-  if (recorder_.mustEmpty()) start();
+  if (!thread_.joinable() && recorder_.mustEmpty()) start();
   isWoken_ = true;
   changed_.notify_all();
 }
@@ -96,11 +95,10 @@ std::optional<Date> DeliveryWorker::work(std::unique_lock<std::mutex>& lock) {
   const std::int64_t drainsAsked = drainsAsked_;
   const bool isPaused = isPaused_;
   lock.unlock();
-  const auto unsettled =
-      recorder_.settle(spool_.file(), haste == Haste::none ? EventRecorder::Haste::none
-                                                           : EventRecorder::Haste::usual);
+  const auto unsettled = recorder_.settle(haste == Haste::none ? EventRecorder::Haste::none
+                                                               : EventRecorder::Haste::usual);
   const Delivery::Step step = deliver(haste, isPaused, transfer);
-  const bool areOwnDelivered = this->areOwnDelivered();
+  const bool areOwnDelivered = recorder_.isAllDelivered();
   lock.lock();
   drainsSeen_ = drainsAsked;
   // Otherwise there is more to be had without the server: from this process, from the one that
@@ -122,14 +120,6 @@ Delivery::Step DeliveryWorker::deliver(Haste haste, bool isPaused, std::stop_tok
   const Delivery::Step step = delivery_.step(haste, transfer);
   recorder_.seen(step.waiting);
   return step;
-}
-
-bool DeliveryWorker::areOwnDelivered() {
-  const OwnEvents own = recorder_.own();
-  if (own.first != 0 && !recorder_.isInPlace()) return false;
-  if (!spool_.isDelivered(own)) return false;
-  recorder_.forget(own);
-  return true;
 }
 
 void DeliveryWorker::waitForNext(std::unique_lock<std::mutex>& lock, std::optional<Date> next) {

@@ -56,9 +56,8 @@ class DeliveryWorker final {
   // to be done until something new comes.
   std::optional<Varnel::Platform::Date> work(std::unique_lock<std::mutex>& lock);
   void waitForNext(std::unique_lock<std::mutex>& lock, std::optional<Varnel::Platform::Date> next);
-  // The next two are called without it.
+  // Called without it.
   Delivery::Step deliver(Delivery::Haste haste, bool isPaused, std::stop_token transfer);
-  [[nodiscard]] bool areOwnDelivered();
 
   Varnel::Platform::Clock& clock_;
   EventRecorder& recorder_;

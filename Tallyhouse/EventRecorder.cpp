@@ -5,7 +5,6 @@
 #include <random>
 #include <tuple>
 #include <utility>
-#include <vector>
 
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
@@ -13,26 +12,21 @@
 
 namespace Tallyhouse {
 
-using Varnel::Platform::Date;
-using Varnel::Platform::DurableFile;
-using Varnel::Platform::SQLiteDatabase;
-using Error = std::optional<Varnel::Platform::PlatformError>;
-
 namespace {
 
-Error readEpoch(SQLiteDatabase& database, Date& epoch) {
+Failure readEpoch(SQLiteDatabase& database, Date& epoch) {
   epoch = {};
   return database.row("SELECT epoch FROM state", std::tie(epoch));
 }
 
 // What is forgotten must not be found in the free parts of the file.
-Error empty(SQLiteDatabase& database, Date epoch) {
+Failure empty(SQLiteDatabase& database, Date epoch) {
   if (auto error = database.execute("PRAGMA secure_delete = ON; DELETE FROM event")) return error;
   return database.run(
       "INSERT INTO state(id, epoch) VALUES(1, ?1) ON CONFLICT(id) DO UPDATE SET epoch = ?1", epoch);
 }
 
-Error addDropped(SQLiteDatabase& database, std::int64_t count, std::int64_t lastID) {
+Failure addDropped(SQLiteDatabase& database, std::int64_t count, std::int64_t lastID) {
   return database.run(
       "INSERT INTO state(id, dropped, lost_through) VALUES(1, ?1, ?2) ON CONFLICT(id)"
       " DO UPDATE SET dropped = dropped + ?1, lost_through = max(lost_through, ?2)",
@@ -41,7 +35,7 @@ Error addDropped(SQLiteDatabase& database, std::int64_t count, std::int64_t last
 
 // The event may be there already: a change is made again when the file was replaced meanwhile. Or
 // another process's event has the number.
-Error insertOnce(SQLiteDatabase& database, SpooledEvent& event) {
+Failure insertOnce(SQLiteDatabase& database, SpooledEvent& event) {
   for (;; event.id += idStep) {
     auto error = database.run("INSERT OR IGNORE INTO event(id, date, uuid, hit) VALUES(?, ?, ?, ?)",
                               event.id, event.date, event.uuid, event.hit);
@@ -55,16 +49,14 @@ Error insertOnce(SQLiteDatabase& database, SpooledEvent& event) {
 
 // Other processes write as well, so nobody takes more than an eighth of what is free. A full spool
 // loses a hundredth at a time, so that most events find room without a count.
-Error trim(SQLiteDatabase& database, const SpoolLimits& limits, SpoolRoom& room) {
+Failure trim(SQLiteDatabase& database, const SpoolLimits& limits, SpoolRoom& room) {
   for (;;) {
     std::int64_t events = 0;
     std::int64_t bytes = 0;
-    auto error = database.row("SELECT count(*) FROM event", std::tie(events));
-    if (!error)
-      error = database.row(
-          "SELECT (page_count - freelist_count) * page_size FROM"
-          " pragma_page_count, pragma_freelist_count, pragma_page_size",
-          std::tie(bytes));
+    auto error = database.row(
+        "SELECT (SELECT count(*) FROM event), (page_count - freelist_count) * page_size"
+        " FROM pragma_page_count, pragma_freelist_count, pragma_page_size",
+        std::tie(events, bytes));
     if (error) return error;
     if (events == 0 || (events <= limits.maxEvents && bytes <= limits.maxBytes)) {
       room = {.events = std::max((limits.maxEvents - events) / 8, limits.maxEvents / 100 + 1),
@@ -82,27 +74,7 @@ Error trim(SQLiteDatabase& database, const SpoolLimits& limits, SpoolRoom& room)
 
 }  // namespace
 
-// What could not be done yet, and how it went.
-struct EventRecorder::Work final {
-  std::vector<SpooledEvent> events;
-  std::int64_t lastID = 0;
-  std::int64_t dropped = 0;
-  std::optional<Date> refusal;
-  Date epoch;  ///< The file's, afterwards.
-  SpoolRoom room;
-
-  Error doIn(SQLiteDatabase& database, const SpoolLimits& limits) {
-    auto error = readEpoch(database, epoch);
-    if (!error && refusal)
-      error = empty(database, epoch = std::max(epoch + Date::duration(1), *refusal));
-    for (SpooledEvent& event : events)
-      if (!error && (refusal || epoch <= event.epoch)) error = insertOnce(database, event);
-    if (!error && dropped > 0) error = addDropped(database, dropped, 0);
-    return error ? error : trim(database, limits, room);
-  }
-};
-
-EventRecorder::EventRecorder(Ports ports, std::string path, SpoolLimits limits)
+EventRecorder::EventRecorder(Ports ports, const std::string& path, SpoolLimits limits)
     : ports_(ports),
       path_(path),
       limits_(limits),
@@ -111,64 +83,59 @@ EventRecorder::EventRecorder(Ports ports, std::string path, SpoolLimits limits)
             Varnel::Platform::Migrating::allowed) {}
 
 EventRecorder::~EventRecorder() {
-  settle(file_, Haste::none);
-  if (lastID_ != origin_) static_cast<void>(isInPlace());
+  settle(Haste::none);
+  if (firstID_ != 0) static_cast<void>(isAllDelivered());
   if (!held_.empty())
     ports_.systemLog.write(fmt::format("{} events are lost: {}", held_.size(), path_));
 }
 
 void EventRecorder::begin() {
-  const std::lock_guard atFile(fileMutex_);
-  Date epoch;
-  const auto error =
-      file_.read([&](SQLiteDatabase& database) { return readEpoch(database, epoch); });
   const std::lock_guard lock(mutex_);
-  own_.epoch = error ? ports_.clock.now() : epoch;
+  const auto error =
+      file_.read([&](SQLiteDatabase& database) { return readEpoch(database, epoch_); });
+  if (error) epoch_ = ports_.clock.now();
   isRevoked_ = false;
 }
 
 std::int64_t EventRecorder::append(std::string_view uuid, Date date, std::string_view hit) {
-  const std::lock_guard atFile(fileMutex_);
-  SpooledEvent event = named(uuid, date, hit);
-  if (event.id == 0) return 0;
-  if (mayInsert() && insert(event)) {
-    const std::lock_guard lock(mutex_);
+  const std::lock_guard lock(mutex_);
+  if (isRevoked_) {
+    hasLost_ = true;
+    return 0;
+  }
+  const bool isAlone = held_.empty() && !refusal_;
+  hold(uuid, date, hit);
+  if (isAlone && room_.events > 0 && room_.bytes > 0 && insert(held_.back())) {
+    held_.clear();
     --room_.events;
-    room_.bytes -= static_cast<std::int64_t>(event.hit.size());
+    room_.bytes -= static_cast<std::int64_t>(hit.size());
     return ++waiting_;
   }
-  const std::int64_t held = hold(std::move(event));
-  settle(file_, Haste::usual);
-  return held;
+  if (held_.size() > limits_.maxHeldEvents) {
+    held_.pop_front();
+    ++dropped_;
+    hasLost_ = true;
+  }
+  doAll(Haste::usual);
+  return held_.empty() ? waiting_ : static_cast<std::int64_t>(held_.size());
 }
 
-SpooledEvent EventRecorder::named(std::string_view uuid, Date date, std::string_view hit) {
+void EventRecorder::hold(std::string_view uuid, Date date, std::string_view hit) {
   constexpr std::int64_t maxTime = (std::int64_t{1} << 62) / idStep;
   using Tick = std::chrono::duration<std::int64_t, std::ratio<64, 1'000'000>>;
   const auto time = std::chrono::duration_cast<Tick>(date.time_since_epoch());
   const auto id = std::clamp<std::int64_t>(time.count(), 0, maxTime) * idStep + origin_;
-  const std::lock_guard lock(mutex_);
-  if (isRevoked_) {
-    own_.hasLost = true;
-    return {};
-  }
-  lastID_ = std::max(lastID_ + idStep, id);
-  if (own_.first == 0) own_.first = lastID_;
-  own_.last = lastID_;
-  return {.id = lastID_,
-          .uuid = std::string(uuid),
-          .date = date,
-          .hit = std::string(hit),
-          .refusals = 0,
-          .epoch = own_.epoch};
+  held_.push_back({.id = std::max(lastID_ + idStep, id),
+                   .uuid = std::string(uuid),
+                   .date = date,
+                   .hit = std::string(hit),
+                   .refusals = 0,
+                   .epoch = epoch_});
+  lastID_ = held_.back().id;
+  if (firstID_ == 0) firstID_ = lastID_;
 }
 
-bool EventRecorder::mayInsert() const {
-  const std::lock_guard lock(mutex_);
-  return held_.empty() && !refusal_ && room_.events > 0 && room_.bytes > 0;
-}
-
-// The usual way, for little more than the row itself. Whatever is unusual is left to `settle`.
+// The usual way, for little more than the row itself. Whatever is unusual is left to `doAll`.
 bool EventRecorder::insert(const SpooledEvent& event) {
   bool isInserted = false;
   const auto write = [&](SQLiteDatabase& database) {
@@ -180,89 +147,65 @@ bool EventRecorder::insert(const SpooledEvent& event) {
     return failure;
   };
   // The next event, or the deliverer, looks again at whether the file is in its place.
-  const auto error = file_.changeByOneStatement(write, DurableFile::Looking::eachMillisecond);
-  if (error) {
-    const std::lock_guard lock(mutex_);
+  if (file_.changeByOneStatement(write, DurableFile::Looking::eachMillisecond))
     pause_.failed(ports_.clock.now());
-  }
   return isInserted;
-}
-
-std::int64_t EventRecorder::hold(SpooledEvent event) {
-  const std::lock_guard lock(mutex_);
-  heldBytes_ += event.hit.size();
-  held_.push_back(std::move(event));
-  while (held_.size() > limits_.maxHeldEvents || heldBytes_ > limits_.maxHeldBytes) {
-    heldBytes_ -= held_.front().hit.size();
-    held_.pop_front();
-    ++dropped_;
-    own_.hasLost = true;
-  }
-  return static_cast<std::int64_t>(held_.size());
 }
 
 void EventRecorder::countDropped() {
   const std::lock_guard lock(mutex_);
   ++dropped_;
-  own_.hasLost = true;
+  hasLost_ = true;
 }
 
 void EventRecorder::discard() {
-  const std::lock_guard atFile(fileMutex_);
-  const bool isThere = file_.isThere();
-  {
-    const std::lock_guard lock(mutex_);
-    held_.clear();
-    heldBytes_ = 0;
-    own_ = {};
-    refusal_ = isThere ? std::optional(ports_.clock.now()) : std::nullopt;
-  }
-  settle(file_, Haste::none);
+  const std::lock_guard lock(mutex_);
+  held_.clear();
+  firstID_ = 0;
+  hasLost_ = false;
+  epoch_ = {};
+  refusal_ = file_.isThere() ? std::optional(ports_.clock.now()) : std::nullopt;
+  doAll(Haste::none);
   file_.removeSetAside();
 }
 
-std::optional<Date> EventRecorder::settle(DurableFile& file, Haste haste) {
-  Work work;
-  {
-    const std::lock_guard lock(mutex_);
-    if (!hasWork()) return std::nullopt;
-    const Date now = ports_.clock.now();
-    const bool isTooEarly = haste == Haste::usual && !pause_.isOver(now);
-    if (!isTooEarly) pause_.failed(now);
-    if (isTooEarly || isSettling_) return pause_.end();
-    isSettling_ = true;
-    work.events.assign(held_.begin(), held_.end());
-    work.lastID = lastID_;
-    work.dropped = dropped_;
-    work.refusal = refusal_;
-  }
-  const auto error =
-      file.change([&](SQLiteDatabase& database) { return work.doIn(database, limits_); });
-  // What is forgotten must not be found in the log either.
-  if (!error && work.refusal)
-    static_cast<void>(file.changeByOneStatement([](SQLiteDatabase& database) {
-      return database.execute("PRAGMA wal_checkpoint(TRUNCATE)");
-    }));
+std::optional<Date> EventRecorder::settle(Haste haste) {
   const std::lock_guard lock(mutex_);
-  isSettling_ = false;
-  if (error) return pause_.end();
-  pause_.succeeded();
-  finish(work);
-  return hasWork() ? std::optional(ports_.clock.now()) : std::nullopt;
+  return doAll(haste);
 }
 
-void EventRecorder::finish(const Work& work) {
-  dropped_ -= work.dropped;
-  for (; !held_.empty() && held_.front().id <= work.lastID; held_.pop_front())
-    heldBytes_ -= held_.front().hit.size();
-  if (!work.events.empty()) own_.last = lastID_ = std::max(lastID_, work.events.back().id);
-  waiting_ += static_cast<std::int64_t>(work.events.size());
-  room_ = work.room;
-  if (work.refusal) {
-    if (refusal_ == work.refusal) refusal_.reset();
-    own_.epoch = work.epoch;
+std::optional<Date> EventRecorder::doAll(Haste haste) {
+  if (!refusal_ && held_.empty() && dropped_ == 0) return std::nullopt;
+  if (haste == Haste::usual && !pause_.isOver(ports_.clock.now())) return pause_.end();
+  Date epoch;
+  const auto error = file_.change([&](SQLiteDatabase& database) {
+    auto failure = readEpoch(database, epoch);
+    if (!failure && refusal_)
+      failure = empty(database, epoch = std::max(epoch + Date::duration(1), *refusal_));
+    for (SpooledEvent& event : held_)
+      if (!failure && (refusal_ || epoch <= event.epoch)) failure = insertOnce(database, event);
+    if (!failure && dropped_ > 0) failure = addDropped(database, dropped_, 0);
+    return failure ? failure : trim(database, limits_, room_);
+  });
+  if (error) {
+    pause_.failed(ports_.clock.now());
+    return pause_.end();
   }
-  isRevoked_ = work.epoch > own_.epoch;
+  pause_.succeeded();
+  if (refusal_) {
+    epoch_ = epoch;
+    refusal_.reset();
+    // What is forgotten must not be found in the log either.
+    static_cast<void>(file_.changeByOneStatement([](SQLiteDatabase& database) {
+      return database.execute("PRAGMA wal_checkpoint(TRUNCATE)");
+    }));
+  }
+  isRevoked_ = epoch > epoch_;
+  if (!held_.empty()) lastID_ = held_.back().id;
+  waiting_ += static_cast<std::int64_t>(held_.size());
+  held_.clear();
+  dropped_ = 0;
+  return std::nullopt;
 }
 
 bool EventRecorder::mustEmpty() const {
@@ -281,32 +224,37 @@ void EventRecorder::seen(std::int64_t waiting) {
   waiting_ += waiting;
 }
 
-OwnEvents EventRecorder::own() const {
+bool EventRecorder::isAllDelivered() {
   const std::lock_guard lock(mutex_);
-  OwnEvents own = own_;
-  own.isHeld = !held_.empty();
-  return own;
+  if (hasLost_ || !held_.empty()) return false;
+  if (firstID_ == 0) return true;
+  bool isDelivered = false;
+  // Those that are gone may also have been pushed out, or have been discarded by another process.
+  const auto error = file_.read([&](SQLiteDatabase& database) {
+    return database.row(
+        "SELECT NOT EXISTS (SELECT 1 FROM event WHERE id BETWEEN ?1 AND ?2 AND (id - ?1) % ?4 = 0)"
+        " AND NOT EXISTS (SELECT 1 FROM state WHERE lost_through >= ?1 OR epoch > ?3)",
+        std::tie(isDelivered), firstID_, lastID_, epoch_, idStep);
+  });
+  if (error || !isDelivered) return false;
+  firstID_ = 0;
+  return true;
 }
 
-bool EventRecorder::isInPlace() {
-  const std::lock_guard atFile(fileMutex_);
-  return !file_.read([](SQLiteDatabase&) { return Error(); });
-}
-
-void EventRecorder::forget(const OwnEvents& delivered) {
+SpoolCounts EventRecorder::counts(int maxRefusals) {
   const std::lock_guard lock(mutex_);
-  own_.first = own_.last == delivered.last ? 0 : delivered.last + idStep;
-}
-
-std::int64_t EventRecorder::droppedCount() {
-  const std::lock_guard atFile(fileMutex_);
-  std::int64_t dropped = 0;
-  static_cast<void>(file_.read([&](SQLiteDatabase& database) {
-    dropped = 0;
-    return database.row("SELECT dropped FROM state", std::tie(dropped));
-  }));
-  const std::lock_guard lock(mutex_);
-  return dropped + dropped_;
+  SpoolCounts counts;
+  if (file_.isThere())
+    static_cast<void>(file_.read([&](SQLiteDatabase& database) {
+      counts = {};
+      return database.row(
+          "SELECT (SELECT count(*) FROM event WHERE refusals < ?),"
+          " coalesce((SELECT dropped FROM state), 0)",
+          std::tie(counts.waiting, counts.dropped), maxRefusals);
+    }));
+  counts.held = static_cast<std::int64_t>(held_.size());
+  counts.dropped += dropped_;
+  return counts;
 }
 
 }  // namespace Tallyhouse

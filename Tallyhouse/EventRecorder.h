@@ -8,8 +8,7 @@
 #include <string>
 #include <string_view>
 
-#include <Varnel/Platform/SQLite/DurableFile.h>
-#include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Tallyhouse/SpoolCounts.h>
 #include <Varnel/Tallyhouse/SpoolFormat.h>
 
 namespace Varnel::Platform {
@@ -25,7 +24,6 @@ struct SpoolLimits final {
   std::int64_t maxEvents = 10'000;
   std::int64_t maxBytes = 8 << 20;   ///< Of the file, without what is free in it.
   std::size_t maxHeldEvents = 1000;  ///< In memory, while the file cannot be had.
-  std::size_t maxHeldBytes = 1 << 20;
 };
 
 /// How much may be written before the file's events are counted again.
@@ -34,24 +32,15 @@ struct SpoolRoom final {
   std::int64_t bytes = 0;
 };
 
-/// What a process has recorded and not yet seen delivered: the numbers from first to last.
-struct OwnEvents final {
-  std::int64_t first = 0;  ///< 0: none.
-  std::int64_t last = 0;
-  Varnel::Platform::Date epoch;
-  bool isHeld = false;   ///< Some are not in the file yet.
-  bool hasLost = false;  ///< Some had to be given up.
-};
-
-/// Writes the events of this process into the spool. What it has taken survives the end of the
+/// Writes the events of this process into the spool. What it has written survives the end of the
 /// process, but not always a loss of power.
 ///
 /// While the file cannot be had, be it locked, full, read-only or refused, events are held in
-/// memory, and `settle` writes them as soon as that works. What memory cannot hold is given up, the
-/// oldest first, and counted.
+/// memory, and `append` and `settle` write them as soon as that works. What memory cannot hold is
+/// given up, the oldest first, and counted.
 ///
-/// Any thread. Nothing throws but for want of memory. No operation waits more than 20 ms for
-/// somebody else's lock, and none for `settle`, which works on the file of its caller.
+/// Any thread. Nothing throws but for want of memory. No operation waits more than 20 ms for the
+/// locks of other processes.
 class EventRecorder final {
  public:
   struct Ports {
@@ -60,7 +49,7 @@ class EventRecorder final {
     Varnel::Platform::SystemLog& systemLog;
   };
 
-  EventRecorder(Ports ports, std::string path, SpoolLimits limits);
+  EventRecorder(Ports ports, const std::string& path, SpoolLimits limits);
   /// Tries for the last time to write what is held, and what lies in a spool that was taken away,
   /// and tells the system's log what is lost.
   ~EventRecorder();
@@ -72,7 +61,7 @@ class EventRecorder final {
 
   /// Takes one event. Returns how many wait now where it was put, in the file or in memory, as far
   /// as this process knows; 0 when it was not taken.
-  std::int64_t append(std::string_view uuid, Varnel::Platform::Date date, std::string_view hit);
+  std::int64_t append(std::string_view uuid, Date date, std::string_view hit);
 
   /// Counts an event that could not even be appended.
   void countDropped();
@@ -86,9 +75,8 @@ class EventRecorder final {
     usual,  ///< Not before the pause after the last failure is over.
     none
   };
-  /// Does in `file`, a connection of the caller's, what could not be done yet. Returns when to call
-  /// again; absent when all is done.
-  std::optional<Varnel::Platform::Date> settle(Varnel::Platform::DurableFile& file, Haste haste);
+  /// Does what could not be done yet. Returns when to call again; absent when all is done.
+  std::optional<Date> settle(Haste haste);
 
   /// Whether nothing is to be sent because the spool is not empty yet, though it should be.
   [[nodiscard]] bool mustEmpty() const;
@@ -97,48 +85,38 @@ class EventRecorder final {
   void looking();
   void seen(std::int64_t waiting);
 
-  [[nodiscard]] OwnEvents own() const;
-  /// Whether those, as asked for before, lie where others find them: carries over what was appended
-  /// to a spool that has been taken away.
-  [[nodiscard]] bool isInPlace();
-  /// They were delivered.
-  void forget(const OwnEvents& delivered);
+  /// Whether all that this process has recorded arrived, whoever delivered it. Carries over what
+  /// was appended to a spool that has been taken away.
+  [[nodiscard]] bool isAllDelivered();
 
-  /// Events pushed out by the limits, too large, or given up, since the file was begun.
-  [[nodiscard]] std::int64_t droppedCount();
+  /// Events wait that were refused less than `maxRefusals` times.
+  [[nodiscard]] SpoolCounts counts(int maxRefusals);
 
  private:
-  struct Work;
-
-  [[nodiscard]] SpooledEvent named(std::string_view uuid, Varnel::Platform::Date date,
-                                   std::string_view hit);
-  [[nodiscard]] bool mayInsert() const;
+  // All with the lock held:
+  void hold(std::string_view uuid, Date date, std::string_view hit);
   [[nodiscard]] bool insert(const SpooledEvent& event);
-  std::int64_t hold(SpooledEvent event);
-  [[nodiscard]] bool hasWork() const { return refusal_ || !held_.empty() || dropped_ > 0; }
-  void finish(const Work& work);
+  std::optional<Date> doAll(Haste haste);
 
   const Ports ports_;
   const std::string path_;
   const SpoolLimits limits_;
   const std::int64_t origin_;  ///< The last bits of its events' numbers.
 
-  std::mutex fileMutex_;  ///< Owns the file. Taken before the other mutex.
-  Varnel::Platform::DurableFile file_;
-
-  mutable std::mutex mutex_;  ///< Owns all below. Nobody keeps it while at a file.
+  mutable std::mutex mutex_;  ///< Owns all below, also while it is at the file: so what one thread
+                              ///< holds cannot stay in memory for what another one does there.
+  DurableFile file_;
   std::deque<SpooledEvent> held_;
-  std::size_t heldBytes_ = 0;
-  std::int64_t dropped_ = 0;  ///< Not yet counted in the file.
-  std::optional<Varnel::Platform::Date>
-      refusal_;             ///< Of the user, here, for which the file is not emptied.
-  bool isRevoked_ = false;  ///< Another process has refused since `begin`.
-  bool isSettling_ = false;
+  std::int64_t dropped_ = 0;     ///< Not yet counted in the file.
+  std::optional<Date> refusal_;  ///< Of the user, here, for which the file is not emptied yet.
+  Date epoch_;                   ///< In which it records.
+  bool isRevoked_ = false;       ///< Another process has refused since `begin`.
   Varnel::Platform::GrowingPause pause_ = spoolPause;
   SpoolRoom room_;
   std::int64_t waiting_ = 0;
+  std::int64_t firstID_ = 0;  ///< Of the events that were not yet seen delivered; 0: none.
   std::int64_t lastID_ = origin_;
-  OwnEvents own_;
+  bool hasLost_ = false;  ///< Some had to be given up.
 };
 
 }  // namespace Tallyhouse

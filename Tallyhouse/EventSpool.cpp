@@ -6,21 +6,16 @@
 #include <utility>
 
 #include <Varnel/Platform/Ports/SystemLog.h>
-#include <Varnel/Tallyhouse/EventRecorder.h>
 #include <fmt/format.h>
 
 namespace Tallyhouse {
-
-using Varnel::Platform::Date;
-using Varnel::Platform::SQLiteDatabase;
-using Varnel::Platform::SQLiteStatement;
-using Error = std::optional<Varnel::Platform::PlatformError>;
 
 namespace {
 
 // Work that is done again must find what it did before: so the count of refusals is set, not
 // raised.
-Error settle(SQLiteDatabase& database, const SpooledEvent& event, const DeliveryOutcome& outcome) {
+Failure settle(SQLiteDatabase& database, const SpooledEvent& event,
+               const DeliveryOutcome& outcome) {
   if (outcome.verdict == Verdict::delivered)
     return database.run("DELETE FROM event WHERE id = ? AND uuid = ?", event.id, event.uuid);
   if (outcome.verdict == Verdict::refused)
@@ -51,12 +46,10 @@ std::optional<SpoolOutlook> EventSpool::look(const std::string& server, std::siz
     outlook = {.backlog = {}, .state = {.server = server, .notBefore = {}}};
     auto& [waiting, oldest, refused] = outlook.backlog;
     auto failure = database.row(
-        "SELECT count(*), min(date) FROM"
-        " (SELECT date FROM event WHERE refusals = 0 ORDER BY id LIMIT ?)",
-        std::tie(waiting, oldest), static_cast<std::int64_t>(maxEvents));
-    if (failure) return failure;
-    failure = database.row("SELECT min(refused_at) FROM event WHERE refusals > 0 AND refusals < ?",
-                           std::tie(refused), maxRefusals);
+        "SELECT count(*), min(date),"
+        " (SELECT min(refused_at) FROM event WHERE refusals > 0 AND refusals < ?)"
+        " FROM (SELECT date FROM event WHERE refusals = 0 ORDER BY id LIMIT ?)",
+        std::tie(waiting, oldest, refused), maxRefusals, static_cast<std::int64_t>(maxEvents));
     if (failure) return failure;
     return database.row(
         "SELECT nullif(not_before, 0), obstacle, failures FROM state WHERE server = ?",
@@ -82,7 +75,7 @@ std::vector<SpooledEvent> EventSpool::events(std::string_view which, std::int64_
     std::size_t size = 0;
     return database.each(
         fmt::format("SELECT id, uuid, date, hit, refusals FROM event WHERE {}", which),
-        [&](SQLiteStatement& row) {
+        [&](Varnel::Platform::SQLiteStatement& row) {
           SpooledEvent event;
           row.read(std::tie(event.id, event.uuid, event.date, event.hit, event.refusals));
           size += event.hit.size();
@@ -95,7 +88,7 @@ std::vector<SpooledEvent> EventSpool::events(std::string_view which, std::int64_
 }
 
 bool EventSpool::save(const DeliveryOutcome& outcome) {
-  return !file_.change([&](SQLiteDatabase& database) -> Error {
+  return !file_.change([&](SQLiteDatabase& database) -> Failure {
     for (const SpooledEvent& event : outcome.events)
       if (auto failure = settle(database, event, outcome)) return failure;
     return database.run(
@@ -104,20 +97,6 @@ bool EventSpool::save(const DeliveryOutcome& outcome) {
         outcome.state.server, outcome.state.notBefore.value_or(Date()),
         static_cast<int>(outcome.state.obstacle), outcome.state.failures);
   });
-}
-
-bool EventSpool::isDelivered(const OwnEvents& events) {
-  if (events.isHeld || events.hasLost) return false;
-  if (events.first == 0) return true;
-  bool isDelivered = false;
-  // Those that are gone may also have been pushed out, or have been discarded by another process.
-  const auto error = file_.read([&](SQLiteDatabase& database) {
-    return database.row(
-        "SELECT NOT EXISTS (SELECT 1 FROM event WHERE id BETWEEN ?1 AND ?2 AND (id - ?1) % ?4 = 0)"
-        " AND NOT EXISTS (SELECT 1 FROM state WHERE lost_through >= ?1 OR epoch > ?3)",
-        std::tie(isDelivered), events.first, events.last, events.epoch, idStep);
-  });
-  return !error && isDelivered;
 }
 
 }  // namespace Tallyhouse

@@ -9,22 +9,18 @@
 #include <vector>
 
 #include <Varnel/Platform/Ports/PrivateFiles.h>
-#include <Varnel/Platform/SQLite/DurableFile.h>
-#include <Varnel/Platform/Values/Date.h>
 #include <Varnel/Tallyhouse/DeliveryPolicy.h>
 #include <Varnel/Tallyhouse/SpoolFormat.h>
 
 namespace Tallyhouse {
 
-struct OwnEvents;
-
 /// Where the delivery to a server stands: for all processes that share the spool, and for the next
 /// ones.
 struct DeliveryState final {
   std::string server;
-  std::optional<Varnel::Platform::Date> notBefore;  ///< The end of the pause, if there is one.
-  Obstacle obstacle = Obstacle::network;            ///< Of the last failure.
-  int failures = 0;                                 ///< In a row by this obstacle.
+  std::optional<Date> notBefore;          ///< The end of the pause, if there is one.
+  Obstacle obstacle = Obstacle::network;  ///< Of the last failure.
+  int failures = 0;                       ///< In a row by this obstacle.
 };
 
 /// What a deliverer has to know before it sends.
@@ -37,7 +33,7 @@ struct SpoolOutlook final {
 struct DeliveryOutcome final {
   std::vector<SpooledEvent> events;
   Verdict verdict = Verdict::later;
-  Varnel::Platform::Date date;
+  Date date;
   DeliveryState state;
 };
 
@@ -49,7 +45,7 @@ struct DeliveryOutcome final {
 /// than 20 ms for a lock.
 class EventSpool final {
  public:
-  using Ports = Varnel::Platform::DurableFile::Ports;
+  using Ports = DurableFile::Ports;
 
   EventSpool(Ports ports, std::string path);
 
@@ -73,10 +69,7 @@ class EventSpool final {
   /// Returns whether that is done.
   [[nodiscard]] bool save(const DeliveryOutcome& outcome);
 
-  /// Whether all of them arrived, whoever delivered them.
-  [[nodiscard]] bool isDelivered(const OwnEvents& events);
-
-  [[nodiscard]] Varnel::Platform::DurableFile& file() { return file_; }
+  [[nodiscard]] DurableFile& file() { return file_; }
 
  private:
   [[nodiscard]] std::vector<SpooledEvent> events(std::string_view which, std::int64_t parameter,
@@ -84,7 +77,7 @@ class EventSpool final {
 
   const Ports ports_;
   const std::string path_;
-  Varnel::Platform::DurableFile file_;
+  DurableFile file_;
   bool hasSaid_ = false;
 };
 

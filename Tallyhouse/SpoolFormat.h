@@ -2,13 +2,19 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
 
-#include <Varnel/Platform/SQLite/DurableFormat.h>
+#include <Varnel/Platform/SQLite/DurableFile.h>
 #include <Varnel/Platform/Values/Date.h>
 #include <Varnel/Platform/Values/GrowingPause.h>
 
 namespace Tallyhouse {
+
+using Varnel::Platform::Date;
+using Varnel::Platform::DurableFile;
+using Varnel::Platform::SQLiteDatabase;
+using Failure = std::optional<Varnel::Platform::PlatformError>;  ///< None when it was done.
 
 /// An event in the spool.
 struct SpooledEvent final {
@@ -16,10 +22,10 @@ struct SpooledEvent final {
   /// differs between files, and tells who recorded it.
   std::int64_t id = 0;
   std::string uuid;
-  Varnel::Platform::Date date;
+  Date date;
   std::string hit;
-  int refusals = 0;              ///< How often the server would not have it. 0: it waits in line.
-  Varnel::Platform::Date epoch;  ///< In which it was recorded. Not kept in the file.
+  int refusals = 0;  ///< How often the server would not have it. 0: it waits in line.
+  Date epoch;        ///< In which it was recorded. Not kept in the file.
 };
 
 /// Between two events of one recorder their numbers differ by a multiple of this.

@@ -37,6 +37,7 @@ struct SpoolingTransport::Parts {
   Parts(Ports ports, Configuration configuration)
       : identity{std::move(configuration.trackingID), std::move(configuration.clientID)},
         maxBatchEvents(static_cast<std::int64_t>(configuration.policy.maxBatchEvents)),
+        maxRefusals(configuration.policy.maxRefusals),
         recorder({ports.privateFiles, ports.clock, ports.systemLog}, configuration.spoolPath,
                  {.maxEvents = configuration.maxEvents, .maxBytes = configuration.maxBytes}),
         spool({ports.privateFiles, ports.systemLog}, configuration.spoolPath),
@@ -48,6 +49,7 @@ struct SpoolingTransport::Parts {
 
   const AnalyticsIdentity identity;
   const std::int64_t maxBatchEvents;
+  const int maxRefusals;
   EventRecorder recorder;
   EventSpool spool;
   DeliveryWorker worker;
@@ -61,7 +63,11 @@ std::unique_ptr<SpoolingTransport> SpoolingTransport::make(Ports ports,
 }
 
 std::unique_ptr<SpoolingTransport> SpoolingTransport::make(Configuration configuration) {
-  const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
+  return make(Varnel::Platform::processPorts(), std::move(configuration));
+}
+
+std::unique_ptr<SpoolingTransport> SpoolingTransport::make(const Varnel::Platform::Ports& ports,
+                                                           Configuration configuration) {
   return make({ports.clock, ports.httpClient, ports.privateFiles, ports.systemLog},
               std::move(configuration));
 }
@@ -107,8 +113,8 @@ bool SpoolingTransport::hasDiscardedAll() const {
   return !parts_->recorder.mustEmpty();
 }
 
-std::int64_t SpoolingTransport::droppedCount() const {
-  return parts_->recorder.droppedCount();
+SpoolCounts SpoolingTransport::counts() const {
+  return parts_->recorder.counts(parts_->maxRefusals);
 }
 
 }  // namespace Tallyhouse

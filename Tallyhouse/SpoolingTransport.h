@@ -11,12 +11,14 @@
 #include <Varnel/Platform/Values/URL.h>
 #include <Varnel/Tallyhouse/AnalyticsTransport.h>
 #include <Varnel/Tallyhouse/DeliveryPolicy.h>
+#include <Varnel/Tallyhouse/SpoolCounts.h>
 
 namespace Varnel::Platform {
 class Clock;
 class HTTPClient;
 class PrivateFiles;
 class SystemLog;
+struct Ports;
 }  // namespace Varnel::Platform
 
 namespace Tallyhouse {
@@ -33,7 +35,8 @@ namespace Tallyhouse {
 ///
 /// `accept` costs the insertion of a row and never waits for the network, nor for more than 20 ms
 /// for another process that has the file locked: events that the file does not take now are held in
-/// memory, as far as that is sensible, and written later. Destruction interrupts a transfer, which
+/// memory, as far as that is sensible, and written later; `counts().held` tells whether there are
+/// any. Destruction interrupts a transfer, which
 /// the next run repeats; call `drain` before it where a process is short-lived.
 ///
 /// Processes may share a spool; one of them delivers at a time. When one of them refuses consent,
@@ -62,6 +65,8 @@ class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
   /// None when the endpoint is no https URL (or http, where that is allowed).
   [[nodiscard]] static std::unique_ptr<SpoolingTransport> make(Ports ports,
                                                                Configuration configuration);
+  [[nodiscard]] static std::unique_ptr<SpoolingTransport> make(const Varnel::Platform::Ports& ports,
+                                                               Configuration configuration);
   [[nodiscard]] static std::unique_ptr<SpoolingTransport> make(Configuration configuration);
   ~SpoolingTransport() override;
   SpoolingTransport(const SpoolingTransport&) = delete;
@@ -82,8 +87,8 @@ class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
   /// it is not, and the next `discardAll` tries again.
   [[nodiscard]] bool hasDiscardedAll() const;
 
-  /// Events of all processes that the spool could not hold, since its file was begun.
-  [[nodiscard]] std::int64_t droppedCount() const;
+  /// What waits and what was dropped. Makes no file; counts nothing in one that cannot be read.
+  [[nodiscard]] SpoolCounts counts() const;
 
  private:
   struct Parts;

@@ -36,6 +36,18 @@ function(varnel_uses target)
   set_property(GLOBAL APPEND PROPERTY VARNEL_OUTSIDE_LIBRARIES ${ARGN})
 endfunction()
 
+# varnel_module(TARGET FILE SOURCES SOURCE…): a part of the framework that is loaded when it is first
+# needed (Platform/POSIX/Modules.h), so that only hosts that need it pay for its libraries.
+function(varnel_module target file)
+  cmake_parse_arguments(ARG "" "" "SOURCES" ${ARGN})
+  add_library(${target} MODULE ${ARG_SOURCES})
+  target_include_directories(${target} PRIVATE "${VARNEL_INCLUDE_ROOT}")
+  set_target_properties(${target} PROPERTIES
+    PREFIX "" OUTPUT_NAME "${file}" LIBRARY_OUTPUT_DIRECTORY "${VARNEL_MODULES_OUTPUT_FOLDER}")
+  install(TARGETS ${target} LIBRARY DESTINATION "${VARNEL_LIB_FOLDER}")
+  set_property(GLOBAL APPEND PROPERTY VARNEL_MODULES ${target})
+endfunction()
+
 # varnel_sources(TARGET [PUBLIC_HEADERS …] [SOURCES …]): adds the current folder's files to a floor.
 # Public headers are installed and compiled alone; other headers need no listing.
 function(varnel_sources target)

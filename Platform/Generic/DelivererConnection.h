@@ -4,6 +4,7 @@
 #include <functional>
 #include <memory>
 
+#include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Generic/NotificationHosts.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
 
@@ -11,7 +12,7 @@ namespace Varnel::Platform {
 
 /// The application, as the deliverer's end of a connection calls it. Called on the main thread, and
 /// never within a call of the connection, but for `shouldPresent`.
-class NotificationHost {
+class VARNEL_API NotificationHost {
  public:
   virtual ~NotificationHost() = default;
 
@@ -28,7 +29,7 @@ class NotificationHost {
 ///     connection.changed();
 ///
 /// Main thread only; no operation waits or fails: what cannot be done now is done later.
-class DelivererConnection {
+class VARNEL_API DelivererConnection {
  public:
   using Failure = UserNotificationCenter::Failure;
   using Standing = UserNotificationCenter::Standing;

@@ -4,10 +4,13 @@
 #include <memory>
 #include <string>
 
+#include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Generic/DelivererConnection.h>
-#include <Varnel/Platform/Generic/NotificationDeliverer.h>
+#include <Varnel/Platform/Generic/DelivererPorts.h>
 
 namespace Varnel::Platform {
+
+class NotificationDeliverer;
 
 /// The deliverer of a product's notifications within a process of the product, where no other
 /// program does that.
@@ -16,9 +19,8 @@ namespace Varnel::Platform {
 /// learn from a lock on a file beside the store that one of them is in front. Main thread only.
 class InProcessDeliverer final : public DelivererConnection {
  public:
-  using Ports = NotificationDeliverer::Ports;
-
-  InProcessDeliverer(const Ports& ports, const std::string& storeFile);
+  /// The store's folder is made now.
+  InProcessDeliverer(const DelivererPorts& ports, const std::string& storeFile);
   ~InProcessDeliverer() override;
 
   void setHost(std::weak_ptr<NotificationHost> host, Standing standing) override;
@@ -33,8 +35,12 @@ class InProcessDeliverer final : public DelivererConnection {
  private:
   class Hosts;
 
-  const std::unique_ptr<Hosts> hosts_;
-  NotificationDeliverer deliverer_;
+  void recheck();
+
+  const std::shared_ptr<Hosts> hosts_;
+  const std::unique_ptr<NotificationDeliverer> deliverer_;
+  NotificationServer& server_;
+  bool isAskedToDeliver_ = false;
 };
 
 }  // namespace Varnel::Platform

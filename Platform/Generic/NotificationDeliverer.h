@@ -9,6 +9,7 @@
 #include <string>
 #include <vector>
 
+#include <Varnel/Platform/Generic/DelivererPorts.h>
 #include <Varnel/Platform/Generic/NotificationHosts.h>
 #include <Varnel/Platform/Generic/NotificationStore.h>
 #include <Varnel/Platform/Values/GrowingPause.h>
@@ -16,15 +17,8 @@
 namespace Varnel::Platform {
 
 class Banners;
-class Clock;
+class Calendar;
 class FileLock;
-class MainQueue;
-class NotificationServer;
-class PrivateFiles;
-class SystemLog;
-class TimeZones;
-class UserLocale;
-class WallClockTimer;
 
 /// Delivers the notifications of one product: makes due what its store has planned, asks whether to
 /// show it, and keeps the desktop's banners in step with the store.
@@ -50,17 +44,7 @@ class NotificationDeliverer final {
   /// process is killed.
   static constexpr std::size_t maxOnTheirWay = 20;
 
-  /// All outlive the deliverer. No one else uses the server and the timer.
-  struct Ports {
-    Clock& clock;
-    UserLocale& userLocale;
-    TimeZones& timeZones;
-    MainQueue& mainQueue;
-    PrivateFiles& privateFiles;
-    SystemLog& systemLog;
-    NotificationServer& notificationServer;
-    WallClockTimer& timer;
-  };
+  using Ports = DelivererPorts;
 
   /// What it does, beyond taking away the banners of what was removed.
   enum class Duty {
@@ -100,7 +84,44 @@ class NotificationDeliverer final {
   [[nodiscard]] Result<std::optional<NotificationSource>> source();
 
  private:
+  /// Whether to show a delivery, as its host was asked.
+  struct Question {
+    Date asked;
+    std::optional<bool> answer;
+  };
+
+  [[nodiscard]] Failure deliver();
+  [[nodiscard]] Failure becomeDeliverer(const std::vector<Delivery>& all);
+  void ask(const std::vector<Delivery>& all);
+  void take(std::int64_t number, bool isToShow);
+  [[nodiscard]] bool isOverdue(const Question& question) const;
+  [[nodiscard]] Failure decide();
+  void lookAhead(const std::vector<Delivery>& all);
+  void report(const Failure& failure);
+  void recheckSoon();
+  void tick();
+  void awaitNext();
+  [[nodiscard]] Calendar calendar() const;
+
+  const Ports ports_;
+  const std::string lockFile_;
+  NotificationHosts& hosts_;
+  NotificationStore store_;
+  /// What is called later finds it gone when the deliverer has ended.
+  const std::shared_ptr<Banners> banners_;
+  Duty duty_ = Duty::nothing;
+  std::unique_ptr<FileLock> lock_;
+  std::map<std::int64_t, Question> questions_;  ///< By the number of the delivery, which is due.
+
+  bool isOccupied_ = false;  ///< A recheck is under way.
+  bool isPosted_ = false;    ///< And another one will follow.
+  bool isBehind_ = false;    ///< Something is left that the last recheck should have done.
+  bool isAllDone_ = false;   ///< The store holds nothing to be done, or is not to be used.
+  std::optional<Date> nextPlanned_;
   std::optional<Date> next_;
+  std::string lastReport_;
+  bool isToRetry_ = false;  ///< When the pause is over.
+  GrowingPause pause_{minPause, maxPause};
 };
 
 }  // namespace Varnel::Platform

@@ -2,14 +2,13 @@
 #include <Varnel/Platform/Generic/NotificationStore.h>
 
 #include <algorithm>
-#include <array>
 #include <string_view>
 #include <tuple>
 
+#include <Varnel/Platform/Generic/NotificationRows.h>
 #include <Varnel/Platform/Text/Calendar.h>
 #include <Varnel/Platform/Values/Restorer.h>
 #include <Varnel/Platform/Values/UUID.h>
-#include <fmt/format.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -17,91 +16,14 @@ namespace {
 using Failure = NotificationStore::Failure;
 using enum DeliveryState;
 
-// As they stand in the file, in the order of the enumeration.
-constexpr std::array<const char*, 7> stateNames{"planned", "due",     "hidden", "toShow",
-                                                "shown",   "expired", "removed"};
-
 // The delivered list keeps the latest, because nobody has to remove any. What has yet to be shown
 // stays.
 constexpr std::int64_t maxDelivered = 100;
-
-DurableFormat format() {
-  // Numbers are random, so that rows which were saved from a lost file meet no others.
-  constexpr const char* schema =
-      "CREATE TABLE deliveries (number INTEGER PRIMARY KEY, state TEXT NOT NULL, key TEXT NOT NULL,"
-      " zone TEXT NOT NULL, count INTEGER NOT NULL, banner TEXT, delivered INTEGER,"
-      " identifier TEXT, title TEXT, text TEXT, action TEXT, other TEXT, date INTEGER,"
-      " years INTEGER, months INTEGER, days INTEGER, hours INTEGER, minutes INTEGER,"
-      " seconds INTEGER);"
-      "CREATE UNIQUE INDEX planned ON deliveries (key) WHERE state = 'planned';"
-      "CREATE UNIQUE INDEX delivered ON deliveries (key)"
-      " WHERE state IN ('due', 'hidden', 'toShow', 'shown', 'expired')";
-  return {.subject = "notifications",
-          .applicationID = 0x564e6f74,
-          .version = {.major = 1, .minor = 0},
-          .schema = schema,
-          .migrations = {},
-          .journal = DurableFormat::Journal::rollback,
-          .synchronisation = DurableFormat::Synchronisation::survivesPowerLoss,
-          .tables = {{.name = "deliveries"}}};
-}
-
-constexpr const char* columns =
-    "number, state, key, zone, count, banner, delivered, identifier, title, text, action, other,"
-    " date, years, months, days, hours, minutes, seconds";
-
-/// A delivery as it stands in the table.
-struct Row {
-  Delivery delivery;
-  std::string state;
-  DateComponents interval;  ///< Empty where the notification does not repeat.
-
-  /// In the order of the columns.
-  auto values() {
-    auto& [key, content, zone, count] = delivery.schedule;
-    return std::tie(delivery.number, state, key, zone, count, delivery.banner,
-                    content.actualDeliveryDate, content.identifier, content.title,
-                    content.informativeText, content.actionButtonTitle, content.otherButtonTitle,
-                    content.deliveryDate, interval.year, interval.month, interval.day,
-                    interval.hour, interval.minute, interval.second);
-  }
-};
 
 // A notification is known by its identifier. One without an identifier gets a unique name.
 std::string keyOf(const UserNotification& notification) {
   return notification.identifier ? "identifier " + *notification.identifier
                                  : "unique " + randomUUIDString();
-}
-
-Failure insert(SQLiteDatabase& database, const Delivery& delivery) {
-  static const std::string sql = fmt::format(
-      "INSERT INTO deliveries ({}) VALUES (coalesce(nullif(?, 0), random()), "
-      "?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?)",
-      columns);
-  const auto& interval = delivery.schedule.notification.deliveryRepeatInterval;
-  Row row{.delivery = delivery,
-          .state = stateNames.at(static_cast<std::size_t>(delivery.state)),
-          .interval = interval.value_or(DateComponents())};
-  return std::apply([&](const auto&... values) { return database.run(sql, values...); },
-                    row.values());
-}
-
-// Any content gives a notification. A state of another version is passed over.
-Failure select(SQLiteDatabase& database, const std::vector<DeliveryState>& states,
-               std::vector<Delivery>& found) {
-  static const std::string sql =
-      fmt::format("SELECT {} FROM deliveries ORDER BY delivered DESC, date DESC", columns);
-  found.clear();
-  return database.each(sql, [&](SQLiteStatement& statement) {
-    Row row;
-    statement.read(row.values());
-    const auto name = std::find(stateNames.begin(), stateNames.end(), row.state);
-    row.delivery.state = static_cast<DeliveryState>(name - stateNames.begin());
-    if (std::find(states.begin(), states.end(), row.delivery.state) == states.end()) return;
-    if (row.interval != DateComponents())
-      row.delivery.schedule.notification.deliveryRepeatInterval = row.interval;
-    found.push_back(std::move(row.delivery));
-  });
 }
 
 // Runs a statement, and forgets what is removed and has no banner any more.
@@ -120,7 +42,7 @@ Failure insertDue(SQLiteDatabase& database, Delivery delivery, Date now) {
   const std::string& key = delivery.schedule.key;
   auto error = database.row("SELECT banner " + predecessor, std::tie(delivery.banner), key);
   if (!error) error = database.run("DELETE " + predecessor, key);
-  return error ? error : insert(database, delivery);
+  return error ? error : insertDelivery(database, delivery);
 }
 
 bool changes(const NotificationSchedule& schedule, Date now, const Calendar& calendar) {
@@ -137,7 +59,7 @@ Failure claim(SQLiteDatabase& database, const Delivery& delivery, Date now,
   if (decision.deliveryCount) {
     Delivery next{.schedule = delivery.schedule};
     next.schedule.deliveryCount = *decision.deliveryCount;
-    if (auto error = insert(database, next)) return error;
+    if (auto error = insertDelivery(database, next)) return error;
   }
   if (!decision.isDue) return std::nullopt;
   Delivery claimed = delivery;
@@ -147,8 +69,9 @@ Failure claim(SQLiteDatabase& database, const Delivery& delivery, Date now,
 
 }  // namespace
 
-NotificationStore::NotificationStore(DurableFile::Ports ports, const std::string& file)
-    : file_(ports, file, format(), Migrating::allowed) {}
+NotificationStore::NotificationStore(DurableFile::Ports ports, const std::string& file,
+                                     Migrating migrating)
+    : file_(ports, file, notificationFormat(), migrating) {}
 
 Failure NotificationStore::read(const DurableFile::Work& work) {
   return open_ ? work(*open_) : file_.read(work);
@@ -170,7 +93,8 @@ Failure NotificationStore::change(const std::function<Failure()>& calls) {
 Result<std::vector<Delivery>> NotificationStore::deliveries(
     const std::vector<DeliveryState>& states) {
   std::vector<Delivery> found;
-  if (auto error = read([&](SQLiteDatabase& database) { return select(database, states, found); }))
+  if (auto error =
+          read([&](SQLiteDatabase& database) { return selectDeliveries(database, states, found); }))
     return *error;
   return found;
 }
@@ -184,7 +108,7 @@ Failure NotificationStore::plan(const UserNotification& notification, Date now,
   return write([&](SQLiteDatabase& database) {
     auto error = database.run("DELETE FROM deliveries WHERE key = ? AND state = 'planned'",
                               delivery.schedule.key);
-    return error ? error : insert(database, delivery);
+    return error ? error : insertDelivery(database, delivery);
   });
 }
 
@@ -197,7 +121,7 @@ Failure NotificationStore::claimDue(Date now, const Calendar& calendar) {
     return std::nullopt;
   return write([&](SQLiteDatabase& database) -> Failure {
     std::vector<Delivery> present;
-    if (auto error = select(database, {planned}, present)) return error;
+    if (auto error = selectDeliveries(database, {planned}, present)) return error;
     for (const Delivery& each : present)
       if (changes(each.schedule, now, calendar))
         if (auto error = claim(database, each, now, calendar)) return error;
@@ -211,19 +135,27 @@ Failure NotificationStore::makeDue(const UserNotification& notification, Date no
   return write([&](SQLiteDatabase& database) { return insertDue(database, delivery, now); });
 }
 
-Failure NotificationStore::decideDue(const std::vector<std::pair<std::int64_t, bool>>& isToShow) {
-  return write([&](SQLiteDatabase& database) -> Failure {
-    for (const auto& [number, shows] : isToShow)
-      if (auto error =
-              database.run("UPDATE deliveries SET state = ? WHERE number = ? AND state = 'due'",
-                           std::string_view(shows ? "toShow" : "hidden"), number))
-        return error;
+Result<std::vector<Delivery>> NotificationStore::decideDue(
+    const std::map<std::int64_t, bool>& decisions) {
+  std::vector<Delivery> decided;
+  const auto error = write([&](SQLiteDatabase& database) -> Failure {
+    if (auto failure = selectDeliveries(database, {due}, decided)) return failure;
+    std::erase_if(decided, [&](const Delivery& each) { return !decisions.contains(each.number); });
+    std::reverse(decided.begin(), decided.end());
+    for (Delivery& each : decided) {
+      each.state = decisions.at(each.number) ? toShow : hidden;
+      if (auto failure = database.run("UPDATE deliveries SET state = ? WHERE number = ?",
+                                      nameOf(each.state), each.number))
+        return failure;
+    }
     return update(database,
                   "UPDATE deliveries SET state = 'removed' WHERE number IN (SELECT number"
                   " FROM deliveries WHERE state IN ('hidden', 'shown', 'expired')"
                   " ORDER BY delivered DESC, date DESC LIMIT -1 OFFSET ?)",
                   maxDelivered);
   });
+  if (error) return *error;
+  return decided;
 }
 
 Result<bool> NotificationStore::noteShown(std::int64_t number, const std::string& banner) {
@@ -249,10 +181,65 @@ Failure NotificationStore::noteGone(std::int64_t number) {
   });
 }
 
+Failure NotificationStore::noteAllExpired() {
+  const auto known = deliveries({shown});
+  if (!known) return known.error();
+  if (known->empty()) return std::nullopt;
+  return write([](SQLiteDatabase& database) {
+    return database.run("UPDATE deliveries SET state = 'expired' WHERE state = 'shown'");
+  });
+}
+
 Failure NotificationStore::remove(std::int64_t number) {
   return write([&](SQLiteDatabase& database) {
     return update(database, "UPDATE deliveries SET state = 'removed' WHERE number = ?", number);
   });
+}
+
+Failure NotificationStore::keepSource(const NotificationSource& source) {
+  const auto known = this->source();
+  if (!known) return known.error();
+  if (*known == source) return std::nullopt;
+  return write([&](SQLiteDatabase& database) { return replaceSource(database, source); });
+}
+
+Result<std::optional<NotificationSource>> NotificationStore::source() {
+  std::optional<NotificationSource> found;
+  if (auto error = read([&](SQLiteDatabase& database) { return selectSource(database, found); }))
+    return *error;
+  return found;
+}
+
+Failure NotificationStore::keepLaunch(const UserNotification& notification, Date now) {
+  return write([&](SQLiteDatabase& database) {
+    return insertLaunch(database, {notification, now});
+  });
+}
+
+Result<std::optional<UserNotification>> NotificationStore::takeLaunch(Date now) {
+  std::vector<Launch> launches;
+  const DurableFile::Work look = [&](SQLiteDatabase& database) {
+    return selectLaunches(database, launches);
+  };
+  // A host looks at each start, and there is seldom one.
+  if (auto error = read(look)) return *error;
+  std::optional<UserNotification> taken;
+  if (launches.empty()) return taken;
+  const auto error = write([&](SQLiteDatabase& database) -> Failure {
+    taken.reset();
+    if (auto failure = look(database)) return failure;
+    for (const Launch& each : launches) {
+      if (taken) break;
+      if (auto failure = database.run("DELETE FROM launches WHERE number = ?", each.number))
+        return failure;
+      // A clock that was set back may have made it one of the future.
+      if (each.clicked > now - maxLaunchAge && each.clicked < now + maxLaunchAge)
+        taken = each.notification;
+    }
+    return std::nullopt;
+  });
+  if (error) return *error;
+  return taken;
 }
 
 }  // namespace Varnel::Platform

@@ -1,46 +1,25 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <cstdint>
 #include <functional>
+#include <map>
 #include <optional>
 #include <string>
-#include <utility>
 #include <vector>
 
-#include <Varnel/Platform/Generic/NotificationSchedule.h>
+#include <Varnel/Platform/Generic/Delivery.h>
 #include <Varnel/Platform/SQLite/DurableFile.h>
-#include <Varnel/Platform/Values/UserNotification.h>
+#include <Varnel/Platform/Values/NotificationSource.h>
 
 namespace Varnel::Platform {
 
 class Calendar;
 
-/// Where a delivery stands. Only planned ones have a date ahead; the delivered list is hidden,
-/// toShow, shown and expired.
-enum class DeliveryState {
-  planned,
-  due,      ///< Its date has come; whether to show it has yet to be asked.
-  hidden,   ///< Delivered without a banner, for good.
-  toShow,   ///< Delivered; its banner has yet to come.
-  shown,    ///< Its banner has come.
-  expired,  ///< Its banner has gone by itself, or with a click.
-  removed   ///< It counts no more; its banner has yet to be closed.
-};
-
-/// One delivery of a notification. A plain value.
-struct Delivery final {
-  std::int64_t number = 0;  ///< Names it, for ever.
-  DeliveryState state = DeliveryState::planned;
-  NotificationSchedule schedule;
-  /// The server's reference of its banner. Until that is shown, and in a hidden one: of the banner
-  /// of its predecessor, which it replaces.
-  std::optional<std::string> banner = std::nullopt;
-};
-
 /// What a product's notification center remembers: every delivery that is planned, and every one
-/// that was made and has not been removed. It knows nothing of the running application, so that any
-/// program of the product may deliver.
+/// that was made and has not been removed; who the product is; and the clicks for which it is being
+/// started. It knows nothing of the running application, so that another program may deliver.
 ///
 ///     store.claimDue(now, calendar);
 ///     auto due = store.deliveries({DeliveryState::due});
@@ -52,7 +31,10 @@ class NotificationStore final {
  public:
   using Failure = std::optional<PlatformError>;  ///< None when it was done.
 
-  NotificationStore(DurableFile::Ports ports, const std::string& file);
+  /// A click is kept no longer, because whoever starts later did not start for it.
+  static constexpr std::chrono::minutes maxLaunchAge{5};
+
+  NotificationStore(DurableFile::Ports ports, const std::string& file, Migrating migrating);
 
   /// Does the calls on this store as one. They may be run more than once. What they throw comes out
   /// of this, and nothing is changed.
@@ -69,15 +51,27 @@ class NotificationStore final {
   [[nodiscard]] Failure claimDue(Date now, const Calendar& calendar);
   /// Makes a notification due that was not planned.
   [[nodiscard]] Failure makeDue(const UserNotification& notification, Date now);
-  /// Decides of due deliveries: each is to be shown, or is hidden.
-  [[nodiscard]] Failure decideDue(const std::vector<std::pair<std::int64_t, bool>>& isToShow);
+  /// Decides of due deliveries, by their numbers: each is to be shown, or is hidden. Returns those
+  /// that were due still, the earliest first.
+  [[nodiscard]] Result<std::vector<Delivery>> decideDue(const std::map<std::int64_t, bool>& toShow);
 
   /// Notes the banner of a delivery. False when the delivery has been removed meanwhile.
   [[nodiscard]] Result<bool> noteShown(std::int64_t number, const std::string& banner);
   /// Notes that there is no banner any more.
   [[nodiscard]] Failure noteGone(std::int64_t number);
+  /// Notes that whoever showed banners has ended, and hears of no click on them any more.
+  [[nodiscard]] Failure noteAllExpired();
   /// Forgets the delivery, once its banner is gone if it has one.
   [[nodiscard]] Failure remove(std::int64_t number);
+
+  /// Keeps who plans here. Without a change, nothing is written.
+  [[nodiscard]] Failure keepSource(const NotificationSource& source);
+  [[nodiscard]] Result<std::optional<NotificationSource>> source();
+
+  /// Keeps a click for the application, which is not running.
+  [[nodiscard]] Failure keepLaunch(const UserNotification& notification, Date now);
+  /// The earliest such click, for one taker alone.
+  [[nodiscard]] Result<std::optional<UserNotification>> takeLaunch(Date now);
 
  private:
   [[nodiscard]] Failure read(const DurableFile::Work& work);

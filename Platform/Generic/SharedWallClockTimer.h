@@ -6,6 +6,7 @@
 #include <optional>
 #include <set>
 
+#include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Ports/WallClockTimer.h>
 
 namespace Varnel::Platform {
@@ -19,7 +20,7 @@ class Clock;
 ///     retries->arm(clock.now() + 1s);
 ///
 /// Main thread only. It outlives its shares.
-class SharedWallClockTimer final {
+class VARNEL_API SharedWallClockTimer final {
  public:
   /// Clock and timer outlive this. No one else uses the timer.
   SharedWallClockTimer(const Clock& clock, WallClockTimer& timer);

@@ -96,6 +96,8 @@ Result<std::unique_ptr<FileLock>> ReplacedFile::lock() {
 }
 
 std::optional<PlatformError> ReplacedFile::replace(std::string_view text) {
+  // Nobody could read it again, nor change it.
+  if (text.size() > maxSize) return failure(std::make_error_code(std::errc::file_too_large));
   const auto path = files_.prepare(path_);
   if (!path) return path.error();
   const std::string half = *path + ".new";

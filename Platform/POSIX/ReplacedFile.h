@@ -36,7 +36,8 @@ class ReplacedFile final {
   /// Waits up to a second for whoever has the lock, then fails with `timed_out`.
   [[nodiscard]] Result<std::unique_ptr<FileLock>> lock();
 
-  /// With the lock held: nothing when the new text is on the disk, else why not.
+  /// With the lock held: nothing when the new text is on the disk, else why not. More than 1 MiB is
+  /// refused (`file_too_large`).
   [[nodiscard]] std::optional<PlatformError> replace(std::string_view text);
   [[nodiscard]] std::optional<PlatformError> setAside();
 

@@ -26,6 +26,7 @@ class VARNEL_API AppendFile {
 class VARNEL_API AppendFiles {
  public:
   virtual ~AppendFiles() = default;
+  AppendFiles& operator=(const AppendFiles&) = delete;
 
   /// Opens the file, and creates it readable and writable by its owner alone (0600) when missing.
   [[nodiscard]] virtual Result<std::unique_ptr<AppendFile>, std::error_code> open(

@@ -9,6 +9,7 @@ namespace Varnel::Platform {
 class VARNEL_API Application {
  public:
   virtual ~Application() = default;
+  Application& operator=(const Application&) = delete;
 
   /// Whether the application is in front. Where the system does not tell, the answer is no until
   /// the host calls `setActive`.

@@ -12,6 +12,7 @@ namespace Varnel::Platform {
 class VARNEL_API Clock {
  public:
   virtual ~Clock() = default;
+  Clock& operator=(const Clock&) = delete;
 
   /// The present moment; it jumps when the user sets the clock.
   [[nodiscard]] virtual Date now() const = 0;

@@ -23,6 +23,7 @@ struct Cookie {
 class VARNEL_API CookieStorage {
  public:
   virtual ~CookieStorage() = default;
+  CookieStorage& operator=(const CookieStorage&) = delete;
 
   /// Whether applications of a group can share a store.
   [[nodiscard]] virtual bool hasGroupContainers() const = 0;

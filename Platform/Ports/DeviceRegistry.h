@@ -41,6 +41,7 @@ class VARNEL_API DeviceRegistry {
   using Entries = std::vector<std::unique_ptr<RegistryEntry>>;
 
   virtual ~DeviceRegistry() = default;
+  DeviceRegistry& operator=(const DeviceRegistry&) = delete;
 
   /// The entries whose own property `name` has this value, in the registry's order. Absent when the
   /// registry cannot be read.

@@ -23,6 +23,7 @@ class VARNEL_API DiskArbitration {
   };
 
   virtual ~DiskArbitration() = default;
+  DiskArbitration& operator=(const DiskArbitration&) = delete;
 
   /// Null when the service cannot be reached.
   [[nodiscard]] virtual std::unique_ptr<Session> openSession() = 0;

@@ -14,6 +14,7 @@ namespace Varnel::Platform {
 class VARNEL_API ExtendedAttributes {
  public:
   virtual ~ExtendedAttributes() = default;
+  ExtendedAttributes& operator=(const ExtendedAttributes&) = delete;
 
   /// The bytes of the attribute `name` of the file or folder at `path`; symbolic links are
   /// followed. Absent when the file has no such attribute. Failed (generic category) when the file

@@ -35,6 +35,7 @@ struct HTTPFailure final {
 class VARNEL_API HTTPClient {
  public:
   virtual ~HTTPClient() = default;
+  HTTPClient& operator=(const HTTPClient&) = delete;
 
   /// Posts and waits for the answer: for some 30 seconds, or until `stop` is requested. The
   /// server's certificate must be good. Redirections are not followed. The final status, once it

@@ -16,6 +16,7 @@ namespace Varnel::Platform {
 class VARNEL_API MachineIdentity {
  public:
   virtual ~MachineIdentity() = default;
+  MachineIdentity& operator=(const MachineIdentity&) = delete;
 
   /// A property of the machine as a whole: "IOPlatformUUID" or "IOPlatformSerialNumber". Absent
   /// when the machine has none or hides it.

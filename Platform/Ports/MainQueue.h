@@ -21,6 +21,7 @@ class VARNEL_API MainQueue {
   using Block = std::function<void()>;
 
   virtual ~MainQueue() = default;
+  MainQueue& operator=(const MainQueue&) = delete;
 
   /// Runs `block` on the main thread, later: never within this call, and behind every block that
   /// was posted before. Any thread.

@@ -57,6 +57,7 @@ class VARNEL_API NotificationServer {
   };
 
   virtual ~NotificationServer() = default;
+  NotificationServer& operator=(const NotificationServer&) = delete;
 
   virtual void setObserver(std::weak_ptr<Observer> observer) = 0;
 

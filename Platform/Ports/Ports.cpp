@@ -16,36 +16,6 @@ const Ports* choose(const Ports* ports) {
 
 }  // namespace
 
-Ports Ports::withStandardOutput(StandardOutput& output) const {
-  return {
-      .appendFiles = appendFiles,
-      .application = application,
-      .applicationStorage = applicationStorage,
-      .clock = clock,
-      .cookieStorage = cookieStorage,
-      .deviceRegistry = deviceRegistry,
-      .diskArbitration = diskArbitration,
-      .extendedAttributes = extendedAttributes,
-      .httpClient = httpClient,
-      .machineIdentity = machineIdentity,
-      .mainQueue = mainQueue,
-      .privateFiles = privateFiles,
-      .processInfo = processInfo,
-      .processLauncher = processLauncher,
-      .readingPriority = readingPriority,
-      .securityScope = securityScope,
-      .soundPlayer = soundPlayer,
-      .standardOutput = output,
-      .systemLog = systemLog,
-      .timeZones = timeZones,
-      .userAccount = userAccount,
-      .userLocale = userLocale,
-      .userNotificationCenters = userNotificationCenters,
-      .volumeCatalog = volumeCatalog,
-      .workspace = workspace,
-  };
-}
-
 const Ports& processPorts() {
   if (const Ports* ports = chosenPorts.load()) return *ports;
   return *choose(&systemPorts());

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
+
 #include <Varnel/Platform/Api.h>
 
 namespace Varnel::Platform {
@@ -31,41 +33,42 @@ class UserNotificationCenters;
 class VolumeCatalog;
 class Workspace;
 
-/// One service of each kind. The objects behind the references outlive all their users; those of
-/// the process are never destroyed.
+/// One service of each kind. Assigning to a member puts another service in the place of that one;
+/// the others stay. The objects behind the references outlive all their users; those of the process
+/// are never destroyed.
 ///
 ///     static auto& clock = *new MyClock();  // a host's own service among the system's
-///     const Ports& system = systemPorts();
-///     if (!installProcessPorts({.appendFiles = system.appendFiles, .clock = clock, …})) return 1;
+///     Ports ports = systemPorts();
+///     ports.clock = clock;
+///     if (!installProcessPorts(ports)) return 1;
+///     …
+///     processPorts().clock.get().now()
 struct Ports {
-  AppendFiles& appendFiles;
-  Application& application;
-  ApplicationStorage& applicationStorage;
-  Clock& clock;
-  CookieStorage& cookieStorage;
-  DeviceRegistry& deviceRegistry;
-  DiskArbitration& diskArbitration;
-  ExtendedAttributes& extendedAttributes;
-  HTTPClient& httpClient;
-  MachineIdentity& machineIdentity;
-  MainQueue& mainQueue;
-  PrivateFiles& privateFiles;
-  ProcessInfo& processInfo;
-  ProcessLauncher& processLauncher;
-  ReadingPriority& readingPriority;
-  SecurityScope& securityScope;
-  SoundPlayer& soundPlayer;
-  StandardOutput& standardOutput;
-  SystemLog& systemLog;
-  TimeZones& timeZones;
-  UserAccount& userAccount;
-  UserLocale& userLocale;
-  UserNotificationCenters& userNotificationCenters;
-  VolumeCatalog& volumeCatalog;
-  Workspace& workspace;
-
-  /// The same services with another standard output.
-  [[nodiscard]] VARNEL_API Ports withStandardOutput(StandardOutput& output) const;
+  std::reference_wrapper<AppendFiles> appendFiles;
+  std::reference_wrapper<Application> application;
+  std::reference_wrapper<ApplicationStorage> applicationStorage;
+  std::reference_wrapper<Clock> clock;
+  std::reference_wrapper<CookieStorage> cookieStorage;
+  std::reference_wrapper<DeviceRegistry> deviceRegistry;
+  std::reference_wrapper<DiskArbitration> diskArbitration;
+  std::reference_wrapper<ExtendedAttributes> extendedAttributes;
+  std::reference_wrapper<HTTPClient> httpClient;
+  std::reference_wrapper<MachineIdentity> machineIdentity;
+  std::reference_wrapper<MainQueue> mainQueue;
+  std::reference_wrapper<PrivateFiles> privateFiles;
+  std::reference_wrapper<ProcessInfo> processInfo;
+  std::reference_wrapper<ProcessLauncher> processLauncher;
+  std::reference_wrapper<ReadingPriority> readingPriority;
+  std::reference_wrapper<SecurityScope> securityScope;
+  std::reference_wrapper<SoundPlayer> soundPlayer;
+  std::reference_wrapper<StandardOutput> standardOutput;
+  std::reference_wrapper<SystemLog> systemLog;
+  std::reference_wrapper<TimeZones> timeZones;
+  std::reference_wrapper<UserAccount> userAccount;
+  std::reference_wrapper<UserLocale> userLocale;
+  std::reference_wrapper<UserNotificationCenters> userNotificationCenters;
+  std::reference_wrapper<VolumeCatalog> volumeCatalog;
+  std::reference_wrapper<Workspace> workspace;
 };
 
 /// The process's own services: those of the system, unless the host installed others before the

@@ -46,6 +46,7 @@ inline constexpr std::string_view privateFileRefusalDomain = "PrivateFile";
 class VARNEL_API PrivateFiles {
  public:
   virtual ~PrivateFiles() = default;
+  PrivateFiles& operator=(const PrivateFiles&) = delete;
 
   /// Makes missing folders (0700) and, if it is missing, the file (0600, empty), and returns the
   /// absolute path to open it by, with no link in it. Links among the folders are followed. Refused

@@ -22,6 +22,7 @@ struct OperatingSystemVersion final {
 class VARNEL_API ProcessInfo {
  public:
   virtual ~ProcessInfo() = default;
+  ProcessInfo& operator=(const ProcessInfo&) = delete;
 
   /// The value of an environment variable; absent when it is not set, empty when set to nothing.
   [[nodiscard]] virtual std::optional<std::string> environmentVariable(

@@ -31,6 +31,7 @@ class VARNEL_API LaunchedProcess {
 class VARNEL_API ProcessLauncher {
  public:
   virtual ~ProcessLauncher() = default;
+  ProcessLauncher& operator=(const ProcessLauncher&) = delete;
 
   /// Starts the program at `path`. It inherits only the environment and standard error; its input
   /// is an open pipe without any data. The output pipe is as large as the system allows: a program

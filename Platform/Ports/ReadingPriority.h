@@ -20,6 +20,7 @@ class VARNEL_API ReadingPriority {
   using Level = int;
 
   virtual ~ReadingPriority() = default;
+  ReadingPriority& operator=(const ReadingPriority&) = delete;
 
   /// The calling thread's level; absent where the system tells none.
   [[nodiscard]] virtual std::optional<Level> current() = 0;

@@ -10,6 +10,7 @@ namespace Varnel::Platform {
 class VARNEL_API SecurityScope {
  public:
   virtual ~SecurityScope() = default;
+  SecurityScope& operator=(const SecurityScope&) = delete;
 
   /// Opens the gate for a file or folder; false when the process may not read it. Every success
   /// needs one `stopAccessing`.

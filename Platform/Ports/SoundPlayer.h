@@ -47,6 +47,7 @@ class VARNEL_API PlayableSound {
 class VARNEL_API SoundPlayer {
  public:
   virtual ~SoundPlayer() = default;
+  SoundPlayer& operator=(const SoundPlayer&) = delete;
 
   /// The sound in a file with these bytes. Null when they do not begin like a sound, or when there
   /// is a missing part. All other faults show only when the sound is played, because nothing here

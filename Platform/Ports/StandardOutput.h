@@ -12,6 +12,7 @@ namespace Varnel::Platform {
 class VARNEL_API StandardOutput {
  public:
   virtual ~StandardOutput() = default;
+  StandardOutput& operator=(const StandardOutput&) = delete;
 
   /// Prints the text as it is, with no terminator. Texts of different threads never mix. A stream
   /// that is closed or full, or whose reader has gone, loses the text without a report or a signal.
@@ -21,8 +22,9 @@ class VARNEL_API StandardOutput {
 
 /// Prints on standard error instead, for hosts whose standard output is their result alone:
 ///
-///     static StandardOutput& errorOutput = *makeStandardErrorOutput().release();
-///     if (!installProcessPorts(systemPorts().withStandardOutput(errorOutput))) return 1;
+///     Ports ports = systemPorts();
+///     ports.standardOutput = *makeStandardErrorOutput().release();
+///     if (!installProcessPorts(ports)) return 1;
 ///
 /// The pointer is released because destructors may log until the process has ended.
 [[nodiscard]] VARNEL_API std::unique_ptr<StandardOutput> makeStandardErrorOutput();

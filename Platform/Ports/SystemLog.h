@@ -11,6 +11,7 @@ namespace Varnel::Platform {
 class VARNEL_API SystemLog {
  public:
   virtual ~SystemLog() = default;
+  SystemLog& operator=(const SystemLog&) = delete;
 
   /// Writes one line, without terminator. Never fails visibly.
   virtual void write(std::string_view line) = 0;

@@ -38,6 +38,7 @@ class VARNEL_API TimeZone {
 class VARNEL_API TimeZones {
  public:
   virtual ~TimeZones() = default;
+  TimeZones& operator=(const TimeZones&) = delete;
 
   /// The user's present zone: its name in the time zone database ("Europe/Vienna"), or another text
   /// that `zone` understands.

@@ -30,23 +30,27 @@ class VARNEL_API TracelessReader final {
 
   /// Reads as many bytes from `offset` on as the buffer holds, or fewer; 0 at the end of the file.
   /// Fails with the system's error (generic category).
-  [[nodiscard]] Result<std::size_t, std::error_code> read(std::span<std::byte> buffer,
-                                                          std::uint64_t offset);
+  using Count = Result<std::size_t, std::error_code>;
+  [[nodiscard]] Count read(std::span<std::byte> buffer, std::uint64_t offset);
 
  private:
-  /// Part of the file. A size of 0 reaches to the end.
   struct Range {
     std::uint64_t offset;
     std::uint64_t size;
   };
-  enum class Giver { undecided, system, self };
+  /// How it reads, from the best way to the one that always works.
+  enum class Way {
+    droppingBehind,  ///< The system gives back.
+    fromCache,       ///< So far all was in the cache.
+    noting,          ///< This has noted what to give back.
+  };
 
+  [[nodiscard]] Count readWith(int flags, std::span<std::byte> buffer, std::uint64_t offset) const;
   void noteAbsentRanges();
-  void noteAbsentRanges(std::uint64_t fileSize);
 
   const int descriptor_;
-  Giver giver_ = Giver::undecided;  ///< Who gives back.
-  std::vector<Range> absent_;       ///< What was not in the cache before, if this gives back.
+  Way way_ = Way::droppingBehind;
+  std::vector<Range> absent_;  ///< What was not in the cache before.
 };
 
 }  // namespace Varnel::Platform

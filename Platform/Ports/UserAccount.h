@@ -12,6 +12,7 @@ namespace Varnel::Platform {
 class VARNEL_API UserAccount {
  public:
   virtual ~UserAccount() = default;
+  UserAccount& operator=(const UserAccount&) = delete;
 
   /// What "~" stands for. The environment or a sandbox may have moved it away from the real home,
   /// though never to a relative path.

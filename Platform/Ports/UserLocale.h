@@ -12,6 +12,7 @@ namespace Varnel::Platform {
 class VARNEL_API UserLocale {
  public:
   virtual ~UserLocale() = default;
+  UserLocale& operator=(const UserLocale&) = delete;
 
   /// The languages the user prefers, best first, as BCP 47 tags ("en-US"); never empty.
   [[nodiscard]] virtual std::vector<std::string> languages() const = 0;

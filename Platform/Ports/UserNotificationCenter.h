@@ -55,6 +55,7 @@ class VARNEL_API UserNotificationCenter {
   };
 
   virtual ~UserNotificationCenter() = default;
+  UserNotificationCenter& operator=(const UserNotificationCenter&) = delete;
 
   /// The only listener from now on; held weakly. Notifications that came due earlier are delivered
   /// now. Without a delegate nothing comes due, and what is scheduled waits.
@@ -118,6 +119,7 @@ class VARNEL_API UserNotificationCenter {
 class VARNEL_API UserNotificationCenters {
  public:
   virtual ~UserNotificationCenters() = default;
+  UserNotificationCenters& operator=(const UserNotificationCenters&) = delete;
 
   /// The center of the product with the source's identifier, always the same one; it lives as long
   /// as this object, and shows the source that it was first asked for with. A system that gives

@@ -15,10 +15,10 @@ namespace Varnel::Platform {
 
 /// A mounted volume. A fact that the system does not tell is absent.
 struct MountedVolume {
-  URL url;                         ///< The folder it is mounted on; its path ends with "/".
-  std::optional<bool> isLocal;     ///< False for network file systems.
-  std::optional<bool> isInternal;  ///< False for media that the user can take away.
-  std::optional<std::string> uuid;
+  URL url;                              ///< The folder it is mounted on; its path ends with "/".
+  std::optional<bool> isLocal = {};     ///< False for network file systems.
+  std::optional<bool> isInternal = {};  ///< False for media that the user can take away.
+  std::optional<std::string> uuid = {};
 
   bool operator==(const MountedVolume&) const = default;
 };
@@ -44,6 +44,7 @@ class VARNEL_API VolumeCatalog {
   };
 
   virtual ~VolumeCatalog() = default;
+  VolumeCatalog& operator=(const VolumeCatalog&) = delete;
 
   /// All mounted volumes in the system's order, without the kernel's own pseudo file systems.
   [[nodiscard]] virtual std::vector<MountedVolume> mountedVolumes() = 0;

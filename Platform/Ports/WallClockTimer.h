@@ -14,6 +14,7 @@ namespace Varnel::Platform {
 class VARNEL_API WallClockTimer {
  public:
   virtual ~WallClockTimer() = default;
+  WallClockTimer& operator=(const WallClockTimer&) = delete;
 
   /// The handler is called on the main thread and never within `arm`: at the date or soon after it,
   /// and whenever the clock was set while the timer was armed. The timer is disarmed by then.

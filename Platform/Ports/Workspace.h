@@ -13,6 +13,7 @@ namespace Varnel::Platform {
 class VARNEL_API Workspace {
  public:
   virtual ~Workspace() = default;
+  Workspace& operator=(const Workspace&) = delete;
 
   /// Where the application with this bundle identifier is: its bundle folder where it has one, else
   /// its executable. Identifiers are compared exactly. Absent when none is installed.

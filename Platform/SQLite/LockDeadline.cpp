@@ -7,24 +7,21 @@
 namespace Varnel::Platform {
 namespace {
 
-constexpr std::chrono::microseconds minPause{100};
 constexpr std::chrono::microseconds maxPause{1000};
 
 }  // namespace
 
 void LockDeadline::restart() {
-  next_ = {};
+  left_ = max_;
+  next_ = minPause;
 }
 
 bool LockDeadline::pause() {
-  const auto now = Clock::now();
-  if (next_ == std::chrono::microseconds::zero()) {
-    next_ = minPause;
-    end_ = now + max_;
-  }
-  if (now >= end_) return false;
-  std::this_thread::sleep_for(std::min<Clock::duration>(next_, end_ - now));
-  next_ = std::min(2 * next_, maxPause);
+  if (left_ <= Clock::duration::zero()) return false;
+  const auto start = Clock::now();
+  std::this_thread::sleep_for(std::min(next_, left_));
+  left_ -= Clock::now() - start;
+  next_ = std::min<Clock::duration>(2 * next_, maxPause);
   return true;
 }
 

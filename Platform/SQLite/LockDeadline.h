@@ -5,7 +5,8 @@
 
 namespace Varnel::Platform {
 
-/// How much longer an operation may wait for locks of others, all its waits together.
+/// How much longer an operation may wait for locks of others, all its waits together. What it does
+/// in between does not count.
 ///
 ///     LockDeadline deadline(std::chrono::milliseconds(20));
 ///     deadline.restart();                        // the operation begins
@@ -14,7 +15,7 @@ namespace Varnel::Platform {
 /// One thread at a time.
 class LockDeadline final {
  public:
-  explicit LockDeadline(std::chrono::microseconds max) : max_(max) {}
+  explicit LockDeadline(std::chrono::microseconds max) : max_(max), left_(max) {}
 
   /// Grants the whole time anew.
   void restart();
@@ -24,10 +25,11 @@ class LockDeadline final {
 
  private:
   using Clock = std::chrono::steady_clock;
+  static constexpr std::chrono::microseconds minPause{100};
 
   const std::chrono::microseconds max_;
-  std::chrono::microseconds next_{};
-  Clock::time_point end_{};  ///< Set at the first pause: most operations never wait.
+  Clock::duration left_;
+  Clock::duration next_ = minPause;
 };
 
 }  // namespace Varnel::Platform

@@ -8,6 +8,7 @@
 
 #include <Varnel/Platform/Ports/ApplicationStorage.h>
 #include <Varnel/Platform/Testing/FakeUserDefaults.h>
+#include <Varnel/Platform/Values/PathComponents.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -24,7 +25,7 @@ class FakeApplicationStorage final : public ApplicationStorage {
     return userDefaults_[identifier];
   }
   [[nodiscard]] std::string analyticsSpoolPath(const std::string& identifier) const override {
-    return folder_ + '/' + identifier + "/analytics.sqlite";
+    return folder_ + '/' + fileNameFor(identifier) + "/analytics.sqlite";
   }
 
  private:

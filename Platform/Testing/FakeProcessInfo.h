@@ -6,6 +6,7 @@
 #include <string>
 #include <string_view>
 
+#include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/ProcessInfo.h>
 
 namespace Varnel::Platform::Testing {
@@ -21,6 +22,9 @@ class FakeProcessInfo final : public ProcessInfo {
   std::string executable = "/usr/bin/host";
   std::optional<std::string> mainBundle;  ///< The folder with the application's Info.plist.
   std::optional<std::string> codeBundle;  ///< The same of any code, whatever address is asked.
+  /// Whether code without a `codeBundle` has its own, as the system finds it: above all the
+  /// framework, whose texts lie there.
+  bool keepsBundles = true;
 
   [[nodiscard]] std::optional<std::string> environmentVariable(
       std::string_view name) const override {
@@ -33,9 +37,10 @@ class FakeProcessInfo final : public ProcessInfo {
   }
   [[nodiscard]] std::string executablePath() const override { return executable; }
   [[nodiscard]] std::optional<std::string> mainBundleFolder() const override { return mainBundle; }
-  [[nodiscard]] std::optional<std::string> bundleFolderOfCode(const void*,
-                                                              std::string_view) const override {
-    return codeBundle;
+  [[nodiscard]] std::optional<std::string> bundleFolderOfCode(
+      const void* address, std::string_view sharedFolder) const override {
+    if (codeBundle || !keepsBundles) return codeBundle;
+    return systemPorts().processInfo.get().bundleFolderOfCode(address, sharedFolder);
   }
 };
 

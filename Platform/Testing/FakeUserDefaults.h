@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <cstdint>
 #include <map>
 #include <memory>
 #include <mutex>
@@ -13,56 +12,44 @@
 
 namespace Varnel::Platform::Testing {
 
-/// Settings that last as long as the object. A value reads as the type that it was set with, and
-/// as no other. Any thread.
+/// Settings that last as long as the object. Any thread.
 class FakeUserDefaults final : public UserDefaults {
  public:
   /// A reading that goes wrong finds nothing; a change is refused.
   std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
 
-  [[nodiscard]] std::optional<bool> truthValue(const std::string& key) const override {
-    return read<bool>(key);
-  }
-  [[nodiscard]] std::optional<std::int64_t> integer(const std::string& key) const override {
-    return read<std::int64_t>(key);
-  }
-  [[nodiscard]] std::optional<double> real(const std::string& key) const override {
-    return read<double>(key);
-  }
-  [[nodiscard]] std::optional<std::string> text(const std::string& key) const override {
-    return read<std::string>(key);
-  }
-  [[nodiscard]] std::optional<PlatformError> set(const std::string& key,
-                                                 const Value& value) override {
-    if (faults->strikes()) return failure();
-    const std::lock_guard lock(mutex_);
-    values_[key] = value;
-    return std::nullopt;
-  }
-  [[nodiscard]] std::optional<PlatformError> remove(const std::string& key) override {
-    if (faults->strikes()) return failure();
-    const std::lock_guard lock(mutex_);
-    values_.erase(key);
-    return std::nullopt;
-  }
-
  private:
-  static PlatformError failure() {
-    return PlatformError(std::make_error_code(std::errc::io_error));
-  }
-
-  template <typename Type>
-  std::optional<Type> read(const std::string& key) const {
+  [[nodiscard]] std::optional<std::string> readText(const std::string& key) const override {
     if (faults->strikes()) return std::nullopt;
     const std::lock_guard lock(mutex_);
-    const auto found = values_.find(key);
-    const auto* value = found == values_.end() ? nullptr : std::get_if<Type>(&found->second);
-    if (!value) return std::nullopt;
-    return *value;
+    const auto found = texts_.find(key);
+    if (found == texts_.end()) return std::nullopt;
+    return found->second;
+  }
+  [[nodiscard]] std::optional<PlatformError> writeText(const std::string& key,
+                                                       const std::string& text) override {
+    if (faults->strikes()) return failure(std::errc::io_error);
+    const std::lock_guard lock(mutex_);
+    std::size_t size = key.size() + text.size();
+    for (const auto& [other, kept] : texts_)
+      if (other != key) size += other.size() + kept.size();
+    if (size > maxSize) return failure(std::errc::file_too_large);
+    texts_[key] = text;
+    return std::nullopt;
+  }
+  [[nodiscard]] std::optional<PlatformError> removeText(const std::string& key) override {
+    if (faults->strikes()) return failure(std::errc::io_error);
+    const std::lock_guard lock(mutex_);
+    texts_.erase(key);
+    return std::nullopt;
   }
 
-  mutable std::mutex mutex_;  ///< Owns `values_`.
-  std::map<std::string, Value> values_;
+  static PlatformError failure(std::errc reason) {
+    return PlatformError(std::make_error_code(reason));
+  }
+
+  mutable std::mutex mutex_;  ///< Owns `texts_`.
+  std::map<std::string, std::string> texts_;
 };
 
 }  // namespace Varnel::Platform::Testing

@@ -1,10 +1,9 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/Text/ByteCountFormatter.h>
 
-#include <unicode/numberformatter.h>
-#include <unicode/uchar.h>
-
 #include <array>
+
+#include <Varnel/Platform/Text/LocaleLibrary.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -50,26 +49,11 @@ std::string decimalText(std::uint64_t fraction, int decimals) {
 }  // namespace
 
 ByteCountFormatter::ByteCountFormatter(std::string_view localeIdentifier) {
-  const icu::Locale locale(std::string(localeIdentifier).c_str());
-  UErrorCode status = U_ZERO_ERROR;
-  const icu::UnicodeString sample = icu::number::NumberFormatter::withLocale(locale)
-                                        .formatDouble(1000.5, status)
-                                        .toString(status);
-  icu::UnicodeString grouping;
-  icu::UnicodeString decimal;
-  int digits = 0;
-  for (std::int32_t at = 0; at < sample.length(); at = sample.moveIndex32(at, 1)) {
-    const UChar32 character = sample.char32At(at);
-    if (u_isdigit(character))
-      ++digits;
-    else if (digits == 1)
-      grouping.append(character);
-    else if (digits == 4)
-      decimal.append(character);
-  }
-  grouping.toUTF8String(groupingSeparator_);
-  decimal.toUTF8String(decimalSeparator_);
-  if (decimalSeparator_.empty()) decimalSeparator_.push_back('.');
+  const LocaleLibrary* const library = localeLibrary();
+  auto separators =
+      library ? library->separators(std::string(localeIdentifier)) : LocaleLibrary::Separators();
+  groupingSeparator_ = std::move(separators.grouping);
+  decimalSeparator_ = std::move(separators.decimal);
 }
 
 // Counts of one unit stay below 1024, so there is at most one group.

@@ -1,13 +1,11 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/Text/Calendar.h>
 
-#include <unicode/calendar.h>
-
-#include <cmath>
 #include <limits>
 
 #include <Varnel/Platform/Ports/TimeZones.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Text/LocaleLibrary.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -17,15 +15,11 @@ using Time = std::chrono::sys_time<milliseconds>;
 using LocalTime = std::chrono::local_time<milliseconds>;
 
 // How far a calculation may lead; `Date` reaches 292,000 years.
-constexpr double maxMilliseconds = 9.0e15;
+constexpr milliseconds maxMilliseconds(9'000'000'000'000'000);
 
-bool isWithinReach(Date date) {
-  constexpr Date::duration maxDuration = milliseconds(static_cast<std::int64_t>(maxMilliseconds));
-  return date.time_since_epoch() <= maxDuration && date.time_since_epoch() >= -maxDuration;
-}
-
-UDate icuDate(milliseconds time) {
-  return static_cast<UDate>(time.count());
+template <typename Time>
+bool isWithinReach(Time time) {
+  return time.time_since_epoch() <= maxMilliseconds && time.time_since_epoch() >= -maxMilliseconds;
 }
 
 LocalTime wallClock(Time time, const TimeZone& zone) {
@@ -65,37 +59,23 @@ struct Calendar::State {
   const TimeZones& zones;
   std::string zoneIdentifier;
   std::shared_ptr<const TimeZone> zone = zones.zone(zoneIdentifier);
-  // Counts by wall clocks, as in a zone whose offset never changes. Cloned for each calculation.
-  std::unique_ptr<icu::Calendar> prototype = nullptr;
+  std::unique_ptr<const LocaleLibrary::WallCalendar> calendar = nullptr;
 
   std::optional<LocalTime> addingDays(const DateComponents& components, LocalTime local,
                                       std::int64_t count) const {
-    const std::unique_ptr<icu::Calendar> calendar(prototype ? prototype->clone() : nullptr);
-    if (!calendar) return std::nullopt;
-    UErrorCode status = U_ZERO_ERROR;
-    calendar->setTime(icuDate(local.time_since_epoch()), status);
-    const auto add = [&](UCalendarDateFields field, const std::optional<std::int64_t>& amount) {
-      if (!amount) return true;
-      const auto total = product(*amount, count);
-      if (total) calendar->add(field, *total, status);
-      return total.has_value();
-    };
-    if (!add(UCAL_YEAR, components.year) || !add(UCAL_MONTH, components.month) ||
-        !add(UCAL_DATE, components.day))
-      return std::nullopt;
-    const UDate sum = calendar->getTime(status);
-    if (U_FAILURE(status) || !(std::abs(sum) <= maxMilliseconds)) return std::nullopt;
-    return LocalTime(milliseconds(static_cast<std::int64_t>(sum)));
+    const auto years = product(components.year.value_or(0), count);
+    const auto months = product(components.month.value_or(0), count);
+    const auto days = product(components.day.value_or(0), count);
+    if (!calendar || !years || !months || !days) return std::nullopt;
+    return calendar->adding(*years, *months, *days, local);
   }
 };
 
 Calendar::Calendar(const std::string& localeIdentifier, const std::string& timeZoneIdentifier,
                    const TimeZones& timeZones)
     : state_(new State{.zones = timeZones, .zoneIdentifier = timeZoneIdentifier}) {
-  UErrorCode status = U_ZERO_ERROR;
-  state_->prototype.reset(icu::Calendar::createInstance(
-      *icu::TimeZone::getGMT(), icu::Locale(localeIdentifier.c_str()), status));
-  if (U_FAILURE(status)) state_->prototype.reset();
+  if (const LocaleLibrary* library = localeLibrary())
+    state_->calendar = library->wallCalendar(localeIdentifier);
 }
 
 Calendar::Calendar(const UserLocale& userLocale, const TimeZones& timeZones)
@@ -128,7 +108,7 @@ std::optional<Date> Calendar::adding(const DateComponents& components, Date date
       !add(components.minute, std::chrono::minutes(1)) ||
       !add(components.second, std::chrono::seconds(1)))
     return std::nullopt;
-  if (!(std::abs(icuDate(time.time_since_epoch())) <= maxMilliseconds)) return std::nullopt;
+  if (!isWithinReach(time)) return std::nullopt;
   return time + rest;
 }
 
@@ -141,9 +121,7 @@ std::optional<Date> Calendar::withWallClockOf(Date date,
 }
 
 std::optional<int> Calendar::weekdayCount() const {
-  if (!state_->prototype) return std::nullopt;
-  const int count = state_->prototype->getMaximum(UCAL_DAY_OF_WEEK) -
-                    state_->prototype->getMinimum(UCAL_DAY_OF_WEEK) + 1;
+  const int count = state_->calendar ? state_->calendar->weekdayCount() : 0;
   return count > 0 ? std::optional(count) : std::nullopt;
 }
 

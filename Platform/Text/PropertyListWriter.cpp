@@ -2,12 +2,12 @@
 #include <Varnel/Platform/Text/PropertyListWriter.h>
 
 #include <plist/plist.h>
-#include <unicode/ustring.h>
 
 #include <algorithm>
 #include <limits>
 
 #include <Varnel/Platform/Text/NeutralLocale.h>
+#include <Varnel/Platform/Values/UTF8.h>
 #include <Varnel/Platform/Values/UniqueHandle.h>
 
 namespace Varnel::Platform {
@@ -24,10 +24,7 @@ bool isText(std::string_view bytes) {
     return static_cast<unsigned char>(c) < 0x20 && c != '\t' && c != '\n';
   };
   if (std::any_of(bytes.begin(), bytes.end(), isControl)) return false;
-  UErrorCode status = U_ZERO_ERROR;
-  u_strFromUTF8(nullptr, 0, nullptr, bytes.data(), static_cast<std::int32_t>(bytes.size()),
-                &status);
-  return status != U_INVALID_CHAR_FOUND;
+  return isValidUTF8(bytes);
 }
 
 plist_t makeNode(const PropertyValue& value);

@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/Text/VisibleText.h>
 
-#include <unicode/uchar.h>
 #include <unicode/utf8.h>
 
 #include <algorithm>
@@ -16,16 +15,15 @@ namespace {
 constexpr auto isPlain = [](char c) { return c >= 0x20 && c < 0x7F && c != '\\'; };
 
 /// Whether the character must not reach a terminal as it is; negative ones stand for wrong bytes.
-bool isDeceptive(UChar32 character) {
-  if (character < 0x7F) return character < 0x20;
-  switch (::u_charType(character)) {
-    case U_CONTROL_CHAR:
-    case U_LINE_SEPARATOR:
-    case U_PARAGRAPH_SEPARATOR:
-      return true;
-    default:
-      return ::u_hasBinaryProperty(character, UCHAR_BIDI_CONTROL) || character == 0xFEFF;
-  }
+constexpr bool isDeceptive(UChar32 character) {
+  const auto isIn = [character](UChar32 first, UChar32 last) {
+    return first <= character && character <= last;
+  };
+  return character < 0x20 || isIn(0x7F, 0x9F)  // control characters
+         || isIn(0x2028, 0x2029)               // separators of lines and of paragraphs
+         || character == 0x061C || isIn(0x200E, 0x200F) || isIn(0x202A, 0x202E) ||
+         isIn(0x2066, 0x2069)     // directions of writing
+         || character == 0xFEFF;  // the byte order mark
 }
 
 void appendEscaped(std::string& text, std::string_view bytes) {

@@ -48,4 +48,11 @@ void appendPathComponent(std::string& path, std::string_view component) {
   }
 }
 
+std::string fileNameFor(std::string text) {
+  for (char& character : text)
+    if (character == '/' || character == '\0') character = '_';
+  if (text.empty() || text == "." || text == "..") return "_";
+  return text;
+}
+
 }  // namespace Varnel::Platform

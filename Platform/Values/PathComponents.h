@@ -48,4 +48,8 @@ class VARNEL_API PathReader final {
 /// component adds nothing, nor does "/" to anything but an empty path.
 VARNEL_API void appendPathComponent(std::string& path, std::string_view component);
 
+/// The name of one file or folder for any text: itself, if it can be one. Slashes and null
+/// characters become "_", and so do "", "." and "..", which name no file of their own.
+[[nodiscard]] VARNEL_API std::string fileNameFor(std::string text);
+
 }  // namespace Varnel::Platform

@@ -23,15 +23,21 @@ struct Candidate {
   std::array<std::uint64_t, 2> key{};
 };
 
-/// What is read of files, in the order in which files are told apart.
+/// What is read of files, in the order in which files are told apart. No two of the first three
+/// show the same byte, so files that agree in all of them are equal, and nothing is read twice.
 enum class Look {
-  head,     ///< The beginning.
-  samples,  ///< Some of the middle and the end.
-  everything,
+  head,         ///< The beginning.
+  samples,      ///< Some of the middle and the end, for those that are large.
+  rest,         ///< All that the looks before have not shown.
+  headAndRest,  ///< For those that fit into a block.
 };
 
-/// How much of a file is looked at first. A disk reads this much in one go anyway, and most files
-/// are not larger.
-constexpr std::uint64_t headLength = 4096;
+/// How much of a file is looked at first. The system reads this much in one go anyway, and most
+/// files are not larger.
+constexpr std::uint64_t headLength = 16 * 1024;
+
+/// From this size on, a look at samples costs little beside reading everything, even on a disk that
+/// reads five megabytes in the time of the look's two seeks.
+constexpr std::uint64_t worthSamples = 8 * 1024 * 1024;
 
 }  // namespace Orvane

@@ -12,11 +12,12 @@
 namespace Orvane {
 namespace {
 
-/// How much of the middle and of the end is looked at.
-constexpr std::uint64_t sampleLength = 4096;
+/// How much of the middle and of the end is looked at: one page, or a little more.
+constexpr std::uint64_t pageLength = 4096;
 
-/// From this size on, telling the system that only parts are read saves more than it costs.
-constexpr std::uint64_t worthAdvice = 64 * 1024;
+std::uint64_t pageBefore(std::uint64_t offset) {
+  return offset - offset % pageLength;
+}
 
 Digest digestFrom(const XXH128_hash_t& hash) {
   return {hash.high64, hash.low64};
@@ -63,23 +64,27 @@ ContentReader::ContentReader(const FileTree& tree, FileSystem& fileSystem,
 
 ContentReader::~ContentReader() = default;
 
-void ContentReader::begin(FileNumber file, Look look) {
-  const std::uint64_t size = tree_.file(file).size;
-  file_ = file;
-  ranges_ = {};
+std::array<ContentReader::Range, 2> ContentReader::rangesOf(Look look, std::uint64_t size) {
+  const Range middle{pageBefore(size / 2), pageBefore(size / 2) + pageLength};
+  const Range end{pageBefore(size - std::min(size, pageLength)), size};
   switch (look) {
     case Look::head:
-      ranges_[0] = {0, std::min(size, headLength)};
-      break;
+      return {Range{0, std::min(size, headLength)}};
     case Look::samples:
-      ranges_ = {Range{size / 2, std::min(size, size / 2 + sampleLength)},
-                 Range{size - std::min(size, sampleLength), size}};
-      break;
-    case Look::everything:
-      ranges_[0] = {0, size};
+      return {middle, end};
+    case Look::rest:
+      if (size < worthSamples) return {Range{headLength, size}};
+      return {Range{headLength, middle.begin}, Range{middle.end, end.begin}};
+    case Look::headAndRest:
       break;
   }
-  isPart_ = look != Look::everything && size >= worthAdvice;
+  return {Range{0, size}};
+}
+
+void ContentReader::begin(FileNumber file, Look look) {
+  file_ = file;
+  look_ = look;
+  ranges_ = rangesOf(look, tree_.file(file).size);
   isFirstBlock_ = true;
   loss_.reset();
 }
@@ -87,7 +92,9 @@ void ContentReader::begin(FileNumber file, Look look) {
 bool ContentReader::step() {
   stepLength_ = 0;
   if (isFirstBlock_) {
-    auto opened = open(isPart_ ? ReadingPlan::parts : ReadingPlan::everything);
+    const bool isPart =
+        look_ == Look::samples || (look_ == Look::head && tree_.file(file_).size > headLength);
+    auto opened = open(isPart ? ReadingPlan::parts : ReadingPlan::everything);
     if (!opened) return lose(Loss::because(opened.error()));
     open_ = std::move(*opened);
   }
@@ -104,9 +111,11 @@ bool ContentReader::step() {
   if (range.begin == range.end) ranges_[0] = std::exchange(ranges_[1], {});
   const std::span<const std::byte> block(buffer_.data(), wanted);
   const bool isLast = ranges_[0].begin == ranges_[0].end;
-  if (isFirstBlock_ && isLast) {
+  if (look_ == Look::headAndRest) {
+    headDigest_ = hash_->of(block.first(headLength));
+    digest_ = hash_->of(block.subspan(headLength));
+  } else if (isFirstBlock_ && isLast) {
     digest_ = hash_->of(block);
-    headDigest_ = block.size() > headLength ? hash_->of(block.first(headLength)) : digest_;
   } else {
     if (isFirstBlock_) hash_->reset();
     hash_->add(block);

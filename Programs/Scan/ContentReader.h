@@ -56,8 +56,8 @@ class ContentReader final {
 
   /// The next three tell of a file that is finished.
   [[nodiscard]] const std::optional<Loss>& loss() const { return loss_; }
+  /// Of what the look shows; of the rest alone when the head was read with it.
   [[nodiscard]] Digest digest() const { return digest_; }
-  /// The digest of the beginning, when everything was read in one block.
   [[nodiscard]] Digest headDigest() const { return headDigest_; }
 
   /// How large a file may be to be read in one block.
@@ -73,6 +73,7 @@ class ContentReader final {
   };
   class Hash;
 
+  [[nodiscard]] static std::array<Range, 2> rangesOf(Look look, std::uint64_t size);
   [[nodiscard]] FileResult<std::unique_ptr<OpenFile>> open(ReadingPlan plan);
   [[nodiscard]] bool lose(const Loss& loss);
   [[nodiscard]] bool finish();
@@ -84,9 +85,9 @@ class ContentReader final {
   const std::unique_ptr<Hash> hash_;
 
   FileNumber file_ = Candidate::lost;
+  Look look_ = Look::head;
   std::array<Range, 2> ranges_{};  ///< What is left to read; the second one may be empty.
   std::unique_ptr<OpenFile> open_;
-  bool isPart_ = false;
   bool isFirstBlock_ = false;
   std::uint64_t stepLength_ = 0;
   std::optional<Loss> loss_;

@@ -13,10 +13,6 @@
 namespace Orvane {
 namespace {
 
-/// From this size on, a look at samples costs little beside reading everything, even on a disk that
-/// reads five megabytes in the time of the look's two seeks.
-constexpr std::uint64_t worthSamples = 8 * 1024 * 1024;
-
 using Candidates = std::vector<Candidate>;
 
 /// Calls `use(begin, end)` for each run of candidates that are equal in the key that is given.
@@ -193,13 +189,13 @@ class Scan final {
         takeOut(rest, [&](const auto& file) { return sizeOf(file) >= worthSamples; });
     look(Look::samples, large);
     keepAgreeing(large);
-    look(Look::everything, large);
+    look(Look::rest, large);
     keepAgreeing(large);
 
     Candidates known =
-        takeOut(rest, [&](const auto& file) { return reading.wholeDigest(file.file).has_value(); });
-    for (Candidate& file : known) file.key = *reading.wholeDigest(file.file);
-    look(Look::everything, rest);
+        takeOut(rest, [&](const auto& file) { return reading.restDigest(file.file).has_value(); });
+    for (Candidate& file : known) file.key = *reading.restDigest(file.file);
+    look(Look::rest, rest);
     rest.insert(rest.end(), known.begin(), known.end());
     keepAgreeing(rest);
     return {std::move(candidates), std::move(large), std::move(rest)};

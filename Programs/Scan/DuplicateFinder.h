@@ -14,7 +14,7 @@ class ScanObserver;
 struct ScanControl;
 
 /// Finds the files of equal content in some folders. Files are told apart by their size, then by
-/// their beginning, large ones by something of their middle and end, and then by everything. What
+/// their beginning, large ones by something of their middle and end, and then by the rest. What
 /// was read is compared by digests of 128 bits that depend on a secret of each scan, so that equal
 /// digests mean equal contents for all a list of duplicates is good for. Who *removes* a file must
 /// compare its bytes with those of the one that stays.

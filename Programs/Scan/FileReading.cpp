@@ -71,7 +71,7 @@ class FileReading::DiskPass final {
     const auto rest = files_.subspan(begin);
     nextSmall_ = begin;
     largeBegin_ = files_.size();
-    if (look_ == Look::everything && stage == Stage::byInode) {
+    if (look_ == Look::rest && stage == Stage::byInode) {
       const auto large =
           std::stable_partition(rest.begin(), rest.end(),
                                 [&](const Candidate& file) { return sizeOf(file) < largeLength; });
@@ -123,8 +123,8 @@ class FileReading::DiskPass final {
   /// How much of the file this look reads at this stage.
   [[nodiscard]] Look lookAt(const Candidate& file) const {
     const bool isWhole = look_ == Look::head && stage_ == Stage::byPlace &&
-                         sizeOf(file) <= ContentReader::blockLength;
-    return isWhole ? Look::everything : look_;
+                         sizeOf(file) > headLength && sizeOf(file) <= ContentReader::blockLength;
+    return isWhole ? Look::headAndRest : look_;
   }
 
   void lose(Candidate& file, const Loss& loss) {
@@ -246,15 +246,15 @@ class FileReading::DiskPass::ReadingTask final : public TaskGroup::Task {
       file.key = reader_.digest();
     } else {
       file.key = reader_.headDigest();
-      if (pass_.sizeOf(file) > headLength) whole_.emplace_back(file.file, reader_.digest());
+      rests_.emplace_back(file.file, reader_.digest());
     }
   }
 
   void end() {
     {
       const std::lock_guard lock(pass_.owner_.mutex_);
-      Digests& all = pass_.owner_.wholeDigests_;
-      all.insert(all.end(), whole_.begin(), whole_.end());
+      Digests& all = pass_.owner_.restDigests_;
+      all.insert(all.end(), rests_.begin(), rests_.end());
     }
     pass_.didEnd();
   }
@@ -265,7 +265,7 @@ class FileReading::DiskPass::ReadingTask final : public TaskGroup::Task {
   Look look_ = Look::head;
   std::uint64_t place_ = 0;
   bool mayReadLarge_ = false;
-  Digests whole_;
+  Digests rests_;
 };
 
 void FileReading::DiskPass::startPlacing() {
@@ -300,14 +300,14 @@ void FileReading::read(Look look, std::vector<Candidate>& candidates) {
   for (const auto& [disk, pass] : passes)
     if (pass->isCold()) coldDisks_.insert(disk);
   std::erase_if(candidates, [](const Candidate& file) { return file.file == Candidate::lost; });
-  std::sort(wholeDigests_.begin(), wholeDigests_.end());
+  std::sort(restDigests_.begin(), restDigests_.end());
 }
 
-std::optional<Digest> FileReading::wholeDigest(FileNumber file) const {
+std::optional<Digest> FileReading::restDigest(FileNumber file) const {
   const auto found =
-      std::lower_bound(wholeDigests_.begin(), wholeDigests_.end(), file,
+      std::lower_bound(restDigests_.begin(), restDigests_.end(), file,
                        [](const auto& digest, FileNumber number) { return digest.first < number; });
-  if (found == wholeDigests_.end() || found->first != file) return std::nullopt;
+  if (found == restDigests_.end() || found->first != file) return std::nullopt;
   return found->second;
 }
 

@@ -48,8 +48,8 @@ class FileReading final {
   /// What was lost since the last call, in no order.
   [[nodiscard]] Losses takeLosses() { return std::exchange(losses_, {}); }
 
-  /// The digest of everything, for a file larger than a head that a look at heads read whole.
-  [[nodiscard]] std::optional<Digest> wholeDigest(FileNumber file) const;
+  /// The digest of the rest, if a look at heads has read it with the head.
+  [[nodiscard]] std::optional<Digest> restDigest(FileNumber file) const;
 
  private:
   class DiskPass;
@@ -62,7 +62,7 @@ class FileReading final {
 
   std::mutex mutex_;  ///< Guards these while tasks run.
   Losses losses_;
-  Digests wholeDigests_;  ///< Sorted when no task runs.
+  Digests restDigests_;  ///< Sorted when no task runs.
 };
 
 }  // namespace Orvane

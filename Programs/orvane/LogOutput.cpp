@@ -23,10 +23,10 @@ class ConsoleOutput final : public Varnel::Platform::StandardOutput {
 }  // namespace
 
 void sendLogTo(Console& console) {
+  Varnel::Platform::Ports ports = Varnel::Platform::systemPorts();
   // Never destroyed: the process's ports are used until it has ended.
-  static ConsoleOutput& output = *new ConsoleOutput(console);
-  [[maybe_unused]] const bool isInTime = Varnel::Platform::installProcessPorts(
-      Varnel::Platform::systemPorts().withStandardOutput(output));
+  ports.standardOutput = *new ConsoleOutput(console);
+  [[maybe_unused]] const bool isInTime = installProcessPorts(ports);
   assert(isInTime);
 }
 

@@ -37,7 +37,7 @@ int RemindListenCommand::run(Console& console) const {
   Varnel::SchedulerService service(std::make_shared<Tallyhouse::AnalyticsTracker>(), router);
   const auto& nextDay = Varnel::NextDayCleanupReminderInfo::userNotificationIdentifier();
   bool isWritten = true;
-  auto& mainQueue = Varnel::Platform::processPorts().mainQueue;
+  Varnel::Platform::MainQueue& mainQueue = Varnel::Platform::processPorts().mainQueue;
   const auto tell = [&](const Varnel::Platform::UserNotification& notification,
                         Router::EventKind kind) {
     isWritten = isWritten &&

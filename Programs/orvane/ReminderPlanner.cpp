@@ -143,7 +143,7 @@ bool ReminderPlanner::plan(const UserNotification& notification) {
 }
 
 void ReminderPlanner::awaitDesktop(const std::function<bool()>& isWaiting) const {
-  auto& mainQueue = Varnel::Platform::processPorts().mainQueue;
+  Varnel::Platform::MainQueue& mainQueue = Varnel::Platform::processPorts().mainQueue;
   const UserNotificationCenter& center = parts_->center;
   mainQueue.runWhile([&] { return isWaiting() || center.isBusy(); }, patience());
   if (center.isBusy())

@@ -70,7 +70,7 @@ UserNotificationCenter::Notifications readPatiently(UserNotificationCenter& cent
   if (found) return found;
   const auto isTime = std::make_shared<bool>(false);
   center.retryLater([isTime] { *isTime = true; });
-  Varnel::Platform::processPorts().mainQueue.runWhile([&] { return !*isTime; }, patience());
+  Varnel::Platform::processPorts().mainQueue.get().runWhile([&] { return !*isTime; }, patience());
   return (center.*list)();
 }
 

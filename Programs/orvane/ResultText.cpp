@@ -9,9 +9,9 @@
 #include <Scan/ScanResult.h>
 #include <Varnel/Paths/QNURLResolver.h>
 #include <Varnel/Platform/Text/ByteCountFormatter.h>
-#include <Varnel/Platform/Text/UTF8.h>
 #include <Varnel/Platform/Text/VisibleText.h>
 #include <Varnel/Platform/Values/URL.h>
+#include <Varnel/Platform/Values/UTF8.h>
 #include <orvane/JSONLine.h>
 
 namespace Orvane {

@@ -107,9 +107,9 @@ int ScanCommand::run(Console& console) const {
   ManagedDiskTurns turns(
       {.queue = Varnel::DiskReadingQueue::shared(), .volumes = ports.volumeCatalog}, qos,
       maxReaders());
-  const CacheUse cacheUse = qos == Varnel::Platform::QualityOfService::background
-                                ? CacheUse::traceless
-                                : CacheUse::normal;
+  using QoS = Varnel::Platform::QualityOfService;
+  const CacheUse cacheUse =
+      qos == QoS::background || qos == QoS::utility ? CacheUse::traceless : CacheUse::normal;
   DuplicateFinder finder(
       {.fileSystem = systemFileSystem(cacheUse), .turns = turns, .observer = log});
   ScanControl control;
@@ -135,7 +135,7 @@ int ScanCommand::run(Console& console) const {
   log.log("Did find " + std::to_string(result.groups.size()) + " groups of duplicates among " +
           std::to_string(result.totals.files) + " files");
   analytics.scanFinished(result.groups.size());
-  const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.numberIdentifier());
+  const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.get().numberIdentifier());
   const auto write = [&](std::string_view text) { return console.writeResult(text); };
   const bool written = isJSON
                            ? writeJSON(result, write)

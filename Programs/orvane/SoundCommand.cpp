@@ -41,15 +41,15 @@ std::optional<std::string> playToTheEnd(Varnel::Sound sound) {
   Varnel::SoundEngine engine;
   engine.play(sound);
   if (!engine.currentSound()) {
-    if (auto missing = ports.soundPlayer.missingPart()) return missing;
+    if (auto missing = ports.soundPlayer.get().missingPart()) return missing;
     return sound.fileName() + " is missing or is no sound";
   }
   const auto end = std::make_shared<End>(engine);
   engine.currentSound()->setDelegate(end);
   // The end of the sound arrives on the main queue.
-  ports.mainQueue.runWhile([&engine] { return engine.currentSound() != nullptr; });
+  ports.mainQueue.get().runWhile([&engine] { return engine.currentSound() != nullptr; });
   if (!end->hasFinished)
-    return ports.soundPlayer.missingPart().value_or("this machine cannot play sounds");
+    return ports.soundPlayer.get().missingPart().value_or("this machine cannot play sounds");
   return std::nullopt;
 }
 

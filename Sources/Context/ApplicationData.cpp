@@ -8,11 +8,12 @@
 namespace Varnel {
 
 Platform::UserDefaults& ApplicationData::settings() {
-  return Platform::processPorts().applicationStorage.userDefaults(Globals::baseIdentifier());
+  return Platform::processPorts().applicationStorage.get().userDefaults(Globals::baseIdentifier());
 }
 
 std::string ApplicationData::analyticsSpoolPath() {
-  return Platform::processPorts().applicationStorage.analyticsSpoolPath(Globals::baseIdentifier());
+  return Platform::processPorts().applicationStorage.get().analyticsSpoolPath(
+      Globals::baseIdentifier());
 }
 
 }  // namespace Varnel

@@ -57,7 +57,8 @@ const BuildSwitches& choose(const BuildSwitches* candidate) {
 }
 
 BuildSwitches undeclared() {
-  const std::filesystem::path executable = Platform::processPorts().processInfo.executablePath();
+  const std::filesystem::path executable =
+      Platform::processPorts().processInfo.get().executablePath();
   return {.isSiteVersion = true, .appName = executable.filename().string()};
 }
 
@@ -71,7 +72,7 @@ const BuildSwitches& BuildSwitches::ofThisProduct() {
 Product::Product(const BuildSwitches& switches) {
   // A plug-in may bring along the declaration that its program has made already.
   if (choose(new BuildSwitches(switches)) == switches) return;
-  Platform::processPorts().systemLog.write(
+  Platform::processPorts().systemLog.get().write(
       "A product was declared after another one, or after its facts had been asked for; it does "
       "not count.");
 }

@@ -91,7 +91,7 @@ Bundle::Bundle(std::optional<std::string> folder, std::vector<std::string> langu
 
 Bundle Bundle::main() {
   const Platform::Ports& ports = Platform::processPorts();
-  return Bundle(ports.processInfo.mainBundleFolder(), ports.userLocale.languages());
+  return Bundle(ports.processInfo.get().mainBundleFolder(), ports.userLocale.get().languages());
 }
 
 std::optional<Platform::URL> Bundle::url() const {

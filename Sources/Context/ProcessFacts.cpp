@@ -47,17 +47,16 @@ std::string baseIdentifierOf(const Platform::ProcessInfo& processInfo,
   return Basalt::withoutChannelComponent(identifier);
 }
 
-ProcessFacts::Ports portsOfProcess() {
-  const Platform::Ports& ports = Platform::processPorts();
-  return {ports.clock, ports.processInfo, ports.userAccount, ports.workspace};
-}
-
 }  // namespace
 
 ProcessFacts::ProcessFacts(Ports ports, BuildSwitches switches)
     : ports_(ports), switches_(std::move(switches)) {}
 
-ProcessFacts::ProcessFacts() : ProcessFacts(portsOfProcess(), BuildSwitches::ofThisProduct()) {}
+ProcessFacts::ProcessFacts(const Platform::Ports& ports)
+    : ProcessFacts(Ports{ports.clock, ports.processInfo, ports.userAccount, ports.workspace},
+                   BuildSwitches::ofThisProduct()) {}
+
+ProcessFacts::ProcessFacts() : ProcessFacts(Platform::processPorts()) {}
 
 const std::string& ProcessFacts::baseIdentifier() const {
   return baseIdentifier_.get([&] { return baseIdentifierOf(ports_.processInfo, switches_); });

@@ -18,6 +18,7 @@ class Clock;
 class ProcessInfo;
 class UserAccount;
 class Workspace;
+struct Ports;
 }  // namespace Varnel::Platform
 
 namespace Varnel {
@@ -44,6 +45,7 @@ class VARNEL_API ProcessFacts final {
   };
 
   ProcessFacts(Ports ports, BuildSwitches switches);
+  explicit ProcessFacts(const Platform::Ports& ports);
   ProcessFacts();
 
   [[nodiscard]] const std::string& baseIdentifier() const;

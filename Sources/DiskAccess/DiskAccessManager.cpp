@@ -11,25 +11,30 @@
 namespace Varnel {
 namespace {
 
-/// The process's services, and the relay that tells the default center of its volumes.
-struct ProcessServices {
-  const Platform::Ports& ports = Platform::processPorts();
-  Basalt::NotificationCenter& center = Basalt::NotificationCenter::defaultCenter();
-  VolumeChangeRelay relay{ports.volumeCatalog, center};
-};
+DiskAccessManager::Ports portsOf(const Platform::Ports& ports, Basalt::NotificationCenter& center) {
+  return {.devices = ports.deviceRegistry,
+          .disks = ports.diskArbitration,
+          .volumes = ports.volumeCatalog,
+          .securityScope = ports.securityScope,
+          .notificationCenter = center};
+}
 
 DiskAccessManager::Ports portsOfProcess() {
-  static const ProcessServices& services = *new ProcessServices;
-  return {.devices = services.ports.deviceRegistry,
-          .disks = services.ports.diskArbitration,
-          .volumes = services.ports.volumeCatalog,
-          .securityScope = services.ports.securityScope,
-          .notificationCenter = services.center};
+  const Platform::Ports& ports = Platform::processPorts();
+  Basalt::NotificationCenter& center = Basalt::NotificationCenter::defaultCenter();
+  static const auto& relay = *new VolumeChangeRelay(ports.volumeCatalog, center);
+  static_cast<void>(relay);
+  return portsOf(ports, center);
 }
 
 }  // namespace
 
-DiskAccessManager::DiskAccessManager() : DiskAccessManager(portsOfProcess()) {}
+struct DiskAccessManager::OwnCenter {
+  explicit OwnCenter(Platform::VolumeCatalog& volumes) : relay(volumes, center) {}
+
+  Basalt::NotificationCenter center;
+  const VolumeChangeRelay relay;
+};
 
 DiskAccessManager::DiskAccessManager(Ports ports)
     : state_(std::make_shared<DiskAccessState>(ports)) {
@@ -45,6 +50,17 @@ DiskAccessManager::DiskAccessManager(Ports ports)
         }));
   }
   state_->scheduleUpdate();
+}
+
+DiskAccessManager::DiskAccessManager() : DiskAccessManager(portsOfProcess()) {}
+
+DiskAccessManager::DiskAccessManager(const Platform::Ports& ports)
+    : DiskAccessManager(ports, std::make_shared<OwnCenter>(ports.volumeCatalog)) {}
+
+DiskAccessManager::DiskAccessManager(const Platform::Ports& ports,
+                                     std::shared_ptr<OwnCenter> ownCenter)
+    : DiskAccessManager(portsOf(ports, ownCenter->center)) {
+  ownCenter_ = std::move(ownCenter);
 }
 
 DiskAccessManager::~DiskAccessManager() {

@@ -18,6 +18,7 @@ class DeviceRegistry;
 class DiskArbitration;
 class SecurityScope;
 class VolumeCatalog;
+struct Ports;
 }  // namespace Varnel::Platform
 
 namespace Varnel {
@@ -52,9 +53,11 @@ class VARNEL_API DiskAccessManager final {
     Basalt::NotificationCenter& notificationCenter;
   };
 
-  /// A manager with the process's services. Both throw `std::system_error` when the system grants
+  /// A manager with the process's services. All throw `std::system_error` when the system grants
   /// no thread for the inventory.
   DiskAccessManager();
+  /// One with the services of a set, which hears of volumes from the set's catalogue alone.
+  explicit DiskAccessManager(const Platform::Ports& ports);
   explicit DiskAccessManager(Ports ports);
 
   /// Waits for an inventory that is under way. After that, only sessions that are left use the
@@ -89,7 +92,10 @@ class VARNEL_API DiskAccessManager final {
 
  private:
   friend class DiskReadingQueue;
+  struct OwnCenter;
+  DiskAccessManager(const Platform::Ports& ports, std::shared_ptr<OwnCenter> ownCenter);
 
+  std::shared_ptr<OwnCenter> ownCenter_;  ///< None where the center came with the ports.
   const std::shared_ptr<DiskAccessState> state_;
   std::vector<Basalt::NotificationCenter::Observer> notificationCenterObservers_;
 };

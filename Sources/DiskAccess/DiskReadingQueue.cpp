@@ -27,7 +27,10 @@ unsigned currentProcess() {
 }  // namespace
 
 DiskReadingQueue::DiskReadingQueue(DiskAccessManager& manager)
-    : DiskReadingQueue(manager, {.readingPriority = Platform::processPorts().readingPriority}) {}
+    : DiskReadingQueue(manager, Platform::processPorts()) {}
+
+DiskReadingQueue::DiskReadingQueue(DiskAccessManager& manager, const Platform::Ports& ports)
+    : DiskReadingQueue(manager, {.readingPriority = ports.readingPriority}) {}
 
 DiskReadingQueue::DiskReadingQueue(DiskAccessManager& manager, Ports ports)
     : core_(std::make_shared<DiskReadingCore>(manager.state_, std::move(ports))),

@@ -11,7 +11,8 @@
 
 namespace Varnel::Platform {
 class ReadingPriority;
-}
+struct Ports;
+}  // namespace Varnel::Platform
 
 namespace Varnel {
 
@@ -53,10 +54,11 @@ class VARNEL_API DiskReadingQueue final {
     DiskReadingTurn::Now now = DiskReadingTurn::Clock::now;  ///< Measures turns.
   };
 
-  /// The manager outlives the queue. Both throw `std::system_error` when the system grants no
+  /// The manager outlives the queue. All throw `std::system_error` when the system grants no
   /// thread.
   explicit DiskReadingQueue(DiskAccessManager& manager);
   DiskReadingQueue(DiskAccessManager& manager, Ports ports);
+  DiskReadingQueue(DiskAccessManager& manager, const Platform::Ports& ports);
 
   /// Stops everything, and waits for callbacks that are running on other threads and for look-ups
   /// of volumes. Afterwards nothing is called back but results that an executor still has to

@@ -35,7 +35,10 @@ std::size_t OVDiskInfo::hash() const {
 }
 
 OVDiskInfo::Array OVDiskInfo::allDiskInfos() {
-  const Platform::Ports& ports = Platform::processPorts();
+  return allDiskInfos(Platform::processPorts());
+}
+
+OVDiskInfo::Array OVDiskInfo::allDiskInfos(const Platform::Ports& ports) {
   return allDiskInfos({.devices = ports.deviceRegistry,
                        .disks = ports.diskArbitration,
                        .volumes = ports.volumeCatalog});

@@ -19,6 +19,7 @@ class DeviceRegistry;
 class DiskArbitration;
 class RegistryEntry;
 class VolumeCatalog;
+struct Ports;
 }  // namespace Varnel::Platform
 
 namespace Varnel {
@@ -61,6 +62,7 @@ class VARNEL_API OVDiskInfo final {
   /// in the set of each. Reads the kernel's tables, no disk.
   [[nodiscard]] static Array allDiskInfos();
   [[nodiscard]] static Array allDiskInfos(Ports ports);
+  [[nodiscard]] static Array allDiskInfos(const Platform::Ports& ports);
 
   /// Identifies the device; equality and hash use it alone. A device that tells no serial number
   /// has a new one in each inventory; only a manager's inventories remember it while one of the

@@ -6,9 +6,11 @@
 
 namespace Varnel {
 
-SoundEngine::SoundEngine()
-    : SoundEngine({.player = Platform::processPorts().soundPlayer,
-                   .path = [](Sound sound) { return sound.path(); }}) {}
+SoundEngine::SoundEngine() : SoundEngine(Platform::processPorts()) {}
+
+SoundEngine::SoundEngine(const Platform::Ports& ports)
+    : SoundEngine({.player = ports.soundPlayer, .path = [](Sound sound) { return sound.path(); }}) {
+}
 
 SoundEngine::SoundEngine(Ports ports)
     // Sounds share this reference, and do not keep the engine alive.

@@ -11,6 +11,10 @@
 #include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Ports/SoundPlayer.h>
 
+namespace Varnel::Platform {
+struct Ports;
+}
+
 namespace Varnel {
 
 /// Plays one of the framework's sounds at a time. A new one cuts off the one before it; there is no
@@ -37,6 +41,7 @@ class VARNEL_API SoundEngine final : private Platform::SoundDelegate {
   /// An engine for the framework's own sounds and the process's player.
   SoundEngine();
   explicit SoundEngine(Ports ports);
+  explicit SoundEngine(const Platform::Ports& ports);
   SoundEngine(const SoundEngine&) = delete;
   SoundEngine& operator=(const SoundEngine&) = delete;
   ~SoundEngine() override;

@@ -31,7 +31,8 @@ constexpr std::string_view fileNameDatePattern = "YYYY-MM-dd";
 // Never destroyed, like the process's logger.
 const Platform::DateFormatter& makeDateFormatter(std::string_view pattern) {
   const Platform::Ports& ports = Platform::processPorts();
-  return *new Platform::DateFormatter(pattern, ports.userLocale.identifier(), ports.timeZones);
+  return *new Platform::DateFormatter(pattern, ports.userLocale.get().identifier(),
+                                      ports.timeZones);
 }
 
 bool isFolder(const Platform::URL& url) {
@@ -49,15 +50,8 @@ LoggingContextTags locationTags(const std::optional<Platform::URL>& location) {
 
 Logger& Logger::instance() {
   static Logger& shared = []() -> Logger& {
-    const Platform::Ports& ports = Platform::processPorts();
     // Never destroyed: threads and destructors may log until the very end.
-    static Logger& logger = *new Logger({.appendFiles = ports.appendFiles,
-                                         .clock = ports.clock,
-                                         .standardOutput = ports.standardOutput,
-                                         .timeZones = ports.timeZones,
-                                         .userAccount = ports.userAccount,
-                                         .userLocale = ports.userLocale},
-                                        Globals::baseIdentifier());
+    static Logger& logger = *new Logger(Platform::processPorts(), Globals::baseIdentifier());
     const auto endGathering = [] {
       if (logger.fileChannel_) logger.fileChannel_->writeThrough();
     };
@@ -68,6 +62,15 @@ Logger& Logger::instance() {
   }();
   return shared;
 }
+
+Logger::Logger(const Platform::Ports& ports, std::string_view baseIdentifier)
+    : Logger({.appendFiles = ports.appendFiles,
+              .clock = ports.clock,
+              .standardOutput = ports.standardOutput,
+              .timeZones = ports.timeZones,
+              .userAccount = ports.userAccount,
+              .userLocale = ports.userLocale},
+             baseIdentifier) {}
 
 Logger::Logger(Ports ports, std::string_view baseIdentifier)
     : ports_(ports),

@@ -26,6 +26,7 @@ class StandardOutput;
 class TimeZones;
 class UserAccount;
 class UserLocale;
+struct Ports;
 }  // namespace Varnel::Platform
 
 namespace Varnel {
@@ -60,6 +61,7 @@ class VARNEL_API Logger final {
   /// A logger of one's own; `baseIdentifier` names the folder of its files. The ports must outlive
   /// it. Destruction writes what has gathered; nobody may be logging meanwhile.
   Logger(Ports ports, std::string_view baseIdentifier);
+  Logger(const Platform::Ports& ports, std::string_view baseIdentifier);
   ~Logger();
   Logger(const Logger&) = delete;
   Logger& operator=(const Logger&) = delete;

@@ -29,8 +29,8 @@ Bundle BaseModule::fetchBundle() const {
   Basalt::QNAssertAbstract("BaseModule::fetchBundle()");
   const Platform::Ports& ports = Platform::processPorts();
   // The description of a class lies in the image that the class was compiled into.
-  return Bundle(ports.processInfo.bundleFolderOfCode(&typeid(*this), {}),
-                ports.userLocale.languages());
+  return Bundle(ports.processInfo.get().bundleFolderOfCode(&typeid(*this), {}),
+                ports.userLocale.get().languages());
 }
 
 std::optional<std::string> BaseModule::fetchVersion() const {

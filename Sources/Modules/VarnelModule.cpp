@@ -46,8 +46,9 @@ std::string VarnelModule::identifier() const {
 
 Bundle VarnelModule::fetchBundle() const {
   const Platform::Ports& ports = Platform::processPorts();
-  return Bundle(ports.processInfo.bundleFolderOfCode(&typeid(VarnelModule), VARNEL_BUNDLE_FOLDER),
-                ports.userLocale.languages());
+  return Bundle(
+      ports.processInfo.get().bundleFolderOfCode(&typeid(VarnelModule), VARNEL_BUNDLE_FOLDER),
+      ports.userLocale.get().languages());
 }
 
 std::string VarnelModule::typeName() const {

@@ -5,7 +5,8 @@
 #include <utility>
 
 #include <Varnel/Basalt/Executor.h>
-#include <Varnel/Context/ApplicationData.h>
+#include <Varnel/Context/Globals.h>
+#include <Varnel/Platform/Ports/ApplicationStorage.h>
 #include <Varnel/Platform/Ports/ExtendedAttributes.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/ProcessInfo.h>
@@ -37,10 +38,13 @@ Platform::Result<std::string> nameOfVolume(const URL& url, Platform::VolumeCatal
 
 }  // namespace
 
-KVDownloadSourceTracker::Ports KVDownloadSourceTracker::Ports::ofProcess() {
-  const Platform::Ports& ports = Platform::processPorts();
-  return {ports.extendedAttributes, ports.processInfo,           ports.processLauncher,
-          ports.systemLog,          ApplicationData::settings(), ports.volumeCatalog};
+KVDownloadSourceTracker::Ports KVDownloadSourceTracker::Ports::of(const Platform::Ports& ports) {
+  return {.extendedAttributes = ports.extendedAttributes,
+          .processInfo = ports.processInfo,
+          .processLauncher = ports.processLauncher,
+          .systemLog = ports.systemLog,
+          .userDefaults = ports.applicationStorage.get().userDefaults(Globals::baseIdentifier()),
+          .volumeCatalog = ports.volumeCatalog};
 }
 
 KVDownloadSourceTracker::KVDownloadSourceTracker(std::shared_ptr<KVQuarantine> quarantine,
@@ -53,7 +57,8 @@ KVDownloadSourceTracker::KVDownloadSourceTracker(std::shared_ptr<KVQuarantine> q
 
 KVDownloadSourceTracker::KVDownloadSourceTracker(std::shared_ptr<KVQuarantine> quarantine,
                                                  Places places)
-    : KVDownloadSourceTracker(std::move(quarantine), std::move(places), Ports::ofProcess()) {}
+    : KVDownloadSourceTracker(std::move(quarantine), std::move(places),
+                              Ports::of(Platform::processPorts())) {}
 
 KVDownloadSourceTracker::KVDownloadSourceTracker(std::shared_ptr<KVQuarantine> quarantine)
     : KVDownloadSourceTracker(std::move(quarantine), Places()) {}

@@ -19,6 +19,7 @@ class ProcessInfo;
 class ProcessLauncher;
 class UserDefaults;
 class VolumeCatalog;
+struct Ports;
 }  // namespace Varnel::Platform
 
 namespace Varnel {
@@ -46,8 +47,8 @@ class VARNEL_API KVDownloadSourceTracker final {
     Platform::UserDefaults& userDefaults;
     Platform::VolumeCatalog& volumeCatalog;
 
-    /// Those of this process.
-    [[nodiscard]] static Ports ofProcess();
+    /// Those of a set, with the application's settings.
+    [[nodiscard]] static Ports of(const Platform::Ports& ports);
   };
 
   /// Where things are on the machine.

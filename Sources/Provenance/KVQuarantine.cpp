@@ -9,7 +9,7 @@
 #include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
 #include <Varnel/Platform/SQLite/SQLiteDatabase.h>
-#include <Varnel/Platform/Text/UTF8.h>
+#include <Varnel/Platform/Values/UTF8.h>
 #include <Varnel/Provenance/DownloadList.h>
 
 namespace Varnel {

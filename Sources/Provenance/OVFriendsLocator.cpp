@@ -25,7 +25,7 @@ std::shared_ptr<Platform::Workspace> OVFriendsLocator::workspace() {
   const std::lock_guard lock(locator.mutex_);
   // The process's ports are never destroyed.
   if (!locator.workspace_)
-    locator.workspace_ = {std::shared_ptr<void>(), &Platform::processPorts().workspace};
+    locator.workspace_ = {std::shared_ptr<void>(), &Platform::processPorts().workspace.get()};
   return locator.workspace_;
 }
 

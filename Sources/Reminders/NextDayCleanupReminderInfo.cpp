@@ -19,7 +19,11 @@ const std::string& NextDayCleanupReminderInfo::userNotificationIdentifier() {
 }
 
 Platform::UserNotification NextDayCleanupReminderInfo::makeUserNotification() const {
-  const Platform::Ports& ports = Platform::processPorts();
+  return makeUserNotification(Platform::processPorts());
+}
+
+Platform::UserNotification NextDayCleanupReminderInfo::makeUserNotification(
+    const Platform::Ports& ports) const {
   return makeUserNotification(
       {ports.clock, ports.userLocale, ports.timeZones, *VarnelModule::instance()});
 }

@@ -11,6 +11,7 @@ namespace Varnel::Platform {
 class Clock;
 class TimeZones;
 class UserLocale;
+struct Ports;
 }  // namespace Varnel::Platform
 
 namespace Varnel {
@@ -47,6 +48,7 @@ class VARNEL_API NextDayCleanupReminderInfo final {
   /// A notification, due one day from now at the same time of day, that names what was found.
   [[nodiscard]] Platform::UserNotification makeUserNotification() const;
   [[nodiscard]] Platform::UserNotification makeUserNotification(Ports ports) const;
+  [[nodiscard]] Platform::UserNotification makeUserNotification(const Platform::Ports& ports) const;
 
   bool operator==(const NextDayCleanupReminderInfo&) const = default;
 

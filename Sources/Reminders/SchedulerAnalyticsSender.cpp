@@ -10,22 +10,19 @@
 #include <Varnel/Platform/Text/DateFormatter.h>
 
 namespace Varnel {
-namespace {
-
-SchedulerAnalyticsSender::Ports portsOfProcess() {
-  const Platform::Ports& ports = Platform::processPorts();
-  return {ports.clock, ports.userLocale, ports.timeZones};
-}
-
-}  // namespace
 
 SchedulerAnalyticsSender::SchedulerAnalyticsSender(
     Ports ports, std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker)
     : CommonAnalyticsSender(std::move(tracker)), ports_(ports) {}
 
 SchedulerAnalyticsSender::SchedulerAnalyticsSender(
+    const Platform::Ports& ports, std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker)
+    : SchedulerAnalyticsSender(Ports{ports.clock, ports.userLocale, ports.timeZones},
+                               std::move(tracker)) {}
+
+SchedulerAnalyticsSender::SchedulerAnalyticsSender(
     std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker)
-    : SchedulerAnalyticsSender(portsOfProcess(), std::move(tracker)) {}
+    : SchedulerAnalyticsSender(Platform::processPorts(), std::move(tracker)) {}
 
 void SchedulerAnalyticsSender::trackNotification(const Platform::UserNotification&) {
   const Platform::DateFormatter formatter("HH:mm", ports_.userLocale.identifier(),

@@ -11,6 +11,7 @@ namespace Varnel::Platform {
 class Clock;
 class TimeZones;
 class UserLocale;
+struct Ports;
 struct UserNotification;
 }  // namespace Varnel::Platform
 
@@ -30,6 +31,8 @@ class VARNEL_API SchedulerAnalyticsSender final : public CommonAnalyticsSender {
   };
 
   SchedulerAnalyticsSender(Ports ports, std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker);
+  SchedulerAnalyticsSender(const Platform::Ports& ports,
+                           std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker);
   explicit SchedulerAnalyticsSender(std::shared_ptr<Tallyhouse::AnalyticsTracker> tracker);
 
   [[nodiscard]] std::string contextName() const override { return "Scheduler"; }

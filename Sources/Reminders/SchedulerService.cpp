@@ -39,12 +39,6 @@ Notifications repeating(Notifications notifications) {
   return notifications;
 }
 
-SchedulerService::Ports portsOfProcess() {
-  const Platform::Ports& ports = Platform::processPorts();
-  return {ports.clock,     ports.userLocale, ports.timeZones,
-          ports.mainQueue, Globals::facts(), VarnelModule::instance()};
-}
-
 }  // namespace
 
 SchedulerService::SchedulerService(Ports ports,
@@ -63,9 +57,17 @@ SchedulerService::SchedulerService(Ports ports,
       });
 }
 
+SchedulerService::SchedulerService(const Platform::Ports& ports,
+                                   std::shared_ptr<Tallyhouse::AnalyticsTracker> analyticsTracker,
+                                   UserNotificationRouter& userNotificationRouter)
+    : SchedulerService(Ports{ports.clock, ports.userLocale, ports.timeZones, ports.mainQueue,
+                             Globals::facts(), VarnelModule::instance()},
+                       std::move(analyticsTracker), userNotificationRouter) {}
+
 SchedulerService::SchedulerService(std::shared_ptr<Tallyhouse::AnalyticsTracker> analyticsTracker,
                                    UserNotificationRouter& userNotificationRouter)
-    : SchedulerService(portsOfProcess(), std::move(analyticsTracker), userNotificationRouter) {}
+    : SchedulerService(Platform::processPorts(), std::move(analyticsTracker),
+                       userNotificationRouter) {}
 
 Platform::UserNotificationCenter& SchedulerService::userNotificationCenter() const {
   return userNotificationRouter_.userNotificationCenter();

@@ -26,6 +26,7 @@ class MainQueue;
 class TimeZones;
 class UserLocale;
 class UserNotificationCenter;
+struct Ports;
 }  // namespace Varnel::Platform
 
 namespace Varnel {
@@ -64,6 +65,9 @@ class VARNEL_API SchedulerService final : public Basalt::ExecutionContext {
 
   /// The router must outlive the service.
   SchedulerService(Ports ports, std::shared_ptr<Tallyhouse::AnalyticsTracker> analyticsTracker,
+                   UserNotificationRouter& userNotificationRouter);
+  SchedulerService(const Platform::Ports& ports,
+                   std::shared_ptr<Tallyhouse::AnalyticsTracker> analyticsTracker,
                    UserNotificationRouter& userNotificationRouter);
   SchedulerService(std::shared_ptr<Tallyhouse::AnalyticsTracker> analyticsTracker,
                    UserNotificationRouter& userNotificationRouter);

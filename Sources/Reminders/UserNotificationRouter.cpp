@@ -58,10 +58,12 @@ class UserNotificationRouter::Routes final : public Platform::UserNotificationCe
 
 namespace {
 
-UserNotificationRouter::Ports portsOfProcess() {
-  const Platform::Ports& ports = Platform::processPorts();
-  return {UserNotificationRouter::defaultUserNotificationCenter(), ports.application,
-          ports.mainQueue};
+UserNotificationCenter& centerOfProduct(const Platform::Ports& ports) {
+  const BuildSwitches& product = BuildSwitches::ofThisProduct();
+  return ports.userNotificationCenters.get().center({.identifier = Globals::baseIdentifier(),
+                                                     .name = Globals::applicationName(),
+                                                     .desktopEntry = product.desktopEntry,
+                                                     .icon = product.icon});
 }
 
 }  // namespace
@@ -78,17 +80,16 @@ UserNotificationRouter::UserNotificationRouter(Ports ports)
   ports_.userNotificationCenter.setDelegate(routes_);
 }
 
-UserNotificationRouter::UserNotificationRouter() : UserNotificationRouter(portsOfProcess()) {}
+UserNotificationRouter::UserNotificationRouter(const Platform::Ports& ports)
+    : UserNotificationRouter(Ports{centerOfProduct(ports), ports.application, ports.mainQueue}) {}
+
+UserNotificationRouter::UserNotificationRouter()
+    : UserNotificationRouter(Platform::processPorts()) {}
 
 UserNotificationRouter::~UserNotificationRouter() = default;
 
 UserNotificationCenter& UserNotificationRouter::defaultUserNotificationCenter() {
-  const BuildSwitches& product = BuildSwitches::ofThisProduct();
-  return Platform::processPorts().userNotificationCenters.center(
-      {.identifier = Globals::baseIdentifier(),
-       .name = Globals::applicationName(),
-       .desktopEntry = product.desktopEntry,
-       .icon = product.icon});
+  return centerOfProduct(Platform::processPorts());
 }
 
 UserNotificationCenter& UserNotificationRouter::userNotificationCenter() const {

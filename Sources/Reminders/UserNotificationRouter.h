@@ -16,6 +16,7 @@ namespace Varnel::Platform {
 class Application;
 class MainQueue;
 class UserNotificationCenter;
+struct Ports;
 }  // namespace Varnel::Platform
 
 namespace Varnel {
@@ -53,6 +54,8 @@ class VARNEL_API UserNotificationRouter final {
 
   /// Becomes the delegate of the center, which then delivers the notifications that came due.
   explicit UserNotificationRouter(Ports ports);
+  /// The running application's own center in a set.
+  explicit UserNotificationRouter(const Platform::Ports& ports);
   /// The router of the running application's own center.
   UserNotificationRouter();
   ~UserNotificationRouter();

@@ -68,7 +68,7 @@ class UserIdentificatorTest : public testing::Test {
 
 // Servers know users by these values: a change here is a mistake.
 TEST_F(UserIdentificatorTest, TheUserIdentifierNeverChanges) {
-  EXPECT_EQ(Basalt::hexadecimal(*Basalt::sha256("abc")),
+  EXPECT_EQ(Basalt::hexadecimal(Basalt::sha256("abc")),
             "ba7816bf8f01cfea414140de5dae2223b00361a396177a9cb410ff61f20015ad");
   EXPECT_EQ(user.userIdentifier(),
             "3a8bc9fb6c605385e50e4f03118cd86b7f59529b27829673810b9854b1a2e6be");

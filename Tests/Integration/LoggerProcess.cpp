@@ -30,8 +30,9 @@ struct LogsAtTheVeryEnd {
 
 void printOnStandardError() {
   static const auto errorOutput = Varnel::Platform::makeStandardErrorOutput();
-  if (!installProcessPorts(Varnel::Platform::systemPorts().withStandardOutput(*errorOutput)))
-    std::abort();
+  Varnel::Platform::Ports ports = Varnel::Platform::systemPorts();
+  ports.standardOutput = *errorOutput;
+  if (!installProcessPorts(ports)) std::abort();
 }
 
 void printForNobody() {

@@ -92,7 +92,8 @@ class Host final {
     EXPECT_TRUE(Tests::drainUntil(*queue, [&] {
       using enum Platform::DeliveryState;
       const auto waiting =
-          Platform::NotificationStore({*files, log}, file).deliveries({due, toShow});
+          Platform::NotificationStore({*files, log}, file, Platform::Migrating::never)
+              .deliveries({due, toShow});
       return waiting && waiting->empty();
     }));
   }

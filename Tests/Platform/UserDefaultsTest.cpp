@@ -5,7 +5,6 @@
 #include <unistd.h>
 
 #include <algorithm>
-#include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <functional>
@@ -13,14 +12,11 @@
 
 #include <Tests/Support/MountNamespace.h>
 #include <Tests/Support/TemporaryFolder.h>
-#include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/Process/KeyFileDefaults.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
-#include <Varnel/Platform/Ports/ApplicationStorage.h>
 #include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
-#include <Varnel/Platform/Testing/FakeApplicationStorage.h>
 #include <Varnel/Platform/Testing/FaultyPrivateFiles.h>
 
 namespace Varnel::Platform {
@@ -38,44 +34,6 @@ class UserDefaultsTest : public ::testing::Test {
   mutable Testing::CapturedSystemLog log;
   const std::unique_ptr<PrivateFiles> files_ = POSIX::makePrivateFiles();
 };
-
-void setAll(UserDefaults& defaults, const std::string& key) {
-  EXPECT_EQ(defaults.text(key), std::nullopt);
-  EXPECT_FALSE(defaults.set(key, std::string("two\nlines; ünïcode ")));
-  EXPECT_FALSE(defaults.set("truth", true));
-  EXPECT_FALSE(defaults.set("count", std::int64_t{-9007199254740993}));
-  EXPECT_FALSE(defaults.set("share", 0.1));
-  EXPECT_FALSE(defaults.set("gone", std::string("x")));
-  EXPECT_FALSE(defaults.remove("gone"));
-  EXPECT_FALSE(defaults.remove("never there"));
-}
-
-void expectAll(const UserDefaults& defaults, const std::string& key) {
-  EXPECT_EQ(defaults.text(key), "two\nlines; ünïcode ");
-  EXPECT_EQ(defaults.truthValue("truth"), true);
-  EXPECT_EQ(defaults.integer("count"), -9007199254740993);
-  EXPECT_EQ(defaults.real("share"), 0.1);
-  EXPECT_EQ(defaults.text("gone"), std::nullopt);
-  EXPECT_EQ(defaults.integer(key), std::nullopt);
-  EXPECT_EQ(defaults.truthValue("count"), std::nullopt);
-}
-
-TEST_F(UserDefaultsTest, KeepValuesFromRunToRun) {
-  const std::string key = "a [key] = with / odd \n characters";
-  auto defaults = open();
-  setAll(defaults, key);
-  expectAll(open(), key);
-  Testing::FakeUserDefaults fake;
-  setAll(fake, key);
-  expectAll(fake, key);
-
-  for (const std::string& wrong : {std::string(), std::string("a\0b", 3)})
-    EXPECT_TRUE(defaults.set(wrong, true));
-  for (const std::string& wrong : {std::string("a\0b", 3), std::string("\xFF")})
-    EXPECT_TRUE(defaults.set("text", wrong));
-  expectAll(open(), key);
-  EXPECT_EQ(log.text(), "");
-}
 
 TEST_F(UserDefaultsTest, ProcessesKeepEachOthersKeys) {
   constexpr int processes = 4;
@@ -132,21 +90,6 @@ TEST_F(UserDefaultsTest, ADamagedFileCountsAsEmptyAndIsSetAside) {
   const std::string said = log.text();
   EXPECT_THAT(said, HasSubstr(path_.string() + " are damaged"));
   EXPECT_EQ(std::count(said.begin(), said.end(), '\n'), 1);
-}
-
-TEST_F(UserDefaultsTest, EachIdentifierHasItsOwn) {
-  ::setenv("XDG_CONFIG_HOME", folder_.path().c_str(), 1);
-  const auto system = Linux::makeApplicationStorage(*files_, log);
-  Testing::FakeApplicationStorage fake(folder_.path().string());
-  for (ApplicationStorage* storage : {system.get(), static_cast<ApplicationStorage*>(&fake)}) {
-    UserDefaults& settings = storage->userDefaults("com.a.One");
-    EXPECT_EQ(&storage->userDefaults("com.a.One"), &settings);
-    EXPECT_FALSE(settings.set("key", true));
-    EXPECT_EQ(storage->userDefaults("com.a.Two").truthValue("key"), std::nullopt);
-    EXPECT_NE(storage->analyticsSpoolPath("com.a.One"), storage->analyticsSpoolPath("com.a.Two"));
-    EXPECT_TRUE(fs::path(storage->analyticsSpoolPath("com.a.One")).is_absolute());
-  }
-  EXPECT_TRUE(fs::exists(folder_.path() / "com.a.One" / "settings.ini"));
 }
 
 // As root with another's home: that user would be locked out of what is made there.

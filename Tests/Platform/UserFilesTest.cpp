@@ -12,7 +12,7 @@
 #include <Varnel/Platform/Ports/ExtendedAttributes.h>
 #include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
-#include <Varnel/Platform/Text/UTF8.h>
+#include <Varnel/Platform/Values/UTF8.h>
 
 namespace Varnel::Platform {
 namespace {

@@ -2,7 +2,7 @@
 #include <string>
 #include <vector>
 
-#include <gtest/gtest.h>
+#include <gmock/gmock.h>
 
 #include <Tests/Support/ChildProcess.h>
 
@@ -47,6 +47,17 @@ TEST(Products, AProductThatSetsNoChannelStopsWhereItIsAskedForOne) {
   const Lines lines = linesOf("WithoutChannel");
   ASSERT_EQ(lines.size(), 5U);
   EXPECT_EQ(lines.front(), "Welcome to Nowhere");
+}
+
+TEST(Products, AHostPutsItsOwnServiceInThePlaceOfOne) {
+  const Lines lines = linesOf("HostWithItsOwnClock");
+  using testing::HasSubstr;
+  EXPECT_THAT(lines, testing::ElementsAre(HasSubstr("/1970-01-1"), HasSubstr("[1970-01-1"),
+                                          "one replaced"));
+}
+
+TEST(Products, AHostsTestRunsOnFakesAndTheFrameworksTexts) {
+  EXPECT_EQ(linesOf("HostTestWithFakes"), Lines{"done"});
 }
 
 }  // namespace

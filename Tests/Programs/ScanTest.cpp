@@ -2,25 +2,19 @@
 #include <dirent.h>
 #include <dlfcn.h>
 #include <fcntl.h>
-#include <gmock/gmock.h>
-#include <sys/mman.h>
 #include <sys/stat.h>
 #include <sys/syscall.h>
 #include <unistd.h>
 
 #include <cerrno>
-#include <chrono>
 #include <climits>
-#include <csignal>
-#include <filesystem>
+#include <fstream>
 #include <map>
 #include <random>
 #include <set>
 #include <sstream>
 
-#include <Scan/DuplicateFinder.h>
-#include <Tests/Programs/ScanFakes.h>
-#include <Tests/Programs/ScanFolder.h>
+#include <Tests/Programs/ScanFixture.h>
 #include <Tests/Support/ForbiddenCalls.h>
 
 namespace {
@@ -43,63 +37,7 @@ extern "C" ssize_t getdents64(int folder, void* buffer, size_t length) noexcept 
 namespace Orvane::Testing {
 namespace {
 
-namespace fs = std::filesystem;
-using ::testing::ElementsAre;
-using ::testing::IsEmpty;
-using ::testing::Pair;
-using Groups = std::vector<std::vector<std::string>>;
-
-class Scan : public ::testing::Test {
- protected:
-  ScanResult scan(const std::vector<std::string>& folders) {
-    ScanResult result = DuplicateFinder({fileSystem, turns, losses}).find(folders, control);
-    turns.join();
-    return result;
-  }
-  ScanResult scan() { return scan({folder.path()}); }
-
-  static Groups paths(const ScanResult& result) {
-    Groups groups;
-    for (const DuplicateGroup& group : result.groups) groups.push_back(result.pathsOf(group));
-    return groups;
-  }
-
-  void TearDown() override {
-    EXPECT_EQ(fileSystem.faults, 0) << "content was read outside a turn";
-    EXPECT_EQ(fileSystem.openFolders, 0);
-  }
-
-  ScanFolder folder;
-  FaultyFileSystem fileSystem;
-  FakeTurns turns;
-  LossRecorder losses;
-  ScanControl control;
-};
-
-std::string bytes(std::size_t count, char last) {
-  std::string text(count, 'x');
-  text.back() = last;
-  return text;
-}
-
-TEST_F(Scan, TellsContentsApartToTheLastByte) {
-  Groups expected;
-  for (const std::size_t size : {1u, 4095u, 4096u, 4097u, 524'288u, 524'289u, 1'500'000u}) {
-    const std::string name = std::to_string(size);
-    expected.push_back({folder.write(name + "/1", bytes(size, 'a')),
-                        folder.write(name + "/2", bytes(size, 'a')),
-                        folder.write(name + "/3", bytes(size, 'a'))});
-    expected.push_back(
-        {folder.write(name + "/4", bytes(size, 'b')), folder.write(name + "/5", bytes(size, 'b'))});
-    folder.write(name + "/6", bytes(size, 'c'));
-  }
-  const ScanResult result = scan();
-  EXPECT_THAT(paths(result), ::testing::UnorderedElementsAreArray(expected));
-  EXPECT_TRUE(std::is_sorted(result.groups.begin(), result.groups.end(),
-                             [](const DuplicateGroup& a, const DuplicateGroup& b) {
-                               return a.wastedBytes() > b.wastedBytes();
-                             }));
-}
+using Scan = ScanFixture;
 
 TEST_F(Scan, CountsEveryKindOfFileOnce) {
   // The folder that was made first is mostly walked first, yet its link is not the first path.
@@ -182,109 +120,6 @@ TEST_F(Scan, LeavesOutWhatCannotBeRead) {
   EXPECT_THAT(scan().lostFolders, ::testing::SizeIs(1));
 }
 
-TEST_F(Scan, LeavesOutFilesThatVanishOrChangeMeanwhile) {
-  const std::string first = folder.write("1", bytes(10'000, 'a'));
-  const std::string second = folder.write("2", bytes(10'000, 'a'));
-  const std::string gone = folder.write("gone", bytes(10'000, 'a'));
-  const std::string grows = folder.write("grows", bytes(10'000, 'a'));
-  const std::string shrinks = folder.write("shrinks", bytes(10'000, 'a'));
-  const std::string touched = folder.write("touched", bytes(10'000, 'a'));
-  const std::string replaced = folder.write("replaced", bytes(10'000, 'a'));
-  const std::string foldered = folder.write("foldered", bytes(10'000, 'a'));
-  const std::string piped = folder.write("piped", bytes(10'000, 'a'));
-  const std::string unwritten = folder.write("unwritten", bytes(10'000, 'a'));
-  const std::string swapped = folder.write("swapped", bytes(10'000, 'a'));
-  const ScanFolder elsewhere;
-  const std::string twin = elsewhere.write("twin", bytes(10'000, 'a'));
-  int pipe = -1;
-  std::string content = "for another reader";
-  fileSystem.beforeOpen = [&](const std::string& path) {
-    if (path == gone) fs::remove(path);
-    if (path == swapped) {
-      fs::last_write_time(twin, fs::last_write_time(path));
-      fs::rename(twin, path);
-    }
-    if (path == replaced) {
-      fs::remove(path);
-      fs::create_symlink(first, path);
-    }
-    if (path == foldered) {
-      fs::remove(path);
-      fs::create_directory(path);
-    }
-    if (path == piped || path == unwritten) {
-      fs::remove(path);
-      ASSERT_EQ(::mkfifo(path.c_str(), 0600), 0);
-    }
-    if (path == piped) {
-      pipe = ::open(path.c_str(), O_RDWR | O_NONBLOCK | O_CLOEXEC);
-      ASSERT_EQ(::write(pipe, content.data(), content.size()), std::ssize(content));
-    }
-  };
-  fileSystem.beforeRead = [&](const std::string& path) {
-    if (path == grows) std::ofstream(path, std::ios::app) << "more";
-    if (path == shrinks) fs::resize_file(path, 100);
-    if (path == touched)
-      fs::last_write_time(path, fs::file_time_type::clock::now() + std::chrono::hours(1));
-  };
-  const ScanResult result = scan();
-  EXPECT_THAT(paths(result), ElementsAre(ElementsAre(first, second)));
-  EXPECT_EQ(result.totals.vanishedFiles, 1u);
-  EXPECT_EQ(result.totals.changedFiles, 8u);
-  EXPECT_EQ(losses.files.size(), 9u);
-  EXPECT_EQ(::read(pipe, content.data(), content.size()), std::ssize(content));
-  ::close(pipe);
-}
-
-std::atomic<int> leased{-1};
-
-TEST_F(Scan, WaitsForALeaseToBeGivenBack) {
-  const std::string first = folder.write("1", "same");
-  const std::string second = folder.write("2", "same");
-  leased = ::open(second.c_str(), O_RDWR | O_CLOEXEC);
-  struct sigaction giveBack {
-  }, before{};
-  giveBack.sa_handler = [](int) { ::fcntl(leased, F_SETLEASE, F_UNLCK); };
-  ::sigaction(SIGIO, &giveBack, &before);
-  const bool hasLeases = ::fcntl(leased, F_SETLEASE, F_WRLCK) == 0;
-  EXPECT_THAT(paths(scan()), ElementsAre(ElementsAre(first, second)));
-  ::sigaction(SIGIO, &before, nullptr);
-  ::close(leased);
-  if (!hasLeases) GTEST_SKIP() << "the file system of temporary files grants no leases";
-}
-
-/// How many pages of the file are in the system's cache.
-long cachedPages(const std::string& path) {
-  const int file = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
-  const std::size_t size = fs::file_size(path);
-  std::vector<unsigned char> pages((size + 4095) / 4096);
-  void* const mapped = ::mmap(nullptr, size, PROT_READ, MAP_SHARED, file, 0);
-  EXPECT_EQ(::mincore(mapped, size, pages.data()), 0);
-  ::munmap(mapped, size);
-  ::close(file);
-  return std::count_if(pages.begin(), pages.end(), [](auto page) { return page & 1; });
-}
-
-TEST_F(Scan, LeavesThePageCacheAloneWhereItShould) {
-  const std::vector<std::string> files = {folder.write("1", bytes(1'000'000, 'a')),
-                                          folder.write("2", bytes(1'000'000, 'a'))};
-  for (const std::string& path : files) {
-    const int file = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
-    ::fsync(file);
-    ::posix_fadvise(file, 0, 0, POSIX_FADV_DONTNEED);
-    ::close(file);
-    if (cachedPages(path) > 0) GTEST_SKIP() << "their file system is a cache itself";
-  }
-  const auto scanAs = [&](CacheUse use) {
-    const ScanResult result =
-        DuplicateFinder({systemFileSystem(use), turns, losses}).find({folder.path()}, control);
-    EXPECT_THAT(paths(result), ElementsAre(files));
-    return cachedPages(files[0]) + cachedPages(files[1]);
-  };
-  EXPECT_EQ(scanAs(CacheUse::traceless), 0);
-  EXPECT_EQ(scanAs(CacheUse::normal), 2 * 245);
-}
-
 /// Runs the work with every means of the system and without the call that opens a path of many
 /// names at once, which the kernel does not know or a sandbox forbids.
 void withAndWithoutOpenat2(const std::function<void()>& work) {
@@ -346,23 +181,6 @@ TEST_F(Scan, FindsFilesHoweverLongTheirPathIs) {
       [&] { EXPECT_THAT(paths(scan()), ElementsAre(ElementsAre(bottom + "/1", bottom + "/2"))); });
 }
 
-TEST_F(Scan, LosingAFileAtALaterLookLosesNoOther) {
-  for (const int lost : {1, 2, 3}) {
-    const ScanFolder three;
-    std::vector<std::string> left;
-    for (const char* name : {"1", "2", "3"}) left.push_back(three.write(name, bytes(9000, 'a')));
-    const std::string victim = three.path(std::to_string(lost));
-    std::erase(left, victim);
-    std::atomic<int> opened{0};
-    fileSystem.beforeOpen = [&](const std::string& path) {
-      if (path == victim && ++opened == 2) fs::remove(path);
-    };
-    losses.files.clear();
-    EXPECT_THAT(paths(scan({three.path()})), ElementsAre(left));
-    EXPECT_THAT(losses.files, ElementsAre(Pair(victim, Loss::Kind::vanished)));
-  }
-}
-
 TEST_F(Scan, StopsWhenAskedTo) {
   for (int i = 0; i < 100; ++i) folder.write(std::to_string(i) + "/file", "same");
   std::atomic<int> begun{0};
@@ -390,17 +208,6 @@ TEST_F(Scan, StopsWithinAFolderWhenAskedTo) {
   EXPECT_EQ(control.filesToRead, 0u) << "nobody asks for them any more";
 }
 
-TEST_F(Scan, StopsWithinAFileWhenAskedTo) {
-  for (int i = 0; i < 3; ++i) fs::resize_file(folder.write(std::to_string(i), ""), 1'000'000'000);
-  std::atomic<int> blocks{0};
-  fileSystem.beforeRead = [&](const std::string&) {
-    // Each file's beginning, middle and end are read first.
-    if (++blocks > 10) control.isCancelled = true;
-  };
-  EXPECT_THAT(paths(scan()), IsEmpty()) << "nobody has seen the rest";
-  EXPECT_LE(blocks, 20);
-}
-
 TEST_F(Scan, PassesOnWhatATaskThrows) {
   folder.write("1", "same");
   folder.write("2", "same");
@@ -418,69 +225,6 @@ TEST_F(Scan, PassesOnWhatATaskThrows) {
   turns.join();
   EXPECT_THROW((void)scan({"/"}), std::bad_alloc);
   turns.join();
-}
-
-using Reading = FaultyFileSystem::Reading;
-
-TEST_F(Scan, ReadsADiskThatMustWorkByPlaceAndEverythingOnce) {
-  turns.disk = {.places = 1, .isOrdered = true};
-  turns.stepsPerTurn = 1;
-  std::vector<Reading> expected;
-  for (const int place : {5, 1, 7, 3, 2, 6, 4}) {
-    const std::string path =
-        folder.write(std::to_string(place), bytes(10'000, place < 4 ? 'a' : 'b'));
-    fileSystem.places[path] = static_cast<std::uint64_t>(place);
-  }
-  for (const auto& [path, place] : fileSystem.places) expected.push_back({path, 0, 10'000});
-  EXPECT_THAT(paths(scan()), ::testing::SizeIs(2));
-  // The first file shows that the disk must work: of that one only, the head was read before.
-  ASSERT_EQ(fileSystem.readings.size(), 8u);
-  const Reading first = fileSystem.readings.front();
-  EXPECT_EQ(first.length, 4096u);
-  fileSystem.readings.erase(fileSystem.readings.begin());
-  std::erase_if(expected, [&](const Reading& reading) { return reading.path == first.path; });
-  expected.push_back({first.path, 0, 10'000});
-  EXPECT_EQ(fileSystem.readings, expected);
-
-  // Where places cannot be told, inodes stand for them, and the question is soon given up.
-  fileSystem.places = {{"nowhere", 1}};
-  fileSystem.readings.clear();
-  fileSystem.placesAsked = 0;
-  for (int i = 10; i < 30; ++i) folder.write(std::to_string(i), bytes(10'000, 'a'));
-  EXPECT_THAT(paths(scan()), ::testing::SizeIs(2));
-  EXPECT_EQ(fileSystem.readings.size(), 28u);
-  EXPECT_EQ(fileSystem.placesAsked, 8 + 1) << "the first file's rest is a look of its own";
-}
-
-TEST_F(Scan, NeverReadsTwoLargeFilesOfAnOrderedDiskByTurns) {
-  turns.disk = {.places = 2, .isOrdered = true};
-  turns.stepsPerTurn = 7;
-  std::vector<std::string> equal;
-  for (const char* name : {"1", "2", "3"})
-    equal.push_back(folder.write(name, bytes(12'000'000, 'a')));
-  EXPECT_THAT(paths(scan()), ElementsAre(equal));
-  std::erase_if(fileSystem.readings, [](const Reading& reading) { return reading.length <= 4096; });
-  std::uint64_t total = 0;
-  for (std::size_t i = 0; i < fileSystem.readings.size(); ++i) {
-    const Reading& reading = fileSystem.readings[i];
-    total += reading.length;
-    EXPECT_TRUE(reading.offset == 0 || reading.path == fileSystem.readings[i - 1].path);
-  }
-  EXPECT_EQ(total, 36'000'000u) << "everything is read once";
-}
-
-TEST_F(Scan, TellsLargeFilesApartByTheirMiddleOrEnd) {
-  for (const std::size_t place : {5'000'000u, 9'999'999u}) {
-    const ScanFolder large;
-    for (const char letter : {'a', 'b', 'c'}) {
-      std::string content(10'000'000, 'x');
-      content[place] = letter;
-      large.write(std::string(1, letter), content);
-    }
-    control.bytesRead = 0;
-    EXPECT_THAT(paths(scan({large.path()})), IsEmpty());
-    EXPECT_EQ(control.bytesRead, 3u * 3 * 4096);
-  }
 }
 
 TEST_F(Scan, DoesWithFewDescriptors) {
@@ -520,7 +264,8 @@ TEST_F(Scan, FindsWhatANaiveSearchFindsWhateverTheTree) {
       constexpr const char* names[] = {"d/", "d-/", "d0/"};
       for (unsigned depth = below(4); depth > 0; --depth) name += names[below(3)];
       // Few sizes around the boundaries and few differences make many near misses.
-      constexpr std::size_t sizes[] = {0, 1, 4096, 4097, 9000, 9000, 9000, 300'000, 1'100'000};
+      constexpr std::size_t sizes[] = {0,      1,      16'384,  16'385,   20'000,
+                                       20'000, 20'000, 300'000, 1'100'000};
       std::string content(sizes[below(9)], 'x');
       if (!content.empty() && below(2) == 0) content[below(3) * (content.size() - 1) / 2] = 'y';
       tree.write(name + "d" + std::to_string(file), content);

@@ -62,7 +62,7 @@ TEST(FriendsLocator, EachProductAnswersForItselfAndItsFamily) {
 
 TEST(FriendsLocator, AsksTheProcessesWorkspaceUntilAnotherIsSet) {
   OVFriendsLocator::sharedLocator().setWorkspace(nullptr);
-  EXPECT_EQ(OVFriendsLocator::workspace().get(), &Platform::processPorts().workspace);
+  EXPECT_EQ(OVFriendsLocator::workspace().get(), &Platform::processPorts().workspace.get());
   const auto other = std::make_shared<Platform::Testing::FakeWorkspace>();
   OVFriendsLocator::sharedLocator().setWorkspace(other);
   EXPECT_EQ(OVFriendsLocator::workspace(), other);

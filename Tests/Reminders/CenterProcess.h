@@ -11,7 +11,9 @@
 #include <vector>
 
 #include <Tests/Support/Zones.h>
+#include <Varnel/Platform/Generic/InProcessDeliverer.h>
 #include <Varnel/Platform/Generic/ScheduledNotificationCenter.h>
+#include <Varnel/Platform/Generic/SharedWallClockTimer.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
@@ -19,6 +21,7 @@
 #include <Varnel/Platform/Testing/FakeNotificationServer.h>
 #include <Varnel/Platform/Testing/FakeUser.h>
 #include <Varnel/Platform/Testing/FakeWallClockTimer.h>
+#include <Varnel/Platform/Testing/FaultyPrivateFiles.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -26,7 +29,6 @@ namespace Varnel::Platform::Testing {
 class Listener final : public UserNotificationCenterDelegate {
  public:
   bool presents = true;
-  bool throws = false;
   std::vector<std::string> events;
 
   void didDeliver(UserNotificationCenter&, const UserNotification& notification) override {
@@ -35,10 +37,7 @@ class Listener final : public UserNotificationCenterDelegate {
   void didActivate(UserNotificationCenter&, const UserNotification& notification) override {
     events.push_back("activated " + *notification.title);
   }
-  bool shouldPresent(UserNotificationCenter&, const UserNotification&) override {
-    if (throws) throw 1;
-    return presents;
-  }
+  bool shouldPresent(UserNotificationCenter&, const UserNotification&) override { return presents; }
 };
 
 /// A process of the product, on the store that all share.
@@ -49,7 +48,8 @@ struct Process {
           Desktop shared = std::make_shared<FakeNotificationServer>())
       : clock(now),
         desktop(std::move(shared)),
-        center({clock, locale, zones, queue, *files, log, server, timer}, file.string()) {}
+        deliverer({clock, locale, zones, queue, files, log, server, *dates}, file.string()),
+        center({clock, locale, zones, files, log, *pauses}, file.string(), source, deliverer) {}
 
   void listen() { center.setDelegate(listener); }
   void schedule(const UserNotification& notification) {
@@ -64,6 +64,11 @@ struct Process {
   [[nodiscard]] std::vector<UserNotification> delivered() {
     return center.deliveredNotifications().valueOr({});
   }
+  /// Until the server and the main queue have nothing left to do.
+  void settle() {
+    do server.report();
+    while (queue.drain());
+  }
   static std::string textOf(const std::optional<PlatformError>& error) {
     return error ? error->localizedDescription() : "";
   }
@@ -72,11 +77,17 @@ struct Process {
   FakeUserLocale locale;
   FakeTimeZones zones = Tests::zonesOf2026();
   FakeMainQueue queue;
-  const std::unique_ptr<PrivateFiles> files = POSIX::makePrivateFiles();
+  const std::unique_ptr<PrivateFiles> realFiles = POSIX::makePrivateFiles();
+  FaultyPrivateFiles files{*realFiles};
   CapturedSystemLog log;
   const Desktop desktop;  ///< It outlives the process.
   FakeNotificationServer& server = *desktop;
   FakeWallClockTimer timer{clock};
+  SharedWallClockTimer timers{clock, timer};
+  const std::unique_ptr<WallClockTimer> dates = timers.share();
+  const std::unique_ptr<WallClockTimer> pauses = timers.share();
+  const NotificationSource source{.identifier = "com.example.Fotovia", .name = "Fotovia"};
+  InProcessDeliverer deliverer;
   ScheduledNotificationCenter center;
   const std::shared_ptr<Listener> listener = std::make_shared<Listener>();
 };

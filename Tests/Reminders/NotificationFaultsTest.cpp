@@ -1,19 +1,10 @@
 // SPDX-License-Identifier: MIT
-#include <Varnel/Platform/Generic/ScheduledNotificationCenter.h>
-
 #include <gtest/gtest.h>
 
 #include <memory>
 
+#include <Tests/Reminders/CenterProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
-#include <Tests/Support/Zones.h>
-#include <Varnel/Platform/POSIX/Adapters.h>
-#include <Varnel/Platform/Testing/CapturedOutput.h>
-#include <Varnel/Platform/Testing/FakeMainQueue.h>
-#include <Varnel/Platform/Testing/FakeNotificationServer.h>
-#include <Varnel/Platform/Testing/FakeUser.h>
-#include <Varnel/Platform/Testing/FakeWallClockTimer.h>
-#include <Varnel/Platform/Testing/FaultyPrivateFiles.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -24,37 +15,20 @@ using Testing::Fault;
 
 constexpr Date start = sys_days(2026y / March / 1) + 8h;
 
-struct Anybody final : UserNotificationCenterDelegate {
-  void didDeliver(UserNotificationCenter&, const UserNotification&) override {}
-  void didActivate(UserNotificationCenter&, const UserNotification&) override {}
-  bool shouldPresent(UserNotificationCenter&, const UserNotification&) override { return true; }
-};
-
 // A process on a machine whose store and desktop go wrong by one plan.
 struct Machine {
   explicit Machine(const std::shared_ptr<Testing::FaultPlan>& faults) {
-    files.faults = server.faults = faults;
-    center.setDelegate(delegate);
+    process.files.faults = process.server.faults = faults;
+    process.listen();
   }
 
   void advanceTo(Date date) {
-    timer.advanceTo(date);
-    server.report();
+    process.timer.advanceTo(date);
+    process.settle();
   }
 
   const Tests::TemporaryFolder folder = Tests::TemporaryFolder::inMemory();
-  Testing::SimulatedClock clock{start};
-  Testing::FakeUserLocale locale;
-  Testing::FakeTimeZones zones = Tests::zonesOf2026();
-  Testing::FakeMainQueue queue;
-  const std::unique_ptr<PrivateFiles> realFiles = POSIX::makePrivateFiles();
-  Testing::FaultyPrivateFiles files{*realFiles};
-  Testing::CapturedSystemLog log;
-  Testing::FakeNotificationServer server;
-  Testing::FakeWallClockTimer timer{clock};
-  ScheduledNotificationCenter center{{clock, locale, zones, queue, files, log, server, timer},
-                                     (folder.path() / "store.sqlite").string()};
-  const std::shared_ptr<Anybody> delegate = std::make_shared<Anybody>();
+  Testing::Process process{folder.path() / "store.sqlite", start};
 };
 
 // What was promised comes once, sooner or later. What was refused comes once at most: a store that
@@ -66,19 +40,20 @@ TEST(NotificationFaults, LoseNoReminderThatWasPromised) {
           fault,
           [&](const auto& faults) {
             Machine machine(faults);
-            const bool isPromised = !machine.center.scheduleNotification(
+            const bool isPromised = !machine.process.center.scheduleNotification(
                 {.identifier = "once", .title = "Once", .deliveryDate = start + 1h});
             machine.advanceTo(start + 1h);
             machine.advanceTo(start + 2h);
             faults->mend();
             machine.advanceTo(start + 2h + ScheduledNotificationCenter::maxPause);
             machine.advanceTo(start + days(1));
-            const std::size_t shown = machine.server.history().size();
-            EXPECT_TRUE(shown == 1 || (shown == 0 && !isPromised)) << shown << machine.log.text();
-            const auto delivered = machine.center.deliveredNotifications();
+            const std::size_t shown = machine.process.server.history().size();
+            EXPECT_TRUE(shown == 1 || (shown == 0 && !isPromised))
+                << shown << machine.process.log.text();
+            const auto delivered = machine.process.center.deliveredNotifications();
             ASSERT_TRUE(delivered);
             EXPECT_EQ(delivered->size(), shown);
-            const auto scheduled = machine.center.scheduledNotifications();
+            const auto scheduled = machine.process.center.scheduledNotifications();
             ASSERT_TRUE(scheduled);
             EXPECT_TRUE(scheduled->empty());
           },

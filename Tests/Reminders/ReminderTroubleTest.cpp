@@ -125,7 +125,7 @@ const Trouble troubles[] = {
      [](Home& home) { home.sql("PRAGMA application_id = 1447980916"); },
      "belongs to another application", Trouble::isLeftAlone},
     {"a newer format", [](Home& home) { home.sql("PRAGMA user_version = 2000"); },
-     [](Home& home) { home.sql("PRAGMA user_version = 1000"); }, "the file's format is 2.0",
+     [](Home& home) { home.sql("PRAGMA user_version = 1001"); }, "the file's format is 2.0",
      Trouble::isLeftAlone},
     {"damage",
      [](Home& home) { std::ofstream(home.store, std::ios::binary) << std::string(20'000, 'y'); },
@@ -207,7 +207,7 @@ TEST_P(ReminderTrouble, WhatIsDueComesLater) {
   trouble.end(*home);
   for (auto date = start + week + 2min; date < start + 2 * week; date += 12h) {
     process.timer.advanceTo(date);
-    process.server.report();
+    process.settle();
   }
   EXPECT_THAT(process.server.history(), SizeIs(1));
   EXPECT_EQ(process.timer.armedDate(), start + 2 * week);

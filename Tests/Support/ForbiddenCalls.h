@@ -8,19 +8,32 @@
 
 #include <cstddef>
 #include <functional>
-#include <initializer_list>
 #include <thread>
 #include <vector>
 
 namespace Varnel::Tests {
 
+/// A system call or, with flags, those of its uses that have one of them as the sixth argument.
+struct ForbiddenCall {
+  ForbiddenCall(unsigned theNumber, unsigned theFlags = 0) : number(theNumber), flags(theFlags) {}
+
+  unsigned number;
+  unsigned flags;
+};
+
 /// Does the work on a thread for which, and for those that it starts, the system calls fail: as on
 /// a kernel without them (ENOSYS) or in a sandbox (EPERM).
-inline void onAKernelThatForbids(std::initializer_list<unsigned> calls, int failure,
+inline void onAKernelThatForbids(const std::vector<ForbiddenCall>& calls, int failure,
                                  const std::function<void()>& work) {
   std::vector<sock_filter> steps{BPF_STMT(BPF_LD | BPF_W | BPF_ABS, offsetof(seccomp_data, nr))};
-  for (const unsigned call : calls) {
-    steps.push_back(BPF_JUMP(BPF_JMP | BPF_JEQ | BPF_K, call, 0, 1));
+  for (const ForbiddenCall& call : calls) {
+    const unsigned char length = call.flags == 0 ? 1 : 4;
+    steps.push_back(BPF_JUMP(BPF_JMP | BPF_JEQ | BPF_K, call.number, 0, length));
+    if (call.flags != 0) {
+      steps.push_back(BPF_STMT(BPF_LD | BPF_W | BPF_ABS, offsetof(seccomp_data, args[5])));
+      steps.push_back(BPF_JUMP(BPF_JMP | BPF_JSET | BPF_K, call.flags, 1, 0));
+      steps.push_back(BPF_STMT(BPF_RET | BPF_K, SECCOMP_RET_ALLOW));
+    }
     steps.push_back(BPF_STMT(BPF_RET | BPF_K, SECCOMP_RET_ERRNO | static_cast<unsigned>(failure)));
   }
   steps.push_back(BPF_STMT(BPF_RET | BPF_K, SECCOMP_RET_ALLOW));

@@ -5,10 +5,12 @@
 
 #include <fstream>
 #include <functional>
+#include <future>
 
 #include <Tests/Support/Crew.h>
 #include <Tests/Support/MountNamespace.h>
 #include <Tests/Tallyhouse/SpoolFixture.h>
+#include <Varnel/Platform/Testing/FaultyPrivateFiles.h>
 
 namespace Tallyhouse {
 namespace {
@@ -47,6 +49,34 @@ TEST_F(EventSpoolTest, KeepsWhatItTookInOrderAndForItsOwnerAlone) {
   EXPECT_EQ(log.text(), "");
 }
 
+TEST_F(EventSpoolTest, AtAFirstStartNothingIsHeldButForAnothersLock) {
+  using Varnel::Platform::Testing::Fault;
+  Varnel::Platform::Testing::FaultyPrivateFiles faulty(*files);
+  const auto faults = faulty.faults;
+  EventRecorder recorder({faulty, clock, log}, path(), {});
+  {
+    const auto making = files->tryLock(path() + ".opening");
+    ASSERT_TRUE(making && *making);
+    recorder.begin();
+    append(recorder, {"a"});
+    EXPECT_EQ(recorder.counts(3).held, 1);
+  }
+  // The file is made, for one thread, and that takes its time.
+  const std::size_t next = faults->calls() + 1;
+  faults->plan(Fault::delays, next);
+  auto settling = std::async(std::launch::async, [&] { return recorder.settle(Haste::none); });
+  faults->waitForCalls(next);
+  auto appending = std::async(std::launch::async, [&] {
+    append(recorder, {"b"});
+    return recorder.counts(3).held;
+  });
+  appending.wait_for(100ms);
+  faults->mend();
+  EXPECT_EQ(appending.get(), 0) << "nor what another thread appends meanwhile";
+  EXPECT_FALSE(settling.get());
+  EXPECT_EQ(names(), "a b ");
+}
+
 TEST_F(EventSpoolTest, WhatIsRefusedLeavesTheLineAndIsSetAsideAtLast) {
   append(*openRecorder(), {"a", "b", "c"});
   const auto spool = openSpool();
@@ -78,7 +108,7 @@ TEST_F(EventSpoolTest, WhatIsDeliveredIsToldOfEachProcessAlone) {
   append(*other, {"last"});
   const auto events = spool->waiting(many, many);
   ASSERT_EQ(events.size(), 3u);
-  EXPECT_FALSE(spool->isDelivered(other->own()));
+  EXPECT_FALSE(other->isAllDelivered());
   auto others = events;
   for (SpooledEvent& event : others) event.uuid = "has this number now";
   for (const Verdict verdict : {Verdict::delivered, Verdict::refused})
@@ -86,20 +116,17 @@ TEST_F(EventSpoolTest, WhatIsDeliveredIsToldOfEachProcessAlone) {
   EXPECT_EQ(namesOf(*spool), "first refused last ");
   EXPECT_TRUE(spool->save({{events[1]}, Verdict::refused, clock.now(), {}}));
   EXPECT_TRUE(spool->save({{events[0], events[2]}, Verdict::delivered, clock.now(), {}}));
-  EXPECT_TRUE(spool->isDelivered(other->own()));
-  EXPECT_FALSE(spool->isDelivered(one->own()));
+  EXPECT_TRUE(other->isAllDelivered());
+  EXPECT_FALSE(one->isAllDelivered());
 }
 
 TEST_F(EventSpoolTest, WhatComesWhileTheDelivererLooksIsNotOverlooked) {
   const auto recorder = openRecorder();
   append(*recorder, {"a"});
-  const OwnEvents delivered = recorder->own();
   recorder->looking();
   EXPECT_EQ(recorder->append("b", clock.now(), "x"), 1) << "which wakes it";
   recorder->seen(30);
   EXPECT_EQ(recorder->append("c", clock.now(), "x"), 32);
-  recorder->forget(delivered);
-  EXPECT_FALSE(openSpool()->isDelivered(recorder->own()));
 }
 
 TEST_F(EventSpoolTest, DropsAndCountsTheOldestAtEitherLimitWhoeverRecords) {
@@ -111,7 +138,7 @@ TEST_F(EventSpoolTest, DropsAndCountsTheOldestAtEitherLimitWhoeverRecords) {
   append(*openRecorder({.maxEvents = 4}), {"d", "e", "f"});
   EXPECT_EQ(namesOf(*spool), "c d e f ");
   EXPECT_TRUE(spool->refused(3).empty()) << "they count, too";
-  EXPECT_EQ(one->droppedCount(), 2);
+  EXPECT_EQ(one->counts(3).dropped, 2);
 
   const auto small = openRecorder({.maxBytes = 100 << 10});
   for (int i = 0; i < 200; ++i) small->append("large", clock.now(), std::string(5000, 'x'));
@@ -119,8 +146,8 @@ TEST_F(EventSpoolTest, DropsAndCountsTheOldestAtEitherLimitWhoeverRecords) {
   const auto kept = spool->waiting(many, many << 20).size();
   EXPECT_GT(kept, 5u);
   EXPECT_LT(kept, 20u);
-  EXPECT_EQ(small->droppedCount(), 6 + 200 - static_cast<std::int64_t>(kept));
-  EXPECT_FALSE(spool->isDelivered(one->own())) << "gone is not delivered";
+  EXPECT_EQ(small->counts(3).dropped, 6 + 200 - static_cast<std::int64_t>(kept));
+  EXPECT_FALSE(one->isAllDelivered()) << "gone is not delivered";
 }
 
 TEST_F(EventSpoolTest, ARefusalOfConsentReachesWhatOtherProcessesHoldAndDo) {
@@ -133,17 +160,17 @@ TEST_F(EventSpoolTest, ARefusalOfConsentReachesWhatOtherProcessesHoldAndDo) {
   {
     OtherConnection lock(path(), "BEGIN IMMEDIATE");
     append(*other, {"held"});
-    EXPECT_TRUE(other->own().isHeld);
+    EXPECT_TRUE(other->counts(3).held > 0);
   }
   std::ofstream(path() + ".damaged") << "x";
   one->discard();
   EXPECT_FALSE(fs::exists(path() + ".damaged"));
   one->begin();
   append(*one, {"c"});
-  EXPECT_FALSE(other->settle(spool->file(), Haste::none));
+  EXPECT_FALSE(other->settle(Haste::none));
   append(*other, {"d"});
   EXPECT_EQ(namesOf(*spool), "c ") << "the other process asks before it records again";
-  EXPECT_FALSE(spool->isDelivered(other->own()));
+  EXPECT_FALSE(other->isAllDelivered());
   for (const Verdict verdict : {Verdict::delivered, Verdict::refused})
     EXPECT_TRUE(spool->save({batch, verdict, clock.now(), {}}));
   EXPECT_EQ(namesOf(*spool), "c ") << "the batch on its way took nothing with it";
@@ -151,9 +178,9 @@ TEST_F(EventSpoolTest, ARefusalOfConsentReachesWhatOtherProcessesHoldAndDo) {
   other->begin();
   append(*other, {"e"});
   EXPECT_TRUE(spool->save({spool->waiting(many, many), Verdict::delivered, clock.now(), {}}));
-  EXPECT_TRUE(spool->isDelivered(one->own()));
-  EXPECT_FALSE(spool->isDelivered(other->own())) << "\"d\" was given up";
-  EXPECT_EQ(one->droppedCount(), 0);
+  EXPECT_TRUE(one->isAllDelivered());
+  EXPECT_FALSE(other->isAllDelivered()) << "\"d\" was given up";
+  EXPECT_EQ(one->counts(3).dropped, 0);
   one->discard();
   append(*other, {"f"});
   EXPECT_EQ(namesOf(*spool), "") << "nor is there a short way past a refusal";
@@ -199,7 +226,7 @@ TEST_F(EventSpoolTest, ARefusalThatTheFileDoesNotAllowYetIsMadeUpFor) {
   recorder->begin();
   lock.end();
   append(*recorder, {"b"});
-  EXPECT_FALSE(recorder->settle(spool->file(), Haste::none));
+  EXPECT_FALSE(recorder->settle(Haste::none));
   EXPECT_FALSE(isFound("Secret", fs::path(path()).parent_path()));
   EXPECT_EQ(namesOf(*spool), "b ");
   append(*recorder, {"c"});
@@ -236,16 +263,16 @@ class AwayTest : public EventSpoolTest {
     append(*recorder, {"c", "d", "e"});
     EXPECT_LT(std::chrono::steady_clock::now() - start, 1s) << "only the first waits";
     const auto spool = openSpool();
-    EXPECT_TRUE(recorder->settle(spool->file(), Haste::none));
-    EXPECT_TRUE(recorder->own().isHeld);
-    EXPECT_TRUE(recorder->own().hasLost);
+    EXPECT_TRUE(recorder->settle(Haste::none));
+    EXPECT_TRUE(recorder->counts(3).held > 0);
+    EXPECT_FALSE(recorder->isAllDelivered());
     obstacle.reset();
-    EXPECT_FALSE(recorder->settle(spool->file(), Haste::none));
+    EXPECT_FALSE(recorder->settle(Haste::none));
     append(*recorder, {"f"});
     const std::string found = names();
     EXPECT_TRUE(found.starts_with(c.isSudden ? "a b x " : "a x ")) << found;
     EXPECT_TRUE(found.ends_with("x c d e f ")) << found;
-    EXPECT_EQ(recorder->droppedCount(), 1);
+    EXPECT_EQ(recorder->counts(3).dropped, 1);
   }
 };
 
@@ -369,7 +396,7 @@ TEST_F(EventSpoolTest, TheLastEventsAreCarriedOverWhenAskedForAndAtTheEnd) {
   append(*recorder, {"a"});
   fs::rename(made, made.string() + ".1");
   append(*recorder, {"b"});
-  EXPECT_TRUE(recorder->isInPlace());
+  EXPECT_FALSE(recorder->isAllDelivered());
   EXPECT_EQ(names(), "a b ");
   clock.advance(1ms);
   fs::rename(made, made.string() + ".2");
@@ -392,14 +419,14 @@ TEST_F(EventSpoolTest, ThreadsAndProcessesMayShareAFile) {
     const auto batch = spool->waiting(20, many);
     if (spool->save({batch, Verdict::delivered, clock.now(), {}})) removed += batch.size();
     spool->file().checkpoint();
-    one->settle(spool->file(), Haste::none);
-    other->settle(spool->file(), Haste::none);
+    one->settle(Haste::none);
+    other->settle(Haste::none);
   }
   threads.join();
   for (EventRecorder* recorder : {one.get(), other.get()})
-    EXPECT_FALSE(recorder->settle(spool->file(), Haste::none));
+    EXPECT_FALSE(recorder->settle(Haste::none));
   EXPECT_EQ(removed + spool->waiting(many, many).size(), 4u * each);
-  EXPECT_EQ(one->droppedCount(), 0);
+  EXPECT_EQ(one->counts(3).dropped, 0);
 }
 
 }  // namespace

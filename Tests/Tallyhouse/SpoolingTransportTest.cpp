@@ -169,7 +169,7 @@ TEST_F(SpoolingTransportTest, ADrainEndsWhenTheServerFails) {
   EXPECT_FALSE(transport->drain(1h));
   EXPECT_FALSE(transport->drain(1h)) << "nor does it wait for the pause to end";
   track(tracker, std::string(10'000, 'x'));
-  EXPECT_EQ(transport->droppedCount(), 1);
+  EXPECT_EQ(transport->counts().dropped, 1);
 }
 
 }  // namespace

@@ -14,35 +14,16 @@
 namespace Varnel::Platform {
 namespace {
 
-// Headers of older systems do not know of these.
-constexpr int dropAfterReading = 0x80;  // RWF_DONTCACHE, Linux 6.14
-constexpr long cachestat = 451;         // Linux 6.5
-
-struct CachestatRange {
-  std::uint64_t offset;
-  std::uint64_t size;
-};
-struct CachestatAnswer {
-  std::uint64_t cached;
-  std::uint64_t others[4];
-};
+constexpr int dropBehind = 0x80;  // RWF_DONTCACHE, Linux 6.14; older headers lack it
 
 std::error_code lastError() {
   return {errno, std::generic_category()};
 }
 
 /// Older kernels and file systems lack the call or its flag, some sandboxes forbid it.
-bool saysThatItIsNotToBeHad(int error) {
-  return error == EOPNOTSUPP || error == ENOSYS || error == EPERM || error == EINVAL;
-}
-
-template <typename Call>
-ssize_t uninterrupted(Call call) {
-  ssize_t count = 0;
-  do {
-    count = call();
-  } while (count < 0 && errno == EINTR);
-  return count;
+bool saysThatItIsNotToBeHad(const std::error_code& error) {
+  const int code = error.value();
+  return code == EOPNOTSUPP || code == ENOSYS || code == EPERM || code == EINVAL;
 }
 
 }  // namespace
@@ -53,44 +34,43 @@ TracelessReader::~TracelessReader() {
                     POSIX_FADV_DONTNEED);
 }
 
-Result<std::size_t, std::error_code> TracelessReader::read(std::span<std::byte> buffer,
-                                                           std::uint64_t offset) {
-  const auto position = static_cast<off_t>(offset);
-  if (giver_ != Giver::self) {
-    const iovec part{.iov_base = buffer.data(), .iov_len = buffer.size()};
-    const ssize_t count =
-        uninterrupted([&] { return ::preadv2(descriptor_, &part, 1, position, dropAfterReading); });
-    if (count >= 0) {
-      giver_ = Giver::system;
-      return static_cast<std::size_t>(count);
-    }
-    if (giver_ == Giver::system || !saysThatItIsNotToBeHad(errno)) return lastError();
-    giver_ = Giver::self;
+TracelessReader::Count TracelessReader::read(std::span<std::byte> buffer, std::uint64_t offset) {
+  if (way_ == Way::droppingBehind) {
+    const Count count = readWith(dropBehind, buffer, offset);
+    if (count || !saysThatItIsNotToBeHad(count.error())) return count;
+    way_ = Way::fromCache;
+  }
+  if (way_ == Way::fromCache) {
+    const Count count = readWith(RWF_NOWAIT, buffer, offset);
+    if (count) return count;
+    way_ = Way::noting;
     noteAbsentRanges();
   }
-  const ssize_t count =
-      uninterrupted([&] { return ::pread(descriptor_, buffer.data(), buffer.size(), position); });
-  if (count < 0) return lastError();
-  return static_cast<std::size_t>(count);
+  while (true) {
+    const ssize_t count =
+        ::pread(descriptor_, buffer.data(), buffer.size(), static_cast<off_t>(offset));
+    if (count >= 0) return static_cast<std::size_t>(count);
+    if (errno != EINTR) return lastError();
+  }
 }
 
-// Before the first byte is read, because the system reads ahead of the reader.
+TracelessReader::Count TracelessReader::readWith(int flags, std::span<std::byte> buffer,
+                                                 std::uint64_t offset) const {
+  const iovec part{.iov_base = buffer.data(), .iov_len = buffer.size()};
+  while (true) {
+    const ssize_t count = ::preadv2(descriptor_, &part, 1, static_cast<off_t>(offset), flags);
+    if (count >= 0) return static_cast<std::size_t>(count);
+    if (errno != EINTR) return lastError();
+  }
+}
+
+// Costs a mapping, so it is done where the disk has to work anyway. What the system began to read
+// ahead when the cache was asked still counts as absent, as long as it is on its way. The kernel
+// calls everything present in a file that is not the user's own.
 void TracelessReader::noteAbsentRanges() {
   struct stat status {};
   if (::fstat(descriptor_, &status) != 0 || !S_ISREG(status.st_mode) || status.st_size <= 0) return;
   const auto fileSize = static_cast<std::uint64_t>(status.st_size);
-  const auto pageSize = static_cast<std::uint64_t>(::sysconf(_SC_PAGESIZE));
-  CachestatRange everything{};
-  CachestatAnswer answer{};
-  if (::syscall(cachestat, descriptor_, &everything, &answer, 0) == 0) {
-    if (answer.cached == 0) absent_ = {{0, 0}};
-    if (answer.cached == 0 || answer.cached >= (fileSize + pageSize - 1) / pageSize) return;
-  }
-  noteAbsentRanges(fileSize);
-}
-
-// Costs a mapping. The kernel calls everything present in a file that is not the user's own.
-void TracelessReader::noteAbsentRanges(std::uint64_t fileSize) {
   constexpr std::uint64_t windowSize = 64u << 20;
   const auto pageSize = static_cast<std::uint64_t>(::sysconf(_SC_PAGESIZE));
   std::vector<unsigned char> pages;

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <map>
 
+#include <Varnel/Platform/Generic/InProcessDeliverer.h>
 #include <Varnel/Platform/Generic/ScheduledNotificationCenter.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/MainLoop/FileWatch.h>
@@ -18,28 +19,47 @@ namespace {
 
 namespace fs = std::filesystem;
 
-// One center with everything that serves it alone. Other processes of the product may change its
-// file, whose folder the center makes; a change of the user's time zone changes the link
-// /etc/localtime.
-class Center final {
+// A deliverer of this process with everything that serves it alone. Other processes of the product
+// may change its file, whose folder is there by then; a change of the user's time zone changes the
+// link /etc/localtime.
+class LocalDeliverer final {
  public:
-  Center(const NotificationPorts& ports, const NotificationSource& source, const fs::path& store)
+  LocalDeliverer(const NotificationPorts& ports, const NotificationSource& source,
+                 const fs::path& store)
       : server_(makeNotificationServer(ports.systemLog, source, makeSessionBus())),
         timer_(makeWallClockTimer(ports.systemLog)),
-        center_({ports.clock, ports.userLocale, ports.timeZones, ports.mainQueue,
-                 ports.privateFiles, ports.systemLog, *server_, *timer_},
-                store.string()),
-        storeWatch_(store.parent_path(), store.filename(), [this] { center_.recheck(); }),
-        zoneWatch_("/etc", "localtime", [this] { center_.recheck(); }) {}
+        deliverer_({ports.clock, ports.userLocale, ports.timeZones, ports.mainQueue,
+                    ports.privateFiles, ports.systemLog, *server_, *timer_},
+                   store.string()),
+        storeWatch_(store.parent_path(), store.filename(), [this] { deliverer_.changed(); }),
+        zoneWatch_("/etc", "localtime", [this] { deliverer_.changed(); }) {}
 
-  UserNotificationCenter& center() { return center_; }
+  DelivererConnection& connection() { return deliverer_; }
 
  private:
   const std::unique_ptr<NotificationServer> server_;
   const std::unique_ptr<WallClockTimer> timer_;
-  ScheduledNotificationCenter center_;
+  InProcessDeliverer deliverer_;
   const FileWatch storeWatch_;
   const FileWatch zoneWatch_;
+};
+
+// One center with everything that serves it alone.
+class Center final {
+ public:
+  Center(const NotificationPorts& ports, const NotificationSource& source, const fs::path& store)
+      : deliverer_(ports, source, store),
+        timer_(makeWallClockTimer(ports.systemLog)),
+        center_({ports.clock, ports.userLocale, ports.timeZones, ports.privateFiles,
+                 ports.systemLog, *timer_},
+                store.string(), source, deliverer_.connection()) {}
+
+  UserNotificationCenter& center() { return center_; }
+
+ private:
+  LocalDeliverer deliverer_;
+  const std::unique_ptr<WallClockTimer> timer_;
+  ScheduledNotificationCenter center_;
 };
 
 class StoredCenters final : public UserNotificationCenters {

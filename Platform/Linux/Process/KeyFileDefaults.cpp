@@ -7,7 +7,6 @@
 
 #include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
-#include <Varnel/Platform/Text/UTF8.h>
 #include <Varnel/Platform/Values/UniqueHandle.h>
 
 namespace Varnel::Platform::Linux {
@@ -25,32 +24,6 @@ Text escaped(const std::string& key) {
   return Text(g_uri_escape_string(key.c_str(), nullptr, FALSE));
 }
 
-bool canBeKey(const std::string& text) {
-  return !text.empty() && text.find('\0') == std::string::npos;
-}
-
-// Another text would be cut, or be refused by the reader.
-bool canBeKept(const UserDefaults::Value& value) {
-  const auto* text = std::get_if<std::string>(&value);
-  return !text || (text->find('\0') == std::string::npos && isValidUTF8(*text));
-}
-
-PlatformError invalidArgument() {
-  return PlatformError(std::make_error_code(std::errc::invalid_argument));
-}
-
-struct Setter {
-  GKeyFile* file;
-  const char* key;
-
-  void operator()(bool value) const { g_key_file_set_boolean(file, group, key, value); }
-  void operator()(std::int64_t value) const { g_key_file_set_int64(file, group, key, value); }
-  void operator()(double value) const { g_key_file_set_double(file, group, key, value); }
-  void operator()(const std::string& value) const {
-    g_key_file_set_string(file, group, key, value.c_str());
-  }
-};
-
 // None when the text is no key file.
 KeyFile parsed(const std::string& text) {
   KeyFile file(g_key_file_new());
@@ -64,46 +37,27 @@ KeyFile parsed(const std::string& text) {
 KeyFileDefaults::KeyFileDefaults(PrivateFiles& files, SystemLog& systemLog, std::string path)
     : systemLog_(systemLog), path_(path), file_(files, std::move(path)) {}
 
-std::optional<bool> KeyFileDefaults::truthValue(const std::string& key) const {
-  return read<bool>(key, [](auto... arguments) { return g_key_file_get_boolean(arguments...); });
-}
-std::optional<std::int64_t> KeyFileDefaults::integer(const std::string& key) const {
-  return read<std::int64_t>(key, g_key_file_get_int64);
-}
-std::optional<double> KeyFileDefaults::real(const std::string& key) const {
-  return read<double>(key, g_key_file_get_double);
-}
-std::optional<std::string> KeyFileDefaults::text(const std::string& key) const {
-  const auto value =
-      read<Text>(key, [](auto... arguments) { return Text(g_key_file_get_string(arguments...)); });
-  if (!value) return std::nullopt;
-  return value->get();
-}
-
-std::optional<PlatformError> KeyFileDefaults::set(const std::string& key, const Value& value) {
-  if (!canBeKey(key) || !canBeKept(value)) return invalidArgument();
-  return change([&](GKeyFile* file) { std::visit(Setter{file, escaped(key).get()}, value); });
-}
-
-std::optional<PlatformError> KeyFileDefaults::remove(const std::string& key) {
-  if (!canBeKey(key)) return invalidArgument();
-  return change(
-      [&](GKeyFile* file) { g_key_file_remove_key(file, group, escaped(key).get(), nullptr); });
-}
-
-template <typename Type, typename Get>
-std::optional<Type> KeyFileDefaults::read(const std::string& key, Get get) const {
+std::optional<std::string> KeyFileDefaults::readText(const std::string& key) const {
   const auto text = file_.text();
   if (!text) complain("cannot be read: " + text.error().localizedDescription());
-  if (!text || !*text || !canBeKey(key)) return std::nullopt;
+  if (!text || !*text) return std::nullopt;
   const KeyFile file = parsed(**text);
   if (!file) complain("are damaged, and count as empty");
   if (!file) return std::nullopt;
-  GError* error = nullptr;
-  std::optional<Type> value(get(file.get(), group, escaped(key).get(), &error));
-  if (!error) return value;
-  g_error_free(error);
-  return std::nullopt;
+  const Text value(g_key_file_get_string(file.get(), group, escaped(key).get(), nullptr));
+  return value ? std::optional<std::string>(value.get()) : std::nullopt;
+}
+
+std::optional<PlatformError> KeyFileDefaults::writeText(const std::string& key,
+                                                        const std::string& text) {
+  return change([&](GKeyFile* file) {
+    g_key_file_set_string(file, group, escaped(key).get(), text.c_str());
+  });
+}
+
+std::optional<PlatformError> KeyFileDefaults::removeText(const std::string& key) {
+  return change(
+      [&](GKeyFile* file) { g_key_file_remove_key(file, group, escaped(key).get(), nullptr); });
 }
 
 std::optional<PlatformError> KeyFileDefaults::change(const std::function<void(GKeyFile*)>& edit) {

@@ -27,17 +27,11 @@ class KeyFileDefaults final : public UserDefaults {
  public:
   KeyFileDefaults(PrivateFiles& files, SystemLog& systemLog, std::string path);
 
-  [[nodiscard]] std::optional<bool> truthValue(const std::string& key) const override;
-  [[nodiscard]] std::optional<std::int64_t> integer(const std::string& key) const override;
-  [[nodiscard]] std::optional<double> real(const std::string& key) const override;
-  [[nodiscard]] std::optional<std::string> text(const std::string& key) const override;
-  [[nodiscard]] std::optional<PlatformError> set(const std::string& key,
-                                                 const Value& value) override;
-  [[nodiscard]] std::optional<PlatformError> remove(const std::string& key) override;
-
  private:
-  template <typename Type, typename Get>
-  [[nodiscard]] std::optional<Type> read(const std::string& key, Get get) const;
+  [[nodiscard]] std::optional<std::string> readText(const std::string& key) const override;
+  [[nodiscard]] std::optional<PlatformError> writeText(const std::string& key,
+                                                       const std::string& text) override;
+  [[nodiscard]] std::optional<PlatformError> removeText(const std::string& key) override;
   [[nodiscard]] std::optional<PlatformError> change(const std::function<void(_GKeyFile*)>& edit);
   void complain(const std::string& trouble) const;
 

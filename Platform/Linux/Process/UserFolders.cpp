@@ -8,6 +8,7 @@
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/Ports/ProcessInfo.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
+#include <Varnel/Platform/Values/PathComponents.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
@@ -20,13 +21,6 @@ fs::path folder(const char* variable, const char* belowHome) {
   return fs::path(POSIX::makeUserAccount()->homeFolder()) / belowHome;
 }
 
-std::string folderName(std::string identifier) {
-  for (char& character : identifier)
-    if (character == '/' || character == '\0') character = '_';
-  if (identifier.empty() || identifier == "." || identifier == "..") return "_";
-  return identifier;
-}
-
 constexpr const char* notifications = "notifications.sqlite";
 
 fs::path stateFolders() {
@@ -34,13 +28,13 @@ fs::path stateFolders() {
 }
 
 fs::path stateFolder(const std::string& identifier) {
-  return stateFolders() / folderName(identifier);
+  return stateFolders() / fileNameFor(identifier);
 }
 
 }  // namespace
 
 fs::path settingsFile(const std::string& identifier) {
-  return folder("XDG_CONFIG_HOME", ".config") / folderName(identifier) / "settings.ini";
+  return folder("XDG_CONFIG_HOME", ".config") / fileNameFor(identifier) / "settings.ini";
 }
 
 fs::path notificationStore(const std::string& identifier) {

@@ -35,8 +35,12 @@ TDSService::TDSService(Ports ports, std::shared_ptr<TDSConfiguration> configurat
 
 TDSService::TDSService(std::shared_ptr<TDSConfiguration> configuration,
                        std::shared_ptr<Identificator> identificator)
-    : TDSService({.processInfo = Platform::processPorts().processInfo,
-                  .userLocale = Platform::processPorts().userLocale},
+    : TDSService(Platform::processPorts(), std::move(configuration), std::move(identificator)) {}
+
+TDSService::TDSService(const Platform::Ports& ports,
+                       std::shared_ptr<TDSConfiguration> configuration,
+                       std::shared_ptr<Identificator> identificator)
+    : TDSService({.processInfo = ports.processInfo, .userLocale = ports.userLocale},
                  std::move(configuration), std::move(identificator)) {}
 
 bool TDSService::accepts(const TDSQueryItem& item) const {

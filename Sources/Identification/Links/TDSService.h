@@ -18,6 +18,7 @@
 namespace Varnel::Platform {
 class ProcessInfo;
 class UserLocale;
+struct Ports;
 }  // namespace Varnel::Platform
 
 namespace Varnel {
@@ -45,6 +46,8 @@ class VARNEL_API TDSService final {
   using QueryItems = std::vector<Platform::URLQueryItem>;
 
   TDSService(Ports ports, std::shared_ptr<TDSConfiguration> configuration,
+             std::shared_ptr<Identificator> identificator);
+  TDSService(const Platform::Ports& ports, std::shared_ptr<TDSConfiguration> configuration,
              std::shared_ptr<Identificator> identificator);
   TDSService(std::shared_ptr<TDSConfiguration> configuration,
              std::shared_ptr<Identificator> identificator);

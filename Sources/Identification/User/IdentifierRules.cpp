@@ -4,9 +4,9 @@
 #include <algorithm>
 
 #include <Varnel/Basalt/Digest.h>
-#include <Varnel/Platform/Text/UTF8.h>
 #include <Varnel/Platform/Values/URL.h>
 #include <Varnel/Platform/Values/URLQuery.h>
+#include <Varnel/Platform/Values/UTF8.h>
 
 namespace Varnel {
 namespace {
@@ -32,8 +32,7 @@ std::string userIdentifierOf(const std::optional<std::string>& machineUUID,
                              const std::string& loginName) {
   const std::string text = machineUUID.value_or(nothing) + ' ' + loginName;
   if (!Platform::isValidUTF8(text)) return nothing;
-  const auto digest = Basalt::sha256(text);
-  return digest ? Basalt::hexadecimal(*digest) : nothing;
+  return Basalt::hexadecimal(Basalt::sha256(text));
 }
 
 std::optional<std::string> macAddressOf(const std::vector<Platform::PropertyData>& addresses) {

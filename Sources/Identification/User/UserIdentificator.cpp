@@ -17,16 +17,16 @@ namespace {
 
 constexpr const char* cookieGroup = "Cookies";
 
-UserIdentificator::Ports portsOfProcess() {
-  const Platform::Ports& ports = Platform::processPorts();
-  return {ports.cookieStorage, ports.machineIdentity, ports.userAccount,
-          KVDownloadSourceTracker::Ports::ofProcess()};
-}
-
 }  // namespace
 
-UserIdentificator::UserIdentificator()
-    : UserIdentificator(portsOfProcess(), BuildSwitches::ofThisProduct().cookieDomain) {}
+UserIdentificator::UserIdentificator() : UserIdentificator(Platform::processPorts()) {}
+
+UserIdentificator::UserIdentificator(const Platform::Ports& ports)
+    : UserIdentificator({.cookieStorage = ports.cookieStorage,
+                         .machineIdentity = ports.machineIdentity,
+                         .userAccount = ports.userAccount,
+                         .downloadSource = KVDownloadSourceTracker::Ports::of(ports)},
+                        BuildSwitches::ofThisProduct().cookieDomain) {}
 
 UserIdentificator::UserIdentificator(Ports ports, std::string cookieDomain)
     : ports_(ports), cookieDomain_(std::move(cookieDomain)) {}

@@ -13,6 +13,7 @@ namespace Varnel::Platform {
 class CookieStorage;
 class MachineIdentity;
 class UserAccount;
+struct Ports;
 }  // namespace Varnel::Platform
 
 namespace Varnel {
@@ -37,6 +38,7 @@ class VARNEL_API UserIdentificator final : public UserIdentificationProvider {
   };
 
   UserIdentificator();
+  explicit UserIdentificator(const Platform::Ports& ports);
   /// `cookieDomain` is that of the vendor's web-analytics cookie, by default the product's; without
   /// one there is no cookie.
   UserIdentificator(Ports ports, std::string cookieDomain);

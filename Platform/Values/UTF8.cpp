@@ -1,11 +1,10 @@
 // SPDX-License-Identifier: MIT
-#include <Varnel/Platform/Text/UTF8.h>
+#include <Varnel/Platform/Values/UTF8.h>
 
 #include <cstdint>
 #include <cstring>
-#include <limits>
 
-#include <unicode/ustring.h>
+#include <unicode/utf8.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -26,13 +25,13 @@ std::size_t lengthOfASCII(std::string_view bytes) {
 
 bool isValidUTF8(std::string_view bytes) {
   bytes.remove_prefix(lengthOfASCII(bytes));
-  if (bytes.empty()) return true;
-  if (bytes.size() > std::numeric_limits<std::int32_t>::max()) return false;
-  // Without a buffer the library only measures the text, and checks it on the way.
-  UErrorCode status = U_ZERO_ERROR;
-  ::u_strFromUTF8(nullptr, 0, nullptr, bytes.data(), static_cast<std::int32_t>(bytes.size()),
-                  &status);
-  return status != U_INVALID_CHAR_FOUND;
+  const auto* units = reinterpret_cast<const std::uint8_t*>(bytes.data());
+  for (std::size_t next = 0; next < bytes.size();) {
+    UChar32 character = 0;
+    U8_NEXT(units, next, bytes.size(), character);
+    if (character < 0) return false;
+  }
+  return true;
 }
 
 }  // namespace Varnel::Platform
