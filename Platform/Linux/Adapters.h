@@ -13,6 +13,7 @@ class Clock;
 class DeviceRegistry;
 class DiskArbitration;
 class ExtendedAttributes;
+class HostedApplication;
 class MachineIdentity;
 class MainQueue;
 class NotificationServer;
@@ -80,8 +81,9 @@ struct NotificationPorts {
   PrivateFiles& privateFiles;
   SystemLog& systemLog;
 };
+/// The application, which outlives the centers, says whether this process is in front.
 [[nodiscard]] std::unique_ptr<UserNotificationCenters> makeUserNotificationCenters(
-    const NotificationPorts& ports);
+    const NotificationPorts& ports, HostedApplication& application);
 
 [[nodiscard]] std::unique_ptr<VolumeCatalog> makeVolumeCatalog(std::shared_ptr<MountTable> table);
 [[nodiscard]] std::unique_ptr<Workspace> makeWorkspace();

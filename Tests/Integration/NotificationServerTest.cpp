@@ -12,6 +12,7 @@
 #include <Varnel/Context/ProcessFacts.h>
 #include <Varnel/Identification/Analytics/CustomDimensionsHolder.h>
 #include <Varnel/Modules/VarnelModule.h>
+#include <Varnel/Platform/Generic/HostedApplication.h>
 #include <Varnel/Platform/Generic/NotificationStore.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
@@ -19,7 +20,6 @@
 #include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
-#include <Varnel/Platform/Testing/FakeApplication.h>
 #include <Varnel/Platform/Testing/FakeProcessInfo.h>
 #include <Varnel/Platform/Testing/FakeTimeZones.h>
 #include <Varnel/Platform/Testing/FakeUser.h>
@@ -105,7 +105,7 @@ class Host final {
   Platform::Testing::FakeTimeZones zones;
   const std::unique_ptr<Platform::PrivateFiles> files = Platform::POSIX::makePrivateFiles();
   Platform::Testing::CapturedSystemLog log;
-  Platform::Testing::FakeApplication application;
+  Platform::HostedApplication application;
   Platform::Testing::FakeProcessInfo processInfo;
   Platform::Testing::FakeUserAccount account;
   Platform::Testing::FakeWorkspace workspace;
@@ -114,7 +114,8 @@ class Host final {
   const std::shared_ptr<Tallyhouse::Testing::MemoryTransport> sent =
       std::make_shared<Tallyhouse::Testing::MemoryTransport>();
   const std::unique_ptr<Platform::UserNotificationCenters> centers =
-      Platform::Linux::makeUserNotificationCenters({*clock, locale, zones, *queue, *files, log});
+      Platform::Linux::makeUserNotificationCenters({*clock, locale, zones, *queue, *files, log},
+                                                   application);
   Platform::UserNotificationCenter& center;
   UserNotificationRouter router;
   SchedulerService service{
