@@ -4,6 +4,10 @@
 set(VARNEL_BUILD_NUMBER "1" CACHE STRING "The framework's build number")
 set(VARNEL_SOURCE_VERSION "" CACHE STRING "The source revision that a release is built from")
 
+# The system whose adapters are built, a folder of Platform/; see docs/porting.md.
+set(VARNEL_SYSTEM "${CMAKE_SYSTEM_NAME}" CACHE STRING "Linux, or Bare: POSIX alone")
+set_property(CACHE VARNEL_SYSTEM PROPERTY STRINGS Linux Bare)
+
 option(BUILD_SHARED_LIBS "Build the framework as a shared library" ON)
 option(VARNEL_BUILD_TESTS "Build the tests" ${PROJECT_IS_TOP_LEVEL})
 option(VARNEL_BUILD_EXAMPLES "Build the examples" ${PROJECT_IS_TOP_LEVEL})

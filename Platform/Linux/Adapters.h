@@ -2,6 +2,7 @@
 #pragma once
 
 #include <chrono>
+#include <functional>
 #include <memory>
 #include <string>
 
@@ -10,6 +11,7 @@ namespace Varnel::Platform {
 class ApplicationLauncher;
 class ApplicationStorage;
 class Clock;
+class DelivererConnection;
 class DeviceRegistry;
 class DiskArbitration;
 class ExtendedAttributes;
@@ -45,7 +47,9 @@ class SessionBus;
 
 [[nodiscard]] std::unique_ptr<ApplicationStorage> makeApplicationStorage(PrivateFiles& files,
                                                                          SystemLog& systemLog);
-[[nodiscard]] std::unique_ptr<DeviceRegistry> makeDeviceRegistry();
+/// `folder` is where the kernel lists its block devices.
+[[nodiscard]] std::unique_ptr<DeviceRegistry> makeDeviceRegistry(
+    const std::string& folder = "/sys/class/block");
 [[nodiscard]] std::unique_ptr<DiskArbitration> makeDiskArbitration(
     std::shared_ptr<MountTable> table);
 [[nodiscard]] std::unique_ptr<ExtendedAttributes> makeExtendedAttributes();
@@ -61,13 +65,17 @@ class SessionBus;
 [[nodiscard]] std::unique_ptr<StandardOutput> makeStandardOutput();
 [[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog,
                                                            MainQueue& mainQueue);
-/// A connection to the user's session bus, which may take as long as `patience`.
-[[nodiscard]] std::shared_ptr<SessionBus> makeSessionBus(
-    std::chrono::milliseconds patience = std::chrono::seconds(10));
-/// The desktop shows the banners under the source's name.
+/// The desktop shows the banners under the source's name. `patience` is how long a connection to
+/// the session bus may take.
 [[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(
-    SystemLog& systemLog, const NotificationSource& source, std::shared_ptr<SessionBus> bus);
-/// Starts applications by the desktop entries installed for the user.
+    SystemLog& systemLog, const NotificationSource& source,
+    std::chrono::milliseconds patience = std::chrono::seconds(10));
+/// The way to the session's notifier for the product with this base identifier, or to the deliverer
+/// of this process that `makeDeliverer` makes where there is none.
+using MakeDeliverer = std::function<std::unique_ptr<DelivererConnection>()>;
+[[nodiscard]] std::shared_ptr<DelivererConnection> makeNotifierConnection(
+    std::string baseIdentifier, MakeDeliverer makeDeliverer);
+/// Starts applications by the desktop entries installed for the user. Part of the notifier alone.
 [[nodiscard]] std::unique_ptr<ApplicationLauncher> makeApplicationLauncher(
     std::shared_ptr<SessionBus> bus);
 [[nodiscard]] std::unique_ptr<WallClockTimer> makeWallClockTimer(SystemLog& systemLog);

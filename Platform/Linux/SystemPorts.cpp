@@ -27,10 +27,8 @@
 #include <Varnel/Platform/Ports/Workspace.h>
 
 #include <Varnel/Platform/Generic/HostedApplication.h>
-#include <Varnel/Platform/Generic/SQLiteCookieStorage.h>
 #include <Varnel/Platform/Generic/WatchedMainQueue.h>
 #include <Varnel/Platform/Linux/Adapters.h>
-#include <Varnel/Platform/Linux/Process/UserFolders.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 
 namespace Varnel::Platform {
@@ -42,17 +40,13 @@ Port& keep(std::unique_ptr<Port> adapter) {
   return *adapter.release();
 }
 
-std::unique_ptr<CookieStorage> makeCookieStorage(const Clock& clock) {
-  return std::make_unique<SQLiteCookieStorage>(Linux::userDataFolder(), Linux::executableName(),
-                                               clock);
-}
-
 }  // namespace
 
 const Ports& systemPorts() {
   // The adapters share it, and they are never destroyed.
   static const auto mountTable = Linux::makeMountTable();
   static Clock& clock = keep(POSIX::makeClock());
+  static ProcessInfo& processInfo = keep(Linux::makeProcessInfo());
   static SystemLog& systemLog = keep(POSIX::makeSystemLog());
   static MainQueue& mainQueue = *new WatchedMainQueue(Linux::makeMainQueue(), systemLog);
   static PrivateFiles& privateFiles = keep(POSIX::makePrivateFiles());
@@ -64,7 +58,7 @@ const Ports& systemPorts() {
       .application = application,
       .applicationStorage = keep(Linux::makeApplicationStorage(privateFiles, systemLog)),
       .clock = clock,
-      .cookieStorage = keep(makeCookieStorage(clock)),
+      .cookieStorage = keep(POSIX::makeCookieStorage(processInfo, clock)),
       .deviceRegistry = keep(Linux::makeDeviceRegistry()),
       .diskArbitration = keep(Linux::makeDiskArbitration(mountTable)),
       .extendedAttributes = keep(Linux::makeExtendedAttributes()),
@@ -72,7 +66,7 @@ const Ports& systemPorts() {
       .machineIdentity = keep(Linux::makeMachineIdentity()),
       .mainQueue = mainQueue,
       .privateFiles = privateFiles,
-      .processInfo = keep(Linux::makeProcessInfo()),
+      .processInfo = processInfo,
       .processLauncher = keep(Linux::makeProcessLauncher()),
       .readingPriority = keep(Linux::makeReadingPriority()),
       .securityScope = keep(POSIX::makeSecurityScope()),

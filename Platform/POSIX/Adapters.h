@@ -1,17 +1,23 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <functional>
 #include <memory>
+#include <string>
 
 namespace Varnel::Platform {
 
 class AppendFiles;
+class ApplicationStorage;
 class Clock;
+class CookieStorage;
 class HTTPClient;
 class PrivateFiles;
+class ProcessInfo;
 class SecurityScope;
 class SystemLog;
 class UserAccount;
+class UserDefaults;
 class UserLocale;
 
 }  // namespace Varnel::Platform
@@ -20,10 +26,20 @@ class UserLocale;
 namespace Varnel::Platform::POSIX {
 
 [[nodiscard]] std::unique_ptr<AppendFiles> makeAppendFiles();
+
+/// The settings of an application, whose files lie in `folder`, in the form that the system has for
+/// them.
+using MakeDefaults = std::function<std::unique_ptr<UserDefaults>(const std::string& folder)>;
+[[nodiscard]] std::unique_ptr<ApplicationStorage> makeApplicationStorage(MakeDefaults makeDefaults);
+
 [[nodiscard]] std::unique_ptr<Clock> makeClock();
+[[nodiscard]] std::unique_ptr<CookieStorage> makeCookieStorage(const ProcessInfo& process,
+                                                               const Clock& clock);
 /// Every post fails when the module of libcurl is missing.
 [[nodiscard]] std::unique_ptr<HTTPClient> makeHTTPClient();
 [[nodiscard]] std::unique_ptr<PrivateFiles> makePrivateFiles();
+/// `executable` is the absolute path of the running program, which an update may rename meanwhile.
+[[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo(const std::string& executable);
 [[nodiscard]] std::unique_ptr<SecurityScope> makeSecurityScope();
 [[nodiscard]] std::unique_ptr<SystemLog> makeSystemLog();
 [[nodiscard]] std::unique_ptr<UserAccount> makeUserAccount();

@@ -10,6 +10,7 @@
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
 #include <Varnel/Platform/POSIX/LastError.h>
+#include <Varnel/Platform/Values/SystemText.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {
@@ -35,6 +36,7 @@ class DescriptorAppendFile final : public AppendFile {
 class DescriptorAppendFiles final : public AppendFiles {
  public:
   Result<std::unique_ptr<AppendFile>, std::error_code> open(const std::string& path) override {
+    if (isCutShort(path)) return std::make_error_code(std::errc::invalid_argument);
     // O_APPEND makes the system choose the end anew for each write, so that two processes may share
     // the file.
     FileDescriptor descriptor(

@@ -13,6 +13,7 @@
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
 #include <Varnel/Platform/POSIX/LastError.h>
+#include <Varnel/Platform/Values/SystemText.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {
@@ -37,6 +38,10 @@ PlatformError systemError(const std::string& path) {
   const std::error_code code = lastError();
   return PlatformError(code.category().name(), code.value(),
                        {{std::string(localizedDescriptionKey), path + ": " + code.message()}});
+}
+
+std::error_code invalidPath() {
+  return std::make_error_code(std::errc::invalid_argument);
 }
 
 // Why this is not the user's own regular file, or null.
@@ -150,6 +155,7 @@ class DescriptionLock final : public FileLock {
 class OwnFiles final : public PrivateFiles {
  public:
   Result<std::string> prepare(const std::string& path) override {
+    if (isCutShort(path)) return PlatformError(invalidPath());
     std::error_code failure;
     const fs::path given = fs::absolute(path, failure);
     const fs::path folder =
@@ -165,6 +171,7 @@ class OwnFiles final : public PrivateFiles {
   }
 
   std::error_code protect(const std::string& path) override {
+    if (isCutShort(path)) return invalidPath();
     for (const char* suffix : suffixes)
       if (const auto failure = protectFile(path + suffix)) return failure;
     return {};
@@ -172,7 +179,7 @@ class OwnFiles final : public PrivateFiles {
 
   std::optional<FileIdentity> identity(const std::string& path) override {
     struct stat facts {};
-    if (::lstat(path.c_str(), &facts) != 0) return std::nullopt;
+    if (isCutShort(path) || ::lstat(path.c_str(), &facts) != 0) return std::nullopt;
     return FileIdentity{
         .device = facts.st_dev, .inode = facts.st_ino, .isEmpty = facts.st_size == 0};
   }
@@ -193,10 +200,12 @@ class OwnFiles final : public PrivateFiles {
   }
 
   std::error_code rename(const std::string& from, const std::string& to) override {
+    if (isCutShort(from) || isCutShort(to)) return invalidPath();
     return ::rename(from.c_str(), to.c_str()) == 0 ? std::error_code() : lastError();
   }
 
   std::error_code remove(const std::string& path) override {
+    if (isCutShort(path)) return invalidPath();
     return ::unlink(path.c_str()) == 0 || errno == ENOENT ? std::error_code() : lastError();
   }
 };

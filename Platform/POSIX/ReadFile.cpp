@@ -7,11 +7,13 @@
 
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
 #include <Varnel/Platform/POSIX/LastError.h>
+#include <Varnel/Platform/Values/SystemText.h>
 
 namespace Varnel::Platform {
 
 Result<std::string, std::error_code> readFile(const std::string& path, std::size_t maxSize) {
   constexpr std::size_t step = 1u << 16;
+  if (isCutShort(path)) return std::make_error_code(std::errc::invalid_argument);
   struct stat facts {};
   // Checked before the file is opened: opening waits for a pipe's writer, and wakes devices.
   if (::stat(path.c_str(), &facts) != 0) return POSIX::lastError();

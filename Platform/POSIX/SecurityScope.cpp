@@ -6,6 +6,7 @@
 #include <string>
 
 #include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Values/SystemText.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {
@@ -15,8 +16,7 @@ class FileRights final : public SecurityScope {
  public:
   bool startAccessing(const URL& url) override {
     const std::string path = url.path();
-    // The system would look up only the part before the zero.
-    return path.find('\0') == std::string::npos && ::access(path.c_str(), R_OK) == 0;
+    return url.hasScheme("file") && !isCutShort(path) && ::access(path.c_str(), R_OK) == 0;
   }
   void stopAccessing(const URL&) override {}
 };

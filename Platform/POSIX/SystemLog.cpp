@@ -7,6 +7,7 @@
 
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/Ports/StandardOutput.h>
+#include <Varnel/Platform/Text/VisibleText.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {
@@ -22,8 +23,9 @@ constexpr bool alsoOnStandardError = true;
 class Syslog final : public SystemLog {
  public:
   void write(std::string_view line) override {
-    ::syslog(LOG_USER | LOG_NOTICE, "%.*s", static_cast<int>(line.size()), line.data());
-    if (alsoOnStandardError) makeStandardErrorOutput()->print(std::string(line) + "\n");
+    const std::string shown = visibleText(std::string(line), Backslashes::kept);
+    ::syslog(LOG_USER | LOG_NOTICE, "%s", shown.c_str());
+    if (alsoOnStandardError) makeStandardErrorOutput()->print(shown + "\n");
   }
 };
 

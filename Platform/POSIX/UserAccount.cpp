@@ -10,6 +10,7 @@
 #include <vector>
 
 #include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Values/PathComponents.h>
 
 namespace Varnel::Platform::POSIX {
 namespace {
@@ -18,11 +19,6 @@ struct Record {
   std::string name;
   std::string homeFolder;
 };
-
-std::string withoutTrailingSlashes(std::string_view path) {
-  while (path.size() > 1 && path.back() == '/') path.remove_suffix(1);
-  return std::string(path);
-}
 
 std::optional<Record> recordOfUser() {
   std::vector<char> buffer(16384);
@@ -40,7 +36,7 @@ std::optional<std::string> environmentVariable(const char* name) {
 
 // A relative home would change with the working directory.
 std::string homeOr(const std::optional<std::string>& path, std::string_view fallback) {
-  return withoutTrailingSlashes(path && path->front() == '/' ? *path : fallback);
+  return joinPathComponents(pathComponents(path && path->front() == '/' ? *path : fallback));
 }
 
 // For a user without a record (in a bare container) the environment serves, and at last the root

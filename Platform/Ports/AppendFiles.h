@@ -29,6 +29,7 @@ class VARNEL_API AppendFiles {
   AppendFiles& operator=(const AppendFiles&) = delete;
 
   /// Opens the file, and creates it readable and writable by its owner alone (0600) when missing.
+  /// A path with a null character is refused (`invalid_argument`).
   [[nodiscard]] virtual Result<std::unique_ptr<AppendFile>, std::error_code> open(
       const std::string& path) = 0;
 };

@@ -11,8 +11,9 @@
 
 namespace Varnel::Platform {
 
-/// An entry of the device registry: a device, a disk, a partition. Owning it keeps the system's
-/// handle open; destruction releases it. One thread at a time.
+/// An entry of the device registry: a device, a disk, a partition. It, and all that is reached from
+/// it, shows the registry as it was at the look-up, also when a device has been unplugged since.
+/// Owning it keeps the system's handle open; destruction releases it. One thread at a time.
 class VARNEL_API RegistryEntry {
  public:
   virtual ~RegistryEntry() = default;
@@ -23,7 +24,7 @@ class VARNEL_API RegistryEntry {
   /// All properties; absent when they cannot be read.
   [[nodiscard]] virtual std::optional<PropertyDictionary> properties() const = 0;
 
-  /// The entry above; null at the root or when the look-up fails.
+  /// The entry above, the first of several; null when there is none or the look-up fails.
   [[nodiscard]] virtual std::unique_ptr<RegistryEntry> parent() const = 0;
 
   /// The entries below. An entry with several parents (a RAID) stands below each.
@@ -43,8 +44,8 @@ class VARNEL_API DeviceRegistry {
   virtual ~DeviceRegistry() = default;
   DeviceRegistry& operator=(const DeviceRegistry&) = delete;
 
-  /// The entries whose own property `name` has this value, in the registry's order. Absent when the
-  /// registry cannot be read.
+  /// The entries whose own property `name` has this value, of the same type, in the registry's
+  /// order. Absent when the registry cannot be read.
   [[nodiscard]] virtual std::optional<Entries> entriesMatchingProperty(
       std::string_view name, const PropertyValue& value) = 0;
 };

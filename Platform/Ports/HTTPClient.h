@@ -16,7 +16,7 @@ struct HTTPPost final {
   std::string url;  ///< Percent-encoded.
   std::string contentType;
   std::string body;
-  bool allowsPlainHTTP = false;  ///< Otherwise anything but https fails.
+  bool allowsPlainHTTP = false;  ///< Otherwise anything but https fails; other schemes always do.
 };
 
 /// The server's answer, without its content.

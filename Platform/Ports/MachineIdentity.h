@@ -18,8 +18,8 @@ class VARNEL_API MachineIdentity {
   virtual ~MachineIdentity() = default;
   MachineIdentity& operator=(const MachineIdentity&) = delete;
 
-  /// A property of the machine as a whole: "IOPlatformUUID" or "IOPlatformSerialNumber". Absent
-  /// when the machine has none or hides it.
+  /// A property of the machine as a whole: "IOPlatformUUID" or "IOPlatformSerialNumber", both texts
+  /// that are not empty. Absent when the machine has none or hides it, and for any other name.
   [[nodiscard]] virtual std::optional<PropertyValue> platformProperty(
       std::string_view name) const = 0;
 

@@ -34,13 +34,14 @@ class VARNEL_API MainQueue {
   virtual void run() = 0;
 
   /// Ends the innermost `run` after the blocks posted before this call; if none is under way, the
-  /// next `run`. Any thread.
+  /// next `run`. Two stops end two runs. Any thread.
   virtual void stop() = 0;
 
   /// Runs what is posted, and waits for more, as long as the condition holds. The condition is
   /// checked at first and whenever something has run. Main thread only.
   virtual void runWhile(const std::function<bool()>& condition) = 0;
-  /// The same for at most `patience`. False when the condition still holds then.
+  /// The same for at most `patience`. False when the condition still holds then. What was posted
+  /// before this call runs even without any patience (0 or less).
   virtual bool runWhile(const std::function<bool()>& condition,
                         std::chrono::milliseconds patience) = 0;
 

@@ -14,10 +14,10 @@ namespace Varnel::Platform {
 
 /// What a banner shows: plain UTF-8 texts. A button without a title is left out.
 struct Banner final {
-  std::string title;
-  std::string text;
-  std::string actionTitle;
-  std::string dismissTitle;
+  std::string title = {};
+  std::string text = {};
+  std::string actionTitle = {};
+  std::string dismissTitle = {};
 
   bool operator==(const Banner&) const = default;
 };
@@ -52,7 +52,7 @@ class VARNEL_API NotificationServer {
     /// The banner is gone otherwise: it was closed as asked, has expired, or its server has ended.
     /// The user may yet bring an expired one back, and click it.
     virtual void bannerGone(const std::string& token) = 0;
-    /// There is a server again, or another one.
+    /// There is a server again, or another one. Told once something was asked of a server.
     virtual void serverAppeared() = 0;
   };
 
@@ -64,16 +64,19 @@ class VARNEL_API NotificationServer {
   /// The product that banners come from, from now on.
   virtual void setSource(const NotificationSource& source) = 0;
 
-  /// Shows a banner, in the place of the one with this reference, whose token counts no more. Ends
-  /// in `bannerShown` or `bannerFailed`, unless it is closed before.
+  /// Shows a banner, in the place of the one with this reference, whose token counts no more. A
+  /// reference that the server does not know replaces nothing. Ends in `bannerShown` or
+  /// `bannerFailed`, unless it is closed before; when the server ends before it has answered, in
+  /// `bannerFailed`. No other banner that is shown has this token.
   virtual void show(const std::string& token, const Banner& banner,
                     const std::optional<std::string>& replacedReference) = 0;
 
   /// Removes the banner with this token or, if an earlier run showed it, with this reference. Ends
-  /// in `bannerGone` or `bannerFailed`.
+  /// in `bannerGone`, also when there was none or its server has ended, or in `bannerFailed` when
+  /// that cannot be known.
   virtual void close(const std::string& token, const std::optional<std::string>& reference) = 0;
 
-  /// Tells, later, why banners cannot be shown at present, or none.
+  /// Tells, later, why banners cannot be shown at present, or none; also without an observer.
   virtual void check(std::function<void(const std::optional<PlatformError>& obstacle)> answer) = 0;
 
   /// Whether any of these requests is still on its way to the server. Becomes false in the end,

@@ -42,7 +42,8 @@ inline constexpr std::string_view privateFileRefusalDomain = "PrivateFile";
 ///     if (lock && *lock) …                     // nobody else has it
 ///
 /// No file is ever opened that could be a database's: closing it would drop the database's locks.
-/// Any thread. Errors are the system's (generic category), or of `privateFileRefusalDomain`.
+/// Any thread. Errors are the system's (generic category), or of `privateFileRefusalDomain`. A path
+/// with a null character leads to no file (`invalid_argument`).
 class VARNEL_API PrivateFiles {
  public:
   virtual ~PrivateFiles() = default;

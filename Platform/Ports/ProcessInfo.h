@@ -24,7 +24,8 @@ class VARNEL_API ProcessInfo {
   virtual ~ProcessInfo() = default;
   ProcessInfo& operator=(const ProcessInfo&) = delete;
 
-  /// The value of an environment variable; absent when it is not set, empty when set to nothing.
+  /// The value of an environment variable; absent when it is not set, empty when set to nothing. A
+  /// text that can be no name of one ("", "A=B") is not set.
   [[nodiscard]] virtual std::optional<std::string> environmentVariable(
       std::string_view name) const = 0;
 

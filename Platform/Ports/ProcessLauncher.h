@@ -23,7 +23,8 @@ class VARNEL_API LaunchedProcess {
   /// Ends it, and what it has started, at once; waits for its end. Does nothing once it has ended.
   virtual void terminate() = 0;
 
-  /// Everything that its output pipe holds. Never waits: to be called after the program has ended.
+  /// Everything that its output pipe holds, which is empty then. Never waits: to be called after
+  /// the program has ended.
   [[nodiscard]] virtual std::string readOutput() = 0;
 };
 
@@ -36,7 +37,7 @@ class VARNEL_API ProcessLauncher {
   /// Starts the program at `path`. It inherits only the environment and standard error; its input
   /// is an open pipe without any data. The output pipe is as large as the system allows: a program
   /// that writes more waits until it is terminated. Failed (generic category) when the program
-  /// cannot be started.
+  /// cannot be started, or a text holds a null character (`invalid_argument`).
   [[nodiscard]] virtual Result<std::unique_ptr<LaunchedProcess>, std::error_code> launch(
       const std::string& path, const std::vector<std::string>& arguments) = 0;
 };

@@ -15,7 +15,7 @@ namespace Varnel::Platform {
 ///     const auto table = parseStringsTable(readFile(path).valueOr(""));
 ///
 /// Folders, pipes and devices are refused (`invalid_argument`): reading them could fail late or
-/// never end. May block as reading a file does; any thread.
+/// never end, and so are paths with a null character. May block as reading a file does; any thread.
 [[nodiscard]] Result<std::string, std::error_code> readFile(const std::string& path,
                                                             std::size_t maxSize = 64u << 20);
 

@@ -8,7 +8,8 @@
 namespace Varnel::Platform {
 
 /// How much the calling thread's reading of disks gives way to that of other threads and programs.
-/// A thread has the level of the one that started it. Any thread.
+/// Whether a thread begins with the level of the one that started it is up to the system. Any
+/// thread.
 ///
 ///     const auto normal = priority.current();
 ///     if (normal) priority.set(priority.lowered(*normal));

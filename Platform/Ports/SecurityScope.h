@@ -12,8 +12,8 @@ class VARNEL_API SecurityScope {
   virtual ~SecurityScope() = default;
   SecurityScope& operator=(const SecurityScope&) = delete;
 
-  /// Opens the gate for a file or folder; false when the process may not read it. Every success
-  /// needs one `stopAccessing`.
+  /// Opens the gate for a file or folder; false when the process may not read it, and for a URL
+  /// that names no file of this machine. Every success needs one `stopAccessing`.
   [[nodiscard]] virtual bool startAccessing(const URL& url) = 0;
   virtual void stopAccessing(const URL& url) = 0;
 };

@@ -13,7 +13,9 @@ class VARNEL_API SystemLog {
   virtual ~SystemLog() = default;
   SystemLog& operator=(const SystemLog&) = delete;
 
-  /// Writes one line, without terminator. Never fails visibly.
+  /// Writes one line, without terminator. Control characters, and bytes that are not UTF-8, show as
+  /// `visibleText` shows them: nothing in a text can pass for a line of its own. Never fails
+  /// visibly.
   virtual void write(std::string_view line) = 0;
 };
 

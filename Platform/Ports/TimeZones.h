@@ -41,7 +41,7 @@ class VARNEL_API TimeZones {
   TimeZones& operator=(const TimeZones&) = delete;
 
   /// The user's present zone: its name in the time zone database ("Europe/Vienna"), or another text
-  /// that `zone` understands.
+  /// that `zone` understands. "UTC" when the system knows no such zone.
   [[nodiscard]] virtual std::string localIdentifier() const = 0;
 
   /// The zone with its present rules; never null. A zone that the system does not know runs on UTC.

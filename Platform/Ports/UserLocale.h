@@ -8,7 +8,7 @@
 
 namespace Varnel::Platform {
 
-/// The user's language and formats. Any thread.
+/// The user's language and formats at present: "en" and "en_US" where none was chosen. Any thread.
 class VARNEL_API UserLocale {
  public:
   virtual ~UserLocale() = default;

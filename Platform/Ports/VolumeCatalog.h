@@ -46,7 +46,8 @@ class VARNEL_API VolumeCatalog {
   virtual ~VolumeCatalog() = default;
   VolumeCatalog& operator=(const VolumeCatalog&) = delete;
 
-  /// All mounted volumes in the system's order, without the kernel's own pseudo file systems.
+  /// All mounted volumes in the system's order, without the kernel's own pseudo file systems, and
+  /// without those that another one hides, which is mounted over them.
   [[nodiscard]] virtual std::vector<MountedVolume> mountedVolumes() = 0;
 
   /// The URL of the volume that holds a file or folder. Failed when the path cannot be looked up,
@@ -57,8 +58,9 @@ class VARNEL_API VolumeCatalog {
   /// no such volume is mounted.
   [[nodiscard]] virtual std::optional<std::string> volumeName(const URL& volumeURL) = 0;
 
-  /// Calls the handler after each change, on a thread of the catalogue's own; by then the lists
-  /// above already show it. Null when the system offers no such events.
+  /// Calls the handler after each change, on a thread of the catalogue's choice and never within
+  /// one of its calls; by then the lists above already show it. The handler may ask for them. Null
+  /// when the system offers no such events.
   [[nodiscard]] virtual std::unique_ptr<Subscription> subscribe(ChangeHandler handler) = 0;
 };
 

@@ -15,8 +15,9 @@ class VARNEL_API Workspace {
   virtual ~Workspace() = default;
   Workspace& operator=(const Workspace&) = delete;
 
-  /// Where the application with this bundle identifier is: its bundle folder where it has one, else
-  /// its executable. Identifiers are compared exactly. Absent when none is installed.
+  /// Where the application with this bundle identifier is: its bundle folder (a URL
+  /// with a slash at its end) where it has one, else its executable. Identifiers are compared
+  /// exactly, and an empty one is nobody's. Absent when none is installed at present.
   [[nodiscard]] virtual std::optional<URL> applicationURL(const std::string& bundleIdentifier) = 0;
 };
 

@@ -7,6 +7,7 @@
 
 #include <Varnel/Platform/Ports/StandardOutput.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Text/VisibleText.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -36,7 +37,9 @@ class CapturedOutput final : public StandardOutput {
 /// A system log that keeps its lines, each ended by a line feed. Any thread.
 class CapturedSystemLog final : public SystemLog {
  public:
-  void write(std::string_view line) override { lines_.print(std::string(line) + "\n"); }
+  void write(std::string_view line) override {
+    lines_.print(visibleText(std::string(line), Backslashes::kept) + "\n");
+  }
 
   [[nodiscard]] std::string text() const { return lines_.text(); }
 

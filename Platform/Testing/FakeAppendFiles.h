@@ -12,6 +12,7 @@
 
 #include <Varnel/Platform/Ports/AppendFiles.h>
 #include <Varnel/Platform/Testing/FaultPlan.h>
+#include <Varnel/Platform/Values/SystemText.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -32,6 +33,7 @@ class FakeAppendFiles final : public AppendFiles {
 
   [[nodiscard]] Result<std::unique_ptr<AppendFile>, std::error_code> open(
       const std::string& path) override {
+    if (isCutShort(path)) return std::make_error_code(std::errc::invalid_argument);
     const Fault fault = faults->nextInTime();
     if (fault == Fault::fails) return std::make_error_code(failure);
     if (fault == Fault::absent) return std::make_error_code(std::errc::no_such_file_or_directory);

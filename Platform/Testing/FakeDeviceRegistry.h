@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <atomic>
 #include <map>
 #include <memory>
 #include <mutex>
@@ -23,7 +24,7 @@ namespace Varnel::Platform::Testing {
 ///     …
 ///     EXPECT_EQ(registry.liveEntries(), 0);  // every handle was given back
 ///
-/// An entry of a device that was unplugged has no properties, no parent and no children.
+/// Entries tell what was plugged in when they were looked up.
 class FakeDeviceRegistry final : public DeviceRegistry {
  public:
   using Device = int;
@@ -38,18 +39,15 @@ class FakeDeviceRegistry final : public DeviceRegistry {
     bool parentBroken = false;
   };
 
+  using Nodes = std::map<Device, Node>;
+
   struct State {
     std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
     std::mutex mutex;  ///< Owns the rest.
-    std::map<Device, Node> nodes{{root, {}}};
+    Nodes nodes{{root, {}}};
     Device last = root;
-    int live = 0;
+    std::atomic<int> live = 0;
     bool readable = true;
-
-    Node* find(Device device) {
-      const auto found = nodes.find(device);
-      return found == nodes.end() ? nullptr : &found->second;
-    }
 
     void remove(Device device) {
       const auto found = nodes.find(device);
@@ -106,93 +104,69 @@ class FakeDeviceRegistry final : public DeviceRegistry {
   }
 
   /// How many entries are held right now.
-  [[nodiscard]] int liveEntries() const {
-    const std::lock_guard lock(state_->mutex);
-    return state_->live;
-  }
+  [[nodiscard]] int liveEntries() const { return state_->live; }
 
   /// The entry of a device, as the registry would hand it out.
   [[nodiscard]] std::unique_ptr<RegistryEntry> entry(Device device) const {
-    return std::make_unique<Entry>(state_, device);
+    const std::lock_guard lock(state_->mutex);
+    return std::make_unique<Entry>(state_, std::make_shared<const Nodes>(state_->nodes), device);
   }
 
   std::optional<Entries> entriesMatchingProperty(std::string_view name,
                                                  const PropertyValue& value) override {
     if (faults->strikes()) return std::nullopt;
-    std::vector<Device> matching;
-    {
-      const std::lock_guard lock(state_->mutex);
-      if (!state_->readable) return std::nullopt;
-      for (const auto& [device, node] : state_->nodes) {
-        const PropertyValue* own = find(node.properties, name);
-        if (own && *own == value) matching.push_back(device);
-      }
+    const std::lock_guard lock(state_->mutex);
+    if (!state_->readable) return std::nullopt;
+    const auto nodes = std::make_shared<const Nodes>(state_->nodes);
+    Entries entries;
+    for (const auto& [device, node] : *nodes) {
+      const PropertyValue* own = find(node.properties, name);
+      if (own && *own == value) entries.push_back(std::make_unique<Entry>(state_, nodes, device));
     }
-    return entriesOf(state_, matching);
+    return entries;
   }
 
  private:
   // Shares the state, and so may outlive the registry.
   class Entry final : public RegistryEntry {
    public:
-    Entry(std::shared_ptr<State> state, Device device) : state_(std::move(state)), device_(device) {
-      const std::lock_guard lock(state_->mutex);
+    Entry(std::shared_ptr<State> state, std::shared_ptr<const Nodes> nodes, Device device)
+        : state_(std::move(state)), nodes_(std::move(nodes)), node_(nodes_->at(device)) {
       ++state_->live;
     }
-    ~Entry() override {
-      const std::lock_guard lock(state_->mutex);
-      --state_->live;
-    }
+    ~Entry() override { --state_->live; }
+    Entry(const Entry&) = delete;
+    Entry& operator=(const Entry&) = delete;
 
     std::optional<PropertyValue> property(std::string_view name) const override {
       if (state_->faults->strikes()) return std::nullopt;
-      const std::lock_guard lock(state_->mutex);
-      const Node* node = state_->find(device_);
-      const PropertyValue* value = node ? find(node->properties, name) : nullptr;
+      const PropertyValue* value = find(node_.properties, name);
       return value ? std::optional(*value) : std::nullopt;
     }
 
     std::optional<PropertyDictionary> properties() const override {
-      if (state_->faults->strikes()) return std::nullopt;
-      const std::lock_guard lock(state_->mutex);
-      const Node* node = state_->find(device_);
-      if (!node || node->propertiesBroken) return std::nullopt;
-      return node->properties;
+      if (state_->faults->strikes() || node_.propertiesBroken) return std::nullopt;
+      return node_.properties;
     }
 
     std::unique_ptr<RegistryEntry> parent() const override {
-      if (state_->faults->strikes()) return nullptr;
-      Device parent = root;
-      {
-        const std::lock_guard lock(state_->mutex);
-        const Node* node = state_->find(device_);
-        if (device_ == root || !node || node->parentBroken) return nullptr;
-        parent = node->parent;
-      }
-      return std::make_unique<Entry>(state_, parent);
+      if (state_->faults->strikes() || node_.parent == root || node_.parentBroken) return nullptr;
+      return std::make_unique<Entry>(state_, nodes_, node_.parent);
     }
 
     DeviceRegistry::Entries children() const override {
-      if (state_->faults->strikes()) return {};
-      std::vector<Device> devices;
-      {
-        const std::lock_guard lock(state_->mutex);
-        if (const Node* node = state_->find(device_)) devices = node->children;
-      }
-      return entriesOf(state_, devices);
+      DeviceRegistry::Entries entries;
+      if (state_->faults->strikes()) return entries;
+      for (const Device child : node_.children)
+        entries.push_back(std::make_unique<Entry>(state_, nodes_, child));
+      return entries;
     }
 
    private:
     const std::shared_ptr<State> state_;
-    const Device device_;
+    const std::shared_ptr<const Nodes> nodes_;
+    const Node& node_;
   };
-
-  static Entries entriesOf(const std::shared_ptr<State>& state,
-                           const std::vector<Device>& devices) {
-    Entries entries;
-    for (const Device device : devices) entries.push_back(std::make_unique<Entry>(state, device));
-    return entries;
-  }
 };
 
 }  // namespace Varnel::Platform::Testing

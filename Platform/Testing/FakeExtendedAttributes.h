@@ -9,6 +9,7 @@
 
 #include <Varnel/Platform/Ports/ExtendedAttributes.h>
 #include <Varnel/Platform/Testing/FaultPlan.h>
+#include <Varnel/Platform/Values/SystemText.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -25,6 +26,8 @@ class FakeExtendedAttributes final : public ExtendedAttributes {
 
   [[nodiscard]] Result<std::optional<std::string>, std::error_code> value(
       const std::string& path, const std::string& name) override {
+    if (name.empty() || isCutShort(name) || isCutShort(path))
+      return std::make_error_code(std::errc::invalid_argument);
     if (error) return error;
     const Fault fault = faults->nextInTime();
     if (fault == Fault::fails) return std::make_error_code(std::errc::io_error);

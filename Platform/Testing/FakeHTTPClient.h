@@ -9,6 +9,9 @@
 
 #include <Varnel/Platform/Ports/HTTPClient.h>
 #include <Varnel/Platform/Testing/FaultPlan.h>
+#include <Varnel/Platform/Values/SystemText.h>
+#include <Varnel/Platform/Values/URL.h>
+#include <Varnel/Platform/Values/URLComponents.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -33,6 +36,7 @@ class FakeHTTPClient final : public HTTPClient {
   [[nodiscard]] Answer post(const HTTPPost& request, std::stop_token stop) override {
     const Fault fault = faults->nextInTime(stop);
     if (stop.stop_requested()) return HTTPFailure{"cancelled"};
+    if (!canBePosted(request)) return HTTPFailure{"no such place"};
     if (fault != Fault::none)
       return HTTPFailure{fault == Fault::absent ? "no server" : "no answer"};
     Server server;
@@ -51,6 +55,12 @@ class FakeHTTPClient final : public HTTPClient {
   }
 
  private:
+  static bool canBePosted(const HTTPPost& request) {
+    const auto url = URL::parse(request.url);
+    return url && !isCutShort(request.url) && !url->components().host.value_or("").empty() &&
+           (url->hasScheme("https") || (request.allowsPlainHTTP && url->hasScheme("http")));
+  }
+
   mutable std::mutex mutex_;  ///< Owns both.
   Server server_ = [](const HTTPPost&) { return HTTPResponse{.status = 200, .retryAfter = {}}; };
   std::vector<HTTPPost> posts_;

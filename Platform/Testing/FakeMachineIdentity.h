@@ -12,7 +12,8 @@
 
 namespace Varnel::Platform::Testing {
 
-/// A machine whose identity the test sets. Set it before other threads read.
+/// A machine whose identity the test sets; an empty text or address is none. Set it before other
+/// threads read.
 class FakeMachineIdentity final : public MachineIdentity {
  public:
   /// Questions. One that goes wrong finds nothing.
@@ -27,11 +28,13 @@ class FakeMachineIdentity final : public MachineIdentity {
     ++questions;
     if (faults->strikes()) return std::nullopt;
     const PropertyValue* value = find(properties, name);
-    if (!value) return std::nullopt;
+    if (!value || *value == PropertyValue("")) return std::nullopt;
     return *value;
   }
   [[nodiscard]] std::vector<PropertyData> primaryInterfaceAddresses() const override {
-    return faults->strikes() ? std::vector<PropertyData>() : addresses;
+    auto present = faults->strikes() ? std::vector<PropertyData>() : addresses;
+    std::erase(present, PropertyData());
+    return present;
   }
 };
 

@@ -1,8 +1,10 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <algorithm>
 #include <chrono>
 #include <condition_variable>
+#include <cstddef>
 #include <deque>
 #include <functional>
 #include <mutex>
@@ -41,14 +43,16 @@ class FakeMainQueue final : public MainQueue {
   }
   bool runWhile(const std::function<bool()>& condition,
                 std::chrono::milliseconds patience) override {
-    const auto end = std::chrono::steady_clock::now() + patience;
-    while (condition()) {
-      if (std::chrono::steady_clock::now() >= end) return false;
-      {
-        std::unique_lock lock(mutex_);
-        posted_.wait_until(lock, end, [this] { return !blocks_.empty(); });
+    constexpr std::chrono::milliseconds longest = std::chrono::years(1);
+    const auto end = std::chrono::steady_clock::now() + std::min(patience, longest);
+    for (std::size_t due = waitingBlocks(); condition(); runNext()) {
+      if (due > 0) {
+        --due;
+        continue;
       }
-      runNext();
+      if (std::chrono::steady_clock::now() >= end) return false;
+      std::unique_lock lock(mutex_);
+      posted_.wait_until(lock, end, [this] { return !blocks_.empty(); });
     }
     return true;
   }
@@ -66,6 +70,11 @@ class FakeMainQueue final : public MainQueue {
   [[nodiscard]] std::optional<int> descriptor() override { return std::nullopt; }
 
  private:
+  std::size_t waitingBlocks() {
+    const std::lock_guard lock(mutex_);
+    return blocks_.size();
+  }
+
   bool runNext() {
     std::unique_lock lock(mutex_);
     if (blocks_.empty()) return false;

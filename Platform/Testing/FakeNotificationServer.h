@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <algorithm>
+#include <deque>
 #include <functional>
 #include <map>
 #include <memory>
@@ -26,7 +28,7 @@ namespace Varnel::Platform::Testing {
 /// Banners are told by their titles. One thread.
 class FakeNotificationServer final : public NotificationServer {
  public:
-  /// Whether there is one. `appear` lets the center know of a change.
+  /// Whether there is one. `appear` and `disappear` let the center know of a change.
   bool isPresent = true;
   /// A request to show or to close that goes wrong is answered with an error. All answers are late:
   /// see `report`.
@@ -40,37 +42,43 @@ class FakeNotificationServer final : public NotificationServer {
 
   void show(const std::string& token, const Banner& banner,
             const std::optional<std::string>& replacedReference) override {
-    if (!works()) return answers_.push_back([token](Observer& told) { told.bannerFailed(token); });
-    if (replacedReference) shown_.erase(*replacedReference);
+    if (!isPresent || isRefused()) return answerLater(&Observer::bannerFailed, token);
+    if (replacedReference) banners_.erase(*replacedReference);
     const std::string reference = std::to_string(++lastReference_);
-    shown_[reference] = {token, banner};
+    banners_[reference] = {token, banner};
     history_.push_back(banner);
-    answers_.push_back([token, reference](Observer& told) { told.bannerShown(token, reference); });
+    answers_.emplace_back([this, reference] {
+      const auto shown = banners_.find(reference);
+      if (shown == banners_.end()) return;
+      shown->second.isReported = true;
+      if (const auto observer = observer_.lock())
+        observer->bannerShown(std::string(shown->second.token), reference);
+    });
   }
 
   void close(const std::string& token, const std::optional<std::string>& reference) override {
-    if (!works()) return answers_.push_back([token](Observer& told) { told.bannerFailed(token); });
-    if (reference) shown_.erase(*reference);
-    std::erase_if(shown_, [&](const auto& each) { return each.second.token == token; });
-    answers_.push_back([token](Observer& told) { told.bannerGone(token); });
+    // Without a server there are no banners any more.
+    if (isPresent && isRefused()) return answerLater(&Observer::bannerFailed, token);
+    if (reference) banners_.erase(*reference);
+    std::erase_if(banners_, [&](const auto& each) { return each.second.token == token; });
+    answerLater(&Observer::bannerGone, token);
   }
 
   void check(std::function<void(const std::optional<PlatformError>&)> answer) override {
-    answers_.push_back([answer = std::move(answer), isPresent = isPresent](Observer&) {
-      if (isPresent)
-        answer(std::nullopt);
-      else
-        answer(PlatformError(std::make_error_code(std::errc::no_such_process)));
-    });
+    std::optional<PlatformError> obstacle;
+    if (!isPresent) obstacle = PlatformError(std::make_error_code(std::errc::no_such_process));
+    answers_.emplace_back([answer = std::move(answer), obstacle] { answer(obstacle); });
   }
 
   [[nodiscard]] bool isBusy() const override { return !answers_.empty(); }
 
   /// Lets the center know what has been done since the last call, as a server does, later.
   void report() {
-    while (!answers_.empty())
-      for (const auto& answer : std::exchange(answers_, {}))
-        if (const auto observer = observer_.lock()) answer(*observer);
+    while (!answers_.empty()) {
+      const auto answer = std::move(answers_.front());
+      answers_.pop_front();
+      answer();
+    }
   }
 
   /// Acts as a server that was started.
@@ -78,51 +86,84 @@ class FakeNotificationServer final : public NotificationServer {
     isPresent = true;
     if (const auto observer = observer_.lock()) observer->serverAppeared();
   }
-  /// Acts as a server that has ended, and all its banners with it.
+  /// Acts as a server that has ended, and all its banners with it. What it had not reported has
+  /// failed.
   void disappear() {
     isPresent = false;
-    for (const auto& [reference, gone] : std::exchange(shown_, {}))
-      if (const auto observer = observer_.lock()) observer->bannerGone(gone.token);
+    for (const auto& [reference, gone] : std::exchange(banners_, {}))
+      if (!gone.isReported)
+        answerLater(&Observer::bannerFailed, gone.token);
+      else if (!gone.isExpired)
+        tell(&Observer::bannerGone, gone.token);
   }
 
   /// How many banners the user sees.
-  [[nodiscard]] std::size_t count() const { return shown_.size(); }
+  [[nodiscard]] std::size_t count() const {
+    return static_cast<std::size_t>(std::count_if(
+        banners_.begin(), banners_.end(), [](const auto& each) { return !each.second.isExpired; }));
+  }
   /// Those banners, by title.
   [[nodiscard]] std::map<std::string, Banner> banners() const {
     std::map<std::string, Banner> banners;
-    for (const auto& [reference, each] : shown_) banners[each.banner.title] = each.banner;
+    for (const auto& [reference, each] : banners_)
+      if (!each.isExpired) banners[each.banner.title] = each.banner;
     return banners;
   }
   /// Every banner that was ever shown, oldest first.
   [[nodiscard]] const std::vector<Banner>& history() const { return history_; }
 
+  /// Acts as the user, who may also click a banner that has expired. What the server has done until
+  /// now is reported before.
   void activate(const std::string& title, const BannerActivation& activation = {}) {
-    if (const auto token = take(title))
-      if (const auto observer = observer_.lock()) observer->bannerActivated(*token, activation);
+    const auto token = take(title);
+    const auto observer = observer_.lock();
+    if (token && observer) observer->bannerActivated(*token, activation);
   }
   void dismiss(const std::string& title) {
-    if (const auto token = take(title))
-      if (const auto observer = observer_.lock()) observer->bannerDismissed(*token);
+    if (const auto token = take(title)) tell(&Observer::bannerDismissed, *token);
+  }
+
+  /// Acts as a server whose banner has been there long enough.
+  void expire(const std::string& title) {
+    report();
+    const auto expired = find(title);
+    if (expired == banners_.end() || std::exchange(expired->second.isExpired, true)) return;
+    tell(&Observer::bannerGone, std::string(expired->second.token));
   }
 
  private:
   struct Shown {
     std::string token;
     Banner banner;
+    bool isReported = false;
+    bool isExpired = false;
   };
+  using Event = void (Observer::*)(const std::string& token);
 
-  bool works() { return isPresent && faults->next() == Fault::none; }
+  bool isRefused() { return faults->next() != Fault::none; }
 
+  void tell(Event event, const std::string& token) const {
+    if (const auto observer = observer_.lock()) ((*observer).*event)(token);
+  }
+  void answerLater(Event event, const std::string& token) {
+    answers_.emplace_back([this, event, token] { tell(event, token); });
+  }
+
+  std::map<std::string, Shown>::iterator find(const std::string& title) {
+    return std::find_if(banners_.begin(), banners_.end(),
+                        [&](const auto& each) { return each.second.banner.title == title; });
+  }
   std::optional<std::string> take(const std::string& title) {
-    for (auto each = shown_.begin(); each != shown_.end(); ++each)
-      if (each->second.banner.title == title) return shown_.extract(each).mapped().token;
-    return std::nullopt;
+    report();
+    const auto found = find(title);
+    if (found == banners_.end()) return std::nullopt;
+    return banners_.extract(found).mapped().token;
   }
 
   std::weak_ptr<Observer> observer_;
-  std::map<std::string, Shown> shown_;  ///< By reference.
+  std::map<std::string, Shown> banners_;  ///< By reference.
   std::vector<Banner> history_;
-  std::vector<std::function<void(Observer&)>> answers_;
+  std::deque<std::function<void()>> answers_;
   int lastReference_ = 0;
 };
 

@@ -1,13 +1,16 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <algorithm>
 #include <memory>
 #include <string>
 #include <system_error>
+#include <utility>
 #include <vector>
 
 #include <Varnel/Platform/Ports/ProcessLauncher.h>
 #include <Varnel/Platform/Testing/FaultPlan.h>
+#include <Varnel/Platform/Values/SystemText.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -31,6 +34,8 @@ class FakeProcessLauncher final : public ProcessLauncher {
 
   [[nodiscard]] Result<std::unique_ptr<LaunchedProcess>, std::error_code> launch(
       const std::string& path, const std::vector<std::string>& arguments) override {
+    if (isCutShort(path) || std::ranges::any_of(arguments, isCutShort))
+      return std::make_error_code(std::errc::invalid_argument);
     launches.push_back({path});
     launches.back().insert(launches.back().end(), arguments.begin(), arguments.end());
     if (script.launchError) return script.launchError;
@@ -66,7 +71,7 @@ class FakeProcessLauncher final : public ProcessLauncher {
       script_.questions = 0;
       ++launcher_.terminations;
     }
-    [[nodiscard]] std::string readOutput() override { return script_.output; }
+    [[nodiscard]] std::string readOutput() override { return std::exchange(script_.output, {}); }
 
    private:
     FakeProcessLauncher& launcher_;

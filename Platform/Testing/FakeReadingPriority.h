@@ -1,9 +1,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <atomic>
 #include <map>
-#include <mutex>
-#include <thread>
 
 #include <Varnel/Platform/Ports/ReadingPriority.h>
 
@@ -16,25 +15,22 @@ namespace Varnel::Platform::Testing {
 ///     EXPECT_TRUE(priority.isLowered());  // this thread's
 class FakeReadingPriority final : public ReadingPriority {
  public:
-  [[nodiscard]] bool isLowered() const {
-    const std::lock_guard lock(mutex_);
-    const auto found = levels_.find(std::this_thread::get_id());
-    return found != levels_.end() && found->second == 1;
-  }
+  [[nodiscard]] bool isLowered() const { return levelOfThread() == 1; }
 
-  std::optional<Level> current() override { return isLowered() ? 1 : 0; }
+  std::optional<Level> current() override { return levelOfThread(); }
   std::optional<Level> ofMainThread() override { return 0; }
-
-  void set(Level level) override {
-    const std::lock_guard lock(mutex_);
-    levels_[std::this_thread::get_id()] = level;
-  }
-
+  void set(Level level) override { levelOfThread() = level; }
   Level lowered(Level) override { return 1; }
 
  private:
-  mutable std::mutex mutex_;  ///< Owns the rest.
-  std::map<std::thread::id, Level> levels_;
+  // The thread takes it along when it ends, so that a later one of the same number begins anew.
+  Level& levelOfThread() const {
+    static thread_local std::map<int, Level> levels;
+    return levels[number_];
+  }
+
+  static inline std::atomic<int> fakes_ = 0;
+  const int number_ = fakes_++;
 };
 
 }  // namespace Varnel::Platform::Testing

@@ -8,6 +8,7 @@
 
 #include <Varnel/Platform/Ports/SecurityScope.h>
 #include <Varnel/Platform/Testing/FaultPlan.h>
+#include <Varnel/Platform/Values/SystemText.h>
 
 namespace Varnel::Platform::Testing {
 
@@ -41,7 +42,7 @@ class FakeSecurityScope final : public SecurityScope {
   }
 
   bool startAccessing(const URL& url) override {
-    const bool isForbidden = faults->strikes();
+    const bool isForbidden = faults->strikes() || !url.hasScheme("file") || isCutShort(url.path());
     const std::lock_guard lock(mutex_);
     ++starts_;
     if (isForbidden || forbidden_.contains(url)) return false;

@@ -40,7 +40,7 @@ class FakeSound final : public PlayableSound {
   bool isPlaying_ = false;
 };
 
-/// A sound player that remembers what it loaded. It refuses the bytes "broken".
+/// A sound player that remembers what it loaded. It refuses the bytes "broken", and none at all.
 class FakeSoundPlayer final : public SoundPlayer {
  public:
   /// The calls of `load`, which never waits.
@@ -49,8 +49,11 @@ class FakeSoundPlayer final : public SoundPlayer {
 
   [[nodiscard]] std::shared_ptr<PlayableSound> load(std::string bytes) override {
     const Fault fault = faults->next();
-    if (bytes == "broken" || fault == Fault::fails || fault == Fault::absent) return nullptr;
-    return sounds.emplace_back(std::make_shared<FakeSound>(std::move(bytes)));
+    const bool isSound = !bytes.empty() && bytes != "broken";
+    if (!isSound || fault == Fault::fails || fault == Fault::absent) return nullptr;
+    const auto sound = sounds.emplace_back(std::make_shared<FakeSound>(std::move(bytes)));
+    // It stops with the last reference outside.
+    return {sound.get(), [sound](PlayableSound*) { sound->stop(); }};
   }
   [[nodiscard]] std::optional<std::string> missingPart() const override { return std::nullopt; }
 };

@@ -28,10 +28,12 @@ class FakeTimeZones final : public TimeZones {
 
   std::string local = "UTC";
   /// The changes of each zone, in the order of time. Before the first one, and in other zones, the
-  /// clocks show UTC.
+  /// clocks show UTC. A user in another zone is in UTC.
   std::map<std::string, std::vector<Change>> changes;
 
-  [[nodiscard]] std::string localIdentifier() const override { return local; }
+  [[nodiscard]] std::string localIdentifier() const override {
+    return changes.contains(local) ? local : "UTC";
+  }
   [[nodiscard]] std::shared_ptr<const TimeZone> zone(const std::string& identifier) const override {
     const auto found = changes.find(identifier);
     return std::make_shared<Zone>(found == changes.end() ? std::vector<Change>() : found->second);

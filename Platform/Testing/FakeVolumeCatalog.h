@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
+#include <iterator>
 #include <map>
 #include <memory>
 #include <mutex>
@@ -45,7 +47,9 @@ class FakeVolumeCatalog final : public VolumeCatalog {
   void unmount(const URL& url) {
     {
       const std::lock_guard lock(mutex_);
-      std::erase_if(volumes_, [&](const MountedVolume& volume) { return volume.url == url; });
+      const auto last = std::find_if(volumes_.rbegin(), volumes_.rend(),
+                                     [&](const auto& volume) { return volume.url == url; });
+      if (last != volumes_.rend()) volumes_.erase(std::next(last).base());
     }
     announce({.kind = VolumeChange::Kind::unmounted, .volumeURL = url});
   }
@@ -82,7 +86,12 @@ class FakeVolumeCatalog final : public VolumeCatalog {
   std::vector<MountedVolume> mountedVolumes() override {
     if (faults->strikes()) return {};
     const std::lock_guard lock(mutex_);
-    return volumes_;
+    std::vector<MountedVolume> visible;
+    for (const MountedVolume& volume : volumes_) {
+      std::erase_if(visible, [&](const MountedVolume& each) { return each.url == volume.url; });
+      visible.push_back(volume);
+    }
+    return visible;
   }
 
   /// The volume with the longest path that is a folder above the URL, or the URL itself.
@@ -92,7 +101,10 @@ class FakeVolumeCatalog final : public VolumeCatalog {
     if (fault == Fault::absent) return std::optional<URL>();
     const std::lock_guard lock(mutex_);
     if (lookupError_) return *lookupError_;
-    const std::string path = withSlash(url.path());
+    std::string path = url.path();
+    if (path.empty() || path.find('\0') != std::string::npos)
+      return PlatformError(std::make_error_code(std::errc::no_such_file_or_directory));
+    path = withSlash(std::move(path));
     std::optional<URL> found;
     std::size_t longest = 0;
     for (const MountedVolume& volume : volumes_) {

@@ -55,7 +55,7 @@ class FakeWallClockTimer final : public WallClockTimer {
  private:
   void fire() {
     armed_.reset();
-    if (handler_) handler_();
+    if (const auto handler = handler_) handler();
   }
 
   SimulatedClock& clock_;

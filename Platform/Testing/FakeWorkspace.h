@@ -24,7 +24,7 @@ class FakeWorkspace final : public Workspace {
   [[nodiscard]] std::optional<URL> applicationURL(const std::string& bundleIdentifier) override {
     if (faults->strikes()) return std::nullopt;
     const auto found = applications.find(bundleIdentifier);
-    if (found == applications.end()) return std::nullopt;
+    if (found == applications.end() || bundleIdentifier.empty()) return std::nullopt;
     return found->second;
   }
 };

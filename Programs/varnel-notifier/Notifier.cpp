@@ -10,10 +10,9 @@
 
 #include <Varnel/Platform/Generic/NotificationDeliverer.h>
 #include <Varnel/Platform/Linux/Notifications/BusHosts.h>
-#include <Varnel/Platform/Linux/Notifications/HostName.h>
 #include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
 #include <Varnel/Platform/Linux/Notifications/NotifierProtocol.h>
-#include <Varnel/Platform/Linux/Process/UserFolders.h>
+#include <Varnel/Platform/POSIX/UserFolders.h>
 #include <Varnel/Platform/Ports/ApplicationLauncher.h>
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
@@ -51,19 +50,18 @@ class Notifier::Product final {
       : ports_(notifier.ports_),
         launcher_(*notifier.launcher_),
         hosts_(notifier.bus_, [this](const auto& activation) { launch(activation); }),
-        server_(makeNotificationServer(ports_.systemLog, {}, notifier.bus_)),
+        server_(makeBusNotificationServer(ports_.systemLog, {}, notifier.bus_)),
         timer_(notifier.sharedTimer_.share()),
         deliverer_({ports_.clock, ports_.userLocale, ports_.timeZones, ports_.mainQueue,
                     ports_.privateFiles, ports_.systemLog, *server_, *timer_},
                    store.string(), Migrating::never, hosts_),
         watch_(store.parent_path(), store.filename(), [this] { deliverer_.recheck(); }) {
     const auto source = deliverer_.source();
-    hosts_.setName(hostName(source && *source ? (*source)->identifier : baseIdentifier));
+    hosts_.setProduct(source && *source ? (*source)->identifier : baseIdentifier);
     deliverer_.setDuty(NotificationDeliverer::Duty::everything);
   }
 
   NotificationDeliverer& deliverer() { return deliverer_; }
-  BusHosts& hosts() { return hosts_; }
   [[nodiscard]] bool isIdle() const {
     return deliverer_.isIdle() && !hosts_.isBusy() && *launches_ == 0;
   }
@@ -110,8 +108,8 @@ Notifier::Notifier(const NotificationPorts& ports, const fs::path& executable)
       // Wakes `run`, which looks then.
       executableWatch_(executable.parent_path(), executable.filename(), [] {}) {
   bus_->serve({notifierPath, notifierInterface,
-               [this](std::string_view method, GVariant* arguments, GDBusMethodInvocation* call) {
-                 receive(method, arguments, call);
+               [this](std::string_view, GVariant* arguments, GDBusMethodInvocation* call) {
+                 receive(arguments, call);
                }});
   bus_->setObserver([this](bool isConnected) { isDisconnected_ = !isConnected; });
 }
@@ -175,7 +173,7 @@ Notifier::Product* Notifier::product(const std::string& baseIdentifier, const fs
 // The folder of a product's store has the name of the base identifier, as far as names of files
 // can.
 void Notifier::findProducts() {
-  for (const fs::path& store : notificationStores())
+  for (const fs::path& store : POSIX::notificationStores())
     product(store.parent_path().filename().string(), store);
 }
 
@@ -188,20 +186,14 @@ bool Notifier::isIdle() const {
                      [](const auto& each) { return each.second->isIdle(); });
 }
 
-void Notifier::receive(std::string_view method, GVariant* arguments, GDBusMethodInvocation* call) {
+// The one method is `Changed`.
+void Notifier::receive(GVariant* arguments, GDBusMethodInvocation* call) {
   const char* identifier = nullptr;
-  GVariant* result = nullptr;
   g_variant_get_child(arguments, 0, "&s", &identifier);
-  Product* const concerned = product(identifier, notificationStore(identifier));
-  if (method == "Changed") {
-    if (concerned) concerned->deliverer().recheck();
-    result = g_variant_new("(b)", static_cast<gboolean>(concerned && !concerned->isIdle()));
-  } else if (concerned) {
-    gboolean isActive = FALSE;
-    g_variant_get_child(arguments, 1, "b", &isActive);
-    concerned->hosts().setActive(g_dbus_method_invocation_get_sender(call), isActive);
-  }
-  g_dbus_method_invocation_return_value(call, result);
+  Product* const concerned = product(identifier, POSIX::notificationStore(identifier));
+  if (concerned) concerned->deliverer().recheck();
+  const bool stays = concerned && !concerned->isIdle();
+  g_dbus_method_invocation_return_value(call, g_variant_new("(b)", static_cast<gboolean>(stays)));
 }
 
 }  // namespace Varnel

@@ -48,7 +48,7 @@ class Notifier final {
   void findProducts();
   void recheck();
   [[nodiscard]] bool isIdle() const;
-  void receive(std::string_view method, GVariant* arguments, GDBusMethodInvocation* call);
+  void receive(GVariant* arguments, GDBusMethodInvocation* call);
   [[nodiscard]] bool ownsName(const char* method);
   void sleepWhile(const std::function<bool()>& condition);
 

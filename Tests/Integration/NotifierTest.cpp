@@ -147,6 +147,13 @@ class Host final {
       return condition();
     }));
   }
+  // What it has sent has arrived at the bus.
+  void synchronise() {
+    bool isAnswered = false;
+    queue_->drain();
+    center.checkBanners([&](const auto&) { isAnswered = true; });
+    await([&] { return isAnswered; });
+  }
   void settle() {
     queue_->runWhile([this] { return center.isBusy(); }, 10s);
   }
@@ -208,7 +215,7 @@ TEST_F(NotifierTest, ABannerComesWhileNoProcessOfTheProductIsInFront) {
   Host host("front"), other("front", std::nullopt);
   for (Host* const inFront : {&host, &other}) {
     inFront->application.setActive(true);
-    inFront->await([] { return true; });
+    inFront->synchronise();
     for (int i = 0; i < 4; ++i) {
       const std::size_t before = host.delivered.size();
       host.deliver("hidden");
@@ -216,7 +223,7 @@ TEST_F(NotifierTest, ABannerComesWhileNoProcessOfTheProductIsInFront) {
     }
     EXPECT_EQ(displayed(), "0\n");
     inFront->application.setActive(false);
-    host.settle();
+    inFront->synchronise();
   }
   host.deliver("shown");
   host.await([] { return displayed() == "1\n"; });
@@ -236,6 +243,7 @@ TEST_F(NotifierTest, EachProductHasItsOwnClicksAndAnOnlookerGivesWay) {
   first.deliver("first");
   first.await([] { return displayed() == "2\n"; });
   outputOf("dunstctl action 0");
+  first.await([] { return displayed() == "1\n"; });
   outputOf("dunstctl action 0");
   first.await([&] { return !first.clicked.empty(); });
   second.await([&] { return !second.clicked.empty(); });

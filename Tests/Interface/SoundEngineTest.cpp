@@ -111,6 +111,7 @@ TEST_F(SoundEngineTest, MutingLeavesWhatPlaysAlone) {
 
 TEST_F(SoundEngineTest, AnySoundsEndStopsTheCurrentOne) {
   engine.play(Sound::start);
+  const auto first = engine.currentSound();
   const auto other = player.load("of the host");
   engine.setCurrentSound(other);
   lastSound().play();
@@ -123,6 +124,7 @@ TEST_F(SoundEngineTest, ASoundMayOutliveItsEngine) {
   auto brief = std::make_unique<SoundEngine>(SoundEngine::Ports{
       .player = player, .path = [this](Sound sound) { return sound.path(bundle); }});
   brief->play(Sound::start);
+  const auto sound = brief->currentSound();
   brief->setCurrentSound(nullptr);
   brief.reset();
   lastSound().end();

@@ -5,6 +5,7 @@
 #include <future>
 #include <map>
 
+#include <Tests/Support/SysfsMachine.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Linux/Disks/BlockDevices.h>
 #include <Varnel/Platform/Linux/Disks/BlockTree.h>
@@ -18,51 +19,9 @@ namespace fs = std::filesystem;
 using testing::ElementsAre;
 using testing::IsEmpty;
 
-// A machine's sysfs, made of folders and links as the kernel lays them out.
-class Machine {
- public:
-  Machine() { fs::create_directories(root_.path() / "class/block"); }
-
-  // `place` is the device's folder below "devices/"; its last component is the device's name.
-  void add(const std::string& place, const std::map<std::string, std::string>& attributes = {}) {
-    const fs::path device = root_.path() / "devices" / place;
-    fs::create_directories(device);
-    for (const auto& [name, value] : attributes)
-      root_.write("devices/" + place + '/' + name, value);
-    fs::create_directory_symlink("../../devices/" + place,
-                                 root_.path() / "class/block" / device.filename());
-  }
-
-  void setSubsystem(const std::string& place, const std::string& subsystem) {
-    const fs::path device = root_.path() / "devices" / place;
-    fs::create_directories(device);
-    fs::create_directory_symlink("/bus/" + subsystem, device / "subsystem");
-  }
-
-  // Also the carrier of the disk "…/0:0:0:0", which its attributes are reached through.
-  void addSCSIDisk(const std::string& above, const std::string& name,
-                   std::map<std::string, std::string> attributes) {
-    setSubsystem(above + "/host0", "scsi");
-    setSubsystem(above + "/host0/0:0:0:0", "scsi");
-    const std::string place = above + "/host0/0:0:0:0/block/" + name;
-    add(place, attributes);
-    fs::create_directory_symlink("../..", root_.path() / "devices" / place / "device");
-    carrier_ = "devices/" + above + "/host0/0:0:0:0/";
-  }
-  void writeOnCarrier(const std::string& name, std::string_view bytes) {
-    root_.write(carrier_ + name, bytes);
-  }
-
-  void standOn(const std::string& name, const std::string& lower) {
-    root_.write("class/block/" + name + "/slaves/" + lower, "");
-  }
-
-  BlockDevices devices() const { return BlockDevices((root_.path() / "class/block").c_str()); }
-
- private:
-  Tests::TemporaryFolder root_;
-  std::string carrier_;
-};
+BlockDevices devicesOf(const Tests::SysfsMachine& machine) {
+  return BlockDevices(machine.folder().c_str());
+}
 
 // "capable(Solid State,S1)[sda[sda1]]": the tree below the nodes that have no parent.
 std::string drawn(const BlockTree& tree, std::size_t node) {
@@ -77,9 +36,9 @@ std::string drawn(const BlockTree& tree, std::size_t node) {
   return text;
 }
 
-std::vector<std::string> drawn(const Machine& machine) {
+std::vector<std::string> drawn(const Tests::SysfsMachine& machine) {
   VirtioSerials serials(std::chrono::minutes(1));
-  const BlockTree tree = readBlockTree(machine.devices(), serials);
+  const BlockTree tree = readBlockTree(devicesOf(machine), serials);
   std::vector<std::string> roots;
   for (std::size_t node = 0; node < tree.nodes.size(); ++node)
     if (!tree.nodes[node].parent) roots.push_back(drawn(tree, node));
@@ -87,7 +46,7 @@ std::vector<std::string> drawn(const Machine& machine) {
 }
 
 TEST(BlockTree, HangsPartitionsAndLogicalDevicesBelowTheirDisk) {
-  Machine machine;
+  Tests::SysfsMachine machine;
   machine.addSCSIDisk("pci0/ata1", "sda", {{"removable", "0\n"}, {"queue/rotational", "1\n"}});
   machine.writeOnCarrier("vpd_pg80", std::string_view("\0\x80\0\x08  WD-12 \n", 12));
   machine.add("pci0/ata1/host0/0:0:0:0/block/sda/sda1", {{"partition", "1\n"}});
@@ -98,13 +57,13 @@ TEST(BlockTree, HangsPartitionsAndLogicalDevicesBelowTheirDisk) {
   machine.add("virtual/block/loop0");
   machine.standOn("loop0", "sda1");  // the kernel never says so
   EXPECT_THAT(drawn(machine), ElementsAre("loop0", "+(Rotational,WD-12)[sda[sda1[dm-0[dm-1]]]]"));
-  EXPECT_EQ(machine.devices().areInternal({"dm-1"}), true);
-  EXPECT_EQ(machine.devices().areInternal({"dm-1", "loop0"}), false);
-  EXPECT_EQ(machine.devices().areInternal({"dm-1", "gone"}), std::nullopt);
+  EXPECT_EQ(devicesOf(machine).areInternal({"dm-1"}), true);
+  EXPECT_EQ(devicesOf(machine).areInternal({"dm-1", "loop0"}), false);
+  EXPECT_EQ(devicesOf(machine).areInternal({"dm-1", "gone"}), std::nullopt);
 }
 
 TEST(BlockTree, ARaidStandsBelowEachOfItsDisksAndCirclesAreCut) {
-  Machine machine;
+  Tests::SysfsMachine machine;
   machine.setSubsystem("pci0/virtio1", "virtio");
   machine.setSubsystem("pci0/virtio2", "virtio");
   machine.add("pci0/virtio1/block/vdya", {{"serial", "A"}, {"queue/rotational", "0\n"}});
@@ -117,11 +76,11 @@ TEST(BlockTree, ARaidStandsBelowEachOfItsDisksAndCirclesAreCut) {
   machine.standOn("dm-1", "dm-0");
   EXPECT_THAT(drawn(machine), ElementsAre("dm-1[dm-0]", "+(Solid State,A)[vdya[md0]]",
                                           "+(Rotational,B)[vdyb[md0]]"));
-  EXPECT_EQ(machine.devices().areInternal({"dm-0"}), std::nullopt);
+  EXPECT_EQ(devicesOf(machine).areInternal({"dm-0"}), std::nullopt);
 }
 
 TEST(BlockTree, DisksOnUSBAndRemovableOnesAreNotCapable) {
-  Machine machine;
+  Tests::SysfsMachine machine;
   machine.setSubsystem("pci0", "pci");
   machine.setSubsystem("pci0/usb1/1-1", "usb");
   machine.addSCSIDisk("pci0/usb1/1-1", "sdb", {{"removable", "0\n"}});
@@ -131,14 +90,14 @@ TEST(BlockTree, DisksOnUSBAndRemovableOnesAreNotCapable) {
   machine.add("pci0/mmc0/mmc0:1/block/mmcblk0/mmcblk0p1", {{"partition", "1\n"}});
   machine.add("pci0/odd/block/odd0");
   EXPECT_THAT(drawn(machine), ElementsAre("-[mmcblk0[mmcblk0p1]]", "-[odd0]", "-[sdb]", "-[sr0]"));
-  EXPECT_EQ(machine.devices().areInternal({"sdb"}), false);
-  EXPECT_EQ(machine.devices().areInternal({"sr0"}), false);
-  EXPECT_EQ(machine.devices().areInternal({"mmcblk0p1"}), true);
-  EXPECT_EQ(machine.devices().areInternal({"odd0"}), std::nullopt);
+  EXPECT_EQ(devicesOf(machine).areInternal({"sdb"}), false);
+  EXPECT_EQ(devicesOf(machine).areInternal({"sr0"}), false);
+  EXPECT_EQ(devicesOf(machine).areInternal({"mmcblk0p1"}), true);
+  EXPECT_EQ(devicesOf(machine).areInternal({"odd0"}), std::nullopt);
 }
 
 TEST(BlockTree, ADiskWithoutASerialNumberIsKnownByItsNameOrItsPlace) {
-  Machine machine;
+  Tests::SysfsMachine machine;
   machine.setSubsystem("pci0/nvme/nvme0", "nvme");
   machine.add("pci0/nvme/nvme0/nvme0n1", {{"wwid", "eui.0025\n"}, {"device/serial", " \n"}});
   machine.add("pci0/nvme/nvme0/nvme0c0n1", {{"hidden", "1\n"}});

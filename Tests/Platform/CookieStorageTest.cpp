@@ -62,20 +62,6 @@ TEST_F(CookieJar, ListsWhatHasNotExpiredInTheOrderOfTheStore) {
   EXPECT_THAT(read(), ElementsAre("a=1", "b=2", "d="));
   clock.advance(std::chrono::seconds(1));
   EXPECT_THAT(read(), ElementsAre("a=1", "d="));
-  EXPECT_EQ(storage.cookiesOfGroupContainer("Cookies").front(),
-            (Cookie{".quennel.example", "/", "a", "1"}));
-}
-
-TEST_F(CookieJar, EachStoreHasItsOwnFileAndNoNameLeadsElsewhere) {
-  ASSERT_EQ(open(folder.path() / "orvane" / "cookies.sqlite")
-                ->execute(createTable + insert(1, "own", "'1'", 2000)),
-            std::nullopt);
-  EXPECT_EQ(storage.cookies().size(), 1U);
-  EXPECT_THAT(read(), ElementsAre());
-  EXPECT_FALSE(fs::exists(groupJar));
-  EXPECT_TRUE(storage.cookiesOfGroupContainer("../orvane").empty());
-  EXPECT_TRUE(storage.cookiesOfGroupContainer("..").empty());
-  EXPECT_TRUE(storage.cookiesOfGroupContainer("").empty());
 }
 
 TEST_F(CookieJar, ADamagedStoreIsEmpty) {

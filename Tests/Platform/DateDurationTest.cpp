@@ -8,7 +8,7 @@
 
 #include <Tests/Support/Crew.h>
 #include <Tests/Support/LocalZone.h>
-#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/TimeZones.h>
 
 namespace Varnel::Platform {
@@ -19,7 +19,7 @@ using namespace std::chrono_literals;
 
 constexpr const char* timestampPattern = "YYYY-MM-dd HH:mm:ss";
 
-const auto zones = Linux::makeTimeZones();
+const TimeZones& zones = systemPorts().timeZones;
 
 // What is finer than a microsecond is cut off, towards the past and in every age.
 static_assert(Date(1us) + 1500ns == Date(2us));
@@ -32,7 +32,7 @@ static_assert(Date(sys_days(32767y / December / 31)) + 1500ns > Date(sys_days(22
 TEST(DateFormatter, WritesTheYearOfTheLocalesWeek) {
   const Tests::LocalZone utc("UTC");
   const auto text = [](const char* pattern, const char* locale, sys_days day) {
-    return DateFormatter(pattern, locale, *zones).string(day);
+    return DateFormatter(pattern, locale, zones).string(day);
   };
   EXPECT_EQ(text("YYYY-MM-dd", "en_US", 2024y / December / 28), "2024-12-28");
   EXPECT_EQ(text("YYYY-MM-dd", "en_US", 2024y / December / 31), "2025-12-31");
@@ -40,7 +40,7 @@ TEST(DateFormatter, WritesTheYearOfTheLocalesWeek) {
   EXPECT_EQ(text("YYYY-MM-dd", "de_DE", 2023y / January / 1), "2022-01-01");
   EXPECT_EQ(text("YYYY-MM-dd", "en_US", 2023y / January / 1), "2023-01-01");
   EXPECT_EQ(text("yyyy-MM-dd", "en_US", 1969y / December / 31), "1969-12-31");
-  const DateFormatter formatter("dd HH", "en_US", *zones);
+  const DateFormatter formatter("dd HH", "en_US", zones);
   const Tests::LocalZone tokyo("Asia/Tokyo");
   EXPECT_EQ(text("dd HH", "en_US", 2024y / October / 27), "27 09");
   EXPECT_EQ(formatter.string(sys_days(2024y / October / 27)), "27 00") << "the zone it was made in";
@@ -49,11 +49,11 @@ TEST(DateFormatter, WritesTheYearOfTheLocalesWeek) {
 TEST(DateFormatter, KeepsTextsOfFormattersAndSecondsApart) {
   const Tests::LocalZone utc("UTC");
   const Date date = sys_days(2024y / May / 5) + 1h;
-  const DateFormatter timestamp(timestampPattern, "en_US", *zones);
-  const DateFormatter milliseconds("ss.SSS", "en_US", *zones);
-  const DateFormatter quoted("ss 'SA' ''", "en_US", *zones);
+  const DateFormatter timestamp(timestampPattern, "en_US", zones);
+  const DateFormatter milliseconds("ss.SSS", "en_US", zones);
+  const DateFormatter quoted("ss 'SA' ''", "en_US", zones);
   const DateFormatter longer("'a text that is much too long to be kept with its second' ss",
-                             "en_US", *zones);
+                             "en_US", zones);
   for (const auto part : {0us, 1000us, 999'999us, 1'000'000us, 0us, -1us}) {
     const bool isNext = part >= 1s;
     const bool isBefore = part < 0s;
@@ -69,25 +69,25 @@ TEST(DateFormatter, KeepsTextsOfFormattersAndSecondsApart) {
 
   // Formatters one after the other at one address and one second.
   for (const auto& [pattern, text] : {std::pair{"HH", "01"}, {"dd", "05"}, {"yy", "24"}})
-    EXPECT_EQ(DateFormatter(pattern, "en_US", *zones).string(date), text);
+    EXPECT_EQ(DateFormatter(pattern, "en_US", zones).string(date), text);
 }
 
 TEST(DateFormatter, SurvivesOddPatternsAndDates) {
   const Tests::LocalZone utc("UTC");
   const Date date = sys_days(2024y / May / 5) + 1h;
-  EXPECT_EQ(DateFormatter("", "en_US", *zones).string(date), "");
-  EXPECT_EQ(DateFormatter("'open quote", "en_US", *zones).string(date), "open quote");
-  EXPECT_EQ(DateFormatter("yyyy N P", "en_US", *zones).string(date), "2024-05-05 01:00:00");
-  EXPECT_EQ(DateFormatter("yyyy", "no such locale", *zones).string(date), "2024");
-  EXPECT_EQ(DateFormatter("d MMMM", "de_DE", *zones).string(date), "5 Mai");
-  const DateFormatter formatter(timestampPattern, "en_US", *zones);
+  EXPECT_EQ(DateFormatter("", "en_US", zones).string(date), "");
+  EXPECT_EQ(DateFormatter("'open quote", "en_US", zones).string(date), "open quote");
+  EXPECT_EQ(DateFormatter("yyyy N P", "en_US", zones).string(date), "2024-05-05 01:00:00");
+  EXPECT_EQ(DateFormatter("yyyy", "no such locale", zones).string(date), "2024");
+  EXPECT_EQ(DateFormatter("d MMMM", "de_DE", zones).string(date), "5 Mai");
+  const DateFormatter formatter(timestampPattern, "en_US", zones);
   EXPECT_FALSE(formatter.string(Date::min()).empty());
   EXPECT_FALSE(formatter.string(Date::max()).empty());
 }
 
 TEST(DateFormatter, GivesEveryThreadTheTextOfItsOwnSecond) {
   const Tests::LocalZone utc("UTC");
-  const DateFormatter formatter("HH:mm:ss", "en_US", *zones);
+  const DateFormatter formatter("HH:mm:ss", "en_US", zones);
   Tests::Crew(4, [&](unsigned thread) {
     for (unsigned step = 0; step < 4000; ++step) {
       const unsigned second = (thread * 7 + step / 4) % 60;

@@ -7,7 +7,6 @@
 #include <fstream>
 
 #include <Tests/Platform/DurableNotes.h>
-#include <Tests/Support/MountNamespace.h>
 #include <Tests/Support/TemporaryFolder.h>
 
 // Where a durable file may lie, and what it does on disks that are full or cannot be written. Each
@@ -47,9 +46,6 @@ class DurableFilePlacesTest : public testing::Test {
     fs::create_directories(home_);
     give(home_, user);
     fs::permissions(folder_.path(), fs::perms::all);
-  }
-  static void give(const fs::path& path, uid_t user) {
-    EXPECT_EQ(::lchown(path.c_str(), user, static_cast<gid_t>(-1)), 0);
   }
 
   TemporaryFolder folder_;

@@ -1,9 +1,6 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <sys/wait.h>
-#include <unistd.h>
-
 #include <filesystem>
 #include <functional>
 #include <memory>
@@ -12,6 +9,7 @@
 
 #include <gtest/gtest.h>
 
+#include <Tests/Support/AsUser.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/SQLite/DurableFile.h>
@@ -116,25 +114,5 @@ struct Notebook final {
   Lines log;
   Platform::DurableFile file;
 };
-
-/// Does the rest of a test in a process of its own, as this user; its failures are the test's.
-inline void inChild(uid_t user, const std::function<void()>& act) {
-  const pid_t child = ::fork();
-  if (child == 0) {
-    if (user != ::geteuid() && (::setgid(user) != 0 || ::setuid(user) != 0)) ::_exit(2);
-    act();
-    ::_exit(testing::Test::HasFailure() ? 1 : 0);
-  }
-  int status = 0;
-  ::waitpid(child, &status, 0);
-  EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0) << "in a process of user " << user;
-}
-
-/// Everybody a test can be: itself and, where that is root, an ordinary user as well.
-inline std::vector<uid_t> users() {
-  constexpr uid_t ordinary = 65534;
-  if (::geteuid() == 0) return {0, ordinary};
-  return {::geteuid()};
-}
 
 }  // namespace Varnel::Tests

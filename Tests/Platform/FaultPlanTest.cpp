@@ -16,6 +16,8 @@ namespace {
 
 using namespace std::chrono_literals;
 
+const HTTPPost post{.url = "https://h.example", .contentType = {}, .body = {}};
+
 TEST(FaultPlan, StrikesTheCallsThatItNamesAcrossFakes) {
   FakeHTTPClient http;
   FakeProcessLauncher launcher;
@@ -24,7 +26,7 @@ TEST(FaultPlan, StrikesTheCallsThatItNamesAcrossFakes) {
     http.faults->plan(fault, first, count);
     std::string works;
     for (int i = 0; i < 2; ++i) {
-      works += http.post({}, {}) ? 'y' : 'n';
+      works += http.post(post, {}) ? 'y' : 'n';
       works += launcher.launch("/tool", {}) ? 'y' : 'n';
     }
     return works;
@@ -41,8 +43,8 @@ TEST(FaultPlan, ADelayedCallWaitsUntilItIsMendedOrStopped) {
   for (const bool isStopped : {false, true}) {
     const std::size_t before = http.faults->calls();
     http.faults->plan(Fault::delays, before + 1);
-    auto answer =
-        std::async(std::launch::async, [&] { return http.post({}, stop.get_token()).hasValue(); });
+    auto answer = std::async(std::launch::async,
+                             [&] { return http.post(post, stop.get_token()).hasValue(); });
     http.faults->waitForCalls(before + 1);
     EXPECT_EQ(http.posts().size(), 0u + isStopped) << "it has not arrived";
     if (isStopped)

@@ -5,7 +5,6 @@
 #include <pthread.h>
 #include <signal.h>
 #include <stdlib.h>
-#include <syslog.h>
 #include <unistd.h>
 
 #include <future>
@@ -15,26 +14,12 @@
 #include <Varnel/Basalt/SerialQueue.h>
 #include <Varnel/Platform/Concurrency/StartThread.h>
 #include <Varnel/Platform/Linux/Adapters.h>
-#include <Varnel/Platform/Linux/Process/UserFolders.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
 #include <Varnel/Platform/POSIX/ImageFile.h>
+#include <Varnel/Platform/POSIX/UserFolders.h>
 #include <Varnel/Platform/Ports/ProcessInfo.h>
-#include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
-
-namespace {
-int openedLogs = 0;
-int lastPriority = 0;
-}  // namespace
-
-// In place of the C library's.
-extern "C" void openlog(const char*, int, int) {
-  ++openedLogs;
-}
-extern "C" void syslog(int priority, const char*, ...) {
-  lastPriority = priority;
-}
 
 namespace Varnel::Platform {
 namespace {
@@ -97,12 +82,6 @@ TEST(FileDescriptor, IsNoStandardStream) {
   ::dup2(input.get(), STDIN_FILENO);
 }
 
-TEST(SystemLog, LeavesTheProcessesLogToTheHost) {
-  POSIX::makeSystemLog()->write("line");
-  EXPECT_EQ(openedLogs, 0);
-  EXPECT_EQ(lastPriority, LOG_USER | LOG_NOTICE);
-}
-
 TEST(ProcessInfo, KnowsItsExecutable) {
   const Tests::TemporaryFolder root;
   const fs::path link = root.path() / "proc/self/exe";
@@ -144,7 +123,7 @@ TEST(UserAccount, RefusesRelativeFolders) {
     ::setenv("HOME", home, 1);
     EXPECT_EQ(account->homeFolder(), folder) << home;
     ::setenv("XDG_DATA_HOME", "relative", 1);
-    EXPECT_EQ(Linux::userDataFolder(), fs::path(folder) / ".local/share");
+    EXPECT_EQ(POSIX::userDataFolder(), fs::path(folder) / ".local/share");
   }
 }
 
@@ -152,14 +131,14 @@ TEST(UserFolders, HoldTheFilesOfAnIdentifierAndOfNoOther) {
   ::setenv("HOME", "/home/ada", 1);
   ::setenv("XDG_CONFIG_HOME", "", 1);
   ::setenv("XDG_STATE_HOME", "relative", 1);
-  EXPECT_EQ(Linux::settingsFile("com.a.B"), "/home/ada/.config/com.a.B/settings.ini");
-  EXPECT_EQ(Linux::analyticsSpool("com.a.B"), "/home/ada/.local/state/com.a.B/analytics.sqlite");
+  EXPECT_EQ(POSIX::settingsFolder("com.a.B"), "/home/ada/.config/com.a.B");
+  EXPECT_EQ(POSIX::analyticsSpool("com.a.B"), "/home/ada/.local/state/com.a.B/analytics.sqlite");
   ::setenv("XDG_CONFIG_HOME", "/c", 1);
   ::setenv("XDG_STATE_HOME", "/s", 1);
-  EXPECT_EQ(Linux::settingsFile("com.a.B"), "/c/com.a.B/settings.ini");
+  EXPECT_EQ(POSIX::settingsFolder("com.a.B"), "/c/com.a.B");
   for (const char* path : {"..", ".", "", "/"})
-    EXPECT_EQ(Linux::notificationStore(path), "/s/_/notifications.sqlite") << path;
-  EXPECT_EQ(Linux::notificationStore("a/../b"), "/s/a_.._b/notifications.sqlite");
+    EXPECT_EQ(POSIX::notificationStore(path), "/s/_/notifications.sqlite") << path;
+  EXPECT_EQ(POSIX::notificationStore("a/../b"), "/s/a_.._b/notifications.sqlite");
 }
 
 }  // namespace

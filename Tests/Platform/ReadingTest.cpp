@@ -118,33 +118,25 @@ TEST(TracelessReader, TellsTheSystemsErrors) {
   EXPECT_EQ(failed.error(), std::errc::bad_file_descriptor);
 }
 
-TEST(ReadingPriority, IsTheThreadsOwnAndCanBeRestored) {
+TEST(ReadingPriority, KnowsTheClassesAndHabitsOfTheKernel) {
   constexpr int lowest = 2 << 13 | 7;
   constexpr int idle = 3 << 13;
   constexpr int realTime = 1 << 13 | 4;
   constexpr int unsetOnOldKernels = 4;
   const auto priority = Linux::makeReadingPriority();
-  const auto normal = priority->current();
-  ASSERT_TRUE(normal);
+  EXPECT_EQ(priority->lowered(0), lowest);
+  EXPECT_EQ(priority->lowered(realTime), realTime) << "nobody else may take it up again";
+  EXPECT_EQ(priority->lowered(idle), idle) << "no less than it was";
   std::thread([&] {
-    EXPECT_EQ(priority->lowered(*normal), lowest);
-    EXPECT_EQ(priority->lowered(realTime), realTime) << "nobody else may take it up again";
     priority->set(lowest);
-    EXPECT_EQ(priority->current(), lowest);
-    EXPECT_EQ(priority->ofMainThread(), normal);
     priority->set(unsetOnOldKernels);
     EXPECT_NE(priority->current(), lowest);
-    priority->set(lowest);
-    priority->set(*normal);
-    EXPECT_EQ(priority->current(), normal);
-    priority->set(idle);
-    EXPECT_EQ(priority->lowered(*priority->current()) >> 13, 3) << "no less than it was";
   }).join();
   Tests::onAKernelThatForbids({SYS_ioprio_set, SYS_ioprio_get}, EPERM, [&] {
     priority->set(lowest);
     EXPECT_FALSE(priority->current());
   });
-  EXPECT_EQ(priority->current(), normal);
+  EXPECT_NE(priority->current(), lowest);
 }
 
 }  // namespace

@@ -1,15 +1,12 @@
 // SPDX-License-Identifier: MIT
 #include <gtest/gtest.h>
 #include <sys/stat.h>
-#include <sys/xattr.h>
 
 #include <cstdlib>
 #include <filesystem>
 
 #include <Tests/Support/TemporaryFolder.h>
-#include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
-#include <Varnel/Platform/Ports/ExtendedAttributes.h>
 #include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
 #include <Varnel/Platform/Values/UTF8.h>
@@ -18,25 +15,6 @@ namespace Varnel::Platform {
 namespace {
 
 namespace fs = std::filesystem;
-
-TEST(ExtendedAttributes, TellsAbsentFromFailed) {
-  const Tests::TemporaryFolder folder;
-  const fs::path file = folder.write("file", "");
-  const std::string value("a\0b;\xFF", 5);
-  if (::setxattr(file.c_str(), "user.note", value.data(), value.size(), 0) != 0)
-    GTEST_SKIP() << "The file system of " << folder.path() << " keeps no attributes.";
-  const auto attributes = Linux::makeExtendedAttributes();
-  EXPECT_EQ(*attributes->value(file.string(), "note"), value);
-  EXPECT_EQ(*attributes->value(file.string(), "other"), std::nullopt);
-  fs::create_symlink(file, folder.path() / "link");
-  EXPECT_EQ(*attributes->value((folder.path() / "link").string(), "note"), value);
-  EXPECT_EQ(attributes->value((folder.path() / "missing").string(), "note").error(),
-            std::errc::no_such_file_or_directory);
-  EXPECT_EQ(attributes->value("/proc/self/stat", "note").error().category(),
-            std::generic_category());
-  ASSERT_EQ(::setxattr(file.c_str(), "user.empty", "", 0, 0), 0);
-  EXPECT_EQ(*attributes->value(file.string(), "empty"), "");
-}
 
 TEST(ReadFile, GivesAllBytesOrTheReason) {
   const Tests::TemporaryFolder folder;
@@ -52,7 +30,8 @@ TEST(ReadFile, GivesAllBytesOrTheReason) {
   EXPECT_EQ(readFile(file + "/in a file").error(), std::errc::not_a_directory);
   const std::string pipe = folder.path() / "pipe";
   ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
-  for (const std::string& path : {pipe, folder.path().string(), std::string("/dev/zero")})
+  for (const std::string& path :
+       {pipe, folder.path().string(), std::string("/dev/zero"), file + '\0'})
     EXPECT_EQ(readFile(path).error(), std::errc::invalid_argument) << path;
 }
 

@@ -12,8 +12,8 @@
 #include <string>
 
 #include <Tests/Reminders/CenterProcess.h>
+#include <Tests/Support/AsUser.h>
 #include <Tests/Support/ChildProcess.h>
-#include <Tests/Support/MountNamespace.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 
@@ -37,21 +37,16 @@ std::string contentOf(const fs::path& file) {
   return text.str();
 }
 
-// A home folder whose store lies on a small disk of its own.
+// A user's home folder.
 class Home final {
  public:
-  Home() {
+  explicit Home(uid_t user) {
     fs::create_directories(state);
     fs::permissions(state, fs::perms::owner_all);
-    isReady = Tests::mountMemory(state);
-    fs::permissions(state, fs::perms::owner_all);
+    for (fs::path made = state; made != folder.path(); made = made.parent_path())
+      Tests::give(made, user);
+    Tests::give(folder.path(), user);
   }
-  ~Home() {
-    lock.reset();
-    ::umount2(state.c_str(), MNT_DETACH);
-  }
-  Home(const Home&) = delete;
-  Home& operator=(const Home&) = delete;
 
   int orvane(const std::string& arguments) {
     const int status =
@@ -68,11 +63,19 @@ class Home final {
     EXPECT_FALSE(database->execute(statements));
   }
 
+  // An ordinary user cannot remount, and root can write whatever the mode is.
+  void protect(bool isOn) const {
+    if (::mount("", state.c_str(), nullptr, MS_REMOUNT | (isOn ? MS_RDONLY : 0), "") == 0) return;
+    if (!isOn) fs::permissions(state, fs::perms(0700));
+    for (const auto& file : fs::directory_iterator(state))
+      fs::permissions(file, fs::perms(isOn ? 0400 : 0600));
+    if (isOn) fs::permissions(state, fs::perms(0500));
+  }
+
   const Tests::TemporaryFolder folder;
   const fs::path state = folder.path() / ".local" / "state" / "com.quennel.Orvane2";
   const fs::path store = state / "notifications.sqlite";
   const fs::path aside = folder.path() / "aside";
-  bool isReady = false;
   std::optional<SQLiteDatabase> lock;
   std::string output, errors;
 };
@@ -82,6 +85,7 @@ struct Trouble {
   std::function<void(Home&)> begin, end;
   const char* complaint;
   enum { waits, isLeftAlone, isReplaced } store = waits;
+  enum { none, ofRoot, ofAll } needsDisk = none;  // One of its own.
 
   friend void PrintTo(const Trouble& trouble, std::ostream* out) { *out << trouble.name; }
 };
@@ -98,18 +102,9 @@ const Trouble troubles[] = {
        std::ofstream filler(home.state / "filler", std::ios::binary);
        while (filler << std::string(1024, 'x') << std::flush) continue;
      },
-     [](Home& home) { fs::remove(home.state / "filler"); }, "full"},
-    {
-        "read-only",
-        [](Home& home) {
-          ::mount(home.state.c_str(), home.state.c_str(), nullptr, MS_BIND, nullptr);
-          EXPECT_EQ(::mount(nullptr, home.state.c_str(), nullptr, MS_REMOUNT | MS_BIND | MS_RDONLY,
-                            nullptr),
-                    0);
-        },
-        [](Home& home) { ::umount2(home.state.c_str(), MNT_DETACH); },
-        "ead",
-    },
+     [](Home& home) { fs::remove(home.state / "filler"); }, "full", Trouble::waits, Trouble::ofAll},
+    {"read-only", [](Home& home) { home.protect(true); }, [](Home& home) { home.protect(false); },
+     "ead", Trouble::waits, Trouble::ofRoot},
     {"a link",
      [](Home& home) {
        fs::copy(home.store, home.aside);
@@ -132,65 +127,45 @@ const Trouble troubles[] = {
      [](Home&) {}, "", Trouble::isReplaced},
 };
 
-class ReminderTrouble : public ::testing::TestWithParam<Trouble> {
- protected:
-  void SetUp() override {
-    if (const std::string reason = Tests::enterMountNamespace(); !reason.empty())
-      GTEST_SKIP() << reason;
-    home.emplace();
-    if (!home->isReady) GTEST_SKIP() << "no file system in memory";
-  }
-
-  std::optional<Home> home;
-};
-
-INSTANTIATE_TEST_SUITE_P(, ReminderTrouble, ::testing::ValuesIn(troubles), [](const auto& one) {
-  std::string name = one.param.name;
-  std::erase_if(name, [](char c) { return !std::isalnum(static_cast<unsigned char>(c)); });
-  return name;
-});
-
 // The program says so with its status, keeps the period, and the next one plans it.
-TEST_P(ReminderTrouble, OrvaneSaysSoAndTheNextCommandPlans) {
-  const Trouble& trouble = GetParam();
-  ASSERT_EQ(home->orvane("remind every weekly"), 0) << home->errors;
-  trouble.begin(*home);
+void orvaneSaysSo(Home& home, const Trouble& trouble) {
+  ASSERT_EQ(home.orvane("remind every weekly"), 0) << home.errors;
+  trouble.begin(home);
   // To open and close a locked file would free it.
   const bool isLeftAlone = trouble.store == Trouble::isLeftAlone;
-  const std::string before = isLeftAlone ? contentOf(home->store) : "";
+  const std::string before = isLeftAlone ? contentOf(home.store) : "";
   const bool isReplaced = trouble.store == Trouble::isReplaced;
   // Also where the plan of before is one of the same period.
   for (const char* period : {"weekly", "monthly"}) {
-    const int status = home->orvane(std::string("remind every ") + period);
+    const int status = home.orvane(std::string("remind every ") + period);
     EXPECT_EQ(status, isReplaced ? 0 : 1) << period;
-    EXPECT_THAT(home->errors, HasSubstr(isReplaced ? "" : "orvane: the "));
-    EXPECT_THAT(home->errors, HasSubstr(trouble.complaint));
+    EXPECT_THAT(home.errors, HasSubstr(isReplaced ? "" : "orvane: the "));
+    EXPECT_THAT(home.errors, HasSubstr(trouble.complaint));
   }
-  EXPECT_EQ(fs::exists(home->store.string() + ".damaged"), isReplaced);
+  EXPECT_EQ(fs::exists(home.store.string() + ".damaged"), isReplaced);
   if (isLeftAlone) {
-    EXPECT_TRUE(contentOf(home->store) == before);
+    EXPECT_TRUE(contentOf(home.store) == before);
   }
-  trouble.end(*home);
+  trouble.end(home);
   const auto saysSo = HasSubstr("the plan is not that of the period");
-  EXPECT_EQ(home->orvane("remind status"), 0);
-  EXPECT_EQ(testing::Matches(saysSo)(home->errors), !isReplaced) << home->errors;
-  EXPECT_EQ(home->orvane("remind tomorrow --found 1 --selected 0"), 0) << home->errors;
-  EXPECT_THAT(home->output,
+  EXPECT_EQ(home.orvane("remind status"), 0);
+  EXPECT_EQ(testing::Matches(saysSo)(home.errors), !isReplaced) << home.errors;
+  EXPECT_EQ(home.orvane("remind tomorrow --found 1 --selected 0"), 0) << home.errors;
+  EXPECT_THAT(home.output,
               AllOf(HasSubstr("period: Every Month\n"), HasSubstr("  SchedulerNotification: ")));
-  EXPECT_EQ(home->orvane("remind status"), 0);
-  EXPECT_THAT(home->errors, Not(saysSo));
+  EXPECT_EQ(home.orvane("remind status"), 0);
+  EXPECT_THAT(home.errors, Not(saysSo));
 }
 
 // A banner that is due in a bad moment comes after it, once.
-TEST_P(ReminderTrouble, WhatIsDueComesLater) {
-  const Trouble& trouble = GetParam();
-  Testing::Process(home->store, start)
+void whatIsDueComesLater(Home& home, const Trouble& trouble) {
+  Testing::Process(home.store, start)
       .schedule({.identifier = "weekly",
                  .title = "Week",
                  .deliveryDate = start + week,
                  .deliveryRepeatInterval = DateComponents{.day = 7}});
-  trouble.begin(*home);
-  Testing::Process process(home->store, start + week);
+  trouble.begin(home);
+  Testing::Process process(home.store, start + week);
   process.listen();
   process.timer.advanceTo(start + week + 1min);
   EXPECT_THAT(process.server.history(), IsEmpty());
@@ -204,13 +179,44 @@ TEST_P(ReminderTrouble, WhatIsDueComesLater) {
   EXPECT_TRUE(!isKnown || process.scheduled().size() == 1);
   EXPECT_THAT(process.log.text(), HasSubstr(trouble.complaint));
   EXPECT_THAT(process.log.text(), Not(IsEmpty()));
-  trouble.end(*home);
+  trouble.end(home);
   for (auto date = start + week + 2min; date < start + 2 * week; date += 12h) {
     process.timer.advanceTo(date);
     process.settle();
   }
   EXPECT_THAT(process.server.history(), SizeIs(1));
   EXPECT_EQ(process.timer.armedDate(), start + 2 * week);
+}
+
+using Scene = std::function<void(Home&, const Trouble&)>;
+
+class ReminderTrouble : public ::testing::TestWithParam<Trouble> {
+ protected:
+  // As this user and, where that is root, as an ordinary one too.
+  static void play(const Scene& scene) {
+    for (const uid_t user : Tests::users()) {
+      Home home(user);
+      const Trouble& trouble = GetParam();
+      const bool needsDisk = trouble.needsDisk >= (user == 0 ? Trouble::ofRoot : Trouble::ofAll);
+      if (!Tests::inChild(
+              user, [&] { scene(home, trouble); }, needsDisk ? home.state : fs::path()))
+        GTEST_SKIP() << "no file system in memory";
+    }
+  }
+};
+
+INSTANTIATE_TEST_SUITE_P(, ReminderTrouble, ::testing::ValuesIn(troubles), [](const auto& one) {
+  std::string name = one.param.name;
+  std::erase_if(name, [](char c) { return !std::isalnum(static_cast<unsigned char>(c)); });
+  return name;
+});
+
+TEST_P(ReminderTrouble, OrvaneSaysSoAndTheNextCommandPlans) {
+  play(orvaneSaysSo);
+}
+
+TEST_P(ReminderTrouble, WhatIsDueComesLater) {
+  play(whatIsDueComesLater);
 }
 
 }  // namespace

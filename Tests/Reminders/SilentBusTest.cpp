@@ -17,7 +17,9 @@
 #include <Tests/Support/DrainUntil.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/Notifications/BusNotificationServer.h>
 #include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
+#include <Varnel/Platform/Linux/Notifications/SessionBus.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Ports/NotificationServer.h>
@@ -26,6 +28,8 @@
 
 namespace Varnel::Platform {
 namespace {
+
+constexpr std::chrono::seconds patience(10);
 
 // Takes connections and never says a word.
 class SilentBus final {
@@ -108,7 +112,7 @@ TEST(NotificationServer, ABusThatDoesNotTellWhoAnswersCostsTheBannerAlone) {
   const NamelessBus bus;
   const auto mainQueue = Linux::makeMainQueue();
   Testing::CapturedSystemLog log;
-  const auto server = Linux::makeNotificationServer(log, {}, Linux::makeSessionBus());
+  const auto server = Linux::makeBusNotificationServer(log, {}, Linux::makeSessionBus(patience));
   const UniqueHandle<GMainContext*, g_main_context_unref> own(g_main_context_new());
   g_main_context_push_thread_default(own.get());
   server->show("token", Banner(), {});
@@ -121,7 +125,7 @@ TEST(NotificationServer, ABusThatIsLostKeepsNobodyWaitingAndTheNextTakesItsPlace
   std::optional<NamelessBus> bus(std::in_place);
   const auto mainQueue = Linux::makeMainQueue();
   Testing::CapturedSystemLog log;
-  const auto server = Linux::makeNotificationServer(log, {}, Linux::makeSessionBus());
+  const auto server = Linux::makeBusNotificationServer(log, {}, Linux::makeSessionBus(patience));
   std::vector<bool> hasAnswered;
   const auto ask = [&] {
     server->check([&](const auto& obstacle) {
@@ -145,13 +149,13 @@ TEST(NotificationServer, ABusThatIsLostKeepsNobodyWaitingAndTheNextTakesItsPlace
 
 TEST(NotificationServer, AMainLoopThatComesLateFindsTheConnection) {
   using Clock = std::chrono::steady_clock;
-  constexpr std::chrono::milliseconds patience(500);
+  constexpr std::chrono::milliseconds halfSecond(500);
   const NamelessBus bus;
   const auto mainQueue = Linux::makeMainQueue();
   Testing::CapturedSystemLog log;
-  const auto server = Linux::makeNotificationServer(log, {}, Linux::makeSessionBus(patience));
+  const auto server = Linux::makeBusNotificationServer(log, {}, Linux::makeSessionBus(halfSecond));
   server->show("token", Banner(), {});
-  const auto end = Clock::now() + patience;
+  const auto end = Clock::now() + halfSecond;
   while (!g_main_context_pending(nullptr)) std::this_thread::yield();
   if (Clock::now() >= end) GTEST_SKIP() << "The machine is too slow.";
   std::this_thread::sleep_until(end);
@@ -166,12 +170,12 @@ TEST(NotificationServer, ABusThatNeverAnswersCostsTheBannersAndNoWaiting) {
   const auto mainQueue = Linux::makeMainQueue();
   Testing::CapturedSystemLog log;
   {
-    const auto ended = Linux::makeNotificationServer(log, {}, Linux::makeSessionBus());
+    const auto ended = Linux::makeBusNotificationServer(log, {}, Linux::makeSessionBus(patience));
     ended->show("token", banner, {});
     EXPECT_TRUE(ended->isBusy());
   }
-  const auto server =
-      Linux::makeNotificationServer(log, {}, Linux::makeSessionBus(std::chrono::milliseconds(50)));
+  const auto server = Linux::makeBusNotificationServer(
+      log, {}, Linux::makeSessionBus(std::chrono::milliseconds(50)));
   // Each attempt comes to an end, and the next banner makes another. The reason is said once.
   for (int attempt = 0; attempt < 2; ++attempt) {
     server->show("token", banner, {});

@@ -15,6 +15,7 @@
 
 #include <Varnel/Platform/Generic/Curl/Module.h>
 #include <Varnel/Platform/Generic/Curl/ThisMachine.h>
+#include <Varnel/Platform/Values/SystemText.h>
 #include <Varnel/Platform/Values/UniqueHandle.h>
 
 namespace Varnel::Platform {
@@ -65,7 +66,9 @@ std::optional<HTTPResponse> responseOf(CURL* easy) {
 
 URLParts parse(const std::string& url) {
   URLParts parts(curl_url());
-  if (!parts || curl_url_set(parts.get(), CURLUPART_URL, url.c_str(), 0) != CURLUE_OK) return {};
+  if (!parts || isCutShort(url) ||
+      curl_url_set(parts.get(), CURLUPART_URL, url.c_str(), 0) != CURLUE_OK)
+    return {};
   return parts;
 }
 

@@ -43,9 +43,11 @@ class TreeEntry final : public RegistryEntry {
 
 class SysfsDeviceRegistry final : public DeviceRegistry {
  public:
+  explicit SysfsDeviceRegistry(std::string folder) : folder_(std::move(folder)) {}
+
   std::optional<Entries> entriesMatchingProperty(std::string_view name,
                                                  const PropertyValue& value) override {
-    const BlockDevices devices;
+    const BlockDevices devices(folder_.c_str());
     if (!devices) return std::nullopt;
     const auto tree = std::make_shared<const BlockTree>(readBlockTree(devices, virtioSerials_));
     Entries entries;
@@ -57,13 +59,14 @@ class SysfsDeviceRegistry final : public DeviceRegistry {
   }
 
  private:
+  const std::string folder_;
   VirtioSerials virtioSerials_;
 };
 
 }  // namespace
 
-std::unique_ptr<DeviceRegistry> makeDeviceRegistry() {
-  return std::make_unique<SysfsDeviceRegistry>();
+std::unique_ptr<DeviceRegistry> makeDeviceRegistry(const std::string& folder) {
+  return std::make_unique<SysfsDeviceRegistry>(folder);
 }
 
 }  // namespace Varnel::Platform::Linux

@@ -6,6 +6,7 @@
 #include <cerrno>
 
 #include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Values/SystemText.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
@@ -39,6 +40,8 @@ class UserAttributes final : public ExtendedAttributes {
  public:
   Result<std::optional<std::string>, std::error_code> value(const std::string& path,
                                                             const std::string& name) override {
+    if (name.empty() || isCutShort(name) || isCutShort(path))
+      return std::make_error_code(std::errc::invalid_argument);
     std::error_code error;
     auto bytes = read(path, userNamespace + name, error);
     if (error) return error;

@@ -5,6 +5,7 @@
 #include <sys/syscall.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <chrono>
 #include <deque>
 #include <functional>
@@ -62,7 +63,12 @@ class DefaultContextQueue final : public MainQueue {
   }
 
   void stop() override {
-    post([this] { (running_.empty() ? stopsNextRun_ : *running_.back()) = true; });
+    post([this] {
+      // The loop may run several blocks before a run looks at its end.
+      const auto innermost = std::find_if(running_.rbegin(), running_.rend(),
+                                          [](const bool* stops) { return !*stops; });
+      (innermost == running_.rend() ? stopsNextRun_ : **innermost) = true;
+    });
   }
 
   void runWhile(const std::function<bool()>& condition) override {
@@ -71,9 +77,10 @@ class DefaultContextQueue final : public MainQueue {
 
   bool runWhile(const std::function<bool()>& condition,
                 std::chrono::milliseconds patience) override {
+    if (patience.count() > G_MAXUINT) return runWhile(condition), true;
     bool isOver = false;
     const UniqueHandle<GSource*, destroy> timer(
-        g_timeout_source_new(static_cast<guint>(patience.count())));
+        g_timeout_source_new(static_cast<guint>(std::max(patience.count(), {}))));
     g_source_set_callback(timer.get(), &note, &isOver, nullptr);
     g_source_attach(timer.get(), nullptr);
     bool holds = false;

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/Linux/Notifications/BusHosts.h>
 
+#include <Varnel/Platform/Linux/Notifications/HostName.h>
 #include <Varnel/Platform/Linux/Notifications/NotifierProtocol.h>
 
 namespace Varnel::Platform::Linux {
@@ -15,17 +16,31 @@ BusHosts::BusHosts(std::shared_ptr<SessionBus> bus,
                    std::function<void(const NotificationActivation&)> launch)
     : bus_(std::move(bus)), launch_(std::move(launch)) {}
 
+void BusHosts::setProduct(const std::string& baseIdentifier) {
+  hostName_ = hostName(baseIdentifier);
+  frontName_ = frontName(baseIdentifier);
+}
+
 BusMessage BusHosts::message(const char* method, GVariant* body) const {
-  return messageToRunning(name_, hostPath, hostInterfaceName, method, body);
+  return messageToRunning(hostName_, hostPath, hostInterfaceName, method, body);
 }
 
 void BusHosts::shouldPresent(const UserNotification& notification,
                              std::function<void(bool isToShow)> answer) {
-  if (isInFront()) return answer(false);
-  bus_->ask(message("ShouldPresent", g_variant_new("(@a{sv})", variantOf(notification))),
-            maxQuestion, [answer = std::move(answer)](GDBusMessage* reply, const BusFailure&) {
-              answer(!reply || isYes(reply));
+  bus_->ask(messageToBus("NameHasOwner", g_variant_new("(s)", frontName_.c_str())), maxQuestion,
+            [life = std::weak_ptr(life_), notification, answer = std::move(answer)](
+                GDBusMessage* reply, const BusFailure&) {
+              const auto self = life.lock();
+              if (!self || (reply && isYes(reply))) return answer(false);
+              (*self)->askHost(notification, answer);
             });
+}
+
+void BusHosts::askHost(const UserNotification& notification,
+                       const std::function<void(bool isToShow)>& answer) {
+  bus_->ask(message("ShouldPresent", g_variant_new("(@a{sv})", variantOf(notification))),
+            maxQuestion,
+            [answer](GDBusMessage* reply, const BusFailure&) { answer(!reply || isYes(reply)); });
 }
 
 void BusHosts::didDeliver(const UserNotification& notification) {
@@ -43,23 +58,6 @@ void BusHosts::didActivate(const NotificationActivation& activation) {
               if (!self) return;
               --(*self)->pendingClicks_;
               if (!reply) (*self)->launch_(activation);
-            });
-}
-
-void BusHosts::setActive(const std::string& process, bool isActive) {
-  if (!isActive) {
-    active_.erase(process);
-    return;
-  }
-  active_[process] = bus_->watch(process, [this, process](const auto&, const std::string& after) {
-    if (after.empty()) active_.erase(process);
-  });
-  // It may have gone before anybody watched.
-  bus_->ask(messageToBus("NameHasOwner", g_variant_new("(s)", process.c_str())),
-            SessionBus::usualTime,
-            [life = std::weak_ptr(life_), process](GDBusMessage* reply, const BusFailure&) {
-              const auto self = life.lock();
-              if (self && reply && !isYes(reply)) (*self)->active_.erase(process);
             });
 }
 

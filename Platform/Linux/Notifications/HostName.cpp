@@ -14,7 +14,6 @@ namespace {
 using Text = UniqueHandle<char*, g_free>;
 
 constexpr std::string_view prefix = "com.quennel.Varnel.Host.";
-constexpr std::string_view suffix = ".Client";
 constexpr std::size_t maxLength = 255;
 constexpr std::size_t digestLength = 64;
 
@@ -38,10 +37,8 @@ std::string escaped(std::string_view identifier) {
   return text.empty() ? "_" : text;
 }
 
-}  // namespace
-
-std::string hostName(const std::string& baseIdentifier) {
-  constexpr std::size_t room = maxLength - prefix.size() - suffix.size();
+std::string nameOf(const std::string& baseIdentifier, std::string_view suffix) {
+  const std::size_t room = maxLength - prefix.size() - suffix.size();
   std::string middle = escaped(baseIdentifier);
   if (middle.size() > room) {
     const Text digest(g_compute_checksum_for_string(G_CHECKSUM_SHA256, middle.c_str(), -1));
@@ -49,6 +46,16 @@ std::string hostName(const std::string& baseIdentifier) {
     middle = middle.substr(0, room - digestLength - 2) + "__" + digest.get();
   }
   return std::string(prefix) + middle + std::string(suffix);
+}
+
+}  // namespace
+
+std::string hostName(const std::string& baseIdentifier) {
+  return nameOf(baseIdentifier, ".Client");
+}
+
+std::string frontName(const std::string& baseIdentifier) {
+  return nameOf(baseIdentifier, ".Front");
 }
 
 }  // namespace Varnel::Platform::Linux

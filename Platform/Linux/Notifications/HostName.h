@@ -15,4 +15,7 @@ namespace Varnel::Platform::Linux {
 /// underscore, and of an identifier that is too long the end stands as a digest.
 [[nodiscard]] std::string hostName(const std::string& baseIdentifier);
 
+/// The name that a process of the product has, or waits for, while it is in front.
+[[nodiscard]] std::string frontName(const std::string& baseIdentifier);
+
 }  // namespace Varnel::Platform::Linux

@@ -2,13 +2,13 @@
 #include <map>
 #include <utility>
 
+#include <Varnel/Platform/Generic/DelivererConnection.h>
 #include <Varnel/Platform/Generic/HostedApplication.h>
 #include <Varnel/Platform/Generic/InProcessDeliverer.h>
 #include <Varnel/Platform/Generic/ScheduledNotificationCenter.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/MainLoop/FileWatch.h>
-#include <Varnel/Platform/Linux/Notifications/NotifierConnection.h>
-#include <Varnel/Platform/Linux/Process/UserFolders.h>
+#include <Varnel/Platform/POSIX/UserFolders.h>
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Ports/NotificationServer.h>
@@ -28,8 +28,8 @@ namespace fs = std::filesystem;
 class LocalDeliverer final : public DelivererConnection {
  public:
   LocalDeliverer(const NotificationPorts& ports, const NotificationSource& source,
-                 const std::shared_ptr<SessionBus>& bus, const fs::path& store)
-      : server_(makeNotificationServer(ports.systemLog, source, bus)),
+                 const fs::path& store)
+      : server_(makeNotificationServer(ports.systemLog, source)),
         timer_(makeWallClockTimer(ports.systemLog)),
         deliverer_({ports.clock, ports.userLocale, ports.timeZones, ports.mainQueue,
                     ports.privateFiles, ports.systemLog, *server_, *timer_},
@@ -61,22 +61,19 @@ class LocalDeliverer final : public DelivererConnection {
 class Center final {
  public:
   Center(const NotificationPorts& ports, const NotificationSource& source, const fs::path& store)
-      : bus_(makeSessionBus()),
-        connection_(bus_, source.identifier,
-                    [this, ports, source, store] {
-                      return std::make_unique<LocalDeliverer>(ports, source, bus_, store);
-                    }),
+      : connection_(makeNotifierConnection(
+            source.identifier,
+            [=] { return std::make_unique<LocalDeliverer>(ports, source, store); })),
         timer_(makeWallClockTimer(ports.systemLog)),
         center_({ports.clock, ports.userLocale, ports.timeZones, ports.privateFiles,
                  ports.systemLog, *timer_},
-                store.string(), source, connection_) {}
+                store.string(), source, *connection_) {}
 
   UserNotificationCenter& center() { return center_; }
-  void setActive(bool isActive) { connection_.setActive(isActive); }
+  void setActive(bool isActive) { connection_->setActive(isActive); }
 
  private:
-  const std::shared_ptr<SessionBus> bus_;
-  NotifierConnection connection_;
+  const std::shared_ptr<DelivererConnection> connection_;
   const std::unique_ptr<WallClockTimer> timer_;
   ScheduledNotificationCenter center_;
 };
@@ -96,7 +93,8 @@ class StoredCenters final : public UserNotificationCenters {
   UserNotificationCenter& center(const NotificationSource& source) override {
     auto& center = centers_[source.identifier];
     if (!center) {
-      center = std::make_unique<Center>(ports_, source, notificationStore(source.identifier));
+      center =
+          std::make_unique<Center>(ports_, source, POSIX::notificationStore(source.identifier));
       if (isActive_) center->setActive(true);
     }
     return center->center();

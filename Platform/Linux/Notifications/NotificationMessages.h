@@ -7,6 +7,7 @@
 #include <optional>
 #include <string>
 
+#include <Varnel/Platform/Linux/Notifications/BusNotificationServer.h>
 #include <Varnel/Platform/Ports/NotificationServer.h>
 #include <Varnel/Platform/Values/NotificationSource.h>
 #include <Varnel/Platform/Values/UniqueHandle.h>
@@ -16,7 +17,6 @@ namespace Varnel::Platform::Linux {
 
 using BusMessage = UniqueHandle<GDBusMessage*, g_object_unref>;
 
-inline constexpr const char* notificationService = "org.freedesktop.Notifications";
 inline constexpr const char* notificationPath = "/org/freedesktop/Notifications";
 
 /// The actions that banners offer.

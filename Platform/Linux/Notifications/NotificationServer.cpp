@@ -8,7 +8,7 @@
 #include <utility>
 #include <vector>
 
-#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/Notifications/BusNotificationServer.h>
 #include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
 #include <Varnel/Platform/Linux/Notifications/SessionBus.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
@@ -254,9 +254,9 @@ class BusNotificationServer final : public NotificationServer {
 
 }  // namespace
 
-std::unique_ptr<NotificationServer> makeNotificationServer(SystemLog& systemLog,
-                                                           const NotificationSource& source,
-                                                           std::shared_ptr<SessionBus> bus) {
+std::unique_ptr<NotificationServer> makeBusNotificationServer(SystemLog& systemLog,
+                                                              const NotificationSource& source,
+                                                              std::shared_ptr<SessionBus> bus) {
   return std::make_unique<BusNotificationServer>(systemLog, source, std::move(bus));
 }
 

@@ -28,9 +28,10 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
       : bus_(std::move(bus)),
         identifier_(std::move(identifier)),
         hostName_(hostName(identifier_)),
+        frontName_(frontName(identifier_)),
         makeDeliverer_(std::move(makeDeliverer)),
         notifiers_(bus_->watch(notifierName, [this](const auto&, const std::string& owner) {
-          owner.empty() ? notifierEnded() : tellActive();
+          if (owner.empty()) notifierEnded();
         })) {}
 
   void start() {
@@ -39,7 +40,7 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
       const auto self = weak.lock();
       if (!self || !isConnected) return;
       self->claimName();
-      self->tellActive();
+      self->claimFront();
     });
     bus_->serve({hostPath, hostInterface,
                  [weak](std::string_view method, GVariant* arguments, GDBusMethodInvocation* call) {
@@ -60,8 +61,8 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
   void setActive(bool isActive) {
     isActive_ = isActive;
     if (replacement_) return replacement_->setActive(isActive_);
-    tellActive();
-    // Whoever is in front has to be known before the next notification comes.
+    claimFront();
+    // The notifier has to know before the next notification comes.
     if (isActive_) bus_->connect([](const std::string&) {});
   }
 
@@ -141,10 +142,11 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
       replacement_->changed();
   }
 
-  void tellActive() const {
-    bus_->tell(messageToRunning(
-        notifierName, notifierPath, notifierName, "SetActive",
-        g_variant_new("(sb)", identifier_.c_str(), static_cast<gboolean>(isActive_))));
+  // Several processes may be in front; one has the name, and the others wait for it.
+  void claimFront() const {
+    bus_->tell(isActive_
+                   ? messageToBus("RequestName", g_variant_new("(su)", frontName_.c_str(), 0u))
+                   : messageToBus("ReleaseName", g_variant_new("(s)", frontName_.c_str())));
   }
 
   // Waits in the bus's queue while somebody has the name who does not give way.
@@ -159,6 +161,7 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
   const std::shared_ptr<SessionBus> bus_;
   const std::string identifier_;
   const std::string hostName_;
+  const std::string frontName_;
   const MakeDeliverer makeDeliverer_;
   std::unique_ptr<DelivererConnection> replacement_;  ///< Where there is no notifier.
   std::weak_ptr<NotificationHost> host_;

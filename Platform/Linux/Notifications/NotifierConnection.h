@@ -6,6 +6,7 @@
 #include <string>
 
 #include <Varnel/Platform/Generic/DelivererConnection.h>
+#include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/Notifications/SessionBus.h>
 
 namespace Varnel::Platform::Linux {
@@ -17,8 +18,6 @@ namespace Varnel::Platform::Linux {
 /// onlooker leaves it to the application. Main thread only.
 class NotifierConnection final : public DelivererConnection {
  public:
-  using MakeDeliverer = std::function<std::unique_ptr<DelivererConnection>()>;
-
   /// `makeDeliverer` makes the one that takes the notifier's place. Nobody else observes the bus.
   NotifierConnection(std::shared_ptr<SessionBus> bus, std::string baseIdentifier,
                      MakeDeliverer makeDeliverer);

@@ -17,12 +17,10 @@ inline constexpr const char* notifierName = "com.quennel.Varnel.Notifier1";
 inline constexpr const char* notifierPath = "/com/quennel/Varnel/Notifier";
 
 /// `Changed` tells that the store of the product with this base identifier has changed, and answers
-/// whether the notifier stays for it. `SetActive` tells whether the caller, a process of the
-/// product, is in front.
+/// whether the notifier stays for it.
 inline constexpr const char* notifierInterface = R"(<node>
   <interface name='com.quennel.Varnel.Notifier1'>
     <method name='Changed'><arg type='s' direction='in'/><arg type='b' direction='out'/></method>
-    <method name='SetActive'><arg type='s' direction='in'/><arg type='b' direction='in'/></method>
   </interface>
 </node>)";
 

@@ -1,50 +1,22 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/Linux/Notifications/SessionBus.h>
 
-#include <mutex>
 #include <system_error>
 #include <utility>
 
 #include <Varnel/Platform/Concurrency/StartThread.h>
-#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Linux/MainLoop/MainLoopBlock.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
 
 using Text = UniqueHandle<char*, g_free>;
 using Cancellable = UniqueHandle<GCancellable*, g_object_unref>;
-using Block = std::function<void()>;
 
 std::string take(GError* error) {
   std::string text = error->message;
   g_error_free(error);
   return text;
-}
-
-// Orders what a thread does before it hands a block over, and what the main loop does with it. GLib
-// orders them as well, out of the thread sanitizer's sight.
-constinit std::mutex handOver;
-
-// Lets the source run the block once, on the main thread. The caller owns the source.
-GSource* attach(GSource* source, int priority, Block block) {
-  std::unique_lock order(handOver);
-  auto* const handed = new Block(std::move(block));
-  order.unlock();
-  g_source_set_priority(source, priority);
-  g_source_set_callback(
-      source,
-      [](gpointer data) -> gboolean {
-        std::unique_lock(handOver).unlock();
-        (*static_cast<Block*>(data))();
-        return G_SOURCE_REMOVE;
-      },
-      handed,
-      [](gpointer data) {
-        std::unique_lock(handOver).unlock();
-        delete static_cast<Block*>(data);
-      });
-  g_source_attach(source, nullptr);
-  return source;
 }
 
 // While it lives, GIO's answers arrive where the main queue runs, even if the host has made another
@@ -216,10 +188,9 @@ void SessionBus::start() {
     startThread("session-bus", [weak = weak_from_this(), attempt] {
       std::string error;
       const auto connection = std::make_shared<Connection>(open(attempt->cancellable.get(), error));
-      g_source_unref(
-          attach(g_idle_source_new(), G_PRIORITY_DEFAULT, [weak, attempt, connection, error] {
-            if (const auto self = weak.lock()) self->finish(attempt, std::move(*connection), error);
-          }));
+      runOnMainLoop([weak, attempt, connection, error] {
+        if (const auto self = weak.lock()) self->finish(attempt, std::move(*connection), error);
+      });
     }).detach();
   } catch (const std::system_error& failure) {
     finish(attempt, {}, failure.what());

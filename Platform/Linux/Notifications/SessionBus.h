@@ -131,4 +131,7 @@ class SessionBus final : public std::enable_shared_from_this<SessionBus> {
   int awaitedReplies_ = 0;
 };
 
+[[nodiscard]] std::shared_ptr<SessionBus> makeSessionBus(
+    std::chrono::milliseconds patience = std::chrono::seconds(10));
+
 }  // namespace Varnel::Platform::Linux

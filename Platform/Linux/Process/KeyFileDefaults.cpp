@@ -5,6 +5,9 @@
 
 #include <utility>
 
+#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/ApplicationStorage.h>
 #include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/Values/UniqueHandle.h>
@@ -79,6 +82,13 @@ std::optional<PlatformError> KeyFileDefaults::change(const std::function<void(GK
 
 void KeyFileDefaults::complain(const std::string& trouble) const {
   if (!hasComplained_.exchange(true)) systemLog_.write("The settings in " + path_ + " " + trouble);
+}
+
+std::unique_ptr<ApplicationStorage> makeApplicationStorage(PrivateFiles& files,
+                                                           SystemLog& systemLog) {
+  return POSIX::makeApplicationStorage([&](const std::string& folder) {
+    return std::make_unique<KeyFileDefaults>(files, systemLog, folder + "/settings.ini");
+  });
 }
 
 }  // namespace Varnel::Platform::Linux

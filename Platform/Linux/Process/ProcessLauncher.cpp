@@ -17,6 +17,7 @@
 
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
+#include <Varnel/Platform/Values/SystemText.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
@@ -156,6 +157,7 @@ class Spawner final : public ProcessLauncher {
  public:
   Result<std::unique_ptr<LaunchedProcess>, std::error_code> launch(
       const std::string& path, const std::vector<std::string>& arguments) override {
+    if (isCutShort(path) || std::ranges::any_of(arguments, isCutShort)) return systemError(EINVAL);
     auto input = makePipe();
     auto output = input ? makePipe() : std::nullopt;
     if (!output) return systemError(errno);

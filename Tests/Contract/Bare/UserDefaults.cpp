@@ -3,7 +3,7 @@
 
 #include <Tests/Contract/UserDefaultsContract.h>
 #include <Tests/Support/TemporaryFolder.h>
-#include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Bare/Adapters.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
@@ -24,10 +24,10 @@ class UserFolders final : public UserDefaultsWorld {
   const Tests::TemporaryFolder home_ = Tests::TemporaryFolder::inMemory();
   Testing::CapturedSystemLog log_;
   const std::unique_ptr<PrivateFiles> files_ = POSIX::makePrivateFiles();
-  const std::unique_ptr<ApplicationStorage> storage_ = Linux::makeApplicationStorage(*files_, log_);
-  const std::unique_ptr<ApplicationStorage> another_ = Linux::makeApplicationStorage(*files_, log_);
+  const std::unique_ptr<ApplicationStorage> storage_ = Bare::makeApplicationStorage(*files_, log_);
+  const std::unique_ptr<ApplicationStorage> another_ = Bare::makeApplicationStorage(*files_, log_);
 };
-INSTANTIATE_TEST_SUITE_P(Linux, UserDefaultsContract, UserDefaultsContract::on<UserFolders>());
+INSTANTIATE_TEST_SUITE_P(Bare, UserDefaultsContract, UserDefaultsContract::on<UserFolders>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

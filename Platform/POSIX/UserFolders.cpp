@@ -1,16 +1,14 @@
 // SPDX-License-Identifier: MIT
-#include <Varnel/Platform/Linux/Process/UserFolders.h>
+#include <Varnel/Platform/POSIX/UserFolders.h>
 
 #include <cstdlib>
 #include <system_error>
 
-#include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
-#include <Varnel/Platform/Ports/ProcessInfo.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
 #include <Varnel/Platform/Values/PathComponents.h>
 
-namespace Varnel::Platform::Linux {
+namespace Varnel::Platform::POSIX {
 namespace {
 
 namespace fs = std::filesystem;
@@ -18,7 +16,7 @@ namespace fs = std::filesystem;
 fs::path folder(const char* variable, const char* belowHome) {
   const char* value = std::getenv(variable);
   if (value && *value == '/') return value;
-  return fs::path(POSIX::makeUserAccount()->homeFolder()) / belowHome;
+  return fs::path(makeUserAccount()->homeFolder()) / belowHome;
 }
 
 constexpr const char* notifications = "notifications.sqlite";
@@ -33,8 +31,8 @@ fs::path stateFolder(const std::string& identifier) {
 
 }  // namespace
 
-fs::path settingsFile(const std::string& identifier) {
-  return folder("XDG_CONFIG_HOME", ".config") / fileNameFor(identifier) / "settings.ini";
+fs::path settingsFolder(const std::string& identifier) {
+  return folder("XDG_CONFIG_HOME", ".config") / fileNameFor(identifier);
 }
 
 fs::path notificationStore(const std::string& identifier) {
@@ -59,9 +57,4 @@ fs::path userDataFolder() {
   return folder("XDG_DATA_HOME", ".local/share");
 }
 
-std::string executableName() {
-  static const auto& executable = *new fs::path(makeProcessInfo()->executablePath());
-  return executable.filename().string();
-}
-
-}  // namespace Varnel::Platform::Linux
+}  // namespace Varnel::Platform::POSIX

@@ -1,0 +1,140 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Platform/Ports/MainQueue.h>
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <array>
+#include <condition_variable>
+#include <deque>
+#include <mutex>
+#include <thread>
+#include <utility>
+#include <vector>
+
+#include <Varnel/Platform/Bare/Adapters.h>
+#include <Varnel/Platform/POSIX/FileDescriptor.h>
+
+namespace Varnel::Platform::Bare {
+namespace {
+
+// POSIX does not tell which thread is the main one; a program loads its libraries on it.
+const std::thread::id mainThread = std::this_thread::get_id();
+
+// A pipe with one byte in it, or none.
+class Signal final {
+ public:
+  Signal() {
+    std::array<int, 2> ends{-1, -1};
+    if (::pipe(ends.data()) != 0) return;
+    readEnd_ = POSIX::FileDescriptor(ends[0]);
+    writeEnd_ = POSIX::FileDescriptor(ends[1]);
+    for (const int end : {readEnd_.get(), writeEnd_.get()}) {
+      ::fcntl(end, F_SETFD, FD_CLOEXEC);
+      ::fcntl(end, F_SETFL, O_NONBLOCK);
+    }
+  }
+
+  void set(bool isSet) {
+    char byte = 0;
+    if (isSet_ == isSet) return;
+    isSet_ = isSet;
+    [[maybe_unused]] const ssize_t done =
+        isSet ? ::write(writeEnd_.get(), &byte, 1) : ::read(readEnd_.get(), &byte, 1);
+  }
+
+  [[nodiscard]] std::optional<int> descriptor() const {
+    return readEnd_ && writeEnd_ ? std::optional(readEnd_.get()) : std::nullopt;
+  }
+
+ private:
+  POSIX::FileDescriptor readEnd_;
+  POSIX::FileDescriptor writeEnd_;
+  bool isSet_ = false;
+};
+
+class OwnQueue final : public MainQueue {
+ public:
+  void post(Block block) override {
+    const std::lock_guard lock(mutex_);
+    blocks_.push_back(std::move(block));
+    if (signal_) signal_->set(true);
+    posted_.notify_one();
+  }
+
+  bool isCurrent() const override { return std::this_thread::get_id() == mainThread; }
+
+  void run() override {
+    bool stops = std::exchange(stopsNextRun_, false);
+    running_.push_back(&stops);
+    runWhile([&stops] { return !stops; });
+    running_.pop_back();
+  }
+
+  void stop() override {
+    post([this] { (running_.empty() ? stopsNextRun_ : *running_.back()) = true; });
+  }
+
+  void runWhile(const std::function<bool()>& condition) override {
+    while (condition()) {
+      {
+        std::unique_lock lock(mutex_);
+        posted_.wait(lock, [this] { return !blocks_.empty(); });
+      }
+      runNext();
+    }
+  }
+
+  bool runWhile(const std::function<bool()>& condition,
+                std::chrono::milliseconds patience) override {
+    const auto end = std::chrono::steady_clock::now() + patience;
+    while (condition()) {
+      {
+        std::unique_lock lock(mutex_);
+        posted_.wait_until(lock, end, [this] { return !blocks_.empty(); });
+      }
+      if (!runNext() || std::chrono::steady_clock::now() >= end) return !condition();
+    }
+    return true;
+  }
+
+  bool drain() override {
+    bool any = false;
+    while (runNext()) any = true;
+    return any;
+  }
+
+  std::optional<int> descriptor() override {
+    const std::lock_guard lock(mutex_);
+    if (!signal_) signal_.emplace().set(!blocks_.empty());
+    return signal_->descriptor();
+  }
+
+ private:
+  bool runNext() {
+    std::unique_lock lock(mutex_);
+    if (blocks_.empty()) return false;
+    const Block block = std::move(blocks_.front());
+    blocks_.pop_front();
+    if (signal_) signal_->set(!blocks_.empty());
+    lock.unlock();
+    block();
+    return true;
+  }
+
+  std::mutex mutex_;  ///< Owns what follows.
+  std::condition_variable posted_;
+  std::deque<Block> blocks_;
+  std::optional<Signal> signal_;  ///< Is set while there are blocks; none until it is asked for.
+  // The members below belong to the main thread.
+  std::vector<bool*> running_;  ///< Whether each run is to end, the innermost last.
+  bool stopsNextRun_ = false;
+};
+
+}  // namespace
+
+std::unique_ptr<MainQueue> makeMainQueue() {
+  return std::make_unique<OwnQueue>();
+}
+
+}  // namespace Varnel::Platform::Bare

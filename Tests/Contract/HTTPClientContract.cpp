@@ -1,0 +1,94 @@
+// SPDX-License-Identifier: MIT
+#include <Tests/Contract/HTTPClientContract.h>
+
+#include <chrono>
+#include <thread>
+
+#include <Varnel/Platform/Testing/FakeHTTPClient.h>
+
+namespace Varnel::Platform::Contract {
+namespace {
+
+using namespace std::chrono_literals;
+using namespace std::string_literals;
+
+HTTPPost postTo(const std::string& url, const std::string& body = "x") {
+  return {.url = url, .contentType = "text/plain", .body = body, .allowsPlainHTTP = true};
+}
+
+TEST_P(HTTPClientContract, PostsTheWholeBodyAndTellsTheServersAnswer) {
+  const std::string url = world->serve({"204", "503/7", "302>/elsewhere", "cut", "201"});
+  const struct {
+    std::string body;
+    int status;
+    std::optional<std::chrono::seconds> pause;
+  } rows[] = {{"a\0\xFF\r\n"s, 204, {}},
+              {"", 503, 7s},
+              {std::string(300'000, 'x'), 302, {}},
+              {"unanswered", 0, {}},
+              {"last", 201, {}}};
+  for (const auto& row : rows) {
+    const auto answer = world->client().post(postTo(url, row.body), {});
+    EXPECT_EQ(world->nextBody(), row.body);
+    EXPECT_EQ(answer ? answer->status : 0, row.status);
+    if (answer) EXPECT_EQ(answer->retryAfter, row.pause);
+    if (!answer) EXPECT_FALSE(answer.error().isOffline || answer.error().message.empty());
+  }
+}
+
+TEST_P(HTTPClientContract, SendsNothingWhereItMayNotOrWhenItIsStopped) {
+  const std::string url = world->serve({"200"});
+  HTTPPost secure = postTo(url);
+  secure.allowsPlainHTTP = false;
+  EXPECT_FALSE(world->client().post(secure, {}));
+  for (const std::string& wrong : {""s, "no url"s, "https:///batch"s, "ftp" + url.substr(4),
+                                   "file:///etc/hostname"s, url + '\0'})
+    EXPECT_FALSE(world->client().post(postTo(wrong), {})) << wrong;
+  std::stop_source stop;
+  stop.request_stop();
+  EXPECT_FALSE(world->client().post(postTo(url), stop.get_token()));
+  EXPECT_TRUE(world->client().post(postTo(url, "only"), {}));
+  EXPECT_EQ(world->nextBody(), "only");
+}
+
+TEST_P(HTTPClientContract, StopsAtOnceAndHoldsNobodyUp) {
+  const std::string url = world->serve({"hang"});
+  std::stop_source stop;
+  std::jthread stopper([&] {
+    world->waitForHanging();
+    std::stop_source other;
+    other.request_stop();
+    EXPECT_FALSE(world->client().post(postTo(url), other.get_token()));
+    stop.request_stop();
+  });
+  EXPECT_FALSE(world->client().post(postTo(url), stop.get_token()));
+}
+
+class FakeWorld final : public HTTPClientWorld {
+ public:
+  HTTPClient& client() override { return client_; }
+  std::string serve(const std::vector<std::string>& answers) override {
+    if (answers.front() == "hang") client_.faults->plan(Testing::Fault::delays, 1);
+    client_.setServer([this, answers](const HTTPPost&) { return answer(answers[answered_++]); });
+    return "http://127.0.0.1/batch";
+  }
+  std::string nextBody() override { return client_.posts()[taken_++].body; }
+  void waitForHanging() override { client_.faults->waitForCalls(1); }
+
+ private:
+  static Testing::FakeHTTPClient::Answer answer(const std::string& text) {
+    if (text == "cut") return HTTPFailure{"cut"};
+    HTTPResponse response{.status = std::stoi(text), .retryAfter = {}};
+    if (const std::size_t mark = text.find('/'); mark == 3)
+      response.retryAfter = std::chrono::seconds(std::stoi(text.substr(mark + 1)));
+    return response;
+  }
+
+  Testing::FakeHTTPClient client_;
+  std::size_t answered_ = 0;
+  std::size_t taken_ = 0;
+};
+INSTANTIATE_TEST_SUITE_P(Fake, HTTPClientContract, HTTPClientContract::on<FakeWorld>());
+
+}  // namespace
+}  // namespace Varnel::Platform::Contract

@@ -1,0 +1,36 @@
+// SPDX-License-Identifier: MIT
+#include <Tests/Contract/UserLocaleContract.h>
+
+#include <stdlib.h>
+
+#include <Varnel/Platform/POSIX/Adapters.h>
+
+namespace Varnel::Platform::Contract {
+namespace {
+
+class POSIXWorld final : public UserLocaleWorld {
+ public:
+  POSIXWorld() {
+    for (const char* name : {"LANG", "LANGUAGE", "LC_ALL", "LC_MESSAGES", "LC_NUMERIC", "LC_TIME"})
+      ::unsetenv(name);
+  }
+  UserLocale& locale() override { return *locale_; }
+  void choose(const std::vector<std::string>& languages, const std::string& dates,
+              const std::string& numbers) override {
+    std::string list;
+    for (const std::string& language : languages)
+      if (&language != &languages.back()) list += language + ":";
+    ::setenv("LANGUAGE", list.c_str(), 1);
+    ::setenv("LC_MESSAGES", (languages.back() + ".UTF-8").c_str(), 1);
+    ::setenv("LC_TIME", dates.c_str(), 1);
+    ::setenv("LC_NUMERIC", numbers.c_str(), 1);
+  }
+
+ private:
+  const std::unique_ptr<UserLocale> locale_ = POSIX::makeUserLocale();
+};
+
+INSTANTIATE_TEST_SUITE_P(POSIX, UserLocaleContract, UserLocaleContract::on<POSIXWorld>());
+
+}  // namespace
+}  // namespace Varnel::Platform::Contract

@@ -1,0 +1,58 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <Tests/Contract/Contract.h>
+#include <Varnel/Platform/Ports/ProcessInfo.h>
+#include <Varnel/Platform/Ports/ProcessLauncher.h>
+#include <Varnel/Platform/Ports/ReadingPriority.h>
+#include <Varnel/Platform/Ports/StandardOutput.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
+
+namespace Varnel::Platform::Contract {
+
+class ProcessInfoWorld : public World {
+ public:
+  virtual ProcessInfo& process() = 0;
+  virtual void setEnvironment(const std::string& name, const std::string& value) = 0;
+};
+using ProcessInfoContract = Suite<ProcessInfoWorld>;
+
+/// A machine with a few programs.
+class ProcessLauncherWorld : public World {
+ public:
+  struct Program {
+    std::string path;
+    std::vector<std::string> arguments;
+  };
+
+  virtual ProcessLauncher& launcher() = 0;
+  virtual Program thatPrints(const std::string& text) = 0;
+  /// Ends only when somebody ends it.
+  virtual Program thatWaits() = 0;
+  virtual Program thatDoesNotExist() = 0;
+};
+using ProcessLauncherContract = Suite<ProcessLauncherWorld>;
+
+class ReadingPriorityWorld : public World {
+ public:
+  virtual ReadingPriority& priority() = 0;
+};
+using ReadingPriorityContract = Suite<ReadingPriorityWorld>;
+
+class StandardOutputWorld : public World {
+ public:
+  virtual StandardOutput& output() = 0;
+  /// All that was printed. Nothing is printed after it.
+  virtual std::string printed() = 0;
+};
+using StandardOutputContract = Suite<StandardOutputWorld>;
+
+class SystemLogWorld : public World {
+ public:
+  virtual SystemLog& log() = 0;
+  /// All that the log has been given, each line ended by a line feed.
+  virtual std::string text() = 0;
+};
+using SystemLogContract = Suite<SystemLogWorld>;
+
+}  // namespace Varnel::Platform::Contract
