@@ -103,8 +103,8 @@ Log openLogger(const fs::path& folder) {
   user.home = folder.string();
   const auto& ports = Varnel::Platform::processPorts();
   const auto logger = std::make_shared<Varnel::Logger>(
-      Varnel::Logger::Ports{ports.appendFiles, ports.clock, ports.standardOutput, ports.timeZones,
-                            user, ports.userLocale},
+      Varnel::Logger::Ports{ports.appendFiles, ports.clock, ports.privateFiles,
+                            ports.standardOutput, ports.timeZones, user, ports.userLocale},
       "benchmark");
   return [logger](const std::string& text) { logger->log(text, author); };
 }

@@ -35,6 +35,9 @@ class Banners final : public NotificationServer::Observer {
   /// Notes what was not noted yet.
   [[nodiscard]] Failure catchUp();
 
+  /// Forgets what was not noted yet, where there is nothing to note it in.
+  void dropNotes() { notes_.clear(); }
+
   /// Closes what the store says and, if that may be, shows the next `max` that it says.
   [[nodiscard]] Failure follow(const std::vector<Delivery>& all, bool mayShow, std::size_t max);
 

@@ -32,11 +32,13 @@ bool isOfOthers(const PlatformError& error) {
 NotificationDeliverer::NotificationDeliverer(const Ports& ports, const std::string& storeFile,
                                              Migrating migrating, NotificationHosts& hosts)
     : ports_(ports),
-      lockFile_(storeFile + ".deliverer"),
+      storeFile_(storeFile),
+      migrating_(migrating),
       hosts_(hosts),
-      store_({ports.privateFiles, ports.systemLog}, storeFile, migrating),
+      store_(std::in_place, DurableFile::Ports{ports.privateFiles, ports.systemLog}, storeFile,
+             migrating),
       banners_(std::make_shared<Banners>(
-          ports.notificationServer, store_,
+          ports.notificationServer, *store_,
           Banners::Events{.changed = [this] { recheckSoon(); },
                           .activated = [this](const auto& it) { hosts_.didActivate(it); }})) {
   ports_.notificationServer.setObserver(banners_);
@@ -60,8 +62,7 @@ void NotificationDeliverer::recheck() {
     const Restorer occupied(isOccupied_);
     isOccupied_ = true;
     isBehind_ = false;
-    Failure failure = banners_->catchUp();
-    if (!failure) failure = deliver();
+    const Failure failure = follow();
     report(failure);
     if (failure) isAllDone_ = isOfOthers(*failure);
     isBehind_ = isBehind_ || failure || banners_->hasFailed();
@@ -69,19 +70,37 @@ void NotificationDeliverer::recheck() {
   awaitNext();
 }
 
+bool NotificationDeliverer::isStoreThere() const {
+  return migrating_ == Migrating::allowed || ports_.privateFiles.identity(storeFile_);
+}
+
+NotificationDeliverer::Failure NotificationDeliverer::follow() {
+  if (!isStoreThere()) {
+    // What it held was removed on purpose and must not come back with the next file.
+    store_.emplace(DurableFile::Ports{ports_.privateFiles, ports_.systemLog}, storeFile_,
+                   migrating_);
+    questions_.clear();
+    banners_->dropNotes();
+    lookAhead({});
+    return banners_->follow({}, false, 0);
+  }
+  auto error = banners_->catchUp();
+  return error ? error : deliver();
+}
+
 NotificationDeliverer::Failure NotificationDeliverer::deliver() {
   const std::vector every{planned, due, hidden, toShow, shown, expired, removed};
-  auto all = store_.deliveries(every);
+  auto all = store_->deliveries(every);
   if (!all) return all.error();
   if (auto error = becomeDeliverer(*all)) return error;
   // Where nothing is due, a schedule may still have to go on from a clock that was set back.
   if (duty_ == Duty::everything && !isBehind_)
-    if (auto error = store_.claimDue(ports_.clock.now(), calendar())) return error;
+    if (auto error = store_->claimDue(ports_.clock.now(), calendar())) return error;
   if (lock_) {
-    if (all = store_.deliveries(every); !all) return all.error();
+    if (all = store_->deliveries(every); !all) return all.error();
     ask(*all);
     if (auto error = decide()) return error;
-    if (all = store_.deliveries(every); !all) return all.error();
+    if (all = store_->deliveries(every); !all) return all.error();
   }
   lookAhead(*all);
   return banners_->follow(*all, lock_ != nullptr, maxOnTheirWay);
@@ -100,7 +119,7 @@ NotificationDeliverer::Failure NotificationDeliverer::becomeDeliverer(
            nextDate(each.schedule, present).value_or(Date::max()) <= now;
   };
   if (std::none_of(all.begin(), all.end(), isDue)) return std::nullopt;
-  auto lock = ports_.privateFiles.tryLock(lockFile_);
+  auto lock = ports_.privateFiles.tryLock(storeFile_ + ".deliverer");
   if (!lock) return lock.error();
   if (!*lock) {
     // The other one may end before it has done everything.
@@ -108,7 +127,7 @@ NotificationDeliverer::Failure NotificationDeliverer::becomeDeliverer(
     return std::nullopt;
   }
   // Whoever showed banners has ended.
-  if (auto error = store_.noteAllExpired()) return error;
+  if (auto error = store_->noteAllExpired()) return error;
   lock_ = std::move(*lock);
   return std::nullopt;
 }
@@ -161,7 +180,7 @@ NotificationDeliverer::Failure NotificationDeliverer::decide() {
       isAnyOpen = true;
   }
   if (decisions.empty() || (isAnyOpen && !isAnyOverdue)) return std::nullopt;
-  const auto delivered = store_.decideDue(decisions);
+  const auto delivered = store_->decideDue(decisions);
   if (!delivered) return delivered.error();
   std::erase_if(questions_, [&](const auto& each) { return decisions.contains(each.first); });
   for (const Delivery& each : *delivered) hosts_.didDeliver(each.schedule.notification);
@@ -195,11 +214,13 @@ bool NotificationDeliverer::isBusy() const {
 
 NotificationDeliverer::Failure NotificationDeliverer::keepLaunch(
     const NotificationActivation& activation) {
-  return store_.keepLaunch(activation.notification, ports_.clock.now());
+  if (!isStoreThere()) return std::nullopt;
+  return store_->keepLaunch(activation.notification, ports_.clock.now());
 }
 
 Result<std::optional<NotificationSource>> NotificationDeliverer::source() {
-  return store_.source();
+  if (!isStoreThere()) return std::optional<NotificationSource>();
+  return store_->source();
 }
 
 void NotificationDeliverer::report(const Failure& failure) {
@@ -215,7 +236,9 @@ void NotificationDeliverer::recheckSoon() {
   ports_.mainQueue.post([this, life = std::weak_ptr(banners_)] {
     if (life.expired()) return;
     isPosted_ = false;
-    if (banners_->onTheirWay() > maxOnTheirWay / 2 && !isOccupied_ && !banners_->catchUp()) return;
+    if (banners_->onTheirWay() > maxOnTheirWay / 2 && !isOccupied_ && isStoreThere() &&
+        !banners_->catchUp())
+      return;
     recheck();
   });
 }

@@ -54,6 +54,7 @@ class NotificationDeliverer final {
   };
 
   /// `hosts` outlives the deliverer. Nothing is done, nor the store opened, before the first call.
+  /// Who may not migrate the store does not make one either: where the file is gone, all is done.
   NotificationDeliverer(const Ports& ports, const std::string& storeFile, Migrating migrating,
                         NotificationHosts& hosts);
   ~NotificationDeliverer();
@@ -90,6 +91,8 @@ class NotificationDeliverer final {
     std::optional<bool> answer;
   };
 
+  [[nodiscard]] bool isStoreThere() const;
+  [[nodiscard]] Failure follow();
   [[nodiscard]] Failure deliver();
   [[nodiscard]] Failure becomeDeliverer(const std::vector<Delivery>& all);
   void ask(const std::vector<Delivery>& all);
@@ -104,9 +107,10 @@ class NotificationDeliverer final {
   [[nodiscard]] Calendar calendar() const;
 
   const Ports ports_;
-  const std::string lockFile_;
+  const std::string storeFile_;
+  const Migrating migrating_;
   NotificationHosts& hosts_;
-  NotificationStore store_;
+  std::optional<NotificationStore> store_;
   /// What is called later finds it gone when the deliverer has ended.
   const std::shared_ptr<Banners> banners_;
   Duty duty_ = Duty::nothing;

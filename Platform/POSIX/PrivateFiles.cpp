@@ -63,11 +63,11 @@ Failure judgeParent(const fs::path& folder) {
 
 // The process's mask of modes may take rights away that a new folder or file is given. Some file
 // systems know no modes.
-Failure makeFolders(const fs::path& folder) {
+Failure makeMissing(const fs::path& folder) {
   struct stat facts {};
   if (::lstat(folder.c_str(), &facts) == 0) return std::nullopt;
   if (folder.has_relative_path())
-    if (auto error = makeFolders(folder.parent_path())) return error;
+    if (auto error = makeMissing(folder.parent_path())) return error;
   if (auto error = judgeParent(folder.parent_path())) return error;
   if (::mkdir(folder.c_str(), folderMode) != 0)
     return errno == EEXIST ? std::nullopt : Failure(systemError(folder));
@@ -154,6 +154,17 @@ class DescriptionLock final : public FileLock {
 
 class OwnFiles final : public PrivateFiles {
  public:
+  std::optional<PlatformError> makeFolders(const std::string& path) override {
+    std::error_code failure;
+    const fs::path given = fs::absolute(path, failure);
+    const fs::path folder = failure ? fs::path() : fs::weakly_canonical(given, failure);
+    if (failure) return PlatformError(failure);
+    if (auto error = makeMissing(folder)) return error;
+    if (fs::is_directory(folder, failure)) return std::nullopt;
+    errno = ENOTDIR;
+    return systemError(folder);
+  }
+
   Result<std::string> prepare(const std::string& path) override {
     if (isCutShort(path)) return PlatformError(invalidPath());
     std::error_code failure;
@@ -162,7 +173,7 @@ class OwnFiles final : public PrivateFiles {
         failure ? fs::path() : fs::weakly_canonical(given.parent_path(), failure);
     if (failure) return PlatformError(failure);
     const std::string resolved = folder / given.filename();
-    Failure error = makeFolders(folder);
+    Failure error = makeMissing(folder);
     if (!error) error = judgeFolder(folder);
     if (!error) error = judgeFiles(resolved);
     if (!error) error = makeFile(resolved);

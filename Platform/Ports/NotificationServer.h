@@ -50,7 +50,7 @@ class VARNEL_API NotificationServer {
     /// The user closed the banner.
     virtual void bannerDismissed(const std::string& token) = 0;
     /// The banner is gone otherwise: it was closed as asked, has expired, or its server has ended.
-    /// The user may yet bring an expired one back, and click it.
+    /// The user may yet bring an expired one back, and click it. Told once for each banner.
     virtual void bannerGone(const std::string& token) = 0;
     /// There is a server again, or another one. Told once something was asked of a server.
     virtual void serverAppeared() = 0;

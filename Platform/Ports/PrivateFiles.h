@@ -9,6 +9,7 @@
 #include <system_error>
 
 #include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Values/PlatformError.h>
 #include <Varnel/Platform/Values/Result.h>
 
 namespace Varnel::Platform {
@@ -48,6 +49,10 @@ class VARNEL_API PrivateFiles {
  public:
   virtual ~PrivateFiles() = default;
   PrivateFiles& operator=(const PrivateFiles&) = delete;
+
+  /// Makes missing folders (0700); refused is to make one in somebody else's, root included. One
+  /// that exists is left as it is, whosever it is.
+  [[nodiscard]] virtual std::optional<PlatformError> makeFolders(const std::string& path) = 0;
 
   /// Makes missing folders (0700) and, if it is missing, the file (0600, empty), and returns the
   /// absolute path to open it by, with no link in it. Links among the folders are followed. Refused

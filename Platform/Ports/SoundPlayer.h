@@ -18,7 +18,7 @@ class VARNEL_API SoundDelegate {
 
   /// Called on the main queue, once for each `play`, unless the sound was stopped before.
   /// `finished` is false when the sound broke off or could not be played, which is not known
-  /// earlier.
+  /// earlier. The sound does not play any more, and may be played again at once.
   virtual void sound(PlayableSound& sound, bool finished) = 0;
 };
 

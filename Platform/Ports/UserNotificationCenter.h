@@ -17,7 +17,8 @@ namespace Varnel::Platform {
 class UserNotificationCenter;
 
 /// The listener of a center, which tells it of events and asks it one question. Called on the main
-/// thread.
+/// thread, within a call on the center or later. What it takes long to answer is shown meanwhile.
+/// It must not throw.
 class VARNEL_API UserNotificationCenterDelegate {
  public:
   virtual ~UserNotificationCenterDelegate() = default;
@@ -57,8 +58,9 @@ class VARNEL_API UserNotificationCenter {
   virtual ~UserNotificationCenter() = default;
   UserNotificationCenter& operator=(const UserNotificationCenter&) = delete;
 
-  /// The only listener from now on; held weakly. Notifications that came due earlier are delivered
-  /// now. Without a delegate nothing comes due, and what is scheduled waits.
+  /// The only listener of this process from now on; held weakly. Notifications that came due
+  /// earlier are delivered now at the latest: where nobody but the application delivers, they wait
+  /// for a delegate. One that was delivered without a listener is not told of again.
   virtual void setDelegate(std::weak_ptr<UserNotificationCenterDelegate> delegate,
                            Standing standing = Standing::application) = 0;
 
@@ -80,17 +82,21 @@ class VARNEL_API UserNotificationCenter {
   ///     });
   [[nodiscard]] virtual Failure change(const std::function<Failure()>& calls) = 0;
 
-  /// Keeps the notification until its delivery date, in the place of one with its identifier.
+  /// Keeps the notification until its delivery date, in the place of one with its identifier. It is
+  /// due at once where the date is past or absent, which stands for now.
   [[nodiscard]] virtual Failure scheduleNotification(const UserNotification& notification) = 0;
 
   /// The notifications that have a delivery ahead, the next one first.
   [[nodiscard]] virtual Notifications scheduledNotifications() = 0;
 
-  /// Cancels all deliveries to come. The notification stays in the delivered list if it is there.
+  /// Cancels all deliveries to come of what is the same (`isSameNotification`, with the next date).
+  /// The notification stays in the delivered list if it is there.
   [[nodiscard]] virtual Failure removeScheduledNotification(
       const UserNotification& notification) = 0;
 
-  /// Delivers now, whatever the dates of the notification say, and replaces its banner.
+  /// Delivers now, whatever the dates of the notification say, also where there is no delegate. It
+  /// is in the delivered list when this returns, in the place of one with its identifier, whose
+  /// banner it replaces.
   [[nodiscard]] virtual Failure deliverNotification(const UserNotification& notification) = 0;
 
   /// The delivered notifications that were neither removed nor dismissed by the user, the latest

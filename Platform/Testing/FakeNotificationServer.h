@@ -115,12 +115,12 @@ class FakeNotificationServer final : public NotificationServer {
   /// Acts as the user, who may also click a banner that has expired. What the server has done until
   /// now is reported before.
   void activate(const std::string& title, const BannerActivation& activation = {}) {
-    const auto token = take(title);
-    const auto observer = observer_.lock();
-    if (token && observer) observer->bannerActivated(*token, activation);
+    if (const auto token = take(title))
+      if (const auto observer = observer_.lock()) observer->bannerActivated(*token, activation);
   }
   void dismiss(const std::string& title) {
-    if (const auto token = take(title)) tell(&Observer::bannerDismissed, *token);
+    if (const auto token = take(title))
+      if (const auto observer = observer_.lock()) observer->bannerDismissed(*token);
   }
 
   /// Acts as a server whose banner has been there long enough.

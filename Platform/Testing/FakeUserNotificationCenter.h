@@ -2,6 +2,7 @@
 #pragma once
 
 #include <algorithm>
+#include <chrono>
 #include <functional>
 #include <memory>
 #include <optional>
@@ -15,7 +16,8 @@
 
 namespace Varnel::Platform::Testing {
 
-/// A center without a clock: notifications come due, and are clicked, when the test says so.
+/// A center without a clock: notifications come due, and are clicked, when the test says so. What
+/// repeats waits for ever, because its dates need a calendar.
 ///
 ///     FakeUserNotificationCenter center;
 ///     UserNotificationRouter router({center, application, mainQueue});
@@ -25,13 +27,14 @@ namespace Varnel::Platform::Testing {
 /// One thread.
 class FakeUserNotificationCenter final : public UserNotificationCenter {
  public:
-  /// The notifications that the delegate wanted to be shown, oldest first.
+  /// Moved by the test alone.
+  Date now;
+  /// The notifications that were shown, because the delegate wanted it or there was none, oldest
+  /// first.
   std::vector<UserNotification> presented;
   /// The calls on its two lists count, each for itself. One that goes wrong fails, and with it all
   /// that it is made together with.
   std::shared_ptr<FaultPlan> faults = std::make_shared<FaultPlan>();
-  /// For what the application was started; taken once.
-  std::optional<UserNotification> launch;
   /// What `checkBanners` answers.
   Failure obstacle;
 
@@ -41,7 +44,10 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
   }
   [[nodiscard]] Result<std::optional<UserNotification>> takeLaunchNotification() override {
     if (auto error = fail()) return *error;
-    return std::exchange(launch, std::nullopt);
+    const auto clicked = std::exchange(launch_, std::nullopt);
+    if (!clicked || now >= launchDate_ + std::chrono::minutes(5))
+      return std::optional<UserNotification>();
+    return clicked;
   }
   [[nodiscard]] std::shared_ptr<UserNotificationCenterDelegate> delegate() const {
     return delegate_.lock();
@@ -61,14 +67,15 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
     }
     isChanging_ = false;
     if (error) state_ = start;
-    for (const auto& notification : std::exchange(state_.due, {})) deliver(notification);
+    for (const auto& notification : std::exchange(state_.due, {})) show(notification);
     return error;
   }
 
   [[nodiscard]] Failure scheduleNotification(const UserNotification& notification) override {
     return call([&] {
-      remove(state_.scheduled, notification);
+      replace(state_.scheduled, notification);
       state_.scheduled.push_back(notification);
+      state_.scheduled.back().deliveryDate = notification.deliveryDate.value_or(now);
       std::stable_sort(state_.scheduled.begin(), state_.scheduled.end(),
                        [](const auto& left, const auto& right) {
                          return left.deliveryDate < right.deliveryDate;
@@ -85,9 +92,11 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
 
   [[nodiscard]] Failure deliverNotification(const UserNotification& notification) override {
     return call([&] {
-      remove(state_.delivered, notification);
-      state_.delivered.insert(state_.delivered.begin(), notification);
-      state_.due.push_back(notification);
+      UserNotification delivered = notification;
+      delivered.actualDeliveryDate = now;
+      replace(state_.delivered, notification);
+      state_.delivered.insert(state_.delivered.begin(), delivered);
+      state_.due.push_back(std::move(delivered));
     });
   }
   [[nodiscard]] Notifications deliveredNotifications() override {
@@ -95,7 +104,10 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
     return state_.delivered;
   }
   [[nodiscard]] Failure removeDeliveredNotification(const UserNotification& notification) override {
-    return call([&] { remove(state_.delivered, notification); });
+    return call([&] {
+      remove(state_.delivered, notification);
+      remove(state_.due, notification);
+    });
   }
 
   void retryLater(std::function<void()> retry) override { retries_.push_back(std::move(retry)); }
@@ -109,6 +121,21 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
     for (const auto& each : std::exchange(retries_, {})) each();
   }
 
+  /// Lets time pass: what comes due meanwhile is delivered now.
+  void advanceTo(Date date) {
+    now = date;
+    for (const UserNotification& each : std::vector(state_.scheduled)) {
+      if (each.deliveryRepeatInterval || each.deliveryDate > now) continue;
+      remove(state_.scheduled, each);
+      static_cast<void>(deliverNotification(each));
+    }
+  }
+
+  /// Acts as a click of the user while the application does not run, which is started then.
+  void startBy(const UserNotification& notification) {
+    launch_ = notification;
+    launchDate_ = now;
+  }
   /// Acts as a click of the user.
   void activate(const UserNotification& notification) {
     if (const auto listener = delegate_.lock()) listener->didActivate(*this, notification);
@@ -118,9 +145,12 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
   struct State {
     std::vector<UserNotification> scheduled;
     std::vector<UserNotification> delivered;
-    std::vector<UserNotification> due;  ///< Its delegate has not heard of them.
+    std::vector<UserNotification> due;  ///< The delegate has not heard of them.
   };
 
+  static void replace(std::vector<UserNotification>& list, const UserNotification& notification) {
+    if (notification.identifier) remove(list, notification);
+  }
   static void remove(std::vector<UserNotification>& list, const UserNotification& notification) {
     const UserNotification copy = notification;  // It may be an element of the list.
     std::erase_if(list, [&](const auto& each) { return isSameNotification(each, copy); });
@@ -140,16 +170,18 @@ class FakeUserNotificationCenter final : public UserNotificationCenter {
     });
   }
 
-  void deliver(const UserNotification& notification) {
+  void show(const UserNotification& notification) {
     const auto listener = delegate_.lock();
-    if (!listener) return;
-    if (listener->shouldPresent(*this, notification)) presented.push_back(notification);
-    listener->didDeliver(*this, notification);
+    if (!listener || listener->shouldPresent(*this, notification))
+      presented.push_back(notification);
+    if (listener) listener->didDeliver(*this, notification);
   }
 
   std::weak_ptr<UserNotificationCenterDelegate> delegate_;
   State state_;
   bool isChanging_ = false;
+  std::optional<UserNotification> launch_;
+  Date launchDate_;
   std::vector<std::function<void()>> retries_;
 };
 

@@ -25,6 +25,10 @@ class FaultyPrivateFiles final : public PrivateFiles {
   /// Called before a call goes wrong: a test may end the process there.
   std::function<void()> whenStruck = [] {};
 
+  [[nodiscard]] std::optional<PlatformError> makeFolders(const std::string& path) override {
+    if (const auto code = failure()) return PlatformError(code);
+    return files_.makeFolders(path);
+  }
   [[nodiscard]] Result<std::string> prepare(const std::string& path) override {
     if (const auto code = failure()) return PlatformError(code);
     return files_.prepare(path);

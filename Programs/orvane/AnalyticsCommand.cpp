@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/AnalyticsCommand.h>
 
+#include <string>
+
 #include <orvane/AnalyticsConsent.h>
 #include <orvane/Console.h>
 #include <orvane/ScanAnalytics.h>
@@ -17,7 +19,10 @@ int AnalyticsCommand::run(Console& console) const {
   if (!isDone) console.complain("the events that wait cannot be thrown away now; try again");
   if (isDone && answer == granted) isKept = storeConsent(granted, console);
   if (!isKept || !isDone) return 1;
-  return console.writeResult("consent: " + textOf(storedConsent()) + "\n") ? 0 : 1;
+  std::string result = "consent: " + textOf(storedConsent()) + "\n";
+  const auto waiting = ScanAnalytics::waitingEvents();
+  if (waiting > 0) result += "waiting: " + std::to_string(waiting) + "\n";
+  return console.writeResult(result) ? 0 : 1;
 }
 
 }  // namespace Orvane

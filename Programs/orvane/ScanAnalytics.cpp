@@ -51,7 +51,19 @@ std::shared_ptr<SpoolingTransport> transportTo(const URL& endpoint) {
                                                    : SpoolingTransport::PlainHTTP::refused});
 }
 
+// It is never started, and so sends nothing, wherever that would go.
+std::unique_ptr<SpoolingTransport> idleTransport() {
+  return SpoolingTransport::make({.endpoint = *URL::parse("https://nowhere.invalid/"),
+                                  .trackingID = {},
+                                  .clientID = {},
+                                  .spoolPath = Varnel::ApplicationData::analyticsSpoolPath()});
+}
+
 }  // namespace
+
+std::int64_t ScanAnalytics::waitingEvents() {
+  return idleTransport()->counts().waiting;
+}
 
 bool ScanAnalytics::isEndpoint(const std::string& text) {
   const auto url = URL::parse(text);
@@ -60,12 +72,7 @@ bool ScanAnalytics::isEndpoint(const std::string& text) {
 }
 
 bool ScanAnalytics::discardEvents(std::chrono::milliseconds patience) {
-  // It is never started, and so sends nothing, wherever that would go.
-  const auto transport =
-      SpoolingTransport::make({.endpoint = *URL::parse("https://nowhere.invalid/"),
-                               .trackingID = {},
-                               .clientID = {},
-                               .spoolPath = Varnel::ApplicationData::analyticsSpoolPath()});
+  const auto transport = idleTransport();
   for (const auto end = std::chrono::steady_clock::now() + patience;;) {
     transport->discardAll();
     if (transport->hasDiscardedAll()) return true;

@@ -24,6 +24,9 @@ class ScanAnalytics final {
   /// that, and it may not be had at all.
   static bool discardEvents(std::chrono::milliseconds patience = std::chrono::seconds(2));
 
+  /// How many events wait in the product's spool.
+  static std::int64_t waitingEvents();
+
   /// Nothing is sent without an endpoint, nor without the user's consent, which is complained of.
   /// Where that was refused, what waits is thrown away.
   ScanAnalytics(const std::optional<std::string>& endpoint, bool printsEvents, Console& console);

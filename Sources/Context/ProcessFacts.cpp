@@ -10,6 +10,7 @@
 #include <Varnel/Context/TargetKind.h>
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/ProcessInfo.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
 
@@ -53,7 +54,8 @@ ProcessFacts::ProcessFacts(Ports ports, BuildSwitches switches)
     : ports_(ports), switches_(std::move(switches)) {}
 
 ProcessFacts::ProcessFacts(const Platform::Ports& ports)
-    : ProcessFacts(Ports{ports.clock, ports.processInfo, ports.userAccount, ports.workspace},
+    : ProcessFacts(Ports{ports.clock, ports.privateFiles, ports.processInfo, ports.userAccount,
+                         ports.workspace},
                    BuildSwitches::ofThisProduct()) {}
 
 ProcessFacts::ProcessFacts() : ProcessFacts(Platform::processPorts()) {}
@@ -123,8 +125,7 @@ const Platform::URL& ProcessFacts::fakeTrashURL() const {
                              switches_.appName + "/FakeTrash";
     auto url = Platform::URL::fileURLWithPath(path);
     // The users of the folder will notice if it could not be made.
-    std::error_code ignored;
-    fs::create_directories(path, ignored);
+    static_cast<void>(ports_.privateFiles.makeFolders(path));
     url.setTemporaryResourceValue(OVURLIsBookmarkedKey, true);
     return url;
   });

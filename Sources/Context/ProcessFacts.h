@@ -15,6 +15,7 @@
 
 namespace Varnel::Platform {
 class Clock;
+class PrivateFiles;
 class ProcessInfo;
 class UserAccount;
 class Workspace;
@@ -39,6 +40,7 @@ class VARNEL_API ProcessFacts final {
  public:
   struct Ports {
     Platform::Clock& clock;
+    Platform::PrivateFiles& privateFiles;
     Platform::ProcessInfo& processInfo;
     Platform::UserAccount& userAccount;
     Platform::Workspace& workspace;

@@ -15,6 +15,7 @@
 #include <Varnel/Platform/Ports/AppendFiles.h>
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/StandardOutput.h>
 #include <Varnel/Platform/Ports/TimeZones.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
@@ -66,6 +67,7 @@ Logger& Logger::instance() {
 Logger::Logger(const Platform::Ports& ports, std::string_view baseIdentifier)
     : Logger({.appendFiles = ports.appendFiles,
               .clock = ports.clock,
+              .privateFiles = ports.privateFiles,
               .standardOutput = ports.standardOutput,
               .timeZones = ports.timeZones,
               .userAccount = ports.userAccount,
@@ -90,11 +92,9 @@ void Logger::openFile(std::string_view baseIdentifier) {
   const std::string path =
       fmt::format("{}/{}.log", folder, fileNameDates.string(ports_.clock.now()));
 
-  std::error_code failure;
-  std::filesystem::create_directories(folder, failure);
-  if (failure) {
-    ports_.standardOutput.print(fmt::format("Unable to write log to file {} with error {}\n", path,
-                                            Platform::PlatformError(failure).description()));
+  if (const auto error = ports_.privateFiles.makeFolders(folder)) {
+    ports_.standardOutput.print(
+        fmt::format("Unable to write log to file {} with error {}\n", path, error->description()));
     ports_.standardOutput.print("Will NOT store log\n");
     return;
   }

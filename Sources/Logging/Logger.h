@@ -22,6 +22,7 @@
 namespace Varnel::Platform {
 class AppendFiles;
 class Clock;
+class PrivateFiles;
 class StandardOutput;
 class TimeZones;
 class UserAccount;
@@ -49,6 +50,7 @@ class VARNEL_API Logger final {
   struct Ports {
     Platform::AppendFiles& appendFiles;
     Platform::Clock& clock;
+    Platform::PrivateFiles& privateFiles;
     Platform::StandardOutput& standardOutput;
     Platform::TimeZones& timeZones;
     Platform::UserAccount& userAccount;

@@ -8,6 +8,8 @@
 #include <Tests/Context/PropertyLists.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Context/Globals.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Testing/FakeProcessInfo.h>
 #include <Varnel/Platform/Testing/FakeUser.h>
 #include <Varnel/Platform/Testing/FakeWorkspace.h>
@@ -25,7 +27,7 @@ constexpr Date launch = std::chrono::sys_days(2016y / 5 / 9);
 class ProcessFactsTest : public testing::Test {
  protected:
   ProcessFacts facts(BuildSwitches switches = {}) {
-    return ProcessFacts({clock, process, user, workspace}, std::move(switches));
+    return ProcessFacts({clock, *privateFiles, process, user, workspace}, std::move(switches));
   }
   ProcessFacts siteFacts() { return facts({.isSiteVersion = true, .appName = "Orvane 2"}); }
 
@@ -40,6 +42,7 @@ class ProcessFactsTest : public testing::Test {
   Platform::Testing::FakeProcessInfo process;
   Platform::Testing::FakeUserAccount user;
   Platform::Testing::FakeWorkspace workspace;
+  const std::unique_ptr<Platform::PrivateFiles> privateFiles = Platform::POSIX::makePrivateFiles();
 };
 
 TEST_F(ProcessFactsTest, EveryChannelSharesTheSuitesBaseIdentifier) {
@@ -100,7 +103,7 @@ TEST_F(ProcessFactsTest, FakeTrashIsMadeOrSilentlyNot) {
   const ProcessFacts fresh = siteFacts();
   const URL url = fresh.fakeTrashURL();
   EXPECT_EQ(url.path(), user.home + "/Library/Application Support/Orvane 2/FakeTrash");
-  EXPECT_TRUE(std::filesystem::is_directory(url.path()));
+  EXPECT_EQ(std::filesystem::status(url.path()).permissions(), std::filesystem::perms::owner_all);
   EXPECT_TRUE(std::any_cast<bool>(url.temporaryResourceValue(OVURLIsBookmarkedKey)));
 
   user.home = folder.write("no folder", "").string();

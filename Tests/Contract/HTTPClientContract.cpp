@@ -17,22 +17,22 @@ HTTPPost postTo(const std::string& url, const std::string& body = "x") {
 }
 
 TEST_P(HTTPClientContract, PostsTheWholeBodyAndTellsTheServersAnswer) {
-  const std::string url = world->serve({"204", "503/7", "302>/elsewhere", "cut", "201"});
+  const std::string url = world->serve({"cut", "204", "503/7", "302>/elsewhere", "201"});
   const struct {
     std::string body;
     int status;
     std::optional<std::chrono::seconds> pause;
-  } rows[] = {{"a\0\xFF\r\n"s, 204, {}},
+  } rows[] = {{"unanswered", 0, {}},
+              {"a\0\xFF\r\n"s, 204, {}},
               {"", 503, 7s},
-              {std::string(300'000, 'x'), 302, {}},
-              {"unanswered", 0, {}},
+              {std::string(50'000, 'x'), 302, {}},
               {"last", 201, {}}};
   for (const auto& row : rows) {
     const auto answer = world->client().post(postTo(url, row.body), {});
     EXPECT_EQ(world->nextBody(), row.body);
     EXPECT_EQ(answer ? answer->status : 0, row.status);
-    if (answer) EXPECT_EQ(answer->retryAfter, row.pause);
-    if (!answer) EXPECT_FALSE(answer.error().isOffline || answer.error().message.empty());
+    EXPECT_EQ(answer ? answer->retryAfter : std::nullopt, row.pause);
+    EXPECT_TRUE(answer || (!answer.error().isOffline && !answer.error().message.empty()));
   }
 }
 

@@ -25,7 +25,9 @@ struct Listener final : NotificationServer::Observer {
     onShown(token);
   }
   void bannerFailed(const std::string& token) override { heard.push_back("failed " + token); }
-  void bannerActivated(const std::string& token) override { heard.push_back("clicked " + token); }
+  void bannerActivated(const std::string& token, const BannerActivation&) override {
+    heard.push_back("clicked " + token);
+  }
   void bannerDismissed(const std::string& token) override { heard.push_back("dismissed " + token); }
   void bannerGone(const std::string& token) override { heard.push_back("gone " + token); }
   void serverAppeared() override { heard.emplace_back("appeared"); }
@@ -84,6 +86,15 @@ TEST_P(NotificationServerContract, AnExpiredBannerIsGoneAndMayYetBeClickedOnce) 
   for (int i = 0; i < 2; ++i) world->activate("A");
   world->workUntil([&] { return !listener->heard.empty(); });
   EXPECT_THAT(heardBy(*listener, *world), ElementsAre("clicked 1"));
+
+  world->server().show("2", {.title = "B"}, {});
+  EXPECT_THAT(heardBy(*listener, *world), ElementsAre("shown 2"));
+  world->expire("B");
+  world->workUntil([&] { return !listener->heard.empty(); });
+  world->endServer();
+  world->startServer();
+  world->workUntil([&] { return listener->heard.size() == 2; });
+  EXPECT_THAT(heardBy(*listener, *world), ElementsAre("gone 2", "appeared"));
 }
 
 TEST_P(NotificationServerContract, ABannerThatIsClosedIsGoneOnceAndNothingElse) {

@@ -99,11 +99,12 @@ class DiskAccessFixture : public ::testing::Test {
   }
 
   /// The same while other threads keep the manager too busy to look the disk up.
-  Session beginOnKnownDisk(const URL& file, std::optional<double> timeout = {}) {
-    Session session = begin(file, timeout);
+  Session beginOnKnownDisk(const URL& file, std::optional<double> timeout = {},
+                           QoS qos = QoS::utility) {
+    Session session = begin(file, timeout, qos);
     while (session && session->diskInfo()->uniqueID() == "unknown") {
       session->endAccessing();
-      session = begin(file, timeout);
+      session = begin(file, timeout, qos);
     }
     return session;
   }

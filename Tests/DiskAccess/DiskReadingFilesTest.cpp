@@ -52,6 +52,8 @@ class DiskReadingFilesTest : public DiskReadingFixture {
                                     std::optional<std::uint64_t> place = {}) {
     return {.url = URL::fileURLWithPath("/stick/" + name), .place = place};
   }
+  static Next readAtOnce(const DiskReadingFile&, Turn&) { return Next::done(); }
+  static Next neverRead(const DiskReadingFile&, Turn& turn) { return never(turn); }
 };
 
 TEST_F(DiskReadingFilesTest, ATurnCoversManySmallFilesAndPartOfALargeOne) {
@@ -153,21 +155,15 @@ TEST_F(DiskReadingFilesTest, EndsFilesThatNobodyHasBegun) {
 }
 
 TEST_F(DiskReadingFilesTest, EndsFilesOfADiskThatIsTaken) {
-  const auto never = [](const DiskReadingFile&, Turn&) {
-    ADD_FAILURE();
-    return Next::done();
-  };
   const DiskAccessGuard session(begin(stickFile));
   for (const double timeout : {0.0, 0.001}) {
     Results results(2);
-    queue_->read({stickNamed("a"), stickNamed("b")}, {.accessWaitingTimeout = timeout}, never,
+    queue_->read({stickNamed("a"), stickNamed("b")}, {.accessWaitingTimeout = timeout}, neverRead,
                  results.recorder());
     EXPECT_EQ(results.await(), (Told{{"a", Result::timedOut}, {"b", Result::timedOut}}));
   }
   Results results(2);
-  queue_->read(
-      {stickNamed("a"), {.url = homeFile}}, {},
-      [](const DiskReadingFile&, Turn&) { return Next::done(); }, results.recorder());
+  queue_->read({stickNamed("a"), {.url = homeFile}}, {}, readAtOnce, results.recorder());
   EXPECT_EQ(results.await(1), (Told{{"file", Result::read}})) << "disks are read side by side";
   queue_.reset();
   EXPECT_EQ(results.await(), (Told{{"a", Result::stopped}, {"file", Result::read}}));
@@ -219,59 +215,46 @@ class StuckCatalog final : public Platform::VolumeCatalog {
   const URL stuck_;
 };
 
-/// A queue whose look-up of one file waits.
-struct StuckQueue {
-  StuckCatalog catalog;
-  DiskAccessManager manager;
-  DiskReadingQueue queue;
+/// The same machine with a queue whose look-up of one file waits.
+class StuckLookUpTest : public DiskReadingFilesTest {
+ protected:
+  /// Reads files, and returns when `stuck` among them is being looked up.
+  void read(const URL& stuck, std::vector<DiskReadingFile> files, DiskReadingOptions options = {}) {
+    catalog_.emplace(volumes_, stuck);
+    stuckManager_.emplace(DiskAccessManager::Ports{devices_, disks_, *catalog_, scope_, center_});
+    queue_.emplace(*stuckManager_, DiskReadingQueue::Ports{.readingPriority = priority_});
+    results_.emplace(files.size());
+    queue_->read(std::move(files), std::move(options), readAtOnce, results_->recorder());
+    catalog_->isAsked.wait();
+  }
+  ~StuckLookUpTest() override { queue_.reset(); }
 
-  StuckQueue(DiskAccessManager::Ports ports, DiskReadingQueue::Ports queuePorts, URL stuck)
-      : catalog(ports.volumes, std::move(stuck)),
-        manager(
-            {ports.devices, ports.disks, catalog, ports.securityScope, ports.notificationCenter}),
-        queue(manager, std::move(queuePorts)) {}
+  std::optional<StuckCatalog> catalog_;
+  std::optional<DiskAccessManager> stuckManager_;
+  std::optional<Results> results_;
 };
 
-TEST_F(DiskReadingFilesTest, AStopIsAnsweredWhileALookUpIsStuck) {
-  StuckQueue stuck({devices_, disks_, volumes_, scope_, center_}, {.readingPriority = priority_},
-                   homeFile);
+TEST_F(StuckLookUpTest, AnswersAStopMeanwhile) {
   std::stop_source source;
-  Results results(1);
-  const auto never = [](const DiskReadingFile&, Turn&) {
-    ADD_FAILURE();
-    return Next::done();
-  };
-  stuck.queue.read({{.url = homeFile}}, {.stop = source.get_token()}, never, results.recorder());
-  stuck.catalog.isAsked.wait();
+  read(homeFile, {{.url = homeFile}}, {.stop = source.get_token()});
   source.request_stop();
-  EXPECT_EQ(results.await(), (Told{{"file", Result::stopped}}));
-  stuck.catalog.mayAnswer.count_down();
+  EXPECT_EQ(results_->await(), (Told{{"file", Result::stopped}}));
+  catalog_->mayAnswer.count_down();
 }
 
-TEST_F(DiskReadingFilesTest, OneStuckLookUpKeepsNoOtherFileWaiting) {
-  StuckQueue stuck({devices_, disks_, volumes_, scope_, center_}, {.readingPriority = priority_},
-                   stickFile);
-  Results results(3);
-  stuck.queue.read(
-      {{.url = URL::fileURLWithPath("/home/a")}, {.url = stickFile}, stickNamed("b")}, {},
-      [](const DiskReadingFile&, Turn&) { return Next::done(); }, results.recorder());
-  EXPECT_EQ(results.await(1), (Told{{"a", Result::read}}));
-  stuck.catalog.mayAnswer.count_down();
-  EXPECT_EQ(results.await(),
+TEST_F(StuckLookUpTest, KeepsNoOtherFileWaiting) {
+  read(stickFile, {{.url = URL::fileURLWithPath("/home/a")}, {.url = stickFile}, stickNamed("b")});
+  EXPECT_EQ(results_->await(1), (Told{{"a", Result::read}}));
+  catalog_->mayAnswer.count_down();
+  EXPECT_EQ(results_->await(),
             (Told{{"a", Result::read}, {"b", Result::read}, {"file", Result::read}}));
 }
 
-TEST_F(DiskReadingFilesTest, AVolumeUnmountedDuringItsLookUpHasVanished) {
-  StuckQueue stuck({devices_, disks_, volumes_, scope_, center_}, {.readingPriority = priority_},
-                   stickFile);
-  Results results(2);
-  stuck.queue.read(
-      {{.url = URL::fileURLWithPath("/home/a")}, {.url = stickFile}}, {},
-      [](const DiskReadingFile&, Turn&) { return Next::done(); }, results.recorder());
-  stuck.catalog.isAsked.wait();
+TEST_F(StuckLookUpTest, FindsAVolumeThatWasUnmountedMeanwhileVanished) {
+  read(stickFile, {{.url = URL::fileURLWithPath("/home/a")}, {.url = stickFile}});
   unmount(stickVolume);
-  stuck.catalog.mayAnswer.count_down();
-  EXPECT_EQ(results.await(), (Told{{"a", Result::read}, {"file", Result::vanished}}));
+  catalog_->mayAnswer.count_down();
+  EXPECT_EQ(results_->await(), (Told{{"a", Result::read}, {"file", Result::vanished}}));
 }
 
 // Readings of all classes with stops, time-outs and executors, while the stick comes and goes and

@@ -52,8 +52,22 @@ class DiskReadingFixture : public DiskAccessFixture {
                                                       .now = [this] { return now_.load(); }});
   }
 
+  static DiskReadingFile on(const URL& volume, std::optional<std::uint64_t> place = {}) {
+    return {.url = volume, .volumeURL = volume, .place = place};
+  }
   static DiskReadingFile onStick(std::optional<std::uint64_t> place = {}) {
     return {.url = stickFile, .volumeURL = stickVolume, .place = place};
+  }
+
+  /// Of the disk itself: the queue's threads may keep the manager too busy to look it up.
+  Session begin(const URL& file, std::optional<double> timeout = {}, QoS qos = QoS::utility) {
+    return beginOnKnownDisk(file, timeout, qos);
+  }
+
+  static Next done(Turn&) { return Next::done(); }
+  static Next never(Turn&) {
+    ADD_FAILURE() << "it must not run";
+    return Next::done();
   }
 
   Task submit(DiskReadingFile file, DiskReadingOptions options, ScriptedTask::Run run) {
@@ -66,14 +80,12 @@ class DiskReadingFixture : public DiskAccessFixture {
   }
 
   /// What was submitted with its volume before has reached the line of its disk: requests get there
-  /// one after another.
-  void awaitLines() {
-    EXPECT_EQ(submit({.url = homeFile, .volumeURL = homeVolume}, [](Turn&) { return Next::done(); })
-                  ->result(),
-              Result::read);
+  /// one after another. The other disk must be free.
+  void awaitLines(const URL& other = homeVolume) {
+    EXPECT_EQ(submit(on(other), done)->result(), Result::read);
   }
 
-  /// A task that stays on the stick until it is let go.
+  /// A task that stays on its disk until it is let go.
   struct Holder {
     std::shared_ptr<std::latch> isIn = std::make_shared<std::latch>(1);
     std::shared_ptr<std::latch> mayGo = std::make_shared<std::latch>(1);
@@ -83,9 +95,9 @@ class DiskReadingFixture : public DiskAccessFixture {
       EXPECT_EQ(task->result(), Result::read);
     }
   };
-  Holder holdStick(std::optional<std::uint64_t> place = {}) {
+  Holder hold(DiskReadingFile file) {
     Holder holder;
-    holder.task = submit(onStick(place), [holder](Turn&) {
+    holder.task = submit(std::move(file), [holder](Turn&) {
       holder.isIn->count_down();
       holder.mayGo->wait();
       return Next::done();
@@ -93,6 +105,8 @@ class DiskReadingFixture : public DiskAccessFixture {
     holder.isIn->wait();
     return holder;
   }
+
+  Holder holdStick() { return hold(onStick()); }
 
   std::size_t accessesTo(const URL& volume) {
     const DiskAccessGuard session(

@@ -20,9 +20,7 @@ TEST_F(DiskReadingQueueTest, NeverHasMoreReadersOnADiskThanItAdmits) {
   const auto disk = DiskAccessGuard(begin(archiveVolume))->diskData();
   std::mutex mutex;
   std::condition_variable changed;
-  int inside = 0;
-  int maxInside = 0;
-  int mayLeave = 0;
+  int inside = 0, maxInside = 0, mayLeave = 0;
   const auto visit = [&](Turn&) {
     std::unique_lock lock(mutex);
     maxInside = std::max(maxInside, ++inside);
@@ -30,123 +28,83 @@ TEST_F(DiskReadingQueueTest, NeverHasMoreReadersOnADiskThanItAdmits) {
     changed.wait(lock, [&] { return mayLeave > 0; });
     --mayLeave;
     --inside;
+    changed.notify_all();
     return Next::done();
   };
   std::vector<Task> tasks;
-  for (int i = 0; i < 8; ++i)
-    tasks.push_back(submit({.url = archiveVolume, .volumeURL = archiveVolume}, visit));
+  for (int i = 0; i < 8; ++i) tasks.push_back(submit(on(archiveVolume), visit));
   awaitLines();
-  const auto hasTwoInside = [&] {
-    const std::lock_guard lock(mutex);
-    return inside == 2 && mayLeave == 0;
-  };
-  while (!hasTwoInside()) std::this_thread::yield();
-  manager_->setIsBackgroundMode(true);
-  {
-    const std::lock_guard lock(mutex);
-    mayLeave = 1;
-    changed.notify_all();
-  }
-  // One that came before the mode leaves, and nobody takes its place.
-  while (accessCount(*disk) > 1) {
-    ASSERT_FALSE(hasTwoInside());
-    std::this_thread::yield();
-  }
-  {
+  const auto let = [&](int count, int stay) {
     std::unique_lock lock(mutex);
-    mayLeave = 1;
+    mayLeave = count;
     changed.notify_all();
-    changed.wait(lock, [&] { return inside == 1 && mayLeave == 0; });
-    mayLeave = 5;
-    maxInside = 1;
-    changed.notify_all();
-    changed.wait(lock, [&] { return mayLeave == 0; });
-    EXPECT_EQ(maxInside, 1);
-    manager_->setIsBackgroundMode(false);
-    mayLeave = 1;
-    changed.notify_all();
+    changed.wait(lock, [&] { return inside == stay && mayLeave == 0; });
+    return std::exchange(maxInside, stay);
+  };
+  EXPECT_EQ(let(0, 2), 2);
+  manager_->setIsBackgroundMode(true);
+  let(1, 1);
+  // One that came before the mode is in, and nobody takes the place of the other.
+  while (accessCount(*disk) > 1) {
+    const std::lock_guard lock(mutex);
+    ASSERT_LT(inside, 2);
   }
+  let(1, 1);
+  EXPECT_EQ(let(4, 1), 1);
+  manager_->setIsBackgroundMode(false);
+  let(2, 0);
   for (const Task& task : tasks) EXPECT_EQ(task->result(), Result::read);
 }
 
 TEST_F(DiskReadingQueueTest, ReadsOnItsWayUpTheDiskOrInTheOrderOfComing) {
   using Places = std::vector<std::optional<std::uint64_t>>;
   const Places places{50, 10, std::nullopt, 30, 70, 30};
-  const auto orderOn = [&](const URL& volume, std::uint64_t from) {
-    manager_->setIsBackgroundMode(true);  // One at a time on any disk.
-    std::mutex mutex;
+  manager_->setIsBackgroundMode(true);  // One at a time on any disk.
+  const auto orderOn = [&](const URL& volume, const URL& other) {
     Places order;
     std::vector<Task> tasks;
-    std::latch isIn(1);
-    std::latch mayGo(1);
-    const auto add = [&](std::optional<std::uint64_t> place, bool isFirst) {
-      tasks.push_back(
-          submit({.url = volume, .volumeURL = volume, .place = place}, [&, place, isFirst](Turn&) {
-            if (isFirst) {
-              isIn.count_down();
-              mayGo.wait();
-            }
-            const std::lock_guard lock(mutex);
-            order.push_back(place);
-            return Next::done();
-          }));
-    };
-    add(from, true);
-    isIn.wait();
-    for (const auto& place : places) add(place, false);
-    // Of the disk that is not in question.
-    DiskReadingFile other{.url = stickFile, .volumeURL = stickVolume};
-    if (volume == stickVolume) other = {.url = homeFile, .volumeURL = homeVolume};
-    EXPECT_EQ(submit(other, [](Turn&) { return Next::done(); })->result(), Result::read);
-    mayGo.count_down();
+    const Holder first = hold(on(volume, 40));
+    for (const auto& place : places)
+      tasks.push_back(submit(on(volume, place), [&order, place](Turn&) {
+        order.push_back(place);
+        return Next::done();
+      }));
+    awaitLines(other);
+    first.letGo();
     for (const Task& task : tasks) EXPECT_EQ(task->result(), Result::read);
     return order;
   };
-  EXPECT_EQ(orderOn(stickVolume, 40), (Places{40, 50, 70, std::nullopt, 10, 30, 30}));
-  Places asTheyCame = places;
-  asTheyCame.insert(asTheyCame.begin(), 40);
-  EXPECT_EQ(orderOn(homeVolume, 40), asTheyCame);
+  EXPECT_EQ(orderOn(stickVolume, homeVolume), (Places{50, 70, std::nullopt, 10, 30, 30}));
+  EXPECT_EQ(orderOn(homeVolume, stickVolume), places);
 }
 
 // On a disk that seeks and on one that does not, in one class.
 TEST_F(DiskReadingQueueTest, NobodyWaitsForTheLastTurnOfAnother) {
+  using Place = std::optional<std::uint64_t>;
   struct Case {
-    URL volume;
-    std::optional<std::uint64_t> place;  ///< Of both that need many turns.
-    std::optional<std::uint64_t> placeOfOther;
+    URL volume, other;
+    Place place;  ///< Of both that need many turns.
+    Place placeOfThird;
   };
-  const Case cases[] = {{stickVolume, std::nullopt, 10},
-                        {stickVolume, 50, 10},
-                        {homeVolume, std::nullopt, std::nullopt}};
   manager_->setIsBackgroundMode(true);
-  for (const Case& one : cases) {
-    const auto at = [&](std::optional<std::uint64_t> where) {
-      return DiskReadingFile{.url = one.volume, .volumeURL = one.volume, .place = where};
-    };
-    std::latch isIn(1);
-    std::latch mayGo(1);
-    std::atomic<bool> hasOtherRun = false;
+  for (const Case& one : {Case{stickVolume, homeVolume, {}, 10},
+                          {stickVolume, homeVolume, 50, 10},
+                          {homeVolume, stickVolume, {}, {}}}) {
+    const Holder holder = hold(on(one.volume, one.place));
+    std::atomic<bool> hasThirdRun = false;
     std::atomic<int> turns = 0;
     const auto longOne = [&](Turn&) {
-      isIn.count_down(isIn.try_wait() ? 0 : 1);
-      mayGo.wait();
-      return hasOtherRun || ++turns == 1000 ? Next::done() : Next::again(one.place);
+      return hasThirdRun || ++turns == 1000 ? Next::done() : Next::again(one.place);
     };
-    const Task first = submit(at(one.place), longOne);
-    isIn.wait();
-    const Task second = submit(at(one.place), longOne);
-    const Task other = submit(at(one.placeOfOther), [&](Turn&) {
-      hasOtherRun = true;
+    std::vector<Task> tasks;
+    for (int i = 0; i < 2; ++i) tasks.push_back(submit(on(one.volume, one.place), longOne));
+    tasks.push_back(submit(on(one.volume, one.placeOfThird), [&](Turn&) {
+      hasThirdRun = true;
       return Next::done();
-    });
-    const bool isHome = one.volume == homeVolume;
-    EXPECT_EQ(submit({.url = isHome ? stickFile : homeFile,
-                      .volumeURL = isHome ? stickVolume : homeVolume},
-                     [](Turn&) { return Next::done(); })
-                  ->result(),
-              Result::read);
-    mayGo.count_down();
-    for (const Task& task : {first, second, other}) EXPECT_EQ(task->result(), Result::read);
+    }));
+    awaitLines(one.other);
+    holder.letGo();
+    for (const Task& task : tasks) EXPECT_EQ(task->result(), Result::read);
     EXPECT_LE(turns, 4) << one.volume.path();
   }
 }
@@ -155,30 +113,22 @@ TEST_F(DiskReadingQueueTest, AMoreUrgentReaderWaitsForOneTurn) {
   // A reader of the queue, and a session of the process.
   std::atomic<bool> hasUrgentRun = false;
   Task urgent;
-  Session session;
-  std::thread other;
+  std::thread session;
   int turns = 0;
   const Task background = submit(onStick(), {.qos = QoS::background}, [&](Turn& turn) {
-    switch (++turns) {
-      case 1:
-        urgent = submit(onStick(), {.qos = QoS::userInteractive}, [&](Turn&) {
-          hasUrgentRun = true;
-          return Next::done();
-        });
-        awaitLines();
-        break;
-      case 2: {
-        EXPECT_TRUE(hasUrgentRun);
-        other = std::thread([&] {
-          session = begin(stickFile, {}, QoS::userInteractive);
-          session->endAccessing();
-        });
-        awaitRequests(*DiskAccessGuard(begin(stickFile))->diskData(), 1);
-        break;
-      }
-      default:
-        other.join();
+    if (++turns == 1) {
+      urgent = submit(onStick(), {.qos = QoS::userInteractive}, [&](Turn&) {
+        hasUrgentRun = true;
         return Next::done();
+      });
+      awaitLines();
+    } else if (turns == 2) {
+      EXPECT_TRUE(hasUrgentRun);
+      session = std::thread([&] { begin(stickFile, {}, QoS::userInteractive)->endAccessing(); });
+      awaitRequests(*DiskAccessGuard(begin(stickFile))->diskData(), 1);
+    } else {
+      session.join();
+      return Next::done();
     }
     EXPECT_FALSE(turn.isOver());
     now_ = now_.load() + Turn::maxTime;
@@ -188,26 +138,24 @@ TEST_F(DiskReadingQueueTest, AMoreUrgentReaderWaitsForOneTurn) {
   EXPECT_EQ(background->result(), Result::read);
   EXPECT_EQ(turns, 3);
   EXPECT_EQ(urgent->result(), Result::read);
-  EXPECT_TRUE(session);
 }
 
 TEST_F(DiskReadingQueueTest, AnUrgentReaderIsNotHeldUpByOneThatWaitsForAdmission) {
   const Session holder = begin(stickFile);
-  std::vector<int> order;
-  const auto note = [&](int number) {
-    return [&order, number](Turn&) {
-      order.push_back(number);
-      return Next::done();
-    };
-  };
-  const Task background = submit(onStick(), {.qos = QoS::background}, note(2));
+  bool hasUrgentRun = false;
+  const Task background = submit(onStick(), {.qos = QoS::background}, [&](Turn& turn) {
+    EXPECT_TRUE(hasUrgentRun);
+    return done(turn);
+  });
   awaitRequests(*holder->diskData(), 1);
-  const Task urgent = submit(onStick(), {.qos = QoS::userInteractive}, note(1));
+  const Task urgent = submit(onStick(), {.qos = QoS::userInteractive}, [&](Turn& turn) {
+    hasUrgentRun = true;
+    return done(turn);
+  });
   awaitRequests(*holder->diskData(), 2);
   holder->endAccessing();
   EXPECT_EQ(urgent->result(), Result::read);
   EXPECT_EQ(background->result(), Result::read);
-  EXPECT_EQ(order, (std::vector{1, 2}));
 }
 
 TEST_F(DiskReadingQueueTest, LowClassesGiveWayToOtherPrograms) {
@@ -247,18 +195,17 @@ TEST_F(DiskReadingQueueTest, ATaskOnTheMainQueueHasThePlaceThere) {
 TEST_F(DiskReadingQueueTest, ABlockedMainQueueKeepsNoPlace) {
   Platform::Testing::FakeMainQueue mainQueue;
   const auto executor = std::make_shared<Basalt::MainQueueExecutor>(mainQueue);
-  const Task onMain = submit(onStick(), {.executor = executor}, [](Turn&) { return Next::done(); });
+  const Task onMain = submit(onStick(), {.executor = executor}, done);
   awaitLines();
   // The main thread waits for that very disk.
   DiskAccessGuard{begin(stickFile)};
-  EXPECT_EQ(submit(onStick(), [](Turn&) { return Next::done(); })->result(), Result::read);
+  EXPECT_EQ(submit(onStick(), done)->result(), Result::read);
   mainQueue.runWhile([&] { return !onMain->hasEnded(); });
   EXPECT_EQ(onMain->result(), Result::read);
   // One that is put off can be stopped, and the block that comes late does nothing.
   std::stop_source source;
-  const Task stopped = submit(onStick(), {.stop = source.get_token(), .executor = executor},
-                              [](Turn&) { return Next::done(); });
-  EXPECT_EQ(submit(onStick(), [](Turn&) { return Next::done(); })->result(), Result::read);
+  const Task stopped = submit(onStick(), {.stop = source.get_token(), .executor = executor}, done);
+  EXPECT_EQ(submit(onStick(), done)->result(), Result::read);
   source.request_stop();
   mainQueue.runWhile([&] { return !stopped->hasEnded(); });
   EXPECT_EQ(stopped->result(), Result::stopped);
@@ -286,7 +233,7 @@ class LateExecutor final : public Basalt::Executor {
 
 TEST_F(DiskReadingQueueTest, AnExecutorThatIsAlwaysLateKeepsAPlaceNoLongerThanATurn) {
   const auto executor = std::make_shared<LateExecutor>();
-  const Task late = submit(onStick(), {.executor = executor}, [](Turn&) { return Next::done(); });
+  const Task late = submit(onStick(), {.executor = executor}, done);
   std::chrono::steady_clock::duration kept{};
   for (int offer = 0; offer < 6; ++offer) {
     Basalt::Block block = executor->next();
@@ -301,111 +248,84 @@ TEST_F(DiskReadingQueueTest, AnExecutorThatIsAlwaysLateKeepsAPlaceNoLongerThanAT
 }
 
 TEST_F(DiskReadingQueueTest, AnswersAStopAtOnceInEachState) {
+  const auto stopWhen = [&](ScriptedTask::Run run, auto isReady) {
+    std::stop_source source;
+    const Task task = submit(onStick(), {.stop = source.get_token()}, std::move(run));
+    isReady();
+    source.request_stop();
+    return task;
+  };
   std::stop_source before;
   before.request_stop();
-  const auto never = [](Turn&) {
-    ADD_FAILURE() << "it was stopped";
-    return Next::done();
-  };
   EXPECT_EQ(submit(onStick(), {.stop = before.get_token()}, never)->result(), Result::stopped);
 
-  std::stop_source inLine;
   const Holder holder = holdStick();
-  const Task waiting = submit(onStick(), {.stop = inLine.get_token()}, never);
-  awaitLines();
-  inLine.request_stop();
-  EXPECT_EQ(waiting->result(), Result::stopped);
+  EXPECT_EQ(stopWhen(never, [&] { awaitLines(); })->result(), Result::stopped);
   holder.letGo();
   awaitFreeStick();
 
-  std::stop_source inAdmission;
   const Session session = begin(stickFile);
-  const Task applying = submit(onStick(), {.stop = inAdmission.get_token()}, never);
-  awaitRequests(*session->diskData(), 1);
-  inAdmission.request_stop();
-  EXPECT_EQ(applying->result(), Result::stopped);
+  EXPECT_EQ(stopWhen(never, [&] { awaitRequests(*session->diskData(), 1); })->result(),
+            Result::stopped)
+      << "in admission";
   session->endAccessing();
   awaitFreeStick();
 
-  std::stop_source inTurn;
   std::latch isIn(1);
   std::latch mayLeave(1);
-  const Task running = submit(onStick(), {.stop = inTurn.get_token()}, [&](Turn& turn) {
+  const auto readOn = [&](Turn& turn) {
     isIn.count_down();
     while (!turn.isOver()) std::this_thread::yield();
     mayLeave.wait();
     return Next::again();
-  });
-  isIn.wait();
-  inTurn.request_stop();
+  };
+  const Task running = stopWhen(readOn, [&] { isIn.wait(); });
   unmount(stickVolume);
   mayLeave.count_down();
   EXPECT_EQ(running->result(), Result::stopped) << "the first reason counts";
 }
 
 TEST_F(DiskReadingQueueTest, ASlowResultKeepsNoTimeOutWaiting) {
-  struct SlowToEnd final : DiskReadingTask {
-    std::latch isTold{1};
-    std::latch mayEnd{1};
-    DiskReadingNext run(Turn&) override { return Next::done(); }
-    void didEnd(Result) override {
-      isTold.count_down();
-      mayEnd.wait();
-    }
-  };
   const Holder holder = holdStick();
-  const auto slow = std::make_shared<SlowToEnd>();
-  queue_->submit(slow, onStick(), {.accessWaitingTimeout = 0.001});
-  slow->isTold.wait();
-  const Task other = submit(
-      onStick(), {.accessWaitingTimeout = 0.001, .executor = Basalt::globalConcurrentQueue()},
-      [](Turn&) { return Next::done(); });
+  std::latch isTold(1);
+  std::latch mayEnd(1);
+  queue_->read({onStick()}, {.accessWaitingTimeout = 0.001}, {},
+               [&](const DiskReadingFile&, DiskReadingResult) {
+                 isTold.count_down();
+                 mayEnd.wait();
+               });
+  isTold.wait();
+  const Task other =
+      submit(onStick(),
+             {.accessWaitingTimeout = 0.001, .executor = Basalt::globalConcurrentQueue()}, never);
   EXPECT_EQ(other->result(), Result::timedOut);
-  slow->mayEnd.count_down();
+  mayEnd.count_down();
   holder.letGo();
 }
 
 TEST_F(DiskReadingQueueTest, SaysWhyNothingWasRead) {
   const Session session = begin(stickFile);
-  const auto never = [](Turn&) {
-    ADD_FAILURE();
-    return Next::done();
-  };
   for (const double timeout : {-1.0, 0.0, 0.001})
     EXPECT_EQ(submit(onStick(), {.accessWaitingTimeout = timeout}, never)->result(),
               Result::timedOut);
   const Task lost = submit(onStick(), never);
   const Task lostLater = submit({.url = stickFile}, never);
-  const Task kept = submit({.url = homeFile}, [](Turn&) { return Next::done(); });
-  EXPECT_EQ(kept->result(), Result::read);
+  EXPECT_EQ(submit({.url = homeFile}, done)->result(), Result::read);
   unmount(stickVolume);
   EXPECT_EQ(lost->result(), Result::vanished);
   EXPECT_NE(lostLater->result(), Result::read);
   session->endAccessing();
   volumes_.setLookupError(Platform::PlatformError("Test", 1));
   EXPECT_EQ(submit({.url = homeFile}, never)->result(), Result::unknownVolume);
-  EXPECT_EQ(submit({.url = homeFile, .volumeURL = homeVolume}, {.accessWaitingTimeout = 0},
-                   [](Turn&) { return Next::done(); })
-                ->result(),
-            Result::read)
+  EXPECT_EQ(submit(on(homeVolume), {.accessWaitingTimeout = 0}, done)->result(), Result::read)
       << "a free disk makes nobody wait";
 }
 
 TEST_F(DiskReadingQueueTest, AVolumeThatBecomesKnownIsCountedOnItsDisk) {
-  const auto onArchive = [&](ScriptedTask::Run run) {
-    return submit({.url = archiveVolume, .volumeURL = archiveVolume}, std::move(run));
-  };
-  std::latch mayGo(1);
-  std::latch isIn(1);
-  const Task holder = onArchive([&](Turn&) {
-    isIn.count_down();
-    mayGo.wait();
-    return Next::done();
-  });
-  isIn.wait();
+  const Holder holder = hold(on(archiveVolume));
   EXPECT_FALSE(queue_->diskOfVolume(archiveVolume));
   std::string disk;
-  const Task waiting = onArchive([&](Turn&) {
+  const Task waiting = submit(on(archiveVolume), [&](Turn&) {
     disk = *DiskAccessGuard(manager_->beginAccessingURL(archiveVolume, "test", QoS::utility, false,
                                                         {}, archiveVolume))
                 ->diskInfo()
@@ -416,16 +336,15 @@ TEST_F(DiskReadingQueueTest, AVolumeThatBecomesKnownIsCountedOnItsDisk) {
   plugDisk("HDD-1", "sda1", "Rotational", archiveVolume);
   volumes_.mount({.url = archiveVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
   EXPECT_TRUE(queue_->diskOfVolume(archiveVolume));
-  mayGo.count_down();
+  holder.letGo();
   EXPECT_EQ(waiting->result(), Result::read);
-  EXPECT_EQ(holder->result(), Result::read);
   EXPECT_EQ(disk, "HDD-1");
   EXPECT_EQ(queue_->diskOfVolume(archiveVolume)->uniqueID(), "HDD-1");
 }
 
 TEST_F(DiskReadingQueueTest, DestructionAnswersEverythingAndWaitsForCallbacks) {
   const Session session = begin(stickFile);
-  const Task applying = submit(onStick(), [](Turn&) { return Next::done(); });
+  const Task applying = submit(onStick(), done);
   awaitRequests(*session->diskData(), 1);
   std::latch isIn(1);
   bool hasLeft = false;
@@ -449,8 +368,8 @@ TEST_F(DiskReadingQueueTest, DestructionAnswersEverythingAndWaitsForCallbacks) {
 TEST_F(DiskReadingQueueTest, ACallbackMaySubmitAndDestroy) {
   Task other;
   const Holder holder = holdStick();
-  const Task task = submit({.url = homeFile, .volumeURL = homeVolume}, [&](Turn&) {
-    other = submit(onStick(), [](Turn&) { return Next::done(); });
+  const Task task = submit(on(homeVolume), [&](Turn&) {
+    other = submit(onStick(), done);
     holder.letGo();
     EXPECT_EQ(other->result(), Result::read);
     queue_.reset();
@@ -463,7 +382,7 @@ TEST_F(DiskReadingQueueTest, AForkedChildIsAnsweredWithinTheCall) {
   const Holder holder = holdStick();
   const pid_t child = ::fork();
   if (child == 0) {
-    const Task task = submit(onStick(), [](Turn&) { return Next::done(); });
+    const Task task = submit(onStick(), done);
     bool isStopped = task->hasEnded() && task->result() == Result::stopped;
     queue_->read({onStick()}, {}, {}, [&](const DiskReadingFile&, DiskReadingResult result) {
       isStopped = isStopped && result == Result::stopped;

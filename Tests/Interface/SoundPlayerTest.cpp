@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <gst/app/gstappsink.h>
 #include <gtest/gtest.h>
-#include <signal.h>
 #include <stdlib.h>
 
 #include <algorithm>
@@ -17,7 +16,6 @@
 #include <Varnel/Platform/Generic/BackgroundSoundPlayer.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/Sounds/GStreamer/Output.h>
-#include <Varnel/Platform/Testing/CapturedOutput.h>
 
 namespace Varnel {
 namespace {
@@ -91,16 +89,6 @@ std::string bytesOf(Sound sound) {
   return std::move(bytes).str();
 }
 
-// Of the calling thread.
-std::vector<int> blockedSignals() {
-  sigset_t blocked;
-  ::pthread_sigmask(SIG_BLOCK, nullptr, &blocked);
-  std::vector<int> signals;
-  for (int signal = 1; signal <= SIGRTMAX; ++signal)
-    if (::sigismember(&blocked, signal) == 1) signals.push_back(signal);
-  return signals;
-}
-
 // An engine whose sounds are recorded, one recording a sound played.
 class SoundPlayerTest : public ::testing::Test {
  protected:
@@ -172,21 +160,6 @@ TEST_F(SoundPlayerTest, DamagedFilesAreSilentAndACutOneEndsEarly) {
   ASSERT_TRUE(drainUntilIdle());
   EXPECT_GT(recordings.back()->seconds(), 0.5);
   EXPECT_LT(recordings.back()->seconds(), 1.35);
-}
-
-TEST_F(SoundPlayerTest, TheModuleIsFoundAndPlaysToTheEndWithoutAnAudioDevice) {
-  Platform::Testing::CapturedSystemLog systemLog;
-  const auto system = Platform::Linux::makeSoundPlayer(systemLog, *mainQueue);
-  EXPECT_EQ(system->load("no sound at all"), nullptr);
-  const auto signalsBefore = blockedSignals();
-  SoundEngine real({.player = *system,
-                    .path = [](Sound sound) { return VARNEL_SOUNDS "/" + sound.fileName(); }});
-  real.play(Sound::purchase);
-  ASSERT_TRUE(real.currentSound());
-  EXPECT_TRUE(real.currentSound()->isPlaying());
-  EXPECT_TRUE(Tests::drainUntil(*mainQueue, [&] { return !real.currentSound(); }));
-  EXPECT_EQ(systemLog.text(), "");
-  EXPECT_EQ(blockedSignals(), signalsBefore) << "some sinks change those of the thread they are on";
 }
 
 }  // namespace

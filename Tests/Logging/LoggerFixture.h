@@ -9,6 +9,8 @@
 
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Logging/Logger.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Platform/Testing/FakeAppendFiles.h>
 #include <Varnel/Platform/Testing/FakeTimeZones.h>
@@ -28,8 +30,9 @@ class LoggerFixture : public testing::Test {
   /// Makes the logger on first use; what it prints at start is left out of `printed()`.
   Logger& logger() {
     if (!logger_) {
-      logger_ = std::make_unique<Logger>(Logger::Ports{files, clock, output, zones, user, locale},
-                                         "com.quennel.Test");
+      logger_ = std::make_unique<Logger>(
+          Logger::Ports{files, clock, *privateFiles, output, zones, user, locale},
+          "com.quennel.Test");
       startSize_ = output.text().size();
     }
     return *logger_;
@@ -46,6 +49,7 @@ class LoggerFixture : public testing::Test {
 
   Tests::TemporaryFolder home;
   Platform::Testing::FakeAppendFiles files;
+  const std::unique_ptr<Platform::PrivateFiles> privateFiles = Platform::POSIX::makePrivateFiles();
   Platform::Testing::SimulatedClock clock{Platform::Date(
       std::chrono::sys_days(std::chrono::year(2026) / 3 / 14) + std::chrono::seconds(33999))};
   Platform::Testing::CapturedOutput output;

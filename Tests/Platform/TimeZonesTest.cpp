@@ -160,11 +160,7 @@ TEST(TimeZones, TakeEveryFormOfTheVariableAndAnythingElseForUTC) {
   EXPECT_EQ(DateFormatter("z VV", "en_US", *system).string(summer), "EDT America/New_York");
   EXPECT_EQ(DateFormatter("z", "en_US", *system).string(summer + days(183)), "EST");
   const auto berlin = system->zone("Europe/Berlin");
-  for (const Date edge : {Date::min(), Date::max()}) EXPECT_LT(berlin->offsetAt(edge).fromUTC, 24h);
   EXPECT_GT(berlin->nextChange(Date::min()), sys_days(1800y / January / 1));
-  EXPECT_EQ(berlin->nextChange(Date::max()), std::nullopt);
-  const Date change = *berlin->nextChange(sys_days(1949y / January / 1));
-  EXPECT_NE(berlin->offsetAt(change - 1us).fromUTC, berlin->offsetAt(change).fromUTC);
 }
 
 TEST(TimeZones, ADamagedFileIsNoZone) {

@@ -300,9 +300,11 @@ TEST_F(Orvane, MakesTheFoldersOfItsStoresForItsUserAlone) {
   moreEnvironment = {"/bin/sh", "-c", "umask 0; exec \"$@\"", "sh"};
   const std::vector<std::string> plan = {"remind", "tomorrow", "--found", "1", "--selected", "0"};
   EXPECT_EQ(run(plan).status, 0);
-  for (const char* made : {".local", ".local/state", ".local/state/com.quennel.Orvane2"})
+  for (const char* made : {".local", ".local/state", ".local/state/com.quennel.Orvane2", "Library",
+                           "Library/Logs/com.quennel.Orvane2"})
     EXPECT_EQ(fs::status(home.path(made)).permissions(), fs::perms::owner_all) << made;
   fs::remove_all(home.path(".local"));
+  fs::remove_all(home.path("Library"));
   if (::chown(home.path().c_str(), 1234, static_cast<gid_t>(-1)) != 0) GTEST_SKIP() << "not root";
   EXPECT_EQ(run(plan).status, 1);
   EXPECT_FALSE(fs::exists(home.path(".local")));

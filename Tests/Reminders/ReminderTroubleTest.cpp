@@ -23,6 +23,7 @@ namespace {
 namespace fs = std::filesystem;
 using namespace std::chrono_literals;
 using ::testing::AllOf;
+using ::testing::ContainsRegex;
 using ::testing::HasSubstr;
 using ::testing::IsEmpty;
 using ::testing::Not;
@@ -104,7 +105,7 @@ const Trouble troubles[] = {
      },
      [](Home& home) { fs::remove(home.state / "filler"); }, "full", Trouble::waits, Trouble::ofAll},
     {"read-only", [](Home& home) { home.protect(true); }, [](Home& home) { home.protect(false); },
-     "ead", Trouble::waits, Trouble::ofRoot},
+     "ead|Permission denied", Trouble::waits, Trouble::ofRoot},
     {"a link",
      [](Home& home) {
        fs::copy(home.store, home.aside);
@@ -140,7 +141,7 @@ void orvaneSaysSo(Home& home, const Trouble& trouble) {
     const int status = home.orvane(std::string("remind every ") + period);
     EXPECT_EQ(status, isReplaced ? 0 : 1) << period;
     EXPECT_THAT(home.errors, HasSubstr(isReplaced ? "" : "orvane: the "));
-    EXPECT_THAT(home.errors, HasSubstr(trouble.complaint));
+    EXPECT_THAT(home.errors, ContainsRegex(trouble.complaint));
   }
   EXPECT_EQ(fs::exists(home.store.string() + ".damaged"), isReplaced);
   if (isLeftAlone) {
@@ -177,7 +178,7 @@ void whatIsDueComesLater(Home& home, const Trouble& trouble) {
     return;
   }
   EXPECT_TRUE(!isKnown || process.scheduled().size() == 1);
-  EXPECT_THAT(process.log.text(), HasSubstr(trouble.complaint));
+  EXPECT_THAT(process.log.text(), ContainsRegex(trouble.complaint));
   EXPECT_THAT(process.log.text(), Not(IsEmpty()));
   trouble.end(home);
   for (auto date = start + week + 2min; date < start + 2 * week; date += 12h) {

@@ -11,7 +11,6 @@
 #include <Tests/Reminders/CenterProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/SQLite/SQLiteDatabase.h>
-#include <Varnel/Platform/Testing/FakeUserNotificationCenter.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -300,35 +299,6 @@ TEST_F(ScheduledNotificationCenterTest, AnotherProcessTakesOverWhenTheDelivererE
   EXPECT_THAT(process.server.history(), SizeIs(1));
 }
 
-TEST_F(ScheduledNotificationCenterTest, CallsTogetherAreDoneAsOneAndNothingIsShownBefore) {
-  process.listen();
-  Testing::FakeUserNotificationCenter fake;
-  const auto listener = std::make_shared<Testing::Listener>();
-  fake.setDelegate(listener);
-  const auto check = [](UserNotificationCenter& center, const auto& shownCount) {
-    EXPECT_FALSE(center.scheduleNotification(weekly()));
-    const auto change = [&](const std::function<UserNotificationCenter::Failure()>& end) {
-      return center.change([&]() -> UserNotificationCenter::Failure {
-        EXPECT_FALSE(center.removeScheduledNotification(weekly()));
-        EXPECT_THAT(center.scheduledNotifications().valueOr({weekly()}), IsEmpty());
-        EXPECT_FALSE(center.deliverNotification({.title = "Now"}));
-        EXPECT_EQ(shownCount(), 0u);
-        return end();
-      });
-    };
-    EXPECT_TRUE(change([] { return PlatformError("Test", 1); }));
-    EXPECT_THROW(static_cast<void>(change([]() -> UserNotificationCenter::Failure { throw 1; })),
-                 int);
-    EXPECT_THAT(center.scheduledNotifications().valueOr({}), ElementsAre(weekly()));
-    EXPECT_EQ(shownCount(), 0u);
-    EXPECT_FALSE(change([] { return std::nullopt; }));
-    EXPECT_THAT(center.scheduledNotifications().valueOr({weekly()}), IsEmpty());
-    EXPECT_EQ(shownCount(), 1u);
-  };
-  check(process.center, [this] { return process.server.history().size(); });
-  check(fake, [&] { return fake.presented.size(); });
-}
-
 // Only a delivery that was promised makes a program without a delegate show banners.
 TEST_F(ScheduledNotificationCenterTest, ADeliveryThatFailsMakesNoDeliverer) {
   {
@@ -359,27 +329,6 @@ TEST_F(ScheduledNotificationCenterTest, ADeliveryThatFailsMakesNoDeliverer) {
     EXPECT_FALSE(process.center.deliverNotification({.title = "Never"}));
     return process.center.removeDeliveredNotification({.title = "Never"});
   }));
-  EXPECT_THAT(process.server.history(), SizeIs(1));
-}
-
-TEST_F(ScheduledNotificationCenterTest, AnIdentifierStandsForOneNotificationOfEachList) {
-  process.listen();
-  process.schedule(weekly());
-  auto again = weekly(start + 1h);
-  again.title = "Again";
-  process.schedule(again);
-  process.schedule({.title = "One", .deliveryDate = start + 2h});
-  process.schedule({.title = "Two", .deliveryDate = start + 2h});
-  const auto scheduled = process.scheduled();
-  ASSERT_THAT(scheduled, SizeIs(3));
-  EXPECT_EQ(scheduled.at(0), again);
-  EXPECT_FALSE(
-      process.center.removeScheduledNotification({.title = "One", .deliveryDate = start + 2h}));
-  EXPECT_THAT(process.scheduled(), SizeIs(2));
-  EXPECT_FALSE(process.center.removeScheduledNotification({.identifier = "weekly"}));
-  EXPECT_THAT(process.scheduled(), SizeIs(1));
-  // Without a date, or with one that is past, it is due at once.
-  process.schedule({.identifier = "now", .title = "Now"});
   EXPECT_THAT(process.server.history(), SizeIs(1));
 }
 

@@ -20,6 +20,12 @@ using ::testing::ElementsAre;
 using ::testing::IsEmpty;
 using ::testing::SizeIs;
 
+auto sameAs(const UserNotification& notification) {
+  return testing::Truly([=](const UserNotification& other) {
+    return Platform::isSameNotification(notification, other);
+  });
+}
+
 class UserNotificationRouterTest : public ::testing::Test {
  protected:
   Router::Handler note(std::string name) {
@@ -117,11 +123,11 @@ TEST_F(UserNotificationRouterTest, BothRemovalsTakeTheirCandidatesFromTheDeliver
   EXPECT_THAT(*center.scheduledNotifications(), SizeIs(2));
   for (const auto& each : {notification, other}) EXPECT_FALSE(center.deliverNotification(each));
   EXPECT_FALSE(router.removeScheduledNotifications("a"));
-  EXPECT_THAT(*center.scheduledNotifications(), ElementsAre(other));
+  EXPECT_THAT(*center.scheduledNotifications(), ElementsAre(sameAs(other)));
   EXPECT_THAT(*center.deliveredNotifications(), SizeIs(2));
   EXPECT_FALSE(router.removeDeliveredNotifications("a"));
-  EXPECT_THAT(*center.deliveredNotifications(), ElementsAre(other));
-  EXPECT_THAT(*center.scheduledNotifications(), ElementsAre(other));
+  EXPECT_THAT(*center.deliveredNotifications(), ElementsAre(sameAs(other)));
+  EXPECT_THAT(*center.scheduledNotifications(), ElementsAre(sameAs(other)));
   center.faults->plan(Platform::Testing::Fault::fails, 1);
   EXPECT_TRUE(router.removeDeliveredNotifications("b"));
 }
@@ -132,8 +138,6 @@ TEST_F(UserNotificationRouterTest, IsHeldWeakly) {
     EXPECT_TRUE(center.delegate());
   }
   EXPECT_FALSE(center.delegate());
-  EXPECT_FALSE(center.deliverNotification(notification));
-  EXPECT_THAT(center.presented, IsEmpty());
 }
 
 TEST_F(UserNotificationRouterTest, AnyThreadMayRegisterWhileEventsCome) {

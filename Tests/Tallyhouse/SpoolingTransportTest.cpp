@@ -6,6 +6,7 @@
 #include <Tests/Support/Crew.h>
 #include <Tests/Tallyhouse/SpoolFixture.h>
 #include <Varnel/Platform/Testing/FakeHTTPClient.h>
+#include <Varnel/Platform/Testing/FaultyPrivateFiles.h>
 #include <Varnel/Tallyhouse/AnalyticsTracker.h>
 
 namespace Tallyhouse {
@@ -159,6 +160,40 @@ TEST_F(SpoolingTransportTest, ALockedFileDelaysADrainThatIsGranted) {
   lock.reset();
   EXPECT_TRUE(transport->drain(30s));
   EXPECT_EQ(http.posts().size(), 1u);
+}
+
+TEST_F(SpoolingTransportTest, NoCallThatFailsLosesAnEvent) {
+  using Varnel::Platform::Testing::Fault;
+  for (const Fault fault : {Fault::fails, Fault::absent}) {
+    const std::size_t struck = sweepFaults(fault, [&](const auto& faults) {
+      std::filesystem::remove_all(std::filesystem::path(path()).parent_path());
+      Varnel::Platform::Testing::FaultyPrivateFiles faulty(*files);
+      Varnel::Platform::Testing::FakeHTTPClient server;
+      faulty.faults = server.faults = faults;
+      const auto run = [&](std::initializer_list<const char*> actions) {
+        const std::shared_ptr<SpoolingTransport> transport = SpoolingTransport::make(
+            {clock, server, faulty, log}, {.endpoint = *URL::parse("https://h.example/batch"),
+                                           .trackingID = "QN-1",
+                                           .clientID = "12.34",
+                                           .spoolPath = path()});
+        AnalyticsTracker tracker({clock}, transport, Consent::granted);
+        for (const char* action : actions) track(tracker, action);
+        return transport->drain(actions.size() == 0 ? 30s : 20ms);
+      };
+      const bool isDelivered = run({"First", "Second"});
+      const std::size_t posts = server.posts().size();
+      faults->mend();
+      clock.advance(24h);
+      EXPECT_TRUE(run({}));
+      EXPECT_TRUE(!isDelivered || server.posts().size() == posts)
+          << "what was said to be delivered";
+      std::string bodies;
+      for (const HTTPPost& post : server.posts()) bodies += post.body;
+      for (const char* event : {"ea=First", "ea=Second"})
+        EXPECT_NE(bodies.find(event), std::string::npos) << event << ", call " << faults->calls();
+    });
+    EXPECT_GT(struck, 20u);
+  }
 }
 
 TEST_F(SpoolingTransportTest, ADrainEndsWhenTheServerFails) {

@@ -84,10 +84,10 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
 
  private:
   using Event = void (NotificationServer::Observer::*)(const std::string& token);
-
   struct Shown {
     std::optional<BannerAddress> address = std::nullopt;  ///< Once the server has answered.
     std::string activationToken = {};                     ///< Comes before the click.
+    bool isExpired = false;
   };
 
   void tell(Event event, const std::string& token) const {
@@ -198,7 +198,10 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     const auto taken = take(address);
     if (!taken) return;
     // The user may bring an expired banner back from the server's history.
-    if (reason == expired) shown_.insert_or_assign(taken->first, taken->second);
+    if (reason == expired) {
+      Shown& kept = shown_.insert_or_assign(taken->first, taken->second).first->second;
+      kept.isExpired = true;
+    }
     using Observer = NotificationServer::Observer;
     tell(reason == dismissedByUser ? &Observer::bannerDismissed : &Observer::bannerGone,
          taken->first);
@@ -207,12 +210,13 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
   // What is on its way to the server that has ended is answered by the bus.
   void replaceServer(const std::string& before, bool isThere) {
     std::vector<std::string> gone;
-    for (const auto& [token, shown] : shown_)
-      if (shown.address && shown.address->server == before) gone.push_back(token);
-    for (const std::string& token : gone) {
-      shown_.erase(token);
-      tell(&NotificationServer::Observer::bannerGone, token);
-    }
+    std::erase_if(shown_, [&](const auto& each) {
+      const Shown& shown = each.second;
+      if (!shown.address || shown.address->server != before) return false;
+      if (!shown.isExpired) gone.push_back(each.first);
+      return true;
+    });
+    for (const std::string& token : gone) tell(&NotificationServer::Observer::bannerGone, token);
     const auto told = observer.lock();
     if (told && isThere) told->serverAppeared();
   }

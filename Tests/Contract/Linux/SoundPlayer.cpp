@@ -1,9 +1,11 @@
 // SPDX-License-Identifier: MIT
 #include <Tests/Contract/SoundPlayerContract.h>
 
+#include <signal.h>
 #include <stdlib.h>
 
 #include <string_view>
+#include <vector>
 
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
@@ -14,6 +16,16 @@ namespace {
 
 using namespace std::string_view_literals;
 
+// Of the calling thread.
+std::vector<int> blockedSignals() {
+  sigset_t blocked;
+  ::pthread_sigmask(SIG_BLOCK, nullptr, &blocked);
+  std::vector<int> signals;
+  for (int signal = 1; signal <= SIGRTMAX; ++signal)
+    if (::sigismember(&blocked, signal) == 1) signals.push_back(signal);
+  return signals;
+}
+
 class LinuxWorld final : public SoundPlayerWorld {
  public:
   LinuxWorld() {
@@ -21,6 +33,10 @@ class LinuxWorld final : public SoundPlayerWorld {
     // Whatever this machine has to play sounds on stays silent.
     ::setenv("PULSE_SERVER", "unix:/nonexistent", 1);
     ::setenv("PULSE_CLIENTCONFIG", "/dev/null", 1);
+  }
+  ~LinuxWorld() override {
+    EXPECT_EQ(log_.text(), "");
+    EXPECT_EQ(blockedSignals(), signals_) << "some sinks change those of the thread they are on";
   }
   SoundPlayer& player() override { return *player_; }
   // 400 samples of silence, 8000 a second.
@@ -38,6 +54,7 @@ class LinuxWorld final : public SoundPlayerWorld {
   }
 
  private:
+  const std::vector<int> signals_ = blockedSignals();
   const std::unique_ptr<MainQueue> queue_ = Linux::makeMainQueue();
   Testing::CapturedSystemLog log_;
   const std::unique_ptr<SoundPlayer> player_ = Linux::makeSoundPlayer(log_, *queue_);
