@@ -12,6 +12,10 @@
 namespace Basalt {
 namespace {
 
+// A pool of our own, small as it is: the one among the libraries that are linked anyway is GLib's,
+// which a system without GLib lacks, and whose threads would neither have our names nor leave the
+// host's signals alone. The parallel algorithms of the standard library need a library of their
+// own.
 class ConcurrentQueue final : public Executor {
  public:
   void execute(Block block) override {

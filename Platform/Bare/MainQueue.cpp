@@ -4,8 +4,11 @@
 #include <fcntl.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <array>
+#include <chrono>
 #include <condition_variable>
+#include <cstddef>
 #include <deque>
 #include <mutex>
 #include <thread>
@@ -87,13 +90,16 @@ class OwnQueue final : public MainQueue {
 
   bool runWhile(const std::function<bool()>& condition,
                 std::chrono::milliseconds patience) override {
-    const auto end = std::chrono::steady_clock::now() + patience;
-    while (condition()) {
-      {
-        std::unique_lock lock(mutex_);
-        posted_.wait_until(lock, end, [this] { return !blocks_.empty(); });
+    constexpr std::chrono::milliseconds longest = std::chrono::years(1);
+    const auto end = std::chrono::steady_clock::now() + std::min(patience, longest);
+    for (std::size_t due = waitingBlocks(); condition(); runNext()) {
+      if (due > 0) {
+        --due;
+        continue;
       }
-      if (!runNext() || std::chrono::steady_clock::now() >= end) return !condition();
+      if (std::chrono::steady_clock::now() >= end) return false;
+      std::unique_lock lock(mutex_);
+      posted_.wait_until(lock, end, [this] { return !blocks_.empty(); });
     }
     return true;
   }
@@ -111,6 +117,11 @@ class OwnQueue final : public MainQueue {
   }
 
  private:
+  std::size_t waitingBlocks() {
+    const std::lock_guard lock(mutex_);
+    return blocks_.size();
+  }
+
   bool runNext() {
     std::unique_lock lock(mutex_);
     if (blocks_.empty()) return false;

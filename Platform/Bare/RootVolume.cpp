@@ -6,6 +6,7 @@
 
 #include <Varnel/Platform/Bare/Adapters.h>
 #include <Varnel/Platform/Ports/VolumeCatalog.h>
+#include <Varnel/Platform/Values/SystemText.h>
 
 namespace Varnel::Platform::Bare {
 namespace {
@@ -16,6 +17,8 @@ class RootVolume final : public VolumeCatalog {
   std::vector<MountedVolume> mountedVolumes() override { return {{.url = root_}}; }
 
   Result<std::optional<URL>> volumeURL(const URL& url) override {
+    if (isCutShort(url.path()))
+      return PlatformError(std::make_error_code(std::errc::invalid_argument));
     struct stat status {};
     if (::lstat(url.path().c_str(), &status) != 0)
       return PlatformError(std::error_code(errno, std::generic_category()));

@@ -4,6 +4,8 @@
 #include <unicode/basictz.h>
 #include <unicode/tztrans.h>
 
+#include <algorithm>
+#include <cstdint>
 #include <cstdlib>
 #include <filesystem>
 #include <string_view>
@@ -17,10 +19,13 @@ namespace {
 
 using Handle = std::unique_ptr<icu::BasicTimeZone>;
 
-// ICU counts in milliseconds.
+// ICU counts in milliseconds, and not for ever.
 double millisecondsOf(Date date) {
-  return static_cast<double>(
-      std::chrono::floor<std::chrono::milliseconds>(date).time_since_epoch().count());
+  using namespace std::chrono;
+  constexpr Date first = sys_days(year(1) / January / 1);
+  constexpr Date last = sys_days(year(9999) / December / 31);
+  const auto time = floor<milliseconds>(std::clamp(date, first, last));
+  return static_cast<double>(time.time_since_epoch().count());
 }
 
 class ICUTimeZone final : public TimeZone {
@@ -41,9 +46,8 @@ class ICUTimeZone final : public TimeZone {
   std::optional<Date> nextChange(Date date) const override {
     icu::TimeZoneTransition change;
     if (!zone_->getNextTransition(millisecondsOf(date), false, change)) return std::nullopt;
-    const double time = change.getTime();
-    if (time >= millisecondsOf(Date::max())) return std::nullopt;
-    return Date(std::chrono::milliseconds(static_cast<std::int64_t>(time)));
+    const Date next{std::chrono::milliseconds(static_cast<std::int64_t>(change.getTime()))};
+    return next > date ? std::optional(next) : std::nullopt;
   }
 
  private:

@@ -96,14 +96,15 @@ NotificationDeliverer::Failure NotificationDeliverer::deliver() {
   // Where nothing is due, a schedule may still have to go on from a clock that was set back.
   if (duty_ == Duty::everything && !isBehind_)
     if (auto error = store_->claimDue(ports_.clock.now(), calendar())) return error;
-  if (lock_) {
+  const bool mayDeliver = lock_ && duty_ != Duty::nothing;
+  if (mayDeliver) {
     if (all = store_->deliveries(every); !all) return all.error();
     ask(*all);
     if (auto error = decide()) return error;
     if (all = store_->deliveries(every); !all) return all.error();
   }
   lookAhead(*all);
-  return banners_->follow(*all, lock_ != nullptr, maxOnTheirWay);
+  return banners_->follow(*all, mayDeliver, maxOnTheirWay);
 }
 
 // Where there is something to deliver. Succeeds also where somebody else is the deliverer.

@@ -44,7 +44,9 @@ std::string homeOr(const std::optional<std::string>& path, std::string_view fall
 class PasswdAccount final : public UserAccount {
  public:
   std::string homeFolder() const override {
-    return homeOr(environmentVariable("HOME"), realHomeFolder());
+    const auto home = environmentVariable("HOME");
+    // Whoever looks a user up may ask the network.
+    return home && home->front() == '/' ? homeOr(home, "/") : realHomeFolder();
   }
 
   std::string realHomeFolder() const override {

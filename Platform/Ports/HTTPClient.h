@@ -39,8 +39,8 @@ class VARNEL_API HTTPClient {
 
   /// Posts and waits for the answer: for some 30 seconds, or until `stop` is requested. The
   /// server's certificate must be good. Redirections are not followed. The final status, once it
-  /// has come, is the answer, whatever becomes of the content. A post whose answer got lost may have
-  /// arrived, even twice. One to this machine itself never goes through a proxy.
+  /// has come, is the answer, whatever becomes of the content. A post whose answer got lost may
+  /// have arrived, even twice. One to this machine itself never goes through a proxy.
   [[nodiscard]] virtual Result<HTTPResponse, HTTPFailure> post(const HTTPPost& request,
                                                                std::stop_token stop) = 0;
 };

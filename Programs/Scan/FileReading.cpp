@@ -14,7 +14,8 @@
 namespace Orvane {
 namespace {
 
-/// Files from this size on are read one after the other on an ordered disk.
+/// Files from this size on are read one after the other on an ordered disk, as its head would go
+/// back and forth between two. Less is read at once where the disk must work.
 constexpr std::uint64_t largeLength = 1024 * 1024;
 
 /// A turn that was over after fewer files and bytes than these was spent waiting for the disk.
@@ -63,25 +64,24 @@ class FileReading::DiskPass final {
     startPlacing();
   }
 
-  /// Reads the files from this one on. A disk that must work has one task: two would make its head
-  /// go back and forth between them. Until that shows, only large files have to come singly.
+  /// Reads the files from this one on. Where the disk admits it, the next small file is asked for
+  /// while one is read. That costs a head no way, and the disk may have none, whatever it says.
   void read(std::size_t begin, Stage stage) {
     stage_ = stage;
     begin_ = begin;
     const auto rest = files_.subspan(begin);
     nextSmall_ = begin;
     largeBegin_ = files_.size();
-    if (look_ == Look::rest && stage == Stage::byInode) {
-      const auto large =
-          std::stable_partition(rest.begin(), rest.end(),
-                                [&](const Candidate& file) { return sizeOf(file) < largeLength; });
+    if (look_ == Look::rest && disk_.isOrdered && disk_.places > 1) {
+      const std::uint64_t max = stage == Stage::byPlace ? ContentReader::blockLength : largeLength;
+      const auto large = std::stable_partition(
+          rest.begin(), rest.end(), [&](const Candidate& file) { return sizeOf(file) < max; });
       largeBegin_ = begin + static_cast<std::size_t>(large - rest.begin());
     }
     nextLarge_ = largeBegin_;
     isLargeTaken_ = false;
     isInterrupted_ = false;
-    const std::size_t max = stage == Stage::byPlace ? 1 : disk_.places;
-    running_ = static_cast<unsigned>(std::min(max, rest.size()));
+    running_ = static_cast<unsigned>(std::min<std::size_t>(disk_.places, rest.size()));
     startReading(running_);
   }
 

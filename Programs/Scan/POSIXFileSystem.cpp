@@ -1,23 +1,17 @@
 // SPDX-License-Identifier: MIT
 #include <dirent.h>
 #include <fcntl.h>
-#include <linux/fiemap.h>
-#include <linux/fs.h>
-#include <linux/openat2.h>
-#include <sys/ioctl.h>
 #include <sys/stat.h>
-#include <sys/syscall.h>
 #include <unistd.h>
 
 #include <algorithm>
-#include <array>
 #include <cerrno>
 #include <climits>
-#include <cstring>
 #include <utility>
 #include <vector>
 
 #include <Scan/FileSystem.h>
+#include <Scan/SystemCalls.h>
 #include <Varnel/Platform/Ports/TracelessReader.h>
 
 namespace Orvane {
@@ -57,10 +51,7 @@ std::size_t endOfStep(std::string_view path, Stride stride) {
 int openStep(int folder, const std::string& path, int flags, Stride stride) {
   // In a path of one name, O_NOFOLLOW leaves nothing to follow.
   if (stride == Stride::oneName) return ::openat(folder, path.c_str(), flags | O_NOFOLLOW);
-  open_how how{};
-  how.flags = static_cast<unsigned>(flags);
-  how.resolve = RESOLVE_NO_SYMLINKS;
-  return static_cast<int>(::syscall(SYS_openat2, folder, path.c_str(), &how, sizeof how));
+  return openWithoutLinksAtOnce(folder, path.c_str(), flags);
 }
 
 /// Opens a path of any length, absolute or below the folder `base`, and follows no symbolic link in
@@ -72,8 +63,8 @@ Descriptor openWithoutLinks(int base, std::string_view path, int flags) {
     const std::size_t end = endOfStep(path, stride);
     const bool isLast = end == path.size();
     Descriptor next(openStep(base, std::string(path.substr(0, end)),
-                             (isLast ? flags : O_PATH | O_DIRECTORY) | O_CLOEXEC, stride));
-    // Kernels before 5.6 do not have the call for more than one name, some sandboxes forbid it.
+                             (isLast ? flags : openToPassThrough) | O_CLOEXEC, stride));
+    // Not every system has the call for more than one name, and some sandboxes forbid it.
     if (next.get() < 0 && stride == Stride::longest && (errno == ENOSYS || errno == EPERM)) {
       stride = Stride::oneName;
       continue;
@@ -89,19 +80,6 @@ FileStatus statusFrom(const struct stat& facts) {
   return {.identity = {.device = facts.st_dev, .inode = facts.st_ino},
           .size = static_cast<std::uint64_t>(facts.st_size),
           .modifiedAt = std::int64_t{facts.st_mtim.tv_sec} * 1'000'000'000 + facts.st_mtim.tv_nsec};
-}
-
-/// Opens what another program writes under a lease, once that has given the lease back: the system
-/// makes it. Only of a regular file is there nobody else to wait for.
-Descriptor openLeased(int folder, const char* name) {
-  const Descriptor found(::openat(folder, name, O_PATH | O_NOFOLLOW | O_CLOEXEC));
-  struct stat facts;
-  const bool isFile =
-      found.get() >= 0 && ::fstat(found.get(), &facts) == 0 && S_ISREG(facts.st_mode);
-  const std::string path = "/proc/self/fd/" + std::to_string(found.get());
-  Descriptor opened(isFile ? ::open(path.c_str(), O_RDONLY | O_CLOEXEC) : -1);
-  if (opened.get() < 0) errno = EAGAIN;
-  return opened;
 }
 
 class DescriptorFile final : public OpenFile {
@@ -127,19 +105,7 @@ class DescriptorFile final : public OpenFile {
     return statusFrom(facts);
   }
 
-  std::optional<std::uint64_t> place() override {
-    // Room for the head of the answer and the one extent that is asked for.
-    alignas(fiemap) std::array<std::byte, sizeof(fiemap) + sizeof(fiemap_extent)> answer{};
-    auto* const map = reinterpret_cast<fiemap*>(answer.data());
-    map->fm_length = FIEMAP_MAX_OFFSET;
-    map->fm_extent_count = 1;
-    if (::ioctl(descriptor_.get(), FS_IOC_FIEMAP, map) != 0 || map->fm_mapped_extents == 0)
-      return std::nullopt;
-    fiemap_extent extent;
-    std::memcpy(&extent, answer.data() + sizeof(fiemap), sizeof extent);
-    if (extent.fe_flags & (FIEMAP_EXTENT_UNKNOWN | FIEMAP_EXTENT_DELALLOC)) return std::nullopt;
-    return extent.fe_physical;
-  }
+  std::optional<std::uint64_t> place() override { return placeOf(descriptor_.get()); }
 
  private:
   Descriptor descriptor_;
@@ -167,7 +133,8 @@ class DescriptorFolder final : public OpenFolder {
   FileResult<std::unique_ptr<OpenFile>> open(const char* name, ReadingPlan plan) override {
     Descriptor descriptor(
         ::openat(number(), name, O_RDONLY | O_NONBLOCK | O_NOCTTY | O_NOFOLLOW | O_CLOEXEC));
-    if (descriptor.get() < 0 && errno == EAGAIN) descriptor = openLeased(number(), name);
+    if (descriptor.get() < 0 && errno == EAGAIN)
+      descriptor = Descriptor(openLeased(number(), name));
     if (descriptor.get() < 0) return lastError();
     // Without read-ahead, a cold disk reads only the parts.
     if (plan == ReadingPlan::parts) ::posix_fadvise(descriptor.get(), 0, 0, POSIX_FADV_RANDOM);

@@ -2,6 +2,7 @@
 #include <orvane/ReminderPlanner.h>
 
 #include <algorithm>
+#include <memory>
 #include <vector>
 
 #include <Varnel/Platform/Ports/MainQueue.h>
@@ -54,6 +55,21 @@ class PlanningCenter final : public UserNotificationCenter {
 
  private:
   UserNotificationCenter& center_;
+};
+
+// A reminder that is to be planned, as long as somebody holds this: the center may try again when
+// the user was told that it is not planned.
+struct Attempt final {
+  UserNotificationCenter& center;
+  const UserNotification& notification;
+  UserNotificationCenter::Failure failure;
+
+  static void make(const std::weak_ptr<Attempt>& attempt) {
+    const auto held = attempt.lock();
+    if (!held) return;
+    held->failure = held->center.scheduleNotification(held->notification);
+    if (held->failure) held->center.retryLater([attempt] { make(attempt); });
+  }
 };
 
 std::string reasonOf(const std::optional<Varnel::Platform::PlatformError>& failure) {
@@ -129,15 +145,11 @@ bool ReminderPlanner::planRegular(SchedulePeriodOption period,
 bool ReminderPlanner::plan(const UserNotification& notification) {
   repairPlan(parts_->service, console_);
   UserNotificationCenter& center = parts_->center;
-  Failure failure;
-  const std::function<void()> tryIt = [&] {
-    failure = center.scheduleNotification(notification);
-    if (failure) center.retryLater(tryIt);
-  };
-  tryIt();
-  awaitDesktop([&] { return failure.has_value(); });
+  const auto attempt = std::make_shared<Attempt>(Attempt{center, notification, {}});
+  Attempt::make(attempt);
+  awaitDesktop([&] { return attempt->failure.has_value(); });
   const auto planned = readPatiently(center, &UserNotificationCenter::scheduledNotifications);
-  if (!planned) failure = planned.error();
+  const Failure failure = planned ? attempt->failure : Failure(planned.error());
   if (planned && std::find(planned->begin(), planned->end(), notification) != planned->end())
     return true;
   console_.complain("the reminder is not planned: " + reasonOf(failure));

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/ApplicationContract.h>
+#include <Tests/Contract/MainLoopWorlds.h>
 
 #include <thread>
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/ClockContract.h>
+#include <Tests/Contract/MainLoopWorlds.h>
 
 #include <atomic>
 #include <thread>

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/DiskArbitrationContract.h>
+#include <Tests/Contract/DiskWorlds.h>
 
 #include <gmock/gmock.h>
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/MainQueueContract.h>
+#include <Tests/Contract/MainLoopWorlds.h>
 
 #include <gmock/gmock.h>
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/TimeZonesContract.h>
+#include <Tests/Contract/UserWorlds.h>
 
 #include <gmock/gmock.h>
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/UserAccountContract.h>
+#include <Tests/Contract/UserWorlds.h>
 
 #include <utility>
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/WorkspaceContract.h>
+#include <Tests/Contract/UserWorlds.h>
 
 #include <Varnel/Platform/Testing/FakeWorkspace.h>
 
@@ -24,6 +24,7 @@ TEST_P(WorkspaceContract, FindsWhatIsInstalledAtThatMomentUnderExactlyThisIdenti
 
 class FakeWorld final : public WorkspaceWorld {
  public:
+  FakeWorld() { workspace_.applications.emplace("", URL::fileURLWithPath("/opt/nobody's")); }
   Workspace& workspace() override { return workspace_; }
   URL install(const std::string& identifier, bool hasBundle) override {
     const URL url = URL::fileURLWithPath("/opt/" + identifier + (hasBundle ? "/" : ""));

@@ -301,6 +301,7 @@ TEST_F(DiskReadingQueueTest, ASlowResultKeepsNoTimeOutWaiting) {
   EXPECT_EQ(other->result(), Result::timedOut);
   mayEnd.count_down();
   holder.letGo();
+  queue_.reset();  // The slow one uses what ends here.
 }
 
 TEST_F(DiskReadingQueueTest, SaysWhyNothingWasRead) {

@@ -54,32 +54,23 @@ TEST_P(DurableFileTest, KeepsWhatIsTakenAwayUnderIt) {
   };
   const fs::path backup = folder_.path() / "backup";
   const fs::path moved = folder_.path() / "moved";
-  const auto remove = [&](std::initializer_list<const char*> suffixes) {
-    for (const char* suffix : suffixes) fs::remove(beside(suffix));
-  };
+  const auto remove = [&](auto... suffixes) { (fs::remove(beside(suffixes)), ...); };
   const std::vector<Case> cases{
-      {"the file removed", [&] { remove({""}); }},
-      {"all files removed",
-       [&] {
-         remove({"", "-wal", "-shm", "-journal"});
-       }},
+      {"the file removed", [&] { remove(""); }},
+      {"all files removed", [&] { remove("", "-wal", "-shm", "-journal"); }},
       {"the folder removed", [&] { fs::remove_all(path_.parent_path()); }},
       {"the folder renamed", [&] { fs::rename(path_.parent_path(), moved); }},
       {"the file renamed", [&] { fs::rename(path_, beside(".away")); }},
       {"the file replaced", [&] { fs::rename(backup, path_); }, false, true, "abcdz"},
       {"the file emptied", [&] { fs::resize_file(path_, 0); }, true, true,
        hasLog() ? "abcd" : "bcd"},
-      {"the journal removed", [&] { remove({"-wal"}); }, hasLog(), hasLog()},
+      {"the journal removed", [&] { remove("-wal"); }, hasLog(), hasLog()},
       {"the journal renamed",
        [&] {
          if (hasLog()) fs::rename(beside("-wal"), beside(".away"));
        },
        hasLog(), hasLog()},
-      {"the journals removed",
-       [&] {
-         remove({"-wal", "-shm", "-journal"});
-       },
-       hasLog(), hasLog()},
+      {"the journals removed", [&] { remove("-wal", "-shm", "-journal"); }, hasLog(), hasLog()},
       {"the journal replaced",
        [&] {
          std::ofstream(beside("-new"));
@@ -337,61 +328,6 @@ TEST_P(DurableFileTest, ACallToTheSystemThatFailsLosesNothing) {
   }
 }
 
-// One file of each format that ever was lies in Data.
-TEST(DurableFormatTest, OnlyTheProductsOwnHostMigrates) {
-  const auto later = [](FormatVersion version) {
-    DurableFormat format = notes(Journal::rollback);
-    format.version = version;
-    format.migrations = {
-        {{1, 0}, "ALTER TABLE note ADD COLUMN text TEXT NOT NULL DEFAULT 'none'"},
-        {{1, 1}, "CREATE TABLE place(name TEXT); DELETE FROM note WHERE key = 'b'"}};
-    return format;
-  };
-  auto broken = later({2, 0});
-  broken.migrations[1].sql += "; nonsense";
-  struct Case {
-    const char* what;
-    DurableFormat format;
-    Migrating migrating;
-    const char* keys;
-    std::int64_t version;
-  };
-  const std::vector<Case> cases{
-      {"the same", later({1, 0}), Migrating::allowed, "abc", 1000},
-      {"a later minor, its own host", later({1, 1}), Migrating::allowed, "abc", 1001},
-      {"a later minor, another", later({1, 1}), Migrating::never, "abc", 1000},
-      {"a later major, its own host", later({2, 0}), Migrating::allowed, "ac", 2000},
-      {"a later major, another", later({2, 0}), Migrating::never, "older", 1000},
-      {"an earlier major", later({0, 9}), Migrating::allowed, "newer", 1000},
-      {"a migration that fails", broken, Migrating::allowed, nullptr, 1000},
-  };
-  const fs::path golden = fs::path(VARNEL_TEST_DATA) / "notes-1.0.sqlite";
-  for (const Case& one : cases) {
-    SCOPED_TRACE(one.what);
-    const TemporaryFolder folder;
-    const fs::path path = folder.path() / "notes.sqlite";
-    fs::copy_file(golden, path);
-    Notebook book(path, one.format, one.migrating);
-    const std::string keys = book.keys();
-    EXPECT_TRUE(one.keys ? keys == one.keys : keys.find("nonsense") != keys.npos) << keys;
-    auto database = SQLiteDatabase::open(path, SQLiteDatabase::Access::readOnly);
-    int version = 0;
-    int count = 0;
-    EXPECT_FALSE(database->row("PRAGMA user_version", std::tie(version)));
-    EXPECT_FALSE(database->row("SELECT count(*) FROM note", std::tie(count)));
-    EXPECT_EQ(version, one.version);
-    EXPECT_EQ(count, version == 2000 ? 2 : 3);
-    EXPECT_FALSE(fs::exists(path.string() + ".damaged"));
-    // One who has the file open meanwhile notices, and one of an earlier minor version goes on.
-    Notebook old(path, notes(Journal::rollback), Migrating::never);
-    Notebook(path, later({1, 1}), Migrating::allowed).keys();
-    EXPECT_EQ(old.change("e"), one.version == 2000 ? "newer" : "kept");
-    Notebook(path, later({2, 0}), Migrating::allowed).keys();
-    for (int time = 0; time < 3; ++time) EXPECT_EQ(old.change("f"), "newer");
-    EXPECT_EQ(old.log.lines.size(), 1u);
-  }
-}
-
 TEST_P(DurableFileTest, NobodyWaitsLongForALockOfAnother) {
   ASSERT_EQ(open()->add("a"), "kept");
   std::unique_ptr<FileLock> lock;
@@ -444,14 +380,6 @@ TEST_P(DurableFileTest, ASecondObjectOfTheProcessLeavesTheLocksOfTheFirst) {
   ::waitpid(other, nullptr, 0);
   EXPECT_EQ(isLocked, 1);
   EXPECT_EQ(open()->keys(), "ab");
-}
-
-TEST_P(DurableFileTest, AStatementNoticesThatAnotherHasMigratedTheFile) {
-  auto book = open();
-  ASSERT_EQ(book->add("a"), "kept");
-  auto other = SQLiteDatabase::open(path_, SQLiteDatabase::Access::readWrite);
-  EXPECT_FALSE(other->execute("ALTER TABLE note RENAME TO page; PRAGMA user_version = 2000"));
-  EXPECT_EQ(book->add("b"), "newer");
 }
 
 TEST_P(DurableFileTest, AForkedChildLeavesTheFileToItsParent) {

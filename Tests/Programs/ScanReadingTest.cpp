@@ -207,19 +207,22 @@ TEST_F(ScanReading, ReadsADiskThatMustWorkByPlaceAndEverythingOnce) {
 
 TEST_F(ScanReading, ReadsLargeFilesOfAnOrderedDiskOneByOneAndNoByteTwice) {
   turns.disk = {.places = 2, .isOrdered = true};
-  turns.stepsPerTurn = 7;
   std::vector<std::string> equal;
   for (const char* name : {"1", "2", "3"})
     equal.push_back(folder.write(name, bytes(12'000'000, 'a')));
-  EXPECT_THAT(paths(scan()), ElementsAre(equal));
-  std::uint64_t total = 0;
-  for (const Reading& reading : fileSystem.readings) total += reading.length;
-  EXPECT_EQ(total, 36'000'000u);
-  std::erase_if(fileSystem.readings,
-                [](const Reading& reading) { return reading.length <= headLength; });
-  for (std::size_t i = 1; i < fileSystem.readings.size(); ++i) {
-    const Reading& reading = fileSystem.readings[i];
-    EXPECT_TRUE(reading.offset == headLength || reading.path == fileSystem.readings[i - 1].path);
+  for (const unsigned steps : {7u, 1u}) {  // A disk that need not work, and one that must.
+    turns.stepsPerTurn = steps;
+    fileSystem.readings.clear();
+    EXPECT_THAT(paths(scan()), ElementsAre(equal));
+    std::uint64_t total = 0;
+    for (const Reading& reading : fileSystem.readings) total += reading.length;
+    EXPECT_EQ(total, 36'000'000u);
+    std::erase_if(fileSystem.readings,
+                  [](const Reading& reading) { return reading.length <= headLength; });
+    for (std::size_t i = 1; i < fileSystem.readings.size(); ++i) {
+      const Reading& reading = fileSystem.readings[i];
+      EXPECT_TRUE(reading.offset == headLength || reading.path == fileSystem.readings[i - 1].path);
+    }
   }
 }
 

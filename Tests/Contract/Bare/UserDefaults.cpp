@@ -1,33 +1,10 @@
 // SPDX-License-Identifier: MIT
-#include <cstdlib>
-
-#include <Tests/Contract/UserDefaultsContract.h>
-#include <Tests/Support/TemporaryFolder.h>
+#include <Tests/Contract/POSIX/UserFolders.h>
 #include <Varnel/Platform/Bare/Adapters.h>
-#include <Varnel/Platform/POSIX/Adapters.h>
-#include <Varnel/Platform/Ports/PrivateFiles.h>
-#include <Varnel/Platform/Testing/CapturedOutput.h>
 
 namespace Varnel::Platform::Contract {
-namespace {
 
-class UserFolders final : public UserDefaultsWorld {
- public:
-  UserFolders() {
-    for (const char* variable : {"XDG_CONFIG_HOME", "XDG_STATE_HOME"})
-      ::setenv(variable, home_.path().c_str(), 1);
-  }
-  ApplicationStorage& storage() override { return *storage_; }
-  ApplicationStorage& storageOfAnother() override { return *another_; }
+INSTANTIATE_TEST_SUITE_P(Bare, UserDefaultsContract,
+                         UserDefaultsContract::on<UserFolders<Bare::makeApplicationStorage>>());
 
- private:
-  const Tests::TemporaryFolder home_ = Tests::TemporaryFolder::inMemory();
-  Testing::CapturedSystemLog log_;
-  const std::unique_ptr<PrivateFiles> files_ = POSIX::makePrivateFiles();
-  const std::unique_ptr<ApplicationStorage> storage_ = Bare::makeApplicationStorage(*files_, log_);
-  const std::unique_ptr<ApplicationStorage> another_ = Bare::makeApplicationStorage(*files_, log_);
-};
-INSTANTIATE_TEST_SUITE_P(Bare, UserDefaultsContract, UserDefaultsContract::on<UserFolders>());
-
-}  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -1,24 +1,10 @@
 // SPDX-License-Identifier: MIT
-#include <cstdlib>
-
-#include <Tests/Contract/ProcessWorlds.h>
+#include <Tests/Contract/POSIX/ProcessColumns.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 
 namespace Varnel::Platform::Contract {
 namespace {
-
-class ProcFolder final : public ProcessInfoWorld {
- public:
-  ProcessInfo& process() override { return *process_; }
-  void setEnvironment(const std::string& name, const std::string& value) override {
-    ASSERT_EQ(::setenv(name.c_str(), value.c_str(), 1), 0);
-  }
-
- private:
-  const std::unique_ptr<ProcessInfo> process_ = Linux::makeProcessInfo();
-};
-INSTANTIATE_TEST_SUITE_P(Linux, ProcessInfoContract, ProcessInfoContract::on<ProcFolder>());
 
 class SpawnedPrograms final : public ProcessLauncherWorld {
  public:
@@ -47,28 +33,15 @@ class ThreadPriority final : public ReadingPriorityWorld {
 INSTANTIATE_TEST_SUITE_P(Linux, ReadingPriorityContract,
                          ReadingPriorityContract::on<ThreadPriority>());
 
-class Output final : public StandardOutputWorld {
- public:
-  Output() { ::testing::internal::CaptureStdout(); }
-  StandardOutput& output() override { return *output_; }
-  std::string printed() override { return ::testing::internal::GetCapturedStdout(); }
-
- private:
-  const std::unique_ptr<StandardOutput> output_ = Linux::makeStandardOutput();
-};
-INSTANTIATE_TEST_SUITE_P(Linux, StandardOutputContract, StandardOutputContract::on<Output>());
-
-class ErrorOutput final : public StandardOutputWorld {
- public:
-  ErrorOutput() { ::testing::internal::CaptureStderr(); }
-  StandardOutput& output() override { return *output_; }
-  std::string printed() override { return ::testing::internal::GetCapturedStderr(); }
-
- private:
-  const std::unique_ptr<StandardOutput> output_ = makeStandardErrorOutput();
-};
+std::unique_ptr<ProcessInfo> makeProcess() {
+  return Linux::makeProcessInfo();
+}
+INSTANTIATE_TEST_SUITE_P(Linux, ProcessInfoContract,
+                         ProcessInfoContract::on<OwnProcess<makeProcess>>());
+INSTANTIATE_TEST_SUITE_P(Linux, StandardOutputContract,
+                         StandardOutputContract::on<Output<Linux::makeStandardOutput>>());
 INSTANTIATE_TEST_SUITE_P(LinuxErrors, StandardOutputContract,
-                         StandardOutputContract::on<ErrorOutput>());
+                         StandardOutputContract::on<Output<makeStandardErrorOutput>>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -1,14 +1,10 @@
 // SPDX-License-Identifier: MIT
 #include <sys/xattr.h>
 
-#include <cstdlib>
-
 #include <Tests/Contract/FilesWorlds.h>
-#include <Tests/Contract/UserDefaultsContract.h>
+#include <Tests/Contract/POSIX/UserFolders.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Linux/Adapters.h>
-#include <Varnel/Platform/POSIX/Adapters.h>
-#include <Varnel/Platform/Testing/CapturedOutput.h>
 
 namespace Varnel::Platform::Contract {
 namespace {
@@ -39,23 +35,8 @@ class UserAttributes final : public ExtendedAttributesWorld {
 INSTANTIATE_TEST_SUITE_P(Linux, ExtendedAttributesContract,
                          ExtendedAttributesContract::on<UserAttributes>());
 
-class UserFolders final : public UserDefaultsWorld {
- public:
-  UserFolders() {
-    for (const char* variable : {"XDG_CONFIG_HOME", "XDG_STATE_HOME"})
-      ::setenv(variable, home_.path().c_str(), 1);
-  }
-  ApplicationStorage& storage() override { return *storage_; }
-  ApplicationStorage& storageOfAnother() override { return *another_; }
-
- private:
-  const Tests::TemporaryFolder home_ = Tests::TemporaryFolder::inMemory();
-  Testing::CapturedSystemLog log_;
-  const std::unique_ptr<PrivateFiles> files_ = POSIX::makePrivateFiles();
-  const std::unique_ptr<ApplicationStorage> storage_ = Linux::makeApplicationStorage(*files_, log_);
-  const std::unique_ptr<ApplicationStorage> another_ = Linux::makeApplicationStorage(*files_, log_);
-};
-INSTANTIATE_TEST_SUITE_P(Linux, UserDefaultsContract, UserDefaultsContract::on<UserFolders>());
+INSTANTIATE_TEST_SUITE_P(Linux, UserDefaultsContract,
+                         UserDefaultsContract::on<UserFolders<Linux::makeApplicationStorage>>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/WallClockTimerContract.h>
+#include <Tests/Contract/MainLoopWorlds.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/UserLocaleContract.h>
+#include <Tests/Contract/UserWorlds.h>
 
 #include <stdlib.h>
 
@@ -8,9 +8,19 @@
 namespace Varnel::Platform::Contract {
 namespace {
 
-class POSIXWorld final : public UserLocaleWorld {
+class PasswdAccount final : public UserAccountWorld {
  public:
-  POSIXWorld() {
+  UserAccount& account() override { return *account_; }
+  void moveHome(const std::string& path) override { ::setenv("HOME", path.c_str(), 1); }
+
+ private:
+  const std::unique_ptr<UserAccount> account_ = POSIX::makeUserAccount();
+};
+INSTANTIATE_TEST_SUITE_P(POSIX, UserAccountContract, UserAccountContract::on<PasswdAccount>());
+
+class EnvironmentLocale final : public UserLocaleWorld {
+ public:
+  EnvironmentLocale() {
     for (const char* name : {"LANG", "LANGUAGE", "LC_ALL", "LC_MESSAGES", "LC_NUMERIC", "LC_TIME"})
       ::unsetenv(name);
   }
@@ -29,8 +39,7 @@ class POSIXWorld final : public UserLocaleWorld {
  private:
   const std::unique_ptr<UserLocale> locale_ = POSIX::makeUserLocale();
 };
-
-INSTANTIATE_TEST_SUITE_P(POSIX, UserLocaleContract, UserLocaleContract::on<POSIXWorld>());
+INSTANTIATE_TEST_SUITE_P(POSIX, UserLocaleContract, UserLocaleContract::on<EnvironmentLocale>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

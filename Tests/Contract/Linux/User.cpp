@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/WorkspaceContract.h>
+#include <Tests/Contract/UserWorlds.h>
 
 #include <glib.h>
 #include <stdlib.h>
@@ -12,10 +12,39 @@ namespace {
 
 namespace fs = std::filesystem;
 
-// The folders of desktop entries are read once a process.
-class LinuxWorld final : public WorkspaceWorld {
+// A machine made of files.
+class MachineOfFiles final : public MachineIdentityWorld {
  public:
-  LinuxWorld() {
+  MachineIdentity& machine() override { return *machine_; }
+  void identify(const std::string& uuid, const std::string& serial) override {
+    folder_.write("etc/machine-id", uuid + "\n");
+    folder_.write("sys/class/dmi/id/product_serial", serial + "\n");
+  }
+  void connect(const PropertyData& address) override {
+    constexpr char digits[] = "0123456789abcdef";
+    std::string text;
+    for (const std::byte byte : address) {
+      if (!text.empty()) text += ':';
+      const auto value = std::to_integer<unsigned>(byte);
+      text.append({digits[value / 16], digits[value % 16]});
+    }
+    folder_.write("sys/class/net/eth0/type", "1\n");
+    folder_.write("sys/class/net/eth0/address", text + "\n");
+    folder_.write("sys/class/net/eth0/device/vendor", "0x8086\n");
+    folder_.write("proc/net/route", "eth0\t00000000\t0101A8C0\t0003\t0\t0\t0\t00000000\t0\t0\t0\n");
+  }
+
+ private:
+  const Tests::TemporaryFolder folder_;
+  const std::unique_ptr<MachineIdentity> machine_ = Linux::makeMachineIdentity(folder_.path());
+};
+INSTANTIATE_TEST_SUITE_P(Linux, MachineIdentityContract,
+                         MachineIdentityContract::on<MachineOfFiles>());
+
+// The folders of desktop entries are read once a process.
+class DesktopEntries final : public WorkspaceWorld {
+ public:
+  DesktopEntries() {
     ::setenv("XDG_DATA_HOME", (folder_.path() / "user").c_str(), 1);
     ::setenv("XDG_DATA_DIRS", (folder_.path() / "system").c_str(), 1);
   }
@@ -44,8 +73,7 @@ class LinuxWorld final : public WorkspaceWorld {
   const Tests::TemporaryFolder folder_;
   const std::unique_ptr<Workspace> workspace_ = Linux::makeWorkspace();
 };
-
-INSTANTIATE_TEST_SUITE_P(Linux, WorkspaceContract, WorkspaceContract::on<LinuxWorld>());
+INSTANTIATE_TEST_SUITE_P(Linux, WorkspaceContract, WorkspaceContract::on<DesktopEntries>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -1,0 +1,27 @@
+// SPDX-License-Identifier: MIT
+#include <fcntl.h>
+
+#include <cerrno>
+
+#include <Scan/SystemCalls.h>
+
+namespace Orvane {
+
+const int openToPassThrough = O_RDONLY | O_DIRECTORY;
+
+int openWithoutLinksAtOnce(int, const char*, int) {
+  errno = ENOSYS;
+  return -1;
+}
+
+// POSIX has no leases.
+int openLeased(int, const char*) {
+  errno = EAGAIN;
+  return -1;
+}
+
+std::optional<std::uint64_t> placeOf(int) {
+  return std::nullopt;
+}
+
+}  // namespace Orvane

@@ -1,0 +1,14 @@
+// SPDX-License-Identifier: MIT
+#include <Tests/Contract/POSIX/ProcessColumns.h>
+#include <Varnel/Platform/Bare/Adapters.h>
+
+namespace Varnel::Platform::Contract {
+
+INSTANTIATE_TEST_SUITE_P(Bare, ProcessInfoContract,
+                         ProcessInfoContract::on<OwnProcess<Bare::makeProcessInfo>>());
+INSTANTIATE_TEST_SUITE_P(Bare, StandardOutputContract,
+                         StandardOutputContract::on<Output<Bare::makeStandardOutput>>());
+INSTANTIATE_TEST_SUITE_P(BareErrors, StandardOutputContract,
+                         StandardOutputContract::on<Output<makeStandardErrorOutput>>());
+
+}  // namespace Varnel::Platform::Contract

@@ -1,0 +1,62 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <vector>
+
+#include <Tests/Contract/Contract.h>
+#include <Varnel/Platform/Ports/MachineIdentity.h>
+#include <Varnel/Platform/Ports/TimeZones.h>
+#include <Varnel/Platform/Ports/UserAccount.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Ports/Workspace.h>
+
+namespace Varnel::Platform::Contract {
+
+/// A machine that hides who it is.
+class MachineIdentityWorld : public World {
+ public:
+  virtual MachineIdentity& machine() = 0;
+  /// 32 hexadecimal digits, and a text; an empty one stands in the place of an identity.
+  virtual void identify(const std::string& uuid, const std::string& serial) = 0;
+  /// Gives the primary interface this hardware address; empty for none.
+  virtual void connect(const PropertyData& address) = 0;
+};
+using MachineIdentityContract = Suite<MachineIdentityWorld>;
+
+/// A system that knows the zones of `zonesOf2026`.
+class TimeZonesWorld : public World {
+ public:
+  virtual TimeZones& zones() = 0;
+  virtual void moveUser(const std::string& zone) = 0;
+};
+using TimeZonesContract = Suite<TimeZonesWorld>;
+
+class UserAccountWorld : public World {
+ public:
+  virtual UserAccount& account() = 0;
+  /// Moves the home away from the one on record, as an environment or a sandbox does.
+  virtual void moveHome(const std::string& path) = 0;
+};
+using UserAccountContract = Suite<UserAccountWorld>;
+
+/// A user who has chosen nothing yet.
+class UserLocaleWorld : public World {
+ public:
+  virtual UserLocale& locale() = 0;
+  /// Languages as in "de_AT", best first, and the locales of dates and numbers.
+  virtual void choose(const std::vector<std::string>& languages, const std::string& dates,
+                      const std::string& numbers) = 0;
+};
+using UserLocaleContract = Suite<UserLocaleWorld>;
+
+/// A user without any application.
+class WorkspaceWorld : public World {
+ public:
+  virtual Workspace& workspace() = 0;
+  /// Installs a program under this identifier and returns its file; with a bundle, the folder.
+  virtual URL install(const std::string& identifier, bool hasBundle) = 0;
+  virtual void remove(const std::string& identifier) = 0;
+};
+using WorkspaceContract = Suite<WorkspaceWorld>;
+
+}  // namespace Varnel::Platform::Contract
