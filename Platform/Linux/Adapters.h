@@ -2,16 +2,20 @@
 #pragma once
 
 #include <chrono>
+#include <functional>
 #include <memory>
 #include <string>
 
 namespace Varnel::Platform {
 
+class ApplicationLauncher;
 class ApplicationStorage;
 class Clock;
+class DelivererConnection;
 class DeviceRegistry;
 class DiskArbitration;
 class ExtendedAttributes;
+class HostedApplication;
 class MachineIdentity;
 class MainQueue;
 class NotificationServer;
@@ -36,6 +40,7 @@ struct NotificationSource;
 namespace Varnel::Platform::Linux {
 
 class MountTable;
+class SessionBus;
 
 /// The one view of the mount table that the volume catalogue and disk arbitration share.
 [[nodiscard]] std::shared_ptr<MountTable> makeMountTable();
@@ -65,6 +70,14 @@ class MountTable;
 [[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(
     SystemLog& systemLog, const NotificationSource& source,
     std::chrono::milliseconds patience = std::chrono::seconds(10));
+/// The way to the session's notifier for the product with this base identifier, or to the deliverer
+/// of this process that `makeDeliverer` makes where there is none.
+using MakeDeliverer = std::function<std::unique_ptr<DelivererConnection>()>;
+[[nodiscard]] std::shared_ptr<DelivererConnection> makeNotifierConnection(
+    std::string baseIdentifier, MakeDeliverer makeDeliverer);
+/// Starts applications by the desktop entries installed for the user. Part of the notifier alone.
+[[nodiscard]] std::unique_ptr<ApplicationLauncher> makeApplicationLauncher(
+    std::shared_ptr<SessionBus> bus);
 [[nodiscard]] std::unique_ptr<WallClockTimer> makeWallClockTimer(SystemLog& systemLog);
 
 /// What notification centers are made with, beyond a server and a timer each.
@@ -76,8 +89,9 @@ struct NotificationPorts {
   PrivateFiles& privateFiles;
   SystemLog& systemLog;
 };
+/// The application, which outlives the centers, says whether this process is in front.
 [[nodiscard]] std::unique_ptr<UserNotificationCenters> makeUserNotificationCenters(
-    const NotificationPorts& ports);
+    const NotificationPorts& ports, HostedApplication& application);
 
 [[nodiscard]] std::unique_ptr<VolumeCatalog> makeVolumeCatalog(std::shared_ptr<MountTable> table);
 [[nodiscard]] std::unique_ptr<Workspace> makeWorkspace();

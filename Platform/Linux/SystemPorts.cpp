@@ -51,10 +51,11 @@ const Ports& systemPorts() {
   static MainQueue& mainQueue = *new WatchedMainQueue(Linux::makeMainQueue(), systemLog);
   static PrivateFiles& privateFiles = keep(POSIX::makePrivateFiles());
   static TimeZones& timeZones = keep(Linux::makeTimeZones());
+  static HostedApplication& application = *new HostedApplication;
   static UserLocale& userLocale = keep(POSIX::makeUserLocale());
   static const Ports& ports = *new Ports{
       .appendFiles = keep(POSIX::makeAppendFiles()),
-      .application = *new HostedApplication,
+      .application = application,
       .applicationStorage = keep(Linux::makeApplicationStorage(privateFiles, systemLog)),
       .clock = clock,
       .cookieStorage = keep(POSIX::makeCookieStorage(processInfo, clock)),
@@ -76,7 +77,7 @@ const Ports& systemPorts() {
       .userAccount = keep(POSIX::makeUserAccount()),
       .userLocale = userLocale,
       .userNotificationCenters = keep(Linux::makeUserNotificationCenters(
-          {clock, userLocale, timeZones, mainQueue, privateFiles, systemLog})),
+          {clock, userLocale, timeZones, mainQueue, privateFiles, systemLog}, application)),
       .volumeCatalog = keep(Linux::makeVolumeCatalog(mountTable)),
       .workspace = keep(Linux::makeWorkspace()),
   };

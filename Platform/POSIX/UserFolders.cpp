@@ -2,6 +2,7 @@
 #include <Varnel/Platform/POSIX/UserFolders.h>
 
 #include <cstdlib>
+#include <system_error>
 
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
@@ -18,8 +19,14 @@ fs::path folder(const char* variable, const char* belowHome) {
   return fs::path(makeUserAccount()->homeFolder()) / belowHome;
 }
 
+constexpr const char* notifications = "notifications.sqlite";
+
+fs::path stateFolders() {
+  return folder("XDG_STATE_HOME", ".local/state");
+}
+
 fs::path stateFolder(const std::string& identifier) {
-  return folder("XDG_STATE_HOME", ".local/state") / fileNameFor(identifier);
+  return stateFolders() / fileNameFor(identifier);
 }
 
 }  // namespace
@@ -29,7 +36,17 @@ fs::path settingsFolder(const std::string& identifier) {
 }
 
 fs::path notificationStore(const std::string& identifier) {
-  return stateFolder(identifier) / "notifications.sqlite";
+  return stateFolder(identifier) / notifications;
+}
+
+std::vector<fs::path> notificationStores() {
+  std::vector<fs::path> stores;
+  std::error_code error;
+  for (fs::directory_iterator each(stateFolders(), error), end; !error && each != end;
+       each.increment(error))
+    if (std::error_code unreadable; fs::exists(each->path() / notifications, unreadable))
+      stores.push_back(each->path() / notifications);
+  return stores;
 }
 
 fs::path analyticsSpool(const std::string& identifier) {

@@ -3,6 +3,7 @@
 
 #include <filesystem>
 #include <string>
+#include <vector>
 
 namespace Varnel::Platform::POSIX {
 
@@ -13,6 +14,8 @@ namespace Varnel::Platform::POSIX {
 /// it names one folder and no path.
 [[nodiscard]] std::filesystem::path settingsFolder(const std::string& identifier);
 [[nodiscard]] std::filesystem::path notificationStore(const std::string& identifier);
+/// Those of all applications that are there.
+[[nodiscard]] std::vector<std::filesystem::path> notificationStores();
 [[nodiscard]] std::filesystem::path analyticsSpool(const std::string& identifier);
 
 /// Where other programs keep the cookies that are read here.

@@ -210,8 +210,7 @@ void addRemind(CLI::App& app, Invocation& invocation) {
   addByteCount(*tomorrowOptions, "--found", tomorrow->foundSize, "What the scan found, in bytes");
   addByteCount(*tomorrowOptions, "--selected", tomorrow->selectedSize,
                "What the user had selected, in bytes");
-  addCommand<RemindListenCommand>(remind, invocation, "listen",
-                                  "Deliver reminders and show what happens to them");
+  addCommand<RemindListenCommand>(remind, invocation, "listen", "Show what happens to reminders");
 }
 
 void addOrigin(CLI::App& app, Invocation& invocation) {

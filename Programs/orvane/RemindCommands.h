@@ -30,8 +30,8 @@ struct RemindTomorrowCommand {
   [[nodiscard]] int run(Console& console) const;
 };
 
-/// `orvane remind listen`: delivers reminders and tells what happens to them, until it is
-/// interrupted.
+/// `orvane remind listen`: tells what happens to reminders, until it is interrupted. Started by a
+/// click on one, it tells that too.
 struct RemindListenCommand {
   [[nodiscard]] int run(Console& console) const;
 };

@@ -33,7 +33,11 @@ const char* nameOf(Router::EventKind kind) {
 }  // namespace
 
 int RemindListenCommand::run(Console& console) const {
-  Router router;
+  // It looks on: a window of the application takes its place.
+  Router router(
+      {Router::defaultUserNotificationCenter(), Varnel::Platform::processPorts().application,
+       Varnel::Platform::processPorts().mainQueue},
+      Varnel::Platform::UserNotificationCenter::Standing::onlooker);
   Varnel::SchedulerService service(std::make_shared<Tallyhouse::AnalyticsTracker>(), router);
   const auto& nextDay = Varnel::NextDayCleanupReminderInfo::userNotificationIdentifier();
   bool isWritten = true;
@@ -54,6 +58,9 @@ int RemindListenCommand::run(Console& console) const {
   });
   // A plan that is right stays: assigning the stored period would move the reminder.
   repairPlan(service, console);
+  if (const auto launch = router.userNotificationCenter().takeLaunchNotification();
+      launch && *launch)
+    router.handleLaunch(**launch);
   router.userNotificationCenter().checkBanners([&](const auto& obstacle) {
     if (obstacle)
       console.complain("no banner can be shown at present: " + obstacle->localizedDescription());

@@ -122,10 +122,12 @@ UserNotificationCenter& ReminderPlanner::center() const {
   return parts_->center;
 }
 
-bool ReminderPlanner::planRegular(SchedulePeriodOption period) {
+bool ReminderPlanner::planRegular(SchedulePeriodOption period,
+                                  std::optional<std::int64_t> sizeLeftToClean) {
   Varnel::SchedulerService& service = parts_->service;
-  // Assigning plans anew and clears what was delivered, so only a choice of the user does it.
+  // Assigning plans anew and clears what was delivered, so only a choice of the user and a scan do.
   service.setSchedulePeriod(period);
+  if (sizeLeftToClean) service.scheduleCleanReminder(*sizeLeftToClean);
   awaitDesktop([&] { return service.failure().has_value(); });
   const auto planned = isPlanned(parts_->center, period);
   const Failure failure = planned ? service.failure() : Failure(planned.error());

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <cstdint>
 #include <functional>
 #include <memory>
 #include <optional>
@@ -30,10 +31,9 @@ class Console;
 /// runs; the service and the console outlive that.
 void repairPlan(Varnel::SchedulerService& service, Console& console);
 
-/// Plans for a program that ends when it has planned. It is not told of deliveries: what is due
-/// waits for a program that listens. Each operation lets the desktop follow, a few seconds at most,
-/// and answers whether what it was asked for is found again in the store; where it is not, it
-/// complains.
+/// Plans for a program that ends when it has planned, and is not told of deliveries. Each operation
+/// lets the desktop follow, a few seconds at most, and answers whether what it was asked for is
+/// found again in the store; where it is not, it complains.
 ///
 ///     ReminderPlanner planner(console);
 ///     if (!planner.planRegular(period)) return 1;
@@ -44,8 +44,10 @@ class ReminderPlanner final {
   ReminderPlanner(const ReminderPlanner&) = delete;
   ReminderPlanner& operator=(const ReminderPlanner&) = delete;
 
-  /// The reminder of this period, which is stored; anew also where it is planned already.
-  [[nodiscard]] bool planRegular(Varnel::SchedulePeriodOption period);
+  /// The reminder of this period, which is stored; anew also where it is planned already. It names
+  /// the bytes that a scan has found to be cleaned, or what the present one names.
+  [[nodiscard]] bool planRegular(Varnel::SchedulePeriodOption period,
+                                 std::optional<std::int64_t> sizeLeftToClean = std::nullopt);
   /// A notification of its own, beside the reminder of the stored period.
   [[nodiscard]] bool plan(const Varnel::Platform::UserNotification& notification);
 

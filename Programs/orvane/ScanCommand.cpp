@@ -2,7 +2,9 @@
 #include <orvane/ScanCommand.h>
 
 #include <algorithm>
+#include <cstdint>
 #include <filesystem>
+#include <limits>
 #include <optional>
 #include <thread>
 
@@ -21,6 +23,8 @@
 #include <orvane/Interruption.h>
 #include <orvane/ManagedDiskTurns.h>
 #include <orvane/ProgressLine.h>
+#include <orvane/ReminderPlanner.h>
+#include <orvane/Reminders.h>
 #include <orvane/ResultText.h>
 #include <orvane/ScanAnalytics.h>
 #include <orvane/SoundCommand.h>
@@ -87,6 +91,16 @@ std::optional<std::vector<std::string>> resolved(const std::vector<std::string>&
   return paths;
 }
 
+// A period from now on the user is reminded of what this scan has found. Who chose none is not.
+void planReminder(std::uint64_t bytesLeftToClean, Console& console) {
+  const auto period = storedPeriod();
+  if (!period || *period == Varnel::SchedulePeriodOption::never) return;
+  constexpr std::uint64_t max = std::numeric_limits<std::int64_t>::max();
+  // It says itself what is in its way; the scan has succeeded all the same.
+  static_cast<void>(ReminderPlanner(console).planRegular(
+      *period, static_cast<std::int64_t>(std::min(bytesLeftToClean, max))));
+}
+
 unsigned maxReaders() {
   const unsigned cores = std::thread::hardware_concurrency();
   return std::max(2u, Globals::canUseAllCores() ? cores : cores / 2);
@@ -140,6 +154,7 @@ int ScanCommand::run(Console& console) const {
   const bool written = isJSON
                            ? writeJSON(result, write)
                            : writeText(result, byteCounts, Varnel::QNURLResolver::shared(), write);
+  planReminder(result.totals.wastedBytes, console);
   // The scan has succeeded even on a machine without sound.
   if (playsSound) playToTheEnd(Varnel::Sound::scanComplete);
   return written ? 0 : 1;

@@ -75,9 +75,9 @@ std::optional<UserNotificationRouter::EventKind> UserNotificationRouter::eventKi
   return std::nullopt;
 }
 
-UserNotificationRouter::UserNotificationRouter(Ports ports)
+UserNotificationRouter::UserNotificationRouter(Ports ports, Standing standing)
     : ports_(ports), routes_(std::make_shared<Routes>(ports.application)) {
-  ports_.userNotificationCenter.setDelegate(routes_);
+  ports_.userNotificationCenter.setDelegate(routes_, standing);
 }
 
 UserNotificationRouter::UserNotificationRouter(const Platform::Ports& ports)

@@ -9,13 +9,13 @@
 
 #include <Varnel/Basalt/Channel.h>
 #include <Varnel/Platform/Api.h>
+#include <Varnel/Platform/Ports/UserNotificationCenter.h>
 #include <Varnel/Platform/Values/PlatformError.h>
 #include <Varnel/Platform/Values/UserNotification.h>
 
 namespace Varnel::Platform {
 class Application;
 class MainQueue;
-class UserNotificationCenter;
 struct Ports;
 }  // namespace Varnel::Platform
 
@@ -46,6 +46,8 @@ class VARNEL_API UserNotificationRouter final {
   };
   using Handler = std::function<void(const Platform::UserNotification&, EventKind)>;
 
+  using Standing = Platform::UserNotificationCenter::Standing;
+
   struct Ports {
     Platform::UserNotificationCenter& userNotificationCenter;
     Platform::Application& application;
@@ -53,7 +55,7 @@ class VARNEL_API UserNotificationRouter final {
   };
 
   /// Becomes the delegate of the center, which then delivers the notifications that came due.
-  explicit UserNotificationRouter(Ports ports);
+  explicit UserNotificationRouter(Ports ports, Standing standing = Standing::application);
   /// The running application's own center in a set.
   explicit UserNotificationRouter(const Platform::Ports& ports);
   /// The router of the running application's own center.

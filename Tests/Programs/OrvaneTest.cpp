@@ -281,7 +281,14 @@ TEST_F(Orvane, PlansReminders) {
   EXPECT_THAT(
       run({"remind", "tomorrow", "--found", "9223372036854775807", "--selected", "1"}).output,
       AllOf(period("Never"), regular));
+  // Each scan plans the reminder of the period anew.
+  run({"remind", "every", "weekly"});
+  std::filesystem::remove(home.path(".local/state/com.quennel.Orvane2/notifications.sqlite"));
+  EXPECT_EQ(run({"scan", folder.path()}).status, 0);
+  EXPECT_THAT(run({"remind", "status"}).output, AllOf(period("Every Week"), regular));
+  run({"remind", "tomorrow", "--found", "9223372036854775807", "--selected", "1"});
   EXPECT_THAT(run({"remind", "every", "never"}).output, AllOf(period("Never"), Not(regular)));
+  EXPECT_EQ(run({"scan", folder.path()}).status, 0);
   const Outcome status = run({"remind", "status"});
   EXPECT_THAT(status.output, AllOf(period("Never"), found("9.22 EB"), Not(regular)));
   EXPECT_EQ(status.status, 0);

@@ -19,6 +19,7 @@
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/Notifications/BusNotificationServer.h>
 #include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
+#include <Varnel/Platform/Linux/Notifications/SessionBus.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Ports/NotificationServer.h>
@@ -111,7 +112,7 @@ TEST(NotificationServer, ABusThatDoesNotTellWhoAnswersCostsTheBannerAlone) {
   const NamelessBus bus;
   const auto mainQueue = Linux::makeMainQueue();
   Testing::CapturedSystemLog log;
-  const auto server = Linux::makeBusNotificationServer(log, {}, patience);
+  const auto server = Linux::makeBusNotificationServer(log, {}, Linux::makeSessionBus(patience));
   const UniqueHandle<GMainContext*, g_main_context_unref> own(g_main_context_new());
   g_main_context_push_thread_default(own.get());
   server->show("token", Banner(), {});
@@ -124,7 +125,7 @@ TEST(NotificationServer, ABusThatIsLostKeepsNobodyWaitingAndTheNextTakesItsPlace
   std::optional<NamelessBus> bus(std::in_place);
   const auto mainQueue = Linux::makeMainQueue();
   Testing::CapturedSystemLog log;
-  const auto server = Linux::makeBusNotificationServer(log, {}, patience);
+  const auto server = Linux::makeBusNotificationServer(log, {}, Linux::makeSessionBus(patience));
   std::vector<bool> hasAnswered;
   const auto ask = [&] {
     server->check([&](const auto& obstacle) {
@@ -152,7 +153,7 @@ TEST(NotificationServer, AMainLoopThatComesLateFindsTheConnection) {
   const NamelessBus bus;
   const auto mainQueue = Linux::makeMainQueue();
   Testing::CapturedSystemLog log;
-  const auto server = Linux::makeBusNotificationServer(log, {}, halfSecond);
+  const auto server = Linux::makeBusNotificationServer(log, {}, Linux::makeSessionBus(halfSecond));
   server->show("token", Banner(), {});
   const auto end = Clock::now() + halfSecond;
   while (!g_main_context_pending(nullptr)) std::this_thread::yield();
@@ -169,11 +170,12 @@ TEST(NotificationServer, ABusThatNeverAnswersCostsTheBannersAndNoWaiting) {
   const auto mainQueue = Linux::makeMainQueue();
   Testing::CapturedSystemLog log;
   {
-    const auto ended = Linux::makeBusNotificationServer(log, {}, patience);
+    const auto ended = Linux::makeBusNotificationServer(log, {}, Linux::makeSessionBus(patience));
     ended->show("token", banner, {});
     EXPECT_TRUE(ended->isBusy());
   }
-  const auto server = Linux::makeBusNotificationServer(log, {}, std::chrono::milliseconds(50));
+  const auto server = Linux::makeBusNotificationServer(
+      log, {}, Linux::makeSessionBus(std::chrono::milliseconds(50)));
   // Each attempt comes to an end, and the next banner makes another. The reason is said once.
   for (int attempt = 0; attempt < 2; ++attempt) {
     server->show("token", banner, {});
@@ -193,11 +195,12 @@ TEST(NotificationServer, ABannerCarriesWhoseItIs) {
   } rows[] = {
       {{.name = "Fotovia \xff", .desktopEntry = "com.example.Fotovia", .icon = "/icons/a b.png"},
        "('Fotovia \uFFFD', uint32 7, 'file:///icons/a%20b.png', ",
-       "{'desktop-entry': <'com.example.Fotovia'>}, -1)"},
+       "{'desktop-entry': <'com.example.Fotovia'>, 'category': <'x-quennel.reminder'>, "
+       "'urgency': <byte 0x01>}, -1)"},
       {{.name = "Fotovia", .icon = "fotovia"},
        "('Fotovia', uint32 7, 'fotovia', ",
-       "@a{sv} {}, -1)"},
-      {{}, "('', uint32 7, '', ", "@a{sv} {}, -1)"},
+       "[], {'category': <'x-quennel.reminder'>, 'urgency': <byte 0x01>}, -1)"},
+      {{}, "('', uint32 7, '', ", "'urgency': <byte 0x01>}, -1)"},
   };
   for (const auto& row : rows) {
     const auto message = Linux::notifyRequest(":1.5", row.source, Banner(), {}, 7);

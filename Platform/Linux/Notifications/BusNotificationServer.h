@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <chrono>
 #include <memory>
 
 namespace Varnel::Platform {
@@ -12,10 +11,13 @@ struct NotificationSource;
 
 namespace Varnel::Platform::Linux {
 
+class SessionBus;
+
+inline constexpr const char* sessionBusModule = "libvarnel-session-bus.so";
 inline constexpr const char* notificationService = "org.freedesktop.Notifications";
 
 /// The server on the session bus. Part of the module: `makeNotificationServer` loads it.
 [[nodiscard]] std::unique_ptr<NotificationServer> makeBusNotificationServer(
-    SystemLog& systemLog, const NotificationSource& source, std::chrono::milliseconds patience);
+    SystemLog& systemLog, const NotificationSource& source, std::shared_ptr<SessionBus> bus);
 
 }  // namespace Varnel::Platform::Linux

@@ -2,10 +2,20 @@
 #include <Varnel/Platform/Linux/Notifications/Module.h>
 
 #include <Varnel/Platform/Linux/Notifications/BusNotificationServer.h>
+#include <Varnel/Platform/Linux/Notifications/NotifierConnection.h>
+#include <Varnel/Platform/Linux/Notifications/SessionBus.h>
 #include <Varnel/Platform/Ports/NotificationServer.h>
 
-Varnel::Platform::NotificationServer* varnelMakeNotificationServer(
-    Varnel::Platform::SystemLog& systemLog, const Varnel::Platform::NotificationSource& source,
-    std::chrono::milliseconds patience) {
-  return Varnel::Platform::Linux::makeBusNotificationServer(systemLog, source, patience).release();
+using namespace Varnel::Platform;
+using namespace Varnel::Platform::Linux;
+
+NotificationServer* varnelMakeNotificationServer(SystemLog& systemLog,
+                                                 const NotificationSource& source,
+                                                 std::chrono::milliseconds patience) {
+  return makeBusNotificationServer(systemLog, source, makeSessionBus(patience)).release();
+}
+
+DelivererConnection* varnelMakeNotifierConnection(const std::string& baseIdentifier,
+                                                  const MakeDeliverer& makeDeliverer) {
+  return new NotifierConnection(makeSessionBus(), baseIdentifier, makeDeliverer);
 }

@@ -17,8 +17,6 @@
 namespace Varnel::Platform::Linux {
 namespace {
 
-constexpr const char* module = "libvarnel-session-bus.so";
-
 // The module's server, which a thread loads with the first request. Requests wait meanwhile; when
 // the module cannot be loaded they fail, and the next one tries again. The main thread owns it; the
 // thread knows it weakly.
@@ -43,7 +41,7 @@ class LoadedServer final : public std::enable_shared_from_this<LoadedServer> {
 
   void setSource(const NotificationSource& source) {
     source_ = source;
-    if (server_) server_->setSource(source);
+    if (server_) server_->setSource(source_);
   }
 
   void request(Request request) {
@@ -67,9 +65,10 @@ class LoadedServer final : public std::enable_shared_from_this<LoadedServer> {
  private:
   void load() {
     const auto load = [weak = weak_from_this()] {
-      runOnMainLoop([weak, loaded = POSIX::moduleFunction(module, "varnelMakeNotificationServer")] {
-        if (const auto self = weak.lock()) self->finish(loaded);
-      });
+      runOnMainLoop(
+          [weak, loaded = POSIX::moduleFunction(sessionBusModule, "varnelMakeNotificationServer")] {
+            if (const auto self = weak.lock()) self->finish(loaded);
+          });
     };
     try {
       startThread("session-bus", load).detach();
@@ -85,7 +84,7 @@ class LoadedServer final : public std::enable_shared_from_this<LoadedServer> {
       server_.reset(make(systemLog_, source_, patience_));
       server_->setObserver(observer_);
     } else {
-      problem = std::string("The module ") + module + " " + loaded.error().text + ".";
+      problem = std::string("The module ") + sessionBusModule + " " + loaded.error().text + ".";
       if (problem != std::exchange(lastProblem_, problem))
         systemLog_.write("Cannot show a notification: " + problem);
     }

@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: MIT
 #include <map>
+#include <utility>
 
+#include <Varnel/Platform/Generic/DelivererConnection.h>
+#include <Varnel/Platform/Generic/HostedApplication.h>
 #include <Varnel/Platform/Generic/InProcessDeliverer.h>
 #include <Varnel/Platform/Generic/ScheduledNotificationCenter.h>
 #include <Varnel/Platform/Linux/Adapters.h>
@@ -22,7 +25,7 @@ namespace fs = std::filesystem;
 // A deliverer of this process with everything that serves it alone. Other processes of the product
 // may change its file, whose folder is there by then; a change of the user's time zone changes the
 // link /etc/localtime.
-class LocalDeliverer final {
+class LocalDeliverer final : public DelivererConnection {
  public:
   LocalDeliverer(const NotificationPorts& ports, const NotificationSource& source,
                  const fs::path& store)
@@ -34,7 +37,16 @@ class LocalDeliverer final {
         storeWatch_(store.parent_path(), store.filename(), [this] { deliverer_.changed(); }),
         zoneWatch_("/etc", "localtime", [this] { deliverer_.changed(); }) {}
 
-  DelivererConnection& connection() { return deliverer_; }
+  void setHost(std::weak_ptr<NotificationHost> host, Standing standing) override {
+    deliverer_.setHost(std::move(host), standing);
+  }
+  void setActive(bool isActive) override { deliverer_.setActive(isActive); }
+  void changed() override { deliverer_.changed(); }
+  void changedAtOnce() override { deliverer_.changedAtOnce(); }
+  void checkBanners(std::function<void(const Failure&)> answer) override {
+    deliverer_.checkBanners(std::move(answer));
+  }
+  bool isBusy() const override { return deliverer_.isBusy(); }
 
  private:
   const std::unique_ptr<NotificationServer> server_;
@@ -44,46 +56,68 @@ class LocalDeliverer final {
   const FileWatch zoneWatch_;
 };
 
-// One center with everything that serves it alone.
+// One center with everything that serves it alone. Its folder is there once the center is, so the
+// deliverer that may take the notifier's place is made later.
 class Center final {
  public:
   Center(const NotificationPorts& ports, const NotificationSource& source, const fs::path& store)
-      : deliverer_(ports, source, store),
+      : connection_(makeNotifierConnection(
+            source.identifier,
+            [=] { return std::make_unique<LocalDeliverer>(ports, source, store); })),
         timer_(makeWallClockTimer(ports.systemLog)),
         center_({ports.clock, ports.userLocale, ports.timeZones, ports.privateFiles,
                  ports.systemLog, *timer_},
-                store.string(), source, deliverer_.connection()) {}
+                store.string(), source, *connection_) {}
 
   UserNotificationCenter& center() { return center_; }
+  void setActive(bool isActive) { connection_->setActive(isActive); }
 
  private:
-  LocalDeliverer deliverer_;
+  const std::shared_ptr<DelivererConnection> connection_;
   const std::unique_ptr<WallClockTimer> timer_;
   ScheduledNotificationCenter center_;
 };
 
 class StoredCenters final : public UserNotificationCenters {
  public:
-  explicit StoredCenters(const NotificationPorts& ports) : ports_(ports) {}
+  StoredCenters(const NotificationPorts& ports, HostedApplication& application)
+      : ports_(ports), application_(application) {
+    application.setObserver([&queue = ports.mainQueue, life = std::weak_ptr(life_)](bool isActive) {
+      queue.post([life, isActive] {
+        if (const auto self = life.lock()) (*self)->setActive(isActive);
+      });
+    });
+  }
+  ~StoredCenters() override { application_.setObserver(nullptr); }
 
   UserNotificationCenter& center(const NotificationSource& source) override {
     auto& center = centers_[source.identifier];
-    if (!center)
+    if (!center) {
       center =
           std::make_unique<Center>(ports_, source, POSIX::notificationStore(source.identifier));
+      if (isActive_) center->setActive(true);
+    }
     return center->center();
   }
 
  private:
+  void setActive(bool isActive) {
+    isActive_ = isActive;
+    for (const auto& [identifier, center] : centers_) center->setActive(isActive);
+  }
+
   const NotificationPorts ports_;
+  HostedApplication& application_;
+  bool isActive_ = false;
   std::map<std::string, std::unique_ptr<Center>> centers_;
+  const std::shared_ptr<StoredCenters*> life_ = std::make_shared<StoredCenters*>(this);
 };
 
 }  // namespace
 
 std::unique_ptr<UserNotificationCenters> makeUserNotificationCenters(
-    const NotificationPorts& ports) {
-  return std::make_unique<StoredCenters>(ports);
+    const NotificationPorts& ports, HostedApplication& application) {
+  return std::make_unique<StoredCenters>(ports, application);
 }
 
 }  // namespace Varnel::Platform::Linux

@@ -11,6 +11,9 @@ namespace {
 using Text = UniqueHandle<char*, g_free>;
 
 constexpr gint32 expiryOfServer = -1;
+// No general category fits, so it is one of the suite's own, as the service's rules for them say.
+constexpr const char* category = "x-quennel.reminder";
+constexpr guchar normalUrgency = 1;
 
 BusMessage request(const char* destination, const char* method, GVariant* body) {
   BusMessage message(
@@ -37,6 +40,8 @@ GVariant* hintsOf(const NotificationSource& source) {
   if (!source.desktopEntry.empty())
     g_variant_builder_add(&hints, "{sv}", "desktop-entry",
                           g_variant_new_string(valid(source.desktopEntry).get()));
+  g_variant_builder_add(&hints, "{sv}", "category", g_variant_new_string(category));
+  g_variant_builder_add(&hints, "{sv}", "urgency", g_variant_new_byte(normalUrgency));
   return g_variant_builder_end(&hints);
 }
 
@@ -116,6 +121,21 @@ std::optional<std::uint32_t> bannerNumberIn(GDBusMessage* reply) {
 BusMessage closeRequest(const BannerAddress& banner) {
   return request(banner.server.c_str(), "CloseNotification",
                  g_variant_new("(u)", guint32{banner.number}));
+}
+
+BusMessage messageToBus(const char* method, GVariant* body) {
+  constexpr const char* bus = "org.freedesktop.DBus";
+  BusMessage message(g_dbus_message_new_method_call(bus, "/org/freedesktop/DBus", bus, method));
+  g_dbus_message_set_body(message.get(), body);
+  return message;
+}
+
+bool isYes(GDBusMessage* reply) {
+  GVariant* body = g_dbus_message_get_body(reply);
+  gboolean answer = FALSE;
+  if (body && g_variant_is_of_type(body, G_VARIANT_TYPE("(b)")))
+    g_variant_get(body, "(b)", &answer);
+  return answer != FALSE;
 }
 
 BusMessage pingOfBus() {

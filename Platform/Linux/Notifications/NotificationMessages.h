@@ -58,8 +58,12 @@ struct BannerAddress final {
 
 [[nodiscard]] BusMessage closeRequest(const BannerAddress& banner);
 
-/// Asks the bus itself for nothing but an answer.
+/// A call of the bus itself.
+[[nodiscard]] BusMessage messageToBus(const char* method, GVariant* body);
+/// Asks the bus for nothing but an answer.
 [[nodiscard]] BusMessage pingOfBus();
+/// Whether the reply is a yes.
+[[nodiscard]] bool isYes(GDBusMessage* reply);
 
 /// The error that a reply reports.
 [[nodiscard]] std::optional<std::string> errorIn(GDBusMessage* reply);

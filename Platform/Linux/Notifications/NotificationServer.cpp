@@ -20,12 +20,18 @@ namespace {
 // What the server's replies and signals refer to. Replies may outlive the adapter.
 class Desktop final : public std::enable_shared_from_this<Desktop> {
  public:
-  Desktop(SystemLog& systemLog, NotificationSource first, std::chrono::milliseconds patience)
+  Desktop(SystemLog& systemLog, NotificationSource first, std::shared_ptr<SessionBus> bus)
       : source(std::move(first)),
         systemLog_(systemLog),
-        bus_(std::make_shared<SessionBus>([this](const char* sender, const char* name,
-                                                 GVariant* body) { receive(sender, name, body); },
-                                          patience)) {}
+        bus_(std::move(bus)),
+        signals_(bus_->listen({notificationService, notificationService, nullptr, notificationPath},
+                              [this](const char* sender, const char* name, GVariant* body) {
+                                receive(sender, name, body);
+                              })),
+        servers_(bus_->watch(notificationService,
+                             [this](const std::string& before, const std::string& after) {
+                               replaceServer(before, !after.empty());
+                             })) {}
 
   std::weak_ptr<NotificationServer::Observer> observer;
   NotificationSource source;
@@ -36,60 +42,51 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
         replacedReference ? BannerAddress::parse(*replacedReference) : std::nullopt;
     if (replaced) take(*replaced);
     shown_.insert_or_assign(token, Shown());
-    bus_->connect([weak = weak_from_this(), token, banner, replaced](const std::string& error) {
-      const auto self = weak.lock();
-      if (!self || !self->shown_.contains(token)) return;
-      if (!error.empty()) return self->fail(token, error);
-      // Asked each time, because another server may have taken its place.
-      self->send(capabilitiesRequest(), token, SessionBus::Waiting::limited,
-                 [token, banner, replaced](Desktop& desktop, GDBusMessage* reply) {
-                   desktop.notify(token, banner, replaced, g_dbus_message_get_sender(reply),
-                                  capabilitiesIn(reply));
-                 });
-    });
+    // Asked each time, because another server may have taken its place.
+    ask(capabilitiesRequest(), token, SessionBus::usualTime,
+        [token, banner, replaced](Desktop& self, GDBusMessage* reply) {
+          self.notify(token, banner, replaced, g_dbus_message_get_sender(reply),
+                      capabilitiesIn(reply));
+        });
   }
 
   void close(const std::string& token, const std::optional<std::string>& reference) {
     auto address = reference ? BannerAddress::parse(*reference) : std::nullopt;
     if (const auto shown = shown_.extract(token); shown && shown.mapped().address)
-      address = *shown.mapped().address;
+      address = shown.mapped().address;
+    ++pending_;
     bus_->connect([weak = weak_from_this(), token, address](const std::string& error) {
       const auto self = weak.lock();
       if (!self) return;
+      --self->pending_;
       if (!error.empty()) return self->tell(&NotificationServer::Observer::bannerFailed, token);
       // The server of another session has gone with its banners; then the bus alone is asked, so
       // that the answer comes later.
       const bool isHere = address && address->bus == self->bus_->name();
-      self->bus_->send(isHere ? closeRequest(*address) : pingOfBus(), SessionBus::Waiting::limited,
-                       [weak, token](GDBusMessage*, const std::string&) {
-                         // Whatever the server says: it does not matter whether it was still there.
-                         if (const auto asked = weak.lock())
-                           asked->tell(&NotificationServer::Observer::bannerGone, token);
-                       });
+      self->send(isHere ? closeRequest(*address) : pingOfBus(), SessionBus::usualTime,
+                 // Whatever the server says: it does not matter whether it was still there.
+                 [token](Desktop& asked, GDBusMessage*, const BusFailure&) {
+                   asked.tell(&NotificationServer::Observer::bannerGone, token);
+                 });
     });
   }
 
   void check(std::function<void(const std::optional<PlatformError>&)> answer) {
-    const auto tell = [answer = std::move(answer)](const std::string& error) {
-      if (error.empty()) return answer(std::nullopt);
-      answer(
-          PlatformError(notificationService, 0, {{std::string(localizedDescriptionKey), error}}));
-    };
-    bus_->connect([weak = weak_from_this(), tell](const std::string& error) {
-      const auto self = weak.lock();
-      if (!self) return;
-      if (!error.empty()) return tell(error);
-      self->bus_->send(capabilitiesRequest(), SessionBus::Waiting::limited,
-                       [tell](GDBusMessage*, const std::string& refusal) { tell(refusal); });
-    });
+    send(capabilitiesRequest(), SessionBus::usualTime,
+         [answer = std::move(answer)](Desktop&, GDBusMessage* reply, const BusFailure& failure) {
+           if (reply) return answer(std::nullopt);
+           answer(PlatformError(notificationService, 0,
+                                {{std::string(localizedDescriptionKey), failure.text}}));
+         });
   }
 
-  bool isBusy() const { return bus_->isBusy(); }
+  bool isBusy() const { return pending_ > 0; }
 
  private:
   using Event = void (NotificationServer::Observer::*)(const std::string& token);
   struct Shown {
-    std::optional<BannerAddress> address;  // None while the server has yet to answer.
+    std::optional<BannerAddress> address = std::nullopt;  ///< Once the server has answered.
+    std::string activationToken = {};                     ///< Comes before the click.
     bool isExpired = false;
   };
 
@@ -98,15 +95,24 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
   }
 
   template <typename Use>
-  void send(const BusMessage& message, const std::string& token, SessionBus::Waiting waiting,
-            Use use) {
-    bus_->send(
-        message, waiting,
-        [weak = weak_from_this(), token, use](GDBusMessage* reply, const std::string& error) {
-          const auto self = weak.lock();
-          if (!self) return;
-          reply ? use(*self, reply) : self->fail(token, error);
-        });
+  void send(BusMessage message, std::chrono::milliseconds time, Use use) {
+    ++pending_;
+    bus_->ask(std::move(message), time,
+              [weak = weak_from_this(), use](GDBusMessage* reply, const BusFailure& failure) {
+                const auto self = weak.lock();
+                if (!self) return;
+                --self->pending_;
+                use(*self, reply, failure);
+              });
+  }
+
+  // What fails is the banner with this token.
+  template <typename Use>
+  void ask(BusMessage message, const std::string& token, std::chrono::milliseconds time, Use use) {
+    send(std::move(message), time,
+         [token, use](Desktop& self, GDBusMessage* reply, const BusFailure& failure) {
+           reply ? use(self, reply) : self.fail(token, failure.text);
+         });
   }
 
   void fail(const std::string& token, const std::string& error) {
@@ -123,73 +129,82 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
               ServerCapabilities capabilities) {
     if (!shown_.contains(token)) return;
     const bool knowsIt = replaced && replaced->bus == bus_->name() && replaced->server == server;
-    send(notifyRequest(server, source, banner, capabilities, knowsIt ? replaced->number : 0), token,
-         SessionBus::Waiting::unlimited, [token, server](Desktop& self, GDBusMessage* reply) {
-           const auto number = bannerNumberIn(reply);
-           if (!number) return self.fail(token, "The notification server gives no number.");
-           self.hasShown(token, {self.bus_->name(), server, *number});
-         });
+    ask(notifyRequest(server, source, banner, capabilities, knowsIt ? replaced->number : 0), token,
+        SessionBus::unlimitedTime, [token, server](Desktop& self, GDBusMessage* reply) {
+          const auto number = bannerNumberIn(reply);
+          if (!number) return self.fail(token, "The notification server gives no number.");
+          self.hasShown(token, {self.bus_->name(), server, *number});
+        });
   }
 
   void hasShown(const std::string& token, const BannerAddress& address) {
     lastError_.clear();
     const auto shown = shown_.find(token);
-    if (shown == shown_.end()) {
-      // The banner was closed before the server had answered.
-      bus_->send(closeRequest(address), SessionBus::Waiting::limited,
-                 [](GDBusMessage*, const std::string&) {});
-      return;
-    }
+    // The banner was closed before the server had answered.
+    if (shown == shown_.end()) return closeQuietly(address);
     shown->second.address = address;
     if (const auto told = observer.lock()) told->bannerShown(token, address.reference());
   }
 
+  void closeQuietly(const BannerAddress& address) {
+    send(closeRequest(address), SessionBus::usualTime,
+         [](Desktop&, GDBusMessage*, const BusFailure&) {});
+  }
+
   void receive(const char* sender, std::string_view name, GVariant* body) {
     guint32 number = 0;
-    if (name == "ActionInvoked" && g_variant_is_of_type(body, G_VARIANT_TYPE("(us)"))) {
-      const char* action = nullptr;
-      g_variant_get(body, "(u&s)", &number, &action);
-      invoke({bus_->name(), sender, number}, action);
+    const char* text = nullptr;
+    if (g_variant_is_of_type(body, G_VARIANT_TYPE("(us)"))) {
+      g_variant_get(body, "(u&s)", &number, &text);
+      if (name == "ActionInvoked") invoke({bus_->name(), sender, number}, text);
+      if (name == "ActivationToken") keepToken({bus_->name(), sender, number}, text);
     }
     if (name == "NotificationClosed" && g_variant_is_of_type(body, G_VARIANT_TYPE("(uu)"))) {
       guint32 reason = 0;
       g_variant_get(body, "(uu)", &number, &reason);
       close({bus_->name(), sender, number}, reason);
     }
-    if (name == "NameOwnerChanged" && g_variant_is_of_type(body, G_VARIANT_TYPE("(sss)"))) {
-      const char* before = nullptr;
-      const char* after = nullptr;
-      g_variant_get(body, "(&s&s&s)", nullptr, &before, &after);
-      replaceServer(before, *after != 0);
-    }
   }
 
-  // The banner's token, once: further signals for the same banner are ignored.
-  std::optional<std::string> take(const BannerAddress& address) {
-    for (auto shown = shown_.begin(); shown != shown_.end(); ++shown)
-      if (shown->second.address == address) return shown_.extract(shown).key();
+  // The banner's token and what is known of it, once: further signals for the same banner are
+  // ignored.
+  std::optional<std::pair<std::string, Shown>> take(const BannerAddress& address) {
+    for (auto shown = shown_.begin(); shown != shown_.end(); ++shown) {
+      if (shown->second.address != address) continue;
+      auto taken = shown_.extract(shown);
+      return std::pair(taken.key(), std::move(taken.mapped()));
+    }
     return std::nullopt;
   }
 
+  void keepToken(const BannerAddress& address, const char* activationToken) {
+    for (auto& [token, shown] : shown_)
+      if (shown.address == address) shown.activationToken = activationToken;
+  }
+
   void invoke(const BannerAddress& address, std::string_view action) {
-    const auto token = take(address);
-    if (!token) return;
+    const auto taken = take(address);
+    if (!taken) return;
     // Not every server closes the banner by itself.
-    bus_->send(closeRequest(address), SessionBus::Waiting::limited,
-               [](GDBusMessage*, const std::string&) {});
+    closeQuietly(address);
     if (action == dismissAction)
-      return tell(&NotificationServer::Observer::bannerDismissed, *token);
+      return tell(&NotificationServer::Observer::bannerDismissed, taken->first);
     if (const auto told = observer.lock())
-      told->bannerActivated(*token, {.isActionButton = action == buttonAction});
+      told->bannerActivated(taken->first, {.isActionButton = action == buttonAction,
+                                           .activationToken = taken->second.activationToken});
   }
 
   void close(const BannerAddress& address, guint32 reason) {
-    const auto token = take(address);
-    if (!token) return;
+    const auto taken = take(address);
+    if (!taken) return;
     // The user may bring an expired banner back from the server's history.
-    if (reason == expired) shown_[*token] = {.address = address, .isExpired = true};
+    if (reason == expired) {
+      Shown& kept = shown_.insert_or_assign(taken->first, taken->second).first->second;
+      kept.isExpired = true;
+    }
     using Observer = NotificationServer::Observer;
-    tell(reason == dismissedByUser ? &Observer::bannerDismissed : &Observer::bannerGone, *token);
+    tell(reason == dismissedByUser ? &Observer::bannerDismissed : &Observer::bannerGone,
+         taken->first);
   }
 
   // What is on its way to the server that has ended is answered by the bus.
@@ -208,15 +223,18 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
 
   SystemLog& systemLog_;
   const std::shared_ptr<SessionBus> bus_;
-  std::map<std::string, Shown> shown_;  // By token.
+  const SessionBus::Subscription signals_;
+  const SessionBus::Subscription servers_;
+  std::map<std::string, Shown> shown_;  ///< By the owner's token.
   std::string lastError_;
+  int pending_ = 0;  ///< Requests that have not been answered.
 };
 
 class BusNotificationServer final : public NotificationServer {
  public:
   BusNotificationServer(SystemLog& systemLog, const NotificationSource& source,
-                        std::chrono::milliseconds patience)
-      : desktop_(std::make_shared<Desktop>(systemLog, source, patience)) {}
+                        std::shared_ptr<SessionBus> bus)
+      : desktop_(std::make_shared<Desktop>(systemLog, source, std::move(bus))) {}
 
   void setObserver(std::weak_ptr<Observer> observer) override {
     desktop_->observer = std::move(observer);
@@ -242,8 +260,8 @@ class BusNotificationServer final : public NotificationServer {
 
 std::unique_ptr<NotificationServer> makeBusNotificationServer(SystemLog& systemLog,
                                                               const NotificationSource& source,
-                                                              std::chrono::milliseconds patience) {
-  return std::make_unique<BusNotificationServer>(systemLog, source, patience);
+                                                              std::shared_ptr<SessionBus> bus) {
+  return std::make_unique<BusNotificationServer>(systemLog, source, std::move(bus));
 }
 
 }  // namespace Varnel::Platform::Linux

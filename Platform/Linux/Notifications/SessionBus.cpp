@@ -40,16 +40,83 @@ class OnMainContext final {
   const bool isPushed_;
 };
 
-void dispatch(GDBusConnection*, const char* sender, const char*, const char*, const char* name,
-              GVariant* body, gpointer signal) noexcept {
-  (*static_cast<SessionBus::Signal*>(signal))(sender, name, body);
+using BusInterface = UniqueHandle<GDBusNodeInfo*, g_dbus_node_info_unref>;
+
+constexpr const char* busService = "org.freedesktop.DBus";
+constexpr const char* busPath = "/org/freedesktop/DBus";
+
+BusFailure failureIn(GDBusMessage* reply, std::string text) {
+  const char* name = g_dbus_message_get_error_name(reply);
+  return {name ? name : "", std::move(text)};
 }
 
-void release(gpointer signal) noexcept {
-  delete static_cast<SessionBus::Signal*>(signal);
+void call(GDBusConnection*, const char*, const char*, const char*, const char* method,
+          GVariant* arguments, GDBusMethodInvocation* invocation, gpointer object) noexcept {
+  static_cast<ServedObject*>(object)->call(method, arguments, invocation);
 }
 
 }  // namespace
+
+bool BusFailure::isNobodyThere() const {
+  const std::string_view errors = "org.freedesktop.DBus.Error.";
+  if (name.empty()) return false;
+  return name == std::string(errors) + "ServiceUnknown" ||
+         name == std::string(errors) + "NameHasNoOwner" ||
+         name.starts_with(std::string(errors) + "Spawn.");
+}
+
+// Signals that somebody hears, as long as it lives.
+class SessionBus::Listener final : public std::enable_shared_from_this<Listener> {
+ public:
+  Listener(const SignalMatch& match, Signal signal)
+      : sender_(match.sender),
+        interface_(match.interface),
+        name_(match.name),
+        path_(match.path),
+        argument_(match.argument ? match.argument : ""),
+        hasArgument_(match.argument),
+        signal_(std::move(signal)) {}
+  ~Listener() { detach(); }
+  Listener(const Listener&) = delete;
+  Listener& operator=(const Listener&) = delete;
+
+  void attach(GDBusConnection* connection) {
+    detach();
+    const OnMainContext here;
+    connection_ = Kept(G_DBUS_CONNECTION(g_object_ref(connection)));
+    number_ = g_dbus_connection_signal_subscribe(
+        connection, sender_, interface_, name_, path_, hasArgument_ ? argument_.c_str() : nullptr,
+        G_DBUS_SIGNAL_FLAGS_NONE, &dispatch, new std::weak_ptr(weak_from_this()), &forget);
+  }
+
+ private:
+  using Kept = UniqueHandle<GDBusConnection*, g_object_unref>;
+
+  static void dispatch(GDBusConnection*, const char* sender, const char*, const char*,
+                       const char* name, GVariant* body, gpointer listener) noexcept {
+    const auto told = static_cast<std::weak_ptr<Listener>*>(listener)->lock();
+    if (told) told->signal_(sender, name, body);
+  }
+  static void forget(gpointer listener) noexcept {
+    delete static_cast<std::weak_ptr<Listener>*>(listener);
+  }
+
+  void detach() {
+    if (connection_) g_dbus_connection_signal_unsubscribe(connection_.get(), number_);
+    connection_ = Kept();
+  }
+
+  // Of the texts only the last may be made at run time.
+  const char* const sender_;
+  const char* const interface_;
+  const char* const name_;
+  const char* const path_;
+  const std::string argument_;
+  const bool hasArgument_;
+  const Signal signal_;
+  Kept connection_;
+  guint number_ = 0;
+};
 
 struct SessionBus::Attempt {
   const Cancellable cancellable{g_cancellable_new()};
@@ -60,16 +127,48 @@ struct SessionBus::AwaitedReply {
   Reply use;
 };
 
-SessionBus::SessionBus(Signal signal, std::chrono::milliseconds patience)
-    : signal_(std::move(signal)), patience_(patience) {}
+SessionBus::SessionBus(std::chrono::milliseconds patience) : patience_(patience) {}
 
 SessionBus::~SessionBus() {
   if (attempt_) g_cancellable_cancel(attempt_->cancellable.get());
-  unsubscribe();
+  release();
+}
+
+SessionBus::Subscription SessionBus::listen(const SignalMatch& match, Signal signal) {
+  std::erase_if(listeners_, [](const auto& each) { return each.expired(); });
+  const auto listener = std::make_shared<Listener>(match, std::move(signal));
+  listeners_.push_back(listener);
+  if (isConnected()) listener->attach(connection_.get());
+  return listener;
+}
+
+SessionBus::Subscription SessionBus::watch(
+    const std::string& name,
+    std::function<void(const std::string& before, const std::string& after)> changed) {
+  return listen({busService, busService, "NameOwnerChanged", busPath, name.c_str()},
+                [changed = std::move(changed)](const char*, const char*, GVariant* body) {
+                  if (!g_variant_is_of_type(body, G_VARIANT_TYPE("(sss)"))) return;
+                  const char* before = nullptr;
+                  const char* after = nullptr;
+                  g_variant_get(body, "(&s&s&s)", nullptr, &before, &after);
+                  changed(before, after);
+                });
+}
+
+void SessionBus::serve(ServedObject object) {
+  objects_.push_back(std::move(object));
+}
+
+void SessionBus::setObserver(std::function<void(bool isConnected)> observer) {
+  observer_ = std::move(observer);
+}
+
+bool SessionBus::isConnected() const {
+  return connection_ && !g_dbus_connection_is_closed(connection_.get());
 }
 
 void SessionBus::connect(Connected use) {
-  if (connection_ && !g_dbus_connection_is_closed(connection_.get())) return use({});
+  if (isConnected()) return use({});
   waiting_.push_back(std::move(use));
   if (!attempt_) start();
 }
@@ -124,30 +223,54 @@ void SessionBus::finish(std::shared_ptr<Attempt> attempt, Connection connection,
 
 void SessionBus::adopt(Connection connection) {
   // A signal of the lost connection may still arrive.
-  unsubscribe();
+  release();
   connection_ = std::move(connection);
   const OnMainContext here;
-  const auto subscribe = [this](const char* sender, const char* interface, const char* name,
-                                const char* path, const char* argument) {
-    return g_dbus_connection_signal_subscribe(connection_.get(), sender, interface, name, path,
-                                              argument, G_DBUS_SIGNAL_FLAGS_NONE, &dispatch,
-                                              new Signal(signal_), &release);
-  };
-  constexpr const char* bus = "org.freedesktop.DBus";
-  subscriptions_[0] =
-      subscribe(notificationService, notificationService, nullptr, notificationPath, nullptr);
-  subscriptions_[1] =
-      subscribe(bus, bus, "NameOwnerChanged", "/org/freedesktop/DBus", notificationService);
+  g_signal_connect(connection_.get(), "closed", G_CALLBACK(closed), this);
+  for (const auto& each : listeners_)
+    if (const auto listener = each.lock()) listener->attach(connection_.get());
+  for (const ServedObject& object : objects_) publish(object);
+  if (observer_) observer_(true);
 }
 
-void SessionBus::send(const BusMessage& message, Waiting waiting, Reply reply) {
-  constexpr int defaultTimeout = -1;
+void SessionBus::publish(const ServedObject& object) const {
+  static constexpr GDBusInterfaceVTable table{&call, nullptr, nullptr, {}};
+  const BusInterface node(g_dbus_node_info_new_for_xml(object.interface, nullptr));
+  g_dbus_connection_register_object(
+      connection_.get(), object.path, node.get()->interfaces[0], &table, new ServedObject(object),
+      [](gpointer kept) { delete static_cast<ServedObject*>(kept); }, nullptr);
+}
+
+void SessionBus::closed(GDBusConnection* connection, gboolean, GError*, gpointer self) noexcept {
+  auto& bus = *static_cast<SessionBus*>(self);
+  if (connection == bus.connection_.get() && bus.observer_) bus.observer_(false);
+}
+
+void SessionBus::send(const BusMessage& message, std::chrono::milliseconds time, Reply reply) {
   const OnMainContext here;
   ++awaitedReplies_;
   g_dbus_connection_send_message_with_reply(
       connection_.get(), message.get(), G_DBUS_SEND_MESSAGE_FLAGS_NONE,
-      waiting == Waiting::limited ? defaultTimeout : G_MAXINT, nullptr, nullptr, &replied,
+      static_cast<int>(time.count()), nullptr, nullptr, &replied,
       new AwaitedReply{weak_from_this(), std::move(reply)});
+}
+
+void SessionBus::ask(BusMessage message, std::chrono::milliseconds time, Reply reply) {
+  const auto kept = std::make_shared<BusMessage>(std::move(message));
+  connect([weak = weak_from_this(), kept, time, reply](const std::string& error) {
+    const auto self = weak.lock();
+    if (self && error.empty()) return self->send(*kept, time, reply);
+    reply(nullptr, {"", error});
+  });
+}
+
+void SessionBus::tell(const BusMessage& message) {
+  g_dbus_message_set_flags(message.get(),
+                           static_cast<GDBusMessageFlags>(g_dbus_message_get_flags(message.get()) |
+                                                          G_DBUS_MESSAGE_FLAGS_NO_REPLY_EXPECTED));
+  if (isConnected())
+    g_dbus_connection_send_message(connection_.get(), message.get(), G_DBUS_SEND_MESSAGE_FLAGS_NONE,
+                                   nullptr, nullptr);
 }
 
 void SessionBus::replied(GObject* connection, GAsyncResult* result, gpointer data) noexcept {
@@ -156,13 +279,13 @@ void SessionBus::replied(GObject* connection, GAsyncResult* result, gpointer dat
   const BusMessage message(g_dbus_connection_send_message_with_reply_finish(
       G_DBUS_CONNECTION(connection), result, &error));
   if (const auto self = awaited->bus.lock()) --self->awaitedReplies_;
-  if (!message) return awaited->use(nullptr, take(error));
+  if (!message) return awaited->use(nullptr, {"", take(error)});
   // A message from a real bus always has a sender.
   if (!g_dbus_message_get_sender(message.get()))
-    return awaited->use(nullptr, "The session bus does not tell who answers.");
+    return awaited->use(nullptr, {"", "The session bus does not tell who answers."});
   const auto refusal = errorIn(message.get());
   if (refusal)
-    awaited->use(nullptr, *refusal);
+    awaited->use(nullptr, failureIn(message.get(), *refusal));
   else
     awaited->use(message.get(), {});
 }
@@ -172,10 +295,8 @@ std::string SessionBus::name() const {
   return guid ? guid : "";
 }
 
-void SessionBus::unsubscribe() {
-  if (!connection_) return;
-  for (const guint subscription : subscriptions_)
-    g_dbus_connection_signal_unsubscribe(connection_.get(), subscription);
+void SessionBus::release() {
+  if (connection_) g_signal_handlers_disconnect_by_data(connection_.get(), this);
 }
 
 void SessionBus::disconnect(GDBusConnection* connection) {
@@ -186,6 +307,10 @@ void SessionBus::disconnect(GDBusConnection* connection) {
 void SessionBus::destroy(GSource* source) {
   g_source_destroy(source);
   g_source_unref(source);
+}
+
+std::shared_ptr<SessionBus> makeSessionBus(std::chrono::milliseconds patience) {
+  return std::make_shared<SessionBus>(patience);
 }
 
 }  // namespace Varnel::Platform::Linux

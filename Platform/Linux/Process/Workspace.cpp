@@ -8,24 +8,14 @@
 #include <Varnel/Platform/Generic/BundleFolders.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/Process/CommandLine.h>
+#include <Varnel/Platform/Linux/Process/DesktopEntry.h>
 #include <Varnel/Platform/Values/UniqueHandle.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
 
 namespace fs = std::filesystem;
-using DesktopEntry = UniqueHandle<GKeyFile*, g_key_file_unref>;
 using Text = UniqueHandle<char*, g_free>;
-
-// The entry of this identifier: the user's before the system's, and "a-b" also as "b" in a folder
-// "a". The escapes of its texts are undone as they are read.
-DesktopEntry entryOf(const std::string& identifier) {
-  DesktopEntry entry(g_key_file_new());
-  const std::string file = "applications/" + identifier + ".desktop";
-  if (!g_key_file_load_from_data_dirs(entry.get(), file.c_str(), nullptr, G_KEY_FILE_NONE, nullptr))
-    return {};
-  return entry;
-}
 
 std::optional<std::string> textIn(const DesktopEntry& entry, const char* key) {
   const Text text(g_key_file_get_string(entry.get(), G_KEY_FILE_DESKTOP_GROUP, key, nullptr));
@@ -44,13 +34,8 @@ std::optional<fs::path> find(const std::string& program) {
   return failed ? fs::path(found.get()) : resolved;
 }
 
-// Absent for an entry that hides the application, or whose "TryExec" program is missing.
+// Absent where the entry's "TryExec" program is missing.
 std::optional<fs::path> executableOf(const DesktopEntry& entry) {
-  if (textIn(entry, G_KEY_FILE_DESKTOP_KEY_TYPE) != G_KEY_FILE_DESKTOP_TYPE_APPLICATION)
-    return std::nullopt;
-  if (g_key_file_get_boolean(entry.get(), G_KEY_FILE_DESKTOP_GROUP, G_KEY_FILE_DESKTOP_KEY_HIDDEN,
-                             nullptr))
-    return std::nullopt;
   const auto tried = textIn(entry, G_KEY_FILE_DESKTOP_KEY_TRY_EXEC);
   if (tried && !find(*tried)) return std::nullopt;
   const auto line = textIn(entry, G_KEY_FILE_DESKTOP_KEY_EXEC);
@@ -61,11 +46,7 @@ std::optional<fs::path> executableOf(const DesktopEntry& entry) {
 class DesktopEntries final : public Workspace {
  public:
   std::optional<URL> applicationURL(const std::string& bundleIdentifier) override {
-    // An identifier must be one file name. With a separator, it could lead out of the folder of
-    // desktop entries.
-    if (bundleIdentifier.empty() || bundleIdentifier.find('/') != std::string::npos)
-      return std::nullopt;
-    const DesktopEntry entry = entryOf(bundleIdentifier);
+    const DesktopEntry entry = findDesktopEntry(bundleIdentifier);
     if (!entry) return std::nullopt;
     const auto executable = executableOf(entry);
     if (!executable) return std::nullopt;

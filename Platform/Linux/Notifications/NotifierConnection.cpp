@@ -1,0 +1,210 @@
+// SPDX-License-Identifier: MIT
+#include <Varnel/Platform/Linux/Notifications/NotifierConnection.h>
+
+#include <utility>
+
+#include <Varnel/Platform/Linux/Notifications/HostName.h>
+#include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
+#include <Varnel/Platform/Linux/Notifications/NotifierProtocol.h>
+
+namespace Varnel::Platform::Linux {
+namespace {
+
+using Variant = UniqueHandle<GVariant*, g_variant_unref>;
+
+BusMessage changedMessage(const std::string& identifier) {
+  BusMessage message(
+      g_dbus_message_new_method_call(notifierName, notifierPath, notifierName, "Changed"));
+  g_dbus_message_set_body(message.get(), g_variant_new("(s)", identifier.c_str()));
+  return message;
+}
+
+}  // namespace
+
+// What replies and calls refer to, which may come after the connection's end.
+class NotifierConnection::Conversation final : public std::enable_shared_from_this<Conversation> {
+ public:
+  Conversation(std::shared_ptr<SessionBus> bus, std::string identifier, MakeDeliverer makeDeliverer)
+      : bus_(std::move(bus)),
+        identifier_(std::move(identifier)),
+        hostName_(hostName(identifier_)),
+        frontName_(frontName(identifier_)),
+        makeDeliverer_(std::move(makeDeliverer)),
+        notifiers_(bus_->watch(notifierName, [this](const auto&, const std::string& owner) {
+          if (owner.empty()) notifierEnded();
+        })) {}
+
+  void start() {
+    const std::weak_ptr weak = weak_from_this();
+    bus_->setObserver([weak](bool isConnected) {
+      const auto self = weak.lock();
+      if (!self || !isConnected) return;
+      self->claimName();
+      self->claimFront();
+    });
+    bus_->serve({hostPath, hostInterface,
+                 [weak](std::string_view method, GVariant* arguments, GDBusMethodInvocation* call) {
+                   const auto self = weak.lock();
+                   g_dbus_method_invocation_return_value(
+                       call, self ? self->receive(method, arguments) : nullptr);
+                 }});
+  }
+
+  void setHost(std::weak_ptr<NotificationHost> host, Standing standing) {
+    host_ = std::move(host);
+    standing_ = standing;
+    if (replacement_) replacement_->setHost(host_, standing_);
+    claimName();
+    changed();
+  }
+
+  void setActive(bool isActive) {
+    isActive_ = isActive;
+    if (replacement_) return replacement_->setActive(isActive_);
+    claimFront();
+    // The notifier has to know before the next notification comes.
+    if (isActive_) bus_->connect([](const std::string&) {});
+  }
+
+  // While one message is on its way, all further changes wait for one more.
+  void changed() {
+    if (replacement_) return replacement_->changed();
+    if (std::exchange(isChanged_, true)) return;
+    if (pendingChanges_ == 0) tellChanged();
+  }
+
+  void changedAtOnce() {
+    if (replacement_) return replacement_->changedAtOnce();
+    isUrgent_ = true;
+    changed();
+  }
+
+  void checkBanners(std::function<void(const Failure& obstacle)> answer) {
+    if (replacement_) return replacement_->checkBanners(std::move(answer));
+    bus_->ask(capabilitiesRequest(), SessionBus::usualTime,
+              [answer = std::move(answer)](GDBusMessage* reply, const BusFailure& failure) {
+                if (reply) return answer(std::nullopt);
+                answer(PlatformError(notificationService, 0,
+                                     {{std::string(localizedDescriptionKey), failure.text}}));
+              });
+  }
+
+  bool isBusy() const { return pendingChanges_ > 0 || (replacement_ && replacement_->isBusy()); }
+
+ private:
+  GVariant* receive(std::string_view method, GVariant* arguments) {
+    const auto host = host_.lock();
+    const Variant dictionary(g_variant_get_child_value(arguments, 0));
+    const UserNotification notification = notificationIn(dictionary.get());
+    if (method == "ShouldPresent")
+      return g_variant_new("(b)", !host || host->shouldPresent(notification));
+    if (host && method == "DidDeliver") host->didDeliver(notification);
+    if (host && method == "DidActivate") {
+      gboolean isActionButton = FALSE;
+      g_variant_get_child(arguments, 1, "b", &isActionButton);
+      host->didActivate({notification, isActionButton != FALSE});
+    }
+    return nullptr;
+  }
+
+  void tellChanged() {
+    isChanged_ = false;
+    ++pendingChanges_;
+    bus_->ask(changedMessage(identifier_), SessionBus::usualTime,
+              [weak = weak_from_this()](GDBusMessage* reply, const BusFailure& failure) {
+                if (const auto self = weak.lock()) self->changeAnswered(reply, failure);
+              });
+  }
+
+  void changeAnswered(GDBusMessage* reply, const BusFailure& failure) {
+    --pendingChanges_;
+    const bool isThere = reply || (!failure.name.empty() && !failure.isNobodyThere());
+    if (!isThere) return replace();
+    isUrgent_ = false;
+    staysForUs_ = reply && isYes(reply);
+    if (isChanged_) tellChanged();
+  }
+
+  // A notifier that had nothing to do any more is not called back. One that ended otherwise is,
+  // once.
+  void notifierEnded() {
+    if (std::exchange(staysForUs_, false) && !replacement_) changed();
+  }
+
+  void replace() {
+    if (replacement_) return;
+    replacement_ = makeDeliverer_();
+    replacement_->setActive(isActive_);
+    replacement_->setHost(host_, standing_);
+    if (isUrgent_)
+      replacement_->changedAtOnce();
+    else
+      replacement_->changed();
+  }
+
+  // Several processes may be in front; one has the name, and the others wait for it.
+  void claimFront() const {
+    bus_->tell(isActive_
+                   ? messageToBus("RequestName", g_variant_new("(su)", frontName_.c_str(), 0u))
+                   : messageToBus("ReleaseName", g_variant_new("(s)", frontName_.c_str())));
+  }
+
+  // Waits in the bus's queue while somebody has the name who does not give way.
+  void claimName() const {
+    constexpr std::uint32_t givesWay = 1, takesOver = 2;
+    if (!host_.expired())
+      bus_->tell(messageToBus(
+          "RequestName", g_variant_new("(su)", hostName_.c_str(),
+                                       standing_ == Standing::onlooker ? givesWay : takesOver)));
+  }
+
+  const std::shared_ptr<SessionBus> bus_;
+  const std::string identifier_;
+  const std::string hostName_;
+  const std::string frontName_;
+  const MakeDeliverer makeDeliverer_;
+  std::unique_ptr<DelivererConnection> replacement_;  ///< Where there is no notifier.
+  std::weak_ptr<NotificationHost> host_;
+  Standing standing_ = Standing::application;
+  bool isActive_ = false;
+  bool isChanged_ = false;   ///< Since the last message.
+  bool isUrgent_ = false;    ///< Something must not wait for a host.
+  bool staysForUs_ = false;  ///< What the notifier said last.
+  int pendingChanges_ = 0;   ///< Messages that have not been answered.
+  const SessionBus::Subscription notifiers_;
+};
+
+NotifierConnection::NotifierConnection(std::shared_ptr<SessionBus> bus, std::string baseIdentifier,
+                                       MakeDeliverer makeDeliverer)
+    : conversation_(std::make_shared<Conversation>(std::move(bus), std::move(baseIdentifier),
+                                                   std::move(makeDeliverer))) {
+  conversation_->start();
+}
+
+NotifierConnection::~NotifierConnection() = default;
+
+void NotifierConnection::setHost(std::weak_ptr<NotificationHost> host, Standing standing) {
+  conversation_->setHost(std::move(host), standing);
+}
+
+void NotifierConnection::setActive(bool isActive) {
+  conversation_->setActive(isActive);
+}
+
+void NotifierConnection::changed() {
+  conversation_->changed();
+}
+
+void NotifierConnection::changedAtOnce() {
+  conversation_->changedAtOnce();
+}
+
+void NotifierConnection::checkBanners(std::function<void(const Failure& obstacle)> answer) {
+  conversation_->checkBanners(std::move(answer));
+}
+
+bool NotifierConnection::isBusy() const {
+  return conversation_->isBusy();
+}
+
+}  // namespace Varnel::Platform::Linux

@@ -1,0 +1,199 @@
+// SPDX-License-Identifier: MIT
+#include <varnel-notifier/Notifier.h>
+
+#include <malloc.h>
+
+#include <algorithm>
+#include <optional>
+#include <system_error>
+#include <utility>
+
+#include <Varnel/Platform/Generic/NotificationDeliverer.h>
+#include <Varnel/Platform/Linux/Notifications/BusHosts.h>
+#include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
+#include <Varnel/Platform/Linux/Notifications/NotifierProtocol.h>
+#include <Varnel/Platform/POSIX/UserFolders.h>
+#include <Varnel/Platform/Ports/ApplicationLauncher.h>
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/NotificationServer.h>
+#include <Varnel/Platform/Ports/SystemLog.h>
+#include <Varnel/Platform/Ports/WallClockTimer.h>
+
+namespace Varnel {
+
+using namespace Platform;
+using namespace Platform::Linux;
+
+namespace {
+
+namespace fs = std::filesystem;
+
+// The action of a desktop entry that an action button stands for: the notification's identifier,
+// with a dash for each character that names of actions lack.
+std::string actionOf(const NotificationActivation& activation) {
+  if (!activation.isActionButton) return "";
+  std::string name = activation.notification.identifier.value_or("");
+  for (char& c : name)
+    if (!g_ascii_isalnum(c)) c = '-';
+  return name;
+}
+
+}  // namespace
+
+// A product's store and everything that serves it alone. Other processes change the store, also
+// those that are killed before they can tell.
+class Notifier::Product final {
+ public:
+  // The base identifier counts until the store tells it.
+  Product(Notifier& notifier, const std::string& baseIdentifier, const fs::path& store)
+      : ports_(notifier.ports_),
+        launcher_(*notifier.launcher_),
+        hosts_(notifier.bus_, [this](const auto& activation) { launch(activation); }),
+        server_(makeBusNotificationServer(ports_.systemLog, {}, notifier.bus_)),
+        timer_(notifier.sharedTimer_.share()),
+        deliverer_({ports_.clock, ports_.userLocale, ports_.timeZones, ports_.mainQueue,
+                    ports_.privateFiles, ports_.systemLog, *server_, *timer_},
+                   store.string(), Migrating::never, hosts_),
+        watch_(store.parent_path(), store.filename(), [this] { deliverer_.recheck(); }) {
+    const auto source = deliverer_.source();
+    hosts_.setProduct(source && *source ? (*source)->identifier : baseIdentifier);
+    deliverer_.setDuty(NotificationDeliverer::Duty::everything);
+  }
+
+  NotificationDeliverer& deliverer() { return deliverer_; }
+  [[nodiscard]] bool isIdle() const {
+    return deliverer_.isIdle() && !hosts_.isBusy() && *launches_ == 0;
+  }
+
+ private:
+  // The store first: the application looks there as soon as it runs.
+  void launch(const NotificationActivation& activation) {
+    const auto complain = [&log = ports_.systemLog](const std::optional<PlatformError>& error) {
+      if (error)
+        log.write("A clicked notification does not reach its application: " +
+                  error->localizedDescription());
+    };
+    complain(deliverer_.keepLaunch(activation));
+    const auto source = deliverer_.source();
+    if (!source || !*source) return;
+    ++*launches_;
+    launcher_.launch({.desktopEntry = (*source)->desktopEntry,
+                      .action = actionOf(activation),
+                      .activationToken = activation.notification.activationToken.value_or("")},
+                     [complain, launches = launches_](const auto& error) {
+                       complain(error);
+                       --*launches;
+                     });
+  }
+
+  const NotificationPorts ports_;
+  ApplicationLauncher& launcher_;
+  const std::shared_ptr<int> launches_ = std::make_shared<int>(0);  ///< Not answered yet.
+  BusHosts hosts_;
+  const std::unique_ptr<NotificationServer> server_;
+  const std::unique_ptr<WallClockTimer> timer_;
+  NotificationDeliverer deliverer_;
+  const FileWatch watch_;
+};
+
+Notifier::Notifier(const NotificationPorts& ports, const fs::path& executable)
+    : ports_(ports),
+      executable_(executable),
+      bus_(makeSessionBus()),
+      launcher_(makeApplicationLauncher(bus_)),
+      timer_(makeWallClockTimer(ports.systemLog)),
+      sharedTimer_(ports.clock, *timer_),
+      zoneWatch_("/etc", "localtime", [this] { recheck(); }),
+      // Wakes `run`, which looks then.
+      executableWatch_(executable.parent_path(), executable.filename(), [] {}) {
+  bus_->serve({notifierPath, notifierInterface,
+               [this](std::string_view, GVariant* arguments, GDBusMethodInvocation* call) {
+                 receive(arguments, call);
+               }});
+  bus_->setObserver([this](bool isConnected) { isDisconnected_ = !isConnected; });
+}
+
+Notifier::~Notifier() = default;
+
+// Who calls while the name is given back reaches this notifier still, or else the next one.
+bool Notifier::run() {
+  std::optional<std::string> failure;
+  bus_->connect([&](const std::string& error) { failure = error; });
+  sleepWhile([&] { return !failure; });
+  if (!failure->empty()) {
+    ports_.systemLog.write("Notifications are not delivered: " + *failure);
+    return false;
+  }
+  const auto isOver = [this] {
+    std::error_code error;
+    return isDisconnected_ || !fs::exists(executable_, error);
+  };
+  do {
+    if (!ownsName("RequestName")) return true;
+    findProducts();
+    sleepWhile([&] { return !isOver() && !isIdle(); });
+    if (isOver()) return true;
+    static_cast<void>(ownsName("ReleaseName"));
+  } while (!isOver() && !isIdle());
+  return true;
+}
+
+// Asks the bus for the name, or gives it back; whether this is its owner then.
+bool Notifier::ownsName(const char* method) {
+  constexpr guint32 doNotQueue = 4, owner = 1;
+  const bool isRequest = std::string_view(method) == "RequestName";
+  std::optional<guint32> answer;
+  bus_->ask(messageToBus(method, isRequest ? g_variant_new("(su)", notifierName, doNotQueue)
+                                           : g_variant_new("(s)", notifierName)),
+            SessionBus::usualTime, [&](GDBusMessage* reply, const BusFailure&) {
+              answer = reply ? bannerNumberIn(reply).value_or(0) : 0;
+            });
+  sleepWhile([&] { return !answer; });
+  return isRequest && *answer == owner;
+}
+
+// What was used is given back before each sleep, which may last for weeks.
+void Notifier::sleepWhile(const std::function<bool()>& condition) {
+  while (condition()) {
+    ::malloc_trim(0);
+    ports_.mainQueue.runWhile([isFirst = true]() mutable { return std::exchange(isFirst, false); });
+    while (condition() && ports_.mainQueue.drain()) continue;
+  }
+}
+
+Notifier::Product* Notifier::product(const std::string& baseIdentifier, const fs::path& store) {
+  if (const auto known = products_.find(store); known != products_.end())
+    return known->second.get();
+  std::error_code error;
+  if (!fs::is_regular_file(fs::symlink_status(store, error))) return nullptr;
+  return (products_[store] = std::make_unique<Product>(*this, baseIdentifier, store)).get();
+}
+
+// The folder of a product's store has the name of the base identifier, as far as names of files
+// can.
+void Notifier::findProducts() {
+  for (const fs::path& store : POSIX::notificationStores())
+    product(store.parent_path().filename().string(), store);
+}
+
+void Notifier::recheck() {
+  for (const auto& [identifier, product] : products_) product->deliverer().recheck();
+}
+
+bool Notifier::isIdle() const {
+  return std::all_of(products_.begin(), products_.end(),
+                     [](const auto& each) { return each.second->isIdle(); });
+}
+
+// The one method is `Changed`.
+void Notifier::receive(GVariant* arguments, GDBusMethodInvocation* call) {
+  const char* identifier = nullptr;
+  g_variant_get_child(arguments, 0, "&s", &identifier);
+  Product* const concerned = product(identifier, POSIX::notificationStore(identifier));
+  if (concerned) concerned->deliverer().recheck();
+  const bool stays = concerned && !concerned->isIdle();
+  g_dbus_method_invocation_return_value(call, g_variant_new("(b)", static_cast<gboolean>(stays)));
+}
+
+}  // namespace Varnel
