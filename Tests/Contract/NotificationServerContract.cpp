@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/NotificationServerContract.h>
+#include <Tests/Contract/NotificationWorlds.h>
 
 #include <gmock/gmock.h>
 
@@ -35,7 +35,7 @@ struct Listener final : NotificationServer::Observer {
 
 // What the listener has heard when nothing is under way any more.
 std::vector<std::string> heardBy(Listener& listener, NotificationServerWorld& world) {
-  world.workUntil([&] { return !world.server().isBusy(); });
+  world.workUntil([&] { return !world.port().isBusy(); });
   return std::exchange(listener.heard, {});
 }
 
@@ -52,7 +52,7 @@ std::vector<std::string> titles(NotificationServerWorld& world) {
 }
 
 TEST_P(NotificationServerContract, ShowsABannerAndTellsLaterHowItEnded) {
-  NotificationServer& server = world->server();
+  NotificationServer& server = world->port();
   const auto listener = listenTo(server);
   const Banner banner{.title = "A", .text = "text", .actionTitle = "Go", .dismissTitle = "Later"};
   const std::pair<void (NotificationServerWorld::*)(const std::string&), const char*> ends[] = {
@@ -76,8 +76,8 @@ TEST_P(NotificationServerContract, ShowsABannerAndTellsLaterHowItEnded) {
 }
 
 TEST_P(NotificationServerContract, AnExpiredBannerIsGoneAndMayYetBeClickedOnce) {
-  const auto listener = listenTo(world->server());
-  world->server().show("1", {.title = "A"}, {});
+  const auto listener = listenTo(world->port());
+  world->port().show("1", {.title = "A"}, {});
   EXPECT_THAT(heardBy(*listener, *world), ElementsAre("shown 1"));
   world->expire("A");
   world->workUntil([&] { return !listener->heard.empty(); });
@@ -87,7 +87,7 @@ TEST_P(NotificationServerContract, AnExpiredBannerIsGoneAndMayYetBeClickedOnce) 
   world->workUntil([&] { return !listener->heard.empty(); });
   EXPECT_THAT(heardBy(*listener, *world), ElementsAre("clicked 1"));
 
-  world->server().show("2", {.title = "B"}, {});
+  world->port().show("2", {.title = "B"}, {});
   EXPECT_THAT(heardBy(*listener, *world), ElementsAre("shown 2"));
   world->expire("B");
   world->workUntil([&] { return !listener->heard.empty(); });
@@ -98,7 +98,7 @@ TEST_P(NotificationServerContract, AnExpiredBannerIsGoneAndMayYetBeClickedOnce) 
 }
 
 TEST_P(NotificationServerContract, ABannerThatIsClosedIsGoneOnceAndNothingElse) {
-  NotificationServer& server = world->server();
+  NotificationServer& server = world->port();
   const auto listener = listenTo(server);
   server.show("1", {.title = "A"}, {});
   server.show("2", {.title = "B"}, {});
@@ -118,7 +118,7 @@ TEST_P(NotificationServerContract, ABannerThatIsClosedIsGoneOnceAndNothingElse) 
 }
 
 TEST_P(NotificationServerContract, ABannerTakesThePlaceOfAnother) {
-  NotificationServer& server = world->server();
+  NotificationServer& server = world->port();
   const auto listener = listenTo(server);
   server.show("1", {.title = "A"}, {});
   EXPECT_THAT(heardBy(*listener, *world), ElementsAre("shown 1"));
@@ -138,7 +138,7 @@ TEST_P(NotificationServerContract, ABannerTakesThePlaceOfAnother) {
 }
 
 TEST_P(NotificationServerContract, ItsEndTakesTheBannersAndFailsWhatItHasNotAnswered) {
-  NotificationServer& server = world->server();
+  NotificationServer& server = world->port();
   const auto listener = listenTo(server);
   server.show("1", {.title = "A"}, {});
   EXPECT_THAT(heardBy(*listener, *world), ElementsAre("shown 1"));
@@ -164,9 +164,9 @@ TEST_P(NotificationServerContract, TellsWhatStandsInTheWayAlsoWithoutAnObserver)
   std::vector<bool> obstacles;
   const auto ask = [&] {
     const std::size_t before = obstacles.size();
-    world->server().check([&](const auto& obstacle) { obstacles.push_back(obstacle.has_value()); });
+    world->port().check([&](const auto& obstacle) { obstacles.push_back(obstacle.has_value()); });
     EXPECT_EQ(obstacles.size(), before) << "never within the call";
-    world->workUntil([&] { return !world->server().isBusy(); });
+    world->workUntil([&] { return !world->port().isBusy(); });
   };
   ask();
   world->endServer();
@@ -176,30 +176,27 @@ TEST_P(NotificationServerContract, TellsWhatStandsInTheWayAlsoWithoutAnObserver)
   EXPECT_THAT(obstacles, ElementsAre(false, true, false));
 }
 
-class FakeWorld final : public NotificationServerWorld {
+class FakeNotificationServerWorld final
+    : public FakeColumn<NotificationServerWorld, Testing::FakeNotificationServer> {
  public:
-  NotificationServer& server() override { return server_; }
   std::vector<Banner> banners() override {
     std::vector<Banner> banners;
-    for (const auto& [title, banner] : server_.banners()) banners.push_back(banner);
+    for (const auto& [title, banner] : port_.banners()) banners.push_back(banner);
     return banners;
   }
-  void activate(const std::string& title) override { server_.activate(title); }
-  void dismiss(const std::string& title) override { server_.dismiss(title); }
-  void expire(const std::string& title) override { server_.expire(title); }
-  void endServer() override { server_.disappear(); }
-  void startServer() override { server_.appear(); }
+  void activate(const std::string& title) override { port_.activate(title); }
+  void dismiss(const std::string& title) override { port_.dismiss(title); }
+  void expire(const std::string& title) override { port_.expire(title); }
+  void endServer() override { port_.disappear(); }
+  void startServer() override { port_.appear(); }
   void workUntil(const std::function<bool()>& condition) override {
-    server_.report();
+    port_.report();
     EXPECT_TRUE(condition());
   }
-
- private:
-  Testing::FakeNotificationServer server_;
 };
 
 INSTANTIATE_TEST_SUITE_P(Fake, NotificationServerContract,
-                         NotificationServerContract::on<FakeWorld>());
+                         NotificationServerContract::on<FakeNotificationServerWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -3,7 +3,7 @@
 
 #include <Tests/Contract/MainLoopWorlds.h>
 #include <Tests/Contract/UserWorlds.h>
-#include <Tests/Support/LocalZone.h>
+#include <Tests/Support/Zones.h>
 #include <Varnel/Platform/Generic/HostedApplication.h>
 #include <Varnel/Platform/Ports/Ports.h>
 
@@ -11,18 +11,12 @@
 namespace Varnel::Platform::Contract {
 namespace {
 
-class HostedWorld final : public ApplicationWorld {
- public:
-  Application& application() override { return application_; }
+INSTANTIATE_TEST_SUITE_P(Hosted, ApplicationContract,
+                         ApplicationContract::onFake<HostedApplication>());
 
- private:
-  HostedApplication application_;
-};
-INSTANTIATE_TEST_SUITE_P(Hosted, ApplicationContract, ApplicationContract::on<HostedWorld>());
-
-class SystemQueue final : public MainQueueWorld {
+class SystemQueue final : public WorldOf<MainQueue> {
  public:
-  MainQueue& queue() override { return systemPorts().mainQueue; }
+  MainQueue& port() override { return systemPorts().mainQueue; }
 };
 INSTANTIATE_TEST_SUITE_P(System, MainQueueContract, MainQueueContract::on<SystemQueue>());
 
@@ -32,7 +26,7 @@ class SystemZones final : public TimeZonesWorld {
     const Tests::LocalZone berlin("Europe/Berlin");
     return zones_.localIdentifier() == "UTC" ? "The system has no table of time zones." : "";
   }
-  TimeZones& zones() override { return zones_; }
+  TimeZones& port() override { return zones_; }
   void moveUser(const std::string& zone) override { local_.emplace(zone.c_str()); }
 
  private:

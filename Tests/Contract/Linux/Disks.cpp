@@ -17,7 +17,7 @@ namespace fs = std::filesystem;
 
 class SysfsDisks final : public DeviceRegistryWorld {
  public:
-  DeviceRegistry& registry() override { return *registry_; }
+  DeviceRegistry& port() override { return *registry_; }
   void plug(const std::string& name, const std::string& serial) override {
     const std::string above = "pci0/" + name;
     machine_.setSubsystem(above, "virtio");
@@ -51,7 +51,7 @@ class BoundFolders final : public DiskArbitrationWorld {
     if (std::string reason = Tests::enterMountNamespace(); !reason.empty()) return reason;
     return name_.empty() ? "The temporary folder lies on no disk." : "";
   }
-  DiskArbitration& disks() override { return *disks_; }
+  DiskArbitration& port() override { return *disks_; }
   std::string disk() override { return name_; }
   URL mount(const std::string& name) override {
     const fs::path place = folder_.path() / name;
@@ -84,7 +84,7 @@ INSTANTIATE_TEST_SUITE_P(Linux, DiskArbitrationContract,
 class MountedMemory final : public VolumeCatalogWorld {
  public:
   [[nodiscard]] std::string obstacle() const override { return Tests::enterMountNamespace(); }
-  VolumeCatalog& catalog() override { return *catalog_; }
+  VolumeCatalog& port() override { return *catalog_; }
   std::string folder(const std::string& name) override {
     std::filesystem::create_directory(folder_.path() / name);
     return folder_.path() / name;
