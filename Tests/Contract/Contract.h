@@ -5,6 +5,7 @@
 
 #include <memory>
 #include <string>
+#include <type_traits>
 
 namespace Varnel::Platform::Contract {
 
@@ -47,32 +48,34 @@ class AdapterColumn : public World {
   const std::unique_ptr<typename World::Port> port_ = make();
 };
 
+template <typename World>
+using Maker = std::unique_ptr<World> (*)();
+
+/// Makes a column, as the world of the suite that it is of; of a fake alone, its column.
+template <typename Column>
+struct Make {
+  template <typename World>
+  operator Maker<World>() const {
+    using Made =
+        std::conditional_t<std::is_base_of_v<World, Column>, Column, FakeColumn<World, Column>>;
+    return []() -> std::unique_ptr<World> { return std::make_unique<Made>(); };
+  }
+};
+
+/// What a suite is instantiated with: this column, or this fake where there is nothing to arrange.
+template <typename Column>
+auto on() {
+  return ::testing::Values(Make<Column>());
+}
+
 /// The suite of a port, which every column must pass. Each test has a world of its own.
 ///
-///     class ClockWorld : public WorldOf<Clock> { … };                      // MainLoopWorlds.h
+///     class ClockWorld : public WorldOf<Clock> { … };                 // MainLoopWorlds.h
 ///     using ClockContract = Suite<ClockWorld>;
-///     TEST_P(ClockContract, NeverStandsStill) { … world->port() … }        //
-///     MainLoopContracts.cpp INSTANTIATE_TEST_SUITE_P(Fake, ClockContract,
-///     ClockContract::on<FakeClock>());
+///     TEST_P(ClockContract, NeverStandsStill) { … world->port() … }   // MainLoopContracts.cpp
+///     INSTANTIATE_TEST_SUITE_P(Fake, ClockContract, on<FakeClock>());
 template <typename Type>
-class Suite : public ::testing::TestWithParam<std::unique_ptr<Type> (*)()> {
- public:
-  using Maker = std::unique_ptr<Type> (*)();
-
-  template <typename Column>
-  static auto on() {
-    return ::testing::Values(
-        Maker([]() -> std::unique_ptr<Type> { return std::make_unique<Column>(); }));
-  }
-  template <typename Fake>
-  static auto onFake() {
-    return on<FakeColumn<Type, Fake>>();
-  }
-  template <auto make>
-  static auto onAdapter() {
-    return on<AdapterColumn<Type, make>>();
-  }
-
+class Suite : public ::testing::TestWithParam<Maker<Type>> {
  protected:
   void SetUp() override {
     if (const std::string reason = world->obstacle(); !reason.empty()) GTEST_SKIP() << reason;

@@ -120,9 +120,7 @@ class FakeDeviceRegistryWorld final
  private:
   std::map<std::string, Testing::FakeDeviceRegistry::Device> devices_, partitions_;
 };
-
-INSTANTIATE_TEST_SUITE_P(Fake, DeviceRegistryContract,
-                         DeviceRegistryContract::on<FakeDeviceRegistryWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, DeviceRegistryContract, on<FakeDeviceRegistryWorld>());
 
 TEST_P(DiskArbitrationContract, ASessionKnowsEveryPlaceOfADiskAsItWasWhenTheSessionBegan) {
   DiskArbitration& disks = world->port();
@@ -165,9 +163,7 @@ class FakeDiskArbitrationWorld final
  private:
   std::vector<URL> places_;
 };
-
-INSTANTIATE_TEST_SUITE_P(Fake, DiskArbitrationContract,
-                         DiskArbitrationContract::on<FakeDiskArbitrationWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, DiskArbitrationContract, on<FakeDiskArbitrationWorld>());
 
 URL volumeAt(const std::string& path) {
   return URL::fileURLWithPath(path + "/");
@@ -306,9 +302,7 @@ class FakeVolumeCatalogWorld final
   void mount(const URL& folder) override { port_.mount({folder, true, {}, {}}); }
   void unmount(const URL& folder) override { port_.unmount(folder); }
 };
-
-INSTANTIATE_TEST_SUITE_P(Fake, VolumeCatalogContract,
-                         VolumeCatalogContract::on<FakeVolumeCatalogWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, VolumeCatalogContract, on<FakeVolumeCatalogWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

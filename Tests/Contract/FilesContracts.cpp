@@ -59,8 +59,7 @@ class FakeAppendFilesWorld final : public FakeColumn<AppendFilesWorld, Testing::
     return "/missing/log";
   }
 };
-INSTANTIATE_TEST_SUITE_P(Fake, AppendFilesContract,
-                         AppendFilesContract::on<FakeAppendFilesWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, AppendFilesContract, on<FakeAppendFilesWorld>());
 
 TEST_P(ExtendedAttributesContract, GivesAllBytesAndTellsAbsentFromFailed) {
   ExtendedAttributes& attributes = world->port();
@@ -96,8 +95,7 @@ class FakeExtendedAttributesWorld final
     return "/other";
   }
 };
-INSTANTIATE_TEST_SUITE_P(Fake, ExtendedAttributesContract,
-                         ExtendedAttributesContract::on<FakeExtendedAttributesWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, ExtendedAttributesContract, on<FakeExtendedAttributesWorld>());
 
 TEST_P(PrivateFilesContract, PreparesAFileAndChangesNoneThatExists) {
   const Tests::TemporaryFolder folder;
@@ -172,8 +170,7 @@ class FakePrivateFilesWorld final : public WorldOf<PrivateFiles> {
  private:
   Testing::FaultyPrivateFiles files_{systemPorts().privateFiles};
 };
-INSTANTIATE_TEST_SUITE_P(Fake, PrivateFilesContract,
-                         PrivateFilesContract::on<FakePrivateFilesWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, PrivateFilesContract, on<FakePrivateFilesWorld>());
 
 TEST_P(SecurityScopeContract, OpensForFilesThatTheProcessMayRead) {
   SecurityScope& scope = world->port();
@@ -198,8 +195,7 @@ class FakeSecurityScopeWorld final
   }
   URL forbidden() override { return *URL::parse("file:///forbidden"); }
 };
-INSTANTIATE_TEST_SUITE_P(Fake, SecurityScopeContract,
-                         SecurityScopeContract::on<FakeSecurityScopeWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, SecurityScopeContract, on<FakeSecurityScopeWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -86,7 +86,7 @@ class FakeHTTPClientWorld final : public FakeColumn<HTTPClientWorld, Testing::Fa
   std::size_t answered_ = 0;
   std::size_t taken_ = 0;
 };
-INSTANTIATE_TEST_SUITE_P(Fake, HTTPClientContract, HTTPClientContract::on<FakeHTTPClientWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, HTTPClientContract, on<FakeHTTPClientWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -32,8 +32,7 @@ TEST_P(ApplicationContract, IsInFrontWhenTheHostSaysSoOnWhateverThread) {
   }
 }
 
-INSTANTIATE_TEST_SUITE_P(Fake, ApplicationContract,
-                         ApplicationContract::onFake<Testing::FakeApplication>());
+INSTANTIATE_TEST_SUITE_P(Fake, ApplicationContract, on<Testing::FakeApplication>());
 
 TEST_P(ClockContract, RunsForwardForEveryThread) {
   const Clock& clock = world->port();
@@ -57,8 +56,7 @@ class FakeClockWorld final : public FakeColumn<ClockWorld, Testing::SimulatedClo
  public:
   void pass() override { port_.advance(std::chrono::seconds(1)); }
 };
-
-INSTANTIATE_TEST_SUITE_P(Fake, ClockContract, ClockContract::on<FakeClockWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, ClockContract, on<FakeClockWorld>());
 
 TEST_P(MainQueueContract, RunsBlocksLaterAndInOrderAlsoThoseThatBlocksPost) {
   MainQueue& queue = world->port();
@@ -189,8 +187,7 @@ TEST_P(MainQueueContract, TheDescriptorWakesAHostThatPolls) {
   EXPECT_TRUE(Tests::drainUntil(queue, [&] { return !ran; }));
 }
 
-INSTANTIATE_TEST_SUITE_P(Fake, MainQueueContract,
-                         MainQueueContract::onFake<Testing::FakeMainQueue>());
+INSTANTIATE_TEST_SUITE_P(Fake, MainQueueContract, on<Testing::FakeMainQueue>());
 
 TEST_P(WallClockTimerContract, CallsOnceAtTheDateAndNeverWithinTheArming) {
   const auto timer = world->timer();
@@ -280,8 +277,7 @@ class FakeTimers final : public WallClockTimerWorld {
   Testing::SimulatedClock clock_{std::chrono::sys_days(std::chrono::days(20'000))};
   std::vector<Testing::FakeWallClockTimer*> timers_;
 };
-
-INSTANTIATE_TEST_SUITE_P(Fake, WallClockTimerContract, WallClockTimerContract::on<FakeTimers>());
+INSTANTIATE_TEST_SUITE_P(Fake, WallClockTimerContract, on<FakeTimers>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

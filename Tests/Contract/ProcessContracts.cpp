@@ -33,8 +33,7 @@ class FakeProcessInfoWorld final : public FakeColumn<ProcessInfoWorld, Testing::
     port_.environment[name] = value;
   }
 };
-INSTANTIATE_TEST_SUITE_P(Fake, ProcessInfoContract,
-                         ProcessInfoContract::on<FakeProcessInfoWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, ProcessInfoContract, on<FakeProcessInfoWorld>());
 
 TEST_P(ProcessLauncherContract, GivesAllThatAProgramHasPrintedOnce) {
   for (const std::string& text : {""s, "\0\xFF\n"s, std::string(60'000, 'x')}) {
@@ -90,8 +89,7 @@ class FakeProcessLauncherWorld final
     return {"/missing", {}};
   }
 };
-INSTANTIATE_TEST_SUITE_P(Fake, ProcessLauncherContract,
-                         ProcessLauncherContract::on<FakeProcessLauncherWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, ProcessLauncherContract, on<FakeProcessLauncherWorld>());
 
 TEST_P(ReadingPriorityContract, IsTheThreadsOwnAndCanBeRestored) {
   ReadingPriority& priority = world->port();
@@ -115,8 +113,7 @@ TEST_P(ReadingPriorityContract, IsTheThreadsOwnAndCanBeRestored) {
   std::thread([&] { EXPECT_EQ(priority.current(), normal); }).join();
 }
 
-INSTANTIATE_TEST_SUITE_P(Fake, ReadingPriorityContract,
-                         ReadingPriorityContract::onFake<Testing::FakeReadingPriority>());
+INSTANTIATE_TEST_SUITE_P(Fake, ReadingPriorityContract, on<Testing::FakeReadingPriority>());
 
 TEST_P(StandardOutputContract, PrintsTextsAsTheyAre) {
   std::string expected;
@@ -150,8 +147,7 @@ class FakeStandardOutputWorld final
  public:
   std::string printed() override { return port_.text(); }
 };
-INSTANTIATE_TEST_SUITE_P(Fake, StandardOutputContract,
-                         StandardOutputContract::on<FakeStandardOutputWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, StandardOutputContract, on<FakeStandardOutputWorld>());
 
 TEST_P(SystemLogContract, WritesOneVisibleLineForEachText) {
   for (const std::string& text :
@@ -165,7 +161,7 @@ class FakeSystemLogWorld final : public FakeColumn<SystemLogWorld, Testing::Capt
  public:
   std::string text() override { return port_.text(); }
 };
-INSTANTIATE_TEST_SUITE_P(Fake, SystemLogContract, SystemLogContract::on<FakeSystemLogWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, SystemLogContract, on<FakeSystemLogWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -105,9 +105,7 @@ class FakeSoundPlayerWorld final : public FakeColumn<SoundPlayerWorld, Testing::
       for (const auto& sound : port_.sounds) sound->end(sound->bytes != damagedSound());
   }
 };
-
-INSTANTIATE_TEST_SUITE_P(Fake, SoundPlayerContract,
-                         SoundPlayerContract::on<FakeSoundPlayerWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, SoundPlayerContract, on<FakeSoundPlayerWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

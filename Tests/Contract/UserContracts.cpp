@@ -46,8 +46,7 @@ class FakeCookieStorageWorld final
     port_.ofGroup[identifier] = cookies;
   }
 };
-INSTANTIATE_TEST_SUITE_P(Fake, CookieStorageContract,
-                         CookieStorageContract::on<FakeCookieStorageWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, CookieStorageContract, on<FakeCookieStorageWorld>());
 
 TEST_P(MachineIdentityContract, TellsTextsOrNothingUnderExactlyTheirNames) {
   const MachineIdentity& machine = world->port();
@@ -88,9 +87,7 @@ class FakeMachineIdentityWorld final
   }
   void connect(const PropertyData& address) override { port_.addresses = {address}; }
 };
-
-INSTANTIATE_TEST_SUITE_P(Fake, MachineIdentityContract,
-                         MachineIdentityContract::on<FakeMachineIdentityWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, MachineIdentityContract, on<FakeMachineIdentityWorld>());
 
 TEST_P(TimeZonesContract, ClocksChangeAtTheMomentOfTheChangeAndBehindItLiesTheNext) {
   const Date newYear = sys_days(2026y / January / 1);
@@ -146,8 +143,7 @@ class FakeTimeZonesWorld final : public TimeZonesWorld {
  private:
   Testing::FakeTimeZones zones_ = Tests::zonesOf2026();
 };
-
-INSTANTIATE_TEST_SUITE_P(Fake, TimeZonesContract, TimeZonesContract::on<FakeTimeZonesWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, TimeZonesContract, on<FakeTimeZonesWorld>());
 
 TEST_P(UserAccountContract, AHomeIsAnAbsolutePathAndTheOneOnRecordStays) {
   const UserAccount& account = world->port();
@@ -168,9 +164,7 @@ class FakeUserAccountWorld final : public FakeColumn<UserAccountWorld, Testing::
  public:
   void moveHome(const std::string& path) override { port_.home = path; }
 };
-
-INSTANTIATE_TEST_SUITE_P(Fake, UserAccountContract,
-                         UserAccountContract::on<FakeUserAccountWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, UserAccountContract, on<FakeUserAccountWorld>());
 
 TEST_P(UserLocaleContract, WhoHasChosenNothingReadsEnglish) {
   EXPECT_THAT(world->port().languages(), ElementsAre("en"));
@@ -200,8 +194,7 @@ class FakeUserLocaleWorld final : public FakeColumn<UserLocaleWorld, Testing::Fa
     port_.numberLocaleIdentifier = numbers;
   }
 };
-
-INSTANTIATE_TEST_SUITE_P(Fake, UserLocaleContract, UserLocaleContract::on<FakeUserLocaleWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, UserLocaleContract, on<FakeUserLocaleWorld>());
 
 TEST_P(WorkspaceContract, FindsWhatIsInstalledAtThatMomentUnderExactlyThisIdentifier) {
   Workspace& workspace = world->port();
@@ -229,8 +222,7 @@ class FakeWorkspaceWorld final : public FakeColumn<WorkspaceWorld, Testing::Fake
   }
   void remove(const std::string& identifier) override { port_.applications.erase(identifier); }
 };
-
-INSTANTIATE_TEST_SUITE_P(Fake, WorkspaceContract, WorkspaceContract::on<FakeWorkspaceWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, WorkspaceContract, on<FakeWorkspaceWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -126,8 +126,7 @@ class FakeUserDefaultsWorld final : public UserDefaultsWorld {
  private:
   Testing::FakeApplicationStorage storage_{"/home/ada"};
 };
-INSTANTIATE_TEST_SUITE_P(Fake, UserDefaultsContract,
-                         UserDefaultsContract::on<FakeUserDefaultsWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, UserDefaultsContract, on<FakeUserDefaultsWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -168,7 +168,7 @@ class FakeUserNotificationCenterWorld final
   void startBy(const UserNotification& notification) override { port_.startBy(notification); }
 };
 INSTANTIATE_TEST_SUITE_P(Fake, UserNotificationCenterContract,
-                         UserNotificationCenterContract::on<FakeUserNotificationCenterWorld>());
+                         on<FakeUserNotificationCenterWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

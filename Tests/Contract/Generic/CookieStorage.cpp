@@ -40,7 +40,7 @@ class CookieFiles final : public CookieStorageWorld {
   Testing::SimulatedClock clock_;
   SQLiteCookieStorage storage_{folder_.path(), "own", clock_};
 };
-INSTANTIATE_TEST_SUITE_P(Generic, CookieStorageContract, CookieStorageContract::on<CookieFiles>());
+INSTANTIATE_TEST_SUITE_P(Generic, CookieStorageContract, on<CookieFiles>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -31,9 +31,7 @@ class BackgroundWorld final : public SoundPlayerWorld {
   Testing::FakeMainQueue queue_;
   BackgroundSoundPlayer player_{queue_, [] { return std::make_unique<ShortOutput>(); }};
 };
-
-INSTANTIATE_TEST_SUITE_P(Background, SoundPlayerContract,
-                         SoundPlayerContract::on<BackgroundWorld>());
+INSTANTIATE_TEST_SUITE_P(Background, SoundPlayerContract, on<BackgroundWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -11,14 +11,13 @@
 namespace Varnel::Platform::Contract {
 namespace {
 
-INSTANTIATE_TEST_SUITE_P(Hosted, ApplicationContract,
-                         ApplicationContract::onFake<HostedApplication>());
+INSTANTIATE_TEST_SUITE_P(Hosted, ApplicationContract, on<HostedApplication>());
 
 class SystemQueue final : public WorldOf<MainQueue> {
  public:
   MainQueue& port() override { return systemPorts().mainQueue; }
 };
-INSTANTIATE_TEST_SUITE_P(System, MainQueueContract, MainQueueContract::on<SystemQueue>());
+INSTANTIATE_TEST_SUITE_P(System, MainQueueContract, on<SystemQueue>());
 
 class SystemZones final : public TimeZonesWorld {
  public:
@@ -33,7 +32,7 @@ class SystemZones final : public TimeZonesWorld {
   TimeZones& zones_ = systemPorts().timeZones;
   std::optional<Tests::LocalZone> local_;
 };
-INSTANTIATE_TEST_SUITE_P(System, TimeZonesContract, TimeZonesContract::on<SystemZones>());
+INSTANTIATE_TEST_SUITE_P(System, TimeZonesContract, on<SystemZones>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -33,8 +33,7 @@ class StoredCenter final : public UserNotificationCenterWorld {
   const std::string store_ = folder_.path() / "store.sqlite";
   Testing::Process process_{store_, std::chrono::sys_days(std::chrono::year(2026) / 3 / 1)};
 };
-INSTANTIATE_TEST_SUITE_P(Generic, UserNotificationCenterContract,
-                         UserNotificationCenterContract::on<StoredCenter>());
+INSTANTIATE_TEST_SUITE_P(Generic, UserNotificationCenterContract, on<StoredCenter>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

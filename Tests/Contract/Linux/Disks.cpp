@@ -37,7 +37,7 @@ class SysfsDisks final : public DeviceRegistryWorld {
   Tests::SysfsMachine machine_;
   const std::unique_ptr<DeviceRegistry> registry_ = Linux::makeDeviceRegistry(machine_.folder());
 };
-INSTANTIATE_TEST_SUITE_P(Linux, DeviceRegistryContract, DeviceRegistryContract::on<SysfsDisks>());
+INSTANTIATE_TEST_SUITE_P(Linux, DeviceRegistryContract, on<SysfsDisks>());
 
 // The disk that the temporary folder lies on. Binding a folder mounts its disk in another place.
 class BoundFolders final : public DiskArbitrationWorld {
@@ -78,8 +78,7 @@ class BoundFolders final : public DiskArbitrationWorld {
       Linux::makeDiskArbitration(Linux::makeMountTable());
   bool isLost_ = false;
 };
-INSTANTIATE_TEST_SUITE_P(Linux, DiskArbitrationContract,
-                         DiskArbitrationContract::on<BoundFolders>());
+INSTANTIATE_TEST_SUITE_P(Linux, DiskArbitrationContract, on<BoundFolders>());
 
 class MountedMemory final : public VolumeCatalogWorld {
  public:
@@ -96,7 +95,7 @@ class MountedMemory final : public VolumeCatalogWorld {
   const Tests::TemporaryFolder folder_;
   const std::unique_ptr<VolumeCatalog> catalog_ = Linux::makeVolumeCatalog(Linux::makeMountTable());
 };
-INSTANTIATE_TEST_SUITE_P(Linux, VolumeCatalogContract, VolumeCatalogContract::on<MountedMemory>());
+INSTANTIATE_TEST_SUITE_P(Linux, VolumeCatalogContract, on<MountedMemory>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -59,8 +59,7 @@ class LinuxWorld final : public SoundPlayerWorld {
   Testing::CapturedSystemLog log_;
   const std::unique_ptr<SoundPlayer> player_ = Linux::makeSoundPlayer(log_, *queue_);
 };
-
-INSTANTIATE_TEST_SUITE_P(Linux, SoundPlayerContract, SoundPlayerContract::on<LinuxWorld>());
+INSTANTIATE_TEST_SUITE_P(Linux, SoundPlayerContract, on<LinuxWorld>());
 
 class LinuxTimers final : public WallClockTimerWorld {
  public:
@@ -77,8 +76,7 @@ class LinuxTimers final : public WallClockTimerWorld {
   const std::unique_ptr<MainQueue> queue_ = Linux::makeMainQueue();
   Testing::CapturedSystemLog log_;
 };
-
-INSTANTIATE_TEST_SUITE_P(Linux, WallClockTimerContract, WallClockTimerContract::on<LinuxTimers>());
+INSTANTIATE_TEST_SUITE_P(Linux, WallClockTimerContract, on<LinuxTimers>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -157,9 +157,7 @@ class LinuxWorld final : public NotificationServerWorld {
   std::optional<Desktop> desktop_;
   const std::unique_ptr<NotificationServer> server_ = Linux::makeNotificationServer(log_, {});
 };
-
-INSTANTIATE_TEST_SUITE_P(Linux, NotificationServerContract,
-                         NotificationServerContract::on<LinuxWorld>());
+INSTANTIATE_TEST_SUITE_P(Linux, NotificationServerContract, on<LinuxWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

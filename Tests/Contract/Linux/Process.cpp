@@ -19,21 +19,18 @@ class SpawnedPrograms final
  private:
   const Tests::TemporaryFolder folder_;
 };
-INSTANTIATE_TEST_SUITE_P(Linux, ProcessLauncherContract,
-                         ProcessLauncherContract::on<SpawnedPrograms>());
+INSTANTIATE_TEST_SUITE_P(Linux, ProcessLauncherContract, on<SpawnedPrograms>());
 
-INSTANTIATE_TEST_SUITE_P(Linux, ReadingPriorityContract,
-                         ReadingPriorityContract::onAdapter<Linux::makeReadingPriority>());
+using ThreadPriority = AdapterColumn<WorldOf<ReadingPriority>, Linux::makeReadingPriority>;
+INSTANTIATE_TEST_SUITE_P(Linux, ReadingPriorityContract, on<ThreadPriority>());
 
 std::unique_ptr<ProcessInfo> makeProcess() {
   return Linux::makeProcessInfo();
 }
-INSTANTIATE_TEST_SUITE_P(Linux, ProcessInfoContract,
-                         ProcessInfoContract::on<OwnProcess<makeProcess>>());
-INSTANTIATE_TEST_SUITE_P(Linux, StandardOutputContract,
-                         StandardOutputContract::on<Output<Linux::makeStandardOutput>>());
+INSTANTIATE_TEST_SUITE_P(Linux, ProcessInfoContract, on<OwnProcess<makeProcess>>());
+INSTANTIATE_TEST_SUITE_P(Linux, StandardOutputContract, on<Output<Linux::makeStandardOutput>>());
 INSTANTIATE_TEST_SUITE_P(LinuxErrors, StandardOutputContract,
-                         StandardOutputContract::on<Output<makeStandardErrorOutput>>());
+                         on<Output<makeStandardErrorOutput>>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

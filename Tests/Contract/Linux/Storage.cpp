@@ -31,11 +31,10 @@ class UserAttributes final
   const Tests::TemporaryFolder folder_;
   const std::string file_ = folder_.write("file", "");
 };
-INSTANTIATE_TEST_SUITE_P(Linux, ExtendedAttributesContract,
-                         ExtendedAttributesContract::on<UserAttributes>());
+INSTANTIATE_TEST_SUITE_P(Linux, ExtendedAttributesContract, on<UserAttributes>());
 
 INSTANTIATE_TEST_SUITE_P(Linux, UserDefaultsContract,
-                         UserDefaultsContract::on<UserFolders<Linux::makeApplicationStorage>>());
+                         on<UserFolders<Linux::makeApplicationStorage>>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -38,8 +38,7 @@ class MachineOfFiles final : public MachineIdentityWorld {
   const Tests::TemporaryFolder folder_;
   const std::unique_ptr<MachineIdentity> machine_ = Linux::makeMachineIdentity(folder_.path());
 };
-INSTANTIATE_TEST_SUITE_P(Linux, MachineIdentityContract,
-                         MachineIdentityContract::on<MachineOfFiles>());
+INSTANTIATE_TEST_SUITE_P(Linux, MachineIdentityContract, on<MachineOfFiles>());
 
 // The folders of desktop entries are read once a process.
 class DesktopEntries final : public AdapterColumn<WorkspaceWorld, Linux::makeWorkspace> {
@@ -71,7 +70,7 @@ class DesktopEntries final : public AdapterColumn<WorkspaceWorld, Linux::makeWor
 
   const Tests::TemporaryFolder folder_;
 };
-INSTANTIATE_TEST_SUITE_P(Linux, WorkspaceContract, WorkspaceContract::on<DesktopEntries>());
+INSTANTIATE_TEST_SUITE_P(Linux, WorkspaceContract, on<DesktopEntries>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -21,10 +21,10 @@ class OpenFiles final : public AdapterColumn<AppendFilesWorld, POSIX::makeAppend
   static constexpr const char* full = "/dev/full";
   const Tests::TemporaryFolder folder_;
 };
-INSTANTIATE_TEST_SUITE_P(POSIX, AppendFilesContract, AppendFilesContract::on<OpenFiles>());
+INSTANTIATE_TEST_SUITE_P(POSIX, AppendFilesContract, on<OpenFiles>());
 
-INSTANTIATE_TEST_SUITE_P(POSIX, PrivateFilesContract,
-                         PrivateFilesContract::onAdapter<POSIX::makePrivateFiles>());
+using OwnFiles = AdapterColumn<WorldOf<PrivateFiles>, POSIX::makePrivateFiles>;
+INSTANTIATE_TEST_SUITE_P(POSIX, PrivateFilesContract, on<OwnFiles>());
 
 class FileRights final : public AdapterColumn<SecurityScopeWorld, POSIX::makeSecurityScope> {
  public:
@@ -37,7 +37,7 @@ class FileRights final : public AdapterColumn<SecurityScopeWorld, POSIX::makeSec
  private:
   const Tests::TemporaryFolder folder_;
 };
-INSTANTIATE_TEST_SUITE_P(POSIX, SecurityScopeContract, SecurityScopeContract::on<FileRights>());
+INSTANTIATE_TEST_SUITE_P(POSIX, SecurityScopeContract, on<FileRights>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

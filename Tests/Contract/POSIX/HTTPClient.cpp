@@ -19,7 +19,7 @@ class CurlModule final : public AdapterColumn<HTTPClientWorld, POSIX::makeHTTPCl
  private:
   std::optional<Tests::AnalyticsServer> server_;
 };
-INSTANTIATE_TEST_SUITE_P(POSIX, HTTPClientContract, HTTPClientContract::on<CurlModule>());
+INSTANTIATE_TEST_SUITE_P(POSIX, HTTPClientContract, on<CurlModule>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

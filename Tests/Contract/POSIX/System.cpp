@@ -35,7 +35,7 @@ class Syslog final : public AdapterColumn<SystemLogWorld, POSIX::makeSystemLog> 
   Syslog() { written.clear(); }
   std::string text() override { return written; }
 };
-INSTANTIATE_TEST_SUITE_P(POSIX, SystemLogContract, SystemLogContract::on<Syslog>());
+INSTANTIATE_TEST_SUITE_P(POSIX, SystemLogContract, on<Syslog>());
 
 class POSIXClock final : public AdapterColumn<ClockWorld, POSIX::makeClock> {
  public:
@@ -45,8 +45,7 @@ class POSIXClock final : public AdapterColumn<ClockWorld, POSIX::makeClock> {
     EXPECT_LE(std::abs(std::chrono::system_clock::to_time_t(port_->now()) - ::time(nullptr)), 60);
   }
 };
-
-INSTANTIATE_TEST_SUITE_P(POSIX, ClockContract, ClockContract::on<POSIXClock>());
+INSTANTIATE_TEST_SUITE_P(POSIX, ClockContract, on<POSIXClock>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

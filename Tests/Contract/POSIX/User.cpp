@@ -12,7 +12,7 @@ class PasswdAccount final : public AdapterColumn<UserAccountWorld, POSIX::makeUs
  public:
   void moveHome(const std::string& path) override { ::setenv("HOME", path.c_str(), 1); }
 };
-INSTANTIATE_TEST_SUITE_P(POSIX, UserAccountContract, UserAccountContract::on<PasswdAccount>());
+INSTANTIATE_TEST_SUITE_P(POSIX, UserAccountContract, on<PasswdAccount>());
 
 class EnvironmentLocale final : public AdapterColumn<UserLocaleWorld, POSIX::makeUserLocale> {
  public:
@@ -31,7 +31,7 @@ class EnvironmentLocale final : public AdapterColumn<UserLocaleWorld, POSIX::mak
     ::setenv("LC_NUMERIC", numbers.c_str(), 1);
   }
 };
-INSTANTIATE_TEST_SUITE_P(POSIX, UserLocaleContract, UserLocaleContract::on<EnvironmentLocale>());
+INSTANTIATE_TEST_SUITE_P(POSIX, UserLocaleContract, on<EnvironmentLocale>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract
