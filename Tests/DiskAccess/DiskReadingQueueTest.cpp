@@ -191,8 +191,10 @@ TEST_F(DiskReadingQueueTest, ATaskOnTheMainQueueHasThePlaceThere) {
 TEST_F(DiskReadingQueueTest, ABlockedMainQueueKeepsNoPlace) {
   const Task onMain = submit(onStick(), {.executor = mainExecutor_}, done);
   awaitLines();
-  // The main thread waits for that very disk.
+  // The main thread waits for that very disk, and no longer than about a turn.
+  const auto start = std::chrono::steady_clock::now();
   DiskAccessGuard{begin(stickFile)};
+  EXPECT_LT(std::chrono::steady_clock::now() - start, 25 * Turn::maxTime);
   EXPECT_EQ(submit(onStick(), done)->result(), Result::read);
   mainQueue_.runWhile([&] { return !onMain->hasEnded(); });
   EXPECT_EQ(onMain->result(), Result::read);
