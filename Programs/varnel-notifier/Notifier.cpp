@@ -1,17 +1,23 @@
 // SPDX-License-Identifier: MIT
 #include <varnel-notifier/Notifier.h>
 
+#include <fcntl.h>
 #include <malloc.h>
+#include <unistd.h>
 
 #include <algorithm>
+#include <array>
+#include <cstdint>
 #include <optional>
 #include <system_error>
 #include <utility>
 
 #include <Varnel/Platform/Generic/NotificationDeliverer.h>
+#include <Varnel/Platform/Generic/NotificationRows.h>
 #include <Varnel/Platform/Linux/Notifications/BusHosts.h>
 #include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
 #include <Varnel/Platform/Linux/Notifications/NotifierProtocol.h>
+#include <Varnel/Platform/POSIX/FileDescriptor.h>
 #include <Varnel/Platform/POSIX/UserFolders.h>
 #include <Varnel/Platform/Ports/ApplicationLauncher.h>
 #include <Varnel/Platform/Ports/Clock.h>
@@ -37,6 +43,20 @@ std::string actionOf(const NotificationActivation& activation) {
   for (char& c : name)
     if (!g_ascii_isalnum(c)) c = '-';
   return name;
+}
+
+// Other programs have files of this name, too: what does not call itself a store is not touched,
+// not even to find it damaged. Its application's name stands at a fixed place of any database.
+bool isStore(const fs::path& file) {
+  std::error_code error;
+  if (!fs::is_regular_file(fs::symlink_status(file, error))) return false;
+  constexpr off_t place = 68;
+  std::array<std::uint8_t, 4> name{};
+  const POSIX::FileDescriptor head(::open(file.c_str(), O_RDONLY | O_NOFOLLOW | O_CLOEXEC));
+  if (::pread(head.get(), name.data(), name.size(), place) != ssize_t{name.size()}) return false;
+  std::uint32_t number = 0;
+  for (const std::uint8_t byte : name) number = number << 8 | byte;
+  return number == static_cast<std::uint32_t>(notificationFormat().applicationID);
 }
 
 }  // namespace
@@ -165,8 +185,7 @@ void Notifier::sleepWhile(const std::function<bool()>& condition) {
 Notifier::Product* Notifier::product(const std::string& baseIdentifier, const fs::path& store) {
   if (const auto known = products_.find(store); known != products_.end())
     return known->second.get();
-  std::error_code error;
-  if (!fs::is_regular_file(fs::symlink_status(store, error))) return nullptr;
+  if (!isStore(store)) return nullptr;
   return (products_[store] = std::make_unique<Product>(*this, baseIdentifier, store)).get();
 }
 

@@ -289,10 +289,14 @@ TEST_F(NotifierTest, AHostThatHangsIsNotWaitedFor) {
 }
 
 TEST_F(NotifierTest, ANotifierWithNothingToDoEnds) {
+  // Somebody else's, who encrypts it.
+  fs::create_directory(home_ + "/foreign");
+  write("foreign/notifications.sqlite", std::string(8192, 'x'));
   EXPECT_EQ(Tests::ChildProcess({VARNEL_NOTIFIER}).wait(), 0);
   const std::string orvane = ORVANE_PROGRAM;
   outputOf(orvane + " remind every weekly");
   EXPECT_TRUE(isOnBus(notifierName));
+  EXPECT_EQ(outputOf("ls " + home_ + "/foreign"), "notifications.sqlite\n");
   // There is one of them.
   EXPECT_EQ(Tests::ChildProcess({VARNEL_NOTIFIER}).wait(), 0);
   outputOf(orvane + " remind every never");
