@@ -65,8 +65,7 @@ bool isStore(const fs::path& file) {
 // those that are killed before they can tell.
 class Notifier::Product final {
  public:
-  // The base identifier counts until the store tells it.
-  Product(Notifier& notifier, const std::string& baseIdentifier, const fs::path& store)
+  Product(Notifier& notifier, const fs::path& store)
       : ports_(notifier.ports_),
         launcher_(*notifier.launcher_),
         hosts_(notifier.bus_, [this](const auto& activation) { launch(activation); }),
@@ -76,8 +75,10 @@ class Notifier::Product final {
                     ports_.privateFiles, ports_.systemLog, *server_, *timer_},
                    store.string(), Migrating::never, hosts_),
         watch_(store.parent_path(), store.filename(), [this] { deliverer_.recheck(); }) {
+    // The folder has the name of the base identifier, as far as names of files can.
     const auto source = deliverer_.source();
-    hosts_.setProduct(source && *source ? (*source)->identifier : baseIdentifier);
+    hosts_.setProduct(source && *source ? (*source)->identifier
+                                        : store.parent_path().filename().string());
     deliverer_.setDuty(NotificationDeliverer::Duty::everything);
   }
 
@@ -182,22 +183,22 @@ void Notifier::sleepWhile(const std::function<bool()>& condition) {
   }
 }
 
-Notifier::Product* Notifier::product(const std::string& baseIdentifier, const fs::path& store) {
+// Links to a folder lead to one store, which one product here is for.
+Notifier::Product* Notifier::product(const fs::path& path) {
+  std::error_code error;
+  const fs::path store = fs::weakly_canonical(path.parent_path(), error) / path.filename();
   if (const auto known = products_.find(store); known != products_.end())
     return known->second.get();
   if (!isStore(store)) return nullptr;
-  return (products_[store] = std::make_unique<Product>(*this, baseIdentifier, store)).get();
+  return (products_[store] = std::make_unique<Product>(*this, store)).get();
 }
 
-// The folder of a product's store has the name of the base identifier, as far as names of files
-// can.
 void Notifier::findProducts() {
-  for (const fs::path& store : POSIX::notificationStores())
-    product(store.parent_path().filename().string(), store);
+  for (const fs::path& store : POSIX::notificationStores()) product(store);
 }
 
 void Notifier::recheck() {
-  for (const auto& [identifier, product] : products_) product->deliverer().recheck();
+  for (const auto& [store, product] : products_) product->deliverer().recheck();
 }
 
 bool Notifier::isIdle() const {
@@ -207,9 +208,9 @@ bool Notifier::isIdle() const {
 
 // The one method is `Changed`.
 void Notifier::receive(GVariant* arguments, GDBusMethodInvocation* call) {
-  const char* identifier = nullptr;
-  g_variant_get_child(arguments, 0, "&s", &identifier);
-  Product* const concerned = product(identifier, POSIX::notificationStore(identifier));
+  const char* store = nullptr;
+  g_variant_get_child(arguments, 0, "^&ay", &store);
+  Product* const concerned = product(store);
   if (concerned) concerned->deliverer().recheck();
   const bool stays = concerned && !concerned->isIdle();
   g_dbus_method_invocation_return_value(call, g_variant_new("(b)", static_cast<gboolean>(stays)));

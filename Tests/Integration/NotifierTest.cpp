@@ -147,6 +147,7 @@ class Host final {
       return condition();
     }));
   }
+  void endListening() { router_.reset(); }
   // What it has sent has arrived at the bus.
   void synchronise() {
     bool isAnswered = false;
@@ -269,6 +270,27 @@ TEST_F(NotifierTest, ABannerOutlivesItsHostAndAServerThatComesLateShowsIt) {
   const Server server;
   EXPECT_TRUE(comesTrue([] { return displayed() == "1\n"; }));
   EXPECT_THAT(outputOf("dunstctl close; dunstctl history"), HasSubstr("waiting"));
+}
+
+// Started by a shell with folders of its own, in a process that goes on without its host.
+TEST_F(NotifierTest, AStoreIsFoundWhereItsApplicationKeepsItAndAClickNeedsAHost) {
+  const Server server;
+  ::setenv("XDG_STATE_HOME", (home_ + "/else\xffwhere").c_str(), 1);
+  Host host("moved");
+  host.synchronise();
+  host.endListening();
+  EXPECT_FALSE(
+      host.center.scheduleNotification({.identifier = "note",
+                                        .title = "found",
+                                        .deliveryDate = std::chrono::system_clock::now() + 200ms}));
+  host.await([] { return displayed() == "1\n"; });
+  EXPECT_TRUE(isOnBus(notifierName));
+  outputOf("dunstctl action 0");
+  // The store may be busy.
+  host.await([&] {
+    const auto launch = host.center.takeLaunchNotification();
+    return launch && *launch;
+  });
 }
 
 TEST_F(NotifierTest, AHostThatHangsIsNotWaitedFor) {
