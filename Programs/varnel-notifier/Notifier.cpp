@@ -25,6 +25,7 @@
 #include <Varnel/Platform/Ports/NotificationServer.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/Ports/WallClockTimer.h>
+#include <Varnel/Platform/SQLite/SQLiteFailure.h>
 
 namespace Varnel {
 
@@ -95,7 +96,7 @@ class Notifier::Product final {
         log.write("A clicked notification does not reach its application: " +
                   error->localizedDescription());
     };
-    complain(deliverer_.keepLaunch(activation));
+    complain(keep(activation));
     const auto source = deliverer_.source();
     if (!source || !*source) return;
     ++*launches_;
@@ -106,6 +107,17 @@ class Notifier::Product final {
                        complain(error);
                        --*launches;
                      });
+  }
+
+  // Nobody clicks a second time, so others may take longer with the store than elsewhere.
+  std::optional<PlatformError> keep(const NotificationActivation& activation) {
+    constexpr int maxTries = 50;
+    std::optional<PlatformError> error;
+    for (int i = 0; i < maxTries; ++i) {
+      error = deliverer_.keepLaunch(activation);
+      if (!error || meaningOf(*error) != SQLiteFailure::busy) break;
+    }
+    return error;
   }
 
   const NotificationPorts ports_;

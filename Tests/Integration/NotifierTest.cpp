@@ -21,6 +21,7 @@
 #include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/TimeZones.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
+#include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Platform/Testing/FakeUser.h>
 #include <Varnel/Reminders/UserNotificationRouter.h>
@@ -251,6 +252,7 @@ TEST_F(NotifierTest, EachProductHasItsOwnClicksAndAnOnlookerGivesWay) {
   EXPECT_THAT(first.clicked, ElementsAre("first"));
   EXPECT_THAT(second.clicked, ElementsAre("second"));
   EXPECT_THAT(onlooker.clicked, IsEmpty());
+  EXPECT_TRUE(comesTrue([] { return !isOnBus(notifierName); }));
 }
 
 TEST_F(NotifierTest, ABannerOutlivesItsHostAndAServerThatComesLateShowsIt) {
@@ -285,8 +287,13 @@ TEST_F(NotifierTest, AStoreIsFoundWhereItsApplicationKeepsItAndAClickNeedsAHost)
                                         .deliveryDate = std::chrono::system_clock::now() + 200ms}));
   host.await([] { return displayed() == "1\n"; });
   EXPECT_TRUE(isOnBus(notifierName));
+  // Another process takes its time in the store.
+  auto holder = Platform::SQLiteDatabase::open(home_ + "/else\xffwhere/moved/notifications.sqlite");
+  EXPECT_TRUE(comesTrue([&] { return !holder->execute("BEGIN EXCLUSIVE"); }));
   outputOf("dunstctl action 0");
-  // The store may be busy.
+  const auto end = std::chrono::steady_clock::now() + 200ms;
+  host.await([&] { return std::chrono::steady_clock::now() > end; });
+  EXPECT_FALSE(holder->execute("COMMIT"));
   host.await([&] {
     const auto launch = host.center.takeLaunchNotification();
     return launch && *launch;
