@@ -156,6 +156,16 @@ class Host final {
     center.checkBanners([&](const auto&) { isAnswered = true; });
     await([&] { return isAnswered; });
   }
+  // Waits while the store is busy.
+  std::optional<UserNotification> takeLaunch() {
+    std::optional<UserNotification> launch;
+    await([&] {
+      const auto taken = center.takeLaunchNotification();
+      if (taken) launch = *taken;
+      return taken.hasValue();
+    });
+    return launch;
+  }
   void settle() {
     queue_->runWhile([this] { return center.isBusy(); }, 10s);
   }
@@ -233,7 +243,7 @@ TEST_F(NotifierTest, ABannerComesWhileNoProcessOfTheProductIsInFront) {
   host.await([&] { return !host.clicked.empty(); });
   EXPECT_THAT(host.clicked, ElementsAre("shown"));
   EXPECT_THAT(host.delivered, SizeIs(9));
-  EXPECT_EQ(*host.center.takeLaunchNotification(), std::nullopt);
+  EXPECT_EQ(host.takeLaunch(), std::nullopt);
   EXPECT_EQ(host.log.text(), "");
 }
 
@@ -294,10 +304,7 @@ TEST_F(NotifierTest, AStoreIsFoundWhereItsApplicationKeepsItAndAClickNeedsAHost)
   const auto end = std::chrono::steady_clock::now() + 200ms;
   host.await([&] { return std::chrono::steady_clock::now() > end; });
   EXPECT_FALSE(holder->execute("COMMIT"));
-  host.await([&] {
-    const auto launch = host.center.takeLaunchNotification();
-    return launch && *launch;
-  });
+  host.await([&] { return host.takeLaunch().has_value(); });
 }
 
 TEST_F(NotifierTest, AHostThatHangsIsNotWaitedFor) {
