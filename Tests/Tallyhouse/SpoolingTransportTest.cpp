@@ -136,19 +136,6 @@ TEST_F(SpoolingTransportTest, ADrainAnswersForItsOwnProcessWhoeverDelivers) {
   EXPECT_EQ(lines, 21);
 }
 
-TEST_F(SpoolingTransportTest, ALockedFileDelaysADrainThatIsGranted) {
-  const auto transport = std::shared_ptr(make());
-  AnalyticsTracker tracker({clock}, transport, Consent::granted);
-  std::optional<Tests::OtherConnection> lock;
-  lock.emplace(path(), "BEGIN IMMEDIATE");
-  track(tracker, "Held");
-  EXPECT_FALSE(transport->drain(100ms));
-  EXPECT_TRUE(http.posts().empty());
-  lock.reset();
-  EXPECT_TRUE(transport->drain(30s));
-  EXPECT_EQ(http.posts().size(), 1u);
-}
-
 TEST_F(SpoolingTransportTest, NoCallThatFailsLosesAnEvent) {
   using Varnel::Platform::Testing::Fault;
   for (const Fault fault : {Fault::fails, Fault::absent}) {
