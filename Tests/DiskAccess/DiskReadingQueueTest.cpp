@@ -248,8 +248,7 @@ TEST_F(DiskReadingQueueTest, AnswersAStopAtOnceInEachState) {
 
 TEST_F(DiskReadingQueueTest, ASlowResultKeepsNoTimeOutWaiting) {
   const Holder holder = holdStick();
-  std::latch isTold(1);
-  std::latch mayEnd(1);
+  std::latch isTold(1), mayEnd(1);
   queue_->read({onStick()}, {.accessWaitingTimeout = 0.001}, {},
                [&](const DiskReadingFile&, DiskReadingResult) {
                  isTold.count_down();

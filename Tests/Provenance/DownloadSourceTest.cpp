@@ -181,6 +181,7 @@ TEST_F(DownloadSource, AToolThatGivesNoAnswerLeavesTheApplicationToDecide) {
       {"with a child", "sleep 2 2>/dev/null &\n" + answer, {}, "image"},
   };
   testing::internal::CaptureStderr();
+  static_cast<void>(Platform::processPorts());  // They stay, with a descriptor of their own.
   const auto descriptors = Tests::openDescriptors();
   for (const auto& each : cases) {
     writeTool(each.script);
