@@ -44,7 +44,8 @@ class TrashKillsTest : public TrashFixture {
 
 TEST_F(TrashKillsTest, AFileIsAlwaysInItsPlaceOrInTheTrashWithItsInfo) {
   arrange = [this] {
-    for (const TrashedFile& each : contents()) trash->restore(each, Folders::leave);
+    for (const TrashedFile& each : contents())
+      static_cast<void>(trash->restore(each, Folders::leave));
   };
   const unsigned moves = killEverywhere([this] { EXPECT_TRUE(move(file)); });
   EXPECT_GE(moves, 40u);

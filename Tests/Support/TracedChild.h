@@ -2,7 +2,6 @@
 #pragma once
 
 #include <gtest/gtest.h>
-#include <linux/ptrace.h>
 #include <signal.h>
 #include <sys/ptrace.h>
 #include <sys/wait.h>

@@ -31,6 +31,18 @@ TrashError failed(std::error_code code) {
   return {.reason = Reason::failed, .code = code};
 }
 
+TrashError noTrash(std::error_code code) {
+  return {.reason = Reason::noTrash, .code = code};
+}
+
+// The links in it are the user's own.
+std::string homePath() {
+  const auto path = POSIX::userDataFolder() / "Trash";
+  std::error_code unreadable;
+  const auto resolved = std::filesystem::weakly_canonical(path, unreadable);
+  return unreadable ? path : resolved;
+}
+
 bool isSameOverRestarts(const FileState& a, const FileState& b) {
   return a.size == b.size && a.modified == b.modified && a.nanoseconds == b.nanoseconds;
 }
@@ -74,6 +86,13 @@ Result<Place, TrashError> presentPlace(const std::string& path) {
   return failed(place.error());
 }
 
+// What is in the trash stays as it is: its first place would be forgotten.
+Result<Place, TrashError> placeOutsideTrash(const std::string& path) {
+  auto place = presentPlace(path);
+  if (place && TrashFolder::isInOne(place->folder, homePath())) return noTrash({});
+  return place;
+}
+
 // What the step itself says: files of other mounts, and file systems that may replace, have no
 // trash here.
 TrashError whyNotMoved(std::error_code code) {
@@ -81,7 +100,7 @@ TrashError whyNotMoved(std::error_code code) {
     return {.reason = Reason::changed, .code = code};
   if (code == std::errc::cross_device_link || code == std::errc::invalid_argument ||
       code == std::errc::function_not_supported)
-    return {.reason = Reason::noTrash, .code = code};
+    return noTrash(code);
   return failed(code);
 }
 
@@ -98,7 +117,7 @@ class DesktopTrash final : public Trash {
   }
 
   Result<std::string, TrashError> folderFor(const std::string& path) override {
-    const auto place = presentPlace(path);
+    const auto place = placeOutsideTrash(path);
     if (!place) return place.error();
     auto trash = homeTrash(*place);
     if (!trash) trash = volumeTrash(*place);
@@ -108,7 +127,7 @@ class DesktopTrash final : public Trash {
 
   Result<TrashedFile, TrashError> move(const std::string& path, const FileState& expected,
                                        const Ready& ready) override {
-    const auto place = presentPlace(path);
+    const auto place = placeOutsideTrash(path);
     if (!place) return place.error();
     if (place->state() != expected) return TrashError{.reason = Reason::changed};
     if (const auto trash = homeTrash(*place)) {
@@ -143,24 +162,16 @@ class DesktopTrash final : public Trash {
 };
 
 Result<TrashFolder, TrashError> DesktopTrash::homeTrash(const Place& place) {
-  const std::string path = POSIX::userDataFolder() / "Trash";
-  const auto unusable = [](std::error_code code) {
-    return TrashError{.reason = Reason::noTrash, .code = code};
-  };
-  std::error_code failure = std::make_error_code(std::errc::permission_denied);
-  if (files_.makeFolders(path)) return unusable(failure);
-  const auto resolved = std::filesystem::canonical(path, failure);
-  if (failure) return unusable(failure);
-  auto trash = TrashFolder::atHome(resolved, place.folder);
-  if (!trash) return unusable(trash.error());
-  if (trash->keepsFilesIn(place.folder.folder.get())) return unusable({});
+  if (files_.makeFolders(homePath()))
+    return noTrash(std::make_error_code(std::errc::permission_denied));
+  auto trash = TrashFolder::atHome(homePath(), place.folder);
+  if (!trash) return noTrash(trash.error());
   return std::move(*trash);
 }
 
 Result<TrashFolder, TrashError> DesktopTrash::volumeTrash(const Place& place) {
   auto trash = TrashFolder::ofVolume(place.folder);
-  if (!trash) return TrashError{.reason = Reason::noTrash, .code = trash.error()};
-  if (trash->keepsFilesIn(place.folder.folder.get())) return TrashError{.reason = Reason::noTrash};
+  if (!trash) return noTrash(trash.error());
   return std::move(*trash);
 }
 
@@ -225,7 +236,7 @@ std::optional<TrashError> DesktopTrash::restore(const TrashedFile& file, Folders
       file.name.find('/') != std::string::npos)
     return failed(std::make_error_code(std::errc::invalid_argument));
   const auto trash = TrashFolder::open(file.folder);
-  if (!trash) return because(Reason::noTrash, trash.error());
+  if (!trash) return noTrash(trash.error());
   const auto info = trash->info(file.name);
   if (!info || trash->pathIn(*info) != file.path) return because(Reason::emptied);
   const auto state = stateAt(trash->files(), file.name);

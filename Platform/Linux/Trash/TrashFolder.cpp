@@ -130,19 +130,16 @@ Result<TrashFolder, std::error_code> TrashFolder::ofVolume(const HeldFolder& fol
   return openOwnIn(folder.volume.get(), std::string(ownPrefix) + user, folder.volumePath);
 }
 
+bool TrashFolder::isInOne(const HeldFolder& folder, const std::string& home) {
+  const std::string path = folder.path + "/";
+  return path.starts_with(home + "/") || path.find("/" + std::string(ownPrefix)) != path.npos ||
+         path.find("/" + std::string(sharedName) + "/") != path.npos;
+}
+
 // Some file systems count characters, and tell how many bytes those could be.
 std::size_t TrashFolder::maxName() const {
   const long told = ::fpathconf(files(), _PC_NAME_MAX);
   return static_cast<std::size_t>(told > 0 ? std::min(told, Linux::maxName) : Linux::maxName);
-}
-
-bool TrashFolder::keepsFilesIn(int folder) const {
-  struct stat there {};
-  if (::fstat(folder, &there) != 0) return false;
-  for (const FileDescriptor* own : {&files_, &info_})
-    if (struct stat facts{}; ::fstat(own->get(), &facts) == 0 && isSameFile(facts, there))
-      return true;
-  return false;
 }
 
 Result<InfoFile, std::error_code> TrashFolder::reserve(const std::string& name,

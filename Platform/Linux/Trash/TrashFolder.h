@@ -40,11 +40,12 @@ class TrashFolder final {
   /// The user's on the volume that the folder lies on. What is missing is made.
   [[nodiscard]] static Result<TrashFolder, std::error_code> ofVolume(const HeldFolder& folder);
 
+  /// Whether the folder lies in a trash, at home or of a volume.
+  [[nodiscard]] static bool isInOne(const HeldFolder& folder, const std::string& home);
+
   [[nodiscard]] const std::string& path() const { return path_; }
   [[nodiscard]] int files() const { return files_.get(); }
   [[nodiscard]] std::size_t maxName() const;
-  /// Whether the folder is the trash's own.
-  [[nodiscard]] bool keepsFilesIn(int folder) const;
 
   /// Takes a name for a file that was at `path`, or fails with `file_exists`.
   [[nodiscard]] Result<InfoFile, std::error_code> reserve(const std::string& name,
