@@ -27,6 +27,7 @@ class SoundPlayer;
 class StandardOutput;
 class SystemLog;
 class TimeZones;
+class Trash;
 class UserLocale;
 class UserNotificationCenters;
 class VolumeCatalog;
@@ -62,6 +63,8 @@ class SessionBus;
 /// `root` is the folder below which /etc/localtime lies.
 [[nodiscard]] std::unique_ptr<TimeZones> makeTimeZones(const std::string& root = "/");
 [[nodiscard]] std::unique_ptr<MainQueue> makeMainQueue();
+[[nodiscard]] std::unique_ptr<Trash> makeTrash(PrivateFiles& files, const Clock& clock,
+                                               const TimeZones& timeZones);
 [[nodiscard]] std::unique_ptr<StandardOutput> makeStandardOutput();
 [[nodiscard]] std::unique_ptr<SoundPlayer> makeSoundPlayer(SystemLog& systemLog,
                                                            MainQueue& mainQueue);

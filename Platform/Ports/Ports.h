@@ -27,6 +27,7 @@ class SoundPlayer;
 class StandardOutput;
 class SystemLog;
 class TimeZones;
+class Trash;
 class UserAccount;
 class UserLocale;
 class UserNotificationCenters;
@@ -64,6 +65,7 @@ struct Ports {
   std::reference_wrapper<StandardOutput> standardOutput;
   std::reference_wrapper<SystemLog> systemLog;
   std::reference_wrapper<TimeZones> timeZones;
+  std::reference_wrapper<Trash> trash;
   std::reference_wrapper<UserAccount> userAccount;
   std::reference_wrapper<UserLocale> userLocale;
   std::reference_wrapper<UserNotificationCenters> userNotificationCenters;
