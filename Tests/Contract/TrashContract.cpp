@@ -123,7 +123,7 @@ class FakeWorld final : public TrashWorld {
   Testing::FakeTrash trash_;
   std::uint64_t inode_ = 0;
 };
-INSTANTIATE_TEST_SUITE_P(Fake, TrashContract, TrashContract::on<FakeWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, TrashContract, on<FakeWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -62,7 +62,7 @@ class HomeTrash final : public TrashWorld {
   Testing::FakeTimeZones zones_;
   const std::unique_ptr<Trash> trash_ = Linux::makeTrash(*files_, clock_, zones_);
 };
-INSTANTIATE_TEST_SUITE_P(Linux, TrashContract, TrashContract::on<HomeTrash>());
+INSTANTIATE_TEST_SUITE_P(Linux, TrashContract, on<HomeTrash>());
 
 INSTANTIATE_TEST_SUITE_P(Linux, UserDefaultsContract,
                          on<UserFolders<Linux::makeApplicationStorage>>());
