@@ -27,7 +27,11 @@ void Console::complain(std::string_view message) {
 
 bool Console::writeResult(std::string_view text) {
   const std::error_code error = writeStandardOutput(text);
-  if (error) complain("cannot write the result: " + error.message());
+  if (error == std::errc::broken_pipe && closedPipesEnd()) {
+    hasLostReader_ = true;
+  } else if (error) {
+    complain("cannot write the result: " + error.message());
+  }
   return !error;
 }
 

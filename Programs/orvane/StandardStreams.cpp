@@ -11,6 +11,8 @@
 namespace Orvane {
 namespace {
 
+bool ignoredClosedPipes = false;  ///< Before it was this program's to choose.
+
 std::error_code writeAll(std::FILE* stream, std::string_view text) {
   errno = 0;
   const bool isWritten = std::fwrite(text.data(), 1, text.size(), stream) == text.size();
@@ -30,7 +32,17 @@ void reserveStandardStreams() {
 }
 
 void failOnClosedPipes() {
-  (void)std::signal(SIGPIPE, SIG_IGN);
+  ignoredClosedPipes = std::signal(SIGPIPE, SIG_IGN) == SIG_IGN;
+}
+
+bool closedPipesEnd() {
+  return !ignoredClosedPipes;
+}
+
+int endByClosedPipe() {
+  (void)std::signal(SIGPIPE, SIG_DFL);
+  (void)std::raise(SIGPIPE);
+  return 128 + SIGPIPE;
 }
 
 std::error_code writeStandardOutput(std::string_view text) {

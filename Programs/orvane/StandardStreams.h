@@ -10,8 +10,15 @@ namespace Orvane {
 /// was started without; such a stream fails when it is used. To be called first of all.
 void reserveStandardStreams();
 
-/// Makes a write to a closed pipe fail with an error rather than end the program without a word.
+/// Makes a write to a closed pipe fail with an error rather than end the program at once.
 void failOnClosedPipes();
+
+/// Whether a closed pipe ends programs: not where the program was started to ignore that.
+[[nodiscard]] bool closedPipesEnd();
+
+/// Ends the program as a write to a closed pipe does by itself. Returns the exit status for that
+/// where the signal is blocked.
+[[nodiscard]] int endByClosedPipe();
 
 /// Writes all of the text to the standard output, or says what went wrong.
 [[nodiscard]] std::error_code writeStandardOutput(std::string_view text);
