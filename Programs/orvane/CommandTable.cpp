@@ -315,6 +315,29 @@ Command help() {
           .run = runs(command)};
 }
 
+Command manual() {
+  return {.name = "manual",
+          .group = Command::Group::duplicates,
+          .summary = "Print the manual page, as roff for man",
+          .output = "The page",
+          .run = runs(std::make_shared<ManualCommand>())};
+}
+
+Command completion() {
+  const auto command = std::make_shared<CompletionCommand>();
+  return {.name = "completion",
+          .group = Command::Group::duplicates,
+          .summary = "Print the script by which a shell completes arguments",
+          .output = "The script",
+          .operands = {.value = word(
+                           "SHELL", command, &CompletionCommand::shell,
+                           {{"bash", Shell::bash}, {"zsh", Shell::zsh}, {"fish", Shell::fish}}),
+                       .description = "The shell",
+                       .min = 1,
+                       .max = 1},
+          .run = runs(command)};
+}
+
 }  // namespace
 
 CommandTable::CommandTable()
@@ -332,9 +355,10 @@ CommandTable::CommandTable()
               {.name = "log-to-stdout",
                .description = "Print it on standard output instead",
                .value = flag(wishes, &Wishes::logToStandardOutput)}},
-      commands{scan(),        disks(),          help(),         analytics(),    consent(),
-               identify(),    link(),           menu(),         origin(),       path(),
-               remindEvery(), remindTomorrow(), remindStatus(), remindListen(), sound()} {}
+      commands{scan(),         disks(),   help(),        manual(),         completion(),
+               analytics(),    consent(), identify(),    link(),           menu(),
+               origin(),       path(),    remindEvery(), remindTomorrow(), remindStatus(),
+               remindListen(), sound()} {}
 
 const Command* CommandTable::find(const std::string& name) const {
   const auto found = std::find_if(commands.begin(), commands.end(),

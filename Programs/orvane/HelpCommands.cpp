@@ -4,6 +4,7 @@
 #include <orvane/CommandTable.h>
 #include <orvane/Console.h>
 #include <orvane/HelpText.h>
+#include <orvane/ManualPage.h>
 
 namespace Orvane {
 
@@ -16,6 +17,14 @@ int HelpCommand::run(Console& console) const {
   if (!text.empty()) return console.writeResult(text) ? 0 : 1;
   console.complain("there is no command \"" + name + "\"");
   return 2;
+}
+
+int ManualCommand::run(Console& console) const {
+  return console.writeResult(manualPage(CommandTable())) ? 0 : 1;
+}
+
+int CompletionCommand::run(Console& console) const {
+  return console.writeResult(completionScript(CommandTable(), shell)) ? 0 : 1;
 }
 
 }  // namespace Orvane

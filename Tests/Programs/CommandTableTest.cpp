@@ -120,5 +120,56 @@ TEST_F(Orvane, ExplainsItself) {
   EXPECT_FALSE(hasLog());
 }
 
+TEST(Commands, AreInTheManualPage) {
+  const CommandTable table;
+  for (const char* name : {"manual", "completion"}) ASSERT_NE(table.find(name), nullptr);
+  const ScanFolder folder;
+  const std::string page = folder.path("page");
+  const auto shell = [](const std::string& command) {
+    return Varnel::Tests::outputOf("/bin/bash -c '" + command + "' 2>&1");
+  };
+  shell(ORVANE_PROGRAM " manual >" + page);
+  EXPECT_EQ(shell("LC_ALL=C.UTF-8 MANWIDTH=80 man --warnings -l " + page + " >" + page + ".txt"),
+            "");
+  // As man shows it, in one line.
+  const std::string text = shell("tr -s \"\\n \" \" \" <" + page + ".txt");
+  for (const Command& command : table.commands) {
+    EXPECT_THAT(text, HasSubstr(synopsis(command)));
+    for (const Option& option : command.options)
+      EXPECT_THAT(text, HasSubstr(formsOf(option) + " " + option.description));
+    for (const JSONField& field : command.fields) EXPECT_THAT(text, HasSubstr(field.key));
+  }
+  for (const ExitStatus& status : exitStatuses) EXPECT_THAT(text, HasSubstr(status.numbers));
+}
+
+TEST(Commands, AreCompleted) {
+  const struct {
+    const char* words;  ///< The last one is to be completed.
+    const char* completions;
+  } cases[] = {
+      {"sca", "scan"},
+      {"--ver", "--version,--verbose"},
+      {"remind \"\"", "every,tomorrow,status,listen"},
+      {"remind every once-in-t", "once-in-two-weeks,once-in-three-months"},
+      {"remind tomorrow --f", "--found"},
+      {"analytics consent y", "yes"},
+      {"scan --qos user-i", "user-initiated,user-interactive"},
+      {"scan -q b", "background"},
+      {"scan --js", "--json"},
+      {"scan /usr/incl", "/usr/include"},
+      {"sound pur", "purchase"},
+      {"menu x", ""},
+  };
+  for (const auto& [words, completions] : cases)
+    EXPECT_EQ(
+        Varnel::Tests::outputOf(
+            "/bin/bash -c 'source <(" ORVANE_PROGRAM " completion bash) && COMP_WORDS=(orvane " +
+            std::string(words) +
+            ") && COMP_CWORD=$((${#COMP_WORDS[@]} - 1)) && _orvane && IFS=, && printf %s "
+            "\"${COMPREPLY[*]}\"'"),
+        completions)
+        << words;
+}
+
 }  // namespace
 }  // namespace Orvane::Testing
