@@ -17,9 +17,9 @@ namespace Orvane {
 // Values that keep themselves in a member of a command.
 
 template <typename Command>
-Value flag(std::shared_ptr<Command> command, bool Command::*member) {
-  return {.take = [command, member](const std::string&) {
-    (*command).*member = true;
+Value flag(std::shared_ptr<Command> command, bool Command::*member, bool meaning = true) {
+  return {.take = [=](const std::string&) {
+    (*command).*member = meaning;
     return Complaint();
   }};
 }

@@ -13,6 +13,8 @@ using Varnel::Platform::visibleText;
 
 constexpr std::string_view eraseLine = "\r\x1b[K";
 
+std::atomic<bool> isStatusShown{false};
+
 }  // namespace
 
 void Console::print(std::string_view text) {
@@ -35,10 +37,15 @@ bool Console::writeResult(std::string_view text) {
   return !error;
 }
 
+void Console::eraseStatusInHandler() {
+  if (isStatusShown) writeStandardErrorInHandler(eraseLine);
+}
+
 void Console::showStatus(std::string status) {
   const std::lock_guard lock(mutex_);
   if (status == status_) return;
   status_ = std::move(status);
+  isStatusShown = !status_.empty();
   writeStandardError(std::string(eraseLine) + status_);
 }
 

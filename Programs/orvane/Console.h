@@ -36,6 +36,10 @@ class Console final {
   void showStatus(std::string status);
   void clearStatus() { showStatus({}); }
 
+  /// Erases the status line of any console from the terminal. For signal handlers that end the
+  /// program.
+  static void eraseStatusInHandler();
+
  private:
   std::mutex mutex_;
   std::string status_;

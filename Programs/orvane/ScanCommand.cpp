@@ -71,6 +71,13 @@ void planReminder(std::uint64_t bytesLeftToClean, Console& console) {
       *period, static_cast<std::int64_t>(std::min(bytesLeftToClean, max))));
 }
 
+std::string howFar(const ScanControl& control) {
+  if (control.filesToRead == 0)
+    return counted(control.filesFound, "file was found", "files were found");
+  return std::to_string(control.filesRead) + " of " +
+         counted(control.filesToRead, "file was read", "files were read");
+}
+
 unsigned maxReaders() {
   const unsigned cores = std::thread::hardware_concurrency();
   return std::max(2u, Globals::canUseAllCores() ? cores : cores / 2);
@@ -107,7 +114,7 @@ int ScanCommand::run(Console& console) const {
     if (interruption.signal() != 0) {
       log.log("Did cancel");
       analytics.scanCancelled();
-      console.complain("interrupted");
+      console.complain("interrupted when " + howFar(control));
       return 128 + interruption.signal();
     }
   }

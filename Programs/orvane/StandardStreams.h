@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <cstddef>
 #include <string_view>
 #include <system_error>
 
@@ -25,7 +26,12 @@ void failOnClosedPipes();
 
 /// Writes the text to standard error; a failure there cannot be reported.
 void writeStandardError(std::string_view text);
+/// The same for signal handlers.
+void writeStandardErrorInHandler(std::string_view text);
 
+/// Whether lines on it can be written over.
 [[nodiscard]] bool isStandardErrorATerminal();
+/// How wide that terminal is now; 80 where it does not tell.
+[[nodiscard]] std::size_t standardErrorColumns();
 
 }  // namespace Orvane

@@ -176,6 +176,21 @@ TEST_F(Orvane, FailsWhenItsResultCannotBeWritten) {
   EXPECT_THAT(logText(), Not(HasSubstr("no duplicates"))) << "the log took the output's place";
 }
 
+TEST_F(Orvane, ShowsProgressOnTerminalsAlone) {
+  folder.write("a", "same");
+  const std::string erase = "\r\x1b[K";
+  const auto onTerminal = [&](const std::string& options) {
+    return Varnel::Tests::outputOf("cd " + home.path() + "; HOME=$PWD script -qec 'stty cols 40; " +
+                                   ORVANE_PROGRAM + " " + options + "' typescript");
+  };
+  const std::string scan = "scan " + folder.path();
+  EXPECT_THAT(onTerminal(scan), HasSubstr(erase + "Looking: "));
+  EXPECT_THAT(onTerminal(scan), HasSubstr(erase + "1 file in 1 folder: no duplicates\r\n"));
+  EXPECT_THAT(onTerminal("scan --progress --no-progress " + folder.path()), Not(HasSubstr("\x1b")));
+  EXPECT_THAT(onTerminal(scan + " 2>errors"), Not(HasSubstr("\x1b")));
+  EXPECT_THAT(run({"scan", "-p", folder.path()}).errors, IsEmpty());
+}
+
 TEST_F(Orvane, ShowsPathsAndTheMenu) {
   EXPECT_EQ(run({"path", "--expand", "/usr//lib/", "docs/a"}).output, "/usr/lib\ndocs/a\n");
   const std::string users = run({"path", "--expand", "~"}).output;
