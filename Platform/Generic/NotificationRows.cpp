@@ -47,11 +47,11 @@ constexpr const char* contentColumns =
 /// A notification as it stands in a table.
 struct Content {
   UserNotification& notification;
-  DateComponents interval;  ///< Empty where the notification does not repeat.
+  DateComponents interval{};  ///< Empty where the notification does not repeat.
 
-  explicit Content(UserNotification& content)
-      : notification(content),
-        interval(content.deliveryRepeatInterval.value_or(DateComponents())) {}
+  explicit Content(UserNotification& content) : notification(content) {
+    if (content.deliveryRepeatInterval) interval = *content.deliveryRepeatInterval;
+  }
 
   /// In the order of the columns.
   auto values() {

@@ -53,10 +53,13 @@ std::string baseIdentifierOf(const Platform::ProcessInfo& processInfo,
 ProcessFacts::ProcessFacts(Ports ports, BuildSwitches switches)
     : ports_(ports), switches_(std::move(switches)) {}
 
-ProcessFacts::ProcessFacts(const Platform::Ports& ports)
+ProcessFacts::ProcessFacts(const Platform::Ports& ports, BuildSwitches switches)
     : ProcessFacts(Ports{ports.clock, ports.privateFiles, ports.processInfo, ports.userAccount,
                          ports.workspace},
-                   BuildSwitches::ofThisProduct()) {}
+                   std::move(switches)) {}
+
+ProcessFacts::ProcessFacts(const Platform::Ports& ports)
+    : ProcessFacts(ports, BuildSwitches::ofThisProduct()) {}
 
 ProcessFacts::ProcessFacts() : ProcessFacts(Platform::processPorts()) {}
 

@@ -31,7 +31,7 @@ inline constexpr std::string_view OVURLIsBookmarkedKey = "OVURLIsBookmarkedKey";
 /// The facts behind `Globals`, for one set of build switches and one system. Hosts ask `Globals`;
 /// their tests make facts of their own:
 ///
-///     ProcessFacts facts({.clock = clock, …}, {.isSiteVersion = true, .appName = "Orvane 3"});
+///     ProcessFacts facts(fakes.ports(), {.isSiteVersion = true, .appName = "Orvane 3"});
 ///     facts.substitutingApplicationName("Welcome to Orvane 2");  // "Welcome to Orvane 3"
 ///
 /// Every fact but `isEndUserFeaturesEnabled()` is computed by its first reader and never changes.
@@ -47,6 +47,7 @@ class VARNEL_API ProcessFacts final {
   };
 
   ProcessFacts(Ports ports, BuildSwitches switches);
+  ProcessFacts(const Platform::Ports& ports, BuildSwitches switches);
   explicit ProcessFacts(const Platform::Ports& ports);
   ProcessFacts();
 

@@ -7,7 +7,7 @@
 #include <limits>
 
 #include <Tests/Support/Crew.h>
-#include <Tests/Support/LocalZone.h>
+#include <Tests/Support/Zones.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/TimeZones.h>
 
@@ -34,7 +34,6 @@ TEST(DateFormatter, WritesTheYearOfTheLocalesWeek) {
   const auto text = [](const char* pattern, const char* locale, sys_days day) {
     return DateFormatter(pattern, locale, zones).string(day);
   };
-  EXPECT_EQ(text("YYYY-MM-dd", "en_US", 2024y / December / 28), "2024-12-28");
   EXPECT_EQ(text("YYYY-MM-dd", "en_US", 2024y / December / 31), "2025-12-31");
   EXPECT_EQ(text("yyyy-MM-dd", "en_US", 2024y / December / 31), "2024-12-31");
   EXPECT_EQ(text("YYYY-MM-dd", "de_DE", 2023y / January / 1), "2022-01-01");

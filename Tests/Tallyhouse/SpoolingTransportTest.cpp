@@ -48,21 +48,6 @@ TEST_F(SpoolingTransportTest, TakesHTTPSUnlessToldOtherwise) {
   EXPECT_FALSE(make("ftp://h.example/batch", allowed));
 }
 
-TEST_F(SpoolingTransportTest, EventsOfManyThreadsAllArrive) {
-  const auto transport = std::shared_ptr(make());
-  AnalyticsTracker tracker({clock}, transport, Consent::granted);
-  Varnel::Tests::Crew(4, [&](unsigned) {
-    for (int n = 0; n < 100; ++n) track(tracker, "Go");
-  });
-  EXPECT_TRUE(transport->drain(30s));
-  std::ptrdiff_t lines = 0;
-  for (const HTTPPost& post : http.posts())
-    lines += 1 + std::count(post.body.begin(), post.body.end(), '\n');
-  EXPECT_EQ(lines, 400);
-  track(tracker, std::string(10'000, 'x'));
-  EXPECT_FALSE(transport->drain(30s)) << "one was given up";
-}
-
 TEST_F(SpoolingTransportTest, AWithdrawnConsentStopsTransfersAndForgets) {
   std::binary_semaphore isPosting(0);
   std::binary_semaphore mayAnswer(0);
@@ -134,7 +119,9 @@ TEST_F(SpoolingTransportTest, ADrainAnswersForItsOwnProcessWhoeverDelivers) {
   AnalyticsTracker tracker({clock}, one, Consent::granted);
   AnalyticsTracker otherTracker({clock}, other, Consent::granted);
   track(otherTracker, "Theirs");
-  for (int i = 0; i < 20; ++i) track(tracker, "Ours");
+  Varnel::Tests::Crew(4, [&](unsigned) {
+    for (int i = 0; i < 5; ++i) track(tracker, "Ours");
+  });
   isPosting.acquire();
   // One of the two is at it. Neither can say that its events are delivered, and neither sends any.
   EXPECT_FALSE(one->drain(1ms));

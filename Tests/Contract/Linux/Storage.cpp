@@ -10,7 +10,8 @@ namespace Varnel::Platform::Contract {
 namespace {
 
 // The file is reached by a link, which is followed.
-class UserAttributes final : public ExtendedAttributesWorld {
+class UserAttributes final
+    : public AdapterColumn<ExtendedAttributesWorld, Linux::makeExtendedAttributes> {
  public:
   UserAttributes() { std::filesystem::create_symlink(file_, path()); }
   std::string obstacle() const override {
@@ -18,7 +19,6 @@ class UserAttributes final : public ExtendedAttributesWorld {
                ? ""
                : "The file system of " + file_ + " keeps no attributes.";
   }
-  ExtendedAttributes& attributes() override { return *attributes_; }
   std::string path() override { return folder_.path() / "link"; }
   void set(const std::string& name, const std::string& value) override {
     ASSERT_EQ(::setxattr(file_.c_str(), ("user." + name).c_str(), value.data(), value.size(), 0),
@@ -30,13 +30,11 @@ class UserAttributes final : public ExtendedAttributesWorld {
  private:
   const Tests::TemporaryFolder folder_;
   const std::string file_ = folder_.write("file", "");
-  const std::unique_ptr<ExtendedAttributes> attributes_ = Linux::makeExtendedAttributes();
 };
-INSTANTIATE_TEST_SUITE_P(Linux, ExtendedAttributesContract,
-                         ExtendedAttributesContract::on<UserAttributes>());
+INSTANTIATE_TEST_SUITE_P(Linux, ExtendedAttributesContract, on<UserAttributes>());
 
 INSTANTIATE_TEST_SUITE_P(Linux, UserDefaultsContract,
-                         UserDefaultsContract::on<UserFolders<Linux::makeApplicationStorage>>());
+                         on<UserFolders<Linux::makeApplicationStorage>>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract
