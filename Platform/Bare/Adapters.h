@@ -20,6 +20,7 @@ class SoundPlayer;
 class StandardOutput;
 class SystemLog;
 class TimeZones;
+class Trash;
 class UserNotificationCenters;
 class VolumeCatalog;
 class Workspace;
@@ -51,6 +52,7 @@ namespace Varnel::Platform::Bare {
 [[nodiscard]] std::unique_ptr<ProcessLauncher> noProcessLauncher();
 [[nodiscard]] std::unique_ptr<ReadingPriority> noReadingPriority();
 [[nodiscard]] std::unique_ptr<SoundPlayer> noSoundPlayer();
+[[nodiscard]] std::unique_ptr<Trash> noTrash();
 [[nodiscard]] std::unique_ptr<UserNotificationCenters> noUserNotificationCenters(MainQueue& queue);
 [[nodiscard]] std::unique_ptr<Workspace> noWorkspace();
 

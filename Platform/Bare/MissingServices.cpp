@@ -9,6 +9,7 @@
 #include <Varnel/Platform/Ports/ProcessLauncher.h>
 #include <Varnel/Platform/Ports/ReadingPriority.h>
 #include <Varnel/Platform/Ports/SoundPlayer.h>
+#include <Varnel/Platform/Ports/Trash.h>
 #include <Varnel/Platform/Ports/Workspace.h>
 
 namespace Varnel::Platform::Bare {
@@ -68,6 +69,23 @@ class NoSoundPlayer final : public SoundPlayer {
   std::optional<std::string> missingPart() const override { return "this system has no sounds"; }
 };
 
+class NoTrash final : public Trash {
+ public:
+  Result<FileState, TrashError> state(const std::string&) override { return none_; }
+  Result<std::string, TrashError> folderFor(const std::string&) override { return none_; }
+  Result<TrashedFile, TrashError> move(const std::string&, const FileState&,
+                                       const Ready&) override {
+    return none_;
+  }
+  std::optional<TrashError> restore(const TrashedFile&, Folders) override { return none_; }
+  Result<std::vector<TrashedFile>, TrashError> contents(const std::string&) override {
+    return none_;
+  }
+
+ private:
+  const TrashError none_{.reason = TrashError::Reason::noTrash, .code = notSupported()};
+};
+
 class NoWorkspace final : public Workspace {
  public:
   std::optional<URL> applicationURL(const std::string&) override { return std::nullopt; }
@@ -95,6 +113,9 @@ std::unique_ptr<ReadingPriority> noReadingPriority() {
 }
 std::unique_ptr<SoundPlayer> noSoundPlayer() {
   return std::make_unique<NoSoundPlayer>();
+}
+std::unique_ptr<Trash> noTrash() {
+  return std::make_unique<NoTrash>();
 }
 std::unique_ptr<Workspace> noWorkspace() {
   return std::make_unique<NoWorkspace>();

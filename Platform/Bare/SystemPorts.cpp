@@ -20,6 +20,7 @@
 #include <Varnel/Platform/Ports/StandardOutput.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/Ports/TimeZones.h>
+#include <Varnel/Platform/Ports/Trash.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
@@ -69,6 +70,7 @@ const Ports& systemPorts() {
       .standardOutput = keep(Bare::makeStandardOutput()),
       .systemLog = systemLog,
       .timeZones = keep(Bare::makeTimeZones()),
+      .trash = keep(Bare::noTrash()),
       .userAccount = keep(POSIX::makeUserAccount()),
       .userLocale = keep(POSIX::makeUserLocale()),
       .userNotificationCenters = keep(Bare::noUserNotificationCenters(mainQueue)),

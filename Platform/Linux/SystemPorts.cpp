@@ -20,6 +20,7 @@
 #include <Varnel/Platform/Ports/StandardOutput.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/Ports/TimeZones.h>
+#include <Varnel/Platform/Ports/Trash.h>
 #include <Varnel/Platform/Ports/UserAccount.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
@@ -74,6 +75,7 @@ const Ports& systemPorts() {
       .standardOutput = keep(Linux::makeStandardOutput()),
       .systemLog = systemLog,
       .timeZones = timeZones,
+      .trash = keep(Linux::makeTrash(privateFiles, clock, timeZones)),
       .userAccount = keep(POSIX::makeUserAccount()),
       .userLocale = userLocale,
       .userNotificationCenters = keep(Linux::makeUserNotificationCenters(

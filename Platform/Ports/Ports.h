@@ -27,6 +27,7 @@ class SoundPlayer;
 class StandardOutput;
 class SystemLog;
 class TimeZones;
+class Trash;
 class UserAccount;
 class UserLocale;
 class UserNotificationCenters;
@@ -34,8 +35,8 @@ class VolumeCatalog;
 class Workspace;
 
 /// One service of each kind. Assigning to a member puts another service in the place of that one;
-/// the others stay. The objects behind the references outlive all their users; those of the process
-/// are never destroyed.
+/// the others stay, and go on to use the services that they were made with. The objects behind the
+/// references outlive all their users; those of the process are never destroyed.
 ///
 ///     static auto& clock = *new MyClock();  // a host's own service among the system's
 ///     Ports ports = systemPorts();
@@ -64,6 +65,7 @@ struct Ports {
   std::reference_wrapper<StandardOutput> standardOutput;
   std::reference_wrapper<SystemLog> systemLog;
   std::reference_wrapper<TimeZones> timeZones;
+  std::reference_wrapper<Trash> trash;
   std::reference_wrapper<UserAccount> userAccount;
   std::reference_wrapper<UserLocale> userLocale;
   std::reference_wrapper<UserNotificationCenters> userNotificationCenters;

@@ -23,6 +23,7 @@
 #include <Varnel/Platform/Testing/FakeSecurityScope.h>
 #include <Varnel/Platform/Testing/FakeSoundPlayer.h>
 #include <Varnel/Platform/Testing/FakeTimeZones.h>
+#include <Varnel/Platform/Testing/FakeTrash.h>
 #include <Varnel/Platform/Testing/FakeUser.h>
 #include <Varnel/Platform/Testing/FakeUserNotificationCenter.h>
 #include <Varnel/Platform/Testing/FakeVolumeCatalog.h>
@@ -76,6 +77,7 @@ struct FakePorts {
   CapturedOutput standardOutput;
   CapturedSystemLog systemLog;
   FakeTimeZones timeZones;
+  FakeTrash trash;
   FakeUserAccount userAccount;
   FakeUserLocale userLocale;
   FakeUserNotificationCenters userNotificationCenters;
@@ -104,6 +106,7 @@ struct FakePorts {
         .standardOutput = standardOutput,
         .systemLog = systemLog,
         .timeZones = timeZones,
+        .trash = trash,
         .userAccount = userAccount,
         .userLocale = userLocale,
         .userNotificationCenters = userNotificationCenters,

@@ -6,6 +6,7 @@
 #include <Varnel/Platform/Ports/ExtendedAttributes.h>
 #include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/SecurityScope.h>
+#include <Varnel/Platform/Ports/Trash.h>
 
 namespace Varnel::Platform::Contract {
 
@@ -42,5 +43,22 @@ class SecurityScopeWorld : public WorldOf<SecurityScope> {
   virtual URL forbidden() = 0;
 };
 using SecurityScopeContract = Suite<SecurityScopeWorld>;
+
+/// A disk with a trash, and a folder on it.
+class TrashWorld : public World {
+ public:
+  virtual Trash& trash() = 0;
+  virtual std::string folder() = 0;
+  /// Makes a file, and its folder, with so many bytes; each is another than all before.
+  virtual void write(const std::string& path, std::size_t size) = 0;
+  virtual bool exists(const std::string& path) = 0;
+  /// The folder goes, with all that is in it.
+  virtual void remove(const std::string& folder) = 0;
+  /// What another program does.
+  virtual void empty(const TrashedFile& file) = 0;
+  /// A file on a disk that has no trash.
+  virtual std::string pathWithoutTrash() = 0;
+};
+using TrashContract = Suite<TrashWorld>;
 
 }  // namespace Varnel::Platform::Contract

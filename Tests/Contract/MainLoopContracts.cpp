@@ -111,6 +111,10 @@ TEST_P(MainQueueContract, StopEndsTheInnermostRunBehindWhatWasPostedBefore) {
   });
   queue.run();
   EXPECT_THAT(ran, ElementsAre(2, 1, 3));
+  // Also those that were called while no run was under way.
+  for (int i = 0; i < 3; ++i) queue.stop();
+  queue.drain();
+  for (int i = 0; i < 3; ++i) queue.run();
 }
 
 TEST_P(MainQueueContract, RunsWhileAConditionHolds) {
@@ -179,6 +183,12 @@ TEST_P(MainQueueContract, TheDescriptorWakesAHostThatPolls) {
   queue.drain();
   EXPECT_TRUE(ran);
   EXPECT_FALSE(isReadable(descriptor(), std::chrono::seconds(0)));
+
+  int left = 2;
+  for (int i = 0; i < 2; ++i) queue.post([&] { --left; });
+  queue.runWhile([&] { return left == 2; });
+  EXPECT_EQ(isReadable(descriptor(), std::chrono::seconds(0)), left > 0) << "what has not run yet";
+  queue.drain();
 
   // Also when the post comes while the host is polling already.
   const int polled = descriptor();

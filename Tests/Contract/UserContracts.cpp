@@ -180,7 +180,10 @@ TEST_P(UserLocaleContract, TheChoiceCountsAtOnceEachPartForItself) {
   EXPECT_EQ(locale.numberIdentifier(), "fr_CH");
   world->choose({"ja_JP"}, "", "de_AT");
   EXPECT_THAT(locale.languages(), ElementsAre("ja-JP"));
+  EXPECT_EQ(locale.identifier(), "en_US");
   EXPECT_EQ(locale.numberIdentifier(), "de_AT");
+  world->choose({"ja_JP"}, "de_AT", "");
+  EXPECT_EQ(locale.numberIdentifier(), "en_US");
 }
 
 class FakeUserLocaleWorld final : public FakeColumn<UserLocaleWorld, Testing::FakeUserLocale> {

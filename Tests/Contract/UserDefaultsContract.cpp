@@ -93,6 +93,8 @@ TEST_P(UserDefaultsContract, RefusesWhatItCannotKeepAndLosesNothing) {
     EXPECT_TRUE(isRefused(defaults.set("key", wrong), std::errc::invalid_argument));
   EXPECT_TRUE(isRefused(defaults.set("key", std::string(2 << 20, 'x')), std::errc::file_too_large));
   EXPECT_EQ(defaults.text("key"), "kept");
+  for (int i = 0; i < 2; ++i)
+    EXPECT_EQ(defaults.set("key", std::string(600'000, 'x')), std::nullopt) << "in its own place";
   EXPECT_EQ(defaults.set("key", "new"s), std::nullopt);
   EXPECT_EQ(defaults.text("key"), "new");
 }

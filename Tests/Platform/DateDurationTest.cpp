@@ -4,7 +4,10 @@
 
 #include <gtest/gtest.h>
 
+#include <atomic>
 #include <limits>
+#include <memory>
+#include <thread>
 
 #include <Tests/Support/Crew.h>
 #include <Tests/Support/Zones.h>
@@ -94,6 +97,34 @@ TEST(DateFormatter, GivesEveryThreadTheTextOfItsOwnSecond) {
       ASSERT_EQ(formatter.string(Date(seconds(second))), "00:00:" + digits);
     }
   });
+}
+
+// As a thread that a fork leaves behind in the middle of a date holds up no child.
+TEST(DateFormatter, WaitsForNoOtherThread) {
+  struct SlowZones final : TimeZones, TimeZone, std::enable_shared_from_this<SlowZones> {
+    mutable std::atomic<bool> isSlow = false, isMidway = false;
+
+    std::string localIdentifier() const override { return "UTC"; }
+    std::shared_ptr<const TimeZone> zone(const std::string&) const override {
+      return shared_from_this();
+    }
+    std::optional<Date> nextChange(Date) const override { return std::nullopt; }
+    Offset offsetAt(Date) const override {
+      if (!isSlow.exchange(false)) return {};
+      isMidway = true;
+      isMidway.notify_all();
+      isMidway.wait(true);
+      return {};
+    }
+  };
+  const auto slowZones = std::make_shared<SlowZones>();
+  const DateFormatter formatter("HH:mm:ss", "en_US", *slowZones);
+  slowZones->isSlow = true;
+  const std::jthread slow([&] { EXPECT_EQ(formatter.string(Date()), "00:00:00"); });
+  slowZones->isMidway.wait(false);
+  EXPECT_EQ(formatter.string(Date(std::chrono::seconds(1))), "00:00:01");
+  slowZones->isMidway = false;
+  slowZones->isMidway.notify_all();
 }
 
 TEST(DurationFormatter, CutsOffFractionsAndLeavesOutZeroUnits) {

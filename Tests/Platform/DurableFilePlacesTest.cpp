@@ -201,7 +201,7 @@ TEST_F(DurableFilePlacesTest, AFullDiskRefusesAndLaterTakes) {
         Notebook book(path_, notes(journal));
         EXPECT_TRUE(isNew || book.add("a") == "kept");
         const fs::path ballast = home_ / "ballast";
-        for (const std::size_t piece : {1 << 16, 1}) fill(ballast, piece);
+        for (const std::size_t piece : {65536u, 1u}) fill(ballast, piece);
         std::string answer = "kept";
         for (int number = 0; number < 2000 && answer == "kept"; ++number)
           answer = book.add("full" + std::to_string(number) + std::string(500, '.'));

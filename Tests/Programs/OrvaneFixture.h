@@ -47,6 +47,13 @@ class Orvane : public ::testing::Test {
     return text;
   }
 
+  void expectFailure(const std::vector<std::string>& arguments, const std::string& complaint) {
+    const Outcome outcome = run(arguments);
+    EXPECT_EQ(outcome.status, 1);
+    EXPECT_EQ(outcome.output, "");
+    EXPECT_THAT(outcome.errors, ::testing::HasSubstr(complaint));
+  }
+
   bool hasLog() const { return std::filesystem::exists(home.path("Library")); }
 
   ScanFolder folder;

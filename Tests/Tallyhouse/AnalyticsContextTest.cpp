@@ -46,5 +46,13 @@ TEST(AnalyticsConsent, LetsEventsThroughOnlyOnceGranted) {
   }
 }
 
+TEST(AnalyticsConsent, IsNotAskedUntilTheHostSaysMore) {
+  const auto witness = std::make_shared<Witness>();
+  AnalyticsTracker tracker(witness);
+  track(tracker, "event");
+  EXPECT_EQ(tracker.context()->consent(), Consent::notAsked);
+  EXPECT_EQ(witness->told, "");
+}
+
 }  // namespace
 }  // namespace Tallyhouse

@@ -155,21 +155,6 @@ TEST_F(DeliveryTest, WhatArrivedButCannotBeNotedIsNotRepeated) {
   EXPECT_EQ(names(), "") << "nor by the next run";
 }
 
-TEST_F(DeliveryTest, OneProcessDeliversUntilItHasNothingToDoOrDies) {
-  append(60);
-  auto one = std::make_unique<Process>(*this);
-  Process other(*this);
-  EXPECT_EQ(one->step(), Delivery::State::due);
-  EXPECT_EQ(other.step(), Delivery::State::elsewhere);
-  one.reset();
-  EXPECT_EQ(other.step(), Delivery::State::due);
-  EXPECT_EQ(other.step(), Delivery::State::idle);
-  one = std::make_unique<Process>(*this);
-  append(20);
-  EXPECT_EQ(one->step(), Delivery::State::idle);
-  EXPECT_EQ(http.posts().size(), 4u);
-}
-
 TEST_F(DeliveryTest, ALockThatNobodyCanTakeIsSaidOnce) {
   append(20);
   const std::string lock = path() + ".deliverer";

@@ -21,14 +21,15 @@ using Varnel::Platform::URL;
 class SpoolingTransportTest : public Tests::SpoolFixture {
  protected:
   std::unique_ptr<SpoolingTransport> make(
-      const char* endpoint = "https://h.example/batch",
+      SpoolingTransport::Ports ports, const char* endpoint = "https://h.example/batch",
       SpoolingTransport::PlainHTTP plain = SpoolingTransport::PlainHTTP::refused) {
-    return SpoolingTransport::make({clock, http, *files, log}, {.endpoint = *URL::parse(endpoint),
-                                                                .trackingID = "QN-1",
-                                                                .clientID = "12.34",
-                                                                .spoolPath = path(),
-                                                                .plainHTTP = plain});
+    return SpoolingTransport::make(ports, {.endpoint = *URL::parse(endpoint),
+                                           .trackingID = "QN-1",
+                                           .clientID = "12.34",
+                                           .spoolPath = path(),
+                                           .plainHTTP = plain});
   }
+  std::unique_ptr<SpoolingTransport> make() { return make({clock, http, *files, log}); }
 
   static void track(AnalyticsTracker& tracker, std::string_view action) {
     tracker.context()->trackEvent("Category", action, std::nullopt, std::nullopt, {}, {});
@@ -39,13 +40,13 @@ class SpoolingTransportTest : public Tests::SpoolFixture {
 
 TEST_F(SpoolingTransportTest, TakesHTTPSUnlessToldOtherwise) {
   using enum SpoolingTransport::PlainHTTP;
-  EXPECT_TRUE(make("https://h.example/batch"));
-  EXPECT_TRUE(make("HTTPS://h.example"));
-  EXPECT_TRUE(make("http://h.example/batch", allowed));
+  const SpoolingTransport::Ports ports{clock, http, *files, log};
+  EXPECT_TRUE(make(ports, "HTTPS://h.example"));
+  EXPECT_TRUE(make(ports, "http://h.example/batch", allowed));
   for (const char* url :
        {"http://h.example/batch", "file:///etc/passwd", "//h/batch", "https:///x"})
-    EXPECT_FALSE(make(url)) << url;
-  EXPECT_FALSE(make("ftp://h.example/batch", allowed));
+    EXPECT_FALSE(make(ports, url)) << url;
+  EXPECT_FALSE(make(ports, "ftp://h.example/batch", allowed));
 }
 
 TEST_F(SpoolingTransportTest, AWithdrawnConsentStopsTransfersAndForgets) {
@@ -136,19 +137,6 @@ TEST_F(SpoolingTransportTest, ADrainAnswersForItsOwnProcessWhoeverDelivers) {
   EXPECT_EQ(lines, 21);
 }
 
-TEST_F(SpoolingTransportTest, ALockedFileDelaysADrainThatIsGranted) {
-  const auto transport = std::shared_ptr(make());
-  AnalyticsTracker tracker({clock}, transport, Consent::granted);
-  std::optional<Tests::OtherConnection> lock;
-  lock.emplace(path(), "BEGIN IMMEDIATE");
-  track(tracker, "Held");
-  EXPECT_FALSE(transport->drain(100ms));
-  EXPECT_TRUE(http.posts().empty());
-  lock.reset();
-  EXPECT_TRUE(transport->drain(30s));
-  EXPECT_EQ(http.posts().size(), 1u);
-}
-
 TEST_F(SpoolingTransportTest, NoCallThatFailsLosesAnEvent) {
   using Varnel::Platform::Testing::Fault;
   for (const Fault fault : {Fault::fails, Fault::absent}) {
@@ -158,11 +146,7 @@ TEST_F(SpoolingTransportTest, NoCallThatFailsLosesAnEvent) {
       Varnel::Platform::Testing::FakeHTTPClient server;
       faulty.faults = server.faults = faults;
       const auto run = [&](std::initializer_list<const char*> actions) {
-        const std::shared_ptr<SpoolingTransport> transport = SpoolingTransport::make(
-            {clock, server, faulty, log}, {.endpoint = *URL::parse("https://h.example/batch"),
-                                           .trackingID = "QN-1",
-                                           .clientID = "12.34",
-                                           .spoolPath = path()});
+        const auto transport = std::shared_ptr(make({clock, server, faulty, log}));
         AnalyticsTracker tracker({clock}, transport, Consent::granted);
         for (const char* action : actions) track(tracker, action);
         return transport->drain(actions.size() == 0 ? 30s : 20ms);
