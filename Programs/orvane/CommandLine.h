@@ -5,6 +5,8 @@
 #include <string>
 #include <variant>
 
+#include <orvane/LogOutput.h>
+
 namespace Orvane {
 
 class Console;
@@ -12,7 +14,7 @@ class Console;
 /// What the arguments ask for.
 struct Invocation {
   std::function<int(Console&)> command;  ///< Runs it and returns the exit status.
-  bool logsToStandardOutput = false;
+  LogOutput logOutput = LogOutput::none;
 };
 
 /// The answer to --help or --version.
@@ -20,7 +22,7 @@ struct Information {
   std::string text;
 };
 
-/// What is wrong with the arguments, in one line.
+/// What is wrong with the arguments, in one line; empty when there are none.
 struct UsageError {
   std::string message;
 };

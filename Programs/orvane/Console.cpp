@@ -13,6 +13,8 @@ using Varnel::Platform::visibleText;
 
 constexpr std::string_view eraseLine = "\r\x1b[K";
 
+std::atomic<bool> isStatusShown{false};
+
 }  // namespace
 
 void Console::print(std::string_view text) {
@@ -27,14 +29,23 @@ void Console::complain(std::string_view message) {
 
 bool Console::writeResult(std::string_view text) {
   const std::error_code error = writeStandardOutput(text);
-  if (error) complain("cannot write the result: " + error.message());
+  if (error == std::errc::broken_pipe && closedPipesEnd()) {
+    hasLostReader_ = true;
+  } else if (error) {
+    complain("cannot write the result: " + error.message());
+  }
   return !error;
+}
+
+void Console::eraseStatusInHandler() {
+  if (isStatusShown) writeStandardErrorInHandler(eraseLine);
 }
 
 void Console::showStatus(std::string status) {
   const std::lock_guard lock(mutex_);
   if (status == status_) return;
   status_ = std::move(status);
+  isStatusShown = !status_.empty();
   writeStandardError(std::string(eraseLine) + status_);
 }
 

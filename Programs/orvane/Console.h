@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <atomic>
 #include <mutex>
 #include <string>
 #include <string_view>
@@ -26,16 +27,23 @@ class Console final {
   /// Prints "orvane: " and the message on one line.
   void complain(std::string_view message);
 
-  /// Writes the result to standard output; complains and returns false when that fails.
+  /// Writes the result to standard output; complains and returns false when that fails. Says
+  /// nothing when the result's reader has gone, which ends programs.
   [[nodiscard]] bool writeResult(std::string_view text);
+  [[nodiscard]] bool hasLostReader() const { return hasLostReader_; }
 
   /// Replaces the status line. Only for terminals.
   void showStatus(std::string status);
   void clearStatus() { showStatus({}); }
 
+  /// Erases the status line of any console from the terminal. For signal handlers that end the
+  /// program.
+  static void eraseStatusInHandler();
+
  private:
   std::mutex mutex_;
   std::string status_;
+  std::atomic<bool> hasLostReader_{false};
 };
 
 }  // namespace Orvane

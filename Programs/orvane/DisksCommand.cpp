@@ -2,6 +2,8 @@
 #include <orvane/DisksCommand.h>
 
 #include <nlohmann/json.hpp>
+#include <optional>
+#include <set>
 #include <string>
 
 #include <Varnel/DiskAccess/OVDiskInfo.h>
@@ -15,6 +17,7 @@ namespace {
 using Varnel::OVDiskInfo;
 using Varnel::OVDiskKind;
 using Varnel::Platform::visibleText;
+using Identifier = std::optional<std::string>;
 
 std::string nameOf(OVDiskKind kind) {
   switch (kind) {
@@ -37,19 +40,30 @@ const OVDiskInfo::VolumeURLs& volumesOf(const OVDiskInfo& disk) {
   return disk.volumeURLs() ? *disk.volumeURLs() : none;
 }
 
-std::string textOf(const OVDiskInfo& disk) {
-  std::string text = visibleText(disk.uniqueID().value_or("?")) + ": " + nameOf(disk.kind()) +
-                     ", at most " + std::to_string(disk.maxTreads()) +
+/// The identifiers that two inventories agree on. Others are invented anew by each, for what has no
+/// identifier of its own, and mean nothing to anyone.
+std::set<std::string> lastingIdentifiers(const OVDiskInfo::Array& disks) {
+  std::set<std::string> before;
+  for (const auto& disk : OVDiskInfo::allDiskInfos()) before.insert(disk->uniqueID().value_or(""));
+  std::set<std::string> lasting;
+  for (const auto& disk : disks)
+    if (disk->uniqueID() && before.contains(*disk->uniqueID())) lasting.insert(*disk->uniqueID());
+  return lasting;
+}
+
+std::string textOf(const OVDiskInfo& disk, const Identifier& identifier) {
+  std::string text = (identifier ? visibleText(*identifier) : "(no identifier)") + ": " +
+                     nameOf(disk.kind()) + ", at most " + std::to_string(disk.maxTreads()) +
                      (disk.maxTreads() == 1 ? " reader" : " readers") + "\n";
   for (const auto& volume : volumesOf(disk)) text += "  " + visibleText(volume.path()) + "\n";
   return text;
 }
 
-nlohmann::ordered_json jsonOf(const OVDiskInfo& disk) {
+nlohmann::ordered_json jsonOf(const OVDiskInfo& disk, const Identifier& identifier) {
   nlohmann::ordered_json json;
-  json["uniqueID"] = disk.uniqueID() ? nlohmann::ordered_json(*disk.uniqueID()) : nullptr;
+  json["uniqueID"] = identifier ? nlohmann::ordered_json(*identifier) : nullptr;
   json["kind"] = nameOf(disk.kind());
-  json["maxTreads"] = disk.maxTreads();
+  json["maxReaders"] = disk.maxTreads();
   json["volumes"] = nlohmann::ordered_json::array();
   for (const auto& volume : volumesOf(disk)) json["volumes"].push_back(volume.absoluteString());
   return json;
@@ -59,10 +73,15 @@ nlohmann::ordered_json jsonOf(const OVDiskInfo& disk) {
 
 int DisksCommand::run(Console& console) const {
   std::string text;
-  nlohmann::ordered_json json = {{"disks", nlohmann::ordered_json::array()}};
-  for (const auto& disk : OVDiskInfo::allDiskInfos()) {
-    text += textOf(*disk);
-    json["disks"].push_back(jsonOf(*disk));
+  nlohmann::ordered_json json = {{"schemaVersion", schemaVersion},
+                                 {"disks", nlohmann::ordered_json::array()}};
+  const auto disks = OVDiskInfo::allDiskInfos();
+  const auto lasting = lastingIdentifiers(disks);
+  for (const auto& disk : disks) {
+    const Identifier identifier =
+        lasting.contains(disk->uniqueID().value_or("")) ? disk->uniqueID() : std::nullopt;
+    text += textOf(*disk, identifier);
+    json["disks"].push_back(jsonOf(*disk, identifier));
   }
   return console.writeResult(isJSON ? jsonLine(json) : text) ? 0 : 1;
 }

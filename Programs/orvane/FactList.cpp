@@ -17,7 +17,7 @@ void FactList::add(std::string key, std::string label, std::optional<std::string
 
 std::string FactList::text(Form form) const {
   std::string lines;
-  nlohmann::ordered_json json = nlohmann::ordered_json::object();
+  nlohmann::ordered_json json = {{"schemaVersion", schemaVersion}};
   for (const Fact& fact : facts_) {
     lines += fact.label + ": " + (fact.value ? visibleText(*fact.value) : "none") + "\n";
     json[fact.key] = fact.value ? nlohmann::ordered_json(*fact.value) : nullptr;

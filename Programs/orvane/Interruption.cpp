@@ -3,10 +3,12 @@
 
 #include <csignal>
 
+#include <orvane/Console.h>
+
 namespace Orvane {
 namespace {
 
-constexpr int signals[] = {SIGINT, SIGTERM};
+constexpr int signals[] = {SIGINT, SIGTERM, SIGHUP};
 
 // What a signal handler may touch: atomics that need no lock.
 std::atomic<std::atomic<bool>*> flagToSet{nullptr};
@@ -14,8 +16,13 @@ std::atomic<int> caughtSignal{0};
 static_assert(std::atomic<std::atomic<bool>*>::is_always_lock_free);
 
 extern "C" void interrupt(int signal) {
-  (void)std::signal(signal, SIG_DFL);
-  caughtSignal = signal;
+  // The signal is blocked here, and ends the program when this returns.
+  if (caughtSignal.exchange(signal) != 0) {
+    Console::eraseStatusInHandler();
+    (void)std::signal(signal, SIG_DFL);
+    (void)std::raise(signal);
+    return;
+  }
   if (std::atomic<bool>* flag = flagToSet) *flag = true;
 }
 

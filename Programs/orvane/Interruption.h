@@ -5,8 +5,8 @@
 
 namespace Orvane {
 
-/// While it lives, the first SIGINT or SIGTERM sets a flag instead of ending the program; a second
-/// one ends it. One object at a time.
+/// While it lives, the first SIGINT, SIGTERM or SIGHUP sets a flag instead of ending the program; a
+/// second one ends it, and leaves no line of progress on the terminal. One object at a time.
 ///
 ///     Interruption interruption(control.isCancelled);
 ///     …

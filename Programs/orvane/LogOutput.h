@@ -5,9 +5,15 @@ namespace Orvane {
 
 class Console;
 
-/// Sends what the framework's logger prints to the console's standard error, so that standard
-/// output holds the result alone. To be called before anything of the framework is used; the
+/// Where the log goes beside its file.
+enum class LogOutput {
+  none,  ///< Nowhere, but for the events that a scan is asked to print: standard error shows them.
+  standardError,
+  standardOutput,
+};
+
+/// Installs that for the process. To be called before anything of the framework is used; the
 /// console lives as long as the process.
-void sendLogTo(Console& console);
+void sendLog(LogOutput output, Console& console);
 
 }  // namespace Orvane

@@ -1,15 +1,33 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/ProgressLine.h>
 
-#include <chrono>
+#include <algorithm>
 #include <condition_variable>
 #include <mutex>
+#include <optional>
+#include <vector>
 
 #include <Scan/ScanObserver.h>
 #include <Varnel/Platform/Concurrency/StartThread.h>
 #include <orvane/Console.h>
+#include <orvane/ResultText.h>
+#include <orvane/StandardStreams.h>
 
 namespace Orvane {
+namespace {
+
+std::string megabytes(double bytes) {
+  return std::to_string(static_cast<std::uint64_t>(bytes / 1e6));
+}
+
+/// "45 s", "12 min", "3 h".
+std::string timeText(double seconds) {
+  const auto whole = static_cast<std::uint64_t>(seconds);
+  if (whole < 100) return std::to_string(whole) + " s";
+  return whole < 6000 ? std::to_string(whole / 60) + " min" : std::to_string(whole / 3600) + " h";
+}
+
+}  // namespace
 
 ProgressLine::ProgressLine(Console& console, const ScanControl& control)
     : console_(console),
@@ -23,20 +41,49 @@ ProgressLine::~ProgressLine() {
 }
 
 void ProgressLine::show(const std::stop_token& stop) {
+  using std::chrono::steady_clock;
   std::mutex mutex;
   std::condition_variable_any stopped;
   std::unique_lock lock(mutex);
-  while (!stop.stop_requested()) {
-    console_.showStatus(text(control_));
+  std::optional<steady_clock::time_point> begin;
+  do {
+    const auto now = steady_clock::now();
+    if (!begin && control_.filesToRead > 0) begin = now;
+    const auto readingTime =
+        std::chrono::duration_cast<std::chrono::milliseconds>(now - begin.value_or(now));
+    // A line that fills the last column would wrap on some terminals.
+    console_.showStatus(text(control_, readingTime, standardErrorColumns() - 1));
     stopped.wait_for(lock, stop, std::chrono::milliseconds(100), [] { return false; });
-  }
+  } while (!stop.stop_requested());
 }
 
-std::string ProgressLine::text(const ScanControl& control) {
+std::string ProgressLine::text(const ScanControl& control, std::chrono::milliseconds readingTime,
+                               std::size_t columns) {
   const std::uint64_t toRead = control.filesToRead;
-  if (toRead == 0) return std::to_string(control.filesFound) + " files found";
-  return std::to_string(control.filesRead) + " of " + std::to_string(toRead) + " files read, " +
-         std::to_string(control.bytesRead / 1'000'000) + " MB";
+  const std::uint64_t read = std::min<std::uint64_t>(control.filesRead, toRead);
+  const std::uint64_t bytes = control.bytesRead;
+  std::vector<std::string> parts;
+  if (toRead == 0) {
+    parts.push_back("Looking: " + counted(control.filesFound, "file", "files"));
+  } else {
+    parts.push_back("Reading: " + std::to_string(read) + " of " + counted(toRead, "file", "files"));
+    parts.push_back(megabytes(static_cast<double>(bytes)) + " MB");
+    const double seconds = std::chrono::duration<double>(readingTime).count();
+    if (seconds >= 1) {
+      parts.push_back(megabytes(static_cast<double>(bytes) / seconds) + " MB/s");
+      if (read > 0)
+        parts.push_back(
+            timeText(seconds / static_cast<double>(read) * static_cast<double>(toRead - read)) +
+            " left");
+    }
+  }
+  std::string line;
+  for (const std::string& part : parts) {
+    const std::string longer = line.empty() ? part : line + ", " + part;
+    if (longer.size() > columns) break;
+    line = longer;
+  }
+  return line.empty() ? parts.front().substr(0, columns) : line;
 }
 
 }  // namespace Orvane

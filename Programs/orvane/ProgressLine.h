@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
+#include <cstddef>
 #include <stop_token>
 #include <string>
 #include <thread>
@@ -19,8 +21,10 @@ class ProgressLine final {
   ProgressLine(const ProgressLine&) = delete;
   ProgressLine& operator=(const ProgressLine&) = delete;
 
-  /// The line for what the control says now.
-  [[nodiscard]] static std::string text(const ScanControl& control);
+  /// What the control says some time after the reading began: the phase and its files, the bytes
+  /// read, their rate and the time left. What has no room in the columns is left out from the end.
+  [[nodiscard]] static std::string text(const ScanControl& control,
+                                        std::chrono::milliseconds readingTime, std::size_t columns);
 
  private:
   void show(const std::stop_token& stop);

@@ -22,10 +22,6 @@ using Varnel::Platform::ByteCountStyle;
 using Varnel::Platform::URL;
 using Varnel::Platform::visibleText;
 
-std::string counted(std::uint64_t count, const char* singular, const char* plural) {
-  return std::to_string(count) + " " + (count == 1 ? singular : plural);
-}
-
 std::string summary(const ScanTotals& totals, std::size_t groups, const std::string& wasted) {
   std::string text = counted(totals.files, "file", "files") + " in " +
                      counted(totals.folders, "folder", "folders") + ": ";
@@ -81,6 +77,10 @@ class Parts final {
 
 }  // namespace
 
+std::string counted(std::uint64_t count, const char* singular, const char* plural) {
+  return std::to_string(count) + " " + (count == 1 ? singular : plural);
+}
+
 bool writeText(const ScanResult& result, const ByteCountFormatter& byteCounts,
                const Varnel::QNURLResolver& paths, const TextWriter& write) {
   const auto size = [&](std::uint64_t bytes) {
@@ -101,6 +101,7 @@ bool writeText(const ScanResult& result, const ByteCountFormatter& byteCounts,
 bool writeJSON(const ScanResult& result, const TextWriter& write) {
   const ScanTotals& totals = result.totals;
   std::string head = jsonLine({
+      {"schemaVersion", schemaVersion},
       {"folders", totals.folders},
       {"files", totals.files},
       {"bytes", totals.bytes},

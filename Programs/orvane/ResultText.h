@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <cstdint>
 #include <functional>
+#include <string>
 #include <string_view>
 
 namespace Varnel {
@@ -15,6 +17,9 @@ class ByteCountFormatter;
 namespace Orvane {
 
 struct ScanResult;
+
+/// "1 file", "2 files".
+[[nodiscard]] std::string counted(std::uint64_t count, const char* singular, const char* plural);
 
 /// Takes the next part of a text, of some 64 kB; false when it could not be written.
 using TextWriter = std::function<bool(std::string_view)>;

@@ -27,6 +27,7 @@
 #include <orvane/Reminders.h>
 #include <orvane/ResultText.h>
 #include <orvane/ScanAnalytics.h>
+#include <orvane/ScanLog.h>
 #include <orvane/SoundCommand.h>
 #include <orvane/StandardStreams.h>
 
@@ -35,38 +36,7 @@ namespace {
 
 namespace fs = std::filesystem;
 using Varnel::Globals;
-using Varnel::LoggingContextTag;
 using Varnel::Platform::URL;
-
-std::string reasonOf(const Loss& loss) {
-  switch (loss.kind) {
-    case Loss::Kind::vanished:
-      return "it vanished";
-    case Loss::Kind::changed:
-      return "it changed meanwhile";
-    case Loss::Kind::incomplete:
-      return "the rest of it cannot be read: " + loss.error.message();
-    case Loss::Kind::unreadable:
-      break;
-  }
-  return "it cannot be read: " + loss.error.message();
-}
-
-/// Names in the log what the scan leaves out.
-class ScanLog final : public ScanObserver, public Varnel::LoggingObject {
- public:
-  [[nodiscard]] std::string_view logAuthor() const override { return "ScanCommand"; }
-
-  void fileLeftOut(const std::string& path, const Loss& loss) override { leftOut(path, loss); }
-  void folderLeftOut(const std::string& path, const Loss& loss) override {
-    leftOut(path + "/", loss);
-  }
-
- private:
-  void leftOut(const std::string& path, const Loss& loss) const {
-    log("Left out: " + reasonOf(loss), URL::fileURLWithPath(path));
-  }
-};
 
 void complainThatItCannotScan(const std::string& folder, const std::string& reason,
                               Console& console) {
@@ -99,6 +69,13 @@ void planReminder(std::uint64_t bytesLeftToClean, Console& console) {
   // It says itself what is in its way; the scan has succeeded all the same.
   static_cast<void>(ReminderPlanner(console).planRegular(
       *period, static_cast<std::int64_t>(std::min(bytesLeftToClean, max))));
+}
+
+std::string howFar(const ScanControl& control) {
+  if (control.filesToRead == 0)
+    return counted(control.filesFound, "file was found", "files were found");
+  return std::to_string(control.filesRead) + " of " +
+         counted(control.filesToRead, "file was read", "files were read");
 }
 
 unsigned maxReaders() {
@@ -137,7 +114,7 @@ int ScanCommand::run(Console& console) const {
     if (interruption.signal() != 0) {
       log.log("Did cancel");
       analytics.scanCancelled();
-      console.complain("interrupted");
+      console.complain("interrupted when " + howFar(control));
       return 128 + interruption.signal();
     }
   }
@@ -146,8 +123,9 @@ int ScanCommand::run(Console& console) const {
       complainThatItCannotScan(lost.path, reasonOf(lost.loss), console);
     return 1;
   }
-  log.log("Did find " + std::to_string(result.groups.size()) + " groups of duplicates among " +
-          std::to_string(result.totals.files) + " files");
+  log.log("Did find " + counted(result.groups.size(), "group", "groups") + " of duplicates among " +
+          counted(result.totals.files, "file", "files"));
+  log.complain(console);
   analytics.scanFinished(result.groups.size());
   const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.get().numberIdentifier());
   const auto write = [&](std::string_view text) { return console.writeResult(text); };

@@ -16,7 +16,7 @@ struct ScanCommand {
   std::vector<std::string> folders;
   Varnel::Platform::QualityOfService qos = Varnel::Platform::QualityOfService::utility;
   bool isJSON = false;
-  bool showsProgress = false;
+  bool showsProgress = true;  ///< While standard error is a terminal.
   bool playsSound = false;
   std::optional<std::string> analyticsEndpoint;  ///< Where events go; nowhere without one.
   bool printsEvents = false;

@@ -2,14 +2,18 @@
 #include <orvane/StandardStreams.h>
 
 #include <fcntl.h>
+#include <sys/ioctl.h>
 #include <unistd.h>
 
 #include <cerrno>
 #include <csignal>
 #include <cstdio>
+#include <cstdlib>
 
 namespace Orvane {
 namespace {
+
+bool ignoredClosedPipes = false;  ///< Before it was this program's to choose.
 
 std::error_code writeAll(std::FILE* stream, std::string_view text) {
   errno = 0;
@@ -30,7 +34,17 @@ void reserveStandardStreams() {
 }
 
 void failOnClosedPipes() {
-  (void)std::signal(SIGPIPE, SIG_IGN);
+  ignoredClosedPipes = std::signal(SIGPIPE, SIG_IGN) == SIG_IGN;
+}
+
+bool closedPipesEnd() {
+  return !ignoredClosedPipes;
+}
+
+int endByClosedPipe() {
+  (void)std::signal(SIGPIPE, SIG_DFL);
+  (void)std::raise(SIGPIPE);
+  return 128 + SIGPIPE;
 }
 
 std::error_code writeStandardOutput(std::string_view text) {
@@ -41,8 +55,19 @@ void writeStandardError(std::string_view text) {
   (void)writeAll(stderr, text);
 }
 
+void writeStandardErrorInHandler(std::string_view text) {
+  [[maybe_unused]] const auto written = ::write(STDERR_FILENO, text.data(), text.size());
+}
+
 bool isStandardErrorATerminal() {
-  return ::isatty(STDERR_FILENO) == 1;
+  const char* const type = std::getenv("TERM");
+  return ::isatty(STDERR_FILENO) == 1 && (type == nullptr || std::string_view(type) != "dumb");
+}
+
+std::size_t standardErrorColumns() {
+  ::winsize size{};
+  const bool isTold = ::ioctl(STDERR_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0;
+  return isTold ? size.ws_col : 80;
 }
 
 }  // namespace Orvane

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <cstddef>
 #include <string_view>
 #include <system_error>
 
@@ -10,15 +11,27 @@ namespace Orvane {
 /// was started without; such a stream fails when it is used. To be called first of all.
 void reserveStandardStreams();
 
-/// Makes a write to a closed pipe fail with an error rather than end the program without a word.
+/// Makes a write to a closed pipe fail with an error rather than end the program at once.
 void failOnClosedPipes();
+
+/// Whether a closed pipe ends programs: not where the program was started to ignore that.
+[[nodiscard]] bool closedPipesEnd();
+
+/// Ends the program as a write to a closed pipe does by itself. Returns the exit status for that
+/// where the signal is blocked.
+[[nodiscard]] int endByClosedPipe();
 
 /// Writes all of the text to the standard output, or says what went wrong.
 [[nodiscard]] std::error_code writeStandardOutput(std::string_view text);
 
 /// Writes the text to standard error; a failure there cannot be reported.
 void writeStandardError(std::string_view text);
+/// The same for signal handlers.
+void writeStandardErrorInHandler(std::string_view text);
 
+/// Whether lines on it can be written over.
 [[nodiscard]] bool isStandardErrorATerminal();
+/// How wide that terminal is now; 80 where it does not tell.
+[[nodiscard]] std::size_t standardErrorColumns();
 
 }  // namespace Orvane

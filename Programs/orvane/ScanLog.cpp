@@ -1,0 +1,38 @@
+// SPDX-License-Identifier: MIT
+#include <orvane/ScanLog.h>
+
+#include <Varnel/Logging/Logger.h>
+#include <Varnel/Platform/Values/URL.h>
+#include <orvane/Console.h>
+#include <orvane/ResultText.h>
+
+namespace Orvane {
+
+std::string reasonOf(const Loss& loss) {
+  switch (loss.kind) {
+    case Loss::Kind::vanished:
+      return "it vanished";
+    case Loss::Kind::changed:
+      return "it changed meanwhile";
+    case Loss::Kind::incomplete:
+      return "the rest of it cannot be read: " + loss.error.message();
+    case Loss::Kind::unreadable:
+      break;
+  }
+  return "it cannot be read: " + loss.error.message();
+}
+
+void ScanLog::leaveOut(const std::string& path, const Loss& loss) {
+  log("Left out: " + reasonOf(loss), Varnel::Platform::URL::fileURLWithPath(path));
+  if (++count_ <= maxNamed) first_.push_back({path, loss});
+}
+
+void ScanLog::complain(Console& console) const {
+  for (const LostPath& lost : first_)
+    console.complain("left out \"" + lost.path + "\": " + reasonOf(lost.loss));
+  if (count_ > maxNamed)
+    console.complain(counted(count_ - maxNamed, "more was", "more were") +
+                     " left out; the log names them all");
+}
+
+}  // namespace Orvane

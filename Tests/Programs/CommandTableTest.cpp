@@ -1,0 +1,175 @@
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include <fstream>
+#include <nlohmann/json.hpp>
+#include <set>
+#include <sstream>
+
+#include <Tests/Programs/OrvaneFixture.h>
+#include <orvane/Arguments.h>
+#include <orvane/CommandTable.h>
+#include <orvane/HelpText.h>
+
+namespace Orvane::Testing {
+namespace {
+
+using ::testing::AllOf;
+using ::testing::Contains;
+using ::testing::HasSubstr;
+using ::testing::Not;
+
+// What a parser might split, unquote or take for something else.
+std::vector<std::string> hostileValues() {
+  return {"[a,b]",    "++",
+          "-",        "--",
+          "-x",       "--json",
+          "--json=x", "a=b",
+          "x y",      "{'a', \"b\"}",
+          "%s\\n",    "",
+          "\xff\xfe", std::string(254, '\xe9') + "\n"};
+}
+
+TEST(Commands, GetTheirValuesUntouched) {
+  CommandTable table;
+  for (Command& command : table.commands) {
+    std::vector<std::string> taken;
+    const auto record = [&](const std::string& value) {
+      taken.push_back(value);
+      return Complaint();
+    };
+    command.operands.value.take = record;
+    for (Option& option : command.options) option.value.take = record;
+    const auto expect = [&](const std::vector<std::string>& arguments,
+                            const std::vector<std::string>& values) {
+      taken.clear();
+      EXPECT_EQ(takeArguments(command.options, command.operands, arguments).wrong, std::nullopt);
+      EXPECT_EQ(taken, values) << command.name;
+    };
+    for (const std::string& value : hostileValues()) {
+      for (const Option& option : command.options) {
+        if (option.value.name.empty()) continue;
+        expect({"--" + option.name, value}, {value});
+        expect({"--" + option.name + "=" + value}, {value});
+        if (option.letter == 0) continue;
+        expect({std::string("-") + option.letter, value}, {value});
+        if (!value.empty()) expect({std::string("-") + option.letter + value}, {value});
+      }
+      if (command.operands.max > 0) expect({"--", value}, {value});
+      if (command.operands.max > 2) expect({"a", "--", value, "--"}, {"a", value, "--"});
+      if (command.operands.max > 0 && !value.starts_with('-')) expect({value}, {value});
+    }
+  }
+}
+
+// Every name once, every text in 80 columns of ASCII.
+TEST(Commands, AreExplained) {
+  const CommandTable table;
+  for (const Command& command : table.commands) {
+    EXPECT_THAT(helpText(table), HasSubstr("\n  " + command.name + " "));
+    const std::string help = helpText(table, command.name);
+    std::multiset<std::string> names;
+    std::vector<Option> options = command.options;
+    options.insert(options.end(), table.options.begin(), table.options.end());
+    for (const Option& option : options) {
+      names.insert(option.name);
+      if (option.letter != 0) names.insert(std::string(1, option.letter));
+      EXPECT_THAT(help, HasSubstr(formsOf(option) + " "));
+    }
+    for (const std::string& name : names) EXPECT_EQ(names.count(name), 1u) << name;
+    for (const std::string& word : command.operands.value.words) EXPECT_THAT(help, HasSubstr(word));
+    std::istringstream lines(help + helpText(table));
+    for (std::string line; std::getline(lines, line);) {
+      EXPECT_LE(line.size(), 80u) << line;
+      EXPECT_THAT(line, Not(Contains(::testing::Truly([](char c) { return c < ' ' || c > '~'; }))));
+    }
+  }
+}
+
+TEST_F(Orvane, PrintsTheMembersThatItsHelpNames) {
+  folder.write("a", "same");
+  folder.write("b\xff", "same");
+  for (const Command& command : CommandTable().commands) {
+    if (command.fields.empty()) continue;
+    std::vector<std::string> arguments = {command.name, "--json"};
+    if (command.operands.max > 0) arguments.push_back(folder.path());
+    std::set<std::string> printed;
+    const auto object = nlohmann::json::parse(run(arguments).output);
+    for (const auto& [key, value] : object.items()) {
+      if (!value.is_array()) printed.insert(key);
+      for (const auto& each : value.is_array() ? value : nlohmann::json::array())
+        for (const auto& [inner, ignored] : each.items()) printed.insert(key + "[]." + inner);
+    }
+    std::set<std::string> named;
+    for (const JSONField& field : command.fields) named.insert(field.key);
+    EXPECT_EQ(printed, named) << command.name;
+  }
+}
+
+TEST_F(Orvane, ExplainsItself) {
+  const Outcome bare = run({});
+  EXPECT_EQ(bare.status, 2);
+  EXPECT_THAT(bare.errors, AllOf(HasSubstr("Usage: orvane scan"), HasSubstr("--help")));
+  EXPECT_EQ(run({"--help"}).output, run({"help"}).output);
+  EXPECT_EQ(run({"scan", "--help"}).output, run({"help", "scan"}).output);
+  EXPECT_EQ(run({"remind", "-h"}).output, run({"help", "remind"}).output);
+  EXPECT_EQ(run({"remind", "every", "-h"}).output, run({"help", "remind", "every"}).output);
+  const std::string page = read(VARNEL_DOCUMENTS "/orvane.md");
+  for (const ExitStatus& status : exitStatuses)
+    EXPECT_THAT(page, HasSubstr(std::string("| ") + status.numbers + " | " + status.meaning));
+  EXPECT_FALSE(hasLog());
+}
+
+TEST(Commands, AreInTheManualPage) {
+  const CommandTable table;
+  for (const char* name : {"manual", "completion"}) ASSERT_NE(table.find(name), nullptr);
+  const ScanFolder folder;
+  const std::string page = folder.path("page");
+  const auto shell = [](const std::string& command) {
+    return Varnel::Tests::outputOf("/bin/bash -c '" + command + "' 2>&1");
+  };
+  shell(ORVANE_PROGRAM " manual >" + page);
+  EXPECT_EQ(shell("LC_ALL=C.UTF-8 MANWIDTH=80 man --warnings -l " + page + " >" + page + ".txt"),
+            "");
+  // As man shows it, in one line.
+  const std::string text = shell("tr -s \"\\n \" \" \" <" + page + ".txt");
+  for (const Command& command : table.commands) {
+    EXPECT_THAT(text, HasSubstr(synopsis(command)));
+    for (const Option& option : command.options)
+      EXPECT_THAT(text, HasSubstr(formsOf(option) + " " + option.description));
+    for (const JSONField& field : command.fields) EXPECT_THAT(text, HasSubstr(field.key));
+  }
+  for (const ExitStatus& status : exitStatuses) EXPECT_THAT(text, HasSubstr(status.numbers));
+}
+
+TEST(Commands, AreCompleted) {
+  const struct {
+    const char* words;  ///< The last one is to be completed.
+    const char* completions;
+  } cases[] = {
+      {"sca", "scan"},
+      {"--ver", "--version,--verbose"},
+      {"remind \"\"", "every,tomorrow,status,listen"},
+      {"remind every once-in-t", "once-in-two-weeks,once-in-three-months"},
+      {"remind tomorrow --f", "--found"},
+      {"analytics consent y", "yes"},
+      {"scan --qos user-i", "user-initiated,user-interactive"},
+      {"scan -q b", "background"},
+      {"scan --js", "--json"},
+      {"scan /usr/incl", "/usr/include"},
+      {"sound pur", "purchase"},
+      {"menu x", ""},
+  };
+  for (const auto& [words, completions] : cases)
+    EXPECT_EQ(
+        Varnel::Tests::outputOf(
+            "/bin/bash -c 'source <(" ORVANE_PROGRAM " completion bash) && COMP_WORDS=(orvane " +
+            std::string(words) +
+            ") && COMP_CWORD=$((${#COMP_WORDS[@]} - 1)) && _orvane && IFS=, && printf %s "
+            "\"${COMPREPLY[*]}\"'"),
+        completions)
+        << words;
+}
+
+}  // namespace
+}  // namespace Orvane::Testing
