@@ -68,14 +68,23 @@ class OwnQueue final : public MainQueue {
   bool isCurrent() const override { return std::this_thread::get_id() == mainThread; }
 
   void run() override {
-    bool stops = std::exchange(stopsNextRun_, false);
+    bool stops = stopsAhead_ > 0;
+    if (stops) --stopsAhead_;
     running_.push_back(&stops);
     runWhile([&stops] { return !stops; });
     running_.pop_back();
   }
 
   void stop() override {
-    post([this] { (running_.empty() ? stopsNextRun_ : *running_.back()) = true; });
+    post([this] {
+      // A block may drain the queue, and so run several before a run looks at its end.
+      const auto innermost = std::find_if(running_.rbegin(), running_.rend(),
+                                          [](const bool* stops) { return !*stops; });
+      if (innermost == running_.rend())
+        ++stopsAhead_;
+      else
+        **innermost = true;
+    });
   }
 
   void runWhile(const std::function<bool()>& condition) override {
@@ -139,7 +148,7 @@ class OwnQueue final : public MainQueue {
   std::optional<Signal> signal_;  ///< Is set while there are blocks; none until it is asked for.
   // The members below belong to the main thread.
   std::vector<bool*> running_;  ///< Whether each run is to end, the innermost last.
-  bool stopsNextRun_ = false;
+  int stopsAhead_ = 0;          ///< How many runs to come end at once.
 };
 
 }  // namespace

@@ -73,11 +73,11 @@ class SessionBus;
 [[nodiscard]] std::unique_ptr<NotificationServer> makeNotificationServer(
     SystemLog& systemLog, const NotificationSource& source,
     std::chrono::milliseconds patience = std::chrono::seconds(10));
-/// The way to the session's notifier for the product with this base identifier, or to the deliverer
-/// of this process that `makeDeliverer` makes where there is none.
+/// The way to the session's notifier for the product with this base identifier and store, or to the
+/// deliverer of this process that `makeDeliverer` makes where there is none.
 using MakeDeliverer = std::function<std::unique_ptr<DelivererConnection>()>;
 [[nodiscard]] std::shared_ptr<DelivererConnection> makeNotifierConnection(
-    std::string baseIdentifier, MakeDeliverer makeDeliverer);
+    std::string baseIdentifier, std::string store, MakeDeliverer makeDeliverer);
 /// Starts applications by the desktop entries installed for the user. Part of the notifier alone.
 [[nodiscard]] std::unique_ptr<ApplicationLauncher> makeApplicationLauncher(
     std::shared_ptr<SessionBus> bus);

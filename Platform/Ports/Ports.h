@@ -35,8 +35,8 @@ class VolumeCatalog;
 class Workspace;
 
 /// One service of each kind. Assigning to a member puts another service in the place of that one;
-/// the others stay. The objects behind the references outlive all their users; those of the process
-/// are never destroyed.
+/// the others stay, and go on to use the services that they were made with. The objects behind the
+/// references outlive all their users; those of the process are never destroyed.
 ///
 ///     static auto& clock = *new MyClock();  // a host's own service among the system's
 ///     Ports ports = systemPorts();

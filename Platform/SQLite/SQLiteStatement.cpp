@@ -34,6 +34,11 @@ void SQLiteStatement::bind(int index, std::nullopt_t) {
   expectOK(::sqlite3_bind_null(statement_.get(), index));
 }
 
+// Not inline: where it is, GCC 12 sees numbers read that are not there.
+void SQLiteStatement::bind(int index, const std::optional<std::int64_t>& value) {
+  value ? bind(index, *value) : bind(index, std::nullopt);
+}
+
 void SQLiteStatement::bind(int index, SQLiteStatement& row, int column) {
   expectOK(::sqlite3_bind_value(statement_.get(), index,
                                 ::sqlite3_column_value(row.statement_.get(), column)));

@@ -39,6 +39,7 @@ class SQLiteStatement final {
   void bind(int index, std::string_view text);
   void bind(int index, Date date) { bind(index, std::int64_t{date.time_since_epoch().count()}); }
   void bind(int index, std::nullopt_t null);
+  void bind(int index, const std::optional<std::int64_t>& value);
   template <typename Value>
   void bind(int index, const std::optional<Value>& value) {
     value ? bind(index, *value) : bind(index, std::nullopt);

@@ -35,7 +35,8 @@ class FakeMainQueue final : public MainQueue {
   }
 
   void run() override {
-    runWhile([this] { return !std::exchange(stopped_, false); });
+    runWhile([this] { return stops_ == 0; });
+    --stops_;
   }
 
   void runWhile(const std::function<bool()>& condition) override {
@@ -58,7 +59,7 @@ class FakeMainQueue final : public MainQueue {
   }
 
   void stop() override {
-    post([this] { stopped_ = true; });
+    post([this] { ++stops_; });
   }
 
   bool drain() override {
@@ -89,7 +90,7 @@ class FakeMainQueue final : public MainQueue {
   std::mutex mutex_;  ///< Owns `blocks_`.
   std::condition_variable posted_;
   std::deque<Block> blocks_;
-  bool stopped_ = false;  ///< Main thread only.
+  int stops_ = 0;  ///< How many runs are to end. Main thread only.
 };
 
 }  // namespace Varnel::Platform::Testing

@@ -7,7 +7,6 @@
 #include <atomic>
 #include <cstdint>
 #include <cstring>
-#include <mutex>
 
 #include <Varnel/Platform/Ports/TimeZones.h>
 #include <Varnel/Platform/Text/LocaleLibrary.h>
@@ -62,17 +61,14 @@ struct DateFormatter::State {
       format = library->datePattern(pattern, locale, identifier, zone);
   }
 
-  [[nodiscard]] std::string compute(Date date) {
-    if (!format) return plainText(date, *zone);
-    const std::lock_guard lock(mutex);
-    return format->text(date);
+  [[nodiscard]] std::string compute(Date date) const {
+    return format ? format->text(date) : plainText(date, *zone);
   }
 
   const std::uint64_t identity = nextIdentity();
   const bool isCached;
   std::shared_ptr<const TimeZone> zone;
-  std::mutex mutex;  ///< Guards `format`.
-  std::unique_ptr<LocaleLibrary::DatePattern> format;
+  std::unique_ptr<const LocaleLibrary::DatePattern> format;
 };
 
 DateFormatter::DateFormatter(std::string_view pattern, std::string_view localeIdentifier,

@@ -19,12 +19,13 @@ class TimeZone;
 /// are ICU identifiers. Any thread.
 class LocaleLibrary {
  public:
-  /// Writes dates by a pattern. One thread at a time.
+  /// Writes dates by a pattern. Any thread, without a lock: a forked child writes dates too, and
+  /// would wait for ever for a thread that only its parent has.
   class DatePattern {
    public:
     virtual ~DatePattern() = default;
     /// In UTF-8.
-    [[nodiscard]] virtual std::string text(Date date) = 0;
+    [[nodiscard]] virtual std::string text(Date date) const = 0;
   };
 
   /// Counts by wall clocks, as in a zone whose offset never changes. Any thread.

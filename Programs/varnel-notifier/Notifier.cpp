@@ -1,17 +1,23 @@
 // SPDX-License-Identifier: MIT
 #include <varnel-notifier/Notifier.h>
 
+#include <fcntl.h>
 #include <malloc.h>
+#include <unistd.h>
 
 #include <algorithm>
+#include <array>
+#include <cstdint>
 #include <optional>
 #include <system_error>
 #include <utility>
 
 #include <Varnel/Platform/Generic/NotificationDeliverer.h>
+#include <Varnel/Platform/Generic/NotificationRows.h>
 #include <Varnel/Platform/Linux/Notifications/BusHosts.h>
 #include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
 #include <Varnel/Platform/Linux/Notifications/NotifierProtocol.h>
+#include <Varnel/Platform/POSIX/FileDescriptor.h>
 #include <Varnel/Platform/POSIX/UserFolders.h>
 #include <Varnel/Platform/Ports/ApplicationLauncher.h>
 #include <Varnel/Platform/Ports/Clock.h>
@@ -19,6 +25,7 @@
 #include <Varnel/Platform/Ports/NotificationServer.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
 #include <Varnel/Platform/Ports/WallClockTimer.h>
+#include <Varnel/Platform/SQLite/SQLiteFailure.h>
 
 namespace Varnel {
 
@@ -39,14 +46,27 @@ std::string actionOf(const NotificationActivation& activation) {
   return name;
 }
 
+// Other programs have files of this name, too: what does not call itself a store is not touched,
+// not even to find it damaged. Its application's name stands at a fixed place of any database.
+bool isStore(const fs::path& file) {
+  std::error_code error;
+  if (!fs::is_regular_file(fs::symlink_status(file, error))) return false;
+  constexpr off_t place = 68;
+  std::array<std::uint8_t, 4> name{};
+  const POSIX::FileDescriptor head(::open(file.c_str(), O_RDONLY | O_NOFOLLOW | O_CLOEXEC));
+  if (::pread(head.get(), name.data(), name.size(), place) != ssize_t{name.size()}) return false;
+  std::uint32_t number = 0;
+  for (const std::uint8_t byte : name) number = number << 8 | byte;
+  return number == static_cast<std::uint32_t>(notificationFormat().applicationID);
+}
+
 }  // namespace
 
 // A product's store and everything that serves it alone. Other processes change the store, also
 // those that are killed before they can tell.
 class Notifier::Product final {
  public:
-  // The base identifier counts until the store tells it.
-  Product(Notifier& notifier, const std::string& baseIdentifier, const fs::path& store)
+  Product(Notifier& notifier, const fs::path& store)
       : ports_(notifier.ports_),
         launcher_(*notifier.launcher_),
         hosts_(notifier.bus_, [this](const auto& activation) { launch(activation); }),
@@ -56,8 +76,10 @@ class Notifier::Product final {
                     ports_.privateFiles, ports_.systemLog, *server_, *timer_},
                    store.string(), Migrating::never, hosts_),
         watch_(store.parent_path(), store.filename(), [this] { deliverer_.recheck(); }) {
+    // The folder has the name of the base identifier, as far as names of files can.
     const auto source = deliverer_.source();
-    hosts_.setProduct(source && *source ? (*source)->identifier : baseIdentifier);
+    hosts_.setProduct(source && *source ? (*source)->identifier
+                                        : store.parent_path().filename().string());
     deliverer_.setDuty(NotificationDeliverer::Duty::everything);
   }
 
@@ -74,7 +96,7 @@ class Notifier::Product final {
         log.write("A clicked notification does not reach its application: " +
                   error->localizedDescription());
     };
-    complain(deliverer_.keepLaunch(activation));
+    complain(keep(activation));
     const auto source = deliverer_.source();
     if (!source || !*source) return;
     ++*launches_;
@@ -85,6 +107,17 @@ class Notifier::Product final {
                        complain(error);
                        --*launches;
                      });
+  }
+
+  // Nobody clicks a second time, so others may take longer with the store than elsewhere.
+  std::optional<PlatformError> keep(const NotificationActivation& activation) {
+    constexpr int maxTries = 50;
+    std::optional<PlatformError> error;
+    for (int i = 0; i < maxTries; ++i) {
+      error = deliverer_.keepLaunch(activation);
+      if (!error || meaningOf(*error) != SQLiteFailure::busy) break;
+    }
+    return error;
   }
 
   const NotificationPorts ports_;
@@ -162,23 +195,22 @@ void Notifier::sleepWhile(const std::function<bool()>& condition) {
   }
 }
 
-Notifier::Product* Notifier::product(const std::string& baseIdentifier, const fs::path& store) {
+// Links to a folder lead to one store, which one product here is for.
+Notifier::Product* Notifier::product(const fs::path& path) {
+  std::error_code error;
+  const fs::path store = fs::weakly_canonical(path.parent_path(), error) / path.filename();
   if (const auto known = products_.find(store); known != products_.end())
     return known->second.get();
-  std::error_code error;
-  if (!fs::is_regular_file(fs::symlink_status(store, error))) return nullptr;
-  return (products_[store] = std::make_unique<Product>(*this, baseIdentifier, store)).get();
+  if (!isStore(store)) return nullptr;
+  return (products_[store] = std::make_unique<Product>(*this, store)).get();
 }
 
-// The folder of a product's store has the name of the base identifier, as far as names of files
-// can.
 void Notifier::findProducts() {
-  for (const fs::path& store : POSIX::notificationStores())
-    product(store.parent_path().filename().string(), store);
+  for (const fs::path& store : POSIX::notificationStores()) product(store);
 }
 
 void Notifier::recheck() {
-  for (const auto& [identifier, product] : products_) product->deliverer().recheck();
+  for (const auto& [store, product] : products_) product->deliverer().recheck();
 }
 
 bool Notifier::isIdle() const {
@@ -188,9 +220,9 @@ bool Notifier::isIdle() const {
 
 // The one method is `Changed`.
 void Notifier::receive(GVariant* arguments, GDBusMethodInvocation* call) {
-  const char* identifier = nullptr;
-  g_variant_get_child(arguments, 0, "&s", &identifier);
-  Product* const concerned = product(identifier, POSIX::notificationStore(identifier));
+  const char* store = nullptr;
+  g_variant_get_child(arguments, 0, "^&ay", &store);
+  Product* const concerned = product(store);
   if (concerned) concerned->deliverer().recheck();
   const bool stays = concerned && !concerned->isIdle();
   g_dbus_method_invocation_return_value(call, g_variant_new("(b)", static_cast<gboolean>(stays)));

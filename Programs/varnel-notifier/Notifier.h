@@ -44,7 +44,7 @@ class Notifier final {
   class Product;
 
   /// The product with this store, if there is one.
-  Product* product(const std::string& baseIdentifier, const std::filesystem::path& store);
+  Product* product(const std::filesystem::path& path);
   void findProducts();
   void recheck();
   [[nodiscard]] bool isIdle() const;

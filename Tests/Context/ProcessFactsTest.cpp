@@ -111,18 +111,5 @@ TEST_F(ProcessFactsTest, FakeTrashIsMadeOrSilentlyNot) {
   EXPECT_TRUE(blocked.fakeTrashURL().path().starts_with(user.home));
 }
 
-TEST_F(ProcessFactsTest, AvailabilityIsReadForTheRunningChannelAlone) {
-  const auto dictionary = Basalt::parseJSON(R"({"isAvailableInSite": false})");
-  EXPECT_FALSE(siteFacts().extractIsAvailable(dictionary, true));
-  EXPECT_TRUE(facts({.isAppStoreVersion = true}).extractIsAvailable(dictionary, true));
-}
-
-TEST_F(ProcessFactsTest, NamesTheSiblingsInstalled) {
-  for (const char* identifier : {"com.quennel.site.Orvane2", "com.quennel.Orvane2"})
-    workspace.applications.emplace(identifier, URL::fileURLWithPath("/opt/app"));
-  EXPECT_EQ(siteFacts().findOtherInstalledTargetBundleIDs(),
-            std::vector<std::string>{"com.quennel.Orvane2"});
-}
-
 }  // namespace
 }  // namespace Varnel

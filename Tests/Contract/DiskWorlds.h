@@ -11,9 +11,8 @@
 namespace Varnel::Platform::Contract {
 
 /// A machine without any disks.
-class DeviceRegistryWorld : public World {
+class DeviceRegistryWorld : public WorldOf<DeviceRegistry> {
  public:
-  virtual DeviceRegistry& registry() = 0;
   /// A rotational disk "sda" or "sdb" with one partition, "sda1" or "sdb1".
   virtual void plug(const std::string& name, const std::string& serial) = 0;
   virtual void unplug(const std::string& name) = 0;
@@ -23,9 +22,8 @@ class DeviceRegistryWorld : public World {
 using DeviceRegistryContract = Suite<DeviceRegistryWorld>;
 
 /// One disk, which may be mounted anywhere, also in several places.
-class DiskArbitrationWorld : public World {
+class DiskArbitrationWorld : public WorldOf<DiskArbitration> {
  public:
-  virtual DiskArbitration& disks() = 0;
   virtual std::string disk() = 0;
   virtual URL mount(const std::string& name) = 0;
   virtual void unmount(const URL& folder) = 0;
@@ -35,9 +33,8 @@ class DiskArbitrationWorld : public World {
 using DiskArbitrationContract = Suite<DiskArbitrationWorld>;
 
 /// A machine with a volume at the root.
-class VolumeCatalogWorld : public World {
+class VolumeCatalogWorld : public WorldOf<VolumeCatalog> {
  public:
-  virtual VolumeCatalog& catalog() = 0;
   /// The path of an empty folder of this name.
   virtual std::string folder(const std::string& name) = 0;
   virtual void mount(const URL& folder) = 0;

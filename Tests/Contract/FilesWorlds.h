@@ -11,9 +11,8 @@
 namespace Varnel::Platform::Contract {
 
 /// A disk with a place for a file that does not exist yet.
-class AppendFilesWorld : public World {
+class AppendFilesWorld : public WorldOf<AppendFiles> {
  public:
-  virtual AppendFiles& files() = 0;
   virtual std::string path() = 0;
   /// What the file there holds.
   virtual std::string text() = 0;
@@ -24,9 +23,8 @@ class AppendFilesWorld : public World {
 using AppendFilesContract = Suite<AppendFilesWorld>;
 
 /// One file, whose attributes a test sets.
-class ExtendedAttributesWorld : public World {
+class ExtendedAttributesWorld : public WorldOf<ExtendedAttributes> {
  public:
-  virtual ExtendedAttributes& attributes() = 0;
   virtual std::string path() = 0;
   virtual void set(const std::string& name, const std::string& value) = 0;
   /// A path to nothing, and a file that cannot have attributes.
@@ -36,25 +34,19 @@ class ExtendedAttributesWorld : public World {
 using ExtendedAttributesContract = Suite<ExtendedAttributesWorld>;
 
 /// The suite makes its files itself: a database opens them by their path.
-class PrivateFilesWorld : public World {
- public:
-  virtual PrivateFiles& files() = 0;
-};
-using PrivateFilesContract = Suite<PrivateFilesWorld>;
+using PrivateFilesContract = Suite<WorldOf<PrivateFiles>>;
 
 /// A file, or a folder, that the process may read, and one that it may not.
-class SecurityScopeWorld : public World {
+class SecurityScopeWorld : public WorldOf<SecurityScope> {
  public:
-  virtual SecurityScope& scope() = 0;
   virtual URL readable(bool isFolder) = 0;
   virtual URL forbidden() = 0;
 };
 using SecurityScopeContract = Suite<SecurityScopeWorld>;
 
 /// A disk with a trash, and a folder on it.
-class TrashWorld : public World {
+class TrashWorld : public WorldOf<Trash> {
  public:
-  virtual Trash& trash() = 0;
   virtual std::string folder() = 0;
   /// Makes a file, and its folder, with so many bytes; each is another than all before.
   virtual void write(const std::string& path, std::size_t size) = 0;

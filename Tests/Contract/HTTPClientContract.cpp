@@ -28,7 +28,7 @@ TEST_P(HTTPClientContract, PostsTheWholeBodyAndTellsTheServersAnswer) {
               {std::string(50'000, 'x'), 302, {}},
               {"last", 201, {}}};
   for (const auto& row : rows) {
-    const auto answer = world->client().post(postTo(url, row.body), {});
+    const auto answer = world->port().post(postTo(url, row.body), {});
     EXPECT_EQ(world->nextBody(), row.body);
     EXPECT_EQ(answer ? answer->status : 0, row.status);
     EXPECT_EQ(answer ? answer->retryAfter : std::nullopt, row.pause);
@@ -40,14 +40,14 @@ TEST_P(HTTPClientContract, SendsNothingWhereItMayNotOrWhenItIsStopped) {
   const std::string url = world->serve({"200"});
   HTTPPost secure = postTo(url);
   secure.allowsPlainHTTP = false;
-  EXPECT_FALSE(world->client().post(secure, {}));
+  EXPECT_FALSE(world->port().post(secure, {}));
   for (const std::string& wrong : {""s, "no url"s, "https:///batch"s, "ftp" + url.substr(4),
                                    "file:///etc/hostname"s, url + '\0'})
-    EXPECT_FALSE(world->client().post(postTo(wrong), {})) << wrong;
+    EXPECT_FALSE(world->port().post(postTo(wrong), {})) << wrong;
   std::stop_source stop;
   stop.request_stop();
-  EXPECT_FALSE(world->client().post(postTo(url), stop.get_token()));
-  EXPECT_TRUE(world->client().post(postTo(url, "only"), {}));
+  EXPECT_FALSE(world->port().post(postTo(url), stop.get_token()));
+  EXPECT_TRUE(world->port().post(postTo(url, "only"), {}));
   EXPECT_EQ(world->nextBody(), "only");
 }
 
@@ -58,22 +58,21 @@ TEST_P(HTTPClientContract, StopsAtOnceAndHoldsNobodyUp) {
     world->waitForHanging();
     std::stop_source other;
     other.request_stop();
-    EXPECT_FALSE(world->client().post(postTo(url), other.get_token()));
+    EXPECT_FALSE(world->port().post(postTo(url), other.get_token()));
     stop.request_stop();
   });
-  EXPECT_FALSE(world->client().post(postTo(url), stop.get_token()));
+  EXPECT_FALSE(world->port().post(postTo(url), stop.get_token()));
 }
 
-class FakeWorld final : public HTTPClientWorld {
+class FakeHTTPClientWorld final : public FakeColumn<HTTPClientWorld, Testing::FakeHTTPClient> {
  public:
-  HTTPClient& client() override { return client_; }
   std::string serve(const std::vector<std::string>& answers) override {
-    if (answers.front() == "hang") client_.faults->plan(Testing::Fault::delays, 1);
-    client_.setServer([this, answers](const HTTPPost&) { return answer(answers[answered_++]); });
+    if (answers.front() == "hang") port_.faults->plan(Testing::Fault::delays, 1);
+    port_.setServer([this, answers](const HTTPPost&) { return answer(answers[answered_++]); });
     return "http://127.0.0.1/batch";
   }
-  std::string nextBody() override { return client_.posts()[taken_++].body; }
-  void waitForHanging() override { client_.faults->waitForCalls(1); }
+  std::string nextBody() override { return port_.posts()[taken_++].body; }
+  void waitForHanging() override { port_.faults->waitForCalls(1); }
 
  private:
   static Testing::FakeHTTPClient::Answer answer(const std::string& text) {
@@ -84,11 +83,10 @@ class FakeWorld final : public HTTPClientWorld {
     return response;
   }
 
-  Testing::FakeHTTPClient client_;
   std::size_t answered_ = 0;
   std::size_t taken_ = 0;
 };
-INSTANTIATE_TEST_SUITE_P(Fake, HTTPClientContract, HTTPClientContract::on<FakeWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, HTTPClientContract, on<FakeHTTPClientWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -7,9 +7,8 @@
 namespace Varnel::Platform::Contract {
 
 /// A web server on this machine.
-class HTTPClientWorld : public World {
+class HTTPClientWorld : public WorldOf<HTTPClient> {
  public:
-  virtual HTTPClient& client() = 0;
   /// Where the server listens, with plain http. It answers each request with the next of these: a
   /// status, "503/SECONDS" to ask for a pause, "302>PLACE", "cut" to give no answer, or "hang".
   virtual std::string serve(const std::vector<std::string>& answers) = 0;

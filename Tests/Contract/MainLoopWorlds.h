@@ -7,31 +7,23 @@
 #include <Varnel/Platform/Ports/Application.h>
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
+#include <Varnel/Platform/Ports/SoundPlayer.h>
 #include <Varnel/Platform/Ports/WallClockTimer.h>
 
 namespace Varnel::Platform::Contract {
 
 /// An application that has just started.
-class ApplicationWorld : public World {
- public:
-  virtual Platform::Application& application() = 0;
-};
-using ApplicationContract = Suite<ApplicationWorld>;
+using ApplicationContract = Suite<WorldOf<Application>>;
 
-class ClockWorld : public World {
+class ClockWorld : public WorldOf<Clock> {
  public:
-  virtual Clock& clock() = 0;
   /// Lets some time pass that the clock can tell.
   virtual void pass() = 0;
 };
 using ClockContract = Suite<ClockWorld>;
 
 /// A queue whose main thread is that of the test.
-class MainQueueWorld : public World {
- public:
-  virtual MainQueue& queue() = 0;
-};
-using MainQueueContract = Suite<MainQueueWorld>;
+using MainQueueContract = Suite<WorldOf<MainQueue>>;
 
 class WallClockTimerWorld : public World {
  public:
@@ -42,5 +34,17 @@ class WallClockTimerWorld : public World {
   virtual void passUntil(const std::function<bool()>& condition) = 0;
 };
 using WallClockTimerContract = Suite<WallClockTimerWorld>;
+
+class SoundPlayerWorld : public WorldOf<SoundPlayer> {
+ public:
+  /// A short sound, and one of which only the beginning is sound.
+  virtual std::string sound() = 0;
+  virtual std::string damagedSound() = 0;
+  virtual std::string noSound() = 0;
+  /// Lets sounds play, and the main queue run, until the condition holds.
+  virtual void playUntil(const std::function<bool()>& condition) = 0;
+};
+
+using SoundPlayerContract = Suite<SoundPlayerWorld>;
 
 }  // namespace Varnel::Platform::Contract

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/NotificationServerContract.h>
+#include <Tests/Contract/NotificationWorlds.h>
 
 #include <gmock/gmock.h>
 
@@ -33,9 +33,10 @@ struct Listener final : NotificationServer::Observer {
   void serverAppeared() override { heard.emplace_back("appeared"); }
 };
 
-// What the listener has heard when nothing is under way any more.
-std::vector<std::string> heardBy(Listener& listener, NotificationServerWorld& world) {
-  world.workUntil([&] { return !world.server().isBusy(); });
+// What the listener has heard, so much at least, when nothing is under way any more.
+std::vector<std::string> heardBy(Listener& listener, NotificationServerWorld& world,
+                                 std::size_t count = 0) {
+  world.workUntil([&] { return listener.heard.size() >= count && !world.port().isBusy(); });
   return std::exchange(listener.heard, {});
 }
 
@@ -52,7 +53,7 @@ std::vector<std::string> titles(NotificationServerWorld& world) {
 }
 
 TEST_P(NotificationServerContract, ShowsABannerAndTellsLaterHowItEnded) {
-  NotificationServer& server = world->server();
+  NotificationServer& server = world->port();
   const auto listener = listenTo(server);
   const Banner banner{.title = "A", .text = "text", .actionTitle = "Go", .dismissTitle = "Later"};
   const std::pair<void (NotificationServerWorld::*)(const std::string&), const char*> ends[] = {
@@ -65,8 +66,7 @@ TEST_P(NotificationServerContract, ShowsABannerAndTellsLaterHowItEnded) {
     EXPECT_THAT(heardBy(*listener, *world), ElementsAre("shown 1"));
     EXPECT_THAT(world->banners(), ElementsAre(banner));
     (*world.*end)("A");
-    world->workUntil([&] { return !listener->heard.empty(); });
-    EXPECT_THAT(heardBy(*listener, *world), ElementsAre(name));
+    EXPECT_THAT(heardBy(*listener, *world, 1), ElementsAre(name));
     EXPECT_THAT(world->banners(), IsEmpty());
     // The banner is not known any more.
     server.close("1", listener->references["1"]);
@@ -76,29 +76,26 @@ TEST_P(NotificationServerContract, ShowsABannerAndTellsLaterHowItEnded) {
 }
 
 TEST_P(NotificationServerContract, AnExpiredBannerIsGoneAndMayYetBeClickedOnce) {
-  const auto listener = listenTo(world->server());
-  world->server().show("1", {.title = "A"}, {});
+  const auto listener = listenTo(world->port());
+  world->port().show("1", {.title = "A"}, {});
   EXPECT_THAT(heardBy(*listener, *world), ElementsAre("shown 1"));
   world->expire("A");
-  world->workUntil([&] { return !listener->heard.empty(); });
-  EXPECT_THAT(heardBy(*listener, *world), ElementsAre("gone 1"));
+  EXPECT_THAT(heardBy(*listener, *world, 1), ElementsAre("gone 1"));
   EXPECT_THAT(world->banners(), IsEmpty());
   for (int i = 0; i < 2; ++i) world->activate("A");
-  world->workUntil([&] { return !listener->heard.empty(); });
-  EXPECT_THAT(heardBy(*listener, *world), ElementsAre("clicked 1"));
+  EXPECT_THAT(heardBy(*listener, *world, 1), ElementsAre("clicked 1"));
 
-  world->server().show("2", {.title = "B"}, {});
+  world->port().show("2", {.title = "B"}, {});
   EXPECT_THAT(heardBy(*listener, *world), ElementsAre("shown 2"));
   world->expire("B");
   world->workUntil([&] { return !listener->heard.empty(); });
   world->endServer();
   world->startServer();
-  world->workUntil([&] { return listener->heard.size() == 2; });
-  EXPECT_THAT(heardBy(*listener, *world), ElementsAre("gone 2", "appeared"));
+  EXPECT_THAT(heardBy(*listener, *world, 2), ElementsAre("gone 2", "appeared"));
 }
 
 TEST_P(NotificationServerContract, ABannerThatIsClosedIsGoneOnceAndNothingElse) {
-  NotificationServer& server = world->server();
+  NotificationServer& server = world->port();
   const auto listener = listenTo(server);
   server.show("1", {.title = "A"}, {});
   server.show("2", {.title = "B"}, {});
@@ -118,7 +115,7 @@ TEST_P(NotificationServerContract, ABannerThatIsClosedIsGoneOnceAndNothingElse) 
 }
 
 TEST_P(NotificationServerContract, ABannerTakesThePlaceOfAnother) {
-  NotificationServer& server = world->server();
+  NotificationServer& server = world->port();
   const auto listener = listenTo(server);
   server.show("1", {.title = "A"}, {});
   EXPECT_THAT(heardBy(*listener, *world), ElementsAre("shown 1"));
@@ -133,19 +130,17 @@ TEST_P(NotificationServerContract, ABannerTakesThePlaceOfAnother) {
     EXPECT_THAT(heardBy(*listener, *world), ElementsAre("gone 3"));
   }
   world->dismiss("B");
-  world->workUntil([&] { return !listener->heard.empty(); });
-  EXPECT_THAT(heardBy(*listener, *world), ElementsAre("dismissed 2"));
+  EXPECT_THAT(heardBy(*listener, *world, 1), ElementsAre("dismissed 2"));
 }
 
 TEST_P(NotificationServerContract, ItsEndTakesTheBannersAndFailsWhatItHasNotAnswered) {
-  NotificationServer& server = world->server();
+  NotificationServer& server = world->port();
   const auto listener = listenTo(server);
   server.show("1", {.title = "A"}, {});
   EXPECT_THAT(heardBy(*listener, *world), ElementsAre("shown 1"));
   server.show("2", {.title = "B"}, {});
   world->endServer();
-  world->workUntil([&] { return listener->heard.size() == 2; });
-  EXPECT_THAT(heardBy(*listener, *world), testing::UnorderedElementsAre("gone 1", "failed 2"));
+  EXPECT_THAT(heardBy(*listener, *world, 2), testing::UnorderedElementsAre("gone 1", "failed 2"));
 
   // And while there is none.
   server.show("3", {.title = "C"}, {});
@@ -153,8 +148,7 @@ TEST_P(NotificationServerContract, ItsEndTakesTheBannersAndFailsWhatItHasNotAnsw
   server.close("1", listener->references["1"]);
   EXPECT_THAT(heardBy(*listener, *world), ElementsAre("gone 1"));
   world->startServer();
-  world->workUntil([&] { return !listener->heard.empty(); });
-  EXPECT_THAT(heardBy(*listener, *world), ElementsAre("appeared"));
+  EXPECT_THAT(heardBy(*listener, *world, 1), ElementsAre("appeared"));
   server.show("4", {.title = "D"}, listener->references["1"]);
   EXPECT_THAT(heardBy(*listener, *world), ElementsAre("shown 4"));
   EXPECT_THAT(titles(*world), ElementsAre("D"));
@@ -164,9 +158,9 @@ TEST_P(NotificationServerContract, TellsWhatStandsInTheWayAlsoWithoutAnObserver)
   std::vector<bool> obstacles;
   const auto ask = [&] {
     const std::size_t before = obstacles.size();
-    world->server().check([&](const auto& obstacle) { obstacles.push_back(obstacle.has_value()); });
+    world->port().check([&](const auto& obstacle) { obstacles.push_back(obstacle.has_value()); });
     EXPECT_EQ(obstacles.size(), before) << "never within the call";
-    world->workUntil([&] { return !world->server().isBusy(); });
+    world->workUntil([&] { return !world->port().isBusy(); });
   };
   ask();
   world->endServer();
@@ -176,30 +170,25 @@ TEST_P(NotificationServerContract, TellsWhatStandsInTheWayAlsoWithoutAnObserver)
   EXPECT_THAT(obstacles, ElementsAre(false, true, false));
 }
 
-class FakeWorld final : public NotificationServerWorld {
+class FakeNotificationServerWorld final
+    : public FakeColumn<NotificationServerWorld, Testing::FakeNotificationServer> {
  public:
-  NotificationServer& server() override { return server_; }
   std::vector<Banner> banners() override {
     std::vector<Banner> banners;
-    for (const auto& [title, banner] : server_.banners()) banners.push_back(banner);
+    for (const auto& [title, banner] : port_.banners()) banners.push_back(banner);
     return banners;
   }
-  void activate(const std::string& title) override { server_.activate(title); }
-  void dismiss(const std::string& title) override { server_.dismiss(title); }
-  void expire(const std::string& title) override { server_.expire(title); }
-  void endServer() override { server_.disappear(); }
-  void startServer() override { server_.appear(); }
+  void activate(const std::string& title) override { port_.activate(title); }
+  void dismiss(const std::string& title) override { port_.dismiss(title); }
+  void expire(const std::string& title) override { port_.expire(title); }
+  void endServer() override { port_.disappear(); }
+  void startServer() override { port_.appear(); }
   void workUntil(const std::function<bool()>& condition) override {
-    server_.report();
+    port_.report();
     EXPECT_TRUE(condition());
   }
-
- private:
-  Testing::FakeNotificationServer server_;
 };
-
-INSTANTIATE_TEST_SUITE_P(Fake, NotificationServerContract,
-                         NotificationServerContract::on<FakeWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, NotificationServerContract, on<FakeNotificationServerWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

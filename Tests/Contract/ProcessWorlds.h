@@ -10,22 +10,20 @@
 
 namespace Varnel::Platform::Contract {
 
-class ProcessInfoWorld : public World {
+class ProcessInfoWorld : public WorldOf<ProcessInfo> {
  public:
-  virtual ProcessInfo& process() = 0;
   virtual void setEnvironment(const std::string& name, const std::string& value) = 0;
 };
 using ProcessInfoContract = Suite<ProcessInfoWorld>;
 
 /// A machine with a few programs.
-class ProcessLauncherWorld : public World {
+class ProcessLauncherWorld : public WorldOf<ProcessLauncher> {
  public:
   struct Program {
     std::string path;
     std::vector<std::string> arguments;
   };
 
-  virtual ProcessLauncher& launcher() = 0;
   virtual Program thatPrints(const std::string& text) = 0;
   /// Ends only when somebody ends it.
   virtual Program thatWaits() = 0;
@@ -33,23 +31,17 @@ class ProcessLauncherWorld : public World {
 };
 using ProcessLauncherContract = Suite<ProcessLauncherWorld>;
 
-class ReadingPriorityWorld : public World {
- public:
-  virtual ReadingPriority& priority() = 0;
-};
-using ReadingPriorityContract = Suite<ReadingPriorityWorld>;
+using ReadingPriorityContract = Suite<WorldOf<ReadingPriority>>;
 
-class StandardOutputWorld : public World {
+class StandardOutputWorld : public WorldOf<StandardOutput> {
  public:
-  virtual StandardOutput& output() = 0;
   /// All that was printed. Nothing is printed after it.
   virtual std::string printed() = 0;
 };
 using StandardOutputContract = Suite<StandardOutputWorld>;
 
-class SystemLogWorld : public World {
+class SystemLogWorld : public WorldOf<SystemLog> {
  public:
-  virtual SystemLog& log() = 0;
   /// All that the log has been given, each line ended by a line feed.
   virtual std::string text() = 0;
 };

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/SoundPlayerContract.h>
+#include <Tests/Contract/MainLoopWorlds.h>
 
 #include <gmock/gmock.h>
 
@@ -25,14 +25,14 @@ struct Listener final : SoundDelegate {
 };
 
 TEST_P(SoundPlayerContract, RefusesWhatDoesNotBeginLikeASound) {
-  EXPECT_EQ(world->player().load(""), nullptr);
-  EXPECT_EQ(world->player().load(world->noSound()), nullptr);
-  EXPECT_EQ(world->player().missingPart(), std::nullopt);
+  EXPECT_EQ(world->port().load(""), nullptr);
+  EXPECT_EQ(world->port().load(world->noSound()), nullptr);
+  EXPECT_EQ(world->port().missingPart(), std::nullopt);
 }
 
 TEST_P(SoundPlayerContract, EachPlayEndsOnceAndLater) {
   const auto listener = std::make_shared<Listener>();
-  const auto sound = world->player().load(world->sound());
+  const auto sound = world->port().load(world->sound());
   EXPECT_FALSE(sound->isPlaying());
   sound->setDelegate(listener);
   sound->play();
@@ -49,7 +49,7 @@ TEST_P(SoundPlayerContract, EachPlayEndsOnceAndLater) {
 TEST_P(SoundPlayerContract, NothingIsHeardOfASoundThatWasStoppedOrDropped) {
   const auto listener = std::make_shared<Listener>();
   const auto load = [&] {
-    auto sound = world->player().load(world->sound());
+    auto sound = world->port().load(world->sound());
     sound->setDelegate(listener);
     sound->play();
     return sound;
@@ -69,7 +69,7 @@ TEST_P(SoundPlayerContract, NothingIsHeardOfASoundThatWasStoppedOrDropped) {
 
 TEST_P(SoundPlayerContract, ADamagedSoundEndsUnfinished) {
   const auto listener = std::make_shared<Listener>();
-  const auto sound = world->player().load(world->damagedSound());
+  const auto sound = world->port().load(world->damagedSound());
   ASSERT_NE(sound, nullptr);
   sound->setDelegate(listener);
   sound->play();
@@ -81,7 +81,7 @@ TEST_P(SoundPlayerContract, ADamagedSoundEndsUnfinished) {
 TEST_P(SoundPlayerContract, TheDelegateOfTheEndIsToldIfItIsStillThere) {
   const auto listener = std::make_shared<Listener>();
   auto gone = std::make_shared<Listener>();
-  const auto sound = world->player().load(world->sound());
+  const auto sound = world->port().load(world->sound());
   sound->setDelegate(gone);
   sound->play();
   sound->setDelegate(listener);
@@ -95,22 +95,17 @@ TEST_P(SoundPlayerContract, TheDelegateOfTheEndIsToldIfItIsStillThere) {
   EXPECT_EQ(listener->ends.size(), 1u);
 }
 
-class FakeWorld final : public SoundPlayerWorld {
+class FakeSoundPlayerWorld final : public FakeColumn<SoundPlayerWorld, Testing::FakeSoundPlayer> {
  public:
-  SoundPlayer& player() override { return player_; }
   std::string sound() override { return "sound"; }
   std::string damagedSound() override { return "damaged"; }
   std::string noSound() override { return "broken"; }
   void playUntil(const std::function<bool()>& condition) override {
     while (!condition())
-      for (const auto& sound : player_.sounds) sound->end(sound->bytes != damagedSound());
+      for (const auto& sound : port_.sounds) sound->end(sound->bytes != damagedSound());
   }
-
- private:
-  Testing::FakeSoundPlayer player_;
 };
-
-INSTANTIATE_TEST_SUITE_P(Fake, SoundPlayerContract, SoundPlayerContract::on<FakeWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, SoundPlayerContract, on<FakeSoundPlayerWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

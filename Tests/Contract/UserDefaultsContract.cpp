@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/UserDefaultsContract.h>
+#include <Tests/Contract/UserWorlds.h>
 
 #include <filesystem>
 #include <limits>
@@ -15,7 +15,7 @@ using namespace std::string_literals;
 constexpr const char* identifier = "com.example.App";
 
 TEST_P(UserDefaultsContract, KeepsEveryValueForAllProcesses) {
-  UserDefaults& defaults = world->storage().userDefaults(identifier);
+  UserDefaults& defaults = world->port().userDefaults(identifier);
   const UserDefaults& another = world->storageOfAnother().userDefaults(identifier);
   int row = 0;
   for (const std::string& text :
@@ -68,7 +68,7 @@ TEST_P(UserDefaultsContract, ReadsAValueAsEachTypeThatItSpells) {
       {"yes"s, "yes", {}, {}, {}},
       {""s, "", {}, {}, {}},
   };
-  UserDefaults& defaults = world->storage().userDefaults(identifier);
+  UserDefaults& defaults = world->port().userDefaults(identifier);
   for (const auto& row : rows) {
     EXPECT_EQ(defaults.set("key", row.value), std::nullopt);
     EXPECT_EQ(defaults.text("key"), row.text);
@@ -79,7 +79,7 @@ TEST_P(UserDefaultsContract, ReadsAValueAsEachTypeThatItSpells) {
 }
 
 TEST_P(UserDefaultsContract, RefusesWhatItCannotKeepAndLosesNothing) {
-  UserDefaults& defaults = world->storage().userDefaults(identifier);
+  UserDefaults& defaults = world->port().userDefaults(identifier);
   const auto isRefused = [](const std::optional<PlatformError>& error, std::errc reason) {
     return error && error->code() == static_cast<int>(reason);
   };
@@ -93,12 +93,14 @@ TEST_P(UserDefaultsContract, RefusesWhatItCannotKeepAndLosesNothing) {
     EXPECT_TRUE(isRefused(defaults.set("key", wrong), std::errc::invalid_argument));
   EXPECT_TRUE(isRefused(defaults.set("key", std::string(2 << 20, 'x')), std::errc::file_too_large));
   EXPECT_EQ(defaults.text("key"), "kept");
+  for (int i = 0; i < 2; ++i)
+    EXPECT_EQ(defaults.set("key", std::string(600'000, 'x')), std::nullopt) << "in its own place";
   EXPECT_EQ(defaults.set("key", "new"s), std::nullopt);
   EXPECT_EQ(defaults.text("key"), "new");
 }
 
 TEST_P(UserDefaultsContract, EachIdentifierHasItsOwnBelowTheUsersFolders) {
-  ApplicationStorage& storage = world->storage();
+  ApplicationStorage& storage = world->port();
   UserDefaults& one = storage.userDefaults("com.a.One");
   EXPECT_EQ(&storage.userDefaults("com.a.One"), &one);
   EXPECT_EQ(one.set("key", true), std::nullopt);
@@ -118,15 +120,15 @@ TEST_P(UserDefaultsContract, EachIdentifierHasItsOwnBelowTheUsersFolders) {
   }
 }
 
-class FakeWorld final : public UserDefaultsWorld {
+class FakeUserDefaultsWorld final : public UserDefaultsWorld {
  public:
-  ApplicationStorage& storage() override { return storage_; }
+  ApplicationStorage& port() override { return storage_; }
   ApplicationStorage& storageOfAnother() override { return storage_; }
 
  private:
   Testing::FakeApplicationStorage storage_{"/home/ada"};
 };
-INSTANTIATE_TEST_SUITE_P(Fake, UserDefaultsContract, UserDefaultsContract::on<FakeWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, UserDefaultsContract, on<FakeUserDefaultsWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

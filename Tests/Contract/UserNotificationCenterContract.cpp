@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/UserNotificationCenterContract.h>
+#include <Tests/Contract/NotificationWorlds.h>
 
 #include <gmock/gmock.h>
 
@@ -42,7 +42,7 @@ std::vector<std::string> titles(const UserNotificationCenter::Notifications& not
 }
 
 TEST_P(UserNotificationCenterContract, DeliversAtOnceWhatItIsAskedTo) {
-  UserNotificationCenter& center = world->center();
+  UserNotificationCenter& center = world->port();
   const auto listener = std::make_shared<Listener>();
   center.setDelegate(listener);
   const UserNotification far{.identifier = "a", .title = "A", .deliveryDate = Date::max()};
@@ -69,7 +69,7 @@ TEST_P(UserNotificationCenterContract, DeliversAtOnceWhatItIsAskedTo) {
 }
 
 TEST_P(UserNotificationCenterContract, KeepsWhatIsScheduledUntilItsDate) {
-  UserNotificationCenter& center = world->center();
+  UserNotificationCenter& center = world->port();
   const auto listener = std::make_shared<Listener>();
   center.setDelegate(listener);
   const auto schedule = [&](const char* title, std::optional<Date> date) {
@@ -98,7 +98,7 @@ TEST_P(UserNotificationCenterContract, KeepsWhatIsScheduledUntilItsDate) {
 }
 
 TEST_P(UserNotificationCenterContract, TellsNotificationsByTheirIdentifiersOrElseByAllThatIsSet) {
-  UserNotificationCenter& center = world->center();
+  UserNotificationCenter& center = world->port();
   const Date date = world->now() + 1h;
   for (const char* title : {"First", "Second"}) {
     EXPECT_FALSE(
@@ -121,7 +121,7 @@ TEST_P(UserNotificationCenterContract, TellsNotificationsByTheirIdentifiersOrEls
 }
 
 TEST_P(UserNotificationCenterContract, DoesCallsTogetherAsOneAndShowsNothingBefore) {
-  UserNotificationCenter& center = world->center();
+  UserNotificationCenter& center = world->port();
   const UserNotification later{.identifier = "a", .title = "A", .deliveryDate = world->now() + 1h};
   EXPECT_FALSE(center.scheduleNotification(later));
   const auto change = [&](const std::function<Failure()>& end) {
@@ -147,7 +147,7 @@ TEST_P(UserNotificationCenterContract, DoesCallsTogetherAsOneAndShowsNothingBefo
 }
 
 TEST_P(UserNotificationCenterContract, HandsOutOnceWhatTheApplicationWasStartedFor) {
-  UserNotificationCenter& center = world->center();
+  UserNotificationCenter& center = world->port();
   EXPECT_EQ(*center.takeLaunchNotification(), std::nullopt);
   const UserNotification clicked{.identifier = "a", .title = "A", .activationToken = "token"};
   world->startBy(clicked);
@@ -158,20 +158,17 @@ TEST_P(UserNotificationCenterContract, HandsOutOnceWhatTheApplicationWasStartedF
   EXPECT_EQ(*center.takeLaunchNotification(), std::nullopt) << "somebody else has started it";
 }
 
-class FakeWorld final : public UserNotificationCenterWorld {
+class FakeUserNotificationCenterWorld final
+    : public FakeColumn<UserNotificationCenterWorld, Testing::FakeUserNotificationCenter> {
  public:
-  UserNotificationCenter& center() override { return center_; }
-  Date now() override { return center_.now; }
-  void pass(std::chrono::seconds time) override { center_.advanceTo(center_.now + time); }
-  std::vector<std::string> banners() override { return titles(center_.presented); }
-  void click(const UserNotification& notification) override { center_.activate(notification); }
-  void startBy(const UserNotification& notification) override { center_.startBy(notification); }
-
- private:
-  Testing::FakeUserNotificationCenter center_;
+  Date now() override { return port_.now; }
+  void pass(std::chrono::seconds time) override { port_.advanceTo(port_.now + time); }
+  std::vector<std::string> banners() override { return titles(port_.presented); }
+  void click(const UserNotification& notification) override { port_.activate(notification); }
+  void startBy(const UserNotification& notification) override { port_.startBy(notification); }
 };
 INSTANTIATE_TEST_SUITE_P(Fake, UserNotificationCenterContract,
-                         UserNotificationCenterContract::on<FakeWorld>());
+                         on<FakeUserNotificationCenterWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -56,12 +56,8 @@ class DiskAccessFixture : public ::testing::Test {
  protected:
   DiskAccessFixture() {
     plugDisk("SSD-1", "nvme0n1", "Solid State", homeVolume);
-    volumes_.setVolumes({{.url = homeVolume, .isLocal = {}, .isInternal = {}, .uuid = {}}});
-    manager_.emplace(DiskAccessManager::Ports{.devices = registry_,
-                                              .disks = disks_,
-                                              .volumes = volumes_,
-                                              .securityScope = scope_,
-                                              .notificationCenter = center_});
+    volumes_.setVolumes({plain(homeVolume)});
+    manager_.emplace(DiskAccessManager::Ports{registry_, disks_, volumes_, scope_, center_});
     awaitInventory();
   }
 
@@ -74,6 +70,11 @@ class DiskAccessFixture : public ::testing::Test {
     disks_.setMountURLs(name, {volume});
   }
 
+  /// A volume of which nothing more is known.
+  static Platform::MountedVolume plain(const URL& volume) {
+    return {.url = volume, .isLocal = {}, .isInternal = {}, .uuid = {}};
+  }
+
   /// The inventories that this thread has asked for precede its next access.
   void awaitInventory() {
     if (const auto session = begin(homeFile)) session->endAccessing();
@@ -83,9 +84,7 @@ class DiskAccessFixture : public ::testing::Test {
     volumes_.mount(volume);
     awaitInventory();
   }
-  void mount(const URL& volume) {
-    mount({.url = volume, .isLocal = {}, .isInternal = {}, .uuid = {}});
-  }
+  void mount(const URL& volume) { mount(plain(volume)); }
   void mountStick() {
     mount({.url = stickVolume, .isLocal = true, .isInternal = false, .uuid = "STICK"});
   }

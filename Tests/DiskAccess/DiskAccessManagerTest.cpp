@@ -17,19 +17,6 @@ using namespace Tests;
 
 using DiskAccessManagerTest = DiskAccessFixture;
 
-TEST_F(DiskAccessManagerTest, CountsAnAccessAgainstTheDiskOfItsVolume) {
-  const DiskAccessGuard known(begin(homeFile));
-  EXPECT_EQ(known->diskInfo()->uniqueID(), "SSD-1");
-  EXPECT_TRUE(known->isAccessing());
-  const DiskAccessGuard told(
-      manager_->beginAccessingURL(stickFile, "test", QoS::utility, false, {}, homeVolume));
-  EXPECT_EQ(told->diskData(), known->diskData());
-  const DiskAccessGuard unknown(
-      manager_->beginAccessingURL(homeFile, "test", QoS::utility, false, {}, archiveVolume));
-  EXPECT_EQ(unknown->diskInfo()->uniqueID(), "unknown");
-  EXPECT_EQ(unknown->diskInfo()->maxTreads(), 1);
-}
-
 TEST_F(DiskAccessManagerTest, TheRelayTellsWhichVolumeCameOrWent) {
   std::vector<std::string> told;
   std::vector<Basalt::NotificationCenter::Observer> observers;
@@ -39,7 +26,7 @@ TEST_F(DiskAccessManagerTest, TheRelayTellsWhichVolumeCameOrWent) {
           notification.name + ' ' +
           *Platform::findAs<std::string>(notification.userInfo, "NSWorkspaceVolumeURLKey"));
     }));
-  volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+  volumes_.mount(plain(stickVolume));
   volumes_.unmount(stickVolume);
   EXPECT_EQ(told, (std::vector<std::string>{"NSWorkspaceDidMountNotification file:///stick/",
                                             "NSWorkspaceDidUnmountNotification file:///stick/"}));
@@ -99,7 +86,7 @@ TEST_F(DiskAccessManagerTest, AStormOfMountsCostsOneInventoryAndLosesNone) {
       center_.post({.name = std::string(didMountNotification), .userInfo = {}});
     registry_.interruption = [&] {
       plugDisk("HDD-1", "sda1", "Rotational", stickVolume);
-      volumes_.mount({.url = stickVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+      volumes_.mount(plain(stickVolume));
     };
   });
   awaitInventory();
@@ -134,7 +121,7 @@ TEST_F(DiskAccessManagerTest, AnInventedIdentifierLastsAsLongAsItsVolumeStaysMou
   // Another volume comes to the place of the first before an inventory has missed that one.
   DiskAccessGuard(begin(homeFile))->diskData()->queue().sync([&] {
     volumes_.unmount(archiveVolume);
-    volumes_.mount({.url = archiveVolume, .isLocal = {}, .isInternal = {}, .uuid = {}});
+    volumes_.mount(plain(archiveVolume));
   });
   awaitInventory();
   EXPECT_NE(identifier(archiveVolume), invented);

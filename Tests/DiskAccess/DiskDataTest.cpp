@@ -59,20 +59,6 @@ TEST_F(DiskDataTest, AdmitsAsManyThreadsAsTheDiskBears) {
   }
 }
 
-TEST_F(DiskDataTest, NeverMakesAThreadWaitForADiskThatItHolds) {
-  const auto data = disk(OVDiskKindUnknown);
-  EXPECT_FALSE(request(*data, first));
-  EXPECT_FALSE(request(*data, first));
-  const auto waiting = request(*data, second);
-  ASSERT_TRUE(waiting);
-  release(*data, first);
-  EXPECT_FALSE(isSignalled(*waiting)) << "the thread has one place left";
-  EXPECT_FALSE(request(*data, first));
-  release(*data, first);
-  release(*data, first);
-  EXPECT_TRUE(isSignalled(*waiting));
-}
-
 TEST_F(DiskDataTest, GrantsByClassAndWithinAClassInOrder) {
   const auto data = disk(OVDiskKindUnknown);
   EXPECT_FALSE(request(*data, first));
@@ -116,19 +102,6 @@ TEST_F(DiskDataTest, ThreadsThatGiveUpDoNotPileUp) {
   EXPECT_LT(data->requestCount(), 10u);
   release(*data, first);
   EXPECT_TRUE(isSignalled(*patient));
-}
-
-TEST_F(DiskDataTest, BackgroundModeLowersTheLimitAsThreadsLeave) {
-  const auto data = disk(OVDiskKindSolidState);
-  for (const ThreadID thread : {first, second, third}) EXPECT_FALSE(request(*data, thread));
-  queue_->sync([&] { data->setIsBackgroundMode(true); });
-  const auto waiting = request(*data, static_cast<ThreadID>(1'000'004));
-  ASSERT_TRUE(waiting);
-  release(*data, first);
-  release(*data, second);
-  EXPECT_FALSE(isSignalled(*waiting));
-  release(*data, third);
-  EXPECT_TRUE(isSignalled(*waiting));
 }
 
 TEST(WaitingDeadline, KeepsToTheCalendar) {

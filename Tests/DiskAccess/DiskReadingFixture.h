@@ -12,7 +12,9 @@
 #include <vector>
 
 #include <Tests/DiskAccess/DiskAccessFixture.h>
+#include <Varnel/Basalt/MainQueueExecutor.h>
 #include <Varnel/DiskAccess/DiskReadingQueue.h>
+#include <Varnel/Platform/Testing/FakeMainQueue.h>
 #include <Varnel/Platform/Testing/FakeReadingPriority.h>
 
 namespace Varnel::Tests {
@@ -118,6 +120,9 @@ class DiskReadingFixture : public DiskAccessFixture {
     while (accessesTo(stickVolume) > 0) std::this_thread::yield();
   }
 
+  Platform::Testing::FakeMainQueue mainQueue_;
+  const std::shared_ptr<Basalt::Executor> mainExecutor_ =
+      std::make_shared<Basalt::MainQueueExecutor>(mainQueue_);
   Platform::Testing::FakeReadingPriority priority_;
   std::atomic<Turn::Clock::time_point> now_ = Turn::Clock::time_point();
   std::optional<DiskReadingQueue> queue_;

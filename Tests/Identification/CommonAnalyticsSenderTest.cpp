@@ -44,7 +44,7 @@ class CommonAnalyticsSenderTest : public Tests::LoggerFixture {
   }
 
   std::string lastEntry() const {
-    const std::string text = output.text();
+    const std::string text = fakes.standardOutput.text();
     const std::size_t begin = text.rfind("] ");
     return begin == std::string::npos ? text : text.substr(begin + 2);
   }
@@ -97,9 +97,9 @@ TEST_F(CommonAnalyticsSenderTest, EmptyDimensionsStandForTheHoldersAndOthersForT
 }
 
 TEST_F(CommonAnalyticsSenderTest, EchoesToTheLetterWhileTheTrackerPrints) {
-  const std::string before = output.text();
+  const std::string before = fakes.standardOutput.text();
   sender_.trackCustomEvent("Scan", "Quiet", "", 0);
-  EXPECT_EQ(output.text(), before);
+  EXPECT_EQ(fakes.standardOutput.text(), before);
   EXPECT_EQ(sent_->events().size(), 1u);
 
   tracker_->setShouldPrintEvents(true);

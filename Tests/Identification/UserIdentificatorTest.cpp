@@ -4,20 +4,11 @@
 #include <gtest/gtest.h>
 
 #include <Tests/Support/QuarantineDatabase.h>
-#include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Basalt/Digest.h>
 #include <Varnel/Identification/User/IdentifierRules.h>
 #include <Varnel/Identification/User/KeptDownloadSource.h>
 #include <Varnel/Identification/User/UserIdentificationInfo.h>
-#include <Varnel/Platform/Testing/CapturedOutput.h>
-#include <Varnel/Platform/Testing/FakeCookieStorage.h>
-#include <Varnel/Platform/Testing/FakeExtendedAttributes.h>
-#include <Varnel/Platform/Testing/FakeMachineIdentity.h>
-#include <Varnel/Platform/Testing/FakeProcessInfo.h>
-#include <Varnel/Platform/Testing/FakeProcessLauncher.h>
-#include <Varnel/Platform/Testing/FakeUser.h>
-#include <Varnel/Platform/Testing/FakeUserDefaults.h>
-#include <Varnel/Platform/Testing/FakeVolumeCatalog.h>
+#include <Varnel/Platform/Testing/FakePorts.h>
 
 namespace Varnel {
 namespace {
@@ -39,31 +30,24 @@ Cookie analyticsCookie(std::string value, std::string domain = ".quennel.example
 class UserIdentificatorTest : public testing::Test {
  protected:
   UserIdentificatorTest() {
-    account.home = folder.path().string();
-    processInfo.mainBundle = "/opt/orvane";
+    fakes.userAccount.home = fakes.folder;
+    fakes.processInfo.mainBundle = "/opt/orvane";
   }
 
   // The application comes from the last of these downloads.
   void download(const std::string& url) {
-    Tests::runSQL(KVQuarantine::systemQuarantinePathV2(account),
+    Tests::runSQL(KVQuarantine::systemQuarantinePathV2(fakes.userAccount),
                   "DROP TABLE IF EXISTS LSQuarantineEvent;" + Tests::createQuarantineTable() +
                       Tests::insertDownload("'E'", "'" + url + "'"));
-    attributes.values[{"/opt/orvane", "com.apple.quarantine"}] = "0083;5f3a;Browser;E";
+    fakes.extendedAttributes.values[{"/opt/orvane", "com.apple.quarantine"}] =
+        "0083;5f3a;Browser;E";
   }
 
-  const Tests::TemporaryFolder folder;
-  Platform::Testing::CapturedSystemLog log;
-  Platform::Testing::FakeCookieStorage cookies;
-  Platform::Testing::FakeExtendedAttributes attributes;
-  Platform::Testing::FakeMachineIdentity machine;
-  Platform::Testing::FakeProcessInfo processInfo;
-  Platform::Testing::FakeProcessLauncher launcher;
-  Platform::Testing::FakeUserAccount account;
-  Platform::Testing::FakeUserDefaults userDefaults;
-  Platform::Testing::FakeVolumeCatalog volumes;
-  UserIdentificator user{
-      {cookies, machine, account, {attributes, processInfo, launcher, log, userDefaults, volumes}},
-      ".quennel.example"};
+  Platform::Testing::FakePorts fakes;
+  const UserIdentificator::Ports ports{fakes.cookieStorage, fakes.machineIdentity,
+                                       fakes.userAccount,
+                                       KVDownloadSourceTracker::Ports::of(fakes.ports())};
+  UserIdentificator user{ports, ".quennel.example"};
 };
 
 // Servers know users by these values: a change here is a mistake.
@@ -75,7 +59,7 @@ TEST_F(UserIdentificatorTest, TheUserIdentifierNeverChanges) {
   EXPECT_EQ(userIdentifierOf(std::nullopt, "ada"),
             "a90a92e0a503c5490d0ccf4cadbbd1efdd3c5925d08cc598db2606b8273c88b5");
   EXPECT_EQ(userIdentifierOf("uuid", "\xFF"), "(null)");
-  account.accountName = "grace";
+  fakes.userAccount.accountName = "grace";
   EXPECT_EQ(user.userIdentifier(),
             "3a8bc9fb6c605385e50e4f03118cd86b7f59529b27829673810b9854b1a2e6be");  // kept
   EXPECT_EQ(userIdentifierOf(user.machineUUID(), "grace").size(), 64U);
@@ -84,11 +68,11 @@ TEST_F(UserIdentificatorTest, TheUserIdentifierNeverChanges) {
 
 TEST_F(UserIdentificatorTest, StoredIdentifiersAreComputedOnceOrAssigned) {
   EXPECT_EQ(user.machineUUID(), "0f1e2d3c4b5a69788796a5b4c3d2e1f0");
-  machine.properties.clear();
+  fakes.machineIdentity.properties.clear();
   EXPECT_EQ(user.machineUUID(), "0f1e2d3c4b5a69788796a5b4c3d2e1f0");
   EXPECT_EQ(user.serialNumber(), std::nullopt);
   EXPECT_EQ(user.serialNumber(), std::nullopt);
-  EXPECT_EQ(machine.questions, 2);
+  EXPECT_EQ(fakes.machineIdentity.questions, 2);
 
   user.setSerialNumber("S1");
   user.setMachineUUID(std::nullopt);
@@ -97,22 +81,24 @@ TEST_F(UserIdentificatorTest, StoredIdentifiersAreComputedOnceOrAssigned) {
   EXPECT_EQ(user.userIdentifier(), userIdentifierOf(std::nullopt, "ada"));
   user.setUserIdentifier("U1");
   EXPECT_EQ(user.userIdentifier(), "U1");
-  EXPECT_EQ(machine.questions, 2);
+  EXPECT_EQ(fakes.machineIdentity.questions, 2);
 }
 
 TEST_F(UserIdentificatorTest, APropertyThatIsNoTextIsAbsent) {
-  machine.properties = {{"IOPlatformUUID", bytes({1, 2})}, {"IOPlatformSerialNumber", 5.0}};
+  fakes.machineIdentity.properties = {{"IOPlatformUUID", bytes({1, 2})},
+                                      {"IOPlatformSerialNumber", 5.0}};
   EXPECT_EQ(user.machineUUID(), std::nullopt);
   EXPECT_EQ(user.serialNumber(), std::nullopt);
 }
 
 TEST_F(UserIdentificatorTest, TheLastPrimaryAddressIsWrittenInSixBytes) {
   EXPECT_EQ(user.primaryMacAddress(), std::nullopt);
-  machine.addresses = {bytes({1, 2, 3, 4, 5, 6}), bytes({0x00, 0x1B, 0x63, 0x84, 0x45, 0xE6})};
+  fakes.machineIdentity.addresses = {bytes({1, 2, 3, 4, 5, 6}),
+                                     bytes({0x00, 0x1B, 0x63, 0x84, 0x45, 0xE6})};
   EXPECT_EQ(user.primaryMacAddress(), "00:1b:63:84:45:e6");
-  machine.addresses.push_back(bytes({0xAB, 0xCD}));
+  fakes.machineIdentity.addresses.push_back(bytes({0xAB, 0xCD}));
   EXPECT_EQ(user.primaryMacAddress(), "ab:cd:00:00:00:00");
-  machine.addresses.push_back(bytes({1, 2, 3, 4, 5, 6, 7, 8}));
+  fakes.machineIdentity.addresses.push_back(bytes({1, 2, 3, 4, 5, 6, 7, 8}));
   EXPECT_EQ(user.primaryMacAddress(), "01:02:03:04:05:06");
 }
 
@@ -154,12 +140,12 @@ TEST_F(UserIdentificatorTest, TheClientIdentifierIsCutFromTheFirstCookieOfTheDom
        std::nullopt},
   };
   for (const auto& [stored, value] : cases) {
-    cookies.ofGroup["Cookies"] = stored;
+    fakes.cookieStorage.ofGroup["Cookies"] = stored;
     EXPECT_EQ(user.GACookieValue(), value);
   }
-  cookies.own = {analyticsCookie("GA1.2.own")};
+  fakes.cookieStorage.own = {analyticsCookie("GA1.2.own")};
   EXPECT_EQ(user.GACookieValue(), std::nullopt);
-  cookies.groups = false;
+  fakes.cookieStorage.groups = false;
   EXPECT_EQ(user.GACookieValue(), "own");
 }
 
@@ -172,7 +158,7 @@ TEST_F(UserIdentificatorTest, OnlyTheSitesBuildPrefersCampaignAndCookie) {
   const std::string identifier = user.userIdentifier();
 
   EXPECT_EQ(site.uniqueClientIdentifier(), identifier);
-  cookies.ofGroup["Cookies"] = {analyticsCookie("GA1.2.111.222")};
+  fakes.cookieStorage.ofGroup["Cookies"] = {analyticsCookie("GA1.2.111.222")};
   download("https://example.org/a.dmg");
   EXPECT_EQ(site.uniqueClientIdentifier(), "111.222");
   download("https://example.org/a.dmg?cid=3");
@@ -185,8 +171,8 @@ TEST_F(UserIdentificatorTest, OnlyTheSitesBuildPrefersCampaignAndCookie) {
 // A fault may hide an identifier. It makes up none, and what is asked for each time is found again.
 TEST_F(UserIdentificatorTest, AFaultHidesAnIdentifierAndChangesNone) {
   using Platform::Testing::Fault;
-  cookies.ofGroup["Cookies"] = {analyticsCookie("GA1.2.111.222")};
-  machine.addresses = {bytes({1, 2, 3, 4, 5, 6})};
+  fakes.cookieStorage.ofGroup["Cookies"] = {analyticsCookie("GA1.2.111.222")};
+  fakes.machineIdentity.addresses = {bytes({1, 2, 3, 4, 5, 6})};
   download("https://example.org/a.dmg?cid=3");
   const auto askedEachTime = [](const UserIdentificator& asked) {
     return std::vector<Text>{asked.primaryMacAddress(), asked.downloadSourceURLString(),
@@ -203,13 +189,9 @@ TEST_F(UserIdentificatorTest, AFaultHidesAnIdentifierAndChangesNone) {
   const auto stored = askedOnce(user);
   for (const Fault fault : {Fault::fails, Fault::absent}) {
     const auto calls = sweepFaults(fault, [&](const auto& faults) {
-      cookies.faults = machine.faults = attributes.faults = volumes.faults = faults;
-      const auto asked = std::make_shared<UserIdentificator>(
-          UserIdentificator::Ports{cookies,
-                                   machine,
-                                   account,
-                                   {attributes, processInfo, launcher, log, userDefaults, volumes}},
-          ".quennel.example");
+      fakes.cookieStorage.faults = fakes.machineIdentity.faults = fakes.extendedAttributes.faults =
+          fakes.volumeCatalog.faults = faults;
+      const auto asked = std::make_shared<UserIdentificator>(ports, ".quennel.example");
       hides(changing, askedEachTime(*asked));
       hides(stored, askedOnce(*asked));
       EXPECT_FALSE(
@@ -236,7 +218,7 @@ TEST_F(UserIdentificatorTest, AKeptDownloadIsLookedForOnce) {
               campaign.value_or(user.userIdentifier()));
     EXPECT_EQ(kept->machineUUID(), user.machineUUID());
   }
-  EXPECT_EQ(log.text(), "Failed to open database!\n");
+  EXPECT_EQ(fakes.systemLog.text(), "Failed to open database!\n");
 }
 
 }  // namespace

@@ -94,7 +94,8 @@ TEST_F(ApplicationLauncherTest, ALineIsRunAsTheDesktopWould) {
   install("action", "body",
           "Actions=scan;\n" + action + "Exec=\"" + folder_.path().string() +
               R"(/my \\"\\$app" button)" + "\n");
-  install("unserved", "line", "DBusActivatable=true\n");
+  // One of these cannot be the name of a service.
+  for (const char* name : {"unserved", ":1.5"}) install(name, "line", "DBusActivatable=true\n");
   const struct {
     ApplicationLaunch launch;
     std::string told;
@@ -107,6 +108,7 @@ TEST_F(ApplicationLauncherTest, ALineIsRunAsTheDesktopWould) {
        "button|" + here + "|t|t||"},
       {{.desktopEntry = "action", .action = "other"}, "body|" + here + "||||"},
       {{.desktopEntry = "unserved"}, "line|" + here + "||||"},
+      {{.desktopEntry = ":1.5"}, "line|" + here + "||||"},
   };
   for (const auto& row : rows) {
     ASSERT_EQ(launch(row.launch), "") << row.launch.desktopEntry;

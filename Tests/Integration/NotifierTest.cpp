@@ -21,6 +21,7 @@
 #include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/TimeZones.h>
 #include <Varnel/Platform/Ports/UserNotificationCenter.h>
+#include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Platform/Testing/FakeUser.h>
 #include <Varnel/Reminders/UserNotificationRouter.h>
@@ -147,12 +148,23 @@ class Host final {
       return condition();
     }));
   }
+  void endListening() { router_.reset(); }
   // What it has sent has arrived at the bus.
   void synchronise() {
     bool isAnswered = false;
     queue_->drain();
     center.checkBanners([&](const auto&) { isAnswered = true; });
     await([&] { return isAnswered; });
+  }
+  // Waits while the store is busy.
+  std::optional<UserNotification> takeLaunch() {
+    std::optional<UserNotification> launch;
+    await([&] {
+      const auto taken = center.takeLaunchNotification();
+      if (taken) launch = *taken;
+      return taken.hasValue();
+    });
+    return launch;
   }
   void settle() {
     queue_->runWhile([this] { return center.isBusy(); }, 10s);
@@ -231,7 +243,7 @@ TEST_F(NotifierTest, ABannerComesWhileNoProcessOfTheProductIsInFront) {
   host.await([&] { return !host.clicked.empty(); });
   EXPECT_THAT(host.clicked, ElementsAre("shown"));
   EXPECT_THAT(host.delivered, SizeIs(9));
-  EXPECT_EQ(*host.center.takeLaunchNotification(), std::nullopt);
+  EXPECT_EQ(host.takeLaunch(), std::nullopt);
   EXPECT_EQ(host.log.text(), "");
 }
 
@@ -250,6 +262,7 @@ TEST_F(NotifierTest, EachProductHasItsOwnClicksAndAnOnlookerGivesWay) {
   EXPECT_THAT(first.clicked, ElementsAre("first"));
   EXPECT_THAT(second.clicked, ElementsAre("second"));
   EXPECT_THAT(onlooker.clicked, IsEmpty());
+  EXPECT_TRUE(comesTrue([] { return !isOnBus(notifierName); }));
 }
 
 TEST_F(NotifierTest, ABannerOutlivesItsHostAndAServerThatComesLateShowsIt) {
@@ -271,6 +284,29 @@ TEST_F(NotifierTest, ABannerOutlivesItsHostAndAServerThatComesLateShowsIt) {
   EXPECT_THAT(outputOf("dunstctl close; dunstctl history"), HasSubstr("waiting"));
 }
 
+// Started by a shell with folders of its own, in a process that goes on without its host.
+TEST_F(NotifierTest, AStoreIsFoundWhereItsApplicationKeepsItAndAClickNeedsAHost) {
+  const Server server;
+  ::setenv("XDG_STATE_HOME", (home_ + "/else\xffwhere").c_str(), 1);
+  Host host("moved");
+  host.synchronise();
+  host.endListening();
+  EXPECT_FALSE(
+      host.center.scheduleNotification({.identifier = "note",
+                                        .title = "found",
+                                        .deliveryDate = std::chrono::system_clock::now() + 200ms}));
+  host.await([] { return displayed() == "1\n"; });
+  EXPECT_TRUE(isOnBus(notifierName));
+  // Another process takes its time in the store.
+  auto holder = Platform::SQLiteDatabase::open(home_ + "/else\xffwhere/moved/notifications.sqlite");
+  EXPECT_TRUE(comesTrue([&] { return !holder->execute("BEGIN EXCLUSIVE"); }));
+  outputOf("dunstctl action 0");
+  const auto end = std::chrono::steady_clock::now() + 200ms;
+  host.await([&] { return std::chrono::steady_clock::now() > end; });
+  EXPECT_FALSE(holder->execute("COMMIT"));
+  host.await([&] { return host.takeLaunch().has_value(); });
+}
+
 TEST_F(NotifierTest, AHostThatHangsIsNotWaitedFor) {
   const Server server;
   Host planner("com.quennel.Orvane2", std::nullopt);
@@ -289,10 +325,14 @@ TEST_F(NotifierTest, AHostThatHangsIsNotWaitedFor) {
 }
 
 TEST_F(NotifierTest, ANotifierWithNothingToDoEnds) {
+  // Somebody else's, who encrypts it.
+  fs::create_directory(home_ + "/foreign");
+  write("foreign/notifications.sqlite", std::string(8192, 'x'));
   EXPECT_EQ(Tests::ChildProcess({VARNEL_NOTIFIER}).wait(), 0);
   const std::string orvane = ORVANE_PROGRAM;
   outputOf(orvane + " remind every weekly");
   EXPECT_TRUE(isOnBus(notifierName));
+  EXPECT_EQ(outputOf("ls " + home_ + "/foreign"), "notifications.sqlite\n");
   // There is one of them.
   EXPECT_EQ(Tests::ChildProcess({VARNEL_NOTIFIER}).wait(), 0);
   outputOf(orvane + " remind every never");
@@ -325,7 +365,12 @@ TEST_F(NotifierTest, WithoutItsProgramItEndsAndTheHostDeliversItself) {
   EXPECT_FALSE(host.center.scheduleNotification(
       {.identifier = "later", .deliveryDate = std::chrono::system_clock::now() + 24h}));
   host.settle();
-  EXPECT_TRUE(isOnBus(notifierName));
+  // Its host calls it back when it was killed, but not when it has gone.
+  const pid_t killed = ownerOf(notifierName);
+  ASSERT_NE(killed, 0);
+  ::kill(killed, SIGKILL);
+  host.await([&] { return ownerOf(notifierName) != killed && isOnBus(notifierName); });
+  host.settle();
   fs::remove(copy);
   EXPECT_TRUE(comesTrue([] { return !isOnBus(notifierName); }));
   // As where the package has gone, and its files with it.

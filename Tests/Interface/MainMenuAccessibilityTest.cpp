@@ -39,10 +39,8 @@ TEST(MainMenuAccessibility, ExtendsTheBaseItWasGiven) {
 }
 
 TEST(AccessibleAction, NamesItsButtonAndItsMenuItem) {
-  const AccessibleAction action("remove");
-  EXPECT_EQ(action.identifier(), "remove");
-  EXPECT_EQ(action.buttonIdentifier(), "remove.button");
-  EXPECT_EQ(action.menuItemIdentifier(), "remove.menu-item");
+  EXPECT_EQ(AccessibleAction("remove").buttonIdentifier(), "remove.button");
+  EXPECT_EQ(AccessibleAction("remove").menuItemIdentifier(), "remove.menu-item");
 }
 
 }  // namespace

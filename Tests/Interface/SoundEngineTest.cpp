@@ -3,6 +3,8 @@
 
 #include <gtest/gtest.h>
 
+#include <functional>
+
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Context/Bundle.h>
 #include <Varnel/Platform/Testing/FakeSoundPlayer.h>
@@ -57,46 +59,27 @@ TEST_F(SoundEngineTest, ANewSoundCutsOffTheOneBefore) {
 }
 
 TEST_F(SoundEngineTest, IsIdleAfterTheEndOrAStop) {
-  for (const bool finished : {true, false}) {
+  const std::function<void()> ends[] = {[&] { lastSound().end(true); },
+                                        [&] { lastSound().end(false); }, [&] { engine.stop(); }};
+  for (const auto& end : ends) {
     engine.play(Sound::start);
-    lastSound().end(finished);
+    end();
     EXPECT_FALSE(engine.currentSound());
-    EXPECT_EQ(lastSound().timesStopped, 0);
+    EXPECT_EQ(lastSound().timesStopped, &end == &ends[2] ? 1 : 0);
   }
-  engine.play(Sound::start);
-  engine.stop();
-  EXPECT_FALSE(engine.currentSound());
-  EXPECT_EQ(lastSound().timesStopped, 1);
   engine.stop();
 }
 
-TEST_F(SoundEngineTest, ASoundThatCannotBeLoadedStillEndsTheOneBefore) {
+TEST_F(SoundEngineTest, ASoundThatCannotBeLoadedStillEndsTheOneBeforeAndNoLaterOne) {
   for (const Sound unplayable : {Sound::purchase, Sound::rankIncreased}) {
     engine.play(Sound::start);
     engine.play(unplayable);
     EXPECT_FALSE(engine.currentSound());
     EXPECT_FALSE(lastSound().isPlaying());
   }
-  EXPECT_EQ(player.sounds.size(), 2u);
-}
-
-TEST_F(SoundEngineTest, AFaultSilencesOneSoundAndNoOther) {
-  using Platform::Testing::Fault;
-  const auto calls = Platform::Testing::sweepFaults(Fault::fails, [&](const auto& faults) {
-    player.faults = faults;
-    player.sounds.clear();
-    int heard = 0;
-    for (const Sound sound : {Sound::start, Sound::tutorial, Sound::scanComplete}) {
-      engine.play(sound);
-      heard += engine.currentSound() ? 1 : 0;
-      EXPECT_TRUE(!engine.currentSound() || engine.currentSound()->isPlaying());
-    }
-    EXPECT_GE(heard, 2);
-    EXPECT_EQ(player.sounds.size(), static_cast<std::size_t>(heard));
-    engine.stop();
-    for (const auto& sound : player.sounds) EXPECT_EQ(sound->timesStopped, 1);
-  });
-  EXPECT_EQ(calls, 3u);
+  engine.play(Sound::tutorial);
+  EXPECT_TRUE(engine.currentSound() && lastSound().isPlaying());
+  EXPECT_EQ(player.sounds.size(), 3u);
 }
 
 TEST_F(SoundEngineTest, MutingLeavesWhatPlaysAlone) {

@@ -101,28 +101,6 @@ TEST_F(LogFileChannelTest, ReportsAFullDiskOnceForEachEntryAndGoesOn) {
   EXPECT_EQ(text(), "kept\n");
 }
 
-// Every entry is in the file, or its author reads on the output that it is not.
-TEST(LogFileChannelFaults, LoseNoEntryUnsaid) {
-  constexpr std::size_t entries = 3;
-  for (const Fault fault : {Fault::fails, Fault::absent}) {
-    const auto calls = sweepFaults(fault, [&](const auto& faults) {
-      Platform::Testing::FakeAppendFiles files;
-      files.faults = faults;
-      Platform::Testing::CapturedOutput output;
-      LogFileChannel channel(files, output, "/log", {.interval = longTime});
-      for (std::size_t entry = 0; entry < entries; ++entry) {
-        channel.append(line);
-        channel.flush();
-      }
-      const std::string said = output.text();
-      if (said.starts_with("Unable to write log to file /log")) return;
-      const auto lost = static_cast<std::size_t>(std::count(said.begin(), said.end(), '\n'));
-      EXPECT_EQ(files.text("/log").size() / line.size() + lost, entries) << said;
-    });
-    EXPECT_EQ(calls, 1 + entries) << "the opening and the appends";
-  }
-}
-
 TEST_F(LogFileChannelTest, WritesAtOnceInAProcessThatMayHaveNoMoreThreads) {
   Tests::onAKernelThatForbids({SYS_clone, SYS_clone3}, EAGAIN, [&] {
     LogFileChannel channel(files, output, "/log", {.interval = longTime});

@@ -9,13 +9,7 @@
 
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Logging/Logger.h>
-#include <Varnel/Platform/POSIX/Adapters.h>
-#include <Varnel/Platform/Ports/PrivateFiles.h>
-#include <Varnel/Platform/Testing/CapturedOutput.h>
-#include <Varnel/Platform/Testing/FakeAppendFiles.h>
-#include <Varnel/Platform/Testing/FakeTimeZones.h>
-#include <Varnel/Platform/Testing/FakeUser.h>
-#include <Varnel/Platform/Testing/SimulatedClock.h>
+#include <Varnel/Platform/Testing/FakePorts.h>
 
 namespace Varnel::Tests {
 
@@ -24,16 +18,16 @@ class LoggerFixture : public testing::Test {
  protected:
   LoggerFixture() {
     ::setenv("TZ", "UTC", 1);
-    user.home = home.path().string();
+    fakes.userAccount.home = home.path().string();
+    fakes.clock.set(Platform::Date(std::chrono::sys_days(std::chrono::year(2026) / 3 / 14) +
+                                   std::chrono::seconds(33999)));
   }
 
   /// Makes the logger on first use; what it prints at start is left out of `printed()`.
   Logger& logger() {
     if (!logger_) {
-      logger_ = std::make_unique<Logger>(
-          Logger::Ports{files, clock, *privateFiles, output, zones, user, locale},
-          "com.quennel.Test");
-      startSize_ = output.text().size();
+      logger_ = std::make_unique<Logger>(fakes.ports(), "com.quennel.Test");
+      startSize_ = fakes.standardOutput.text().size();
     }
     return *logger_;
   }
@@ -41,21 +35,16 @@ class LoggerFixture : public testing::Test {
   void destroyLogger() { logger_.reset(); }
 
   /// What was printed since the logger was made.
-  [[nodiscard]] std::string printed() const { return output.text().substr(startSize_); }
+  [[nodiscard]] std::string printed() const {
+    return fakes.standardOutput.text().substr(startSize_);
+  }
 
   [[nodiscard]] std::string logPath() const {
-    return user.home + "/Library/Logs/com.quennel.Test/2026-03-14.log";
+    return fakes.userAccount.home + "/Library/Logs/com.quennel.Test/2026-03-14.log";
   }
 
   Tests::TemporaryFolder home;
-  Platform::Testing::FakeAppendFiles files;
-  const std::unique_ptr<Platform::PrivateFiles> privateFiles = Platform::POSIX::makePrivateFiles();
-  Platform::Testing::SimulatedClock clock{Platform::Date(
-      std::chrono::sys_days(std::chrono::year(2026) / 3 / 14) + std::chrono::seconds(33999))};
-  Platform::Testing::CapturedOutput output;
-  Platform::Testing::FakeUserAccount user;
-  Platform::Testing::FakeTimeZones zones;
-  Platform::Testing::FakeUserLocale locale;
+  Platform::Testing::FakePorts fakes;
 
  private:
   std::unique_ptr<Logger> logger_;

@@ -69,7 +69,7 @@ TEST_F(LoggerTest, WritesTagsOnOneLineBelowTheMessage) {
             stamp + ":  m" + nextLine + "location: /home/ada/Music\n");
 
   destroyLogger();
-  EXPECT_EQ(files.text(logPath()), printed());
+  EXPECT_EQ(fakes.appendFiles.text(logPath()), printed());
 }
 
 TEST_F(LoggerTest, PutsTheCallersPlaceBelowAnError) {
@@ -115,39 +115,40 @@ TEST_F(LoggerTest, HidesPathsAndSizesInAnonymousMode) {
 TEST_F(LoggerTest, TellsTimings) {
   EXPECT_EQ(logger().stringForTiming(3903.9), "1h 5m 3s");
   EXPECT_EQ(logger().stringForTiming(std::numeric_limits<double>::infinity()), "undefined");
-  const Platform::Date start = clock.now();
-  clock.advance(std::chrono::seconds(61));
+  const Platform::Date start = fakes.clock.now();
+  fakes.clock.advance(std::chrono::seconds(61));
   EXPECT_EQ(logger().stringForTiming(start), "1m 1s");
-  EXPECT_EQ(logger().stringForTiming(clock.now(), start), "-1m 1s");
+  EXPECT_EQ(logger().stringForTiming(fakes.clock.now(), start), "-1m 1s");
 }
 
 TEST_F(LoggerTest, KeepsTheFileOfTheDayItWasMadeOn) {
   (void)logger();
-  EXPECT_EQ(output.text(), "Will store log at " + logPath() + "\n");
+  EXPECT_EQ(fakes.standardOutput.text(), "Will store log at " + logPath() + "\n");
   EXPECT_EQ(logger().logFileURL(), URL::fileURLWithPath(logPath()));
-  clock.advance(std::chrono::hours(24));
+  fakes.clock.advance(std::chrono::hours(24));
   logger().log("next day");
   logger().flush();
-  EXPECT_EQ(files.text(logPath()), "[2026-03-15 09:26:39] :  next day\n");
+  EXPECT_EQ(fakes.appendFiles.text(logPath()), "[2026-03-15 09:26:39] :  next day\n");
 }
 
 TEST_F(LoggerTest, CountsTheYearByItsWeeks) {
-  clock.advance(std::chrono::hours(24 * 288));  // to Sunday, the 27th of December
+  fakes.clock.advance(std::chrono::hours(24 * 288));  // to Sunday, the 27th of December
   logger().log("m", "A");
   EXPECT_EQ(printed(), "[2027-12-27 09:26:39] A:  m\n");
   EXPECT_THAT(logger().logFileURL()->path(), testing::EndsWith("/2027-12-27.log"));
   ::setenv("LC_ALL", "en_US.UTF-8", 1);
-  EXPECT_EQ(Logger::logMessageDateFormatter().string(clock.now()), "2027-12-27 09:26:39");
-  EXPECT_EQ(Logger::fileNameDateFormatter().string(clock.now()), "2027-12-27");
+  EXPECT_EQ(Logger::logMessageDateFormatter().string(fakes.clock.now()), "2027-12-27 09:26:39");
+  EXPECT_EQ(Logger::fileNameDateFormatter().string(fakes.clock.now()), "2027-12-27");
 }
 
 TEST_F(LoggerTest, GoesOnWithoutAFolder) {
-  user.home = home.write("file", "in the way").string();
+  fakes.userAccount.home = home.write("file", "in the way").string();
   (void)logger();
-  EXPECT_EQ(output.text(), "Unable to write log to file " + logPath() +
-                               " with error Error Domain=generic Code=20 \"" + user.home +
-                               "/Library: Not a directory\"\n"
-                               "Will NOT store log\n");
+  EXPECT_EQ(fakes.standardOutput.text(), "Unable to write log to file " + logPath() +
+                                             " with error Error Domain=generic Code=20 \"" +
+                                             fakes.userAccount.home +
+                                             "/Library: Not a directory\"\n"
+                                             "Will NOT store log\n");
   EXPECT_EQ(logger().logFileURL(), std::nullopt);
   logger().log("m", "A");
   logger().flush();
@@ -155,17 +156,17 @@ TEST_F(LoggerTest, GoesOnWithoutAFolder) {
 }
 
 TEST_F(LoggerTest, GoesOnWithoutAFile) {
-  files.failure = std::errc::permission_denied;
-  files.faults->plan(Platform::Testing::Fault::fails, 1);
+  fakes.appendFiles.failure = std::errc::permission_denied;
+  fakes.appendFiles.faults->plan(Platform::Testing::Fault::fails, 1);
   logger().flush();
   EXPECT_EQ(logger().logFileURL(), URL::fileURLWithPath(logPath()));
-  const std::string atStart = output.text();
+  const std::string atStart = fakes.standardOutput.text();
   EXPECT_NE(atStart.find("Will store log at " + logPath() + "\n"), std::string::npos);
   EXPECT_NE(atStart.find("Unable to write log to file " + logPath() + " with error 13\n"),
             std::string::npos);
   logger().log("m", "A");
   destroyLogger();
-  EXPECT_EQ(output.text(), atStart + stamp + "A:  m\n");
+  EXPECT_EQ(fakes.standardOutput.text(), atStart + stamp + "A:  m\n");
 }
 
 TEST_F(LoggerTest, KeepsTheEntriesOfManyThreadsWholeAndInOrder) {
@@ -179,7 +180,7 @@ TEST_F(LoggerTest, KeepsTheEntriesOfManyThreadsWholeAndInOrder) {
   });
   destroyLogger();
 
-  std::istringstream lines(files.text(logPath()));
+  std::istringstream lines(fakes.appendFiles.text(logPath()));
   std::vector<int> next(4, 0);
   for (std::string line; std::getline(lines, line);) {
     const int author = line.at(stamp.size()) - '0';
@@ -187,7 +188,7 @@ TEST_F(LoggerTest, KeepsTheEntriesOfManyThreadsWholeAndInOrder) {
                         std::to_string(next.at(static_cast<std::size_t>(author))++));
   }
   EXPECT_EQ(next, std::vector<int>(4, entries));
-  EXPECT_EQ(printed().size(), files.text(logPath()).size());
+  EXPECT_EQ(printed().size(), fakes.appendFiles.text(logPath()).size());
 }
 
 class Caller final : public LoggingObject {

@@ -6,7 +6,6 @@
 #include <limits>
 
 #include <Tests/Support/Zones.h>
-#include <Varnel/Platform/Text/TextFormat.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -78,15 +77,6 @@ TEST(Calendar, AnswersNothingBeyondWhatItCanCount) {
     EXPECT_EQ(calendar.adding({}, edge), std::nullopt);
   }
   EXPECT_EQ(calendar.adding({}, now), now);
-}
-
-TEST(TextFormat, TakesTextsInOrderOrByPosition) {
-  EXPECT_EQ(formatted("%@ of %@", {"a", "b"}), "a of b");
-  EXPECT_EQ(formatted("%2$@ of %1$@, 100 %%", {"a", "b"}), "b of a, 100 %");
-  EXPECT_EQ(formatted("%@ %@ %9$@", {"%@"}), "%@ (null) (null)");
-  EXPECT_EQ(formatted("5 % of %d %0$@ %99999999999999999999$@ %1$d %", {"a"}),
-            "5 % of %d %0$@ %99999999999999999999$@ %1$d %");
-  EXPECT_EQ(formatted("", {"a"}), "");
 }
 
 }  // namespace

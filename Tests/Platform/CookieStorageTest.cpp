@@ -18,15 +18,9 @@ namespace {
 namespace fs = std::filesystem;
 using testing::ElementsAre;
 
-constexpr const char* createTable =
-    "CREATE TABLE moz_cookies (id INTEGER PRIMARY KEY, name TEXT, value TEXT, host TEXT, path TEXT,"
-    " expiry INTEGER, lastAccessed INTEGER, isSecure INTEGER, isHttpOnly INTEGER,"
-    " sameSite INTEGER);";
-
-std::string insert(int id, const std::string& name, const std::string& value, long expiry) {
-  return "INSERT INTO moz_cookies VALUES (" + std::to_string(id) + ", '" + name + "', " + value +
-         ", '.quennel.example', '/', " + std::to_string(expiry) + ", 0, 0, 0, 0);";
-}
+const std::string createTable =
+    "CREATE TABLE moz_cookies (id INTEGER PRIMARY KEY, name, value, expiry, host, path);";
+const std::string insert = "INSERT INTO moz_cookies(id, name, value, expiry) VALUES ";
 
 class CookieJar : public testing::Test {
  protected:
@@ -55,33 +49,31 @@ class CookieJar : public testing::Test {
 };
 
 TEST_F(CookieJar, ListsWhatHasNotExpiredInTheOrderOfTheStore) {
-  ASSERT_EQ(open(groupJar)->execute(createTable + insert(2, "b", "'2'", 1001) +
-                                    insert(1, "a", "'1'", 2000) + insert(3, "c", "'3'", 1000) +
-                                    insert(4, "d", "NULL", 1500)),
-            std::nullopt);
+  ASSERT_FALSE(open(groupJar)->execute(createTable + insert +
+                                       "(2, 'b', '2', 1001), (1, 'a', '1', 2000),"
+                                       "(3, 'c', '3', 1000), (4, 'd', NULL, 1500)"));
   EXPECT_THAT(read(), ElementsAre("a=1", "b=2", "d="));
   clock.advance(std::chrono::seconds(1));
   EXPECT_THAT(read(), ElementsAre("a=1", "d="));
 }
 
 TEST_F(CookieJar, ADamagedStoreIsEmpty) {
-  folder.write("group-containers/Cookies/cookies.sqlite", std::string(5000, 'x'));
-  EXPECT_THAT(read(), ElementsAre());
-  folder.write("group-containers/Cookies/cookies.sqlite", "");
-  EXPECT_THAT(read(), ElementsAre());
-  ASSERT_EQ(open(groupJar)->execute("CREATE TABLE moz_cookies (name TEXT)"), std::nullopt);
+  for (const std::string& bytes : {std::string(5000, 'x'), std::string()}) {
+    folder.write("group-containers/Cookies/cookies.sqlite", bytes);
+    EXPECT_THAT(read(), ElementsAre());
+  }
+  ASSERT_FALSE(open(groupJar)->execute("CREATE TABLE moz_cookies (name TEXT)"));
   EXPECT_THAT(read(), ElementsAre());
 }
 
 // What is committed but still in the log beside the file counts; what is being written does not.
 TEST_F(CookieJar, AJarThatAnotherProcessWritesIsReadAtItsLastCommit) {
-  ASSERT_EQ(open(groupJar)->execute(std::string("PRAGMA journal_mode = WAL;") + createTable),
-            std::nullopt);
+  ASSERT_FALSE(open(groupJar)->execute("PRAGMA journal_mode = WAL;" + createTable));
   const Tests::OtherProcess browser([&] {
     auto writer = open(groupJar);
-    const auto failed =
-        writer->execute("PRAGMA wal_autocheckpoint = 0;" + insert(1, "committed", "'1'", 2000) +
-                        "BEGIN IMMEDIATE;" + insert(2, "pending", "'2'", 2000));
+    const auto failed = writer->execute("PRAGMA wal_autocheckpoint = 0;" + insert +
+                                        "(1, 'committed', '1', 2000); BEGIN IMMEDIATE;" + insert +
+                                        "(2, 'pending', '2', 2000)");
     return failed ? nullptr : std::move(writer);
   });
   ASSERT_TRUE(browser.isReady());

@@ -39,6 +39,14 @@ mode_t modeOf(const fs::path& path) {
   return ::lstat(path.c_str(), &facts) == 0 ? facts.st_mode & 07777 : 0;
 }
 
+constexpr Journal journals[] = {Journal::rollback, Journal::writeAhead};
+
+// Takes all the room that is left, as far as pieces of this size fill it.
+void fill(const fs::path& file, std::size_t piece) {
+  std::ofstream stream(file, std::ios::binary | std::ios::app);
+  while (stream << std::string(piece, 'x') << std::flush) continue;
+}
+
 class DurableFilePlacesTest : public testing::Test {
  protected:
   void beginFor(uid_t user) {
@@ -46,6 +54,12 @@ class DurableFilePlacesTest : public testing::Test {
     fs::create_directories(home_);
     give(home_, user);
     fs::permissions(folder_.path(), fs::perms::all);
+  }
+
+  // On a disk in memory, where the machine grants one.
+  void onSmallDisk(const std::function<void()>& act) {
+    beginFor(::geteuid());
+    inChild(::geteuid(), act, home_);
   }
 
   TemporaryFolder folder_;
@@ -180,22 +194,14 @@ TEST_F(DurableFilePlacesTest, ALockEndsWithItsOwnerThoughAForkedChildLives) {
 }
 
 TEST_F(DurableFilePlacesTest, AFullDiskRefusesAndLaterTakes) {
-  for (const Journal journal : {Journal::rollback, Journal::writeAhead}) {
+  for (const Journal journal : journals) {
     for (const bool isNew : {true, false}) {
       SCOPED_TRACE(isNew);
-      beginFor(::geteuid());
-      inChild(::geteuid(), [&] {
-        if (!enterMountNamespace().empty() || !mountMemory(home_)) return;
-        ::umask(0077);
+      onSmallDisk([&] {
         Notebook book(path_, notes(journal));
         EXPECT_TRUE(isNew || book.add("a") == "kept");
         const fs::path ballast = home_ / "ballast";
-        {
-          std::ofstream file(ballast, std::ios::binary);
-          while (file << std::string(1 << 16, 'x') << std::flush) continue;
-          file.clear();
-          while (file << 'x' << std::flush) continue;
-        }
+        for (const std::size_t piece : {65536u, 1u}) fill(ballast, piece);
         std::string answer = "kept";
         for (int number = 0; number < 2000 && answer == "kept"; ++number)
           answer = book.add("full" + std::to_string(number) + std::string(500, '.'));
@@ -211,10 +217,8 @@ TEST_F(DurableFilePlacesTest, AFullDiskRefusesAndLaterTakes) {
 }
 
 TEST_F(DurableFilePlacesTest, RowsForWhichThereIsNoRoomYetAreNotForgotten) {
-  for (const Journal journal : {Journal::rollback, Journal::writeAhead}) {
-    beginFor(::geteuid());
-    inChild(::geteuid(), [&] {
-      if (!enterMountNamespace().empty() || !mountMemory(home_)) return;
+  for (const Journal journal : journals) {
+    onSmallDisk([&] {
       std::string all;
       {
         Notebook book(path_, notes(journal));
@@ -232,10 +236,7 @@ TEST_F(DurableFilePlacesTest, RowsForWhichThereIsNoRoomYetAreNotForgotten) {
         if (fs::exists(path_.string() + suffix))
           fs::rename(path_.string() + suffix, pending.string() + suffix);
       const fs::path ballast = home_ / "ballast";
-      {
-        std::ofstream file(ballast, std::ios::binary);
-        while (file << std::string(1 << 12, 'x') << std::flush) continue;
-      }
+      fill(ballast, 1 << 12);
       fs::resize_file(ballast, fs::file_size(ballast) - (80 << 10));
       for (int time = 0; time < 2; ++time)
         EXPECT_EQ(Notebook(path_, notes(journal)).keys(), "full");
@@ -251,7 +252,7 @@ TEST_F(DurableFilePlacesTest, RowsForWhichThereIsNoRoomYetAreNotForgotten) {
 }
 
 TEST_F(DurableFilePlacesTest, WhatCanOnlyBeReadIsRead) {
-  for (const Journal journal : {Journal::rollback, Journal::writeAhead}) {
+  for (const Journal journal : journals) {
     for (const bool hasJournals : {true, false}) {
       for (const bool isMount : {true, false}) {
         for (const uid_t user : users()) {

@@ -3,6 +3,7 @@
 
 #include <filesystem>
 #include <functional>
+#include <map>
 #include <memory>
 #include <string>
 #include <vector>
@@ -49,21 +50,12 @@ struct Notebook final {
   std::string add(
       const std::string& key, const std::function<void()>& afterwards = {},
       Platform::DurableFile::Looking looking = Platform::DurableFile::Looking::eachTime) {
-    const auto work = [&](Platform::SQLiteDatabase& database) {
-      auto error = insert(database, key);
-      if (afterwards) afterwards();
-      return error;
-    };
-    return meaning(file.changeByOneStatement(work, looking));
+    return meaning(file.changeByOneStatement(inserting(key, afterwards), looking));
   }
 
   /// The same in a transaction.
   std::string change(const std::string& key, const std::function<void()>& afterwards = {}) {
-    return meaning(file.change([&](Platform::SQLiteDatabase& database) {
-      auto error = insert(database, key);
-      if (afterwards) afterwards();
-      return error;
-    }));
+    return meaning(file.change(inserting(key, afterwards)));
   }
 
   /// Removes all keys.
@@ -83,31 +75,26 @@ struct Notebook final {
     return error ? meaning(error) : found;
   }
 
+  using Work = std::function<Failure(Platform::SQLiteDatabase&)>;
+  static Work inserting(const std::string& key, const std::function<void()>& afterwards) {
+    return [&](Platform::SQLiteDatabase& database) {
+      auto error = insert(database, key);
+      if (afterwards) afterwards();
+      return error;
+    };
+  }
   static Failure insert(Platform::SQLiteDatabase& database, const std::string& key) {
     return database.run("INSERT OR IGNORE INTO note(key) VALUES(?)", key);
   }
 
   static std::string meaning(const Failure& error) {
+    using enum Platform::SQLiteFailure;
+    static const std::map<Platform::SQLiteFailure, std::string> names{
+        {busy, "busy"},   {damaged, "damaged"}, {full, "full"},      {readOnly, "read-only"},
+        {newer, "newer"}, {older, "older"},     {refused, "refused"}};
     if (!error) return "kept";
-    switch (meaningOf(*error)) {
-      case Platform::SQLiteFailure::busy:
-        return "busy";
-      case Platform::SQLiteFailure::damaged:
-        return "damaged";
-      case Platform::SQLiteFailure::full:
-        return "full";
-      case Platform::SQLiteFailure::readOnly:
-        return "read-only";
-      case Platform::SQLiteFailure::newer:
-        return "newer";
-      case Platform::SQLiteFailure::older:
-        return "older";
-      case Platform::SQLiteFailure::refused:
-        return "refused";
-      case Platform::SQLiteFailure::other:
-        break;
-    }
-    return error->description();
+    const auto name = names.find(meaningOf(*error));
+    return name == names.end() ? error->description() : name->second;
   }
 
   std::unique_ptr<Platform::PrivateFiles> ownFiles = Platform::POSIX::makePrivateFiles();

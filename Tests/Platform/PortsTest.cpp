@@ -26,17 +26,6 @@ TEST(Ports, CannotBeAssignedThemselves) {
       areAssignable(a, b, c, d, e, f, g, h, i, j, k, l, m, n, o, p, q, r, s, t, u, v, w, x, y, z));
 }
 
-TEST(Ports, AssigningToAMemberOfASetChangesThatSetAlone) {
-  FakePorts fakes;
-  const Ports before = fakes.ports();
-  Ports ports = before;
-  SimulatedClock clock(Date(std::chrono::sys_days(std::chrono::days(7))));
-  ports.clock = clock;
-  EXPECT_EQ(ports.clock.get().now(), clock.now());
-  EXPECT_EQ(before.clock.get().now(), Date());
-  EXPECT_EQ(&ports.workspace.get(), &fakes.workspace);
-}
-
 TEST(FakePorts, TakeTheirFilesAwayWithThem) {
   std::string spool;
   {

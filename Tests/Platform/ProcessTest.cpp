@@ -19,6 +19,7 @@
 #include <Varnel/Platform/POSIX/ImageFile.h>
 #include <Varnel/Platform/POSIX/UserFolders.h>
 #include <Varnel/Platform/Ports/ProcessInfo.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
 
 namespace Varnel::Platform {
 namespace {
@@ -128,6 +129,33 @@ TEST(UserFolders, HoldTheFilesOfAnIdentifierAndOfNoOther) {
   for (const char* path : {"..", ".", "", "/"})
     EXPECT_EQ(POSIX::notificationStore(path), "/s/_/notifications.sqlite") << path;
   EXPECT_EQ(POSIX::notificationStore("a/../b"), "/s/a_.._b/notifications.sqlite");
+}
+
+TEST(UserLocale, TakesDatesAndNumbersEachFromTheirCategory) {
+  const struct {
+    const char* all;
+    const char* time;
+    const char* numeric;
+    const char* language;
+    const char* dates;
+    const char* numbers;
+  } rows[] = {
+      {"", "en_GB.UTF-8", "de_AT.UTF-8@euro", "fr_FR", "en_GB", "de_AT"},
+      {"", "en_GB.UTF-8", "", "fr_FR", "en_GB", "fr_FR"},
+      {"", "", "de_AT", "fr_FR", "fr_FR", "de_AT"},
+      {"ja_JP", "en_GB", "de_AT", "fr_FR", "ja_JP", "ja_JP"},
+      {"", "en_GB", "C", "fr_FR", "en_GB", "en_US"},
+      {"", "", "", "", "en_US", "en_US"},
+  };
+  for (const auto& row : rows) {
+    ::setenv("LC_ALL", row.all, 1);
+    ::setenv("LC_TIME", row.time, 1);
+    ::setenv("LC_NUMERIC", row.numeric, 1);
+    ::setenv("LANG", row.language, 1);
+    const auto locale = POSIX::makeUserLocale();
+    EXPECT_EQ(locale->identifier(), row.dates) << &row - rows;
+    EXPECT_EQ(locale->numberIdentifier(), row.numbers) << &row - rows;
+  }
 }
 
 }  // namespace

@@ -120,18 +120,16 @@ TEST(PropertyList, ReadsTheBinaryForm) {
 }
 
 TEST(PropertyList, TakesExtremeScalarsAsFarAsTheyHaveACounterpart) {
-  EXPECT_EQ(parsedElement("<integer>-9223372036854775808</integer>"),
-            PropertyValue(std::numeric_limits<std::int64_t>::min()));
-  EXPECT_EQ(parsedElement("<integer>18446744073709551615</integer>"),
-            PropertyValue(std::int64_t{-1}));
-  EXPECT_EQ(parsedElement("<integer>\n\t+0x1F </integer>"), PropertyValue(std::int64_t{31}));
-  EXPECT_EQ(parsedElement("<real> -2.5e-3 </real>"), PropertyValue(-0.0025));
-  EXPECT_EQ(parsedElement("<real>+infinity</real>"),
-            PropertyValue(std::numeric_limits<double>::infinity()));
-  EXPECT_EQ(parsedElement("<date>4001-01-01T00:00:00Z</date>"),
-            PropertyValue(Date(sys_days(4001y / January / 1))));
-  EXPECT_EQ(parsedElement("<date>1601-02-28T23:59:59Z</date>"),
-            PropertyValue(Date(sys_days(1601y / March / 1) - 1s)));
+  const std::pair<const char*, PropertyValue> elements[] = {
+      {"<integer>-9223372036854775808</integer>", std::numeric_limits<std::int64_t>::min()},
+      {"<integer>18446744073709551615</integer>", std::int64_t{-1}},
+      {"<integer>\n\t+0x1F </integer>", std::int64_t{31}},
+      {"<real> -2.5e-3 </real>", -0.0025},
+      {"<real>+infinity</real>", std::numeric_limits<double>::infinity()},
+      {"<date>4001-01-01T00:00:00Z</date>", Date(sys_days(4001y / January / 1))},
+      {"<date>1601-02-28T23:59:59Z</date>", Date(sys_days(1601y / March / 1) - 1s)},
+  };
+  for (const auto& [element, value] : elements) EXPECT_EQ(parsedElement(element), value) << element;
   const auto binaryDate = [](double secondsFrom2001) {
     return parsePropertyList(
         binaryList({"\x33" + bigEndian(std::bit_cast<std::uint64_t>(secondsFrom2001), 8)}));
@@ -149,11 +147,9 @@ static_assert(!std::is_constructible_v<PropertyValue, const int*>);
 static_assert(!std::is_constructible_v<PropertyValue, std::uint64_t>, "it may not fit");
 
 TEST(PropertyValue, TakesWhatHasOneMeaning) {
-  EXPECT_TRUE(PropertyValue(true).as<bool>());
   EXPECT_EQ(PropertyValue(std::int8_t{-7}), PropertyValue(std::int64_t{-7}));
   EXPECT_EQ(PropertyValue(4294967295u), PropertyValue(std::int64_t{4294967295}));
   EXPECT_EQ(*PropertyValue(1.5f).as<double>(), 1.5);
-  EXPECT_EQ(*PropertyValue("text").as<std::string>(), "text");
   EXPECT_EQ(*PropertyValue(std::string_view("a\0b", 3)).as<std::string>(), "a\0b"s);
 }
 

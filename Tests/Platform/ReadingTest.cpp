@@ -2,6 +2,7 @@
 #include <fcntl.h>
 #include <gtest/gtest.h>
 #include <sys/mman.h>
+#include <sys/stat.h>
 #include <sys/syscall.h>
 #include <unistd.h>
 
@@ -14,6 +15,7 @@
 #include <Tests/Support/ForbiddenCalls.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/Ports/ReadingPriority.h>
 #include <Varnel/Platform/Ports/TracelessReader.h>
 
@@ -109,13 +111,8 @@ TEST(TracelessReader, JustReadsWhereTheSystemDoesNotHelp) {
   for (const int refusal : {EOPNOTSUPP, ENOSYS, EPERM, EINVAL})
     Tests::onAKernelThatForbids({SYS_preadv2, SYS_mincore}, refusal,
                                 [&] { EXPECT_EQ(readAll(file), 3 * pageSize) << refusal; });
-}
-
-TEST(TracelessReader, TellsTheSystemsErrors) {
   std::vector<std::byte> buffer(pageSize);
-  const auto failed = TracelessReader(-1).read(buffer, 0);
-  ASSERT_FALSE(failed);
-  EXPECT_EQ(failed.error(), std::errc::bad_file_descriptor);
+  EXPECT_EQ(TracelessReader(-1).read(buffer, 0).error(), std::errc::bad_file_descriptor);
 }
 
 TEST(ReadingPriority, KnowsTheClassesAndHabitsOfTheKernel) {
@@ -137,6 +134,25 @@ TEST(ReadingPriority, KnowsTheClassesAndHabitsOfTheKernel) {
     EXPECT_FALSE(priority->current());
   });
   EXPECT_NE(priority->current(), lowest);
+}
+
+TEST(ReadFile, GivesAllBytesOrTheReason) {
+  const Tests::TemporaryFolder folder;
+  const std::string bytes = std::string(200'000, 'a') + std::string("\0\xFF\n", 3);
+  const std::string file = folder.write("file", bytes);
+  EXPECT_EQ(*readFile(file), bytes);
+  EXPECT_EQ(*readFile(file, bytes.size()), bytes);
+  EXPECT_EQ(readFile(file, bytes.size() - 1).error(), std::errc::file_too_large);
+  EXPECT_EQ(*readFile(folder.write("empty", ""), 0), "");
+  EXPECT_FALSE(readFile("/proc/self/stat")->empty());
+
+  EXPECT_EQ(readFile(folder.path() / "missing").error(), std::errc::no_such_file_or_directory);
+  EXPECT_EQ(readFile(file + "/in a file").error(), std::errc::not_a_directory);
+  const std::string pipe = folder.path() / "pipe";
+  ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
+  for (const std::string& path :
+       {pipe, folder.path().string(), std::string("/dev/zero"), file + '\0'})
+    EXPECT_EQ(readFile(path).error(), std::errc::invalid_argument) << path;
 }
 
 }  // namespace

@@ -66,38 +66,36 @@ TEST(Workspace, AnApplicationIsWhereItsDesktopEntryLeads) {
 
   const std::string apps = "system/applications/";
   const std::string root = folder.path().string();
-  // One backslash of a path takes four: the text's escape, and the quotation's.
-  entry(apps + "quoted", "Exec=\"" + root + R"(/My \\"\\$Apps/50%% off/velt" --open %U)" + "\n");
-  entry(apps + "env", "Exec=env LANG=C \"" + bundled + "\" %F\n");
-  entry(apps + "linked", "Exec=linked\n");
-  entry(apps + "name", "Exec=velt\nTryExec=" + onPath + "\n");
+  const struct {
+    std::string identifier, keys;
+    Text path;
+  } rows[] = {
+      // One backslash of a path takes four: the text's escape, and the quotation's.
+      {"quoted", "Exec=\"" + root + R"(/My \\"\\$Apps/50%% off/velt" --open %U)" + "\n", quoted},
+      {"env", "Exec=env LANG=C \"" + bundled + "\" %F\n", root + "/Velt.app"},
+      {"linked", "Exec=linked\n", root + "/Velt.app"},
+      {"name", "Exec=velt\nTryExec=" + onPath + "\n", onPath},
+      {"com.quennel.Velt-dash", "", onPath},
+      {"hidden", "Exec=velt\n", {}},
+      {"untried", "Exec=velt\nTryExec=" + root + "/missing\n", {}},
+      {"gone", "Exec=env LANG=C \"" + root + "/missing\"\n", {}},
+      {"relative", "Exec=../bin/velt\n", {}},
+      {"none", "DBusActivatable=true\n", {}},
+      {"link", "", {}},
+      {"broken", "", {}},
+      {"../applications/name", "", {}},
+  };
+  for (const auto& row : rows)
+    if (!row.keys.empty()) entry(apps + row.identifier, row.keys);
   entry(apps + "com.quennel.Velt/dash", "Exec=velt\n");
-  entry(apps + "hidden", "Exec=velt\n");
   entry("user/applications/hidden", "Exec=velt\nHidden=true\n");
-  entry(apps + "untried", "Exec=velt\nTryExec=" + root + "/missing\n");
-  entry(apps + "gone", "Exec=env LANG=C \"" + root + "/missing\"\n");
-  entry(apps + "relative", "Exec=../bin/velt\n");
-  entry(apps + "none", "DBusActivatable=true\n");
   folder.write(apps + "link.desktop", "[Desktop Entry]\nType=Link\nExec=velt\n");
   folder.write(apps + "broken.desktop", "Exec=velt\n");
 
-  const std::pair<const char*, Text> cases[] = {{"quoted", quoted},
-                                                {"env", root + "/Velt.app"},
-                                                {"linked", root + "/Velt.app"},
-                                                {"name", onPath},
-                                                {"com.quennel.Velt-dash", onPath},
-                                                {"hidden", {}},
-                                                {"untried", {}},
-                                                {"gone", {}},
-                                                {"relative", {}},
-                                                {"none", {}},
-                                                {"link", {}},
-                                                {"broken", {}},
-                                                {"../applications/name", {}}};
   const auto workspace = makeWorkspace();
-  for (const auto& [identifier, path] : cases) {
-    const auto url = workspace->applicationURL(identifier);
-    EXPECT_EQ(url ? Text(url->path()) : std::nullopt, path) << identifier;
+  for (const auto& row : rows) {
+    const auto url = workspace->applicationURL(row.identifier);
+    EXPECT_EQ(url ? Text(url->path()) : std::nullopt, row.path) << row.identifier;
   }
 }
 

@@ -9,33 +9,39 @@
 #include <Varnel/Basalt/Semaphore.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
 #include <Varnel/DiskAccess/DiskReadingQueue.h>
-#include <Varnel/DiskAccess/VolumeChangeRelay.h>
-#include <Varnel/Platform/Ports/VolumeCatalog.h>
-#include <Varnel/Platform/Testing/FakeDeviceRegistry.h>
-#include <Varnel/Platform/Testing/FakeDiskArbitration.h>
-#include <Varnel/Platform/Testing/FakeSecurityScope.h>
-#include <Varnel/Platform/Testing/FakeVolumeCatalog.h>
+#include <Varnel/Platform/Testing/FakePorts.h>
 
 namespace Orvane::Testing {
 namespace {
 
 using namespace Varnel::Platform;
 
-/// One volume, and a share whose files are looked up for as long as the test says.
-class HangingCatalog final : public VolumeCatalog {
- public:
-  Basalt::Semaphore isHanging, goOn;
+MountedVolume volume(const URL& url) {
+  return {.url = url, .isLocal = {}, .isInternal = {}, .uuid = {}};
+}
 
-  std::vector<MountedVolume> mountedVolumes() override { return {}; }
-  Result<std::optional<URL>> volumeURL(const URL& url) override {
-    if (url.path().starts_with("/share/")) {
-      isHanging.signal();
-      goOn.wait();
-    }
-    return std::optional(URL::fileURLWithPath("/"));
+/// A machine with one disk of three volumes, and a share.
+class ManagedDiskTurnsTest : public ::testing::Test {
+ protected:
+  const std::vector<URL> urls = {URL::fileURLWithPath("/home/"), URL::fileURLWithPath("/archive/"),
+                                 URL::fileURLWithPath("/attic/")};
+  Varnel::Platform::Testing::FakePorts fakes;
+  Varnel::Platform::Testing::FakeVolumeCatalog& volumes = plugged(fakes).volumeCatalog;
+  Varnel::DiskAccessManager manager{fakes.ports()};
+  Varnel::DiskReadingQueue queue{manager};
+  ManagedDiskTurns turns{{queue, volumes}, QualityOfService::utility, 2};
+
+ private:
+  Varnel::Platform::Testing::FakePorts& plugged(Varnel::Platform::Testing::FakePorts& machine) {
+    const auto device = machine.deviceRegistry.plug(
+        {{"SMART Capable", true},
+         {"Device Characteristics", PropertyDictionary{{"Serial Number", std::string("SSD-1")}}}});
+    machine.deviceRegistry.plug({{"BSD Name", std::string("nvme0n1")}}, device);
+    machine.diskArbitration.setMountURLs("nvme0n1", urls);
+    for (const URL& url : urls) machine.volumeCatalog.mount(volume(url));
+    machine.volumeCatalog.mount(volume(URL::fileURLWithPath("/share/")));
+    return machine;
   }
-  std::optional<std::string> volumeName(const URL&) override { return std::nullopt; }
-  std::unique_ptr<Subscription> subscribe(ChangeHandler) override { return nullptr; }
 };
 
 /// A task of some turns that tells when it is done.
@@ -56,15 +62,7 @@ class Turns final : public DiskTask {
   Basalt::Semaphore& isDone_;
 };
 
-TEST(ManagedDiskTurns, AShareThatHangsHoldsUpNoReaderOfOtherDisks) {
-  HangingCatalog volumes;
-  Varnel::Platform::Testing::FakeDeviceRegistry devices;
-  Varnel::Platform::Testing::FakeDiskArbitration disks;
-  Varnel::Platform::Testing::FakeSecurityScope scope;
-  Basalt::NotificationCenter center;
-  Varnel::DiskAccessManager manager({devices, disks, volumes, scope, center});
-  Varnel::DiskReadingQueue queue(manager);
-  ManagedDiskTurns turns({queue, volumes}, QualityOfService::utility, 2);
+TEST_F(ManagedDiskTurnsTest, AShareThatHangsHoldsUpNoReaderOfOtherDisks) {
   Basalt::Semaphore isDone;
   const auto read = [&](const char* path) {
     return std::thread(
@@ -74,11 +72,14 @@ TEST(ManagedDiskTurns, AShareThatHangsHoldsUpNoReaderOfOtherDisks) {
     return isDone.waitUntil(std::chrono::floor<Date::duration>(std::chrono::system_clock::now()) +
                             std::chrono::seconds(20));
   };
+  (void)turns.diskOf("/home/file");  // The first inventory is over; the next look-up hangs.
+  const std::size_t next = volumes.faults->calls() + 1;
+  volumes.faults->plan(Varnel::Platform::Testing::Fault::delays, next, 1);
   std::thread onShare = read("/share/file");
-  volumes.isHanging.wait();
+  volumes.faults->waitForCalls(next);
   std::thread onDisk = read("/home/file");
   EXPECT_TRUE(isDoneInTime());
-  volumes.goOn.signal();
+  volumes.faults->mend();
   onShare.join();
   onDisk.join();
   EXPECT_TRUE(isDoneInTime());
@@ -87,15 +88,13 @@ TEST(ManagedDiskTurns, AShareThatHangsHoldsUpNoReaderOfOtherDisks) {
 /// A task that loses a volume in each of its turns.
 class LosingTask final : public DiskTask {
  public:
-  LosingTask(std::vector<const char*> volumes, Basalt::NotificationCenter& center,
+  LosingTask(std::vector<URL> volumes, Varnel::Platform::Testing::FakeVolumeCatalog& catalog,
              Basalt::Semaphore& isRefused)
-      : volumes_(std::move(volumes)), center_(center), isRefused_(isRefused) {}
+      : volumes_(std::move(volumes)), catalog_(catalog), isRefused_(isRefused) {}
 
   std::optional<std::uint64_t> run(DiskTurn&) override {
     if (turns == volumes_.size()) return std::nullopt;
-    center_.post({.name = std::string(Varnel::didUnmountNotification),
-                  .userInfo = {{std::string(Varnel::volumeURLKey),
-                                URL::fileURLWithPath(volumes_[turns++]).absoluteString()}}});
+    catalog_.announce({.kind = VolumeChange::Kind::unmounted, .volumeURL = volumes_[turns++]});
     return 0;
   }
   void refuse() override { isRefused_.signal(); }
@@ -103,37 +102,17 @@ class LosingTask final : public DiskTask {
   std::size_t turns = 0;
 
  private:
-  const std::vector<const char*> volumes_;
-  Basalt::NotificationCenter& center_;
+  const std::vector<URL> volumes_;
+  Varnel::Platform::Testing::FakeVolumeCatalog& catalog_;
   Basalt::Semaphore& isRefused_;
 };
 
-TEST(ManagedDiskTurns, AnUnmountedVolumeTakesNoOtherOfItsDiskAlong) {
-  namespace Fakes = Varnel::Platform::Testing;
-  Fakes::FakeVolumeCatalog volumes;
-  Fakes::FakeDeviceRegistry devices;
-  Fakes::FakeDiskArbitration disks;
-  Fakes::FakeSecurityScope scope;
-  Basalt::NotificationCenter center;
-  std::vector<MountedVolume> mounted;
-  for (const char* path : {"/home/", "/archive/", "/attic/"})
-    mounted.push_back(
-        {.url = URL::fileURLWithPath(path), .isLocal = {}, .isInternal = {}, .uuid = {}});
-  volumes.setVolumes(mounted);
-  const auto device = devices.plug(
-      {{"SMART Capable", true},
-       {"Device Characteristics", PropertyDictionary{{"Serial Number", std::string("SSD-1")}}}});
-  devices.plug({{"BSD Name", std::string("nvme0n1")}}, device);
-  disks.setMountURLs("nvme0n1", {mounted[0].url, mounted[1].url, mounted[2].url});
-  Varnel::DiskAccessManager manager({devices, disks, volumes, scope, center});
-  Varnel::DiskReadingQueue queue(manager);
-  ManagedDiskTurns turns({queue, volumes}, QualityOfService::utility, 2);
+TEST_F(ManagedDiskTurnsTest, AnUnmountedVolumeTakesNoOtherOfItsDiskAlong) {
   const ScanDisk& disk = turns.diskOf("/home/file");
   for (const char* path : {"/archive/file", "/attic/file", "/home/other"})
     ASSERT_EQ(&turns.diskOf(path), &disk);
   Basalt::Semaphore isRefused;
-  const auto task = std::make_shared<LosingTask>(std::vector{"/home/", "/archive/", "/attic/"},
-                                                 center, isRefused);
+  const auto task = std::make_shared<LosingTask>(urls, volumes, isRefused);
   turns.start(disk, task);
   isRefused.wait();
   EXPECT_EQ(task->turns, 3u) << "as long as a volume of the disk is there";

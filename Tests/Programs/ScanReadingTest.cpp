@@ -20,26 +20,6 @@ namespace {
 using ScanReading = ScanFixture;
 using Reading = FaultyFileSystem::Reading;
 
-TEST_F(ScanReading, TellsContentsApartToTheLastByte) {
-  Groups expected;
-  constexpr std::size_t head = headLength, block = head + 256 * 1024;
-  for (const std::size_t size : {1ul, head - 1, head, head + 1, block, block + 1, 1'500'000ul}) {
-    const std::string name = std::to_string(size);
-    expected.push_back({folder.write(name + "/1", bytes(size, 'a')),
-                        folder.write(name + "/2", bytes(size, 'a')),
-                        folder.write(name + "/3", bytes(size, 'a'))});
-    expected.push_back(
-        {folder.write(name + "/4", bytes(size, 'b')), folder.write(name + "/5", bytes(size, 'b'))});
-    folder.write(name + "/6", bytes(size, 'c'));
-  }
-  const ScanResult result = scan();
-  EXPECT_THAT(paths(result), ::testing::UnorderedElementsAreArray(expected));
-  EXPECT_TRUE(std::is_sorted(result.groups.begin(), result.groups.end(),
-                             [](const DuplicateGroup& a, const DuplicateGroup& b) {
-                               return a.wastedBytes() > b.wastedBytes();
-                             }));
-}
-
 TEST_F(ScanReading, LeavesOutFilesThatVanishOrChangeMeanwhile) {
   using Path = const std::string&;
   std::map<std::string, std::function<void(Path)>> beforeOpen, beforeRead;

@@ -5,21 +5,11 @@
 #include <sys/wait.h>
 
 #include <cerrno>
-#include <future>
-#include <thread>
 
 #include <Tests/Support/OpenDescriptors.h>
 #include <Tests/Support/QuarantineDatabase.h>
 #include <Tests/Support/TemporaryFolder.h>
-#include <Varnel/Basalt/Executor.h>
-#include <Varnel/Context/ApplicationData.h>
-#include <Varnel/Platform/Ports/Ports.h>
-#include <Varnel/Platform/Testing/CapturedOutput.h>
-#include <Varnel/Platform/Testing/FakeExtendedAttributes.h>
-#include <Varnel/Platform/Testing/FakeProcessInfo.h>
-#include <Varnel/Platform/Testing/FakeProcessLauncher.h>
-#include <Varnel/Platform/Testing/FakeUserDefaults.h>
-#include <Varnel/Platform/Testing/FakeVolumeCatalog.h>
+#include <Varnel/Platform/Testing/FakePorts.h>
 #include <Varnel/Provenance/EventFilters.h>
 
 namespace Varnel {
@@ -29,11 +19,11 @@ namespace fs = std::filesystem;
 using Platform::URL;
 using Tests::insertDownload;
 
-// A machine on a temporary folder: its volumes, an application, downloads, and real attributes on
-// real files. The disk-image tool is a script.
+// A machine with a database of downloads, an application, and another on a volume that is mounted
+// from an image. The disk-image tool is a script, or a fake.
 class DownloadSource : public testing::Test {
  protected:
-  void SetUp() override {
+  DownloadSource() {
     Tests::runSQL(database, Tests::createQuarantineTable() +
                                 insertDownload("'other'", "'https://example.org/other'") +
                                 insertDownload("'named'", "'https://example.org/ORVANE-_2.dmg'") +
@@ -41,62 +31,62 @@ class DownloadSource : public testing::Test {
                                 insertDownload("'bundle'", "'https://example.org/bundle'") +
                                 insertDownload("'image'", "'https://example.org/image'") +
                                 insertDownload("''", "'https://example.org/empty'"));
-    fs::create_directories(application);
-    fs::create_directories(mounted);
-    if (!Tests::setQuarantineAttribute(folder.write("probe", ""), "x"))
-      GTEST_SKIP() << "The file system of " << folder.path() << " keeps no attributes.";
-    folder.write("image.dmg", "");
-    mountVolume(volume.string());
-    volumes.setVolumeName(URL::fileURLWithPath(volume.string() + "/"), "Orvane");
+    mountVolume(volume);
+    fakes.volumeCatalog.setVolumeName(URL::fileURLWithPath(volume + "/"), "Orvane");
   }
 
   void mountVolume(const std::string& path) {
-    volumes.setVolumes({{URL::fileURLWithPath(path + "/"), true, true, std::nullopt}});
+    fakes.volumeCatalog.setVolumes({{URL::fileURLWithPath(path + "/"), true, true, std::nullopt}});
+  }
+
+  void setAttribute(const std::string& path, const std::string& value) {
+    fakes.extendedAttributes.values[{path, "com.apple.quarantine"}] = value;
+  }
+  void setEvent(const std::string& path, const std::string& event) {
+    setAttribute(path, "0083;5f3a;Browser;" + event);
   }
 
   // A program that is run in place of the tool.
   void writeTool(const std::string& script) {
     const fs::path file = folder.write("tool", "#!/bin/sh\n" + script);
     fs::permissions(file, fs::perms::owner_all);
+    ports.processLauncher = Platform::processPorts().processLauncher;
   }
 
   [[nodiscard]] std::string propertyList() const {
     return "<plist version=\"1.0\"><dict><key>images</key><array><dict>"
            "<key>image-path</key><string>" +
-           image.string() +
+           image +
            "</string><key>system-entities</key><array><dict/><dict><key>mount-point</key><string>" +
-           volume.string() + "</string></dict></array></dict></array></dict></plist>";
+           volume + "</string></dict></array></dict></array></dict></plist>";
   }
   [[nodiscard]] std::string printing(const std::string& text) const {
     return "[ \"$*\" = 'info -plist' ] || exit 9\ncat <<'END'\n" + text + "\nEND\n";
   }
 
-  // The event that the application at `bundle` is traced to.
-  std::string trace(const fs::path& bundle,
+  // The event that the application at `bundle`, or the running one, is traced to.
+  std::string trace(std::optional<std::string> bundle,
                     std::optional<Platform::TimeInterval> toolTimeout = {}) {
     const KVDownloadSourceTracker tracker(
-        std::make_shared<KVQuarantine>(database.string(), log),
+        std::make_shared<KVQuarantine>(database.string(), fakes.systemLog),
         {.diskImageTool = (folder.path() / "tool").string(),
-         .volumesRoot = (folder.path() / "Volumes").string(),
-         .bundlePath = bundle.string(),
+         .volumesRoot = "/Volumes",
+         .bundlePath = std::move(bundle),
          .toolTimeout = toolTimeout},
-        {Platform::processPorts().extendedAttributes, processInfo,
-         Platform::processPorts().processLauncher, log, userDefaults, volumes});
+        KVDownloadSourceTracker::Ports::of(ports));
     const auto entry = tracker.installSourceEntry();
     return entry ? std::string(entry->eventIdentifier().value_or("?")) : "none";
   }
 
   const Tests::TemporaryFolder folder;
   const fs::path database = folder.path() / "events";
-  const fs::path application = folder.path() / "Applications" / "Orvane.app";
-  const fs::path volume = folder.path() / "Volumes" / "Orvane";
-  const fs::path mounted = volume / "Orvane.app";
-  const fs::path image = folder.path() / "image.dmg";
+  const std::string application = "/Applications/Orvane.app";
+  const std::string volume = "/Volumes/Orvane";
+  const std::string mounted = volume + "/Orvane.app";
+  const std::string image = "/home/ada/image.dmg";
 
-  Platform::Testing::CapturedSystemLog log;
-  Platform::Testing::FakeProcessInfo processInfo;
-  Platform::Testing::FakeUserDefaults userDefaults;
-  Platform::Testing::FakeVolumeCatalog volumes;
+  Platform::Testing::FakePorts fakes;
+  Platform::Ports ports = fakes.ports();
 };
 
 TEST_F(DownloadSource, TheApplicationsOwnAttributeDecides) {
@@ -107,57 +97,57 @@ TEST_F(DownloadSource, TheApplicationsOwnAttributeDecides) {
   };
   EXPECT_EQ(trace(application), "named");
   for (const auto& [attribute, event] : cases) {
-    ASSERT_TRUE(Tests::setQuarantineAttribute(application, attribute));
+    setAttribute(application, attribute);
     EXPECT_EQ(trace(application), event) << attribute;
   }
-  EXPECT_EQ(log.text(), "");
+  EXPECT_EQ(fakes.systemLog.text(), "");
 }
 
 TEST_F(DownloadSource, WithoutDownloadsThereIsNoSource) {
-  ASSERT_TRUE(Tests::setQuarantineAttribute(application, "0083;5f3a;Browser;bundle"));
+  setEvent(application, "bundle");
   Tests::runSQL(database, "DELETE FROM LSQuarantineEvent");
   EXPECT_EQ(trace(application), "none");
-  KVDownloadSourceTracker tracker(std::make_shared<KVQuarantine>(database.string(), log));
+  KVDownloadSourceTracker tracker(
+      std::make_shared<KVQuarantine>(database.string(), fakes.systemLog));
   tracker.setQuarantine(nullptr);
   EXPECT_FALSE(tracker.installSourceEntry());
 }
 
 TEST_F(DownloadSource, OnAMountedImageTheImagesAttributeDecides) {
-  ASSERT_TRUE(Tests::setQuarantineAttribute(mounted, "0083;5f3a;Browser;bundle"));
-  writeTool(printing(propertyList()));
+  setEvent(mounted, "bundle");
+  fakes.processLauncher.script.output = propertyList();
   EXPECT_EQ(trace(mounted), "bundle");  // the image has no attribute yet
-  ASSERT_TRUE(Tests::setQuarantineAttribute(image, "0083;5f3a;Browser;image"));
+  setEvent(image, "image");
   EXPECT_EQ(trace(mounted), "image");
 
   // The volume's name is taken for its folder's, whatever that is called.
-  volumes.setVolumeName(URL::fileURLWithPath(volume.string() + "/"), "Another");
+  fakes.volumeCatalog.setVolumeName(URL::fileURLWithPath(volume + "/"), "Another");
   EXPECT_EQ(trace(mounted), "bundle");
-  EXPECT_EQ(log.text(), "");
+  EXPECT_EQ(fakes.systemLog.text(), "");
 }
 
 TEST_F(DownloadSource, APathThatOnlyStartsLikeTheVolumesIsTakenForOne) {
-  const fs::path similar = folder.path() / "VolumesX" / "Orvane.app";
-  fs::create_directories(similar);
-  ASSERT_TRUE(Tests::setQuarantineAttribute(similar, "0083;5f3a;Browser;bundle"));
-  writeTool("touch '" + (folder.path() / "asked").string() + "'");
-  mountVolume(folder.path().string());
+  const std::string similar = "/VolumesX/Orvane.app";
+  setEvent(similar, "bundle");
+  mountVolume("");
   EXPECT_EQ(trace(similar), "bundle");
-  EXPECT_TRUE(fs::exists(folder.path() / "asked"));
+  EXPECT_EQ(fakes.processLauncher.launches.size(), 1u);
 }
 
 TEST_F(DownloadSource, AVolumeWithoutNameIsLoggedAndTheApplicationDecides) {
-  ASSERT_TRUE(Tests::setQuarantineAttribute(mounted, "0083;5f3a;Browser;bundle"));
-  volumes.setLookupError(Platform::PlatformError("Test", 1));
+  setEvent(mounted, "bundle");
+  fakes.volumeCatalog.setLookupError(Platform::PlatformError("Test", 1));
   EXPECT_EQ(trace(mounted), "bundle");
-  EXPECT_THAT(log.text(), testing::StartsWith("Cannot obtain volume name: Error Domain=Test"));
-  volumes.setLookupError(std::nullopt);
-  volumes.setVolumes({});
+  EXPECT_THAT(fakes.systemLog.text(),
+              testing::StartsWith("Cannot obtain volume name: Error Domain=Test"));
+  fakes.volumeCatalog.setLookupError(std::nullopt);
+  fakes.volumeCatalog.setVolumes({});
   EXPECT_EQ(trace(mounted), "bundle");
 }
 
 TEST_F(DownloadSource, AToolThatGivesNoAnswerLeavesTheApplicationToDecide) {
-  ASSERT_TRUE(Tests::setQuarantineAttribute(mounted, "0083;5f3a;Browser;bundle"));
-  ASSERT_TRUE(Tests::setQuarantineAttribute(image, "0083;5f3a;Browser;image"));
+  setEvent(mounted, "bundle");
+  setEvent(image, "image");
   const std::string answer = printing(propertyList());
   const struct {
     const char* name;
@@ -210,52 +200,33 @@ TEST_F(DownloadSource, AToolThatGivesNoAnswerLeavesTheApplicationToDecide) {
 }
 
 TEST_F(DownloadSource, AToolIsAskedUntilItHasEnded) {
-  Platform::Testing::FakeProcessLauncher launcher;
-  launcher.script = {.output = propertyList(), .questions = 3};
-  ASSERT_TRUE(Tests::setQuarantineAttribute(image, "0083;5f3a;Browser;image"));
-  const KVDownloadSourceTracker tracker(
-      std::make_shared<KVQuarantine>(database.string(), log),
-      {.volumesRoot = (folder.path() / "Volumes").string(), .bundlePath = mounted.string()},
-      {Platform::processPorts().extendedAttributes, processInfo, launcher, log, userDefaults,
-       volumes});
-  EXPECT_EQ(tracker.installSourceEntry()->eventIdentifier(), "image");
-  EXPECT_EQ(launcher.launches,
-            (std::vector<std::vector<std::string>>{{"/usr/bin/hdiutil", "info", "-plist"}}));
-  EXPECT_EQ(launcher.terminations, 0);
+  fakes.processLauncher.script = {.output = propertyList(), .questions = 3};
+  setEvent(image, "image");
+  EXPECT_EQ(trace(mounted), "image");
+  EXPECT_EQ(fakes.processLauncher.launches,
+            (std::vector<std::vector<std::string>>{{folder.path() / "tool", "info", "-plist"}}));
+  EXPECT_EQ(fakes.processLauncher.terminations, 0);
 
   // Without a bundle the executable stands for the application.
-  processInfo.executable = application.string();
-  ASSERT_TRUE(Tests::setQuarantineAttribute(application, "0083;5f3a;Browser;bundle"));
-  const KVDownloadSourceTracker ofProcess(tracker.quarantine(), {},
-                                          {Platform::processPorts().extendedAttributes, processInfo,
-                                           launcher, log, userDefaults, volumes});
-  EXPECT_EQ(ofProcess.installSourceEntry()->eventIdentifier(), "bundle");
-  EXPECT_EQ(ofProcess.userDefaults().get(), &userDefaults);
+  fakes.processInfo.executable = application;
+  setEvent(application, "bundle");
+  EXPECT_EQ(trace(std::nullopt), "bundle");
 }
 
 // A fault may lead to a lesser source, as where the better one is not there. It does so once.
 TEST_F(DownloadSource, AFaultLeadsToALesserSourceOnce) {
   using Platform::Testing::Fault;
-  Platform::Testing::FakeExtendedAttributes attributes;
-  attributes.values[{image.string(), "com.apple.quarantine"}] = "0083;5f3a;Browser;image";
-  attributes.values[{mounted.string(), "com.apple.quarantine"}] = "0083;5f3a;Browser;bundle";
+  setEvent(image, "image");
+  setEvent(mounted, "bundle");
+  fakes.processLauncher.script.output = propertyList();
   for (const Fault fault : {Fault::fails, Fault::absent, Fault::delays}) {
     const bool isSlow = fault == Fault::delays;
-    Platform::Testing::FakeProcessLauncher launcher;
-    launcher.script.output = propertyList();
-    const KVDownloadSourceTracker tracker(
-        std::make_shared<KVQuarantine>(database.string(), log),
-        {.volumesRoot = (folder.path() / "Volumes").string(), .bundlePath = mounted.string()},
-        {attributes, processInfo, launcher, log, userDefaults, volumes});
     const auto calls = sweepFaults(fault, [&](const auto& faults) {
-      launcher.faults = faults;
-      if (!isSlow) attributes.faults = volumes.faults = faults;
-      const auto entry = tracker.installSourceEntry();
-      ASSERT_TRUE(entry);
-      EXPECT_THAT(std::string(entry->eventIdentifier().value_or("?")),
-                  testing::AnyOf("image", isSlow ? "image" : "bundle"));
+      fakes.processLauncher.faults = faults;
+      if (!isSlow) fakes.extendedAttributes.faults = fakes.volumeCatalog.faults = faults;
+      EXPECT_THAT(trace(mounted), testing::AnyOf("image", isSlow ? "image" : "bundle"));
       faults->mend();
-      EXPECT_EQ(tracker.installSourceEntry()->eventIdentifier(), "image");
+      EXPECT_EQ(trace(mounted), "image");
     });
     EXPECT_GE(calls, isSlow ? 1u : 4u);
   }
@@ -286,16 +257,6 @@ TEST(DownloadSourceFilters, TheNewestIsTakenAndOfEquallyNewOnesTheFirst) {
   const auto all = [](const auto&) { return true; };
   EXPECT_EQ(filterEvent(entries, all)->eventIdentifier(), "b");
   EXPECT_FALSE(filterEvent(entries, [](const auto&) { return false; }));
-}
-
-TEST(SharedTracker, IsOneAndHoldsWhatClientsNeed) {
-  const auto tracker = KVDownloadSourceTracker::sharedTracker();
-  EXPECT_EQ(tracker, KVDownloadSourceTracker::sharedTracker());
-  EXPECT_EQ(tracker->quarantine()->path(), KVQuarantine::systemQuarantinePathV2());
-  EXPECT_EQ(tracker->userDefaults().get(), &ApplicationData::settings());
-  std::promise<std::thread::id> ran;
-  tracker->privateQueue()->execute([&] { ran.set_value(std::this_thread::get_id()); });
-  EXPECT_NE(ran.get_future().get(), std::this_thread::get_id());
 }
 
 }  // namespace

@@ -5,7 +5,6 @@
 
 #include <set>
 
-#include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Testing/FakeWorkspace.h>
 
 namespace Varnel {
@@ -58,14 +57,6 @@ TEST(FriendsLocator, EachProductAnswersForItselfAndItsFamily) {
       if (question.ask()) yes.insert(question.name);
     EXPECT_EQ(yes, expected) << installed;
   }
-}
-
-TEST(FriendsLocator, AsksTheProcessesWorkspaceUntilAnotherIsSet) {
-  OVFriendsLocator::sharedLocator().setWorkspace(nullptr);
-  EXPECT_EQ(OVFriendsLocator::workspace().get(), &Platform::processPorts().workspace.get());
-  const auto other = std::make_shared<Platform::Testing::FakeWorkspace>();
-  OVFriendsLocator::sharedLocator().setWorkspace(other);
-  EXPECT_EQ(OVFriendsLocator::workspace(), other);
 }
 
 }  // namespace

@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <sys/xattr.h>
-
 #include <filesystem>
 #include <stdexcept>
 #include <string>
@@ -38,11 +36,6 @@ inline std::string insertDownload(const std::string& identifier, const std::stri
   return "INSERT INTO LSQuarantineEvent VALUES (" + identifier +
          ", 600000000.5, 'org.example.browser', 'Browser', " + dataURL +
          ", 'Ada', 'ada@example.org', 2, 'Downloads', 'https://example.org/', x'00');";
-}
-
-/// Gives a file the attribute of a download; false where its file system keeps none.
-inline bool setQuarantineAttribute(const std::filesystem::path& file, const std::string& value) {
-  return ::setxattr(file.c_str(), "user.com.apple.quarantine", value.data(), value.size(), 0) == 0;
 }
 
 }  // namespace Varnel::Tests

@@ -1,12 +1,30 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <stdlib.h>
+#include <time.h>
+
 #include <string>
 #include <utility>
 
 #include <Varnel/Platform/Testing/FakeTimeZones.h>
 
 namespace Varnel::Tests {
+
+/// The process's time zone as TZ has it, until the object goes.
+class LocalZone final {
+ public:
+  explicit LocalZone(const char* variable) {
+    ::setenv("TZ", variable, 1);
+    ::tzset();
+  }
+  ~LocalZone() {
+    ::unsetenv("TZ");
+    ::tzset();
+  }
+  LocalZone(const LocalZone&) = delete;
+  LocalZone& operator=(const LocalZone&) = delete;
+};
 
 /// Three zones as they are in 2026 and the first weeks of 2027, the user in the one named.
 inline Platform::Testing::FakeTimeZones zonesOf2026(std::string local = "UTC") {

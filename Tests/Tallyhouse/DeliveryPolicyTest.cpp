@@ -1,12 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Tallyhouse/DeliveryPolicy.h>
 
-#include <algorithm>
-#include <functional>
-#include <numeric>
-#include <random>
-#include <vector>
-
 #include <gtest/gtest.h>
 
 namespace Tallyhouse {
@@ -56,50 +50,6 @@ TEST(DeliveryPolicy, RetriesBackOffAndHeedTheServerWithinReason) {
   for (const auto& c : cases)
     EXPECT_EQ(policy.retryDelay(c.failures, c.obstacle, c.retryAfter, c.random), c.delay)
         << c.failures << ' ' << c.random;
-}
-
-// How many times more installations send in the busiest minute after an outage of an hour than in
-// the mean of its busiest hour.
-double rushAfterAnHour(const std::function<DeliveryPolicy::Duration(
-                           int failures, DeliveryPolicy::Duration left, double random)>& delay) {
-  constexpr int installations = 200'000;
-  constexpr DeliveryPolicy::Duration outage = 1h;
-  std::minstd_rand engine(1);
-  std::uniform_real_distribution<double> random;
-  std::vector<int> minutes(4 * 60);
-  for (int i = 0; i < installations; ++i) {
-    auto next = std::chrono::duration_cast<DeliveryPolicy::Duration>(outage * random(engine));
-    for (int failures = 1; next < outage; ++failures)
-      next += delay(failures, outage - next, random(engine));
-    const auto minute = static_cast<std::size_t>((next - outage) / 1min);
-    if (minute < minutes.size()) ++minutes[minute];
-  }
-  const auto busiest = std::max_element(minutes.begin(), minutes.end());
-  const auto first = minutes.begin() + std::distance(minutes.begin(), busiest) / 60 * 60;
-  return *busiest * 60.0 / std::accumulate(first, first + 60, 0);
-}
-
-TEST(DeliveryPolicy, AFleetDoesNotComeBackInOneMinute) {
-  const DeliveryPolicy policy;
-  using Duration = DeliveryPolicy::Duration;
-  const auto seconds = [](Duration left) { return std::chrono::ceil<std::chrono::seconds>(left); };
-  const struct {
-    const char* what;
-    std::function<Duration(int failures, Duration left, double random)> delay;
-    double max;
-  } cases[] = {
-      {"it failed",
-       [&](int n, Duration, double r) { return policy.retryDelay(n, Obstacle::server, {}, r); }, 2},
-      {"it named its own end",
-       [&](int n, Duration left, double r) {
-         return policy.retryDelay(n, Obstacle::server, seconds(left), r);
-       },
-       3.2},
-  };
-  for (const auto& c : cases) {
-    const double rush = rushAfterAnHour(c.delay);
-    EXPECT_LT(rush, c.max) << c.what;
-  }
 }
 
 TEST(DeliveryPolicy, EventsWaitForCompanyButNotForAClockThatWasSetBack) {

@@ -113,18 +113,6 @@ TEST_F(DeliveryTest, ATimeOfflineEndsWithinAMinuteAndIsNotTheServersFault) {
   EXPECT_LE(reached[1] - reached[0], 30min);
 }
 
-TEST_F(DeliveryTest, WhatGotLostOnTheWayBackIsRepeatedUnderTheSameName) {
-  append(30);
-  int answers = 0;
-  http.setServer([&](const HTTPPost& post) -> Server::Answer {
-    const auto answer = server.take(post);
-    return ++answers % 2 ? Server::Answer(HTTPFailure{"cut"}) : answer;
-  });
-  run(24h);
-  EXPECT_EQ(server.timesSeen.size(), 30u);
-  EXPECT_EQ(names(), "");
-}
-
 TEST_F(DeliveryTest, OneBadEventIsSetAsideAndHoldsUpNoOther) {
   append(45);
   std::vector<std::pair<std::size_t, Date>> bad;
@@ -143,13 +131,6 @@ TEST_F(DeliveryTest, OneBadEventIsSetAsideAndHoldsUpNoOther) {
   append(1);
   run(24h);
   EXPECT_EQ(bad.size(), 3u) << "it is not tried again";
-}
-
-TEST_F(DeliveryTest, AServerThatRefusesEverythingIsNotHammered) {
-  append(100);
-  http.setServer([](const HTTPPost&) { return HTTPResponse{.status = 404, .retryAfter = {}}; });
-  run(24h);
-  EXPECT_LT(http.posts().size(), 30u);
 }
 
 TEST_F(DeliveryTest, WhatArrivedButCannotBeNotedIsNotRepeated) {
@@ -172,21 +153,6 @@ TEST_F(DeliveryTest, WhatArrivedButCannotBeNotedIsNotRepeated) {
   lock.reset();
   process.delivery.finish();
   EXPECT_EQ(names(), "") << "nor by the next run";
-}
-
-TEST_F(DeliveryTest, OneProcessDeliversUntilItHasNothingToDoOrDies) {
-  append(60);
-  auto one = std::make_unique<Process>(*this);
-  Process other(*this);
-  EXPECT_EQ(one->step(), Delivery::State::due);
-  EXPECT_EQ(other.step(), Delivery::State::elsewhere);
-  one.reset();
-  EXPECT_EQ(other.step(), Delivery::State::due);
-  EXPECT_EQ(other.step(), Delivery::State::idle);
-  one = std::make_unique<Process>(*this);
-  append(20);
-  EXPECT_EQ(one->step(), Delivery::State::idle);
-  EXPECT_EQ(http.posts().size(), 4u);
 }
 
 TEST_F(DeliveryTest, ALockThatNobodyCanTakeIsSaidOnce) {

@@ -7,7 +7,6 @@
 #include <functional>
 #include <future>
 
-#include <Tests/Support/Crew.h>
 #include <Tests/Tallyhouse/SpoolFixture.h>
 #include <Varnel/Platform/Testing/FaultyPrivateFiles.h>
 
@@ -230,30 +229,6 @@ TEST_F(EventSpoolTest, ARefusalThatTheFileDoesNotAllowYetIsMadeUpFor) {
   EXPECT_EQ(namesOf(*spool), "b ");
   append(*recorder, {"c"});
   EXPECT_EQ(namesOf(*spool), "b c ");
-}
-
-TEST_F(EventSpoolTest, ThreadsAndProcessesMayShareAFile) {
-  const auto one = openRecorder();
-  const auto other = openRecorder();
-  const auto spool = openSpool();
-  constexpr int each = 200;
-  Varnel::Tests::Crew threads(4, [&](unsigned i) {
-    for (int n = 0; n < each; ++n)
-      (i % 2 ? *one : *other).append(std::to_string(i) + '-' + std::to_string(n), clock.now(), "x");
-  });
-  std::size_t removed = 0;
-  while (removed < 2 * each) {
-    const auto batch = spool->waiting(20, many);
-    if (spool->save({batch, Verdict::delivered, clock.now(), {}})) removed += batch.size();
-    spool->file().checkpoint();
-    one->settle(Haste::none);
-    other->settle(Haste::none);
-  }
-  threads.join();
-  for (EventRecorder* recorder : {one.get(), other.get()})
-    EXPECT_FALSE(recorder->settle(Haste::none));
-  EXPECT_EQ(removed + spool->waiting(many, many).size(), 4u * each);
-  EXPECT_EQ(one->counts(3).dropped, 0);
 }
 
 }  // namespace

@@ -56,7 +56,8 @@ class DefaultContextQueue final : public MainQueue {
   bool isCurrent() const override { return ::syscall(SYS_gettid) == ::getpid(); }
 
   void run() override {
-    bool stops = std::exchange(stopsNextRun_, false);
+    bool stops = stopsAhead_ > 0;
+    if (stops) --stopsAhead_;
     running_.push_back(&stops);
     runWhile([&stops] { return !stops; });
     running_.pop_back();
@@ -67,7 +68,10 @@ class DefaultContextQueue final : public MainQueue {
       // The loop may run several blocks before a run looks at its end.
       const auto innermost = std::find_if(running_.rbegin(), running_.rend(),
                                           [](const bool* stops) { return !*stops; });
-      (innermost == running_.rend() ? stopsNextRun_ : **innermost) = true;
+      if (innermost == running_.rend())
+        ++stopsAhead_;
+      else
+        **innermost = true;
     });
   }
 
@@ -117,7 +121,7 @@ class DefaultContextQueue final : public MainQueue {
   std::deque<Block> blocks_;
   // The members below belong to the main thread.
   std::vector<bool*> running_;  // Whether each run is to end, the innermost last.
-  bool stopsNextRun_ = false;
+  int stopsAhead_ = 0;          // How many runs to come end at once.
   std::optional<ContextDescriptor> descriptor_;
 };
 

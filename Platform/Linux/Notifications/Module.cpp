@@ -16,6 +16,7 @@ NotificationServer* varnelMakeNotificationServer(SystemLog& systemLog,
 }
 
 DelivererConnection* varnelMakeNotifierConnection(const std::string& baseIdentifier,
+                                                  const std::string& store,
                                                   const MakeDeliverer& makeDeliverer) {
-  return new NotifierConnection(makeSessionBus(), baseIdentifier, makeDeliverer);
+  return new NotifierConnection(makeSessionBus(), baseIdentifier, store, makeDeliverer);
 }

@@ -21,5 +21,5 @@ varnelMakeNotificationServer(Varnel::Platform::SystemLog& systemLog,
                              std::chrono::milliseconds patience);
 
 extern "C" __attribute__((visibility("default"))) Varnel::Platform::DelivererConnection*
-varnelMakeNotifierConnection(const std::string& baseIdentifier,
+varnelMakeNotifierConnection(const std::string& baseIdentifier, const std::string& store,
                              const Varnel::Platform::Linux::MakeDeliverer& makeDeliverer);

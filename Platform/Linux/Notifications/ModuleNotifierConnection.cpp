@@ -20,8 +20,10 @@ namespace {
 class LoadedConnection final : public DelivererConnection,
                                public std::enable_shared_from_this<LoadedConnection> {
  public:
-  LoadedConnection(std::string baseIdentifier, MakeDeliverer makeDeliverer)
-      : baseIdentifier_(std::move(baseIdentifier)), makeDeliverer_(std::move(makeDeliverer)) {}
+  LoadedConnection(std::string baseIdentifier, std::string store, MakeDeliverer makeDeliverer)
+      : baseIdentifier_(std::move(baseIdentifier)),
+        store_(std::move(store)),
+        makeDeliverer_(std::move(makeDeliverer)) {}
 
   void setHost(std::weak_ptr<NotificationHost> host, Standing standing) override {
     host_ = host;
@@ -76,13 +78,14 @@ class LoadedConnection final : public DelivererConnection,
   void finish(void* function) {
     isLoading_ = false;
     connection_.reset(function ? reinterpret_cast<decltype(&varnelMakeNotifierConnection)>(
-                                     function)(baseIdentifier_, makeDeliverer_)
+                                     function)(baseIdentifier_, store_, makeDeliverer_)
                                : makeDeliverer_().release());
     connection_->setActive(isActive_);
     apply();
   }
 
   const std::string baseIdentifier_;
+  const std::string store_;
   const MakeDeliverer makeDeliverer_;
   std::unique_ptr<DelivererConnection> connection_;
   bool isLoading_ = false;
@@ -99,8 +102,10 @@ class LoadedConnection final : public DelivererConnection,
 }  // namespace
 
 std::shared_ptr<DelivererConnection> makeNotifierConnection(std::string baseIdentifier,
+                                                            std::string store,
                                                             MakeDeliverer makeDeliverer) {
-  return std::make_shared<LoadedConnection>(std::move(baseIdentifier), std::move(makeDeliverer));
+  return std::make_shared<LoadedConnection>(std::move(baseIdentifier), std::move(store),
+                                            std::move(makeDeliverer));
 }
 
 }  // namespace Varnel::Platform::Linux

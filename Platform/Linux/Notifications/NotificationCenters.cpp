@@ -62,7 +62,7 @@ class Center final {
  public:
   Center(const NotificationPorts& ports, const NotificationSource& source, const fs::path& store)
       : connection_(makeNotifierConnection(
-            source.identifier,
+            source.identifier, store.string(),
             [=] { return std::make_unique<LocalDeliverer>(ports, source, store); })),
         timer_(makeWallClockTimer(ports.systemLog)),
         center_({ports.clock, ports.userLocale, ports.timeZones, ports.privateFiles,

@@ -12,10 +12,10 @@ namespace {
 
 using Variant = UniqueHandle<GVariant*, g_variant_unref>;
 
-BusMessage changedMessage(const std::string& identifier) {
+BusMessage changedMessage(const std::string& store) {
   BusMessage message(
       g_dbus_message_new_method_call(notifierName, notifierPath, notifierName, "Changed"));
-  g_dbus_message_set_body(message.get(), g_variant_new("(s)", identifier.c_str()));
+  g_dbus_message_set_body(message.get(), g_variant_new("(^ay)", store.c_str()));
   return message;
 }
 
@@ -24,11 +24,12 @@ BusMessage changedMessage(const std::string& identifier) {
 // What replies and calls refer to, which may come after the connection's end.
 class NotifierConnection::Conversation final : public std::enable_shared_from_this<Conversation> {
  public:
-  Conversation(std::shared_ptr<SessionBus> bus, std::string identifier, MakeDeliverer makeDeliverer)
+  Conversation(std::shared_ptr<SessionBus> bus, const std::string& baseIdentifier,
+               std::string store, MakeDeliverer makeDeliverer)
       : bus_(std::move(bus)),
-        identifier_(std::move(identifier)),
-        hostName_(hostName(identifier_)),
-        frontName_(frontName(identifier_)),
+        store_(std::move(store)),
+        hostName_(hostName(baseIdentifier)),
+        frontName_(frontName(baseIdentifier)),
         makeDeliverer_(std::move(makeDeliverer)),
         notifiers_(bus_->watch(notifierName, [this](const auto&, const std::string& owner) {
           if (owner.empty()) notifierEnded();
@@ -45,8 +46,12 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
     bus_->serve({hostPath, hostInterface,
                  [weak](std::string_view method, GVariant* arguments, GDBusMethodInvocation* call) {
                    const auto self = weak.lock();
-                   g_dbus_method_invocation_return_value(
-                       call, self ? self->receive(method, arguments) : nullptr);
+                   const auto host = self ? self->host_.lock() : nullptr;
+                   // Whoever calls goes on as if this process were not there.
+                   if (!host)
+                     return g_dbus_method_invocation_return_dbus_error(
+                         call, "org.freedesktop.DBus.Error.Failed", "There is no host.");
+                   g_dbus_method_invocation_return_value(call, receive(*host, method, arguments));
                  }});
   }
 
@@ -92,17 +97,16 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
   bool isBusy() const { return pendingChanges_ > 0 || (replacement_ && replacement_->isBusy()); }
 
  private:
-  GVariant* receive(std::string_view method, GVariant* arguments) {
-    const auto host = host_.lock();
+  static GVariant* receive(NotificationHost& host, std::string_view method, GVariant* arguments) {
     const Variant dictionary(g_variant_get_child_value(arguments, 0));
     const UserNotification notification = notificationIn(dictionary.get());
     if (method == "ShouldPresent")
-      return g_variant_new("(b)", !host || host->shouldPresent(notification));
-    if (host && method == "DidDeliver") host->didDeliver(notification);
-    if (host && method == "DidActivate") {
+      return g_variant_new("(b)", static_cast<gboolean>(host.shouldPresent(notification)));
+    if (method == "DidDeliver") host.didDeliver(notification);
+    if (method == "DidActivate") {
       gboolean isActionButton = FALSE;
       g_variant_get_child(arguments, 1, "b", &isActionButton);
-      host->didActivate({notification, isActionButton != FALSE});
+      host.didActivate({notification, isActionButton != FALSE});
     }
     return nullptr;
   }
@@ -110,7 +114,7 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
   void tellChanged() {
     isChanged_ = false;
     ++pendingChanges_;
-    bus_->ask(changedMessage(identifier_), SessionBus::usualTime,
+    bus_->ask(changedMessage(store_), SessionBus::usualTime,
               [weak = weak_from_this()](GDBusMessage* reply, const BusFailure& failure) {
                 if (const auto self = weak.lock()) self->changeAnswered(reply, failure);
               });
@@ -152,14 +156,16 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
   // Waits in the bus's queue while somebody has the name who does not give way.
   void claimName() const {
     constexpr std::uint32_t givesWay = 1, takesOver = 2;
-    if (!host_.expired())
-      bus_->tell(messageToBus(
-          "RequestName", g_variant_new("(su)", hostName_.c_str(),
-                                       standing_ == Standing::onlooker ? givesWay : takesOver)));
+    bus_->tell(
+        host_.expired()
+            ? messageToBus("ReleaseName", g_variant_new("(s)", hostName_.c_str()))
+            : messageToBus("RequestName",
+                           g_variant_new("(su)", hostName_.c_str(),
+                                         standing_ == Standing::onlooker ? givesWay : takesOver)));
   }
 
   const std::shared_ptr<SessionBus> bus_;
-  const std::string identifier_;
+  const std::string store_;
   const std::string hostName_;
   const std::string frontName_;
   const MakeDeliverer makeDeliverer_;
@@ -174,9 +180,10 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
   const SessionBus::Subscription notifiers_;
 };
 
-NotifierConnection::NotifierConnection(std::shared_ptr<SessionBus> bus, std::string baseIdentifier,
+NotifierConnection::NotifierConnection(std::shared_ptr<SessionBus> bus,
+                                       const std::string& baseIdentifier, std::string store,
                                        MakeDeliverer makeDeliverer)
-    : conversation_(std::make_shared<Conversation>(std::move(bus), std::move(baseIdentifier),
+    : conversation_(std::make_shared<Conversation>(std::move(bus), baseIdentifier, std::move(store),
                                                    std::move(makeDeliverer))) {
   conversation_->start();
 }

@@ -18,9 +18,10 @@ namespace Varnel::Platform::Linux {
 /// onlooker leaves it to the application. Main thread only.
 class NotifierConnection final : public DelivererConnection {
  public:
-  /// `makeDeliverer` makes the one that takes the notifier's place. Nobody else observes the bus.
-  NotifierConnection(std::shared_ptr<SessionBus> bus, std::string baseIdentifier,
-                     MakeDeliverer makeDeliverer);
+  /// `store` is the file of the product's notifications. `makeDeliverer` makes the one that takes
+  /// the notifier's place. Nobody else observes the bus.
+  NotifierConnection(std::shared_ptr<SessionBus> bus, const std::string& baseIdentifier,
+                     std::string store, MakeDeliverer makeDeliverer);
   ~NotifierConnection() override;
 
   void setHost(std::weak_ptr<NotificationHost> host, Standing standing) override;

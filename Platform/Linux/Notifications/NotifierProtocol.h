@@ -16,11 +16,11 @@ namespace Varnel::Platform::Linux {
 inline constexpr const char* notifierName = "com.quennel.Varnel.Notifier1";
 inline constexpr const char* notifierPath = "/com/quennel/Varnel/Notifier";
 
-/// `Changed` tells that the store of the product with this base identifier has changed, and answers
-/// whether the notifier stays for it.
+/// `Changed` tells that the store with this path has changed, which the notifier's own environment
+/// may not lead to, and answers whether the notifier stays for it.
 inline constexpr const char* notifierInterface = R"(<node>
   <interface name='com.quennel.Varnel.Notifier1'>
-    <method name='Changed'><arg type='s' direction='in'/><arg type='b' direction='out'/></method>
+    <method name='Changed'><arg type='ay' direction='in'/><arg type='b' direction='out'/></method>
   </interface>
 </node>)";
 

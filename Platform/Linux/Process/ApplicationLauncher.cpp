@@ -99,7 +99,8 @@ class DesktopLauncher final : public ApplicationLauncher {
     const bool hasAction = lists(application->get(), launch.action);
     const bool isActivatable =
         g_desktop_app_info_get_boolean(application->get(), "DBusActivatable") &&
-        g_dbus_is_name(launch.desktopEntry.c_str());
+        g_dbus_is_name(launch.desktopEntry.c_str()) &&
+        !g_dbus_is_unique_name(launch.desktopEntry.c_str());
     if (!isActivatable) return answer(spawn(application->get(), launch, hasAction));
     bus_->ask(activation(launch, hasAction), SessionBus::usualTime,
               [application, launch, hasAction, answer = std::move(answer)](

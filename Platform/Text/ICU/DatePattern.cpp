@@ -64,7 +64,8 @@ class Pattern final : public LocaleLibrary::DatePattern {
 
   void setZone(std::unique_ptr<icu::TimeZone> zone) { format_.adoptTimeZone(zone.release()); }
 
-  std::string text(Date date) override {
+  // Formatting works on a copy of the calendar and changes nothing else.
+  std::string text(Date date) const override {
     icu::UnicodeString characters;
     std::string text;
     return format_.format(icuDate(date), characters).toUTF8String(text);

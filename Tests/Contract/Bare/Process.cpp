@@ -4,11 +4,8 @@
 
 namespace Varnel::Platform::Contract {
 
-INSTANTIATE_TEST_SUITE_P(Bare, ProcessInfoContract,
-                         ProcessInfoContract::on<OwnProcess<Bare::makeProcessInfo>>());
-INSTANTIATE_TEST_SUITE_P(Bare, StandardOutputContract,
-                         StandardOutputContract::on<Output<Bare::makeStandardOutput>>());
-INSTANTIATE_TEST_SUITE_P(BareErrors, StandardOutputContract,
-                         StandardOutputContract::on<Output<makeStandardErrorOutput>>());
+INSTANTIATE_TEST_SUITE_P(Bare, ProcessInfoContract, on<OwnProcess<Bare::makeProcessInfo>>());
+INSTANTIATE_TEST_SUITE_P(Bare, StandardOutputContract, on<Output<Bare::makeStandardOutput>>());
+INSTANTIATE_TEST_SUITE_P(BareErrors, StandardOutputContract, on<Output<makeStandardErrorOutput>>());
 
 }  // namespace Varnel::Platform::Contract

@@ -5,6 +5,6 @@
 namespace Varnel::Platform::Contract {
 
 INSTANTIATE_TEST_SUITE_P(Bare, UserDefaultsContract,
-                         UserDefaultsContract::on<UserFolders<Bare::makeApplicationStorage>>());
+                         on<UserFolders<Bare::makeApplicationStorage>>());
 
 }  // namespace Varnel::Platform::Contract

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/CookieStorageContract.h>
+#include <Tests/Contract/UserWorlds.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Generic/SQLiteCookieStorage.h>
 #include <Varnel/Platform/SQLite/SQLiteDatabase.h>
@@ -10,7 +10,7 @@ namespace {
 
 class CookieFiles final : public CookieStorageWorld {
  public:
-  CookieStorage& storage() override { return storage_; }
+  CookieStorage& port() override { return storage_; }
   void fillOwn(const std::vector<Cookie>& cookies) override { fill("own", cookies); }
   void fillGroup(const std::string& identifier, const std::vector<Cookie>& cookies) override {
     fill("group-containers/" + identifier, cookies);
@@ -40,7 +40,7 @@ class CookieFiles final : public CookieStorageWorld {
   Testing::SimulatedClock clock_;
   SQLiteCookieStorage storage_{folder_.path(), "own", clock_};
 };
-INSTANTIATE_TEST_SUITE_P(Generic, CookieStorageContract, CookieStorageContract::on<CookieFiles>());
+INSTANTIATE_TEST_SUITE_P(Generic, CookieStorageContract, on<CookieFiles>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/SoundPlayerContract.h>
+#include <Tests/Contract/MainLoopWorlds.h>
 #include <Varnel/Platform/Generic/BackgroundSoundPlayer.h>
 #include <Varnel/Platform/Testing/FakeMainQueue.h>
 
@@ -19,7 +19,7 @@ struct ShortOutput final : SoundOutput {
 
 class BackgroundWorld final : public SoundPlayerWorld {
  public:
-  SoundPlayer& player() override { return player_; }
+  SoundPlayer& port() override { return player_; }
   std::string sound() override { return whole; }
   std::string damagedSound() override { return sound() + "?"; }
   std::string noSound() override { return "no sound at all"; }
@@ -31,9 +31,7 @@ class BackgroundWorld final : public SoundPlayerWorld {
   Testing::FakeMainQueue queue_;
   BackgroundSoundPlayer player_{queue_, [] { return std::make_unique<ShortOutput>(); }};
 };
-
-INSTANTIATE_TEST_SUITE_P(Background, SoundPlayerContract,
-                         SoundPlayerContract::on<BackgroundWorld>());
+INSTANTIATE_TEST_SUITE_P(Background, SoundPlayerContract, on<BackgroundWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -3,7 +3,7 @@
 
 #include <Tests/Contract/MainLoopWorlds.h>
 #include <Tests/Contract/UserWorlds.h>
-#include <Tests/Support/LocalZone.h>
+#include <Tests/Support/Zones.h>
 #include <Varnel/Platform/Generic/HostedApplication.h>
 #include <Varnel/Platform/Ports/Ports.h>
 
@@ -11,20 +11,13 @@
 namespace Varnel::Platform::Contract {
 namespace {
 
-class HostedWorld final : public ApplicationWorld {
- public:
-  Application& application() override { return application_; }
+INSTANTIATE_TEST_SUITE_P(Hosted, ApplicationContract, on<HostedApplication>());
 
- private:
-  HostedApplication application_;
-};
-INSTANTIATE_TEST_SUITE_P(Hosted, ApplicationContract, ApplicationContract::on<HostedWorld>());
-
-class SystemQueue final : public MainQueueWorld {
+class SystemQueue final : public WorldOf<MainQueue> {
  public:
-  MainQueue& queue() override { return systemPorts().mainQueue; }
+  MainQueue& port() override { return systemPorts().mainQueue; }
 };
-INSTANTIATE_TEST_SUITE_P(System, MainQueueContract, MainQueueContract::on<SystemQueue>());
+INSTANTIATE_TEST_SUITE_P(System, MainQueueContract, on<SystemQueue>());
 
 class SystemZones final : public TimeZonesWorld {
  public:
@@ -32,14 +25,14 @@ class SystemZones final : public TimeZonesWorld {
     const Tests::LocalZone berlin("Europe/Berlin");
     return zones_.localIdentifier() == "UTC" ? "The system has no table of time zones." : "";
   }
-  TimeZones& zones() override { return zones_; }
+  TimeZones& port() override { return zones_; }
   void moveUser(const std::string& zone) override { local_.emplace(zone.c_str()); }
 
  private:
   TimeZones& zones_ = systemPorts().timeZones;
   std::optional<Tests::LocalZone> local_;
 };
-INSTANTIATE_TEST_SUITE_P(System, TimeZonesContract, TimeZonesContract::on<SystemZones>());
+INSTANTIATE_TEST_SUITE_P(System, TimeZonesContract, on<SystemZones>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

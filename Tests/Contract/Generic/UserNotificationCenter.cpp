@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/UserNotificationCenterContract.h>
+#include <Tests/Contract/NotificationWorlds.h>
 #include <Tests/Reminders/CenterProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Generic/NotificationStore.h>
@@ -9,7 +9,7 @@ namespace {
 
 class StoredCenter final : public UserNotificationCenterWorld {
  public:
-  UserNotificationCenter& center() override { return process_.center; }
+  UserNotificationCenter& port() override { return process_.center; }
   Date now() override { return process_.clock.now(); }
   void pass(std::chrono::seconds time) override {
     process_.timer.advanceTo(now() + time);
@@ -33,8 +33,7 @@ class StoredCenter final : public UserNotificationCenterWorld {
   const std::string store_ = folder_.path() / "store.sqlite";
   Testing::Process process_{store_, std::chrono::sys_days(std::chrono::year(2026) / 3 / 1)};
 };
-INSTANTIATE_TEST_SUITE_P(Generic, UserNotificationCenterContract,
-                         UserNotificationCenterContract::on<StoredCenter>());
+INSTANTIATE_TEST_SUITE_P(Generic, UserNotificationCenterContract, on<StoredCenter>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

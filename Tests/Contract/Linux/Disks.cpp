@@ -17,7 +17,7 @@ namespace fs = std::filesystem;
 
 class SysfsDisks final : public DeviceRegistryWorld {
  public:
-  DeviceRegistry& registry() override { return *registry_; }
+  DeviceRegistry& port() override { return *registry_; }
   void plug(const std::string& name, const std::string& serial) override {
     const std::string above = "pci0/" + name;
     machine_.setSubsystem(above, "virtio");
@@ -37,7 +37,7 @@ class SysfsDisks final : public DeviceRegistryWorld {
   Tests::SysfsMachine machine_;
   const std::unique_ptr<DeviceRegistry> registry_ = Linux::makeDeviceRegistry(machine_.folder());
 };
-INSTANTIATE_TEST_SUITE_P(Linux, DeviceRegistryContract, DeviceRegistryContract::on<SysfsDisks>());
+INSTANTIATE_TEST_SUITE_P(Linux, DeviceRegistryContract, on<SysfsDisks>());
 
 // The disk that the temporary folder lies on. Binding a folder mounts its disk in another place.
 class BoundFolders final : public DiskArbitrationWorld {
@@ -51,7 +51,7 @@ class BoundFolders final : public DiskArbitrationWorld {
     if (std::string reason = Tests::enterMountNamespace(); !reason.empty()) return reason;
     return name_.empty() ? "The temporary folder lies on no disk." : "";
   }
-  DiskArbitration& disks() override { return *disks_; }
+  DiskArbitration& port() override { return *disks_; }
   std::string disk() override { return name_; }
   URL mount(const std::string& name) override {
     const fs::path place = folder_.path() / name;
@@ -78,13 +78,12 @@ class BoundFolders final : public DiskArbitrationWorld {
       Linux::makeDiskArbitration(Linux::makeMountTable());
   bool isLost_ = false;
 };
-INSTANTIATE_TEST_SUITE_P(Linux, DiskArbitrationContract,
-                         DiskArbitrationContract::on<BoundFolders>());
+INSTANTIATE_TEST_SUITE_P(Linux, DiskArbitrationContract, on<BoundFolders>());
 
 class MountedMemory final : public VolumeCatalogWorld {
  public:
   [[nodiscard]] std::string obstacle() const override { return Tests::enterMountNamespace(); }
-  VolumeCatalog& catalog() override { return *catalog_; }
+  VolumeCatalog& port() override { return *catalog_; }
   std::string folder(const std::string& name) override {
     std::filesystem::create_directory(folder_.path() / name);
     return folder_.path() / name;
@@ -96,7 +95,7 @@ class MountedMemory final : public VolumeCatalogWorld {
   const Tests::TemporaryFolder folder_;
   const std::unique_ptr<VolumeCatalog> catalog_ = Linux::makeVolumeCatalog(Linux::makeMountTable());
 };
-INSTANTIATE_TEST_SUITE_P(Linux, VolumeCatalogContract, VolumeCatalogContract::on<MountedMemory>());
+INSTANTIATE_TEST_SUITE_P(Linux, VolumeCatalogContract, on<MountedMemory>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/NotificationServerContract.h>
+#include <Tests/Contract/NotificationWorlds.h>
 
 #include <gio/gio.h>
 
@@ -136,7 +136,7 @@ class LinuxWorld final : public NotificationServerWorld {
   [[nodiscard]] std::string obstacle() const override {
     return bus_ ? "" : "There is no program dbus-daemon.";
   }
-  NotificationServer& server() override { return *server_; }
+  NotificationServer& port() override { return *server_; }
   std::vector<Banner> banners() override { return desktop_->banners(); }
   void activate(const std::string& title) override { desktop_->activate(title); }
   void dismiss(const std::string& title) override {
@@ -157,9 +157,7 @@ class LinuxWorld final : public NotificationServerWorld {
   std::optional<Desktop> desktop_;
   const std::unique_ptr<NotificationServer> server_ = Linux::makeNotificationServer(log_, {});
 };
-
-INSTANTIATE_TEST_SUITE_P(Linux, NotificationServerContract,
-                         NotificationServerContract::on<LinuxWorld>());
+INSTANTIATE_TEST_SUITE_P(Linux, NotificationServerContract, on<LinuxWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

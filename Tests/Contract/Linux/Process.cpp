@@ -6,9 +6,9 @@
 namespace Varnel::Platform::Contract {
 namespace {
 
-class SpawnedPrograms final : public ProcessLauncherWorld {
+class SpawnedPrograms final
+    : public AdapterColumn<ProcessLauncherWorld, Linux::makeProcessLauncher> {
  public:
-  ProcessLauncher& launcher() override { return *launcher_; }
   Program thatPrints(const std::string& text) override {
     return {"/bin/cat", {folder_.write("text", text)}};
   }
@@ -18,30 +18,19 @@ class SpawnedPrograms final : public ProcessLauncherWorld {
 
  private:
   const Tests::TemporaryFolder folder_;
-  const std::unique_ptr<ProcessLauncher> launcher_ = Linux::makeProcessLauncher();
 };
-INSTANTIATE_TEST_SUITE_P(Linux, ProcessLauncherContract,
-                         ProcessLauncherContract::on<SpawnedPrograms>());
+INSTANTIATE_TEST_SUITE_P(Linux, ProcessLauncherContract, on<SpawnedPrograms>());
 
-class ThreadPriority final : public ReadingPriorityWorld {
- public:
-  ReadingPriority& priority() override { return *priority_; }
-
- private:
-  const std::unique_ptr<ReadingPriority> priority_ = Linux::makeReadingPriority();
-};
-INSTANTIATE_TEST_SUITE_P(Linux, ReadingPriorityContract,
-                         ReadingPriorityContract::on<ThreadPriority>());
+using ThreadPriority = AdapterColumn<WorldOf<ReadingPriority>, Linux::makeReadingPriority>;
+INSTANTIATE_TEST_SUITE_P(Linux, ReadingPriorityContract, on<ThreadPriority>());
 
 std::unique_ptr<ProcessInfo> makeProcess() {
   return Linux::makeProcessInfo();
 }
-INSTANTIATE_TEST_SUITE_P(Linux, ProcessInfoContract,
-                         ProcessInfoContract::on<OwnProcess<makeProcess>>());
-INSTANTIATE_TEST_SUITE_P(Linux, StandardOutputContract,
-                         StandardOutputContract::on<Output<Linux::makeStandardOutput>>());
+INSTANTIATE_TEST_SUITE_P(Linux, ProcessInfoContract, on<OwnProcess<makeProcess>>());
+INSTANTIATE_TEST_SUITE_P(Linux, StandardOutputContract, on<Output<Linux::makeStandardOutput>>());
 INSTANTIATE_TEST_SUITE_P(LinuxErrors, StandardOutputContract,
-                         StandardOutputContract::on<Output<makeStandardErrorOutput>>());
+                         on<Output<makeStandardErrorOutput>>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

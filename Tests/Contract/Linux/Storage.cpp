@@ -14,7 +14,8 @@ namespace Varnel::Platform::Contract {
 namespace {
 
 // The file is reached by a link, which is followed.
-class UserAttributes final : public ExtendedAttributesWorld {
+class UserAttributes final
+    : public AdapterColumn<ExtendedAttributesWorld, Linux::makeExtendedAttributes> {
  public:
   UserAttributes() { std::filesystem::create_symlink(file_, path()); }
   std::string obstacle() const override {
@@ -22,7 +23,6 @@ class UserAttributes final : public ExtendedAttributesWorld {
                ? ""
                : "The file system of " + file_ + " keeps no attributes.";
   }
-  ExtendedAttributes& attributes() override { return *attributes_; }
   std::string path() override { return folder_.path() / "link"; }
   void set(const std::string& name, const std::string& value) override {
     ASSERT_EQ(::setxattr(file_.c_str(), ("user." + name).c_str(), value.data(), value.size(), 0),
@@ -34,15 +34,13 @@ class UserAttributes final : public ExtendedAttributesWorld {
  private:
   const Tests::TemporaryFolder folder_;
   const std::string file_ = folder_.write("file", "");
-  const std::unique_ptr<ExtendedAttributes> attributes_ = Linux::makeExtendedAttributes();
 };
-INSTANTIATE_TEST_SUITE_P(Linux, ExtendedAttributesContract,
-                         ExtendedAttributesContract::on<UserAttributes>());
+INSTANTIATE_TEST_SUITE_P(Linux, ExtendedAttributesContract, on<UserAttributes>());
 
 class HomeTrash final : public TrashWorld {
  public:
   HomeTrash() { ::setenv("XDG_DATA_HOME", (home_.path() / "data").c_str(), 1); }
-  Trash& trash() override { return *trash_; }
+  Trash& port() override { return *trash_; }
   std::string folder() override { return home_.path() / "files"; }
   void write(const std::string& path, std::size_t size) override {
     home_.write(path, std::string(size, 'x'));
@@ -64,10 +62,10 @@ class HomeTrash final : public TrashWorld {
   Testing::FakeTimeZones zones_;
   const std::unique_ptr<Trash> trash_ = Linux::makeTrash(*files_, clock_, zones_);
 };
-INSTANTIATE_TEST_SUITE_P(Linux, TrashContract, TrashContract::on<HomeTrash>());
+INSTANTIATE_TEST_SUITE_P(Linux, TrashContract, on<HomeTrash>());
 
 INSTANTIATE_TEST_SUITE_P(Linux, UserDefaultsContract,
-                         UserDefaultsContract::on<UserFolders<Linux::makeApplicationStorage>>());
+                         on<UserFolders<Linux::makeApplicationStorage>>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

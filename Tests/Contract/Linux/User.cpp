@@ -15,7 +15,7 @@ namespace fs = std::filesystem;
 // A machine made of files.
 class MachineOfFiles final : public MachineIdentityWorld {
  public:
-  MachineIdentity& machine() override { return *machine_; }
+  MachineIdentity& port() override { return *machine_; }
   void identify(const std::string& uuid, const std::string& serial) override {
     folder_.write("etc/machine-id", uuid + "\n");
     folder_.write("sys/class/dmi/id/product_serial", serial + "\n");
@@ -38,11 +38,10 @@ class MachineOfFiles final : public MachineIdentityWorld {
   const Tests::TemporaryFolder folder_;
   const std::unique_ptr<MachineIdentity> machine_ = Linux::makeMachineIdentity(folder_.path());
 };
-INSTANTIATE_TEST_SUITE_P(Linux, MachineIdentityContract,
-                         MachineIdentityContract::on<MachineOfFiles>());
+INSTANTIATE_TEST_SUITE_P(Linux, MachineIdentityContract, on<MachineOfFiles>());
 
 // The folders of desktop entries are read once a process.
-class DesktopEntries final : public WorkspaceWorld {
+class DesktopEntries final : public AdapterColumn<WorkspaceWorld, Linux::makeWorkspace> {
  public:
   DesktopEntries() {
     ::setenv("XDG_DATA_HOME", (folder_.path() / "user").c_str(), 1);
@@ -51,7 +50,6 @@ class DesktopEntries final : public WorkspaceWorld {
   [[nodiscard]] std::string obstacle() const override {
     return g_get_user_data_dir() == folder_.path() / "user" ? "" : "A process can do this once.";
   }
-  Workspace& workspace() override { return *workspace_; }
   URL install(const std::string& identifier, bool hasBundle) override {
     const fs::path program = folder_.write(fs::path(identifier) / "app", "");
     fs::permissions(program, fs::perms::owner_all);
@@ -71,9 +69,8 @@ class DesktopEntries final : public WorkspaceWorld {
   }
 
   const Tests::TemporaryFolder folder_;
-  const std::unique_ptr<Workspace> workspace_ = Linux::makeWorkspace();
 };
-INSTANTIATE_TEST_SUITE_P(Linux, WorkspaceContract, WorkspaceContract::on<DesktopEntries>());
+INSTANTIATE_TEST_SUITE_P(Linux, WorkspaceContract, on<DesktopEntries>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

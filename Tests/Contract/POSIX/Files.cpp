@@ -7,12 +7,11 @@
 namespace Varnel::Platform::Contract {
 namespace {
 
-class OpenFiles final : public AppendFilesWorld {
+class OpenFiles final : public AdapterColumn<AppendFilesWorld, POSIX::makeAppendFiles> {
  public:
   std::string obstacle() const override {
     return std::filesystem::exists(full) ? "" : "no device that is full";
   }
-  AppendFiles& files() override { return *files_; }
   std::string path() override { return folder_.path() / "log"; }
   std::string text() override { return readFile(path()).valueOr(""); }
   std::string pathOnAFullDisk() override { return full; }
@@ -21,22 +20,14 @@ class OpenFiles final : public AppendFilesWorld {
  private:
   static constexpr const char* full = "/dev/full";
   const Tests::TemporaryFolder folder_;
-  const std::unique_ptr<AppendFiles> files_ = POSIX::makeAppendFiles();
 };
-INSTANTIATE_TEST_SUITE_P(POSIX, AppendFilesContract, AppendFilesContract::on<OpenFiles>());
+INSTANTIATE_TEST_SUITE_P(POSIX, AppendFilesContract, on<OpenFiles>());
 
-class OwnFiles final : public PrivateFilesWorld {
+using OwnFiles = AdapterColumn<WorldOf<PrivateFiles>, POSIX::makePrivateFiles>;
+INSTANTIATE_TEST_SUITE_P(POSIX, PrivateFilesContract, on<OwnFiles>());
+
+class FileRights final : public AdapterColumn<SecurityScopeWorld, POSIX::makeSecurityScope> {
  public:
-  PrivateFiles& files() override { return *files_; }
-
- private:
-  const std::unique_ptr<PrivateFiles> files_ = POSIX::makePrivateFiles();
-};
-INSTANTIATE_TEST_SUITE_P(POSIX, PrivateFilesContract, PrivateFilesContract::on<OwnFiles>());
-
-class FileRights final : public SecurityScopeWorld {
- public:
-  SecurityScope& scope() override { return *scope_; }
   URL readable(bool isFolder) override {
     return URL::fileURLWithPath(isFolder ? folder_.path().string() + "/"
                                          : folder_.write("file", "").string());
@@ -45,9 +36,8 @@ class FileRights final : public SecurityScopeWorld {
 
  private:
   const Tests::TemporaryFolder folder_;
-  const std::unique_ptr<SecurityScope> scope_ = POSIX::makeSecurityScope();
 };
-INSTANTIATE_TEST_SUITE_P(POSIX, SecurityScopeContract, SecurityScopeContract::on<FileRights>());
+INSTANTIATE_TEST_SUITE_P(POSIX, SecurityScopeContract, on<FileRights>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

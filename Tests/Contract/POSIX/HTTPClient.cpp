@@ -8,9 +8,8 @@
 namespace Varnel::Platform::Contract {
 namespace {
 
-class CurlModule final : public HTTPClientWorld {
+class CurlModule final : public AdapterColumn<HTTPClientWorld, POSIX::makeHTTPClient> {
  public:
-  HTTPClient& client() override { return *client_; }
   std::string serve(const std::vector<std::string>& answers) override {
     return server_.emplace(answers).url();
   }
@@ -19,9 +18,8 @@ class CurlModule final : public HTTPClientWorld {
 
  private:
   std::optional<Tests::AnalyticsServer> server_;
-  const std::unique_ptr<HTTPClient> client_ = POSIX::makeHTTPClient();
 };
-INSTANTIATE_TEST_SUITE_P(POSIX, HTTPClientContract, HTTPClientContract::on<CurlModule>());
+INSTANTIATE_TEST_SUITE_P(POSIX, HTTPClientContract, on<CurlModule>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -8,23 +8,18 @@
 namespace Varnel::Platform::Contract {
 namespace {
 
-class PasswdAccount final : public UserAccountWorld {
+class PasswdAccount final : public AdapterColumn<UserAccountWorld, POSIX::makeUserAccount> {
  public:
-  UserAccount& account() override { return *account_; }
   void moveHome(const std::string& path) override { ::setenv("HOME", path.c_str(), 1); }
-
- private:
-  const std::unique_ptr<UserAccount> account_ = POSIX::makeUserAccount();
 };
-INSTANTIATE_TEST_SUITE_P(POSIX, UserAccountContract, UserAccountContract::on<PasswdAccount>());
+INSTANTIATE_TEST_SUITE_P(POSIX, UserAccountContract, on<PasswdAccount>());
 
-class EnvironmentLocale final : public UserLocaleWorld {
+class EnvironmentLocale final : public AdapterColumn<UserLocaleWorld, POSIX::makeUserLocale> {
  public:
   EnvironmentLocale() {
     for (const char* name : {"LANG", "LANGUAGE", "LC_ALL", "LC_MESSAGES", "LC_NUMERIC", "LC_TIME"})
       ::unsetenv(name);
   }
-  UserLocale& locale() override { return *locale_; }
   void choose(const std::vector<std::string>& languages, const std::string& dates,
               const std::string& numbers) override {
     std::string list;
@@ -35,11 +30,8 @@ class EnvironmentLocale final : public UserLocaleWorld {
     ::setenv("LC_TIME", dates.c_str(), 1);
     ::setenv("LC_NUMERIC", numbers.c_str(), 1);
   }
-
- private:
-  const std::unique_ptr<UserLocale> locale_ = POSIX::makeUserLocale();
 };
-INSTANTIATE_TEST_SUITE_P(POSIX, UserLocaleContract, UserLocaleContract::on<EnvironmentLocale>());
+INSTANTIATE_TEST_SUITE_P(POSIX, UserLocaleContract, on<EnvironmentLocale>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

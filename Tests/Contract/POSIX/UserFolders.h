@@ -3,7 +3,7 @@
 
 #include <cstdlib>
 
-#include <Tests/Contract/UserDefaultsContract.h>
+#include <Tests/Contract/UserWorlds.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/Ports/PrivateFiles.h>
@@ -19,7 +19,7 @@ class UserFolders final : public UserDefaultsWorld {
     for (const char* variable : {"XDG_CONFIG_HOME", "XDG_STATE_HOME"})
       ::setenv(variable, home_.path().c_str(), 1);
   }
-  ApplicationStorage& storage() override { return *storage_; }
+  ApplicationStorage& port() override { return *storage_; }
   ApplicationStorage& storageOfAnother() override { return *another_; }
 
  private:

@@ -1,9 +1,11 @@
 // SPDX-License-Identifier: MIT
 #include <syslog.h>
+#include <time.h>
 
 #include <cstdarg>
 #include <cstdio>
 
+#include <Tests/Contract/MainLoopWorlds.h>
 #include <Tests/Contract/ProcessWorlds.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 
@@ -28,16 +30,22 @@ extern "C" void syslog(int priority, const char* format, ...) {
 namespace Varnel::Platform::Contract {
 namespace {
 
-class Syslog final : public SystemLogWorld {
+class Syslog final : public AdapterColumn<SystemLogWorld, POSIX::makeSystemLog> {
  public:
   Syslog() { written.clear(); }
-  SystemLog& log() override { return *log_; }
   std::string text() override { return written; }
-
- private:
-  const std::unique_ptr<SystemLog> log_ = POSIX::makeSystemLog();
 };
-INSTANTIATE_TEST_SUITE_P(POSIX, SystemLogContract, SystemLogContract::on<Syslog>());
+INSTANTIATE_TEST_SUITE_P(POSIX, SystemLogContract, on<Syslog>());
+
+class POSIXClock final : public AdapterColumn<ClockWorld, POSIX::makeClock> {
+ public:
+  void pass() override {
+    const Date before = port_->now();
+    while (port_->now() == before) continue;
+    EXPECT_LE(std::abs(std::chrono::system_clock::to_time_t(port_->now()) - ::time(nullptr)), 60);
+  }
+};
+INSTANTIATE_TEST_SUITE_P(POSIX, ClockContract, on<POSIXClock>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include <Tests/Contract/SoundPlayerContract.h>
+#include <Tests/Contract/MainLoopWorlds.h>
 
 #include <signal.h>
 #include <stdlib.h>
@@ -38,7 +38,7 @@ class LinuxWorld final : public SoundPlayerWorld {
     EXPECT_EQ(log_.text(), "");
     EXPECT_EQ(blockedSignals(), signals_) << "some sinks change those of the thread they are on";
   }
-  SoundPlayer& player() override { return *player_; }
+  SoundPlayer& port() override { return *player_; }
   // 400 samples of silence, 8000 a second.
   std::string sound() override {
     std::string bytes(
@@ -59,8 +59,24 @@ class LinuxWorld final : public SoundPlayerWorld {
   Testing::CapturedSystemLog log_;
   const std::unique_ptr<SoundPlayer> player_ = Linux::makeSoundPlayer(log_, *queue_);
 };
+INSTANTIATE_TEST_SUITE_P(Linux, SoundPlayerContract, on<LinuxWorld>());
 
-INSTANTIATE_TEST_SUITE_P(Linux, SoundPlayerContract, SoundPlayerContract::on<LinuxWorld>());
+class LinuxTimers final : public WallClockTimerWorld {
+ public:
+  std::unique_ptr<WallClockTimer> timer() override { return Linux::makeWallClockTimer(log_); }
+  Date now() override {
+    return std::chrono::floor<Date::duration>(std::chrono::system_clock::now());
+  }
+  void passUntil(const std::function<bool()>& condition) override {
+    const auto holds = [&] { return !condition(); };
+    EXPECT_TRUE(queue_->runWhile(holds, std::chrono::seconds(30))) << log_.text();
+  }
+
+ private:
+  const std::unique_ptr<MainQueue> queue_ = Linux::makeMainQueue();
+  Testing::CapturedSystemLog log_;
+};
+INSTANTIATE_TEST_SUITE_P(Linux, WallClockTimerContract, on<LinuxTimers>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract
