@@ -45,9 +45,8 @@ class SecurityScopeWorld : public WorldOf<SecurityScope> {
 using SecurityScopeContract = Suite<SecurityScopeWorld>;
 
 /// A disk with a trash, and a folder on it.
-class TrashWorld : public World {
+class TrashWorld : public WorldOf<Trash> {
  public:
-  virtual Trash& trash() = 0;
   virtual std::string folder() = 0;
   /// Makes a file, and its folder, with so many bytes; each is another than all before.
   virtual void write(const std::string& path, std::size_t size) = 0;

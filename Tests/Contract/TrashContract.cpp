@@ -16,7 +16,7 @@ bool always(const TrashedFile&) {
 }
 
 TEST_P(TrashContract, TakesFilesAndGivesBackThoseVeryOnes) {
-  Trash& trash = world->trash();
+  Trash& trash = world->port();
   std::vector<TrashedFile> gone;
   std::vector<std::string> folders{"/a", "/b", "/c"};
   for (std::size_t i = 0; i < folders.size(); ++i) {
@@ -48,7 +48,7 @@ TEST_P(TrashContract, TakesFilesAndGivesBackThoseVeryOnes) {
 }
 
 TEST_P(TrashContract, TakesNoFileButTheOneExpected) {
-  Trash& trash = world->trash();
+  Trash& trash = world->port();
   const std::string path = world->folder() + "/a";
   world->write(path, 5);
   const FileState state = *trash.state(path);
@@ -79,7 +79,7 @@ TEST_P(TrashContract, TakesNoFileButTheOneExpected) {
 }
 
 TEST_P(TrashContract, PutsBackWithoutReplacingAnything) {
-  Trash& trash = world->trash();
+  Trash& trash = world->port();
   const std::string path = world->folder() + "/sub/a";
   world->write(path, 5);
   const TrashedFile file = *trash.move(path, *trash.state(path), always);
@@ -102,28 +102,26 @@ TEST_P(TrashContract, PutsBackWithoutReplacingAnything) {
   EXPECT_EQ(trash.state(path)->size, 7u);
 }
 
-class FakeWorld final : public TrashWorld {
+class FakeTrashWorld final : public FakeColumn<TrashWorld, Testing::FakeTrash> {
  public:
-  FakeWorld() { trash_.foldersWithoutTrash = {"/network"}; }
-  Trash& trash() override { return trash_; }
+  FakeTrashWorld() { port_.foldersWithoutTrash = {"/network"}; }
   std::string folder() override { return "/home"; }
   void write(const std::string& path, std::size_t size) override {
-    trash_.files[path] = {.inode = ++inode_, .size = size};
+    port_.files[path] = {.inode = ++inode_, .size = size};
   }
-  bool exists(const std::string& path) override { return trash_.files.contains(path); }
+  bool exists(const std::string& path) override { return port_.files.contains(path); }
   void remove(const std::string& folder) override {
-    trash_.missingFolders.insert(folder);
-    std::erase_if(trash_.files,
+    port_.missingFolders.insert(folder);
+    std::erase_if(port_.files,
                   [&](const auto& file) { return file.first.starts_with(folder + "/"); });
   }
-  void empty(const TrashedFile& file) override { std::erase(trash_.trashed, file); }
+  void empty(const TrashedFile& file) override { std::erase(port_.trashed, file); }
   std::string pathWithoutTrash() override { return "/network/file"; }
 
  private:
-  Testing::FakeTrash trash_;
   std::uint64_t inode_ = 0;
 };
-INSTANTIATE_TEST_SUITE_P(Fake, TrashContract, on<FakeWorld>());
+INSTANTIATE_TEST_SUITE_P(Fake, TrashContract, on<FakeTrashWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -40,7 +40,7 @@ INSTANTIATE_TEST_SUITE_P(Linux, ExtendedAttributesContract, on<UserAttributes>()
 class HomeTrash final : public TrashWorld {
  public:
   HomeTrash() { ::setenv("XDG_DATA_HOME", (home_.path() / "data").c_str(), 1); }
-  Trash& trash() override { return *trash_; }
+  Trash& port() override { return *trash_; }
   std::string folder() override { return home_.path() / "files"; }
   void write(const std::string& path, std::size_t size) override {
     home_.write(path, std::string(size, 'x'));
