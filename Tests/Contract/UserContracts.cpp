@@ -7,6 +7,7 @@
 #include <utility>
 
 #include <Tests/Support/Zones.h>
+#include <Varnel/Platform/Testing/FakeApplicationLauncher.h>
 #include <Varnel/Platform/Testing/FakeCookieStorage.h>
 #include <Varnel/Platform/Testing/FakeMachineIdentity.h>
 #include <Varnel/Platform/Testing/FakeUser.h>
@@ -17,6 +18,7 @@ namespace {
 
 using namespace std::chrono;
 using namespace std::chrono_literals;
+using namespace std::string_literals;
 using ::testing::ElementsAre;
 using ::testing::IsEmpty;
 
@@ -226,6 +228,38 @@ class FakeWorkspaceWorld final : public FakeColumn<WorkspaceWorld, Testing::Fake
   void remove(const std::string& identifier) override { port_.applications.erase(identifier); }
 };
 INSTANTIATE_TEST_SUITE_P(Fake, WorkspaceContract, on<FakeWorkspaceWorld>());
+
+TEST_P(ApplicationLauncherContract, StartsWhatIsInstalledAndNothingElse) {
+  world->install("com.example.Velt", "scan");
+  const auto launch = [&](const ApplicationLaunch& what) {
+    std::vector<bool> answers;
+    world->port().launch(what, [&](const auto& error) { answers.push_back(!error); });
+    EXPECT_EQ(answers.size(), 1u) << what.desktopEntry;
+    return answers == std::vector{true};
+  };
+  const ApplicationLaunch whole{"com.example.Velt", "scan", "token"};
+  for (const ApplicationLaunch& each : {whole, ApplicationLaunch{"com.example.Velt"},
+                                        ApplicationLaunch{"com.example.Velt", "other"}}) {
+    ASSERT_TRUE(launch(each));
+    const ApplicationLaunch started = world->started();
+    EXPECT_EQ(started.desktopEntry, "com.example.Velt");
+    EXPECT_EQ(started.action, each.action == "scan" ? "scan" : "");
+    EXPECT_EQ(started.activationToken, each.activationToken);
+  }
+  for (const std::string& other : {std::string(), std::string("com.example.velt"),
+                                   std::string("./com.example.Velt"), "com.example.Velt"s + '\0'})
+    EXPECT_FALSE(launch({.desktopEntry = other})) << other;
+}
+
+class FakeLauncherWorld final
+    : public FakeColumn<ApplicationLauncherWorld, Testing::FakeApplicationLauncher> {
+ public:
+  void install(const std::string& desktopEntry, const std::string& action) override {
+    port_.installed[desktopEntry] = {action};
+  }
+  ApplicationLaunch started() override { return port_.launches.back(); }
+};
+INSTANTIATE_TEST_SUITE_P(Fake, ApplicationLauncherContract, on<FakeLauncherWorld>());
 
 }  // namespace
 }  // namespace Varnel::Platform::Contract

@@ -4,6 +4,7 @@
 #include <vector>
 
 #include <Tests/Contract/Contract.h>
+#include <Varnel/Platform/Ports/ApplicationLauncher.h>
 #include <Varnel/Platform/Ports/ApplicationStorage.h>
 #include <Varnel/Platform/Ports/CookieStorage.h>
 #include <Varnel/Platform/Ports/MachineIdentity.h>
@@ -14,6 +15,16 @@
 #include <Varnel/Platform/Ports/Workspace.h>
 
 namespace Varnel::Platform::Contract {
+
+/// A desktop on which nothing is installed.
+class ApplicationLauncherWorld : public WorldOf<ApplicationLauncher> {
+ public:
+  /// An application with one action.
+  virtual void install(const std::string& desktopEntry, const std::string& action) = 0;
+  /// What the last launch has started; waited for.
+  virtual ApplicationLaunch started() = 0;
+};
+using ApplicationLauncherContract = Suite<ApplicationLauncherWorld>;
 
 /// A machine that hides who it is.
 class MachineIdentityWorld : public WorldOf<MachineIdentity> {
