@@ -75,7 +75,7 @@ TEST_P(DeviceRegistryContract, LeadsUpToTheDeviceAndDownToAllThatStandsOnIt) {
   world->plug("sdb", "S2");
   world->putOn("md0", {"sda1", "sdb1"});
   const auto devices = matching(registry, "SMART Capable", true);
-  for (const std::size_t i : {0, 1}) {
+  for (const std::size_t i : {0u, 1u}) {
     const std::string disk = i == 0 ? "sda" : "sdb";
     const auto disks = devices[i]->children();
     EXPECT_THAT(named(disks), ElementsAre(disk));

@@ -29,7 +29,7 @@ class Output final : public AdapterColumn<StandardOutputWorld, make> {
   }
 
  private:
-  static constexpr bool isError = make == &makeStandardErrorOutput;
+  const bool isError = make == &makeStandardErrorOutput;
 };
 
 }  // namespace Varnel::Platform::Contract
