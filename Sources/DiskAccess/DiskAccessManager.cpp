@@ -19,12 +19,16 @@ DiskAccessManager::Ports portsOf(const Platform::Ports& ports, Basalt::Notificat
           .notificationCenter = center};
 }
 
-DiskAccessManager::Ports portsOfProcess() {
+/// The process's services, and the relay that tells the default center of its volumes.
+struct ProcessServices {
   const Platform::Ports& ports = Platform::processPorts();
   Basalt::NotificationCenter& center = Basalt::NotificationCenter::defaultCenter();
-  static const auto& relay = *new VolumeChangeRelay(ports.volumeCatalog, center);
-  static_cast<void>(relay);
-  return portsOf(ports, center);
+  VolumeChangeRelay relay{ports.volumeCatalog, center};
+};
+
+DiskAccessManager::Ports portsOfProcess() {
+  static const ProcessServices& services = *new ProcessServices;
+  return portsOf(services.ports, services.center);
 }
 
 }  // namespace
