@@ -13,7 +13,6 @@
 #include <mutex>
 #include <thread>
 #include <utility>
-#include <vector>
 
 #include <Varnel/Platform/Bare/Adapters.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
@@ -68,23 +67,12 @@ class OwnQueue final : public MainQueue {
   bool isCurrent() const override { return std::this_thread::get_id() == mainThread; }
 
   void run() override {
-    bool stops = stopsAhead_ > 0;
-    if (stops) --stopsAhead_;
-    running_.push_back(&stops);
-    runWhile([&stops] { return !stops; });
-    running_.pop_back();
+    runWhile([this] { return stops_ == 0; });
+    --stops_;
   }
 
   void stop() override {
-    post([this] {
-      // A block may drain the queue, and so run several before a run looks at its end.
-      const auto innermost = std::find_if(running_.rbegin(), running_.rend(),
-                                          [](const bool* stops) { return !*stops; });
-      if (innermost == running_.rend())
-        ++stopsAhead_;
-      else
-        **innermost = true;
-    });
+    post([this] { ++stops_; });
   }
 
   void runWhile(const std::function<bool()>& condition) override {
@@ -147,8 +135,7 @@ class OwnQueue final : public MainQueue {
   std::deque<Block> blocks_;
   std::optional<Signal> signal_;  ///< Is set while there are blocks; none until it is asked for.
   // The members below belong to the main thread.
-  std::vector<bool*> running_;  ///< Whether each run is to end, the innermost last.
-  int stopsAhead_ = 0;          ///< How many runs to come end at once.
+  int stops_ = 0;  ///< How many runs are to end. Main thread only.
 };
 
 }  // namespace

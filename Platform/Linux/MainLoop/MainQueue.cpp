@@ -12,7 +12,6 @@
 #include <mutex>
 #include <optional>
 #include <utility>
-#include <vector>
 
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/MainLoop/ContextDescriptor.h>
@@ -56,23 +55,12 @@ class DefaultContextQueue final : public MainQueue {
   bool isCurrent() const override { return ::syscall(SYS_gettid) == ::getpid(); }
 
   void run() override {
-    bool stops = stopsAhead_ > 0;
-    if (stops) --stopsAhead_;
-    running_.push_back(&stops);
-    runWhile([&stops] { return !stops; });
-    running_.pop_back();
+    runWhile([this] { return stops_ == 0; });
+    --stops_;
   }
 
   void stop() override {
-    post([this] {
-      // The loop may run several blocks before a run looks at its end.
-      const auto innermost = std::find_if(running_.rbegin(), running_.rend(),
-                                          [](const bool* stops) { return !*stops; });
-      if (innermost == running_.rend())
-        ++stopsAhead_;
-      else
-        **innermost = true;
-    });
+    post([this] { ++stops_; });
   }
 
   void runWhile(const std::function<bool()>& condition) override {
@@ -120,8 +108,7 @@ class DefaultContextQueue final : public MainQueue {
   std::mutex mutex_;  // Owns blocks_, of which there are as many as sources.
   std::deque<Block> blocks_;
   // The members below belong to the main thread.
-  std::vector<bool*> running_;  // Whether each run is to end, the innermost last.
-  int stopsAhead_ = 0;          // How many runs to come end at once.
+  int stops_ = 0;  // How many runs are to end. Main thread only.
   std::optional<ContextDescriptor> descriptor_;
 };
 
