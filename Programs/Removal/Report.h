@@ -1,0 +1,53 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <cstdint>
+#include <istream>
+#include <string>
+#include <vector>
+
+#include <Varnel/Platform/Values/Result.h>
+
+namespace Orvane {
+
+struct ScanResult;
+
+/// A file as a scan has found it. One that was replaced or written to since has another inode, size
+/// or time.
+struct ReportFile {
+  std::string path;  ///< Absolute, byte for byte.
+  std::uint64_t inode = 0;
+  std::int64_t modified = 0;  ///< In seconds since 1970-01-01 UTC, and
+  std::int32_t nanoseconds = 0;
+  std::vector<std::string> names{};  ///< Further paths of the same file: hard links.
+  bool isReference = false;          ///< It stays, whatever is chosen.
+
+  bool operator==(const ReportFile&) const = default;
+};
+
+/// Files that had the same content.
+struct ReportGroup {
+  std::uint64_t size = 0;  ///< Of each file, in bytes.
+  std::vector<ReportFile> files{};
+
+  bool operator==(const ReportGroup&) const = default;
+};
+
+/// What a scan has found, as its JSON object tells it. A plain value.
+struct Report {
+  bool isPartial = false;            ///< The scan was interrupted.
+  std::vector<std::string> roots{};  ///< What was scanned, in the order in which it was named.
+  std::vector<ReportGroup> groups{};
+
+  bool operator==(const Report&) const = default;
+};
+
+/// Reads the JSON object of a scan, whoever has written it: numbers and paths may be anything.
+/// Fails, with a text for people, where it is no such object or too long to be one.
+[[nodiscard]] Varnel::Platform::Result<Report, std::string> readReport(std::istream& text);
+
+/// The same straight from a scan. Files that are no longer as the scan saw them are left out, and
+/// so are groups of which one file remains. Looks at every file.
+[[nodiscard]] Report reportOf(const ScanResult& result, bool isPartial);
+
+}  // namespace Orvane

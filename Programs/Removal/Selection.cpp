@@ -1,0 +1,105 @@
+// SPDX-License-Identifier: MIT
+#include <Removal/Selection.h>
+
+#include <algorithm>
+#include <set>
+#include <string>
+#include <string_view>
+#include <tuple>
+
+#include <Removal/Report.h>
+
+namespace Orvane {
+namespace {
+
+bool isBelow(std::string_view path, std::string_view folder) {
+  while (folder.ends_with('/')) folder.remove_suffix(1);
+  return path.starts_with(folder) && path.substr(folder.size()).starts_with('/');
+}
+
+// What a rule compares: the least one stays.
+using Rank = std::tuple<std::int64_t, std::int64_t>;
+
+Rank rankOf(const ReportFile& file, KeepRule rule, const Report& report) {
+  switch (rule) {
+    case KeepRule::oldest:
+      return {file.modified, file.nanoseconds};
+    case KeepRule::newest:
+      // The complement, as the least number has no opposite.
+      return {~file.modified, ~std::int64_t{file.nanoseconds}};
+    case KeepRule::shortest:
+      return {static_cast<std::int64_t>(file.path.size()), 0};
+    case KeepRule::firstFolder:
+      break;
+  }
+  const auto root =
+      std::find_if(report.roots.begin(), report.roots.end(),
+                   [&](const std::string& folder) { return isBelow(file.path, folder); });
+  return {root - report.roots.begin(), 0};
+}
+
+Choice choose(const ReportGroup& group, KeepRule rule, const Report& report) {
+  const bool hasReference = std::any_of(group.files.begin(), group.files.end(),
+                                        [](const ReportFile& file) { return file.isReference; });
+  Choice choice;
+  std::optional<Rank> best;
+  for (std::size_t i = 0; i < group.files.size(); ++i) {
+    const ReportFile& file = group.files[i];
+    if (!file.isReference) choice.victims.push_back(i);
+    if (file.isReference != hasReference) continue;
+    const Rank rank = rankOf(file, rule, report);
+    choice.isTie = best == rank || (choice.isTie && best < rank);
+    if (best && *best <= rank) continue;
+    best = rank;
+    choice.kept = i;
+  }
+  std::erase(choice.victims, choice.kept);
+  return choice;
+}
+
+std::set<std::string_view> namesOf(const ReportFile& file) {
+  std::set<std::string_view> names(file.names.begin(), file.names.end());
+  names.insert(file.path);
+  return names;
+}
+
+std::optional<Refusal::Reason> objectionTo(const ReportGroup& group, const Choice& choice) {
+  using enum Refusal::Reason;
+  if (choice.kept >= group.files.size()) return unknown;
+  const auto keptNames = namesOf(group.files[choice.kept]);
+  std::set<std::size_t> seen;
+  for (const std::size_t victim : choice.victims) {
+    if (victim >= group.files.size() || !seen.insert(victim).second) return unknown;
+    const ReportFile& file = group.files[victim];
+    if (file.isReference) return reference;
+    for (const std::string_view name : namesOf(file))
+      if (keptNames.contains(name)) return kept;
+  }
+  return std::nullopt;
+}
+
+}  // namespace
+
+Selection select(const Report& report, KeepRule rule) {
+  Selection selection;
+  for (std::size_t i = 0; i < report.groups.size(); ++i) {
+    Choice choice = choose(report.groups[i], rule, report);
+    choice.group = i;
+    if (!choice.victims.empty()) selection.push_back(std::move(choice));
+  }
+  return selection;
+}
+
+std::optional<Refusal> check(const Report& report, const Selection& selection) {
+  std::set<std::size_t> seen;
+  for (std::size_t i = 0; i < selection.size(); ++i) {
+    const Choice& choice = selection[i];
+    if (choice.group >= report.groups.size() || !seen.insert(choice.group).second)
+      return Refusal{.reason = Refusal::Reason::unknown, .choice = i};
+    if (const auto reason = objectionTo(report.groups[choice.group], choice))
+      return Refusal{.reason = *reason, .choice = i};
+  }
+  return std::nullopt;
+}
+
+}  // namespace Orvane
