@@ -109,7 +109,7 @@ int ScanCommand::run(Console& console) const {
     const Interruption interruption(control.isCancelled);
     std::optional<ProgressLine> progress;
     if (showsProgress && isStandardErrorATerminal()) progress.emplace(console, control);
-    result = finder.find(*paths, control);
+    result = finder.find({.folders = *paths}, control);
     progress.reset();
     if (interruption.signal() != 0) {
       log.log("Did cancel");
