@@ -16,6 +16,8 @@ class RootVolume final : public VolumeCatalog {
  public:
   std::vector<MountedVolume> mountedVolumes() override { return {{.url = root_}}; }
 
+  std::vector<URL> pseudoFileSystems() override { return {}; }
+
   Result<std::optional<URL>> volumeURL(const URL& url) override {
     if (isCutShort(url.path()))
       return PlatformError(std::make_error_code(std::errc::invalid_argument));

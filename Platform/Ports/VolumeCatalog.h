@@ -50,6 +50,10 @@ class VARNEL_API VolumeCatalog {
   /// without those that another one hides, which is mounted over them.
   [[nodiscard]] virtual std::vector<MountedVolume> mountedVolumes() = 0;
 
+  /// The folders that the kernel's own pseudo file systems are mounted on and seen at, written as
+  /// volumes are. What is read or opened below them may act, or wait for ever.
+  [[nodiscard]] virtual std::vector<URL> pseudoFileSystems() = 0;
+
   /// The URL of the volume that holds a file or folder. Failed when the path cannot be looked up,
   /// absent when it lies on no volume of the list.
   [[nodiscard]] virtual Result<std::optional<URL>> volumeURL(const URL& url) = 0;

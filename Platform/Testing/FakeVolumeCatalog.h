@@ -54,6 +54,12 @@ class FakeVolumeCatalog final : public VolumeCatalog {
     announce({.kind = VolumeChange::Kind::unmounted, .volumeURL = url});
   }
 
+  /// Without events.
+  void setPseudoFileSystems(std::vector<URL> folders) {
+    const std::lock_guard lock(mutex_);
+    pseudoFileSystems_ = std::move(folders);
+  }
+
   /// Calls the handlers of all subscriptions; the list stays as it is.
   void announce(const VolumeChange& change) const {
     const std::lock_guard lock(subscribers_->mutex);
@@ -94,7 +100,14 @@ class FakeVolumeCatalog final : public VolumeCatalog {
     return visible;
   }
 
-  /// The volume with the longest path that is a folder above the URL, or the URL itself.
+  std::vector<URL> pseudoFileSystems() override {
+    if (faults->strikes()) return {};
+    const std::lock_guard lock(mutex_);
+    return pseudoFileSystems_;
+  }
+
+  /// The volume with the longest path that is a folder above the URL, or the URL itself. Absent
+  /// where a pseudo file system lies nearer.
   Result<std::optional<URL>> volumeURL(const URL& url) override {
     const Fault fault = faults->nextInTime();
     if (fault == Fault::fails) return PlatformError(std::make_error_code(std::errc::io_error));
@@ -112,6 +125,10 @@ class FakeVolumeCatalog final : public VolumeCatalog {
       if (!path.starts_with(root) || root.size() < longest) continue;
       longest = root.size();
       found = volume.url;
+    }
+    for (const URL& folder : pseudoFileSystems_) {
+      const std::string root = withSlash(folder.path());
+      if (path.starts_with(root) && root.size() >= longest) return std::optional<URL>();
     }
     return found;
   }
@@ -170,6 +187,7 @@ class FakeVolumeCatalog final : public VolumeCatalog {
   const std::shared_ptr<Subscribers> subscribers_ = std::make_shared<Subscribers>();
   mutable std::mutex mutex_;  ///< Owns what follows; never held while a handler runs.
   std::vector<MountedVolume> volumes_;
+  std::vector<URL> pseudoFileSystems_;
   std::map<URL, std::string> names_;
   std::optional<PlatformError> lookupError_;
   bool offersEvents_ = true;

@@ -5,6 +5,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace Orvane {
 
@@ -13,6 +14,18 @@ struct ScanDisk {
   unsigned places = 1;     ///< How many tasks read at once, at least 1.
   bool isOrdered = true;   ///< Whether it reads faster what lies together.
   bool isReadable = true;  ///< No when the framework knows no volume there: content stays unread.
+};
+
+/// A file system that is mounted.
+struct ScanMount {
+  enum class Kind {
+    local,
+    network,  ///< Its files lie on another machine, which may not answer.
+    pseudo,   ///< The kernel shows itself there; nobody's files.
+  };
+
+  std::string path;  ///< The folder that it is mounted on, absolute.
+  Kind kind = Kind::local;
 };
 
 /// The time in which a task may read. One thread at a time.
@@ -46,9 +59,13 @@ class DiskTurns {
  public:
   virtual ~DiskTurns() = default;
 
+  /// What is mounted where, as far as the system tells. Touches none of it.
+  [[nodiscard]] virtual std::vector<ScanMount> mounts() = 0;
+
   /// The disk that holds the folder or file; the same object for all that lie on one disk. A disk
-  /// remains as long as one volume remains that was asked about. May wait for a share that does not
-  /// answer. Lives as long as this object.
+  /// remains as long as one volume remains that was asked about. Touches nothing when something is
+  /// mounted on just that folder; otherwise it may wait for a share that does not answer. Lives as
+  /// long as this object.
   [[nodiscard]] virtual const ScanDisk& diskOf(const std::string& path) = 0;
 
   /// Runs the task, in turns, on a thread of its own choice until it is done, and drops it. Does

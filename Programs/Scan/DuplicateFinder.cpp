@@ -30,24 +30,6 @@ auto groupAndKey(const Candidate& candidate) {
   return std::tie(candidate.group, candidate.key);
 }
 
-/// Leaves the groups of candidates that agree in group and key, at least two, and gives them
-/// numbers of their own.
-void keepAgreeing(Candidates& candidates) {
-  std::sort(candidates.begin(), candidates.end(),
-            [](const Candidate& a, const Candidate& b) { return groupAndKey(a) < groupAndKey(b); });
-  std::uint32_t group = 0;
-  auto kept = candidates.begin();
-  forEachRun(candidates.begin(), candidates.end(), groupAndKey, [&](auto begin, auto end) {
-    if (end - begin == 1) return;
-    ++group;
-    for (; begin != end; ++begin, ++kept) {
-      *kept = *begin;
-      kept->group = group;
-    }
-  });
-  candidates.erase(kept, candidates.end());
-}
-
 /// Takes out the candidates that a condition holds for.
 template <typename Condition>
 Candidates takeOut(Candidates& candidates, const Condition& condition) {
@@ -63,8 +45,10 @@ class Scan final {
  public:
   Scan(DuplicateFinder::Ports ports, ScanControl& control) : ports_(ports), control_(control) {}
 
-  ScanResult run(const std::vector<std::string>& folders) {
-    WalkResult walk = walkFolders(folders, ports_.fileSystem, ports_.turns, control_);
+  ScanResult run(const ScanRequest& request) {
+    hasReferences_ = !request.references.empty();
+    WalkResult walk =
+        walkFolders(request, ports_.fileSystem, ports_.turns, ports_.observer, control_);
     if (control_.isCancelled) return {};
     if (!walk.lostRoots.empty()) return {.lostFolders = std::move(walk.lostRoots)};
     tree_ = walk.tree;
@@ -102,6 +86,16 @@ class Scan final {
     ports_.observer.fileLeftOut(path, loss);
   }
 
+  [[nodiscard]] bool isToStay(FileNumber file) const {
+    return hasReferences_ && tree_->folderOf(file).isReference;
+  }
+
+  template <typename Iterator>
+  [[nodiscard]] bool areAllToStay(Iterator begin, Iterator end) const {
+    return hasReferences_ &&
+           std::all_of(begin, end, [&](const Candidate& each) { return isToStay(each.file); });
+  }
+
   [[nodiscard]] std::uint64_t sizeOf(const Candidate& candidate) const {
     return tree_->file(candidate.file).size;
   }
@@ -111,6 +105,7 @@ class Scan final {
     Candidates files;
     files.reserve(tree_->fileCount());
     tree_->forEachFile([&](FileNumber number, const FileRecord& record) {
+      if (isToStay(number)) ++totals_.referenceFiles;
       if (record.size == 0) {
         ++totals_.emptyFiles;
       } else {
@@ -134,10 +129,13 @@ class Scan final {
     });
     if (links.empty()) return;
     sortByPath(*tree_, links);
-    // Each file's first path comes first now, and the files in the order of the candidates.
-    std::stable_sort(links.begin(), links.end(), [&](FileNumber a, FileNumber b) {
-      return tree_->locationOf(a) < tree_->locationOf(b);
-    });
+    // Each file's first path comes first now, if need be of those that are to stay, and the files
+    // in the order of the candidates.
+    const auto rankOf = [&](FileNumber link) {
+      return std::pair(tree_->locationOf(link), !isToStay(link));
+    };
+    std::stable_sort(links.begin(), links.end(),
+                     [&](FileNumber a, FileNumber b) { return rankOf(a) < rankOf(b); });
     auto link = links.begin();
     auto kept = files.begin();
     forEachRun(files.begin(), files.end(), keyOf, [&](auto begin, auto end) {
@@ -152,16 +150,18 @@ class Scan final {
     files.erase(kept, files.end());
   }
 
-  /// Leaves the files whose size others have too, and makes a group of each size.
+  /// Leaves the files whose size others have too, unless all of them are to stay, and makes a group
+  /// of each size.
   void keepSharedSizes(Candidates& files) const {
+    // Behind each size whether a file may go, so that the one that may is the last of its size.
     std::vector<std::uint64_t> sizes;
     sizes.reserve(files.size());
-    for (const Candidate& file : files) sizes.push_back(sizeOf(file));
+    for (const Candidate& file : files) sizes.push_back(sizeOf(file) << 1 | !isToStay(file.file));
     std::sort(sizes.begin(), sizes.end());
     auto kept = sizes.begin();
     for (auto begin = sizes.begin(); begin != sizes.end();) {
-      const auto end = std::upper_bound(begin, sizes.end(), *begin);
-      if (end - begin > 1) *kept++ = *begin;
+      const auto end = std::upper_bound(begin, sizes.end(), *begin | 1);
+      if (end - begin > 1 && (*(end - 1) & 1) != 0) *kept++ = *begin >> 1;
       begin = end;
     }
     sizes.erase(kept, sizes.end());
@@ -171,6 +171,25 @@ class Scan final {
       return found == sizes.end() || *found != sizeOf(file);
     });
     files.shrink_to_fit();
+  }
+
+  /// Leaves the groups of candidates that agree in group and key, at least two of which one may go,
+  /// and gives them numbers of their own.
+  void keepAgreeing(Candidates& candidates) const {
+    std::sort(candidates.begin(), candidates.end(), [](const Candidate& a, const Candidate& b) {
+      return groupAndKey(a) < groupAndKey(b);
+    });
+    std::uint32_t group = 0;
+    auto kept = candidates.begin();
+    forEachRun(candidates.begin(), candidates.end(), groupAndKey, [&](auto begin, auto end) {
+      if (end - begin == 1 || areAllToStay(begin, end)) return;
+      ++group;
+      for (; begin != end; ++begin, ++kept) {
+        *kept = *begin;
+        kept->group = group;
+      }
+    });
+    candidates.erase(kept, candidates.end());
   }
 
   /// The candidates of equal content. Each look is for those that are still alike after the last.
@@ -220,6 +239,7 @@ class Scan final {
         const std::uint32_t group = first + candidate.group - 1;
         if (group == groups.size()) groups.push_back({.size = sizeOf(candidate)});
         ++groups[group].count;
+        if (isToStay(candidate.file)) ++groups[group].references;
         groupOf[candidate.file] = group;
         files.push_back(candidate.file);
       }
@@ -244,7 +264,7 @@ class Scan final {
                        return a.wastedBytes() > b.wastedBytes();
                      });
     for (const DuplicateGroup& group : result.groups) {
-      result.totals.duplicateFiles += group.count - 1;
+      result.totals.duplicateFiles += group.removable();
       result.totals.wastedBytes += group.wastedBytes();
     }
     result.tree = tree_;
@@ -254,13 +274,14 @@ class Scan final {
   DuplicateFinder::Ports ports_;
   ScanControl& control_;
   std::shared_ptr<const FileTree> tree_;
+  bool hasReferences_ = false;
   ScanTotals totals_;
 };
 
 }  // namespace
 
-ScanResult DuplicateFinder::find(const std::vector<std::string>& folders, ScanControl& control) {
-  return Scan(ports_, control).run(folders);
+ScanResult DuplicateFinder::find(const ScanRequest& request, ScanControl& control) {
+  return Scan(ports_, control).run(request);
 }
 
 }  // namespace Orvane

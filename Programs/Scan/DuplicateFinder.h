@@ -1,9 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <string>
-#include <vector>
-
+#include <Scan/ScanRequest.h>
 #include <Scan/ScanResult.h>
 
 namespace Orvane {
@@ -20,10 +18,11 @@ struct ScanControl;
 /// compare its bytes with those of the one that stays.
 ///
 ///     DuplicateFinder finder({systemFileSystem(), turns, observer});
-///     ScanResult result = finder.find({"/home/u/Pictures"}, control);
+///     ScanResult result = finder.find({.folders = {"/home/u/Pictures"}}, control);
 ///
-/// All hard links of a file count as one file, known by the first of its paths; symbolic links and
-/// empty files have no part. A file that cannot be read, is gone or changes meanwhile is left out,
+/// All hard links of a file count as one file, known by the first of its paths, those in reference
+/// folders before others; symbolic links and empty files have no part. Where all files of a group
+/// are to stay, it is none. A file that cannot be read, is gone or changes meanwhile is left out,
 /// counted and reported to the observer. The same files give the same result in the same order,
 /// however many threads read them. One call at a time; the finder keeps nothing from one to the
 /// next.
@@ -37,9 +36,9 @@ class DuplicateFinder final {
 
   explicit DuplicateFinder(Ports ports) : ports_(ports) {}
 
-  /// Scans folders given by absolute paths without symbolic links. Once `control` asks to stop it
+  /// Once `control` asks to stop it
   /// returns soon, with a result that is of no use.
-  [[nodiscard]] ScanResult find(const std::vector<std::string>& folders, ScanControl& control);
+  [[nodiscard]] ScanResult find(const ScanRequest& request, ScanControl& control);
 
  private:
   Ports ports_;

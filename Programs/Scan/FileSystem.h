@@ -54,9 +54,14 @@ class OpenFile {
 /// How the reader of a file is going to read.
 enum class ReadingPlan { parts, everything };
 
-/// A regular file or a folder in a folder, or what could not be looked at.
+/// What is in a folder, or could not be looked at.
 struct FolderEntry {
-  enum class Kind { file, folder, failure };
+  enum class Kind {
+    file,  ///< A regular one.
+    folder,
+    other,  ///< A symbolic link, a device, a socket or a pipe.
+    failure,
+  };
 
   Kind kind;
   const char* name;         ///< Valid during the call.
@@ -73,10 +78,13 @@ class OpenFolder {
 
   [[nodiscard]] virtual FileIdentity identity() const = 0;
 
-  /// Calls `visit` for the next few entries; each call goes on where the last one ended. Symbolic
-  /// links, devices, sockets and pipes are left out. False when there are no more.
+  /// Calls `visit` for the next few entries; each call goes on where the last one ended. Those of
+  /// the other kinds are left out. False when there are no more.
   [[nodiscard]] virtual FileResult<bool> list(
       const std::function<void(const FolderEntry&)>& visit) = 0;
+
+  /// The entry of this name.
+  [[nodiscard]] virtual FolderEntry look(const char* name) = 0;
 
   /// Opens a file in the folder, and never waits for the other end of a pipe that took the file's
   /// place. The status tells whether it is still a file, and which one.

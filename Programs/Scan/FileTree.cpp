@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <limits>
 #include <stdexcept>
+#include <utility>
 
 namespace Orvane {
 namespace {
@@ -34,15 +35,24 @@ FileTree::~FileTree() = default;
 
 Folder& FileTree::addGiven(const std::string& path) {
   const std::lock_guard lock(mutex_);
-  const std::string& kept = givenPaths_.emplace_back(path == "/" ? "" : path);
-  return folders_.emplace_back(
-      Folder{nullptr, kept.c_str(), {}, static_cast<std::uint32_t>(folders_.size())});
+  return add(nullptr, ways_.emplace_back(path == "/" ? "" : path).c_str(), {});
 }
 
 Folder& FileTree::addFolder(const Folder& parent, const char* name, FileIdentity identity) {
   const std::lock_guard lock(mutex_);
-  return folders_.emplace_back(
-      Folder{&parent, name, identity, static_cast<std::uint32_t>(folders_.size())});
+  return add(&parent, name, identity);
+}
+
+Folder& FileTree::addMounted(const Folder& parent, std::string way) {
+  const std::lock_guard lock(mutex_);
+  return add(&parent, ways_.emplace_back(std::move(way)).c_str(), {});
+}
+
+Folder& FileTree::add(const Folder* parent, const char* name, FileIdentity identity) {
+  const auto number = static_cast<std::uint32_t>(folders_.size());
+  Folder& folder = folders_.emplace_back(Folder{parent, name, identity, number});
+  folder.isReference = parent && parent->isReference;
+  return folder;
 }
 
 std::uint32_t FileTree::deviceNumber(std::uint64_t identifier, const ScanDisk& disk) {

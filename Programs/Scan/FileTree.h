@@ -23,6 +23,11 @@ struct Folder {
   const char* name;       ///< Kept by the tree. For a given folder its path, empty for "/".
   FileIdentity identity;  ///< Until it is opened, what its parent tells of it.
   std::uint32_t number;   ///< In the tree.
+
+  bool isWhole = false;  ///< Whether the tree has all that is directly in it; known once listed.
+  bool isReference = false;    ///< Whether its files are to stay.
+  bool leadsToMounts = false;  ///< Whether something is mounted below it.
+  bool isListed = true;        ///< Not where it is given for some of its files alone.
 };
 
 /// Stands for a file of the tree.
@@ -57,10 +62,12 @@ class FileTree final {
   FileTree(const FileTree&) = delete;
   FileTree& operator=(const FileTree&) = delete;
 
-  /// Adds a folder to scan. Any thread, as for the two below.
+  /// Adds a folder to scan. Any thread, as for the three below.
   Folder& addGiven(const std::string& path);
   /// Adds a folder whose name a writer keeps.
   Folder& addFolder(const Folder& parent, const char* name, FileIdentity identity);
+  /// Adds what is mounted below a folder, by the names that lead down there.
+  Folder& addMounted(const Folder& parent, std::string way);
   /// The number of the device, which is added with this disk if it is new.
   std::uint32_t deviceNumber(std::uint64_t identifier, const ScanDisk& disk);
 
@@ -112,11 +119,12 @@ class FileTree final {
     std::array<char, bytesPerBlock> bytes;
   };
 
+  Folder& add(const Folder* parent, const char* name, FileIdentity identity);
   Block& takeBlock();
   NameBlock& takeNameBlock();
 
   std::mutex mutex_;  ///< Guards the lists while the tree grows; not what writers write.
-  std::deque<std::string> givenPaths_;
+  std::deque<std::string> ways_;  ///< Paths of given folders, and the names down to mounted ones.
   std::deque<Folder> folders_;
   std::vector<Device> devices_;
   std::vector<std::unique_ptr<Block>> blocks_;

@@ -12,7 +12,9 @@
 namespace Orvane {
 
 class DiskTurns;
+class ScanObserver;
 struct ScanControl;
+struct ScanRequest;
 
 /// What a walk found.
 struct WalkResult {
@@ -23,14 +25,17 @@ struct WalkResult {
   std::vector<LostPath> lostRoots{};  ///< Given folders that could not be listed.
 };
 
-/// Walks folders, given by absolute paths without symbolic links, in turns: each disk with as many
-/// tasks as it has places, and from inode to inode, for that is mostly how folders lie.
+/// Walks the folders of a request in turns: each disk with as many tasks as it has places, and from
+/// inode to inode, for that is mostly how folders lie. Looks up its single files then.
 ///
 /// Symbolic links are not followed, and a folder that is mounted again below itself is not entered
-/// again. A folder that is given twice, or lies in another given one, is walked once. Returns
-/// early, with what it has so far, when `control` says so or a given folder cannot be listed.
-[[nodiscard]] WalkResult walkFolders(const std::vector<std::string>& folders,
-                                     FileSystem& fileSystem, DiskTurns& turns,
+/// again. A folder that is given twice, or lies in another given one, is walked once. What is
+/// mounted below is walked in the turns of its own disk, and not touched in those of another.
+/// Pseudo file systems are left out, but for what is mounted in them in turn, and for given
+/// folders. Returns early, with what it has so far, when `control` says so or a given folder cannot
+/// be listed.
+[[nodiscard]] WalkResult walkFolders(const ScanRequest& request, FileSystem& fileSystem,
+                                     DiskTurns& turns, ScanObserver& observer,
                                      ScanControl& control);
 
 }  // namespace Orvane

@@ -130,6 +130,16 @@ class DescriptorFolder final : public OpenFolder {
     return true;
   }
 
+  FolderEntry look(const char* name) override {
+    using Kind = FolderEntry::Kind;
+    struct stat facts;
+    if (::fstatat(number(), name, &facts, AT_SYMLINK_NOFOLLOW) != 0)
+      return {.kind = Kind::failure, .name = name, .inode = 0, .error = lastError()};
+    if (S_ISDIR(facts.st_mode)) return {.kind = Kind::folder, .name = name, .inode = facts.st_ino};
+    if (!S_ISREG(facts.st_mode)) return {.kind = Kind::other, .name = name, .inode = 0};
+    return {.kind = Kind::file, .name = name, .inode = 0, .status = statusFrom(facts)};
+  }
+
   FileResult<std::unique_ptr<OpenFile>> open(const char* name, ReadingPlan plan) override {
     Descriptor descriptor(
         ::openat(number(), name, O_RDONLY | O_NONBLOCK | O_NOCTTY | O_NOFOLLOW | O_CLOEXEC));
@@ -172,20 +182,12 @@ class DescriptorFolder final : public OpenFolder {
   }
 
   /// The kind that comes with the name saves asking for the status of folders.
-  void visitEntry(const dirent64& entry,
-                  const std::function<void(const FolderEntry&)>& visit) const {
+  void visitEntry(const dirent64& listed, const std::function<void(const FolderEntry&)>& visit) {
     using Kind = FolderEntry::Kind;
-    const char* const name = entry.d_name;
-    struct stat facts;
-    if (entry.d_type == DT_DIR) {
-      visit({.kind = Kind::folder, .name = name, .inode = entry.d_ino});
-    } else if (::fstatat(number(), name, &facts, AT_SYMLINK_NOFOLLOW) != 0) {
-      visit({.kind = Kind::failure, .name = name, .inode = 0, .error = lastError()});
-    } else if (S_ISDIR(facts.st_mode)) {
-      visit({.kind = Kind::folder, .name = name, .inode = facts.st_ino});
-    } else if (S_ISREG(facts.st_mode)) {
-      visit({.kind = Kind::file, .name = name, .inode = 0, .status = statusFrom(facts)});
-    }
+    if (listed.d_type == DT_DIR)
+      return visit({.kind = Kind::folder, .name = listed.d_name, .inode = listed.d_ino});
+    const FolderEntry entry = look(listed.d_name);
+    if (entry.kind != Kind::other) visit(entry);
   }
 
   Descriptor descriptor_;

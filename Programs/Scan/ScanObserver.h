@@ -9,14 +9,19 @@
 
 namespace Orvane {
 
-/// Hears of everything that a scan leaves out. Called on the thread that runs the scan, in the
-/// order of the paths within each step.
+/// Hears of everything that a scan leaves out, on the thread that runs the scan, in the order of
+/// the paths within each step.
 class ScanObserver {
  public:
   virtual ~ScanObserver() = default;
 
   virtual void fileLeftOut(const std::string& path, const Loss& loss) = 0;
   virtual void folderLeftOut(const std::string& path, const Loss& loss) = 0;
+
+  /// The scan is going to read a file system whose files lie on another machine, mounted on this
+  /// folder. Once for each, before it is touched, but where it was given; on any thread, one call
+  /// at a time.
+  virtual void networkEntered(const std::string& /*folder*/) {}
 };
 
 /// The progress of a running scan, which any thread may read, and the request to stop it, which any

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
 #include <memory>
 #include <string>
@@ -16,9 +17,12 @@ struct DuplicateGroup {
   std::uint64_t size = 0;   ///< Of each file, in bytes; never 0.
   std::uint32_t begin = 0;  ///< Among the result's files.
   std::uint32_t count = 0;
+  std::uint32_t references = 0;  ///< How many of the files are to stay.
 
-  /// The bytes that all files but one take up.
-  [[nodiscard]] std::uint64_t wastedBytes() const { return size * (count - 1); }
+  /// How many may go: all that need not stay, or all but one.
+  [[nodiscard]] std::uint32_t removable() const { return count - std::max(references, 1u); }
+  /// The bytes that those take up.
+  [[nodiscard]] std::uint64_t wastedBytes() const { return size * removable(); }
 };
 
 /// The figures of a scan. Every regular file is counted in `files`; the members below it count
@@ -28,12 +32,13 @@ struct ScanTotals {
   std::uint64_t files = 0;
   std::uint64_t bytes = 0;  ///< Of all files, hard links once.
   std::uint64_t emptyFiles = 0;
-  std::uint64_t hardLinks = 0;  ///< Further names of files already counted.
+  std::uint64_t referenceFiles = 0;  ///< Those that are to stay.
+  std::uint64_t hardLinks = 0;       ///< Further names of files already counted.
   std::uint64_t unreadableFiles = 0;
   std::uint64_t vanishedFiles = 0;
   std::uint64_t changedFiles = 0;
   std::uint64_t unreadableFolders = 0;
-  std::uint64_t duplicateFiles = 0;  ///< Files that could go: all but one of each group.
+  std::uint64_t duplicateFiles = 0;  ///< Files that could go: see `DuplicateGroup::removable`.
   std::uint64_t wastedBytes = 0;
 
   bool operator==(const ScanTotals&) const = default;
@@ -48,6 +53,9 @@ struct ScanResult {
   ScanTotals totals{};
   std::vector<FileNumber> files{};  ///< Of all groups.
   std::shared_ptr<const FileTree> tree{};
+
+  /// Whether the file is to stay.
+  [[nodiscard]] bool isReference(FileNumber file) const { return tree->folderOf(file).isReference; }
 
   /// One path of each of the group's files, absolute, in the order of their bytes.
   [[nodiscard]] std::vector<std::string> pathsOf(const DuplicateGroup& group) const {

@@ -96,10 +96,13 @@ class Taker final {
     run();
     for (const std::string& operand : words_.rest())
       if (!taken_.wrong) takeOperand(operand);
-    for (std::size_t i = 0; i < options_.size(); ++i)
+    bool needsOperands = operandCount_ < operands_.min;
+    for (std::size_t i = 0; i < options_.size(); ++i) {
       if (options_[i].isRequired && !isGiven_[i])
         taken_.missing = "--" + options_[i].name + " is missing";
-    if (operandCount_ < operands_.min) taken_.missing = "a " + operands_.value.name + " is missing";
+      if (options_[i].standsForOperands && isGiven_[i]) needsOperands = false;
+    }
+    if (needsOperands) taken_.missing = "a " + operands_.value.name + " is missing";
     return taken_;
   }
 

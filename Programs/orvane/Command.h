@@ -32,6 +32,7 @@ struct Option {
   Value value{};
   std::string defaultValue{};
   bool isRequired = false;
+  bool standsForOperands = false;  ///< With it no operand need be given.
 };
 
 /// The arguments of a command that are no options.

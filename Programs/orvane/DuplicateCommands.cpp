@@ -1,10 +1,13 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/CommandGroups.h>
 
+#include <utility>
+
 #include <orvane/CommandParts.h>
 #include <orvane/DisksCommand.h>
 #include <orvane/ScanAnalytics.h>
 #include <orvane/ScanCommand.h>
+#include <orvane/SizeText.h>
 
 namespace Orvane {
 namespace {
@@ -20,9 +23,93 @@ Complaint checkEndpoint(const std::string& text) {
   return "\"" + text + "\" is no https URL";
 }
 
+Complaint checkGlob(const std::string& pattern) {
+  return pattern.empty() ? Complaint("the pattern is empty") : std::nullopt;
+}
+
+Value size(const std::shared_ptr<ScanChoice>& choice, std::uint64_t ScanChoice::*member) {
+  return {.name = "SIZE", .take = [=](const std::string& given) {
+            const Complaint complaint = readSize(given, (*choice).*member);
+            if (complaint || choice->minSize <= choice->maxSize) return complaint;
+            return Complaint("the smallest size is above the largest");
+          }};
+}
+
+/// The options that choose what is scanned.
+std::vector<Option> choosingOptions(const std::shared_ptr<ScanChoice>& choice) {
+  return {
+      {.name = "min-size",
+       .description = "Leave out smaller files: 4096, 10M or 4KiB, say",
+       .value = size(choice, &ScanChoice::minSize)},
+      {.name = "max-size",
+       .description = "Leave out larger files",
+       .value = size(choice, &ScanChoice::maxSize)},
+      {.name = "include",
+       .description = "Take the files of such a name alone, or of such a path if it has a \"/\"",
+       .value = text("GLOB", choice, &ScanChoice::include, Value::Kind::text, checkGlob)},
+      {.name = "exclude",
+       .description = "Leave out files and folders of such a name, or such a path",
+       .value = text("GLOB", choice, &ScanChoice::exclude, Value::Kind::text, checkGlob)},
+      {.name = "skip-hidden",
+       .description = "Leave out what has a dot in front of its name",
+       .value = flag(choice, &ScanChoice::skipsHidden)},
+      {.letter = 'x',
+       .name = "one-file-system",
+       .description = "Enter no file system that is mounted below a folder",
+       .value = flag(choice, &ScanChoice::staysOnFileSystem)},
+      {.letter = 'k',
+       .name = "keep-in",
+       .description = "Scan this folder too; its files are to stay",
+       .value = text("FOLDER", choice, &ScanChoice::references, Value::Kind::folder, checkFolder)},
+      {.name = "files-from",
+       .description = "Scan the files that it names, one a line; - is standard input",
+       .value = text("FILE", choice, &ScanChoice::listOfFiles, Value::Kind::file),
+       .standsForOperands = true},
+      {.name = "null",
+       .description = "In the list of --files-from, null characters end the names",
+       .value = {.take = [choice](const std::string&) {
+         choice->endOfNames = NameEnd::null;
+         return Complaint();
+       }}}};
+}
+
+/// The options of a scan that do not choose.
+std::vector<Option> workingOptions(const std::shared_ptr<ScanCommand>& command) {
+  using enum QualityOfService;
+  return {json(command),
+          {.name = "no-progress",
+           .description = "Do not show on the terminal how far the scan is",
+           .value = flag(command, &ScanCommand::showsProgress, false)},
+          {.letter = 'p',
+           .name = "progress",
+           .description = "Show it, as without either",
+           .value = flag(command, &ScanCommand::showsProgress)},
+          {.name = "sound",
+           .description = "Play a sound at the end",
+           .value = flag(command, &ScanCommand::playsSound)},
+          {.letter = 'q',
+           .name = "qos",
+           .description = "How urgent reading is",
+           .value = word("QUALITY", command, &ScanCommand::qos,
+                         {{"background", background},
+                          {"utility", utility},
+                          {"user-initiated", userInitiated},
+                          {"user-interactive", userInteractive}}),
+           .defaultValue = "utility"},
+          {.name = "analytics",
+           .description = "Send events of the scan there, if the user consents",
+           .value = text("URL", command, &ScanCommand::analyticsEndpoint, Value::Kind::text,
+                         checkEndpoint)},
+          {.name = "print-events",
+           .description = "Show events on standard error",
+           .value = flag(command, &ScanCommand::printsEvents)}};
+}
+
 Command scan() {
   const auto command = std::make_shared<ScanCommand>();
-  using enum QualityOfService;
+  const std::shared_ptr<ScanChoice> choice = command;
+  std::vector<Option> options = workingOptions(command);
+  for (Option& option : choosingOptions(choice)) options.push_back(std::move(option));
   return {
       .name = "scan",
       .group = Command::Group::duplicates,
@@ -37,48 +124,24 @@ Command scan() {
                  {"files", "how many were found"},
                  {"bytes", "of all files, hard links once"},
                  {"emptyFiles", "files without content, which are no duplicates"},
+                 {"referenceFiles", "files that are to stay, as --keep-in says"},
                  {"hardLinks", "further names of files already counted"},
                  {"unreadableFiles", "files that could not be read"},
                  {"vanishedFiles", "files that were gone when their turn came"},
                  {"changedFiles", "files that changed meanwhile"},
                  {"unreadableFolders", "folders that could not be read, or only in part"},
-                 {"duplicateFiles", "files that could go: all but one of each group"},
+                 {"duplicateFiles",
+                  "files that could go: of each group all that need not stay, or all but one"},
                  {"wastedBytes", "what those take up"},
                  {"groups[].size", "of each file, in bytes"},
                  {"groups[].paths",
                   "of the files, in the order of their bytes; bytes that are not "
                   "UTF-8 are U+FFFD"},
                  {"groups[].urls", "exact file URLs of all paths, only where a path is not UTF-8"}},
-      .options = {json(command),
-                  {.name = "no-progress",
-                   .description = "Do not show on the terminal how far the scan is",
-                   .value = flag(command, &ScanCommand::showsProgress, false)},
-                  {.letter = 'p',
-                   .name = "progress",
-                   .description = "Show it, as without either",
-                   .value = flag(command, &ScanCommand::showsProgress)},
-                  {.name = "sound",
-                   .description = "Play a sound at the end",
-                   .value = flag(command, &ScanCommand::playsSound)},
-                  {.letter = 'q',
-                   .name = "qos",
-                   .description = "How urgent reading is",
-                   .value = word("QUALITY", command, &ScanCommand::qos,
-                                 {{"background", background},
-                                  {"utility", utility},
-                                  {"user-initiated", userInitiated},
-                                  {"user-interactive", userInteractive}}),
-                   .defaultValue = "utility"},
-                  {.name = "analytics",
-                   .description = "Send events of the scan there, if the user consents",
-                   .value = text("URL", command, &ScanCommand::analyticsEndpoint, Value::Kind::text,
-                                 checkEndpoint)},
-                  {.name = "print-events",
-                   .description = "Show events on standard error",
-                   .value = flag(command, &ScanCommand::printsEvents)}},
-      .operands = {.value = text("FOLDER", command, &ScanCommand::folders, Value::Kind::folder,
+      .options = std::move(options),
+      .operands = {.value = text("FOLDER", choice, &ScanChoice::folders, Value::Kind::folder,
                                  checkFolder),
-                   .description = "The folders",
+                   .description = "The folders; with --files-from none is needed",
                    .min = 1,
                    .max = Operands::anyNumber},
       .run = runs(command)};

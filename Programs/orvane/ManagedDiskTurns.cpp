@@ -26,6 +26,13 @@ std::string askablePath(const std::string& path) {
   return path.size() < PATH_MAX ? path : path.substr(0, path.rfind('/', PATH_MAX - 1));
 }
 
+/// The folder that a volume is mounted on.
+std::string folderAt(const URL& volume) {
+  std::string path = volume.path();
+  if (path.size() > 1 && path.ends_with('/')) path.pop_back();
+  return path;
+}
+
 bool isAmong(const std::vector<DiskReadingFile>& files, const DiskReadingFile& sought) {
   return std::any_of(files.begin(), files.end(),
                      [&](const auto& file) { return file.volumeURL == sought.volumeURL; });
@@ -91,17 +98,36 @@ ManagedDiskTurns::~ManagedDiskTurns() {
   for (std::thread& thread : threads_) thread.join();
 }
 
+std::vector<ScanMount> ManagedDiskTurns::mounts() {
+  std::vector<ScanMount> mounts;
+  for (const auto& volume : ports_.volumes.mountedVolumes()) {
+    const bool isLocal = volume.isLocal.value_or(true);
+    mounts.push_back(
+        {folderAt(volume.url), isLocal ? ScanMount::Kind::local : ScanMount::Kind::network});
+  }
+  for (const URL& url : ports_.volumes.pseudoFileSystems())
+    mounts.push_back({folderAt(url), ScanMount::Kind::pseudo});
+  return mounts;
+}
+
+// What is mounted on the path itself is found without a look-up, for which it might keep us.
+std::optional<URL> ManagedDiskTurns::volumeOf(const std::string& path) const {
+  for (const auto& volume : ports_.volumes.mountedVolumes())
+    if (folderAt(volume.url) == path) return volume.url;
+  const auto found = ports_.volumes.volumeURL(URL::fileURLWithPath(askablePath(path)));
+  return found ? *found : std::nullopt;
+}
+
 const ScanDisk& ManagedDiskTurns::diskOf(const std::string& path) {
   std::string identifier;
   const URL url = URL::fileURLWithPath(askablePath(path));
   auto disk = std::make_unique<Disk>();
-  const auto volume = ports_.volumes.volumeURL(url);
-  if (volume && *volume) {
+  if (const auto volume = volumeOf(path)) {
     // No security scope to open: the user named the folders, and an unreadable file shows when it
     // is opened.
-    disk->files.push_back({.url = url, .volumeURL = **volume, .enableSecureScopedAccess = false});
-    identifier = (*volume)->absoluteString();
-    if (const auto info = ports_.queue.diskOfVolume(**volume)) {
+    disk->files.push_back({.url = url, .volumeURL = *volume, .enableSecureScopedAccess = false});
+    identifier = volume->absoluteString();
+    if (const auto info = ports_.queue.diskOfVolume(*volume)) {
       identifier = info->uniqueID().value_or(identifier);
       disk->places =
           static_cast<unsigned>(std::clamp<std::int64_t>(info->maxTreads(), 1, maxTasks_));

@@ -4,6 +4,7 @@
 #include <map>
 #include <memory>
 #include <mutex>
+#include <optional>
 #include <string>
 #include <thread>
 #include <vector>
@@ -35,6 +36,7 @@ class ManagedDiskTurns final : public DiskTurns {
   /// Waits for tasks on no known volume. Those on disks must be done.
   ~ManagedDiskTurns() override;
 
+  std::vector<ScanMount> mounts() override;
   const ScanDisk& diskOf(const std::string& path) override;
   void start(const ScanDisk& disk, std::shared_ptr<DiskTask> task) override;
 
@@ -42,6 +44,7 @@ class ManagedDiskTurns final : public DiskTurns {
   struct Disk;
   class QueueTask;
 
+  [[nodiscard]] std::optional<Varnel::Platform::URL> volumeOf(const std::string& path) const;
   void submit(const Disk& disk, std::shared_ptr<DiskTask> task,
               const Varnel::DiskReadingFile& file);
   void goOnWithout(const Varnel::DiskReadingFile& vanished, const Disk& disk,

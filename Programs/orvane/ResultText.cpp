@@ -34,6 +34,7 @@ std::string summary(const ScanTotals& totals, std::size_t groups, const std::str
   const auto add = [&](std::uint64_t count, const char* singular, const char* plural) {
     if (count > 0) text += "; " + counted(count, singular, plural);
   };
+  add(totals.referenceFiles, "of the files is to stay", "of the files are to stay");
   add(totals.unreadableFiles, "file could not be read", "files could not be read");
   add(totals.vanishedFiles, "file vanished", "files vanished");
   add(totals.changedFiles, "file changed meanwhile", "files changed meanwhile");
@@ -106,6 +107,7 @@ bool writeJSON(const ScanResult& result, const TextWriter& write) {
       {"files", totals.files},
       {"bytes", totals.bytes},
       {"emptyFiles", totals.emptyFiles},
+      {"referenceFiles", totals.referenceFiles},
       {"hardLinks", totals.hardLinks},
       {"unreadableFiles", totals.unreadableFiles},
       {"vanishedFiles", totals.vanishedFiles},

@@ -3,7 +3,6 @@
 
 #include <algorithm>
 #include <cstdint>
-#include <filesystem>
 #include <limits>
 #include <optional>
 #include <thread>
@@ -34,32 +33,8 @@
 namespace Orvane {
 namespace {
 
-namespace fs = std::filesystem;
 using Varnel::Globals;
 using Varnel::Platform::URL;
-
-void complainThatItCannotScan(const std::string& folder, const std::string& reason,
-                              Console& console) {
-  console.complain("cannot scan \"" + folder + "\": " + reason);
-}
-
-/// The folders as the engine wants them, or none after a complaint about one that is not there.
-std::optional<std::vector<std::string>> resolved(const std::vector<std::string>& folders,
-                                                 Console& console) {
-  std::vector<std::string> paths;
-  for (const std::string& folder : folders) {
-    std::error_code error;
-    const fs::path path = fs::canonical(folder, error);
-    if (!error && !fs::is_directory(path, error) && !error)
-      error = std::make_error_code(std::errc::not_a_directory);
-    if (error) {
-      complainThatItCannotScan(folder, error.message(), console);
-      return std::nullopt;
-    }
-    paths.push_back(path.string());
-  }
-  return paths;
-}
 
 // A period from now on the user is reminded of what this scan has found. Who chose none is not.
 void planReminder(std::uint64_t bytesLeftToClean, Console& console) {
@@ -86,13 +61,14 @@ unsigned maxReaders() {
 }  // namespace
 
 int ScanCommand::run(Console& console) const {
-  const auto paths = resolved(folders, console);
-  if (!paths) return 1;
+  const auto asked = request(console);
+  if (!asked) return 1;
 
   ScanAnalytics analytics(analyticsEndpoint, printsEvents, console);
-  analytics.scanStarted(paths->size());
-  ScanLog log;
-  for (const std::string& path : *paths) log.log("Will scan", URL::fileURLWithPath(path + "/"));
+  analytics.scanStarted(asked->folders.size());
+  ScanLog log(console);
+  for (const auto* paths : {&asked->folders, &asked->references})
+    for (const std::string& path : *paths) log.log("Will scan", URL::fileURLWithPath(path + "/"));
 
   const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
   ManagedDiskTurns turns(
@@ -109,7 +85,7 @@ int ScanCommand::run(Console& console) const {
     const Interruption interruption(control.isCancelled);
     std::optional<ProgressLine> progress;
     if (showsProgress && isStandardErrorATerminal()) progress.emplace(console, control);
-    result = finder.find(*paths, control);
+    result = finder.find(*asked, control);
     progress.reset();
     if (interruption.signal() != 0) {
       log.log("Did cancel");
@@ -125,7 +101,7 @@ int ScanCommand::run(Console& console) const {
   }
   log.log("Did find " + counted(result.groups.size(), "group", "groups") + " of duplicates among " +
           counted(result.totals.files, "file", "files"));
-  log.complain(console);
+  log.complain();
   analytics.scanFinished(result.groups.size());
   const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.get().numberIdentifier());
   const auto write = [&](std::string_view text) { return console.writeResult(text); };

@@ -3,17 +3,16 @@
 
 #include <optional>
 #include <string>
-#include <vector>
 
 #include <Varnel/Platform/Values/QualityOfService.h>
+#include <orvane/ScanChoice.h>
 
 namespace Orvane {
 
 class Console;
 
 /// `orvane scan`: finds the duplicate files in folders.
-struct ScanCommand {
-  std::vector<std::string> folders;
+struct ScanCommand : ScanChoice {
   Varnel::Platform::QualityOfService qos = Varnel::Platform::QualityOfService::utility;
   bool isJSON = false;
   bool showsProgress = true;  ///< While standard error is a terminal.

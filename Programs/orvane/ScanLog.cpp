@@ -27,12 +27,17 @@ void ScanLog::leaveOut(const std::string& path, const Loss& loss) {
   if (++count_ <= maxNamed) first_.push_back({path, loss});
 }
 
-void ScanLog::complain(Console& console) const {
+void ScanLog::networkEntered(const std::string& folder) {
+  log("Will scan a network file system", Varnel::Platform::URL::fileURLWithPath(folder + "/"));
+  console_.complain("\"" + folder + "\" is a network file system");
+}
+
+void ScanLog::complain() const {
   for (const LostPath& lost : first_)
-    console.complain("left out \"" + lost.path + "\": " + reasonOf(lost.loss));
+    console_.complain("left out \"" + lost.path + "\": " + reasonOf(lost.loss));
   if (count_ > maxNamed)
-    console.complain(counted(count_ - maxNamed, "more was", "more were") +
-                     " left out; the log names them all");
+    console_.complain(counted(count_ - maxNamed, "more was", "more were") +
+                      " left out; the log names them all");
 }
 
 }  // namespace Orvane

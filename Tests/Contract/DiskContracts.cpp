@@ -266,6 +266,16 @@ TEST_P(VolumeCatalogContract, AVolumeOverAnotherHidesItUntilItGoes) {
   EXPECT_EQ(count(), 0);
 }
 
+TEST_P(VolumeCatalogContract, TellsPseudoFileSystemsFromVolumes) {
+  VolumeCatalog& catalog = world->port();
+  const URL url = volumeAt(world->folder("kernel"));
+  EXPECT_THAT(catalog.pseudoFileSystems(), Not(Contains(url)));
+  world->mountPseudo(url);
+  EXPECT_THAT(catalog.pseudoFileSystems(), Contains(url));
+  EXPECT_THAT(catalog.mountedVolumes(), Not(Contains(Field(&MountedVolume::url, url))));
+  EXPECT_EQ(catalog.volumeURL(url).value(), std::nullopt);
+}
+
 TEST_P(VolumeCatalogContract, APathThatIsNoneCannotBeLookedUp) {
   for (const std::string& path : {std::string(), std::string("/\0/x", 4)})
     EXPECT_FALSE(world->port().volumeURL(URL::fileURLWithPath(path))) << path;
@@ -301,6 +311,7 @@ class FakeVolumeCatalogWorld final
   std::string folder(const std::string& name) override { return "/media/" + name; }
   void mount(const URL& folder) override { port_.mount({folder, true, {}, {}}); }
   void unmount(const URL& folder) override { port_.unmount(folder); }
+  void mountPseudo(const URL& folder) override { port_.setPseudoFileSystems({folder}); }
 };
 INSTANTIATE_TEST_SUITE_P(Fake, VolumeCatalogContract, on<FakeVolumeCatalogWorld>());
 

@@ -39,6 +39,8 @@ class VolumeCatalogWorld : public WorldOf<VolumeCatalog> {
   virtual std::string folder(const std::string& name) = 0;
   virtual void mount(const URL& folder) = 0;
   virtual void unmount(const URL& folder) = 0;
+  /// Mounts a pseudo file system of the kernel's, which stays.
+  virtual void mountPseudo(const URL& folder) = 0;
 };
 using VolumeCatalogContract = Suite<VolumeCatalogWorld>;
 

@@ -196,6 +196,7 @@ class StuckCatalog final : public Platform::VolumeCatalog {
   std::vector<Platform::MountedVolume> mountedVolumes() override {
     return volumes_.mountedVolumes();
   }
+  std::vector<URL> pseudoFileSystems() override { return {}; }
   Platform::Result<std::optional<URL>> volumeURL(const URL& url) override {
     auto volume = volumes_.volumeURL(url);
     if (url == stuck_) {

@@ -88,11 +88,11 @@ TEST(ScanLog, NamesTheFirstOfManyFilesAndCountsTheOthers) {
   ::setenv("HOME", home.path().c_str(), 1);
   const Loss denied{Loss::Kind::unreadable, std::make_error_code(std::errc::permission_denied)};
   const auto complaints = [&](int count) {
-    ScanLog log;
-    for (int i = 0; i < count; ++i) log.fileLeftOut("/file" + std::to_string(i), denied);
     Console console;
+    ScanLog log(console);
+    for (int i = 0; i < count; ++i) log.fileLeftOut("/file" + std::to_string(i), denied);
     ::testing::internal::CaptureStderr();
-    log.complain(console);
+    log.complain();
     return ::testing::internal::GetCapturedStderr();
   };
   EXPECT_EQ(complaints(0), "");

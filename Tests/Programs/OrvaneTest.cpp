@@ -50,6 +50,38 @@ TEST_F(Orvane, SendsTheLogWhereItIsTold) {
   EXPECT_EQ(apart.output, "0 files in 1 folder: no duplicates\n");
 }
 
+TEST_F(Orvane, ScansWhatItIsAskedFor) {
+  for (const char* name : {"a.jpg", "b.jpg", "c.txt", ".hidden/d.jpg", "sub/e\nf.jpg", "old/g.jpg"})
+    folder.write(name, "same content");
+  folder.write("large", "the same content, and more");
+  std::filesystem::create_directory_symlink(folder.path("sub"), folder.path("link"));
+  const std::string lines = home.write("lines", folder.path("a.jpg") + "\n\n./c.txt\nlost/1");
+  const std::string nulls = home.write("nulls", std::string("link/e\nf.jpg\0a.jpg\0", 20));
+  const struct {
+    std::vector<std::string> arguments;
+    std::string summary;
+  } cases[] = {
+      {{"--include", "*.jpg", "--exclude=old/", "--skip-hidden", "."},
+       "3 files in 2 folders: 2 dup"},
+      {{"--min-size", "20", "."}, "1 file in 4 folders: no"},
+      {{"--max-size=12B", "-x", "."}, "6 files in 4 folders: 5 duplicates in 1 group"},
+      {{"-k", "sub", "--keep-in", "old", "."},
+       "7 files in 4 folders: 4 duplicates in 1 group, 48 bytes wasted; 2 of the files are to "
+       "stay\n"},
+      {{"--files-from", lines},
+       "3 files in 0 folders: 1 duplicate in 1 group, 12 bytes wasted; 1 file vanished\n"},
+      {{"--files-from", nulls, "--null"}, "2 files in 0 folders: 1 duplicate"},
+      {{"--files-from", "-"}, "3 files in 0 folders: 1 duplicate"},
+  };
+  moreEnvironment = {"/usr/bin/env", "-C", folder.path()};
+  for (const auto& [arguments, summary] : cases) {
+    std::vector<std::string> words = {"scan"};
+    words.insert(words.end(), arguments.begin(), arguments.end());
+    const Outcome outcome = run(words, "<" + lines + " >\"$HOME/output\"");
+    EXPECT_THAT(outcome.output, HasSubstr(summary)) << arguments[0];
+  }
+}
+
 TEST_F(Orvane, ShowsHostileNamesAsWhatTheyAre) {
   folder.write("fake\n\n9 files of 1 byte\x1b[2J", "same");
   folder.write("\xffno\\slash", "same");
@@ -92,6 +124,14 @@ TEST_F(Orvane, RefusesWrongArgumentsInOneLineAndDoesNothing) {
       {{"scan", ""}, 2, "empty"},
       {{"scan", "--nope", folder.path()}, 2, "--nope"},
       {{"scan", "--qos", "fast\nest", folder.path()}, 2, "fast\\nest"},
+      {{"scan", "--min-size", "10q", "."}, 2, "--min-size: \"10q\" is no size"},
+      {{"scan", "--max-size", "1K", "--min-size", "1KiB", "."}, 2, "above the largest"},
+      {{"scan", "--exclude", "", "."}, 2, "the pattern is empty"},
+      {{"scan", "--keep-in", missing, "."}, 1, missing},
+      {{"scan", "--files-from", missing}, 1, "list"},
+      {{"scan", "--files-from", folder.path()}, 1, "Is a directory"},
+      {{"scan", "--files-from", folder.write("nulls", std::string("a\0b", 3))}, 1, "--null"},
+      {{"scan", "--files-from", "/dev/zero"}, 1, "--null"},
       {{"disks", "extra"}, 2, "extra"},
       {{"link"}, 2, "link"},
       {{"link", "a", "b"}, 2, "link"},

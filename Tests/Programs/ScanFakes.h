@@ -18,17 +18,22 @@
 
 namespace Orvane::Testing {
 
-/// One disk for everything, whose turns are over after some steps, each task on a thread of its
-/// own. Knows whether the calling thread has a turn. Set up before the scan.
+/// One disk for everything but what is mounted, whose turns are over after some steps, each task on
+/// a thread of its own. Knows whose turn the calling thread has. Set up before the scan.
 class FakeTurns final : public DiskTurns {
  public:
   ~FakeTurns() override { join(); }
 
-  const ScanDisk& diskOf(const std::string&) override { return disk; }
+  std::vector<ScanMount> mounts() override { return mounted; }
+  const ScanDisk& diskOf(const std::string& path) override {
+    const auto other = mountedDisks.find(path);
+    return other == mountedDisks.end() ? disk : other->second;
+  }
 
-  void start(const ScanDisk&, std::shared_ptr<DiskTask> task) override {
+  void start(const ScanDisk& at, std::shared_ptr<DiskTask> task) override {
     const std::lock_guard lock(mutex_);
-    threads_.emplace_back([this, task = std::move(task)] {
+    threads_.emplace_back([this, &at, task = std::move(task)] {
+      current() = &at;
       if (refuses) return task->refuse();
       for (bool goesOn = true; goesOn;) {
         takePlace();
@@ -57,7 +62,15 @@ class FakeTurns final : public DiskTurns {
     return inside;
   }
 
+  /// The disk at which the calling thread's task reads.
+  static const ScanDisk*& current() {
+    thread_local const ScanDisk* disk = nullptr;
+    return disk;
+  }
+
   ScanDisk disk{.places = 4, .isOrdered = false};
+  std::vector<ScanMount> mounted;
+  std::map<std::string, ScanDisk> mountedDisks;  ///< Of some of them.
   unsigned stepsPerTurn = 1000;
   bool refuses = false;
 
@@ -102,9 +115,11 @@ class LossRecorder final : public ScanObserver {
   void folderLeftOut(const std::string& path, const Loss& loss) override {
     folders.emplace_back(path, loss.kind);
   }
+  void networkEntered(const std::string& folder) override { networks.push_back(folder); }
 
   std::vector<std::pair<std::string, Loss::Kind>> files;
   std::vector<std::pair<std::string, Loss::Kind>> folders;
+  std::vector<std::string> networks;
 };
 
 /// The real file system with faults: paths that cannot be opened or listed to the end, files that
@@ -203,6 +218,8 @@ class FaultyFileSystem final : public FileSystem {
         return std::make_error_code(fault->second);
       return folder_->list(visit);
     }
+
+    FolderEntry look(const char* name) override { return folder_->look(name); }
 
     FileResult<std::unique_ptr<OpenFile>> open(const char* name, ReadingPlan plan) override {
       const std::string path = path_ + "/" + name;

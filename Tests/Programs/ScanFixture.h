@@ -21,10 +21,13 @@ using Groups = std::vector<std::vector<std::string>>;
 
 class ScanFixture : public ::testing::Test {
  protected:
-  ScanResult scan(const std::vector<std::string>& folders) {
-    ScanResult result = DuplicateFinder({fileSystem, turns, losses}).find(folders, control);
+  ScanResult scan(const ScanRequest& request) {
+    ScanResult result = DuplicateFinder({fileSystem, turns, losses}).find(request, control);
     turns.join();
     return result;
+  }
+  ScanResult scan(const std::vector<std::string>& folders) {
+    return scan(ScanRequest{.folders = folders});
   }
   ScanResult scan() { return scan({folder.path()}); }
 

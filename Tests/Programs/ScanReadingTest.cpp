@@ -135,8 +135,8 @@ TEST_F(ScanReading, LeavesThePageCacheAloneWhereItShould) {
     if (cachedPages(path) > 0) GTEST_SKIP() << "their file system is a cache itself";
   }
   const auto scanAs = [&](CacheUse use) {
-    const ScanResult result =
-        DuplicateFinder({systemFileSystem(use), turns, losses}).find({folder.path()}, control);
+    const ScanResult result = DuplicateFinder({systemFileSystem(use), turns, losses})
+                                  .find({.folders = {folder.path()}}, control);
     EXPECT_THAT(paths(result), ElementsAre(::testing::ElementsAreArray(equal)));
     long pages = 0;
     for (const std::string& path : files) pages += cachedPages(path);

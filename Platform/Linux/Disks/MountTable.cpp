@@ -86,10 +86,13 @@ std::shared_ptr<const VolumeTable> makeTable(std::string_view mountInfo) {
   const BlockDevices devices;
   DeviceNames deviceNames;
   for (Mount& mount : visibleMounts(mountInfo)) {
-    if (isPseudoFileSystem(mount.type)) continue;
+    if (!mount.target.ends_with('/')) mount.target += '/';
+    if (isPseudoFileSystem(mount.type)) {
+      table->pseudoFileSystems.push_back(URL::fileURLWithPath(mount.target));
+      continue;
+    }
     auto names = deviceNames.of(mount);
     const auto internal = devices.areInternal(names);
-    if (!mount.target.ends_with('/')) mount.target += '/';
     table->volumes.push_back({.mountID = mount.id,
                               .device = std::move(mount.device),
                               .type = std::move(mount.type),

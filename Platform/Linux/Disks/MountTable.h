@@ -28,9 +28,10 @@ struct Volume {
   }
 };
 
-/// The volumes at one moment, in the order of the mount table. Immutable.
+/// The volumes at one moment, all in the order of the mount table. Immutable.
 struct VolumeTable {
   std::vector<Volume> volumes;
+  std::vector<URL> pseudoFileSystems;  ///< Where the kernel's own are mounted.
   std::vector<std::size_t> byMountID;  ///< Positions in `volumes`, by rising mount id.
 
   [[nodiscard]] const Volume* withMountID(int mountID) const;

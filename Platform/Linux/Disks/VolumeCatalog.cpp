@@ -37,6 +37,11 @@ class MountTableCatalog final : public VolumeCatalog {
     return volumes;
   }
 
+  std::vector<URL> pseudoFileSystems() override {
+    const auto table = table_->current();
+    return table ? table->pseudoFileSystems : std::vector<URL>();
+  }
+
   Result<std::optional<URL>> volumeURL(const URL& url) override {
     const auto mountID = mountIDOf(url.path());
     if (!mountID) return mountID.error();

@@ -82,6 +82,9 @@ INSTANTIATE_TEST_SUITE_P(Linux, DiskArbitrationContract, on<BoundFolders>());
 
 class MountedMemory final : public VolumeCatalogWorld {
  public:
+  ~MountedMemory() override {
+    if (!pseudo_.empty()) ::umount2(pseudo_.c_str(), MNT_DETACH);
+  }
   [[nodiscard]] std::string obstacle() const override { return Tests::enterMountNamespace(); }
   VolumeCatalog& port() override { return *catalog_; }
   std::string folder(const std::string& name) override {
@@ -90,8 +93,14 @@ class MountedMemory final : public VolumeCatalogWorld {
   }
   void mount(const URL& folder) override { EXPECT_TRUE(Tests::mountMemory(folder.path())); }
   void unmount(const URL& folder) override { EXPECT_EQ(::umount(folder.path().c_str()), 0); }
+  void mountPseudo(const URL& folder) override {
+    const std::string path = folder.path();
+    EXPECT_EQ(::mount("/proc", path.c_str(), nullptr, MS_BIND | MS_REC, nullptr), 0);
+    pseudo_ = path;
+  }
 
  private:
+  std::string pseudo_;
   const Tests::TemporaryFolder folder_;
   const std::unique_ptr<VolumeCatalog> catalog_ = Linux::makeVolumeCatalog(Linux::makeMountTable());
 };
