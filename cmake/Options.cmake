@@ -2,7 +2,10 @@
 # (VarnelProduct.cmake), program by program.
 
 set(VARNEL_BUILD_NUMBER "1" CACHE STRING "The framework's build number")
-set(VARNEL_SOURCE_VERSION "" CACHE STRING "The source revision that a release is built from")
+# git writes the revision into the file when it makes a tarball.
+file(STRINGS "${CMAKE_CURRENT_LIST_DIR}/SourceVersion.txt" source_version REGEX "^[0-9a-f]+$")
+string(SUBSTRING "${source_version}" 0 12 source_version)
+set(VARNEL_SOURCE_VERSION "${source_version}" CACHE STRING "The source revision that a release is built from")
 
 # The system whose adapters are built, a folder of Platform/; see docs/porting.md.
 set(VARNEL_SYSTEM "${CMAKE_SYSTEM_NAME}" CACHE STRING "Linux, or Bare: POSIX alone")
