@@ -150,6 +150,7 @@ bool ContentReader::finish() {
   const auto status = open_->status();
   if (!status) return lose(Loss::because(status.error()));
   if (!tree_.isUnchanged(file_, *status)) return lose({Loss::Kind::changed, {}});
+  status_ = *status;
   open_.reset();
   return true;
 }

@@ -54,8 +54,9 @@ class ContentReader final {
   /// How many bytes the last step read.
   [[nodiscard]] std::uint64_t stepLength() const { return stepLength_; }
 
-  /// The next three tell of a file that is finished.
+  /// The next four tell of a file that is finished.
   [[nodiscard]] const std::optional<Loss>& loss() const { return loss_; }
+  [[nodiscard]] const FileStatus& status() const { return status_; }
   /// Of what the look shows; of the rest alone when the head was read with it.
   [[nodiscard]] Digest digest() const { return digest_; }
   [[nodiscard]] Digest headDigest() const { return headDigest_; }
@@ -91,6 +92,7 @@ class ContentReader final {
   bool isFirstBlock_ = false;
   std::uint64_t stepLength_ = 0;
   std::optional<Loss> loss_;
+  FileStatus status_{};
   Digest digest_{};
   Digest headDigest_{};
 };

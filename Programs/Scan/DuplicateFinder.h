@@ -38,7 +38,7 @@ class DuplicateFinder final {
   explicit DuplicateFinder(Ports ports) : ports_(ports) {}
 
   /// Scans folders given by absolute paths without symbolic links. Once `control` asks to stop it
-  /// returns soon, with a result that is of no use.
+  /// returns soon, with a partial result: the files that were compared by then.
   [[nodiscard]] ScanResult find(const std::vector<std::string>& folders, ScanControl& control);
 
  private:

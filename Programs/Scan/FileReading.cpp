@@ -242,6 +242,12 @@ class FileReading::DiskPass::ReadingTask final : public TaskGroup::Task {
   void settle() {
     Candidate& file = *std::exchange(file_, nullptr);
     if (const auto& loss = reader_.loss()) return pass_.lose(file, *loss);
+    const FileStatus& status = reader_.status();
+    file.modifiedAt = status.modifiedAt;
+    const bool isRead =
+        look_ != Look::samples && (look_ != Look::head || status.size <= headLength);
+    if (isRead && (status.links > 1 || status.allocated < status.size))
+      footprints_.push_back({file.file, status.links, std::min(status.allocated, status.size)});
     if (look_ == pass_.look_) {
       file.key = reader_.digest();
     } else {
@@ -255,6 +261,8 @@ class FileReading::DiskPass::ReadingTask final : public TaskGroup::Task {
       const std::lock_guard lock(pass_.owner_.mutex_);
       Digests& all = pass_.owner_.restDigests_;
       all.insert(all.end(), rests_.begin(), rests_.end());
+      auto& footprints = pass_.owner_.footprints_;
+      footprints.insert(footprints.end(), footprints_.begin(), footprints_.end());
     }
     pass_.didEnd();
   }
@@ -266,6 +274,7 @@ class FileReading::DiskPass::ReadingTask final : public TaskGroup::Task {
   std::uint64_t place_ = 0;
   bool mayReadLarge_ = false;
   Digests rests_;
+  std::vector<Footprint> footprints_;
 };
 
 void FileReading::DiskPass::startPlacing() {
@@ -279,8 +288,12 @@ void FileReading::DiskPass::startReading(unsigned count) {
 FileReading::~FileReading() = default;
 
 void FileReading::read(Look look, std::vector<Candidate>& candidates) {
+  if (control_.isCancelled) return candidates.clear();
   control_.filesToRead.fetch_add(candidates.size(), std::memory_order_relaxed);
-  for (Candidate& candidate : candidates) candidate.key = ports_.tree.locationOf(candidate.file);
+  for (Candidate& candidate : candidates) {
+    candidate.key = ports_.tree.locationOf(candidate.file);
+    candidate.modifiedAt = Candidate::unread;
+  }
   const auto liesBefore = [](const Candidate& a, const Candidate& b) { return a.key < b.key; };
   if (!std::is_sorted(candidates.begin(), candidates.end(), liesBefore))
     std::sort(candidates.begin(), candidates.end(), liesBefore);
@@ -299,8 +312,15 @@ void FileReading::read(Look look, std::vector<Candidate>& candidates) {
   group.wait();
   for (const auto& [disk, pass] : passes)
     if (pass->isCold()) coldDisks_.insert(disk);
-  std::erase_if(candidates, [](const Candidate& file) { return file.file == Candidate::lost; });
+  std::erase_if(candidates, [](const Candidate& file) {
+    return file.file == Candidate::lost || file.modifiedAt == Candidate::unread;
+  });
   std::sort(restDigests_.begin(), restDigests_.end());
+}
+
+std::vector<Footprint> FileReading::takeFootprints() {
+  sortByFile(footprints_);
+  return std::exchange(footprints_, {});
 }
 
 std::optional<Digest> FileReading::restDigest(FileNumber file) const {

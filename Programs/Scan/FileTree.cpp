@@ -71,6 +71,12 @@ FileIdentity FileTree::identityOf(FileNumber number) const {
   return {.device = devices_[record.device].identifier, .inode = record.inode};
 }
 
+bool FileTree::isReference(FileNumber number) const {
+  const Folder* folder = &folderOf(number);
+  while (folder->parent) folder = folder->parent;
+  return folder->isReference;
+}
+
 std::array<std::uint64_t, 2> FileTree::locationOf(FileNumber number) const {
   const FileRecord& record = file(number);
   std::uint64_t disk = 0;  // The number of its first device.

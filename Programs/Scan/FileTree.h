@@ -23,6 +23,9 @@ struct Folder {
   const char* name;       ///< Kept by the tree. For a given folder its path, empty for "/".
   FileIdentity identity;  ///< Until it is opened, what its parent tells of it.
   std::uint32_t number;   ///< In the tree.
+  bool isWhole =
+      false;  ///< Whether the tree has all that is directly in it, known once it is listed.
+  bool isReference = false;  ///< Of a given folder: whether its files are only compared with.
 };
 
 /// Stands for a file of the tree.
@@ -75,6 +78,8 @@ class FileTree final {
   [[nodiscard]] const char* nameOf(FileNumber number) const;
   [[nodiscard]] std::string pathOf(FileNumber number) const;
   [[nodiscard]] FileIdentity identityOf(FileNumber number) const;
+  /// Whether the file lies below a given folder of that kind.
+  [[nodiscard]] bool isReference(FileNumber number) const;
 
   [[nodiscard]] const ScanDisk& diskOf(FileNumber number) const {
     return *devices_[file(number).device].disk;

@@ -175,6 +175,7 @@ class Walk::Task final : public TaskGroup::Task {
       if (!listing_ && !begin()) {
         folder_ = nullptr;
       } else if (!listSome()) {
+        folder_->isWhole = isWhole_;
         walk_.finish(work_, *folder_, children_);
         listing_ = nullptr;
         folder_ = nullptr;
@@ -213,6 +214,7 @@ class Walk::Task final : public TaskGroup::Task {
     }
     listing_ = *opened;
     isListed_ = false;
+    isWhole_ = true;
     return true;
   }
 
@@ -222,6 +224,7 @@ class Walk::Task final : public TaskGroup::Task {
     const auto more = listing_->list(visit_);
     walk_.control_.filesFound.fetch_add(found_, std::memory_order_relaxed);
     if (!more) {
+      isWhole_ = false;
       const Loss loss = Loss::because(more.error());
       walk_.lose(*folder_, isListed_ ? Loss{Loss::Kind::incomplete, loss.error} : loss);
     }
@@ -243,7 +246,11 @@ class Walk::Task final : public TaskGroup::Task {
       case FolderEntry::Kind::folder:
         children_.push_back({writer_.add(entry.name), entry.inode});
         break;
+      case FolderEntry::Kind::other:
+        isWhole_ = false;
+        break;
       case FolderEntry::Kind::failure: {
+        isWhole_ = false;
         const std::lock_guard lock(walk_.mutex_);
         walk_.result_.unreadableFiles.push_back(
             {pathBelow(*folder_, entry.name), Loss::because(entry.error)});
@@ -270,6 +277,7 @@ class Walk::Task final : public TaskGroup::Task {
   Folder* folder_ = nullptr;       ///< The one that is listed, and what it held so far.
   OpenFolder* listing_ = nullptr;  ///< In `open_`.
   bool isListed_ = false;
+  bool isWhole_ = false;  ///< Whether all of it so far is in the tree.
   std::vector<Child> children_;
   std::uint64_t found_ = 0;
   std::uint64_t deviceIdentifier_ = 0;

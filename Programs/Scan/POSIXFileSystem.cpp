@@ -77,9 +77,14 @@ Descriptor openWithoutLinks(int base, std::string_view path, int flags) {
 }
 
 FileStatus statusFrom(const struct stat& facts) {
+  // A moment that no 64 bits hold wraps around; it is still another than those near it.
+  const auto modifiedAt = static_cast<std::uint64_t>(facts.st_mtim.tv_sec) * 1'000'000'000 +
+                          static_cast<std::uint64_t>(facts.st_mtim.tv_nsec);
   return {.identity = {.device = facts.st_dev, .inode = facts.st_ino},
           .size = static_cast<std::uint64_t>(facts.st_size),
-          .modifiedAt = std::int64_t{facts.st_mtim.tv_sec} * 1'000'000'000 + facts.st_mtim.tv_nsec};
+          .modifiedAt = static_cast<std::int64_t>(modifiedAt),
+          .allocated = static_cast<std::uint64_t>(facts.st_blocks) * 512,
+          .links = static_cast<std::uint32_t>(facts.st_nlink)};
 }
 
 class DescriptorFile final : public OpenFile {
@@ -102,10 +107,17 @@ class DescriptorFile final : public OpenFile {
   FileResult<FileStatus> status() override {
     struct stat facts;
     if (::fstat(descriptor_.get(), &facts) != 0) return lastError();
-    return statusFrom(facts);
+    FileStatus status = statusFrom(facts);
+    // Some systems count no blocks at all.
+    if (status.allocated == 0 && !isHole(descriptor_.get())) status.allocated = status.size;
+    return status;
   }
 
   std::optional<std::uint64_t> place() override { return placeOf(descriptor_.get()); }
+
+  std::optional<SharedExtents> sharedExtents() override {
+    return sharedExtentsOf(descriptor_.get());
+  }
 
  private:
   Descriptor descriptor_;
@@ -129,6 +141,8 @@ class DescriptorFolder final : public OpenFolder {
       visitEntry(*entries_[next_], visit);
     return true;
   }
+
+  [[nodiscard]] bool mayShareExtents() const override { return tellsSharedExtents(number()); }
 
   FileResult<std::unique_ptr<OpenFile>> open(const char* name, ReadingPlan plan) override {
     Descriptor descriptor(
@@ -160,15 +174,11 @@ class DescriptorFolder final : public OpenFolder {
       const auto* const entry = reinterpret_cast<const dirent64*>(buffer_.get() + at);
       at += entry->d_reclen;
       const std::string_view name = entry->d_name;
-      if (name != "." && name != ".." && mayTakePart(entry->d_type)) entries_.push_back(entry);
+      if (name != "." && name != "..") entries_.push_back(entry);
     }
     std::sort(entries_.begin(), entries_.end(),
               [](const dirent64* a, const dirent64* b) { return a->d_ino < b->d_ino; });
     return size > 0;
-  }
-
-  static bool mayTakePart(unsigned char type) {
-    return type == DT_REG || type == DT_DIR || type == DT_UNKNOWN;
   }
 
   /// The kind that comes with the name saves asking for the status of folders.
@@ -179,12 +189,16 @@ class DescriptorFolder final : public OpenFolder {
     struct stat facts;
     if (entry.d_type == DT_DIR) {
       visit({.kind = Kind::folder, .name = name, .inode = entry.d_ino});
+    } else if (entry.d_type != DT_REG && entry.d_type != DT_UNKNOWN) {
+      visit({.kind = Kind::other, .name = name, .inode = 0});
     } else if (::fstatat(number(), name, &facts, AT_SYMLINK_NOFOLLOW) != 0) {
       visit({.kind = Kind::failure, .name = name, .inode = 0, .error = lastError()});
     } else if (S_ISDIR(facts.st_mode)) {
       visit({.kind = Kind::folder, .name = name, .inode = facts.st_ino});
     } else if (S_ISREG(facts.st_mode)) {
       visit({.kind = Kind::file, .name = name, .inode = 0, .status = statusFrom(facts)});
+    } else {
+      visit({.kind = Kind::other, .name = name, .inode = 0});
     }
   }
 

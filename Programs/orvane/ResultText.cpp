@@ -89,7 +89,7 @@ bool writeText(const ScanResult& result, const ByteCountFormatter& byteCounts,
   Parts parts(write);
   for (const DuplicateGroup& group : result.groups) {
     std::string text = std::to_string(group.count) + " files of " + size(group.size) + ", " +
-                       size(group.wastedBytes()) + " wasted\n";
+                       size(group.wastedBytes) + " wasted\n";
     for (const std::string& path : result.pathsOf(group))
       text += "  " + visibleText(paths.abbreviatedPath(path)) + "\n";
     if (!parts.add(text + "\n")) return false;
