@@ -61,6 +61,9 @@ class ContentReader final {
   [[nodiscard]] Digest digest() const { return digest_; }
   [[nodiscard]] Digest headDigest() const { return headDigest_; }
 
+  /// How many bytes a look reads of a file of this size.
+  [[nodiscard]] static std::uint64_t lengthOf(Look look, std::uint64_t size);
+
   /// How large a file may be to be read in one block.
   static constexpr std::uint64_t blockLength = 256 * 1024;
 

@@ -82,15 +82,14 @@ class Comparison final {
   }
 
   void addEntry(Contents& sum, const char* name, EntryKind kind, const Digest& content) {
-    std::array<char, 256 + sizeof content + 1> entry;
-    const std::size_t length = std::min<std::size_t>(std::strlen(name), 255);
-    char* end = std::copy_n(name, length, entry.data());
-    *end++ = static_cast<char>(kind);
-    std::memcpy(end, content.data(), sizeof content);
-    end += sizeof content;
+    entry_ = name;
+    entry_ += static_cast<char>(kind);
+    std::array<char, sizeof content> bytes;
+    std::memcpy(bytes.data(), content.data(), bytes.size());
+    entry_.append(bytes.data(), bytes.size());
     const std::span<const std::byte> secret = secret_.bytes();
-    const XXH128_hash_t hash = XXH3_128bits_withSecret(
-        entry.data(), static_cast<std::size_t>(end - entry.data()), secret.data(), secret.size());
+    const XXH128_hash_t hash =
+        XXH3_128bits_withSecret(entry_.data(), entry_.size(), secret.data(), secret.size());
     sum.digest[0] += hash.high64;
     sum.digest[1] += hash.low64;
   }
@@ -99,6 +98,7 @@ class Comparison final {
   const std::vector<std::uint32_t>& contents_;
   const DigestSecret secret_;
   std::vector<Contents> sums_;
+  std::string entry_;  ///< The last one that was added.
 };
 
 /// The classes of a comparison, made into groups.

@@ -2,7 +2,6 @@
 #include <Scan/ScanResult.h>
 
 #include <algorithm>
-#include <utility>
 
 #include <Scan/FolderGroups.h>
 
@@ -16,16 +15,18 @@ std::vector<std::string> ScanResult::pathsOf(const DuplicateGroup& group) const 
 
 std::vector<DuplicateFile> ScanResult::filesOf(const DuplicateGroup& group) const {
   std::vector<DuplicateFile> found;
-  for (std::uint32_t i = group.begin; i < group.begin + group.count; ++i) {
-    const FileNumber number = files[i];
-    DuplicateFile file{.path = tree->pathOf(number),
-                       .identity = tree->identityOf(number),
-                       .modifiedAt = modifiedAt[i],
-                       .isReference = isReference(number)};
-    for (const FileLink& link : linksOf(number)) file.names.push_back(tree->pathOf(link.name));
-    found.push_back(std::move(file));
-  }
+  for (std::uint32_t i = 0; i < group.count; ++i) found.push_back(fileAt(group.begin + i));
   return found;
+}
+
+DuplicateFile ScanResult::fileAt(std::uint32_t index) const {
+  const FileNumber number = files[index];
+  DuplicateFile file{.path = tree->pathOf(number),
+                     .identity = tree->identityOf(number),
+                     .modifiedAt = modifiedAt[index],
+                     .isReference = isReference(number)};
+  for (const FileLink& link : linksOf(number)) file.names.push_back(tree->pathOf(link.name));
+  return file;
 }
 
 std::vector<std::string> ScanResult::pathsOf(const FolderGroup& group) const {

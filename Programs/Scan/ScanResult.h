@@ -85,8 +85,10 @@ struct ScanResult {
 
   /// One path of each of the group's files, absolute, in the order of their bytes.
   [[nodiscard]] std::vector<std::string> pathsOf(const DuplicateGroup& group) const;
-  /// The files, in the same order.
+  /// The files, in the same order. A group may have millions: `fileAt` takes one at a time.
   [[nodiscard]] std::vector<DuplicateFile> filesOf(const DuplicateGroup& group) const;
+  /// The file at a place of `files`, from the `begin` of its group on.
+  [[nodiscard]] DuplicateFile fileAt(std::uint32_t index) const;
   /// The folders' paths, in the order of their bytes.
   [[nodiscard]] std::vector<std::string> pathsOf(const FolderGroup& group) const;
 

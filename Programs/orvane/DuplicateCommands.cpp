@@ -5,6 +5,7 @@
 #include <orvane/DisksCommand.h>
 #include <orvane/ScanAnalytics.h>
 #include <orvane/ScanCommand.h>
+#include <orvane/ScanReport.h>
 
 namespace Orvane {
 namespace {
@@ -30,26 +31,27 @@ Command scan() {
           "Find the files of equal content, as 128-bit digests tell it, in folders and below "
           "them",
       .output =
-          "The files of each group, one path a line, the group that wastes most first; the "
-          "summary last",
-      .fields = {schemaVersionField,
-                 {"folders", "how many were read"},
-                 {"files", "how many were found"},
-                 {"bytes", "of all files, hard links once"},
-                 {"emptyFiles", "files without content, which are no duplicates"},
-                 {"hardLinks", "further names of files already counted"},
-                 {"unreadableFiles", "files that could not be read"},
-                 {"vanishedFiles", "files that were gone when their turn came"},
-                 {"changedFiles", "files that changed meanwhile"},
-                 {"unreadableFolders", "folders that could not be read, or only in part"},
-                 {"duplicateFiles", "files that could go: all but one of each group"},
-                 {"wastedBytes", "what those take up"},
-                 {"groups[].size", "of each file, in bytes"},
-                 {"groups[].paths",
-                  "of the files, in the order of their bytes; bytes that are not "
-                  "UTF-8 are U+FFFD"},
-                 {"groups[].urls", "exact file URLs of all paths, only where a path is not UTF-8"}},
-      .options = {json(command),
+          "The files of each group, one path a line, the group that wastes most first, or last on "
+          "a "
+          "terminal; folders that hold the same stand for their files; the summary last",
+      .fields = scanReportFields(),
+      .options = {{.letter = 'j',
+                   .name = "json",
+                   .description = "Print one JSON object, a report for trash and share",
+                   .value = flag(command, &ScanCommand::form, ScanCommand::Form::json)},
+                  {.letter = '0',
+                   .name = "print0",
+                   .description =
+                       "Print the paths alone, a zero byte behind each and one more behind a group",
+                   .value = flag(command, &ScanCommand::form, ScanCommand::Form::pathList)},
+                  {.letter = 't',
+                   .name = "top",
+                   .description = "Print no more groups than these, those that waste most",
+                   .value = wholeNumber("NUMBER", "number", command, &ScanCommand::maxGroups)},
+                  {.letter = 's',
+                   .name = "summary",
+                   .description = "Print the summary, or the totals, without any group",
+                   .value = flag(command, &ScanCommand::maxGroups, 0)},
                   {.name = "no-progress",
                    .description = "Do not show on the terminal how far the scan is",
                    .value = flag(command, &ScanCommand::showsProgress, false)},

@@ -6,23 +6,33 @@
 #include <vector>
 
 #include <Varnel/Platform/Values/QualityOfService.h>
+#include <orvane/ResultText.h>
 
 namespace Orvane {
 
 class Console;
+class Interruption;
+struct ScanFacts;
 
 /// `orvane scan`: finds the duplicate files in folders.
 struct ScanCommand {
+  enum class Form { text, json, pathList };
+
   std::vector<std::string> folders;
   Varnel::Platform::QualityOfService qos = Varnel::Platform::QualityOfService::utility;
-  bool isJSON = false;
-  bool showsProgress = true;  ///< While standard error is a terminal.
+  Form form = Form::text;
+  std::size_t maxGroups = TextForm::allGroups;  ///< Those that waste most.
+  bool showsProgress = true;                    ///< While standard error is a terminal.
   bool playsSound = false;
   std::optional<std::string> analyticsEndpoint;  ///< Where events go; nowhere without one.
   bool printsEvents = false;
 
   /// Runs the command and returns the program's exit status.
   [[nodiscard]] int run(Console& console) const;
+
+ private:
+  [[nodiscard]] bool write(const ScanResult& result, const ScanFacts& facts,
+                           const Interruption& interruption, Console& console) const;
 };
 
 }  // namespace Orvane
