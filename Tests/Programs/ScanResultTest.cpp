@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: MIT
 #include <fcntl.h>
+#include <linux/fs.h>
+#include <sys/ioctl.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <map>
@@ -9,6 +12,8 @@
 
 #include <Scan/Candidate.h>
 #include <Tests/Programs/ScanFixture.h>
+#include <Tests/Support/DiskImage.h>
+#include <Tests/Support/MountNamespace.h>
 
 namespace Orvane::Testing {
 namespace {
@@ -112,6 +117,42 @@ TEST_F(ScanResults, CountAsWasteWhatRemovalFrees) {
     EXPECT_EQ(result.totals.wastedBytes, wastedBytes);
     EXPECT_EQ(result.totals.duplicateFiles, files.size() - 1);
   }
+}
+
+/// Makes a file that shares all extents of another one.
+bool share(const std::string& path, const std::string& other) {
+  const int from = ::open(other.c_str(), O_RDONLY | O_CLOEXEC);
+  const int file = ::open(path.c_str(), O_CREAT | O_WRONLY | O_CLOEXEC, 0600);
+  const bool isShared = ::ioctl(file, FICLONE, from) == 0;
+  ::close(file);
+  ::close(from);
+  return isShared;
+}
+
+// What the file systems themselves tell, in a mount of each.
+TEST_F(ScanResults, KnowWhichExtentsFilesShare) {
+  static const std::string reason = Varnel::Tests::enterMountNamespace();
+  if (!reason.empty()) GTEST_SKIP() << reason;
+  unsigned tried = 0;
+  for (const auto& kind : {Varnel::Tests::DiskImage::xfs(), Varnel::Tests::DiskImage::btrfs()}) {
+    const Varnel::Tests::DiskImage image(folder.path(kind.name), kind);
+    const ScanFolder mounted;
+    if (image.name().empty() || !image.mount(mounted.path())) continue;
+    ++tried;
+    constexpr std::size_t size = 200'000;
+    for (const char* name : {"in/1", "in/2", "out/1"}) mounted.write(name, bytes(size, *name));
+    fs::create_directory(mounted.path("copies"));
+    ::sync();
+    EXPECT_EQ(scan({mounted.path("in")}).totals.wastedBytes, size);
+    EXPECT_TRUE(share(mounted.path("copies/1"), mounted.path("in/1")));
+    EXPECT_EQ(scan({mounted.path("in"), mounted.path("copies")}).totals.wastedBytes, size);
+    // Both are held from outside now.
+    EXPECT_TRUE(share(mounted.path("copies/2"), mounted.path("in/2")));
+    EXPECT_EQ(scan({mounted.path("in")}).totals.wastedBytes, 0u);
+    EXPECT_EQ(scan({mounted.path("in"), mounted.path("copies")}).totals.wastedBytes, size);
+    EXPECT_EQ(::umount(mounted.path().c_str()), 0);
+  }
+  if (tried == 0) GTEST_SKIP() << "no mkfs.xfs, no mkfs.btrfs, or no loop devices";
 }
 
 /// "a/x=1 a/y=2": files and their contents. "a/l@x" is a symbolic link, "b/x:a/x" a hard link,
