@@ -16,11 +16,13 @@ using Digest = std::array<std::uint64_t, 2>;
 /// A file that may have a duplicate. One of the few things there are a million of.
 struct Candidate {
   static constexpr FileNumber lost = std::numeric_limits<FileNumber>::max();
+  static constexpr std::int64_t unread = std::numeric_limits<std::int64_t>::min();
 
   FileNumber file;          ///< `lost` once it cannot take part.
   std::uint32_t group = 0;  ///< Files of different groups are known to differ.
   /// By turns where the file lies (device and inode, or place), and the digest of what was read.
   std::array<std::uint64_t, 2> key{};
+  std::int64_t modifiedAt = unread;  ///< In nanoseconds since 1970, as the last look saw it.
 };
 
 /// What is read of files, in the order in which files are told apart. No two of the first three

@@ -81,6 +81,12 @@ std::array<ContentReader::Range, 2> ContentReader::rangesOf(Look look, std::uint
   return {Range{0, size}};
 }
 
+std::uint64_t ContentReader::lengthOf(Look look, std::uint64_t size) {
+  std::uint64_t length = 0;
+  for (const Range& range : rangesOf(look, size)) length += range.end - range.begin;
+  return length;
+}
+
 void ContentReader::begin(FileNumber file, Look look) {
   file_ = file;
   look_ = look;
@@ -150,6 +156,7 @@ bool ContentReader::finish() {
   const auto status = open_->status();
   if (!status) return lose(Loss::because(status.error()));
   if (!tree_.isUnchanged(file_, *status)) return lose({Loss::Kind::changed, {}});
+  status_ = *status;
   open_.reset();
   return true;
 }

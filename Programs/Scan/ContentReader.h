@@ -54,11 +54,15 @@ class ContentReader final {
   /// How many bytes the last step read.
   [[nodiscard]] std::uint64_t stepLength() const { return stepLength_; }
 
-  /// The next three tell of a file that is finished.
+  /// The next four tell of a file that is finished.
   [[nodiscard]] const std::optional<Loss>& loss() const { return loss_; }
+  [[nodiscard]] const FileStatus& status() const { return status_; }
   /// Of what the look shows; of the rest alone when the head was read with it.
   [[nodiscard]] Digest digest() const { return digest_; }
   [[nodiscard]] Digest headDigest() const { return headDigest_; }
+
+  /// How many bytes a look reads of a file of this size.
+  [[nodiscard]] static std::uint64_t lengthOf(Look look, std::uint64_t size);
 
   /// How large a file may be to be read in one block.
   static constexpr std::uint64_t blockLength = 256 * 1024;
@@ -91,6 +95,7 @@ class ContentReader final {
   bool isFirstBlock_ = false;
   std::uint64_t stepLength_ = 0;
   std::optional<Loss> loss_;
+  FileStatus status_{};
   Digest digest_{};
   Digest headDigest_{};
 };

@@ -6,9 +6,12 @@
 #include <utility>
 
 #include <Scan/FileReading.h>
+#include <Scan/FolderGroups.h>
 #include <Scan/FolderWalk.h>
 #include <Scan/PathOrder.h>
 #include <Scan/ScanObserver.h>
+#include <Scan/SharedSpace.h>
+#include <Scan/Waste.h>
 
 namespace Orvane {
 namespace {
@@ -49,15 +52,14 @@ class Scan final {
     hasReferences_ = !request.references.empty();
     WalkResult walk =
         walkFolders(request, ports_.fileSystem, ports_.turns, ports_.observer, control_);
-    if (control_.isCancelled) return {};
     if (!walk.lostRoots.empty()) return {.lostFolders = std::move(walk.lostRoots)};
     tree_ = walk.tree;
     reportWalk(walk);
     Candidates candidates = distinctFiles();
     keepSharedSizes(candidates);
-    std::vector<Candidates> equal = readEqual(std::move(candidates));
-    if (control_.isCancelled) return {};
-    return resultFrom(std::move(equal));
+    FileReading reading({*tree_, ports_.fileSystem, ports_.turns}, control_);
+    std::vector<Candidates> equal = readEqual(reading, std::move(candidates));
+    return resultFrom(std::move(equal), reading.takeFootprints());
   }
 
  private:
@@ -142,10 +144,13 @@ class Scan final {
       *kept = *begin;
       if (end - begin > 1) {
         kept->file = *link;
-        link += end - begin;
+        for (const auto last = link + (end - begin); ++link != last;)
+          links_.push_back({.file = kept->file, .name = *link});
       }
       ++kept;
     });
+    std::stable_sort(links_.begin(), links_.end(),
+                     [](const FileLink& a, const FileLink& b) { return a.file < b.file; });
     totals_.hardLinks = static_cast<std::uint64_t>(files.end() - kept);
     files.erase(kept, files.end());
   }
@@ -193,8 +198,7 @@ class Scan final {
   }
 
   /// The candidates of equal content. Each look is for those that are still alike after the last.
-  std::vector<Candidates> readEqual(Candidates candidates) {
-    FileReading reading({*tree_, ports_.fileSystem, ports_.turns}, control_);
+  std::vector<Candidates> readEqual(FileReading& reading, Candidates candidates) {
     const auto look = [&](Look next, Candidates& files) {
       reading.read(next, files);
       leaveOut(reading.takeLosses());
@@ -229,18 +233,37 @@ class Scan final {
   }
 
   /// The result from groups that are numbered from 1 in each part.
-  ScanResult resultFrom(std::vector<Candidates> parts) {
-    std::vector<std::uint32_t> groupOf(tree_->endOfNumbers());
+  ScanResult resultFrom(std::vector<Candidates> parts, const std::vector<Footprint>& footprints) {
+    std::vector<std::uint32_t> contents(tree_->endOfNumbers());
+    ScanResult result = groupFiles(std::move(parts), contents);
+    setContentsOfLinks(contents, static_cast<std::uint32_t>(result.groups.size()));
+    std::erase_if(links_,
+                  [&](const FileLink& link) { return contents[link.file] > result.groups.size(); });
+    result.links = std::move(links_);
+    result.isPartial = control_.isCancelled;
+    computeWaste(result, footprints,
+                 findSharedSpace(*tree_, result.files, ports_.fileSystem, ports_.turns, control_));
+    findFolderGroups(result, contents);
+    std::stable_sort(result.groups.begin(), result.groups.end(),
+                     [](const DuplicateGroup& a, const DuplicateGroup& b) {
+                       return a.wastedBytes > b.wastedBytes;
+                     });
+    return result;
+  }
+
+  /// The groups by their first path. Gives the content of each a number, from 1 on.
+  ScanResult groupFiles(std::vector<Candidates> parts, std::vector<std::uint32_t>& contents) {
+    std::vector<std::int64_t> modifiedAt(tree_->endOfNumbers());
     std::vector<FileNumber> files;
     std::vector<DuplicateGroup> groups;
     for (Candidates& part : parts) {
       const auto first = static_cast<std::uint32_t>(groups.size());
       for (const Candidate& candidate : part) {
-        const std::uint32_t group = first + candidate.group - 1;
-        if (group == groups.size()) groups.push_back({.size = sizeOf(candidate)});
-        ++groups[group].count;
-        if (isToStay(candidate.file)) ++groups[group].references;
-        groupOf[candidate.file] = group;
+        const std::uint32_t group = first + candidate.group;
+        if (group > groups.size()) groups.push_back({.size = sizeOf(candidate)});
+        ++groups[group - 1].count;
+        contents[candidate.file] = group;
+        modifiedAt[candidate.file] = candidate.modifiedAt;
         files.push_back(candidate.file);
       }
       Candidates().swap(part);
@@ -250,25 +273,30 @@ class Scan final {
       end += std::exchange(group.count, 0);
     }
     sortByPath(*tree_, files);
-    ScanResult result{.totals = totals_, .files = std::vector<FileNumber>(files.size())};
+    ScanResult result{.totals = totals_,
+                      .files = std::vector<FileNumber>(files.size()),
+                      .modifiedAt = std::vector<std::int64_t>(files.size()),
+                      .tree = tree_};
     std::vector<std::uint32_t> byFirstPath;
     for (const FileNumber file : files) {
-      DuplicateGroup& group = groups[groupOf[file]];
-      if (group.count == 0) byFirstPath.push_back(groupOf[file]);
-      result.files[group.begin + group.count++] = file;
+      DuplicateGroup& group = groups[contents[file] - 1];
+      if (group.count == 0) byFirstPath.push_back(contents[file] - 1);
+      const std::uint32_t index = group.begin + group.count++;
+      result.files[index] = file;
+      result.modifiedAt[index] = modifiedAt[file];
     }
     result.groups.reserve(groups.size());
     for (const std::uint32_t group : byFirstPath) result.groups.push_back(groups[group]);
-    std::stable_sort(result.groups.begin(), result.groups.end(),
-                     [](const DuplicateGroup& a, const DuplicateGroup& b) {
-                       return a.wastedBytes() > b.wastedBytes();
-                     });
-    for (const DuplicateGroup& group : result.groups) {
-      result.totals.duplicateFiles += group.removable();
-      result.totals.wastedBytes += group.wastedBytes();
-    }
-    result.tree = tree_;
     return result;
+  }
+
+  /// Gives a file's further names the number of its content. Where it has no equal, its names have,
+  /// for they are of one content.
+  void setContentsOfLinks(std::vector<std::uint32_t>& contents, std::uint32_t last) const {
+    for (const FileLink& link : links_) {
+      if (contents[link.file] == 0) contents[link.file] = ++last;
+      contents[link.name] = contents[link.file];
+    }
   }
 
   DuplicateFinder::Ports ports_;
@@ -276,6 +304,7 @@ class Scan final {
   std::shared_ptr<const FileTree> tree_;
   bool hasReferences_ = false;
   ScanTotals totals_;
+  std::vector<FileLink> links_;  ///< Of all files; sorted as in the result.
 };
 
 }  // namespace

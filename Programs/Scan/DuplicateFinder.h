@@ -36,8 +36,8 @@ class DuplicateFinder final {
 
   explicit DuplicateFinder(Ports ports) : ports_(ports) {}
 
-  /// Once `control` asks to stop it
-  /// returns soon, with a result that is of no use.
+  /// Once `control` asks to stop it returns soon, with a partial result: the files that were
+  /// compared by then.
   [[nodiscard]] ScanResult find(const ScanRequest& request, ScanControl& control);
 
  private:

@@ -41,7 +41,7 @@ class FileReading::DiskPass final {
 
   void start() {
     if (!disk_.isReadable) {
-      for (Candidate& file : files_) lose(file, diskIsGone());
+      for (Candidate& file : files_) lose(file, diskIsGone(), lengthOf(file));
     } else if (disk_.isOrdered && owner_.coldDisks_.contains(&disk_)) {
       place(0);
     } else {
@@ -127,7 +127,14 @@ class FileReading::DiskPass final {
     return isWhole ? Look::headAndRest : look_;
   }
 
-  void lose(Candidate& file, const Loss& loss) {
+  /// How much of the file each look reads that has not found it to be worth more.
+  [[nodiscard]] std::uint64_t lengthOf(const Candidate& file) const {
+    return ContentReader::lengthOf(look_, sizeOf(file));
+  }
+
+  /// Some bytes will not be read that were to be.
+  void lose(Candidate& file, const Loss& loss, std::uint64_t unreadBytes) {
+    owner_.control_.bytesToRead.fetch_sub(unreadBytes, std::memory_order_relaxed);
     const std::lock_guard lock(owner_.mutex_);
     owner_.losses_.emplace_back(std::exchange(file.file, Candidate::lost), loss);
   }
@@ -202,6 +209,7 @@ class FileReading::DiskPass::ReadingTask final : public TaskGroup::Task {
       if (!goesOn) break;
       const bool isFinished = reader_.step();
       bytes += reader_.stepLength();
+      unreadBytes_ -= std::min(reader_.stepLength(), unreadBytes_);
       turn.didRead(reader_.stepLength());
       if (isFinished) {
         settle();
@@ -223,7 +231,7 @@ class FileReading::DiskPass::ReadingTask final : public TaskGroup::Task {
 
   void refuse() override {
     while (file_ || begin()) {
-      pass_.lose(*file_, diskIsGone());
+      pass_.lose(*file_, diskIsGone(), unreadBytes_);
       file_ = nullptr;
     }
     end();
@@ -235,13 +243,22 @@ class FileReading::DiskPass::ReadingTask final : public TaskGroup::Task {
     if (!file_) return false;
     place_ = file_->key[1];
     look_ = pass_.lookAt(*file_);
+    unreadBytes_ = ContentReader::lengthOf(look_, pass_.sizeOf(*file_));
+    pass_.owner_.control_.bytesToRead.fetch_add(unreadBytes_ - pass_.lengthOf(*file_),
+                                                std::memory_order_relaxed);
     reader_.begin(file_->file, look_);
     return true;
   }
 
   void settle() {
     Candidate& file = *std::exchange(file_, nullptr);
-    if (const auto& loss = reader_.loss()) return pass_.lose(file, *loss);
+    if (const auto& loss = reader_.loss()) return pass_.lose(file, *loss, unreadBytes_);
+    const FileStatus& status = reader_.status();
+    file.modifiedAt = status.modifiedAt;
+    const bool isRead =
+        look_ != Look::samples && (look_ != Look::head || status.size <= headLength);
+    if (isRead && (status.links > 1 || status.allocated < status.size))
+      footprints_.push_back({file.file, status.links, std::min(status.allocated, status.size)});
     if (look_ == pass_.look_) {
       file.key = reader_.digest();
     } else {
@@ -255,6 +272,8 @@ class FileReading::DiskPass::ReadingTask final : public TaskGroup::Task {
       const std::lock_guard lock(pass_.owner_.mutex_);
       Digests& all = pass_.owner_.restDigests_;
       all.insert(all.end(), rests_.begin(), rests_.end());
+      auto& footprints = pass_.owner_.footprints_;
+      footprints.insert(footprints.end(), footprints_.begin(), footprints_.end());
     }
     pass_.didEnd();
   }
@@ -264,8 +283,10 @@ class FileReading::DiskPass::ReadingTask final : public TaskGroup::Task {
   Candidate* file_ = nullptr;  ///< The one that is being read.
   Look look_ = Look::head;
   std::uint64_t place_ = 0;
+  std::uint64_t unreadBytes_ = 0;  ///< Of the file.
   bool mayReadLarge_ = false;
   Digests rests_;
+  std::vector<Footprint> footprints_;
 };
 
 void FileReading::DiskPass::startPlacing() {
@@ -279,8 +300,15 @@ void FileReading::DiskPass::startReading(unsigned count) {
 FileReading::~FileReading() = default;
 
 void FileReading::read(Look look, std::vector<Candidate>& candidates) {
+  if (control_.isCancelled) return candidates.clear();
   control_.filesToRead.fetch_add(candidates.size(), std::memory_order_relaxed);
-  for (Candidate& candidate : candidates) candidate.key = ports_.tree.locationOf(candidate.file);
+  std::uint64_t bytes = 0;
+  for (Candidate& candidate : candidates) {
+    bytes += ContentReader::lengthOf(look, ports_.tree.file(candidate.file).size);
+    candidate.key = ports_.tree.locationOf(candidate.file);
+    candidate.modifiedAt = Candidate::unread;
+  }
+  control_.bytesToRead.fetch_add(bytes, std::memory_order_relaxed);
   const auto liesBefore = [](const Candidate& a, const Candidate& b) { return a.key < b.key; };
   if (!std::is_sorted(candidates.begin(), candidates.end(), liesBefore))
     std::sort(candidates.begin(), candidates.end(), liesBefore);
@@ -299,8 +327,15 @@ void FileReading::read(Look look, std::vector<Candidate>& candidates) {
   group.wait();
   for (const auto& [disk, pass] : passes)
     if (pass->isCold()) coldDisks_.insert(disk);
-  std::erase_if(candidates, [](const Candidate& file) { return file.file == Candidate::lost; });
+  std::erase_if(candidates, [](const Candidate& file) {
+    return file.file == Candidate::lost || file.modifiedAt == Candidate::unread;
+  });
   std::sort(restDigests_.begin(), restDigests_.end());
+}
+
+std::vector<Footprint> FileReading::takeFootprints() {
+  sortByFile(footprints_);
+  return std::exchange(footprints_, {});
 }
 
 std::optional<Digest> FileReading::restDigest(FileNumber file) const {

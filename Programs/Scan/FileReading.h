@@ -9,6 +9,7 @@
 
 #include <Scan/Candidate.h>
 #include <Scan/ContentReader.h>
+#include <Scan/Footprint.h>
 #include <Scan/Loss.h>
 
 namespace Orvane {
@@ -41,12 +42,16 @@ class FileReading final {
   FileReading(Ports ports, ScanControl& control) : ports_(ports), control_(control) {}
   ~FileReading();
 
-  /// Leaves in each candidate's key the digest of what the look shows. Those that cannot be read
-  /// become `lost`.
+  /// Leaves in each candidate's key the digest of what the look shows. Drops those that cannot be
+  /// read, and those whose turn did not come because the scan was cancelled.
   void read(Look look, std::vector<Candidate>& candidates);
 
   /// What was lost since the last call, in no order.
   [[nodiscard]] Losses takeLosses() { return std::exchange(losses_, {}); }
+
+  /// The files that were read to their end and take up other than their size, or have other names;
+  /// sorted.
+  [[nodiscard]] std::vector<Footprint> takeFootprints();
 
   /// The digest of the rest, if a look at heads has read it with the head.
   [[nodiscard]] std::optional<Digest> restDigest(FileNumber file) const;
@@ -62,6 +67,7 @@ class FileReading final {
 
   std::mutex mutex_;  ///< Guards these while tasks run.
   Losses losses_;
+  std::vector<Footprint> footprints_;
   Digests restDigests_;  ///< Sorted when no task runs.
 };
 

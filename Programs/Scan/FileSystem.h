@@ -26,13 +26,19 @@ struct FileIdentity {
   auto operator<=>(const FileIdentity&) const = default;
 };
 
-/// Tells one state of a file's content from another.
+/// With identity, size and time one state of a file's content is told from another.
 struct FileStatus {
   FileIdentity identity;
   std::uint64_t size = 0;       ///< Bytes.
   std::int64_t modifiedAt = 0;  ///< Nanoseconds since 1970.
+  std::uint64_t allocated = 0;  ///< Bytes that it takes up: none for its holes.
+  std::uint32_t links = 1;      ///< Its names, wherever they are.
+};
 
-  bool operator==(const FileStatus&) const = default;
+/// What a file holds together with other files of its volume.
+struct SharedExtents {
+  std::uint64_t bytes = 0;
+  std::uint64_t place = 0;  ///< Files of one place share everything with one another.
 };
 
 /// A regular file that is open for reading. One thread at a time; closed when destroyed.
@@ -49,6 +55,9 @@ class OpenFile {
 
   /// Where on the volume the content begins, in bytes; nothing when that cannot be told.
   [[nodiscard]] virtual std::optional<std::uint64_t> place() = 0;
+
+  /// What it shares with other files; nothing when that cannot be told.
+  [[nodiscard]] virtual std::optional<SharedExtents> sharedExtents() = 0;
 };
 
 /// How the reader of a file is going to read.
@@ -78,13 +87,16 @@ class OpenFolder {
 
   [[nodiscard]] virtual FileIdentity identity() const = 0;
 
-  /// Calls `visit` for the next few entries; each call goes on where the last one ended. Those of
-  /// the other kinds are left out. False when there are no more.
+  /// Calls `visit` for the next few entries; each call goes on where the last one ended. False when
+  /// there are no more.
   [[nodiscard]] virtual FileResult<bool> list(
       const std::function<void(const FolderEntry&)>& visit) = 0;
 
   /// The entry of this name.
   [[nodiscard]] virtual FolderEntry look(const char* name) = 0;
+
+  /// Whether its volume lets files share extents, and tells which do.
+  [[nodiscard]] virtual bool mayShareExtents() const = 0;
 
   /// Opens a file in the folder, and never waits for the other end of a pipe that took the file's
   /// place. The status tells whether it is still a file, and which one.

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <fcntl.h>
+#include <linux/btrfs.h>
 #include <linux/fiemap.h>
 #include <linux/fs.h>
 #include <linux/magic.h>
@@ -14,11 +15,66 @@
 #include <cerrno>
 #include <cstddef>
 #include <cstring>
+#include <span>
 #include <string>
 
 #include <Scan/SystemCalls.h>
 
 namespace Orvane {
+namespace {
+
+// Not every release of the headers names them.
+constexpr std::uint32_t xfsMagic = 0x5846'5342;
+constexpr std::uint32_t bcachefsMagic = 0xca45'1a4e;
+
+/// A file in more pieces than fit into these is not looked at to its end.
+constexpr unsigned maxMaps = 4096;
+
+/// The system's list of some of a file's extents, from a place on.
+template <std::uint32_t maxCount>
+class ExtentMap final {
+ public:
+  explicit ExtentMap(std::uint64_t begin) {
+    fiemap head{};
+    head.fm_start = begin;
+    head.fm_length = FIEMAP_MAX_OFFSET - begin;
+    head.fm_extent_count = maxCount;
+    std::memcpy(answer_.data(), &head, sizeof head);
+  }
+
+  /// Valid as long as the object; nothing when the system does not tell.
+  std::optional<std::span<const fiemap_extent>> ask(int descriptor) {
+    if (::ioctl(descriptor, FS_IOC_FIEMAP, answer_.data()) != 0) return std::nullopt;
+    fiemap head;
+    std::memcpy(&head, answer_.data(), sizeof head);
+    std::memcpy(extents_.data(), answer_.data() + sizeof head, sizeof extents_);
+    return std::span<const fiemap_extent>(extents_).first(head.fm_mapped_extents);
+  }
+
+ private:
+  std::array<fiemap_extent, maxCount> extents_{};
+  alignas(fiemap) std::array<std::byte, sizeof(fiemap) + sizeof extents_> answer_{};
+};
+
+std::uint64_t mixed(std::uint64_t sum, std::uint64_t fact) {
+  sum = (sum ^ fact) * 0x9E37'79B9'7F4A'7C15;
+  return sum ^ sum >> 32;
+}
+
+/// A number for the volume. The subvolumes of one have devices of their own, and share extents.
+std::optional<std::uint64_t> volumeOf(int descriptor) {
+  btrfs_ioctl_fs_info_args volume{};
+  if (::ioctl(descriptor, BTRFS_IOC_FS_INFO, &volume) == 0) {
+    std::array<std::uint64_t, 2> identifier;
+    std::memcpy(identifier.data(), volume.fsid, sizeof identifier);
+    return mixed(identifier[0], identifier[1]);
+  }
+  struct stat facts;
+  if (::fstat(descriptor, &facts) != 0) return std::nullopt;
+  return facts.st_dev;
+}
+
+}  // namespace
 
 const int openToPassThrough = O_PATH | O_DIRECTORY;
 
@@ -49,16 +105,44 @@ bool isInMemory(int folder) {
          (facts.f_type == TMPFS_MAGIC || facts.f_type == RAMFS_MAGIC);
 }
 
+bool isHole(int descriptor) {
+  return ::lseek(descriptor, 0, SEEK_DATA) < 0 && errno == ENXIO;
+}
+
+bool tellsSharedExtents(int folder) {
+  struct statfs facts;
+  if (::fstatfs(folder, &facts) != 0) return false;
+  const auto type = static_cast<std::uint32_t>(facts.f_type);
+  return type == BTRFS_SUPER_MAGIC || type == xfsMagic || type == bcachefsMagic;
+}
+
+std::optional<SharedExtents> sharedExtentsOf(int descriptor) {
+  const auto volume = volumeOf(descriptor);
+  if (!volume) return std::nullopt;
+  SharedExtents found{.place = *volume};
+  std::uint64_t begin = 0;
+  unsigned maps = 0;
+  for (bool isLast = false; !isLast;) {
+    ExtentMap<64> map(begin);
+    const auto extents = map.ask(descriptor);
+    if (!extents || ++maps > maxMaps) return std::nullopt;
+    isLast = extents->empty();
+    for (const fiemap_extent& extent : *extents) {
+      for (const std::uint64_t fact : {extent.fe_logical, extent.fe_physical, extent.fe_length})
+        found.place = mixed(found.place, fact);
+      if (extent.fe_flags & FIEMAP_EXTENT_SHARED) found.bytes += extent.fe_length;
+      begin = extent.fe_logical + extent.fe_length;
+      isLast = (extent.fe_flags & FIEMAP_EXTENT_LAST) != 0;
+    }
+  }
+  return found;
+}
+
 std::optional<std::uint64_t> placeOf(int descriptor) {
-  // Room for the head of the answer and the one extent that is asked for.
-  alignas(fiemap) std::array<std::byte, sizeof(fiemap) + sizeof(fiemap_extent)> answer{};
-  auto* const map = reinterpret_cast<fiemap*>(answer.data());
-  map->fm_length = FIEMAP_MAX_OFFSET;
-  map->fm_extent_count = 1;
-  if (::ioctl(descriptor, FS_IOC_FIEMAP, map) != 0 || map->fm_mapped_extents == 0)
-    return std::nullopt;
-  fiemap_extent extent;
-  std::memcpy(&extent, answer.data() + sizeof(fiemap), sizeof extent);
+  ExtentMap<1> map(0);
+  const auto extents = map.ask(descriptor);
+  if (!extents || extents->empty()) return std::nullopt;
+  const fiemap_extent& extent = extents->front();
   if (extent.fe_flags & (FIEMAP_EXTENT_UNKNOWN | FIEMAP_EXTENT_DELALLOC)) return std::nullopt;
   return extent.fe_physical;
 }

@@ -24,6 +24,18 @@ bool isInMemory(int) {
   return false;
 }
 
+bool isHole(int) {
+  return false;
+}
+
+bool tellsSharedExtents(int) {
+  return false;
+}
+
+std::optional<SharedExtents> sharedExtentsOf(int) {
+  return std::nullopt;
+}
+
 std::optional<std::uint64_t> placeOf(int) {
   return std::nullopt;
 }

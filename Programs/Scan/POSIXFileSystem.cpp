@@ -77,9 +77,14 @@ Descriptor openWithoutLinks(int base, std::string_view path, int flags) {
 }
 
 FileStatus statusFrom(const struct stat& facts) {
+  // A moment that no 64 bits hold wraps around; it is still another than those near it.
+  const auto modifiedAt = static_cast<std::uint64_t>(facts.st_mtim.tv_sec) * 1'000'000'000 +
+                          static_cast<std::uint64_t>(facts.st_mtim.tv_nsec);
   return {.identity = {.device = facts.st_dev, .inode = facts.st_ino},
           .size = static_cast<std::uint64_t>(facts.st_size),
-          .modifiedAt = std::int64_t{facts.st_mtim.tv_sec} * 1'000'000'000 + facts.st_mtim.tv_nsec};
+          .modifiedAt = static_cast<std::int64_t>(modifiedAt),
+          .allocated = static_cast<std::uint64_t>(facts.st_blocks) * 512,
+          .links = static_cast<std::uint32_t>(facts.st_nlink)};
 }
 
 class DescriptorFile final : public OpenFile {
@@ -102,10 +107,17 @@ class DescriptorFile final : public OpenFile {
   FileResult<FileStatus> status() override {
     struct stat facts;
     if (::fstat(descriptor_.get(), &facts) != 0) return lastError();
-    return statusFrom(facts);
+    FileStatus status = statusFrom(facts);
+    // Some systems count no blocks at all.
+    if (status.allocated == 0 && !isHole(descriptor_.get())) status.allocated = status.size;
+    return status;
   }
 
   std::optional<std::uint64_t> place() override { return placeOf(descriptor_.get()); }
+
+  std::optional<SharedExtents> sharedExtents() override {
+    return sharedExtentsOf(descriptor_.get());
+  }
 
  private:
   Descriptor descriptor_;
@@ -140,6 +152,8 @@ class DescriptorFolder final : public OpenFolder {
     return {.kind = Kind::file, .name = name, .inode = 0, .status = statusFrom(facts)};
   }
 
+  [[nodiscard]] bool mayShareExtents() const override { return tellsSharedExtents(number()); }
+
   FileResult<std::unique_ptr<OpenFile>> open(const char* name, ReadingPlan plan) override {
     Descriptor descriptor(
         ::openat(number(), name, O_RDONLY | O_NONBLOCK | O_NOCTTY | O_NOFOLLOW | O_CLOEXEC));
@@ -170,24 +184,22 @@ class DescriptorFolder final : public OpenFolder {
       const auto* const entry = reinterpret_cast<const dirent64*>(buffer_.get() + at);
       at += entry->d_reclen;
       const std::string_view name = entry->d_name;
-      if (name != "." && name != ".." && mayTakePart(entry->d_type)) entries_.push_back(entry);
+      if (name != "." && name != "..") entries_.push_back(entry);
     }
     std::sort(entries_.begin(), entries_.end(),
               [](const dirent64* a, const dirent64* b) { return a->d_ino < b->d_ino; });
     return size > 0;
   }
 
-  static bool mayTakePart(unsigned char type) {
-    return type == DT_REG || type == DT_DIR || type == DT_UNKNOWN;
-  }
-
   /// The kind that comes with the name saves asking for the status of folders.
   void visitEntry(const dirent64& listed, const std::function<void(const FolderEntry&)>& visit) {
     using Kind = FolderEntry::Kind;
+    const char* const name = listed.d_name;
     if (listed.d_type == DT_DIR)
-      return visit({.kind = Kind::folder, .name = listed.d_name, .inode = listed.d_ino});
-    const FolderEntry entry = look(listed.d_name);
-    if (entry.kind != Kind::other) visit(entry);
+      return visit({.kind = Kind::folder, .name = name, .inode = listed.d_ino});
+    if (listed.d_type != DT_REG && listed.d_type != DT_UNKNOWN)
+      return visit({.kind = Kind::other, .name = name, .inode = 0});
+    visit(look(name));
   }
 
   Descriptor descriptor_;

@@ -31,6 +31,7 @@ struct ScanControl {
   std::atomic<std::uint64_t> filesFound{0};
   std::atomic<std::uint64_t> filesToRead{0};
   std::atomic<std::uint64_t> filesRead{0};
+  std::atomic<std::uint64_t> bytesToRead{0};  ///< As far as is known; it grows, as for the files.
   std::atomic<std::uint64_t> bytesRead{0};
 };
 

@@ -4,6 +4,8 @@
 #include <cstdint>
 #include <optional>
 
+#include <Scan/FileSystem.h>
+
 namespace Orvane {
 
 // What the systems of the POSIX family do each in its own way, or not at all. CMake chooses the
@@ -23,6 +25,15 @@ extern const int openToPassThrough;
 /// Whether the files in the folder are known to be in memory alone, so that no cache holds anything
 /// of them.
 [[nodiscard]] bool isInMemory(int folder);
+
+/// Whether the system knows that the file has no content but holes.
+[[nodiscard]] bool isHole(int descriptor);
+
+/// Whether the file system of the folder lets files share extents, and tells which do.
+[[nodiscard]] bool tellsSharedExtents(int folder);
+
+/// What the file shares with others, if the system tells.
+[[nodiscard]] std::optional<SharedExtents> sharedExtentsOf(int descriptor);
 
 /// Where on its disk the file begins, if the system tells.
 [[nodiscard]] std::optional<std::uint64_t> placeOf(int descriptor);

@@ -16,8 +16,10 @@ namespace Orvane {
 
 // Values that keep themselves in a member of a command.
 
-template <typename Command>
-Value flag(std::shared_ptr<Command> command, bool Command::*member, bool meaning = true) {
+/// Without a value of its own: the option stands for the meaning.
+template <typename Command, typename T = bool>
+Value flag(std::shared_ptr<Command> command, T Command::*member,
+           std::type_identity_t<T> meaning = true) {
   return {.take = [=](const std::string&) {
     (*command).*member = meaning;
     return Complaint();
@@ -61,18 +63,24 @@ Value word(std::string name, std::shared_ptr<Command> command, T Command::*membe
 }
 
 /// Digits and nothing else: no sign, no other base.
-template <typename Command>
-Value byteCount(std::shared_ptr<Command> command, std::int64_t Command::*member) {
-  return {.name = "BYTES", .take = [command, member](const std::string& given) {
+template <typename Command, typename T>
+Value wholeNumber(std::string name, std::string thing, std::shared_ptr<Command> command,
+                  T Command::*member) {
+  return {.name = std::move(name), .take = [=](const std::string& given) {
             const char* const end = given.data() + given.size();
-            std::int64_t& count = (*command).*member;
+            T& count = (*command).*member;
             const auto [stop, status] = std::from_chars(given.data(), end, count);
             if (status == std::errc::invalid_argument || stop != end || given.starts_with('-'))
-              return Complaint("\"" + given + "\" is no count of bytes");
+              return Complaint("\"" + given + "\" is no " + thing);
             if (status == std::errc::result_out_of_range)
               return Complaint("\"" + given + "\" is more than there can be");
             return Complaint();
           }};
+}
+
+template <typename Command>
+Value byteCount(std::shared_ptr<Command> command, std::int64_t Command::*member) {
+  return wholeNumber("BYTES", "count of bytes", command, member);
 }
 
 }  // namespace Orvane

@@ -7,6 +7,7 @@
 #include <orvane/DisksCommand.h>
 #include <orvane/ScanAnalytics.h>
 #include <orvane/ScanCommand.h>
+#include <orvane/ScanReport.h>
 #include <orvane/SizeText.h>
 
 namespace Orvane {
@@ -76,33 +77,49 @@ std::vector<Option> choosingOptions(const std::shared_ptr<ScanChoice>& choice) {
 /// The options of a scan that do not choose.
 std::vector<Option> workingOptions(const std::shared_ptr<ScanCommand>& command) {
   using enum QualityOfService;
-  return {json(command),
-          {.name = "no-progress",
-           .description = "Do not show on the terminal how far the scan is",
-           .value = flag(command, &ScanCommand::showsProgress, false)},
-          {.letter = 'p',
-           .name = "progress",
-           .description = "Show it, as without either",
-           .value = flag(command, &ScanCommand::showsProgress)},
-          {.name = "sound",
-           .description = "Play a sound at the end",
-           .value = flag(command, &ScanCommand::playsSound)},
-          {.letter = 'q',
-           .name = "qos",
-           .description = "How urgent reading is",
-           .value = word("QUALITY", command, &ScanCommand::qos,
-                         {{"background", background},
-                          {"utility", utility},
-                          {"user-initiated", userInitiated},
-                          {"user-interactive", userInteractive}}),
-           .defaultValue = "utility"},
-          {.name = "analytics",
-           .description = "Send events of the scan there, if the user consents",
-           .value = text("URL", command, &ScanCommand::analyticsEndpoint, Value::Kind::text,
-                         checkEndpoint)},
-          {.name = "print-events",
-           .description = "Show events on standard error",
-           .value = flag(command, &ScanCommand::printsEvents)}};
+  return {
+      {.letter = 'j',
+       .name = "json",
+       .description = "Print one JSON object, a report for trash and share",
+       .value = flag(command, &ScanCommand::form, ScanCommand::Form::json)},
+      {.letter = '0',
+       .name = "print0",
+       .description = "Print the paths alone, a zero byte behind each and one more behind a group",
+       .value = flag(command, &ScanCommand::form, ScanCommand::Form::pathList)},
+      {.letter = 't',
+       .name = "top",
+       .description = "Print no more groups than these, those that waste most",
+       .value = wholeNumber("NUMBER", "number", command, &ScanCommand::maxGroups)},
+      {.letter = 's',
+       .name = "summary",
+       .description = "Print the summary, or the totals, without any group",
+       .value = flag(command, &ScanCommand::maxGroups, 0)},
+      {.name = "no-progress",
+       .description = "Do not show on the terminal how far the scan is",
+       .value = flag(command, &ScanCommand::showsProgress, false)},
+      {.letter = 'p',
+       .name = "progress",
+       .description = "Show it, as without either",
+       .value = flag(command, &ScanCommand::showsProgress)},
+      {.name = "sound",
+       .description = "Play a sound at the end",
+       .value = flag(command, &ScanCommand::playsSound)},
+      {.letter = 'q',
+       .name = "qos",
+       .description = "How urgent reading is",
+       .value = word("QUALITY", command, &ScanCommand::qos,
+                     {{"background", background},
+                      {"utility", utility},
+                      {"user-initiated", userInitiated},
+                      {"user-interactive", userInteractive}}),
+       .defaultValue = "utility"},
+      {.name = "analytics",
+       .description = "Send events of the scan there, if the user consents",
+       .value =
+           text("URL", command, &ScanCommand::analyticsEndpoint, Value::Kind::text, checkEndpoint)},
+      {.name = "print-events",
+       .description = "Show events on standard error",
+       .value = flag(command, &ScanCommand::printsEvents)}};
 }
 
 Command scan() {
@@ -117,27 +134,9 @@ Command scan() {
           "Find the files of equal content, as 128-bit digests tell it, in folders and below "
           "them",
       .output =
-          "The files of each group, one path a line, the group that wastes most first; the "
-          "summary last",
-      .fields = {schemaVersionField,
-                 {"folders", "how many were read"},
-                 {"files", "how many were found"},
-                 {"bytes", "of all files, hard links once"},
-                 {"emptyFiles", "files without content, which are no duplicates"},
-                 {"referenceFiles", "files that are to stay, as --keep-in says"},
-                 {"hardLinks", "further names of files already counted"},
-                 {"unreadableFiles", "files that could not be read"},
-                 {"vanishedFiles", "files that were gone when their turn came"},
-                 {"changedFiles", "files that changed meanwhile"},
-                 {"unreadableFolders", "folders that could not be read, or only in part"},
-                 {"duplicateFiles",
-                  "files that could go: of each group all that need not stay, or all but one"},
-                 {"wastedBytes", "what those take up"},
-                 {"groups[].size", "of each file, in bytes"},
-                 {"groups[].paths",
-                  "of the files, in the order of their bytes; bytes that are not "
-                  "UTF-8 are U+FFFD"},
-                 {"groups[].urls", "exact file URLs of all paths, only where a path is not UTF-8"}},
+          "The files of each group, one path a line, the group that wastes most first, or last on "
+          "a terminal; folders that hold the same stand for their files; the summary last",
+      .fields = scanReportFields(),
       .options = std::move(options),
       .operands = {.value = text("FOLDER", choice, &ScanChoice::folders, Value::Kind::folder,
                                  checkFolder),

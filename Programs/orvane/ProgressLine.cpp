@@ -16,8 +16,8 @@
 namespace Orvane {
 namespace {
 
-std::string megabytes(double bytes) {
-  return std::to_string(static_cast<std::uint64_t>(bytes / 1e6));
+std::string megabytes(std::uint64_t bytes) {
+  return std::to_string(bytes / 1'000'000);
 }
 
 /// "45 s", "12 min", "3 h".
@@ -59,23 +59,22 @@ void ProgressLine::show(const std::stop_token& stop) {
 
 std::string ProgressLine::text(const ScanControl& control, std::chrono::milliseconds readingTime,
                                std::size_t columns) {
-  const std::uint64_t toRead = control.filesToRead;
-  const std::uint64_t read = std::min<std::uint64_t>(control.filesRead, toRead);
-  const std::uint64_t bytes = control.bytesRead;
+  const std::uint64_t files = control.filesToRead;
+  const std::uint64_t bytes = control.bytesToRead;
+  const std::uint64_t read = std::min<std::uint64_t>(control.bytesRead, bytes);
   std::vector<std::string> parts;
-  if (toRead == 0) {
+  if (files == 0) {
     parts.push_back("Looking: " + counted(control.filesFound, "file", "files"));
   } else {
-    parts.push_back("Reading: " + std::to_string(read) + " of " + counted(toRead, "file", "files"));
-    parts.push_back(megabytes(static_cast<double>(bytes)) + " MB");
+    parts.push_back("Reading: " + megabytes(read) + " of " + megabytes(bytes) + " MB");
     const double seconds = std::chrono::duration<double>(readingTime).count();
-    if (seconds >= 1) {
-      parts.push_back(megabytes(static_cast<double>(bytes) / seconds) + " MB/s");
-      if (read > 0)
-        parts.push_back(
-            timeText(seconds / static_cast<double>(read) * static_cast<double>(toRead - read)) +
-            " left");
+    if (seconds >= 1 && read > 0) {
+      const double rate = static_cast<double>(read) / seconds;
+      parts.push_back(timeText(static_cast<double>(bytes - read) / rate) + " left");
+      parts.push_back(megabytes(static_cast<std::uint64_t>(rate)) + " MB/s");
     }
+    parts.push_back(std::to_string(std::min<std::uint64_t>(control.filesRead, files)) + " of " +
+                    counted(files, "file", "files"));
   }
   std::string line;
   for (const std::string& part : parts) {

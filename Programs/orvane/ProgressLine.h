@@ -21,8 +21,9 @@ class ProgressLine final {
   ProgressLine(const ProgressLine&) = delete;
   ProgressLine& operator=(const ProgressLine&) = delete;
 
-  /// What the control says some time after the reading began: the phase and its files, the bytes
-  /// read, their rate and the time left. What has no room in the columns is left out from the end.
+  /// What the control says some time after the reading began: the phase, the bytes, the time that
+  /// those known of will take, the rate, and the files. What has no room in the columns is left out
+  /// from the end.
   [[nodiscard]] static std::string text(const ScanControl& control,
                                         std::chrono::milliseconds readingTime, std::size_t columns);
 

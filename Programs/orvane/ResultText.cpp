@@ -2,78 +2,145 @@
 #include <orvane/ResultText.h>
 
 #include <algorithm>
-#include <nlohmann/json.hpp>
-#include <string>
-#include <utility>
+#include <sstream>
+#include <vector>
 
 #include <Scan/ScanResult.h>
 #include <Varnel/Paths/QNURLResolver.h>
 #include <Varnel/Platform/Text/ByteCountFormatter.h>
 #include <Varnel/Platform/Text/VisibleText.h>
-#include <Varnel/Platform/Values/URL.h>
-#include <Varnel/Platform/Values/UTF8.h>
-#include <orvane/JSONLine.h>
 
 namespace Orvane {
 namespace {
 
 using Varnel::Platform::ByteCountFormatter;
 using Varnel::Platform::ByteCountStyle;
-using Varnel::Platform::URL;
-using Varnel::Platform::visibleText;
 
-std::string summary(const ScanTotals& totals, std::size_t groups, const std::string& wasted) {
-  std::string text = counted(totals.files, "file", "files") + " in " +
-                     counted(totals.folders, "folder", "folders") + ": ";
-  if (groups == 0) {
-    text += "no duplicates";
-  } else {
-    text += counted(totals.duplicateFiles, "duplicate", "duplicates") + " in " +
-            counted(groups, "group", "groups") + ", " + wasted + " wasted";
+/// A group to show: one of the two.
+struct Entry {
+  const FolderGroup* folders = nullptr;
+  const DuplicateGroup* files = nullptr;
+
+  [[nodiscard]] std::uint64_t wastedBytes() const {
+    return folders ? folders->wastedBytes : files->wastedBytes;
   }
-  const auto add = [&](std::uint64_t count, const char* singular, const char* plural) {
-    if (count > 0) text += "; " + counted(count, singular, plural);
+};
+
+/// What is to be shown, most wasted bytes first; folders before files of the same waste.
+std::vector<Entry> entriesOf(const ScanResult& result, std::size_t max) {
+  std::vector<Entry> entries;
+  auto folders = result.folderGroups.begin();
+  const auto addFolders = [&](std::uint64_t wastedBytes) {
+    for (; folders != result.folderGroups.end() && folders->wastedBytes >= wastedBytes; ++folders)
+      entries.push_back({.folders = &*folders});
   };
-  add(totals.referenceFiles, "of the files is to stay", "of the files are to stay");
-  add(totals.unreadableFiles, "file could not be read", "files could not be read");
-  add(totals.vanishedFiles, "file vanished", "files vanished");
-  add(totals.changedFiles, "file changed meanwhile", "files changed meanwhile");
-  add(totals.unreadableFolders, "folder could not be read", "folders could not be read");
-  return text + "\n";
-}
-
-nlohmann::ordered_json jsonOf(const DuplicateGroup& group, const std::vector<std::string>& paths) {
-  nlohmann::ordered_json json = {{"size", group.size}, {"paths", paths}};
-  if (!std::all_of(paths.begin(), paths.end(), Varnel::Platform::isValidUTF8)) {
-    nlohmann::ordered_json& urls = json["urls"] = nlohmann::ordered_json::array();
-    for (const std::string& path : paths)
-      urls.push_back(URL::fileURLWithPath(path).absoluteString());
+  for (const DuplicateGroup& group : result.groups) {
+    if (entries.size() >= max) break;
+    addFolders(group.wastedBytes);
+    if (!result.isImplied(group)) entries.push_back({.files = &group});
   }
-  return json;
+  addFolders(0);
+  entries.resize(std::min(entries.size(), max));
+  return entries;
 }
 
-/// Collects text and hands it on in parts.
-class Parts final {
+class Text final {
  public:
-  explicit Parts(const TextWriter& write) : write_(write) {}
+  Text(const ScanResult& result, const TextForm& form, const ByteCountFormatter& byteCounts,
+       const Varnel::QNURLResolver& paths, const TextWriter& write)
+      : result_(result), form_(form), byteCounts_(byteCounts), paths_(paths), parts_(write) {}
 
-  /// False once the writer has failed.
-  [[nodiscard]] bool add(std::string_view text) {
-    part_ += text;
-    return part_.size() < maxPart || flush();
-  }
-
-  [[nodiscard]] bool flush() {
-    const bool isWritten = write_(part_);
-    part_.clear();
-    return isWritten;
+  [[nodiscard]] bool write() {
+    std::vector<Entry> entries = entriesOf(result_, form_.maxGroups);
+    if (form_.endsWithMost) std::reverse(entries.begin(), entries.end());
+    for (const Entry& entry : entries) {
+      if (form_.shouldStop()) break;
+      if (!(entry.folders ? add(*entry.folders) : add(*entry.files))) return false;
+    }
+    return parts_.add(prominent(summary())) && parts_.flush();
   }
 
  private:
-  static constexpr std::size_t maxPart = 64 * 1024;
+  [[nodiscard]] bool add(const FolderGroup& group) {
+    std::string head = std::to_string(group.count) + " folders of " +
+                       counted(group.files, "file", "files") + " and " + size(group.bytes);
+    // Where it wastes nothing, the groups of files say what they do.
+    if (group.wastedBytes > 0) head += ", " + wasted(group.wastedBytes);
+    std::string text = prominent(head);
+    for (const std::string& path : result_.pathsOf(group))
+      text += "  " + line(path.ends_with('/') ? path : path + "/");
+    return parts_.add(text + "\n");
+  }
 
-  const TextWriter& write_;
-  std::string part_;
+  [[nodiscard]] bool add(const DuplicateGroup& group) {
+    const std::string head = std::to_string(group.count) + " files of " + size(group.size) + ", " +
+                             wasted(group.wastedBytes);
+    if (!parts_.add(prominent(head))) return false;
+    for (std::uint32_t i = 0; i < group.count && !form_.shouldStop(); ++i) {
+      const DuplicateFile file = result_.fileAt(group.begin + i);
+      std::string text = (file.isReference ? "* " : "  ") + line(file.path);
+      for (const std::string& name : file.names) text += "    also " + line(name);
+      if (!parts_.add(text)) return false;
+    }
+    return parts_.add("\n");
+  }
+
+  [[nodiscard]] std::string summary() const {
+    const ScanTotals& totals = result_.totals;
+    std::string text = result_.isPartial ? "interrupted; so far " : "";
+    text += counted(totals.files, "file", "files") + " in " +
+            counted(totals.folders, "folder", "folders") + ": ";
+    if (result_.groups.empty()) {
+      text += "no duplicates";
+    } else {
+      text += counted(totals.duplicateFiles, "duplicate", "duplicates") + " in " +
+              counted(result_.groups.size(), "group", "groups") + ", " + wasted(totals.wastedBytes);
+    }
+    const auto add = [&](std::uint64_t count, const char* singular, const char* plural) {
+      if (count > 0) text += "; " + counted(count, singular, plural);
+    };
+    add(result_.folderGroups.size(), "group of folders that hold the same",
+        "groups of folders that hold the same");
+    add(totals.referenceFiles, "of the files is to stay", "of the files are to stay");
+    add(totals.unreadableFiles, "file could not be read", "files could not be read");
+    add(totals.vanishedFiles, "file vanished", "files vanished");
+    add(totals.changedFiles, "file changed meanwhile", "files changed meanwhile");
+    add(totals.unreadableFolders, "folder could not be read", "folders could not be read");
+    return text;
+  }
+
+  [[nodiscard]] std::string line(const std::string& path) const {
+    return Varnel::Platform::visibleText(paths_.abbreviatedPath(path)) + "\n";
+  }
+
+  [[nodiscard]] std::string size(std::uint64_t bytes) const {
+    return byteCounts_.string(static_cast<std::int64_t>(bytes), ByteCountStyle::file);
+  }
+  [[nodiscard]] std::string wasted(std::uint64_t bytes) const {
+    return bytes == 0 ? "nothing wasted" : size(bytes) + " wasted";
+  }
+
+  /// The words, in lines of the form's columns.
+  [[nodiscard]] std::string prominent(const std::string& words) const {
+    std::string text;
+    std::size_t column = 0;
+    std::istringstream stream(words);
+    for (std::string word; stream >> word; column += word.size()) {
+      if (column > 0) {
+        const bool hasRoom = form_.columns == 0 || column + 1 + word.size() <= form_.columns;
+        text += hasRoom ? ' ' : '\n';
+        column = hasRoom ? column + 1 : 0;
+      }
+      text += word;
+    }
+    return form_.isBold ? "\x1b[1m" + text + "\x1b[0m\n" : text + "\n";
+  }
+
+  const ScanResult& result_;
+  const TextForm& form_;
+  const ByteCountFormatter& byteCounts_;
+  const Varnel::QNURLResolver& paths_;
+  TextParts parts_;
 };
 
 }  // namespace
@@ -82,51 +149,9 @@ std::string counted(std::uint64_t count, const char* singular, const char* plura
   return std::to_string(count) + " " + (count == 1 ? singular : plural);
 }
 
-bool writeText(const ScanResult& result, const ByteCountFormatter& byteCounts,
+bool writeText(const ScanResult& result, const TextForm& form, const ByteCountFormatter& byteCounts,
                const Varnel::QNURLResolver& paths, const TextWriter& write) {
-  const auto size = [&](std::uint64_t bytes) {
-    return byteCounts.string(static_cast<std::int64_t>(bytes), ByteCountStyle::file);
-  };
-  Parts parts(write);
-  for (const DuplicateGroup& group : result.groups) {
-    std::string text = std::to_string(group.count) + " files of " + size(group.size) + ", " +
-                       size(group.wastedBytes()) + " wasted\n";
-    for (const std::string& path : result.pathsOf(group))
-      text += "  " + visibleText(paths.abbreviatedPath(path)) + "\n";
-    if (!parts.add(text + "\n")) return false;
-  }
-  return parts.add(summary(result.totals, result.groups.size(), size(result.totals.wastedBytes))) &&
-         parts.flush();
-}
-
-bool writeJSON(const ScanResult& result, const TextWriter& write) {
-  const ScanTotals& totals = result.totals;
-  std::string head = jsonLine({
-      {"schemaVersion", schemaVersion},
-      {"folders", totals.folders},
-      {"files", totals.files},
-      {"bytes", totals.bytes},
-      {"emptyFiles", totals.emptyFiles},
-      {"referenceFiles", totals.referenceFiles},
-      {"hardLinks", totals.hardLinks},
-      {"unreadableFiles", totals.unreadableFiles},
-      {"vanishedFiles", totals.vanishedFiles},
-      {"changedFiles", totals.changedFiles},
-      {"unreadableFolders", totals.unreadableFolders},
-      {"duplicateFiles", totals.duplicateFiles},
-      {"wastedBytes", totals.wastedBytes},
-      {"groups", nlohmann::ordered_json::array()},
-  });
-  const std::string_view tail = "]}\n";
-  head.resize(head.size() - tail.size());
-  Parts parts(write);
-  if (!parts.add(head)) return false;
-  for (bool isFirst = true; const DuplicateGroup& group : result.groups) {
-    std::string text = jsonLine(jsonOf(group, result.pathsOf(group)));
-    text.pop_back();  // The end of the line.
-    if (!parts.add((std::exchange(isFirst, false) ? "" : ",") + text)) return false;
-  }
-  return parts.add(tail) && parts.flush();
+  return Text(result, form, byteCounts, paths, write).write();
 }
 
 }  // namespace Orvane

@@ -1,10 +1,13 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <functional>
+#include <limits>
 #include <string>
-#include <string_view>
+
+#include <orvane/TextParts.h>
 
 namespace Varnel {
 class QNURLResolver;
@@ -21,22 +24,25 @@ struct ScanResult;
 /// "1 file", "2 files".
 [[nodiscard]] std::string counted(std::uint64_t count, const char* singular, const char* plural);
 
-/// Takes the next part of a text, of some 64 kB; false when it could not be written.
-using TextWriter = std::function<bool(std::string_view)>;
+/// How a result looks.
+struct TextForm {
+  static constexpr std::size_t allGroups = std::numeric_limits<std::size_t>::max();
 
-// A result may name millions of files, so its text is never whole in memory. Both functions return
-// whether all of it could be written, and end at the first part that could not.
+  std::size_t maxGroups = allGroups;  ///< Those that waste most.
+  std::size_t columns = 0;    ///< Where lines but those of paths end; 0 for lines of any length.
+  bool endsWithMost = false;  ///< The group that wastes most is the last one: nearest to the user.
+  bool isBold = false;        ///< Whether what is no path stands out, as terminals can show it.
+  /// Asked between groups: whether to leave out the rest of them.
+  std::function<bool()> shouldStop = [] { return false; };
+};
 
-/// The result for people: each group's files, one path a line, abbreviated and as `visibleText`
-/// shows it, and a summary.
-[[nodiscard]] bool writeText(const ScanResult& result,
+/// The result for people: each group's paths, one a line, abbreviated and as `visibleText` shows
+/// them, and a summary. Folders that hold the same stand for their files. Below a file's path stand
+/// its further names, and a star marks one that is there to be compared with.
+///
+/// Returns whether all could be written, and ends at the first part that could not.
+[[nodiscard]] bool writeText(const ScanResult& result, const TextForm& form,
                              const Varnel::Platform::ByteCountFormatter& byteCounts,
                              const Varnel::QNURLResolver& paths, const TextWriter& write);
-
-/// The result for programs: one JSON object on one line. Each of its "groups" has the "size" of a
-/// file in bytes and the "paths"; the totals stand beside them. Where a path is not UTF-8, which
-/// JSON texts must be, its wrong bytes show as U+FFFD, and the group also has "urls": the file URLs
-/// of all its paths, in which no byte is lost.
-[[nodiscard]] bool writeJSON(const ScanResult& result, const TextWriter& write);
 
 }  // namespace Orvane

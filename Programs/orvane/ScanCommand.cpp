@@ -2,6 +2,7 @@
 #include <orvane/ScanCommand.h>
 
 #include <algorithm>
+#include <chrono>
 #include <cstdint>
 #include <limits>
 #include <optional>
@@ -15,6 +16,7 @@
 #include <Varnel/Logging/Logger.h>
 #include <Varnel/Logging/LoggingObject.h>
 #include <Varnel/Paths/QNURLResolver.h>
+#include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
 #include <Varnel/Platform/Text/ByteCountFormatter.h>
@@ -27,6 +29,7 @@
 #include <orvane/ResultText.h>
 #include <orvane/ScanAnalytics.h>
 #include <orvane/ScanLog.h>
+#include <orvane/ScanReport.h>
 #include <orvane/SoundCommand.h>
 #include <orvane/StandardStreams.h>
 
@@ -51,6 +54,10 @@ std::string howFar(const ScanControl& control) {
     return counted(control.filesFound, "file was found", "files were found");
   return std::to_string(control.filesRead) + " of " +
          counted(control.filesToRead, "file was read", "files were read");
+}
+
+std::chrono::sys_seconds startOfScan(const Varnel::Platform::Clock& clock) {
+  return std::chrono::floor<std::chrono::seconds>(clock.now());
 }
 
 unsigned maxReaders() {
@@ -79,39 +86,54 @@ int ScanCommand::run(Console& console) const {
       qos == QoS::background || qos == QoS::utility ? CacheUse::traceless : CacheUse::normal;
   DuplicateFinder finder(
       {.fileSystem = systemFileSystem(cacheUse), .turns = turns, .observer = log});
+  const ScanFacts facts{.startedAt = startOfScan(ports.clock), .folders = asked->folders};
   ScanControl control;
-  ScanResult result;
-  {
-    const Interruption interruption(control.isCancelled);
-    std::optional<ProgressLine> progress;
-    if (showsProgress && isStandardErrorATerminal()) progress.emplace(console, control);
-    result = finder.find(*asked, control);
-    progress.reset();
-    if (interruption.signal() != 0) {
-      log.log("Did cancel");
-      analytics.scanCancelled();
-      console.complain("interrupted when " + howFar(control));
-      return 128 + interruption.signal();
-    }
-  }
+  const Interruption interruption(control.isCancelled);
+  std::optional<ProgressLine> progress;
+  if (showsProgress && isStandardErrorATerminal()) progress.emplace(console, control);
+  const ScanResult result = finder.find(*asked, control);
+  progress.reset();
   if (!result.lostFolders.empty()) {
     for (const LostPath& lost : result.lostFolders)
       complainThatItCannotScan(lost.path, reasonOf(lost.loss), console);
     return 1;
   }
-  log.log("Did find " + counted(result.groups.size(), "group", "groups") + " of duplicates among " +
-          counted(result.totals.files, "file", "files"));
+  if (result.isPartial) {
+    log.log("Did cancel");
+    analytics.scanCancelled();
+    console.complain("interrupted when " + howFar(control));
+  } else {
+    log.log("Did find " + counted(result.groups.size(), "group", "groups") +
+            " of duplicates among " + counted(result.totals.files, "file", "files"));
+    analytics.scanFinished(result.groups.size());
+  }
   log.complain();
-  analytics.scanFinished(result.groups.size());
+  const bool isWritten = write(result, facts, interruption, console);
+  if (!result.isPartial) {
+    planReminder(result.totals.wastedBytes, console);
+    // The scan has succeeded even on a machine without sound.
+    if (playsSound) playToTheEnd(Varnel::Sound::scanComplete);
+  }
+  if (!isWritten) return 1;
+  return interruption.signal() != 0 ? 128 + interruption.signal() : 0;
+}
+
+bool ScanCommand::write(const ScanResult& result, const ScanFacts& facts,
+                        const Interruption& interruption, Console& console) const {
+  const auto send = [&](std::string_view text) { return console.writeResult(text); };
+  if (form == Form::json) return writeReport(result, facts, maxGroups, send);
+  if (form == Form::pathList) return writePathList(result, maxGroups, send);
+  TextForm look{.maxGroups = maxGroups};
+  if (isStandardOutputATerminal()) {
+    look.columns = standardOutputColumns();
+    look.endsWithMost = true;
+    look.isBold = !refusesColours();
+    // Who interrupts a list that runs over the screen wants no more of it; a file gets it whole.
+    look.shouldStop = [&] { return interruption.signal() != 0; };
+  }
+  const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
   const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.get().numberIdentifier());
-  const auto write = [&](std::string_view text) { return console.writeResult(text); };
-  const bool written = isJSON
-                           ? writeJSON(result, write)
-                           : writeText(result, byteCounts, Varnel::QNURLResolver::shared(), write);
-  planReminder(result.totals.wastedBytes, console);
-  // The scan has succeeded even on a machine without sound.
-  if (playsSound) playToTheEnd(Varnel::Sound::scanComplete);
-  return written ? 0 : 1;
+  return writeText(result, look, byteCounts, Varnel::QNURLResolver::shared(), send);
 }
 
 }  // namespace Orvane

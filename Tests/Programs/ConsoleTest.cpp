@@ -53,31 +53,35 @@ TEST(Interruption, WhatWasIgnoredStaysIgnored) {
 
 TEST(ProgressLine, SaysWhatHasRoom) {
   const struct {
-    std::uint64_t found, toRead, read, bytes;
+    std::uint64_t found, files, bytes, filesRead, bytesRead;
     int milliseconds;
     std::size_t columns;
     const char* text;
   } cases[] = {
-      {0, 0, 0, 0, 0, 79, "Looking: 0 files"},
-      {1, 0, 0, 0, 0, 79, "Looking: 1 file"},
-      {1, 0, 0, 0, 0, 5, "Looki"},
-      {9, 1, 0, 0, 0, 79, "Reading: 0 of 1 file, 0 MB"},
-      {9, 0, 2, 0, 0, 79, "Looking: 9 files"},
-      {9, 4, 2, 6'000'000, 999, 79, "Reading: 2 of 4 files, 6 MB"},
-      {9, 4, 2, 6'000'000, 2000, 79, "Reading: 2 of 4 files, 6 MB, 3 MB/s, 2 s left"},
-      {9, 4, 2, 6'000'000, 2000, 39, "Reading: 2 of 4 files, 6 MB, 3 MB/s"},
-      {9, 4, 2, 6'000'000, 2000, 26, "Reading: 2 of 4 files"},
-      {9, 4, 0, 6'000'000, 2000, 79, "Reading: 0 of 4 files, 6 MB, 3 MB/s"},
-      {9, 101, 1, 0, 6'000, 199, "Reading: 1 of 101 files, 0 MB, 0 MB/s, 10 min left"},
-      {9, 10'001, 1, 0, 6'000, 199, "Reading: 1 of 10001 files, 0 MB, 0 MB/s, 16 h left"},
-      {9, 4, 5, 0, 2000, 79, "Reading: 4 of 4 files, 0 MB, 0 MB/s, 0 s left"},
+      {0, 0, 0, 0, 0, 0, 79, "Looking: 0 files"},
+      {1, 0, 0, 0, 0, 0, 79, "Looking: 1 file"},
+      {1, 0, 0, 0, 0, 0, 5, "Looki"},
+      {9, 0, 0, 2, 0, 0, 79, "Looking: 9 files"},
+      {9, 1, 900, 0, 0, 2000, 79, "Reading: 0 of 0 MB, 0 of 1 file"},
+      {9, 4, 9'000'000, 2, 6'000'000, 999, 79, "Reading: 6 of 9 MB, 2 of 4 files"},
+      {9, 4, 9'000'000, 2, 6'000'000, 2000, 79,
+       "Reading: 6 of 9 MB, 1 s left, 3 MB/s, 2 of 4 files"},
+      {9, 4, 9'000'000, 2, 6'000'000, 2000, 39, "Reading: 6 of 9 MB, 1 s left, 3 MB/s"},
+      {9, 4, 9'000'000, 2, 6'000'000, 2000, 31, "Reading: 6 of 9 MB, 1 s left"},
+      // A few large files after many small ones.
+      {9, 1000, 7'000'000'000, 999, 1'000'000, 1000, 49, "Reading: 1 of 7000 MB, 1 h left, 1 MB/s"},
+      {9, 9, 60'001'000'000, 1, 1'000'000, 6'000, 199,
+       "Reading: 1 of 60001 MB, 100 h left, 0 MB/s, 1 of 9 files"},
+      {9, 4, 6'000'000, 5, 7'000'000, 2000, 79,
+       "Reading: 6 of 6 MB, 0 s left, 3 MB/s, 4 of 4 files"},
   };
   for (const auto& each : cases) {
     ScanControl control;
     control.filesFound = each.found;
-    control.filesToRead = each.toRead;
-    control.filesRead = each.read;
-    control.bytesRead = each.bytes;
+    control.filesToRead = each.files;
+    control.bytesToRead = each.bytes;
+    control.filesRead = each.filesRead;
+    control.bytesRead = each.bytesRead;
     const std::chrono::milliseconds time(each.milliseconds);
     EXPECT_EQ(ProgressLine::text(control, time, each.columns), each.text);
   }

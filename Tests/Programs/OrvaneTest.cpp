@@ -1,10 +1,13 @@
 // SPDX-License-Identifier: MIT
+#include <fcntl.h>
 #include <gmock/gmock.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <csignal>
 #include <filesystem>
 #include <nlohmann/json.hpp>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -34,10 +37,64 @@ TEST_F(Orvane, PrintsTheResultAloneAndLogsTheRun) {
 
   const Outcome json = run({"scan", "--json", "--qos", "background", folder.path()});
   const auto result = nlohmann::json::parse(json.output);
-  EXPECT_EQ(result["groups"],
-            nlohmann::json::parse(R"([{"size": 12, "paths": [")" + folder.path("a") + R"(", ")" +
-                                  folder.path("b") + R"("]}])"));
+  EXPECT_EQ(result["groups"][0]["files"][1]["path"], folder.path("b"));
   EXPECT_EQ(result["wastedBytes"], 12);
+  EXPECT_FALSE(result["partial"]);
+  const Outcome list = run({"scan", "-0", folder.path()});
+  EXPECT_EQ(list.output,
+            folder.path("a") + std::string(1, '\0') + folder.path("b") + std::string(2, '\0'));
+  EXPECT_THAT(run({"scan", "--summary", folder.path()}).output,
+              StartsWith("3 files in 1 folder: "));
+  EXPECT_EQ(run({"scan", "--top", "1", folder.path()}).output, text.output);
+}
+
+/// Tells when another process opens the file, which waits until then for the object's end.
+class LeasedFile final {
+ public:
+  explicit LeasedFile(const std::string& path) : file_(::open(path.c_str(), O_RDWR | O_CLOEXEC)) {
+    ::sigemptyset(&opening_);
+    ::sigaddset(&opening_, SIGIO);
+    ::pthread_sigmask(SIG_BLOCK, &opening_, &before_);
+    isLeased_ = ::fcntl(file_, F_SETLEASE, F_WRLCK) == 0;
+  }
+  LeasedFile(const LeasedFile&) = delete;
+  LeasedFile& operator=(const LeasedFile&) = delete;
+  ~LeasedFile() {
+    ::close(file_);
+    ::pthread_sigmask(SIG_SETMASK, &before_, nullptr);
+  }
+
+  [[nodiscard]] bool isLeased() const { return isLeased_; }
+  void waitUntilItIsOpened() const {
+    int signal = 0;
+    ::sigwait(&opening_, &signal);
+  }
+
+ private:
+  int file_;
+  bool isLeased_ = false;
+  sigset_t opening_{}, before_{};
+};
+
+TEST_F(Orvane, KeepsWhatItHasWhenItIsInterrupted) {
+  for (const char* name : {"a", "b"}) folder.write(name, "same");
+  for (const char* option : {"--json", "--print0", "--no-progress"}) {
+    std::optional<LeasedFile> held(folder.path("b"));
+    if (!held->isLeased()) GTEST_SKIP() << "the file system of temporary files grants no leases";
+    // Started with the signal blocked, it keeps it so.
+    Varnel::Tests::ChildProcess program({"/usr/bin/env", "--default-signal", "HOME=" + home.path(),
+                                         ORVANE_PROGRAM, "scan", option, folder.path()});
+    held->waitUntilItIsOpened();
+    program.signal(SIGTERM);
+    held.reset();
+    const std::string output = program.readAll();
+    EXPECT_EQ(program.wait(), 128 + SIGTERM);
+    if (option == std::string("--json")) {
+      EXPECT_TRUE(nlohmann::json::parse(output)["partial"]);
+    } else if (option == std::string("--no-progress")) {
+      EXPECT_THAT(output, HasSubstr("interrupted; so far 2 files in 1 folder: "));
+    }
+  }
 }
 
 TEST_F(Orvane, SendsTheLogWhereItIsTold) {
@@ -94,10 +151,10 @@ TEST_F(Orvane, ShowsHostileNamesAsWhatTheyAre) {
   EXPECT_THAT(log.errors, AllOf(HasSubstr("/clear\\x1B[2J\\n[\n"), Not(HasSubstr("\x1b"))));
 
   const Outcome json = run({"scan", "--json", folder.path()});
-  const auto group = nlohmann::json::parse(json.output)["groups"][0];
-  EXPECT_EQ(group["paths"][0], folder.path("fake\n\n9 files of 1 byte\x1b[2J"));
-  EXPECT_EQ(group["paths"][1], folder.path("\xEF\xBF\xBDno\\slash"));
-  EXPECT_EQ(group["urls"][1], "file://" + folder.path("%FFno%5Cslash"));
+  const auto files = nlohmann::json::parse(json.output)["groups"][0]["files"];
+  EXPECT_EQ(files[0]["path"], folder.path("fake\n\n9 files of 1 byte\x1b[2J"));
+  EXPECT_EQ(files[1]["path"], folder.path("\xEF\xBF\xBDno\\slash"));
+  EXPECT_EQ(files[1]["url"], "file://" + folder.path("%FFno%5Cslash"));
 }
 
 TEST_F(Orvane, PrintsLinks) {
@@ -143,6 +200,7 @@ TEST_F(Orvane, RefusesWrongArgumentsInOneLineAndDoesNothing) {
       {{"remind", "never"}, 2, "never"},
       {{"help", "bogus"}, 2, "bogus"},
       {{"scan", "--qos"}, 2, "QUALITY"},
+      {{"scan", "--top", "-1", "."}, 2, "--top: \"-1\" is no number"},
       {{"scan", "--json=1", "."}, 2, "--json takes no value"},
       {{"remind", "tomorrow", "--found", "1"}, 2, "--selected is missing"},
       {{"remind", "every", "sometimes"}, 2, "sometimes"},
@@ -180,7 +238,7 @@ TEST_F(Orvane, TakesFoldersOfEveryName) {
   }
   const Outcome outcome = run(arguments);
   EXPECT_EQ(outcome.status, 0) << outcome.errors;
-  EXPECT_THAT(outcome.output, StartsWith("10 files of "));
+  EXPECT_THAT(outcome.output, StartsWith("10 folders of 1 file and 4 bytes, "));
 }
 
 TEST_F(Orvane, FailsWhenItsResultCannotBeWritten) {
@@ -213,16 +271,20 @@ TEST_F(Orvane, FailsWhenItsResultCannotBeWritten) {
   EXPECT_THAT(logText(), Not(HasSubstr("no duplicates"))) << "the log took the output's place";
 }
 
-TEST_F(Orvane, ShowsProgressOnTerminalsAlone) {
+TEST_F(Orvane, ShowsProgressAndEmphasisOnTerminalsAlone) {
   folder.write("a", "same");
   const std::string erase = "\r\x1b[K";
   const auto onTerminal = [&](const std::string& options) {
-    return Varnel::Tests::outputOf("cd " + home.path() + "; HOME=$PWD script -qec 'stty cols 40; " +
-                                   ORVANE_PROGRAM + " " + options + "' typescript");
+    return Varnel::Tests::outputOf("cd " + home.path() + "; HOME=$PWD " + moreEnvironment[0] +
+                                   " script -qec 'stty cols 30; " + ORVANE_PROGRAM + " " + options +
+                                   "' typescript");
   };
   const std::string scan = "scan " + folder.path();
-  EXPECT_THAT(onTerminal(scan), HasSubstr(erase + "Looking: "));
-  EXPECT_THAT(onTerminal(scan), HasSubstr(erase + "1 file in 1 folder: no duplicates\r\n"));
+  moreEnvironment = {"NO_COLOR="};
+  EXPECT_THAT(onTerminal(scan),
+              AllOf(HasSubstr(erase + "Looking: "),
+                    HasSubstr(erase + "\x1b[1m1 file in 1 folder: no\r\nduplicates\x1b[0m\r\n")));
+  moreEnvironment = {"NO_COLOR=1"};
   EXPECT_THAT(onTerminal("scan --progress --no-progress " + folder.path()), Not(HasSubstr("\x1b")));
   EXPECT_THAT(onTerminal(scan + " 2>errors"), Not(HasSubstr("\x1b")));
   EXPECT_THAT(run({"scan", "-p", folder.path()}).errors, IsEmpty());

@@ -153,6 +153,7 @@ class FaultyFileSystem final : public FileSystem {
   std::map<std::string, std::errc> openFaults;
   std::map<std::string, std::errc> readFaults;
   std::map<std::string, std::uint64_t> places;  ///< Where given, of all files.
+  std::map<std::string, SharedExtents> shared;  ///< Where given, of all files.
   std::function<void(const std::string& path)> beforeOpenFolder;
   std::function<void(const std::string& path)> beforeList;
   std::function<void(const std::string& path)> beforeOpen;
@@ -192,6 +193,12 @@ class FaultyFileSystem final : public FileSystem {
       return place == owner_.places.end() ? std::nullopt : std::optional(place->second);
     }
 
+    std::optional<SharedExtents> sharedExtents() override {
+      if (owner_.shared.empty()) return file_->sharedExtents();
+      const auto extents = owner_.shared.find(path_);
+      return extents == owner_.shared.end() ? std::nullopt : std::optional(extents->second);
+    }
+
    private:
     FaultyFileSystem& owner_;
     std::string path_;
@@ -220,6 +227,10 @@ class FaultyFileSystem final : public FileSystem {
     }
 
     FolderEntry look(const char* name) override { return folder_->look(name); }
+
+    [[nodiscard]] bool mayShareExtents() const override {
+      return !owner_.shared.empty() || folder_->mayShareExtents();
+    }
 
     FileResult<std::unique_ptr<OpenFile>> open(const char* name, ReadingPlan plan) override {
       const std::string path = path_ + "/" + name;

@@ -6,23 +6,35 @@
 #include <sys/ioctl.h>
 #include <sys/mount.h>
 
+#include <cstdint>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <string>
+#include <utility>
 
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
 
 namespace Varnel::Tests {
 
-/// A small ext4 file system in a file, behind a loop device that is detached when the last user has
-/// gone.
+/// A file system in a file, behind a loop device that is detached when the last user has gone.
 class DiskImage final {
  public:
-  explicit DiskImage(const std::filesystem::path& file) {
+  struct Kind {
+    std::string name;   ///< As mount and mkfs have it.
+    std::string force;  ///< What makes mkfs work on a file.
+    std::uintmax_t bytes;
+  };
+  static Kind ext4() { return {"ext4", "-q -F", 4 << 20}; }
+  static Kind xfs() { return {"xfs", "-q -f", 320 << 20}; }  // Smaller ones are not made.
+  static Kind btrfs() { return {"btrfs", "-q -f", 160 << 20}; }
+
+  explicit DiskImage(const std::filesystem::path& file, Kind kind = ext4())
+      : kind_(std::move(kind)) {
     std::ofstream(file).close();
-    std::filesystem::resize_file(file, 4 << 20);
-    if (std::system(("mkfs.ext4 -q -F '" + file.string() + "'").c_str()) != 0) return;
+    std::filesystem::resize_file(file, kind_.bytes);
+    const std::string maker = "mkfs." + kind_.name + " " + kind_.force + " '" + file.string() + "'";
+    if (std::system((maker + " >/dev/null 2>&1").c_str()) != 0) return;
     const Platform::POSIX::FileDescriptor control(::open("/dev/loop-control", O_RDWR | O_CLOEXEC));
     const Platform::POSIX::FileDescriptor image(::open(file.c_str(), O_RDWR | O_CLOEXEC));
     const int number = ::ioctl(control.get(), LOOP_CTL_GET_FREE);
@@ -39,10 +51,12 @@ class DiskImage final {
   [[nodiscard]] const std::string& name() const { return name_; }
 
   [[nodiscard]] bool mount(const std::filesystem::path& folder) const {
-    return ::mount(("/dev/" + name_).c_str(), folder.c_str(), "ext4", 0, nullptr) == 0;
+    const std::string device = "/dev/" + name_;
+    return ::mount(device.c_str(), folder.c_str(), kind_.name.c_str(), 0, nullptr) == 0;
   }
 
  private:
+  const Kind kind_;
   Platform::POSIX::FileDescriptor device_;
   std::string name_;
 };
