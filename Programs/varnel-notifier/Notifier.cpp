@@ -152,7 +152,7 @@ Notifier::~Notifier() = default;
 // Who calls while the name is given back reaches this notifier still, or else the next one.
 bool Notifier::run() {
   std::optional<std::string> failure;
-  bus_->connect([&](const std::string& error) { failure = error; });
+  bus_->connect([&](const BusFailure* error) { failure = error ? error->text : ""; });
   sleepWhile([&] { return !failure; });
   if (!failure->empty()) {
     ports_.systemLog.write("Notifications are not delivered: " + *failure);
