@@ -21,15 +21,14 @@ class Product final {
   explicit Product(const std::string& folder)
       : process_(folder + "/notifications.sqlite", std::chrono::system_clock::now()) {}
 
-  void plan(const std::string& title) {
-    process_.schedule(
-        {.identifier = title, .title = title, .deliveryDate = std::chrono::system_clock::now()});
+  void plan(const std::string& title, std::chrono::hours later = 0h) {
+    const UserNotification planned{.identifier = title,
+                                   .title = title,
+                                   .deliveryDate = std::chrono::system_clock::now() + later};
+    // The notifier may have the store locked.
+    EXPECT_TRUE(comesTrue([&] { return !process_.center.scheduleNotification(planned); }));
   }
-  void planForLater() {
-    process_.schedule({.identifier = "later",
-                       .title = "later",
-                       .deliveryDate = std::chrono::system_clock::now() + 24h});
-  }
+  void planForLater() { plan("later", 24h); }
 
  private:
   Platform::Testing::Process process_;
