@@ -73,8 +73,7 @@ TEST_F(NotifierTest, WithoutItsProgramItEndsAndTheHostDeliversItself) {
   install(copy);
   const Server server;
   Host host("removed");
-  EXPECT_FALSE(host.center.scheduleNotification(
-      {.identifier = "later", .deliveryDate = std::chrono::system_clock::now() + 24h}));
+  host.schedule({.identifier = "later", .deliveryDate = std::chrono::system_clock::now() + 24h});
   host.settle();
   // Its host calls it back when it was killed, but not when it has gone.
   const pid_t killed = ownerOf(notifierName);
@@ -167,8 +166,7 @@ TEST_F(NotifierTest, OneThatIsKilledAtItsStartIsStartedAgain) {
   fs::permissions(home_ + "/start", fs::perms::owner_all);
   addService(notifierName, home_ + "/start");
   Host host("persistent");
-  EXPECT_FALSE(host.center.scheduleNotification(
-      {.identifier = "later", .deliveryDate = std::chrono::system_clock::now() + 24h}));
+  host.schedule({.identifier = "later", .deliveryDate = std::chrono::system_clock::now() + 24h});
   host.await([] { return isOnBus(notifierName); });
 }
 

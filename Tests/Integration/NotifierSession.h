@@ -136,8 +136,13 @@ class Host final {
     });
   }
 
-  void deliver(const std::string& title) {
-    EXPECT_FALSE(center.deliverNotification({.identifier = "note", .title = title}));
+  // The notifier may have the store locked.
+  void deliver(const std::string& title, const std::string& identifier = "note") {
+    EXPECT_TRUE(comesTrue(
+        [&] { return !center.deliverNotification({.identifier = identifier, .title = title}); }));
+  }
+  void schedule(const UserNotification& notification) {
+    EXPECT_TRUE(comesTrue([&] { return !center.scheduleNotification(notification); }));
   }
   template <typename Condition>
   void await(Condition condition) {

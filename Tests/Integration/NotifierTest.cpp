@@ -106,7 +106,7 @@ TEST_F(NotifierTest, ABannerOutlivesItsHostAndAServerThatComesLateShowsIt) {
   early.reset();
   {
     Host host("late", std::nullopt);
-    EXPECT_FALSE(host.center.deliverNotification({.identifier = "other", .title = "waiting"}));
+    host.deliver("waiting", "other");
     host.settle();
   }
   const Server server;
@@ -121,10 +121,9 @@ TEST_F(NotifierTest, AStoreIsFoundWhereItsApplicationKeepsItAndAClickNeedsAHost)
   Host host("moved");
   host.synchronise();
   host.endListening();
-  EXPECT_FALSE(
-      host.center.scheduleNotification({.identifier = "note",
-                                        .title = "found",
-                                        .deliveryDate = std::chrono::system_clock::now() + 200ms}));
+  host.schedule({.identifier = "note",
+                 .title = "found",
+                 .deliveryDate = std::chrono::system_clock::now() + 200ms});
   host.await([] { return displayed() == "1\n"; });
   EXPECT_TRUE(isOnBus(notifierName));
   // Another process takes its time in the store.
@@ -144,8 +143,7 @@ TEST_F(NotifierTest, AHostThatHangsIsNotWaitedFor) {
   EXPECT_TRUE(
       comesTrue([] { return isOnBus("com.quennel.Varnel.Host.com.quennel.Orvane2.Client"); }));
   listener.signal(SIGSTOP);
-  EXPECT_FALSE(planner.center.deliverNotification(
-      {.identifier = "SchedulerNotification", .title = "Hello"}));
+  planner.deliver("Hello", "SchedulerNotification");
   planner.await([] { return displayed() == "1\n"; });
   // The click waits for it, and starts nothing.
   outputOf("dunstctl action 0");
