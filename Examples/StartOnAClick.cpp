@@ -96,8 +96,7 @@ int main(int count, char** arguments) {
               << notification.activationToken.value_or("none") << std::endl;
     isHandled = true;
   });
-  if (const auto launch = center.takeLaunchNotification(); launch && *launch)
-    router.handleLaunch(**launch);
+  router.handlePendingLaunch();
   Activated activated = [&](std::string_view method) {
     std::cout << method << std::endl;
     isActivated = true;

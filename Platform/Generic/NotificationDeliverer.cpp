@@ -206,7 +206,11 @@ void NotificationDeliverer::lookAhead(const std::vector<Delivery>& all) {
 }
 
 bool NotificationDeliverer::isIdle() const {
-  return isAllDone_ && questions_.empty() && banners_->isIdle() && !isBusy();
+  return isAllDone_ && isQuiet();
+}
+
+bool NotificationDeliverer::isQuiet() const {
+  return questions_.empty() && banners_->isIdle() && !isBusy();
 }
 
 bool NotificationDeliverer::isBusy() const {
@@ -224,7 +228,15 @@ Result<std::optional<NotificationSource>> NotificationDeliverer::source() {
   return store_->source();
 }
 
+// Others may take longer with the store than anybody here waits for them. That is said when it
+// lasts.
 void NotificationDeliverer::report(const Failure& failure) {
+  const Date now = ports_.clock.now();
+  if (!failure || meaningOf(*failure) != SQLiteFailure::busy)
+    busySince_.reset();
+  else if (!busySince_)
+    busySince_ = now;
+  if (busySince_ && now < *busySince_ + minPause) return;
   const std::string text = failure ? failure->localizedDescription() : "";
   if (failure && text != lastReport_) ports_.systemLog.write("Notifications have to wait: " + text);
   lastReport_ = text;

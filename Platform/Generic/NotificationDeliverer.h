@@ -68,10 +68,13 @@ class NotificationDeliverer final {
   /// user's time zone.
   void recheck();
 
-  /// Whether nothing is left for it to do, now or later: nothing is planned, due or to be shown, no
-  /// banner of it is up, and nothing is under way. So it is, too, where the store is not its to
-  /// use: of another format, or not the user's.
+  /// Whether nothing is left for it to do, now or later: it is quiet, and nothing is planned, due
+  /// or to be shown. So it is, too, where the store is not its to use: of another format, or not
+  /// the user's.
   [[nodiscard]] bool isIdle() const;
+  /// Whether another one may take its place, and nobody misses a click: no banner of it is up, and
+  /// nothing is under way.
+  [[nodiscard]] bool isQuiet() const;
   /// Whether something is on its way to the server or the store. Becomes false in the end, also
   /// without a server, but not while one has taken a banner and hangs.
   [[nodiscard]] bool isBusy() const;
@@ -123,6 +126,7 @@ class NotificationDeliverer final {
   bool isAllDone_ = false;   ///< The store holds nothing to be done, or is not to be used.
   std::optional<Date> nextPlanned_;
   std::optional<Date> next_;
+  std::optional<Date> busySince_;  ///< The store is locked.
   std::string lastReport_;
   bool isToRetry_ = false;  ///< When the pause is over.
   GrowingPause pause_{minPause, maxPause};

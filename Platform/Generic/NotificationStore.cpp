@@ -197,9 +197,6 @@ Failure NotificationStore::remove(std::int64_t number) {
 }
 
 Failure NotificationStore::keepSource(const NotificationSource& source) {
-  const auto known = this->source();
-  if (!known) return known.error();
-  if (*known == source) return std::nullopt;
   return write([&](SQLiteDatabase& database) { return replaceSource(database, source); });
 }
 

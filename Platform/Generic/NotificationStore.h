@@ -64,7 +64,7 @@ class NotificationStore final {
   /// Forgets the delivery, once its banner is gone if it has one.
   [[nodiscard]] Failure remove(std::int64_t number);
 
-  /// Keeps who plans here. Without a change, nothing is written.
+  /// Keeps who plans here.
   [[nodiscard]] Failure keepSource(const NotificationSource& source);
   [[nodiscard]] Result<std::optional<NotificationSource>> source();
 

@@ -19,24 +19,26 @@ fs::path folder(const char* variable, const char* belowHome) {
   return fs::path(makeUserAccount()->homeFolder()) / belowHome;
 }
 
-constexpr const char* notifications = "notifications.sqlite";
-
-fs::path stateFolders() {
-  return folder("XDG_STATE_HOME", ".local/state");
-}
-
 fs::path stateFolder(const std::string& identifier) {
   return stateFolders() / fileNameFor(identifier);
 }
 
 }  // namespace
 
+fs::path stateFolders() {
+  return folder("XDG_STATE_HOME", ".local/state");
+}
+
 fs::path settingsFolder(const std::string& identifier) {
   return folder("XDG_CONFIG_HOME", ".config") / fileNameFor(identifier);
 }
 
 fs::path notificationStore(const std::string& identifier) {
-  return stateFolder(identifier) / notifications;
+  return notificationStoreIn(stateFolder(identifier));
+}
+
+fs::path notificationStoreIn(const fs::path& folder) {
+  return folder / "notifications.sqlite";
 }
 
 std::vector<fs::path> notificationStores() {
@@ -44,8 +46,8 @@ std::vector<fs::path> notificationStores() {
   std::error_code error;
   for (fs::directory_iterator each(stateFolders(), error), end; !error && each != end;
        each.increment(error))
-    if (std::error_code unreadable; fs::exists(each->path() / notifications, unreadable))
-      stores.push_back(each->path() / notifications);
+    if (std::error_code unreadable; fs::exists(notificationStoreIn(*each), unreadable))
+      stores.push_back(notificationStoreIn(*each));
   return stores;
 }
 

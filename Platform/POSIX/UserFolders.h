@@ -16,6 +16,9 @@ namespace Varnel::Platform::POSIX {
 [[nodiscard]] std::filesystem::path notificationStore(const std::string& identifier);
 /// Those of all applications that are there.
 [[nodiscard]] std::vector<std::filesystem::path> notificationStores();
+/// The folder of the applications' folders that have such a file, and the file in one of them.
+[[nodiscard]] std::filesystem::path stateFolders();
+[[nodiscard]] std::filesystem::path notificationStoreIn(const std::filesystem::path& folder);
 [[nodiscard]] std::filesystem::path analyticsSpool(const std::string& identifier);
 
 /// Where other programs keep the cookies that are read here.

@@ -68,7 +68,7 @@ class VARNEL_API UserNotificationCenter {
   /// did not run: once, and no later than five minutes after the click. None otherwise.
   ///
   ///     const auto launch = center.takeLaunchNotification();
-  ///     if (launch && *launch) router.handleLaunch(**launch);
+  ///     if (launch && *launch) show(**launch);
   [[nodiscard]] virtual Result<std::optional<UserNotification>> takeLaunchNotification() = 0;
 
   /// Makes several calls on this center together: all are done or, where one fails or `calls`

@@ -58,9 +58,7 @@ int RemindListenCommand::run(Console& console) const {
   });
   // A plan that is right stays: assigning the stored period would move the reminder.
   repairPlan(service, console);
-  if (const auto launch = router.userNotificationCenter().takeLaunchNotification();
-      launch && *launch)
-    router.handleLaunch(**launch);
+  router.handlePendingLaunch();
   router.userNotificationCenter().checkBanners([&](const auto& obstacle) {
     if (obstacle)
       console.complain("no banner can be shown at present: " + obstacle->localizedDescription());

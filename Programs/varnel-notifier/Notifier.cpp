@@ -75,7 +75,8 @@ class Notifier::Product final {
         deliverer_({ports_.clock, ports_.userLocale, ports_.timeZones, ports_.mainQueue,
                     ports_.privateFiles, ports_.systemLog, *server_, *timer_},
                    store.string(), Migrating::never, hosts_),
-        watch_(store.parent_path(), store.filename(), [this] { deliverer_.recheck(); }) {
+        store_(store) {
+    watchFolder();
     // The folder has the name of the base identifier, as far as names of files can.
     const auto source = deliverer_.source();
     hosts_.setProduct(source && *source ? (*source)->identifier
@@ -84,8 +85,13 @@ class Notifier::Product final {
   }
 
   NotificationDeliverer& deliverer() { return deliverer_; }
-  [[nodiscard]] bool isIdle() const {
-    return deliverer_.isIdle() && !hosts_.isBusy() && *launches_ == 0;
+  // Its folder may be another one than before.
+  void watchFolder() {
+    watch_.emplace(store_.parent_path(), store_.filename(), [this] { deliverer_.recheck(); });
+  }
+  [[nodiscard]] bool isIdle() const { return deliverer_.isIdle() && isQuiet(); }
+  [[nodiscard]] bool isQuiet() const {
+    return deliverer_.isQuiet() && !hosts_.isBusy() && *launches_ == 0;
   }
 
  private:
@@ -127,19 +133,19 @@ class Notifier::Product final {
   const std::unique_ptr<NotificationServer> server_;
   const std::unique_ptr<WallClockTimer> timer_;
   NotificationDeliverer deliverer_;
-  const FileWatch watch_;
+  const fs::path store_;
+  std::optional<FileWatch> watch_;
 };
 
 Notifier::Notifier(const NotificationPorts& ports, const fs::path& executable)
     : ports_(ports),
-      executable_(executable),
       bus_(makeSessionBus()),
       launcher_(makeApplicationLauncher(bus_)),
       timer_(makeWallClockTimer(ports.systemLog)),
       sharedTimer_(ports.clock, *timer_),
       zoneWatch_("/etc", "localtime", [this] { recheck(); }),
-      // Wakes `run`, which looks then.
-      executableWatch_(executable.parent_path(), executable.filename(), [] {}) {
+      stateWatch_(POSIX::stateFolders(), [this](const auto& name) { lookAtFolder(name); }),
+      program_(executable, ports.clock, sharedTimer_.share()) {
   bus_->serve({notifierPath, notifierInterface,
                [this](std::string_view, GVariant* arguments, GDBusMethodInvocation* call) {
                  receive(arguments, call);
@@ -152,24 +158,42 @@ Notifier::~Notifier() = default;
 // Who calls while the name is given back reaches this notifier still, or else the next one.
 bool Notifier::run() {
   std::optional<std::string> failure;
-  bus_->connect([&](const std::string& error) { failure = error; });
+  bus_->connect([&](const BusFailure* error) { failure = error ? error->text : ""; });
   sleepWhile([&] { return !failure; });
   if (!failure->empty()) {
     ports_.systemLog.write("Notifications are not delivered: " + *failure);
     return false;
   }
-  const auto isOver = [this] {
-    std::error_code error;
-    return isDisconnected_ || !fs::exists(executable_, error);
-  };
   do {
     if (!ownsName("RequestName")) return true;
     findProducts();
     sleepWhile([&] { return !isOver() && !isIdle(); });
-    if (isOver()) return true;
+    if (isOver()) break;
     static_cast<void>(ownsName("ReleaseName"));
   } while (!isOver() && !isIdle());
+  if (isReplaced()) handOver();
   return true;
+}
+
+bool Notifier::isOver() {
+  return isDisconnected_ || program_.look() == ProgramFile::State::gone || isReplaced();
+}
+
+// A click on a banner that is up reaches its sender alone, so that is waited for.
+bool Notifier::isReplaced() {
+  return !isDisconnected_ && program_.look() == ProgramFile::State::replaced &&
+         std::all_of(products_.begin(), products_.end(),
+                     [](const auto& each) { return each.second->isQuiet(); });
+}
+
+// Where there is anything left to do, the bus starts what lies in this program's place by now.
+void Notifier::handOver() {
+  if (isIdle()) return;
+  static_cast<void>(ownsName("ReleaseName"));
+  bool isAnswered = false;
+  bus_->ask(messageToBus("StartServiceByName", g_variant_new("(su)", notifierName, 0u)),
+            SessionBus::usualTime, [&](auto*, const auto&) { isAnswered = true; });
+  sleepWhile([&] { return !isAnswered; });
 }
 
 // Asks the bus for the name, or gives it back; whether this is its owner then.
@@ -207,6 +231,20 @@ Notifier::Product* Notifier::product(const fs::path& path) {
 
 void Notifier::findProducts() {
   for (const fs::path& store : POSIX::notificationStores()) product(store);
+}
+
+// An application that is killed as soon as it has made its first plan tells nobody of it, and one
+// whose folder was removed makes another.
+void Notifier::lookAtFolder(const std::string& name) {
+  const fs::path folder = POSIX::stateFolders() / name;
+  const fs::path store = POSIX::notificationStoreIn(folder);
+  newFolders_.erase(folder);
+  newFolders_.try_emplace(folder, folder, store.filename(), [this, store] { product(store); });
+  Product* const known = product(store);
+  if (!known) return;
+  newFolders_.erase(folder);
+  known->watchFolder();
+  known->deliverer().recheck();
 }
 
 void Notifier::recheck() {

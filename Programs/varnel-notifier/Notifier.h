@@ -12,6 +12,7 @@
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/MainLoop/FileWatch.h>
 #include <Varnel/Platform/Linux/Notifications/SessionBus.h>
+#include <varnel-notifier/ProgramFile.h>
 
 namespace Varnel::Platform {
 class ApplicationLauncher;
@@ -37,7 +38,8 @@ class Notifier final {
   Notifier& operator=(const Notifier&) = delete;
 
   /// Delivers until nothing is left to be delivered, shown or clicked, the program's file has gone,
-  /// or the bus has. Returns at once where another notifier runs. False where there is no bus.
+  /// or the bus has. A program that was replaced takes over while no banner is up. Returns at once
+  /// where another notifier runs. False where there is no bus.
   [[nodiscard]] bool run();
 
  private:
@@ -46,14 +48,17 @@ class Notifier final {
   /// The product with this store, if there is one.
   Product* product(const std::filesystem::path& path);
   void findProducts();
+  void lookAtFolder(const std::string& name);
   void recheck();
   [[nodiscard]] bool isIdle() const;
+  [[nodiscard]] bool isOver();
+  [[nodiscard]] bool isReplaced();
+  void handOver();
   void receive(GVariant* arguments, GDBusMethodInvocation* call);
   [[nodiscard]] bool ownsName(const char* method);
   void sleepWhile(const std::function<bool()>& condition);
 
   const Platform::Linux::NotificationPorts ports_;
-  const std::filesystem::path executable_;
   const std::shared_ptr<Platform::Linux::SessionBus> bus_;
   const std::unique_ptr<Platform::ApplicationLauncher> launcher_;
   const std::unique_ptr<Platform::WallClockTimer> timer_;
@@ -61,7 +66,10 @@ class Notifier final {
   std::map<std::filesystem::path, std::unique_ptr<Product>> products_;  ///< By store.
   bool isDisconnected_ = false;
   const Platform::Linux::FileWatch zoneWatch_;
-  const Platform::Linux::FileWatch executableWatch_;
+  const Platform::Linux::FileWatch stateWatch_;  ///< The folder of the products' folders.
+  /// Those that came while this runs, in which there may yet be a store.
+  std::map<std::filesystem::path, Platform::Linux::FileWatch> newFolders_;
+  ProgramFile program_;
 };
 
 }  // namespace Varnel

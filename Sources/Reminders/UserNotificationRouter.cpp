@@ -113,6 +113,19 @@ void UserNotificationRouter::handleLaunch(const UserNotification& notification) 
   routes_->route(notification, EventKind::didLaunchWith);
 }
 
+void UserNotificationRouter::handlePendingLaunch() {
+  takeLaunch(ports_.userNotificationCenter, routes_);
+}
+
+void UserNotificationRouter::takeLaunch(UserNotificationCenter& center,
+                                        const std::weak_ptr<Routes>& routes) {
+  const auto alive = routes.lock();
+  if (!alive) return;
+  const auto launch = center.takeLaunchNotification();
+  if (!launch) return center.retryLater([&center, routes] { takeLaunch(center, routes); });
+  if (*launch) alive->route(**launch, EventKind::didLaunchWith);
+}
+
 std::optional<Platform::PlatformError> UserNotificationRouter::removeScheduledNotifications(
     const std::string& identifier) {
   return removeNotifications(identifier, &UserNotificationCenter::removeScheduledNotification);

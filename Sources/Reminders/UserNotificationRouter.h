@@ -77,6 +77,11 @@ class VARNEL_API UserNotificationRouter final {
 
   /// To be called by a host that was launched through a notification.
   void handleLaunch(const Platform::UserNotification& notification);
+  /// Handles the launch for which the center keeps a notification, if there is one. Where the
+  /// center cannot be asked now it is asked later, as long as the router lives.
+  ///
+  ///     router.handlePendingLaunch();  // once the handlers are registered
+  void handlePendingLaunch();
 
   /// Cancels what is scheduled under this identifier, if it has been delivered before and is still
   /// in the delivered list: published behaviour. A notification that was never delivered stays
@@ -89,6 +94,8 @@ class VARNEL_API UserNotificationRouter final {
 
  private:
   class Routes;
+  static void takeLaunch(Platform::UserNotificationCenter& center,
+                         const std::weak_ptr<Routes>& routes);
   using Failure = std::optional<Platform::PlatformError>;
   using Removal =
       Failure (Platform::UserNotificationCenter::*)(const Platform::UserNotification& notification);

@@ -213,6 +213,59 @@ TEST_F(NotificationDelivererTest, LeavesAProcessThatDeliversItselfAloneUntilItEn
   EXPECT_THAT(notifier.hosts.questions, SizeIs(2));
 }
 
+// One that is due for another process keeps the next one from nobody.
+TEST_F(NotificationDelivererTest, WhatIsPlannedIsAwaitedWhateverIsInTheWay) {
+  Testing::Process other(file, start);
+  other.listen();
+  other.deliver(at(start, "its own"));
+  host.schedule(at(start));
+  host.schedule(at(start + 500ms, "next"));
+  const Notifier notifier(file, start);
+  EXPECT_EQ(notifier.deliverer->earliestDate(), start + 500ms);
+}
+
+TEST_F(NotificationDelivererTest, TheBannerOfAnEarlierOneIsKnownUntilItIsClosed) {
+  NotificationStore store({*host.realFiles, host.log}, file.string(), Migrating::never);
+  host.schedule(at(start));
+  {
+    Notifier earlier(file, start);
+    earlier.hosts.questions.at("A")(true);
+    earlier.settle();
+    EXPECT_THAT(*store.deliveries({DeliveryState::shown}), SizeIs(1));
+  }
+  host.schedule(at(start, "B"));
+  Notifier notifier(file, start);
+  const auto expired = store.deliveries({DeliveryState::expired});
+  ASSERT_THAT(*expired, SizeIs(1));
+  EXPECT_TRUE(expired->front().banner);
+  // The next A is hidden, and the server does not close the banner.
+  host.schedule(at(start));
+  notifier.deliverer->recheck();
+  notifier.server.faults->plan(Testing::Fault::fails, 1, 1);
+  for (const char* const title : {"A", "B"}) notifier.hosts.questions.at(title)(false);
+  notifier.settle();
+  EXPECT_FALSE(notifier.deliverer->isIdle());
+  EXPECT_TRUE(notifier.deliverer->isQuiet());
+  notifier.server.appear();
+  notifier.settle();
+  EXPECT_TRUE(notifier.deliverer->isIdle());
+}
+
+TEST_F(NotificationDelivererTest, ALockedStoreIsSpokenOfWhenItLasts) {
+  host.schedule(at(start + 1h));
+  Notifier notifier(file, start);
+  auto holder = SQLiteDatabase::open(file.string());
+  for (const bool lasts : {false, true}) {
+    ASSERT_FALSE(holder->execute("BEGIN EXCLUSIVE"));
+    notifier.deliverer->recheck();
+    EXPECT_EQ(notifier.log.text(), "");
+    if (lasts) notifier.timer.advanceTo(start + 2 * NotificationDeliverer::minPause);
+    ASSERT_FALSE(holder->execute("COMMIT"));
+    notifier.timer.advanceTo(notifier.clock.now() + NotificationDeliverer::minPause);
+  }
+  EXPECT_EQ(notifier.log.text(), "Notifications have to wait: database is locked\n");
+}
+
 TEST_F(NotificationDelivererTest, AStoreThatTheUserRemovesStaysRemoved) {
   host.schedule(at(start));
   host.schedule(at(start + 1h, "old"));
@@ -225,6 +278,7 @@ TEST_F(NotificationDelivererTest, AStoreThatTheUserRemovesStaysRemoved) {
   EXPECT_FALSE(notifier.deliverer->keepLaunch({at(start)}));
   notifier.settle();
   EXPECT_TRUE(notifier.deliverer->isIdle());
+  EXPECT_EQ(notifier.deliverer->earliestDate(), std::nullopt);
   EXPECT_EQ(notifier.server.count(), 0u);
   EXPECT_FALSE(std::filesystem::exists(file));
   Testing::Process(file, start + 1h).schedule(at(start + 2h, "new"));

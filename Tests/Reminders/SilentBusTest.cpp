@@ -16,9 +16,11 @@
 
 #include <Tests/Support/DrainUntil.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Generic/DelivererConnection.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/Notifications/BusNotificationServer.h>
 #include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
+#include <Varnel/Platform/Linux/Notifications/NotifierConnection.h>
 #include <Varnel/Platform/Linux/Notifications/SessionBus.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
 #include <Varnel/Platform/Ports/MainQueue.h>
@@ -184,6 +186,33 @@ TEST(NotificationServer, ABusThatNeverAnswersCostsTheBannersAndNoWaiting) {
     EXPECT_TRUE(Tests::drainUntil(*mainQueue, [&] { return !server->isBusy(); }));
     EXPECT_EQ(log.text(), "Cannot show a notification: The session bus does not answer.\n");
   }
+}
+
+// Whose calls do nothing.
+class Replacement final : public DelivererConnection {
+ public:
+  void setHost(std::weak_ptr<NotificationHost>, Standing) override {}
+  void setActive(bool) override {}
+  void changed() override {}
+  void changedAtOnce() override {}
+  void checkBanners(std::function<void(const Failure&)>) override {}
+  [[nodiscard]] bool isBusy() const override { return false; }
+};
+
+TEST(NotifierConnection, ABusThatIsSilentIsAskedAgainAndOneThatHasGoneIsReplaced) {
+  std::optional<SilentBus> bus(std::in_place);
+  const auto mainQueue = Linux::makeMainQueue();
+  int replacements = 0;
+  Linux::NotifierConnection connection(Linux::makeSessionBus(std::chrono::milliseconds(50)),
+                                       "com.example", "/store", [&] {
+                                         ++replacements;
+                                         return std::make_unique<Replacement>();
+                                       });
+  connection.changed();
+  EXPECT_TRUE(Tests::drainUntil(*mainQueue, [&] { return !connection.isBusy(); }));
+  EXPECT_EQ(replacements, 0);
+  bus.reset();
+  EXPECT_TRUE(Tests::drainUntil(*mainQueue, [&] { return replacements == 1; }));
 }
 
 // As the desktop notification standard orders the parts.

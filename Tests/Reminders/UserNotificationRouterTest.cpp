@@ -61,6 +61,22 @@ TEST_F(UserNotificationRouterTest, ReachesAllHandlersOfTheIdentifierInTheirOrder
   EXPECT_EQ(Router::eventKindWithRawValue(-1), std::nullopt);
 }
 
+TEST_F(UserNotificationRouterTest, ALaunchWaitsForACenterThatCannotBeAsked) {
+  router.register_("a", note("launched"));
+  center.startBy(notification);
+  {
+    Router shortLived({center, application, queue});
+    center.faults->plan(Platform::Testing::Fault::fails, 1, 3);
+    for (Router* const each : {&shortLived, &router}) each->handlePendingLaunch();
+  }
+  center.retry();
+  EXPECT_EQ(center.retryCount(), 1u);
+  center.retry();
+  router.handlePendingLaunch();
+  queue.drain();
+  EXPECT_THAT(events, ElementsAre("launched A 0"));
+}
+
 TEST_F(UserNotificationRouterTest, DropsWhatNobodyAskedForAndReplaysNothing) {
   center.activate(notification);
   router.register_("a", note("late"));

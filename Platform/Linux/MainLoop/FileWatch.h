@@ -15,14 +15,16 @@ namespace Varnel::Platform::Linux {
 class FileWatch final {
  public:
   FileWatch(const std::filesystem::path& folder, std::string name, std::function<void()> changed);
+  /// Calls back with the name of anything that was made in the folder, or moved into it.
+  FileWatch(const std::filesystem::path& folder, std::function<void(const std::string& name)> come);
   FileWatch(const FileWatch&) = delete;
   FileWatch& operator=(const FileWatch&) = delete;
 
  private:
   void readEvents();
 
-  const std::string name_;
-  const std::function<void()> changed_;
+  const std::string name_;  ///< Empty for any.
+  const std::function<void(const std::string& name)> changed_;
   const POSIX::FileDescriptor descriptor_;
   const MainLoopSource source_;
 };

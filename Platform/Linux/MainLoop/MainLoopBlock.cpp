@@ -38,6 +38,11 @@ GSource* attach(GSource* source, int priority, Block block) {
   return source;
 }
 
+void detach(GSource* source) {
+  g_source_destroy(source);
+  g_source_unref(source);
+}
+
 void runOnMainLoop(Block block) {
   g_source_unref(attach(g_idle_source_new(), G_PRIORITY_DEFAULT, std::move(block)));
 }

@@ -55,11 +55,11 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     if (const auto shown = shown_.extract(token); shown && shown.mapped().address)
       address = shown.mapped().address;
     ++pending_;
-    bus_->connect([weak = weak_from_this(), token, address](const std::string& error) {
+    bus_->connect([weak = weak_from_this(), token, address](const BusFailure* failure) {
       const auto self = weak.lock();
       if (!self) return;
       --self->pending_;
-      if (!error.empty()) return self->tell(&NotificationServer::Observer::bannerFailed, token);
+      if (failure) return self->tell(&NotificationServer::Observer::bannerFailed, token);
       // The server of another session has gone with its banners; then the bus alone is asked, so
       // that the answer comes later.
       const bool isHere = address && address->bus == self->bus_->name();

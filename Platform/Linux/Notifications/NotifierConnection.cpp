@@ -6,6 +6,7 @@
 #include <Varnel/Platform/Linux/Notifications/HostName.h>
 #include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
 #include <Varnel/Platform/Linux/Notifications/NotifierProtocol.h>
+#include <Varnel/Platform/Values/GrowingPause.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
@@ -39,7 +40,8 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
     const std::weak_ptr weak = weak_from_this();
     bus_->setObserver([weak](bool isConnected) {
       const auto self = weak.lock();
-      if (!self || !isConnected) return;
+      if (!self) return;
+      if (!isConnected) return self->tryLater();
       self->claimName();
       self->claimFront();
     });
@@ -68,7 +70,7 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
     if (replacement_) return replacement_->setActive(isActive_);
     claimFront();
     // The notifier has to know before the next notification comes.
-    if (isActive_) bus_->connect([](const std::string&) {});
+    if (isActive_) bus_->connect([](const BusFailure*) {});
   }
 
   // While one message is on its way, all further changes wait for one more.
@@ -97,6 +99,8 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
   bool isBusy() const { return pendingChanges_ > 0 || (replacement_ && replacement_->isBusy()); }
 
  private:
+  static constexpr int maxStarts = 3;
+
   static GVariant* receive(NotificationHost& host, std::string_view method, GVariant* arguments) {
     const Variant dictionary(g_variant_get_child_value(arguments, 0));
     const UserNotification notification = notificationIn(dictionary.get());
@@ -122,11 +126,28 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
 
   void changeAnswered(GDBusMessage* reply, const BusFailure& failure) {
     --pendingChanges_;
-    const bool isThere = reply || (!failure.name.empty() && !failure.isNobodyThere());
-    if (!isThere) return replace();
+    if (!reply) return isHopeless(failure) ? replace() : tryLater();
     isUrgent_ = false;
-    staysForUs_ = reply && isYes(reply);
+    staysForUs_ = isYes(reply);
+    failedStarts_ = 0;
+    pause_.succeeded();
+    retry_ = AttachedSource();
     if (isChanged_) tellChanged();
+  }
+
+  // Somebody that the bus cannot start may have been killed on the way.
+  bool isHopeless(const BusFailure& failure) {
+    failedStarts_ = failure.isNobodyThere() ? failedStarts_ + 1 : 0;
+    return failure.isUnknownThere() || failedStarts_ == maxStarts;
+  }
+
+  void tryLater() {
+    if (replacement_) return;
+    pause_.failed(Date());
+    const auto pause = std::chrono::ceil<std::chrono::milliseconds>(pause_.end() - Date());
+    isChanged_ = false;
+    retry_ = AttachedSource(attach(g_timeout_source_new(static_cast<guint>(pause.count())),
+                                   G_PRIORITY_DEFAULT, [this] { changed(); }));
   }
 
   // A notifier that had nothing to do any more is not called back. One that ended otherwise is,
@@ -177,6 +198,9 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
   bool isUrgent_ = false;    ///< Something must not wait for a host.
   bool staysForUs_ = false;  ///< What the notifier said last.
   int pendingChanges_ = 0;   ///< Messages that have not been answered.
+  int failedStarts_ = 0;     ///< In a row.
+  GrowingPause pause_{std::chrono::seconds(1), std::chrono::minutes(5)};
+  AttachedSource retry_;
   const SessionBus::Subscription notifiers_;
 };
 

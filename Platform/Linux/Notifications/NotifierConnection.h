@@ -12,7 +12,9 @@
 namespace Varnel::Platform::Linux {
 
 /// The way to the session's notifier, which the bus starts when it is needed. Where the bus has no
-/// such service, or there is no bus, a deliverer of this process takes its place, and keeps it.
+/// such service or cannot start it, or there is no bus, a deliverer of this process takes its
+/// place, and keeps it. What got no answer is said again, after pauses that grow from a second to
+/// five minutes.
 ///
 /// A host owns the product's host name on the bus: the first process that asked for it, but an
 /// onlooker leaves it to the application. Main thread only.

@@ -5,7 +5,6 @@
 #include <utility>
 
 #include <Varnel/Platform/Concurrency/StartThread.h>
-#include <Varnel/Platform/Linux/MainLoop/MainLoopBlock.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
@@ -44,10 +43,18 @@ using BusInterface = UniqueHandle<GDBusNodeInfo*, g_dbus_node_info_unref>;
 
 constexpr const char* busService = "org.freedesktop.DBus";
 constexpr const char* busPath = "/org/freedesktop/DBus";
+const std::string errors = "org.freedesktop.DBus.Error.";
 
 BusFailure failureIn(GDBusMessage* reply, std::string text) {
   const char* name = g_dbus_message_get_error_name(reply);
   return {name ? name : "", std::move(text)};
+}
+
+// What is short now may not be so later.
+bool isPassing(const GError& error) {
+  if (error.domain != G_IO_ERROR) return false;
+  return error.code == G_IO_ERROR_TOO_MANY_OPEN_FILES || error.code == G_IO_ERROR_TIMED_OUT ||
+         error.code == G_IO_ERROR_CLOSED || error.code == G_IO_ERROR_CONNECTION_CLOSED;
 }
 
 void call(GDBusConnection*, const char*, const char*, const char*, const char* method,
@@ -58,11 +65,13 @@ void call(GDBusConnection*, const char*, const char*, const char*, const char* m
 }  // namespace
 
 bool BusFailure::isNobodyThere() const {
-  const std::string_view errors = "org.freedesktop.DBus.Error.";
-  if (name.empty()) return false;
-  return name == std::string(errors) + "ServiceUnknown" ||
-         name == std::string(errors) + "NameHasNoOwner" ||
-         name.starts_with(std::string(errors) + "Spawn.");
+  return (!name.empty() && isUnknownThere()) || name == errors + "NameHasNoOwner" ||
+         name.starts_with(errors + "Spawn.");
+}
+
+// The door of a sandbox answers with the second one, too.
+bool BusFailure::isUnknownThere() const {
+  return name.empty() || name == errors + "ServiceUnknown" || name == errors + "AccessDenied";
 }
 
 // Signals that somebody hears, as long as it lives.
@@ -168,7 +177,7 @@ bool SessionBus::isConnected() const {
 }
 
 void SessionBus::connect(Connected use) {
-  if (isConnected()) return use({});
+  if (isConnected()) return use(nullptr);
   waiting_.push_back(std::move(use));
   if (!attempt_) start();
 }
@@ -179,46 +188,49 @@ void SessionBus::connect(Connected use) {
 // no time for either.
 void SessionBus::start() {
   const auto attempt = attempt_ = std::make_shared<Attempt>();
-  timer_ = Timer(attach(g_timeout_source_new(static_cast<guint>(patience_.count())),
-                        G_PRIORITY_DEFAULT + 1, [this] {
-                          g_cancellable_cancel(attempt_->cancellable.get());
-                          finish(attempt_, {}, "The session bus does not answer.");
-                        }));
+  timer_ = AttachedSource(attach(
+      g_timeout_source_new(static_cast<guint>(patience_.count())), G_PRIORITY_DEFAULT + 1, [this] {
+        g_cancellable_cancel(attempt_->cancellable.get());
+        finish(attempt_, {}, {BusFailure::noReply, "The session bus does not answer."});
+      }));
   try {
     startThread("session-bus", [weak = weak_from_this(), attempt] {
-      std::string error;
-      const auto connection = std::make_shared<Connection>(open(attempt->cancellable.get(), error));
-      runOnMainLoop([weak, attempt, connection, error] {
-        if (const auto self = weak.lock()) self->finish(attempt, std::move(*connection), error);
+      BusFailure failure;
+      const auto connection =
+          std::make_shared<Connection>(open(attempt->cancellable.get(), failure));
+      runOnMainLoop([weak, attempt, connection, failure] {
+        if (const auto self = weak.lock()) self->finish(attempt, std::move(*connection), failure);
       });
     }).detach();
-  } catch (const std::system_error& failure) {
-    finish(attempt, {}, failure.what());
+  } catch (const std::system_error& error) {
+    finish(attempt, {}, {BusFailure::noReply, error.what()});
   }
 }
 
-SessionBus::Connection SessionBus::open(GCancellable* cancellable, std::string& error) {
-  GError* failure = nullptr;
-  const Text address(g_dbus_address_get_for_bus_sync(G_BUS_TYPE_SESSION, cancellable, &failure));
+SessionBus::Connection SessionBus::open(GCancellable* cancellable, BusFailure& failure) {
+  GError* error = nullptr;
+  const Text address(g_dbus_address_get_for_bus_sync(G_BUS_TYPE_SESSION, cancellable, &error));
   constexpr auto flags =
       static_cast<GDBusConnectionFlags>(G_DBUS_CONNECTION_FLAGS_AUTHENTICATION_CLIENT |
                                         G_DBUS_CONNECTION_FLAGS_MESSAGE_BUS_CONNECTION);
   Connection connection;
   if (address)
-    connection = Connection(g_dbus_connection_new_for_address_sync(address.get(), flags, nullptr,
-                                                                   cancellable, &failure));
-  if (failure) error = take(failure);
+    connection = Connection(
+        g_dbus_connection_new_for_address_sync(address.get(), flags, nullptr, cancellable, &error));
+  if (error && isPassing(*error)) failure.name = BusFailure::noReply;
+  if (error) failure.text = take(error);
   return connection;
 }
 
 void SessionBus::finish(std::shared_ptr<Attempt> attempt, Connection connection,
-                        const std::string& error) {
+                        const BusFailure& failure) {
   // The attempt was given up.
   if (attempt != attempt_) return;
-  if (connection) adopt(std::move(connection));
+  const bool hasSucceeded{connection};
+  if (hasSucceeded) adopt(std::move(connection));
   attempt_.reset();
-  timer_ = Timer();
-  for (const Connected& use : std::exchange(waiting_, {})) use(error);
+  timer_ = AttachedSource();
+  for (const Connected& use : std::exchange(waiting_, {})) use(hasSucceeded ? nullptr : &failure);
 }
 
 void SessionBus::adopt(Connection connection) {
@@ -257,10 +269,10 @@ void SessionBus::send(const BusMessage& message, std::chrono::milliseconds time,
 
 void SessionBus::ask(BusMessage message, std::chrono::milliseconds time, Reply reply) {
   const auto kept = std::make_shared<BusMessage>(std::move(message));
-  connect([weak = weak_from_this(), kept, time, reply](const std::string& error) {
+  connect([weak = weak_from_this(), kept, time, reply](const BusFailure* failure) {
     const auto self = weak.lock();
-    if (self && error.empty()) return self->send(*kept, time, reply);
-    reply(nullptr, {"", error});
+    if (self && !failure) return self->send(*kept, time, reply);
+    reply(nullptr, failure ? *failure : BusFailure());
   });
 }
 
@@ -279,7 +291,7 @@ void SessionBus::replied(GObject* connection, GAsyncResult* result, gpointer dat
   const BusMessage message(g_dbus_connection_send_message_with_reply_finish(
       G_DBUS_CONNECTION(connection), result, &error));
   if (const auto self = awaited->bus.lock()) --self->awaitedReplies_;
-  if (!message) return awaited->use(nullptr, {"", take(error)});
+  if (!message) return awaited->use(nullptr, {BusFailure::noReply, take(error)});
   // A message from a real bus always has a sender.
   if (!g_dbus_message_get_sender(message.get()))
     return awaited->use(nullptr, {"", "The session bus does not tell who answers."});
@@ -302,11 +314,6 @@ void SessionBus::release() {
 void SessionBus::disconnect(GDBusConnection* connection) {
   g_dbus_connection_close(connection, nullptr, nullptr, nullptr);
   g_object_unref(connection);
-}
-
-void SessionBus::destroy(GSource* source) {
-  g_source_destroy(source);
-  g_source_unref(source);
 }
 
 std::shared_ptr<SessionBus> makeSessionBus(std::chrono::milliseconds patience) {

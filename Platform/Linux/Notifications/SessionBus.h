@@ -10,6 +10,7 @@
 #include <string_view>
 #include <vector>
 
+#include <Varnel/Platform/Linux/MainLoop/MainLoopBlock.h>
 #include <Varnel/Platform/Linux/Notifications/NotificationMessages.h>
 #include <Varnel/Platform/Values/UniqueHandle.h>
 
@@ -18,11 +19,16 @@ namespace Varnel::Platform::Linux {
 /// Why a message came to nothing: the bus's name of the error, empty where there is no bus, and the
 /// text.
 struct BusFailure final {
+  /// The name where nobody has answered, who may yet do so the next time.
+  static constexpr const char* noReply = "org.freedesktop.DBus.Error.NoReply";
+
   std::string name;
   std::string text;
 
   /// Whether nobody was there to take the message, nor anybody that could be started.
   [[nodiscard]] bool isNobodyThere() const;
+  /// Whether there is no bus, or it knows of no such service.
+  [[nodiscard]] bool isUnknownThere() const;
 };
 
 /// The signals to hear of; what is null is any.
@@ -50,8 +56,8 @@ struct ServedObject final {
 ///         failure) { … });
 class SessionBus final : public std::enable_shared_from_this<SessionBus> {
  public:
-  /// Given the error, or an empty text. Must not throw.
-  using Connected = std::function<void(const std::string& error)>;
+  /// Given the failure, or null. Must not throw.
+  using Connected = std::function<void(const BusFailure* failure)>;
   /// Given the reply, which has a sender, or null and the failure. Must not throw.
   using Reply = std::function<void(GDBusMessage* reply, const BusFailure& failure)>;
   /// Given the sender, the member and the body of a signal. Must not throw.
@@ -105,24 +111,22 @@ class SessionBus final : public std::enable_shared_from_this<SessionBus> {
   struct AwaitedReply;
   class Listener;
 
-  static void destroy(GSource* source);
   static void disconnect(GDBusConnection* connection);
   using Connection = UniqueHandle<GDBusConnection*, disconnect>;
-  using Timer = UniqueHandle<GSource*, destroy>;
 
   [[nodiscard]] bool isConnected() const;
   void start();
   static void replied(GObject* connection, GAsyncResult* result, gpointer awaited) noexcept;
   static void closed(GDBusConnection* connection, gboolean, GError*, gpointer self) noexcept;
-  static Connection open(GCancellable* cancellable, std::string& error);
-  void finish(std::shared_ptr<Attempt> attempt, Connection connection, const std::string& error);
+  static Connection open(GCancellable* cancellable, BusFailure& failure);
+  void finish(std::shared_ptr<Attempt> attempt, Connection connection, const BusFailure& failure);
   void adopt(Connection connection);
   void release();
   void publish(const ServedObject& object) const;
 
   const std::chrono::milliseconds patience_;
   std::shared_ptr<Attempt> attempt_;  // The connection that is being made.
-  Timer timer_;                       // Ends the attempt.
+  AttachedSource timer_;              // Ends the attempt.
   std::vector<Connected> waiting_;    // Called at the end of the attempt.
   std::vector<std::weak_ptr<Listener>> listeners_;
   std::vector<ServedObject> objects_;

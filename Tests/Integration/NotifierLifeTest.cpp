@@ -1,0 +1,174 @@
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <fstream>
+#include <string>
+#include <thread>
+
+#include <Tests/Integration/NotifierSession.h>
+#include <Tests/Reminders/CenterProcess.h>
+
+namespace Varnel::Tests {
+namespace {
+
+using ::testing::HasSubstr;
+using ::testing::Not;
+
+// A process that plans and is gone before it tells the notifier.
+class Product final {
+ public:
+  explicit Product(const std::string& folder)
+      : process_(folder + "/notifications.sqlite", std::chrono::system_clock::now()) {}
+
+  void plan(const std::string& title, std::chrono::hours later = 0h) {
+    const UserNotification planned{.identifier = title,
+                                   .title = title,
+                                   .deliveryDate = std::chrono::system_clock::now() + later};
+    // The notifier may have the store locked.
+    EXPECT_TRUE(comesTrue([&] { return !process_.center.scheduleNotification(planned); }));
+  }
+  void planForLater() { plan("later", 24h); }
+
+ private:
+  Platform::Testing::Process process_;
+};
+
+// When the notifier runs, for how long, and what its end costs.
+TEST_F(NotifierTest, ANotifierWithNothingToDoEnds) {
+  // Somebody else's, who encrypts it.
+  fs::create_directory(home_ + "/foreign");
+  write("foreign/notifications.sqlite", std::string(8192, 'x'));
+  EXPECT_EQ(ChildProcess({VARNEL_NOTIFIER}).wait(), 0);
+  const std::string orvane = ORVANE_PROGRAM;
+  outputOf(orvane + " remind every weekly");
+  EXPECT_TRUE(isOnBus(notifierName));
+  EXPECT_EQ(outputOf("ls " + home_ + "/foreign"), "notifications.sqlite\n");
+  // There is one of them.
+  EXPECT_EQ(ChildProcess({VARNEL_NOTIFIER}).wait(), 0);
+  outputOf(orvane + " remind every never");
+  EXPECT_TRUE(comesTrue([] { return !isOnBus(notifierName); }));
+}
+
+// Asleep it has little memory of its own, and nothing wakes it.
+TEST_F(NotifierTest, ANotifierSleeps) {
+  outputOf(std::string(ORVANE_PROGRAM) + " remind every weekly");
+  const std::string process = "/proc/" + std::to_string(ownerOf(notifierName));
+  const auto figure = [&](const char* file, const char* name) {
+    std::ifstream lines(process + file);
+    for (std::string line; std::getline(lines, line);)
+      if (line.starts_with(name)) return std::stol(line.substr(std::string(name).size()));
+    return -1l;
+  };
+  EXPECT_LT(figure("/smaps_rollup", "Private_Dirty:"), 1200);
+  std::this_thread::sleep_for(1s);
+  const long switches = figure("/status", "voluntary_ctxt_switches:");
+  std::this_thread::sleep_for(3s);
+  EXPECT_EQ(figure("/status", "voluntary_ctxt_switches:"), switches);
+}
+
+TEST_F(NotifierTest, WithoutItsProgramItEndsAndTheHostDeliversItself) {
+  const std::string copy = home_ + "/varnel-notifier";
+  fs::copy_file(VARNEL_NOTIFIER, copy);
+  install(copy);
+  const Server server;
+  Host host("removed");
+  host.schedule({.identifier = "later", .deliveryDate = std::chrono::system_clock::now() + 24h});
+  host.settle();
+  // Its host calls it back when it was killed, but not when it has gone.
+  const pid_t killed = ownerOf(notifierName);
+  ASSERT_NE(killed, 0);
+  ::kill(killed, SIGKILL);
+  host.await([&] { return ownerOf(notifierName) != killed && isOnBus(notifierName); });
+  host.settle();
+  fs::remove(copy);
+  EXPECT_TRUE(comesTrue([] { return !isOnBus(notifierName); }));
+  // As where the package has gone, and its files with it.
+  fs::remove(home_ + "/notifier");
+  host.deliver("by itself");
+  host.await([] { return displayed() == "1\n"; });
+  outputOf("dunstctl action 0");
+  host.await([&] { return !host.clicked.empty(); });
+}
+
+// As a session starts: the notifier first, and the desktop later.
+TEST_F(NotifierTest, AtLoginItWaitsForAServerAndForTheOneAfterIt) {
+  Product product(home_ + "/login");
+  product.plan("early");
+  ChildProcess notifier({VARNEL_NOTIFIER});
+  EXPECT_TRUE(comesTrue([] { return isOnBus(notifierName); }));
+  auto server = std::make_unique<Server>();
+  EXPECT_TRUE(comesTrue([] { return displayed() == "1\n"; }));
+  product.planForLater();
+  server = nullptr;
+  server = std::make_unique<Server>();
+  product.plan("late");
+  EXPECT_TRUE(comesTrue([] { return displayed() == "1\n"; }));
+  EXPECT_THAT(outputOf("dunstctl close; dunstctl history"), Not(HasSubstr("early")));
+}
+
+// Its planner is killed before it tells anybody, and perhaps its folder is a new one.
+TEST_F(NotifierTest, WhatNobodyTellsOfIsFound) {
+  const Server server;
+  const std::string folder = home_ + "/silent";
+  Product(home_ + "/known").planForLater();
+  ChildProcess notifier({VARNEL_NOTIFIER});
+  EXPECT_TRUE(comesTrue([] { return isOnBus(notifierName); }));
+  for (const char* const pass : {"new ", "made again "}) {
+    Product product(folder);
+    for (const std::string title : {"first", "next"}) {
+      product.plan(pass + title);
+      EXPECT_TRUE(comesTrue([&] {
+        return outputOf("dunstctl close-all; dunstctl history").find(pass + title) !=
+               std::string::npos;
+      })) << pass
+          << title;
+    }
+    fs::remove_all(folder);
+  }
+}
+
+TEST_F(NotifierTest, AProgramThatIsReplacedTakesOverOnceNoBannerIsUp) {
+  const std::string copy = home_ + "/varnel-notifier";
+  fs::copy_file(VARNEL_NOTIFIER, copy);
+  install(copy);
+  const Server server;
+  Product product(home_ + "/upgraded");
+  product.planForLater();
+  Host host("upgraded", std::nullopt);
+  host.deliver("up");
+  host.await([] { return displayed() == "1\n"; });
+  const pid_t old = ownerOf(notifierName);
+  const auto isAwake = [&] {
+    return outputOf(
+               "gdbus call --session -d com.quennel.Varnel.Notifier1 -o "
+               "/com/quennel/Varnel/Notifier -m com.quennel.Varnel.Notifier1.Changed '[]'") ==
+           "(false,)\n";
+  };
+  // Away for a moment, and back.
+  fs::rename(copy, copy + ".old");
+  EXPECT_TRUE(isAwake());
+  fs::rename(copy + ".old", copy);
+  fs::copy_file(VARNEL_NOTIFIER, copy + ".new");
+  fs::rename(copy + ".new", copy);
+  EXPECT_TRUE(isAwake());
+  EXPECT_EQ(ownerOf(notifierName), old);
+  outputOf("dunstctl close");
+  EXPECT_TRUE(comesTrue([&] {
+    const pid_t present = ownerOf(notifierName);
+    return present != 0 && present != old;
+  }));
+}
+
+TEST_F(NotifierTest, OneThatIsKilledAtItsStartIsStartedAgain) {
+  write("start", "#!/bin/sh\n[ -e " + home_ + "/killed ] && exec " + home_ + "/notifier\n: >" +
+                     home_ + "/killed\nkill -KILL $$\n");
+  fs::permissions(home_ + "/start", fs::perms::owner_all);
+  addService(notifierName, home_ + "/start");
+  Host host("persistent");
+  host.schedule({.identifier = "later", .deliveryDate = std::chrono::system_clock::now() + 24h});
+  host.await([] { return isOnBus(notifierName); });
+}
+
+}  // namespace
+}  // namespace Varnel::Tests
