@@ -161,4 +161,14 @@ std::string pathOf(const Folder& folder) {
   return folder.name[0] == '\0' ? "/" : folder.name;
 }
 
+bool isOnTheWay(const FileIdentity& identity, const Folder& folder) {
+  for (const Folder* each = &folder; each != nullptr; each = each->parent)
+    if (each->identity == identity) return true;
+  return false;
+}
+
+bool isUnseen(const Folder& folder) {
+  return folder.parent && std::string_view(folder.name).find('/') != std::string_view::npos;
+}
+
 }  // namespace Orvane

@@ -157,4 +157,9 @@ class FileTree::Writer final {
 [[nodiscard]] std::string pathBelow(const Folder& folder, std::string_view name);
 [[nodiscard]] std::string pathOf(const Folder& folder);
 
+/// Whether it identifies the folder or one of those above it, up to a given one.
+[[nodiscard]] bool isOnTheWay(const FileIdentity& identity, const Folder& folder);
+/// Whether no listing shows the folder, as it is mounted in a pseudo file system. It may be a file.
+[[nodiscard]] bool isUnseen(const Folder& folder);
+
 }  // namespace Orvane

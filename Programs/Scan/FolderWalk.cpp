@@ -19,13 +19,6 @@
 namespace Orvane {
 namespace {
 
-/// Whether the folder is `folder` or one of those above it, up to the root of the walk.
-bool isOnTheWay(const FileIdentity& identity, const Folder* folder) {
-  for (; folder != nullptr; folder = folder->parent)
-    if (folder->identity == identity) return true;
-  return false;
-}
-
 /// The walk in progress. A task takes its locks once a folder.
 class Walk final {
  public:
@@ -252,12 +245,13 @@ class Walk::Task final : public TaskGroup::Task {
   bool begin() {
     const auto opened = open_.open(*folder_);
     if (!opened) {
-      walk_.lose(*folder_, Loss::because(opened.error()));
+      if (opened.error() != std::errc::not_a_directory || !isUnseen(*folder_))
+        walk_.lose(*folder_, Loss::because(opened.error()));
       return false;
     }
     const FileIdentity identity = (*opened)->identity();
     if (folder_->parent) {
-      if (isOnTheWay(identity, folder_->parent)) return false;
+      if (isOnTheWay(identity, *folder_->parent)) return false;
       if (walk_.request_.staysOnFileSystem && identity.device != folder_->parent->identity.device)
         return false;
       // A given folder that lies in another one is walked by itself.

@@ -2,6 +2,7 @@
 #include <Varnel/DiskAccess/DiskReadingCore.h>
 
 #include <algorithm>
+#include <chrono>
 #include <system_error>
 #include <utility>
 
@@ -10,6 +11,12 @@
 #include <Varnel/Platform/Ports/VolumeCatalog.h>
 
 namespace Varnel {
+namespace {
+
+/// A look-up that takes longer is stuck.
+constexpr std::chrono::seconds maxLookUpTime{1};
+
+}  // namespace
 
 DiskReadingCore::DiskReadingCore(std::shared_ptr<DiskAccessState> disks, Ports ports)
     : disks_(std::move(disks)),
@@ -38,6 +45,21 @@ void DiskReadingCore::add(DiskReadingJobs& jobs, Basalt::Block block) {
     block = {};
     const Lock lock(self->mutex_);
     self->leaveBusy(thread);
+  });
+}
+
+void DiskReadingCore::lookUp(Basalt::Block block) {
+  add(*lookups_, [self = shared_from_this(), block = std::move(block)]() mutable {
+    // Set by the first of the two: the end of the look-up, and that of the time for it.
+    const auto isSettled = std::make_shared<std::atomic<bool>>(false);
+    const auto timer = self->watch_.at(DiskReadingWatch::Time::clock::now() + maxLookUpTime,
+                                       [jobs = self->lookups_, isSettled] {
+                                         if (!isSettled->exchange(true)) jobs->didGetStuck();
+                                       });
+    block();
+    block = {};
+    self->watch_.cancel(timer);
+    if (isSettled->exchange(true)) self->lookups_->goesOn();
   });
 }
 

@@ -62,7 +62,7 @@ class DiskReadingCore final : public std::enable_shared_from_this<DiskReadingCor
   /// Runs a block that asks the file system, and may get stuck in it, or one that waits for the
   /// manager at most. `close` waits for a block that runs and drops one that does not. Both throw
   /// `std::system_error`, having done nothing, when there is no thread.
-  void lookUp(Basalt::Block block) { add(*lookups_, std::move(block)); }
+  void lookUp(Basalt::Block block);
   void plan(Basalt::Block block) { add(*plans_, std::move(block)); }
 
   /// Calls back, later: on the executor or, without one that can, one after another on a thread
@@ -123,7 +123,7 @@ class DiskReadingCore final : public std::enable_shared_from_this<DiskReadingCor
   const Ports ports_;
   const std::optional<Platform::ReadingPriority::Level> normalPriority_;
   const std::shared_ptr<DiskReadingWorkers> workers_ = std::make_shared<DiskReadingWorkers>();
-  /// A dead share keeps who asks it for ever.
+  /// A dead share keeps who asks it for ever, and nobody else.
   const std::shared_ptr<DiskReadingJobs> lookups_ = std::make_shared<DiskReadingJobs>(workers_, 16);
   const std::shared_ptr<DiskReadingJobs> plans_ = std::make_shared<DiskReadingJobs>(workers_, 1);
   std::optional<Basalt::NotificationCenter::Observer> unmounts_;

@@ -55,10 +55,9 @@ void DiskReadingWorkers::work() {
 
 void DiskReadingJobs::add(Basalt::Block block) {
   const std::lock_guard lock(mutex_);
-  if (running_ < maxRunning_) {
+  if (running_ < room()) {
     try {
-      workers_->run([self = shared_from_this()] { self->work(); });
-      ++running_;
+      startWorker();
     } catch (const std::system_error&) {
       if (running_ == 0) throw;
     }
@@ -66,9 +65,30 @@ void DiskReadingJobs::add(Basalt::Block block) {
   waiting_.push_back(std::move(block));
 }
 
+void DiskReadingJobs::startWorker() {
+  workers_->run([self = shared_from_this()] { self->work(); });
+  ++running_;
+}
+
+void DiskReadingJobs::didGetStuck() {
+  const std::lock_guard lock(mutex_);
+  ++stuck_;
+  if (waiting_.empty() || running_ >= room()) return;
+  try {
+    startWorker();
+  } catch (const std::system_error&) {
+    // Then they wait for one that goes on.
+  }
+}
+
+void DiskReadingJobs::goesOn() {
+  const std::lock_guard lock(mutex_);
+  --stuck_;
+}
+
 void DiskReadingJobs::work() {
   std::unique_lock lock(mutex_);
-  while (!waiting_.empty()) {
+  while (!waiting_.empty() && running_ <= room()) {
     runFirst(waiting_, lock);
   }
   --running_;

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <algorithm>
 #include <condition_variable>
 #include <cstddef>
 #include <deque>
@@ -29,7 +30,8 @@ class DiskReadingWorkers final : public std::enable_shared_from_this<DiskReading
   std::size_t idle_ = 0;
 };
 
-/// Blocks that wait for one of a few workers, in order. Held by `std::shared_ptr`. Any thread.
+/// Blocks that wait for one of a few workers, in order. A block that is stuck does not count among
+/// them, as far as threads are to be had. Held by `std::shared_ptr`. Any thread.
 class DiskReadingJobs final : public std::enable_shared_from_this<DiskReadingJobs> {
  public:
   DiskReadingJobs(std::shared_ptr<DiskReadingWorkers> workers, std::size_t maxRunning)
@@ -38,7 +40,15 @@ class DiskReadingJobs final : public std::enable_shared_from_this<DiskReadingJob
   /// Throws as `DiskReadingWorkers::run` does, without keeping the block.
   void add(Basalt::Block block);
 
+  /// A block that runs has got stuck, or goes on after that.
+  void didGetStuck();
+  void goesOn();
+
  private:
+  static constexpr std::size_t maxStuck = 256;
+
+  [[nodiscard]] std::size_t room() const { return maxRunning_ + std::min(stuck_, maxStuck); }
+  void startWorker();
   void work();
 
   const std::shared_ptr<DiskReadingWorkers> workers_;
@@ -46,6 +56,7 @@ class DiskReadingJobs final : public std::enable_shared_from_this<DiskReadingJob
   std::mutex mutex_;  ///< Owns what follows.
   std::deque<Basalt::Block> waiting_;
   std::size_t running_ = 0;
+  std::size_t stuck_ = 0;  ///< Of those that run.
 };
 
 }  // namespace Varnel

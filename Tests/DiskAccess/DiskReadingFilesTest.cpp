@@ -184,7 +184,7 @@ TEST_F(DiskReadingFilesTest, CallsBackOnTheExecutorAlone) {
   mainQueue_.runWhile([&] { return !results.isComplete(); });
 }
 
-/// A catalogue in which one look-up waits before it answers, as on a dead share.
+/// A catalogue in which the look-ups of one file wait before they answer, as on a dead share.
 class StuckCatalog final : public Platform::VolumeCatalog {
  public:
   StuckCatalog(Platform::VolumeCatalog& volumes, URL stuck)
@@ -200,7 +200,7 @@ class StuckCatalog final : public Platform::VolumeCatalog {
   Platform::Result<std::optional<URL>> volumeURL(const URL& url) override {
     auto volume = volumes_.volumeURL(url);
     if (url == stuck_) {
-      isAsked.count_down();
+      if (!wasAsked_.test_and_set()) isAsked.count_down();
       mayAnswer.wait();
     }
     return volume;
@@ -211,6 +211,7 @@ class StuckCatalog final : public Platform::VolumeCatalog {
  private:
   Platform::VolumeCatalog& volumes_;
   const URL stuck_;
+  std::atomic_flag wasAsked_;
 };
 
 /// The same machine with a queue whose look-up of one file waits.
@@ -238,6 +239,19 @@ TEST_F(StuckLookUpTest, AnswersAStopMeanwhile) {
   source.request_stop();
   EXPECT_EQ(results_->await(), (Told{{"file", Result::stopped}}));
   catalog_->mayAnswer.count_down();
+}
+
+TEST_F(StuckLookUpTest, LetsOthersPassHoweverManyAreStuck) {
+  read(homeFile, {{.url = homeFile}});
+  std::latch others(20);
+  for (int i = 0; i < 20; ++i)
+    queue_->read({{.url = homeFile}}, {}, readAtOnce,
+                 [&](const auto&, DiskReadingResult) { others.count_down(); });
+  Results results(1);
+  queue_->read({{.url = stickFile}}, {}, readAtOnce, results.recorder());
+  EXPECT_EQ(results.await(), (Told{{"file", Result::read}}));
+  catalog_->mayAnswer.count_down();
+  others.wait();
 }
 
 TEST_F(StuckLookUpTest, FindsAVolumeThatWasUnmountedMeanwhileVanished) {

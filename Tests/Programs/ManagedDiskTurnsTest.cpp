@@ -85,6 +85,25 @@ TEST_F(ManagedDiskTurnsTest, AShareThatHangsHoldsUpNoReaderOfOtherDisks) {
   EXPECT_TRUE(isDoneInTime());
 }
 
+TEST_F(ManagedDiskTurnsTest, KnowsWhatIsMountedWithoutALookAtIt) {
+  using enum ScanMount::Kind;
+  volumes.mount({.url = URL::fileURLWithPath("/nas/"), .isLocal = false});
+  volumes.setPseudoFileSystems({URL::fileURLWithPath("/proc/")});
+  volumes.setLookupError(PlatformError("Test", 1));
+  std::map<std::string, ScanMount::Kind> kinds;
+  for (const ScanMount& mount : turns.mounts()) {
+    kinds[mount.path] = mount.kind;
+    EXPECT_EQ(turns.diskOf(mount.path).isReadable, mount.kind != pseudo) << mount.path;
+  }
+  EXPECT_EQ(kinds, (std::map<std::string, ScanMount::Kind>{{"/home", local},
+                                                           {"/archive", local},
+                                                           {"/attic", local},
+                                                           {"/share", local},
+                                                           {"/nas", network},
+                                                           {"/proc", pseudo}}));
+  EXPECT_FALSE(turns.diskOf("/nas/file").isReadable) << "that needs a look-up";
+}
+
 /// A task that loses a volume in each of its turns.
 class LosingTask final : public DiskTask {
  public:

@@ -191,18 +191,15 @@ TEST_F(ScanChoice, KeepsReferenceFoldersAsTheyAre) {
 TEST_F(ScanChoice, ReadsWhatIsMountedAtItsOwnDiskAndNoPseudoFileSystems) {
   using enum ScanMount::Kind;
   writeAll({"here/1", "local/2", "local/sub/3", "share/4", "kernel/5", "kernel/sub/6",
-            "kernel/homes/.ada/7", "kernel/other/8", "quiet/9", "file"});
+            "kernel/homes/.ada/7", "kernel/other/8", "kernel/masked", "quiet/9", "file"});
   const struct {
     const char* name;
     ScanMount::Kind kind;
     std::uint64_t device;
-  } mounts[] = {{"local", local, 91},
-                {"share", network, 92},
-                {"kernel", pseudo, 93},
-                {"kernel/homes/.ada", network, 94},
-                {"kernel/other", pseudo, 95},
-                {"quiet", network, 96},
-                {"file", local, 0}};
+  } mounts[] = {{"local", local, 91},         {"share", network, 92},
+                {"kernel", pseudo, 93},       {"kernel/homes/.ada", network, 94},
+                {"kernel/other", pseudo, 95}, {"kernel/masked", local, 0},
+                {"quiet", network, 96},       {"file", local, 0}};
   turns.mounted = {{"/", local}};
   for (const auto& [name, kind, device] : mounts) {
     turns.mounted.push_back({folder.path(name), kind});
@@ -235,7 +232,7 @@ TEST_F(ScanChoice, ReadsWhatIsMountedAtItsOwnDiskAndNoPseudoFileSystems) {
        {"kernel/sub/6", "local/2", "local/sub/3", "share/4"},
        {"share"}},
       {{.folders = {folder.path("kernel")}},
-       {"kernel/5", "kernel/homes/.ada/7", "kernel/sub/6"},
+       {"kernel/5", "kernel/homes/.ada/7", "kernel/masked", "kernel/sub/6"},
        {"kernel/homes/.ada"}},
   };
   for (const auto& [request, names, networks] : cases) {
@@ -252,6 +249,7 @@ TEST_F(ScanChoice, ReadsWhatIsMountedAtItsOwnDiskAndNoPseudoFileSystems) {
     EXPECT_THAT(paths(result), ElementsAre(expected));
     std::vector<std::string> said;
     for (const std::string& name : networks) said.push_back(folder.path(name));
+    EXPECT_THAT(losses.folders, IsEmpty());
     EXPECT_THAT(losses.networks, ::testing::UnorderedElementsAreArray(said));
   }
 }
