@@ -13,3 +13,9 @@ endforeach()
 
 # In the build tree the modules lie beside the library as well.
 set(VARNEL_MODULES_OUTPUT_FOLDER "${CMAKE_BINARY_DIR}/lib/${VARNEL_VERSIONED_NAME}")
+
+# What other builds find the libraries by: the CMake package, and the way from the files of pkg-config to
+# the prefix.
+set(VARNEL_PACKAGE_FOLDER "${CMAKE_INSTALL_LIBDIR}/cmake/Varnel")
+file(RELATIVE_PATH VARNEL_PREFIX_FROM_PKGCONFIG
+     "${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig" "${CMAKE_INSTALL_PREFIX}")
