@@ -61,7 +61,7 @@ std::string textOf(const CommandTable& table, Command::Group group) {
 
 std::string manualPage(const CommandTable& table) {
   std::string text =
-      std::string(".TH ORVANE 1 \"\" \"orvane ") + QNAppDisplayVersion() + "\"\n" +
+      std::string(".TH ORVANE 1 \"\" \"orvane ") + QNAppDisplayVersion() + "\"\n.nh\n" +
       section("NAME") + "orvane \\- finds duplicate files\n" + section("SYNOPSIS") +
       bold("orvane") + " COMMAND [OPTION...] [ARGUMENT...]\n" + section("DESCRIPTION") +
       "Standard output holds the result alone. The log goes to its file.\n"

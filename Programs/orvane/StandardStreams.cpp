@@ -22,6 +22,17 @@ std::error_code writeAll(std::FILE* stream, std::string_view text) {
   return {errno != 0 ? errno : EIO, std::generic_category()};
 }
 
+bool isTerminal(int stream) {
+  const char* const type = std::getenv("TERM");
+  return ::isatty(stream) == 1 && (type == nullptr || std::string_view(type) != "dumb");
+}
+
+std::size_t columnsOf(int stream) {
+  ::winsize size{};
+  const bool isTold = ::ioctl(stream, TIOCGWINSZ, &size) == 0 && size.ws_col > 0;
+  return isTold ? size.ws_col : 80;
+}
+
 }  // namespace
 
 void reserveStandardStreams() {
@@ -60,14 +71,24 @@ void writeStandardErrorInHandler(std::string_view text) {
 }
 
 bool isStandardErrorATerminal() {
-  const char* const type = std::getenv("TERM");
-  return ::isatty(STDERR_FILENO) == 1 && (type == nullptr || std::string_view(type) != "dumb");
+  return isTerminal(STDERR_FILENO);
+}
+
+bool isStandardOutputATerminal() {
+  return isTerminal(STDOUT_FILENO);
 }
 
 std::size_t standardErrorColumns() {
-  ::winsize size{};
-  const bool isTold = ::ioctl(STDERR_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0;
-  return isTold ? size.ws_col : 80;
+  return columnsOf(STDERR_FILENO);
+}
+
+std::size_t standardOutputColumns() {
+  return columnsOf(STDOUT_FILENO);
+}
+
+bool refusesColours() {
+  const char* const answer = std::getenv("NO_COLOR");
+  return answer != nullptr && *answer != '\0';
 }
 
 }  // namespace Orvane

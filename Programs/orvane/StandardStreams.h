@@ -29,9 +29,13 @@ void writeStandardError(std::string_view text);
 /// The same for signal handlers.
 void writeStandardErrorInHandler(std::string_view text);
 
-/// Whether lines on it can be written over.
+/// Whether it is a terminal on which lines can be written over.
 [[nodiscard]] bool isStandardErrorATerminal();
+[[nodiscard]] bool isStandardOutputATerminal();
 /// How wide that terminal is now; 80 where it does not tell.
 [[nodiscard]] std::size_t standardErrorColumns();
+[[nodiscard]] std::size_t standardOutputColumns();
+/// Whether the user wants no colours, nor other means of emphasis: NO_COLOR says so.
+[[nodiscard]] bool refusesColours();
 
 }  // namespace Orvane
