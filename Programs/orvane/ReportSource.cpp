@@ -17,6 +17,7 @@
 #include <orvane/Console.h>
 #include <orvane/ManagedDiskTurns.h>
 #include <orvane/ProgressLine.h>
+#include <orvane/ScanChoice.h>
 #include <orvane/ScanLog.h>
 #include <orvane/StandardStreams.h>
 
@@ -38,35 +39,28 @@ std::optional<Report> read(std::istream& text, const std::string& name, Console&
 
 std::optional<Report> scan(const std::vector<std::string>& folders, Console& console,
                            ScanControl& control) {
-  std::vector<std::string> paths;
-  for (const std::string& folder : folders) {
-    std::error_code error;
-    paths.push_back(fs::canonical(folder, error));
-    if (!error && !fs::is_directory(paths.back(), error) && !error)
-      error = std::make_error_code(std::errc::not_a_directory);
-    if (error) {
-      console.complain("cannot scan \"" + folder + "\": " + error.message());
-      return std::nullopt;
-    }
-  }
+  ScanChoice choice;
+  choice.folders = folders;
+  const auto request = choice.request(console);
+  if (!request) return std::nullopt;
   const unsigned maxReaders = std::max(2u, std::thread::hardware_concurrency() / 2);
   ManagedDiskTurns turns({.queue = Varnel::DiskReadingQueue::shared(),
                           .volumes = Varnel::Platform::processPorts().volumeCatalog},
                          Varnel::Platform::QualityOfService::utility, maxReaders);
-  ScanLog log;
+  ScanLog log(console);
   DuplicateFinder finder(
       {.fileSystem = systemFileSystem(CacheUse::traceless), .turns = turns, .observer = log});
   std::optional<ProgressLine> progress;
   if (isStandardErrorATerminal()) progress.emplace(console, control);
-  const ScanResult result = finder.find(paths, control);
+  const ScanResult result = finder.find(*request, control);
   progress.reset();
   if (control.isCancelled) return std::nullopt;
-  log.complain(console);
+  log.complain();
   for (const LostPath& lost : result.lostFolders)
-    console.complain("cannot scan \"" + lost.path + "\": " + reasonOf(lost.loss));
+    complainThatItCannotScan(lost.path, reasonOf(lost.loss), console);
   if (!result.lostFolders.empty()) return std::nullopt;
   Report report = reportOf(result, false);
-  report.roots = paths;
+  report.roots = request->folders;
   return report;
 }
 
