@@ -34,8 +34,8 @@ Outcome outcomeOf(TrashError::Reason reason) {
 // Numbers of devices and inodes do not last.
 bool isIn(const std::string& path, const Varnel::Platform::FileState& expected, Trash& trash) {
   const auto state = trash.state(path);
-  return state && state->size == expected.size &&
-         state->modified == expected.modified && state->nanoseconds == expected.nanoseconds;
+  return state && state->size == expected.size && state->modified == expected.modified &&
+         state->nanoseconds == expected.nanoseconds;
 }
 
 void putBack(RestorationStep& step, Trash& trash) {
