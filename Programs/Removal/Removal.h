@@ -5,7 +5,9 @@
 #include <cstddef>
 #include <cstdint>
 #include <optional>
+#include <set>
 #include <string>
+#include <string_view>
 #include <system_error>
 #include <vector>
 
@@ -16,6 +18,9 @@
 
 namespace Varnel {
 class DiskAccessManager;
+}
+namespace Varnel::Platform {
+class Clock;
 }
 
 namespace Orvane {
@@ -57,18 +62,19 @@ struct RemovalStep {
   std::size_t file = 0;    ///< In the group.
   std::size_t name = 0;    ///< 0 is its path; above, one of its further names.
   Outcome outcome = Outcome::planned;
-  std::error_code code{};  ///< What the system has said, if it did.
-  std::uint64_t freedBytes =
-      0;  ///< Once the trash is emptied; none while the file has other names.
-  std::uint64_t otherNames = 0;  ///< Hard links that stay.
+  std::error_code code{};        ///< What the system has said, if it did.
+  std::uint64_t otherNames = 0;  ///< Hard links that stay. While there are any, nothing is freed.
 };
 
 /// The figures of a removal.
 struct RemovalTotals {
-  std::uint64_t moved = 0;       ///< Names.
-  std::uint64_t notAllowed = 0;  ///< Names left alone for want of an allowance.
-  std::uint64_t notMoved = 0;    ///< Names left alone because of what was met.
-  std::uint64_t freedBytes = 0;  ///< Once the trash is emptied.
+  std::uint64_t planned = 0;  ///< Names, as all that follow.
+  std::uint64_t moved = 0;
+  std::uint64_t notAllowed = 0;  ///< Left alone for want of an allowance.
+  std::uint64_t notMoved = 0;    ///< Left alone because of what was met.
+  /// What is free once the trash is emptied, and what would be if all that is planned were moved.
+  std::uint64_t freedBytes = 0;
+  std::uint64_t plannedBytes = 0;
 };
 
 /// Moves the victims of a selection to the trash, one at a time. Each is compared byte for byte
@@ -79,6 +85,7 @@ struct RemovalTotals {
 ///     Removal removal(ports, report, selection, allowances, shouldStop);
 ///     if (const auto problem = removal.prepare()) return complain(*problem);
 ///     show(removal.steps());
+///     if (const auto problem = removal.begin()) return complain(*problem);
 ///     while (const RemovalStep* step = removal.next()) show(*step);
 ///     if (removal.totals().notMoved > 0) …
 ///
@@ -92,6 +99,7 @@ class Removal final {
     Varnel::Platform::Trash& trash;
     PackagedFiles& packagedFiles;
     RemovalJournal& journal;
+    const Varnel::Platform::Clock& clock;
   };
 
   /// What is in the way of the whole removal, before anything was touched.
@@ -122,10 +130,12 @@ class Removal final {
   /// In the order of the selection.
   [[nodiscard]] const std::vector<RemovalStep>& steps() const { return steps_; }
   [[nodiscard]] const std::string& pathOf(const RemovalStep& step) const;
+  [[nodiscard]] std::uint64_t sizeOf(const RemovalStep& step) const;
   /// The file that stays for it.
   [[nodiscard]] const std::string& keptFor(const RemovalStep& step) const;
 
-  /// Takes the lock and begins an entry of the journal. To be called once, before `next`.
+  /// Finds a trash for each file, takes the lock and begins an entry of the journal. To be called
+  /// once, before `next`.
   [[nodiscard]] std::optional<Problem> begin();
 
   /// Makes the next planned step and returns it; null when none is left.
@@ -136,6 +146,17 @@ class Removal final {
   [[nodiscard]] RemovalTotals totals() const;
 
  private:
+  using Names = std::set<std::string_view>;
+
+  [[nodiscard]] const ReportGroup& groupOf(const RemovalStep& step) const;
+  [[nodiscard]] const ReportFile& fileOf(const RemovalStep& step) const;
+  // From one step to another, of one group:
+  void lookAtGroup(std::size_t begin, std::size_t end, const Names& packaged);
+  void lookAt(RemovalStep& step, bool isOnFileSystemOfKept, const Names& packaged);
+  [[nodiscard]] std::optional<Problem> findTrashes();
+  void move(RemovalStep& step);
+  void end(std::size_t from, std::size_t to, RemovalStep::Outcome outcome);
+
   const Ports ports_;
   const Report& report_;
   const Selection& selection_;

@@ -4,6 +4,7 @@
 #include <cstdint>
 #include <istream>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include <Varnel/Platform/Values/Result.h>
@@ -41,6 +42,9 @@ struct Report {
 
   bool operator==(const Report&) const = default;
 };
+
+/// Whether the path lies in the folder, at any depth. Both are absolute.
+[[nodiscard]] bool isBelow(std::string_view path, std::string_view folder);
 
 /// Reads the JSON object of a scan, whoever has written it: numbers and paths may be anything.
 /// Fails, with a text for people, where it is no such object or too long to be one.

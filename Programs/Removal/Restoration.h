@@ -81,7 +81,7 @@ class Restoration final {
 
  private:
   const Ports ports_;
-  const std::optional<std::int64_t> number_;
+  const std::optional<std::int64_t> wanted_;
   RemovalRecord record_;
   RemovalJournal::Lock lock_;
   std::vector<RestorationStep> steps_;

@@ -12,11 +12,6 @@
 namespace Orvane {
 namespace {
 
-bool isBelow(std::string_view path, std::string_view folder) {
-  while (folder.ends_with('/')) folder.remove_suffix(1);
-  return path.starts_with(folder) && path.substr(folder.size()).starts_with('/');
-}
-
 // What a rule compares: the least one stays.
 using Rank = std::tuple<std::int64_t, std::int64_t>;
 
@@ -79,6 +74,11 @@ std::optional<Refusal::Reason> objectionTo(const ReportGroup& group, const Choic
 }
 
 }  // namespace
+
+bool isBelow(std::string_view path, std::string_view folder) {
+  while (folder.ends_with('/')) folder.remove_suffix(1);
+  return path.starts_with(folder) && path.substr(folder.size()).starts_with('/');
+}
 
 Selection select(const Report& report, KeepRule rule) {
   Selection selection;

@@ -33,6 +33,11 @@ struct FileStatus {
   std::int64_t modifiedAt = 0;  ///< Nanoseconds since 1970.
   std::uint64_t allocated = 0;  ///< Bytes that it takes up: none for its holes.
   std::uint32_t links = 1;      ///< Its names, wherever they are.
+
+  /// Whether both are the same state of one file's content.
+  [[nodiscard]] bool hasContentOf(const FileStatus& other) const {
+    return identity == other.identity && size == other.size && modifiedAt == other.modifiedAt;
+  }
 };
 
 /// What a file holds together with other files of its volume.

@@ -11,6 +11,8 @@ namespace Orvane {
 
 /// Those that find duplicates.
 [[nodiscard]] std::vector<Command> duplicateCommands();
+/// Those that remove them, and give them back.
+[[nodiscard]] std::vector<Command> removalCommands();
 /// Those that explain the program.
 [[nodiscard]] std::vector<Command> selfCommands();
 /// Those that show the framework's services.

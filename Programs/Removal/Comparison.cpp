@@ -1,0 +1,118 @@
+// SPDX-License-Identifier: MIT
+#include <Removal/Comparison.h>
+
+#include <algorithm>
+#include <memory>
+#include <vector>
+
+#include <Removal/DiskPlace.h>
+#include <Scan/Loss.h>
+
+namespace Orvane {
+namespace {
+
+using Verdict = Comparison::Verdict;
+
+constexpr std::size_t blockLength = 1024 * 1024;
+/// Then others come in, who read more urgently.
+constexpr std::uint64_t maxTurn = 16 * blockLength;
+
+Comparison because(std::error_code error) {
+  const Loss loss = Loss::because(error);
+  if (loss.kind != Loss::Kind::unreadable) return {.verdict = Verdict::changed, .code = error};
+  return {.verdict = Verdict::unreadable, .code = error};
+}
+
+/// A file that is read from its beginning to its end.
+class Reading final {
+ public:
+  explicit Reading(const ComparedFile& file) : file_(file), block_(blockLength) {}
+
+  [[nodiscard]] Comparison open(FileSystem& fileSystem) {
+    const std::size_t slash = file_.path.rfind('/');
+    if (slash == std::string::npos) return {.verdict = Verdict::changed};
+    auto folder =
+        fileSystem.openFolder(nullptr, file_.path.substr(0, std::max<std::size_t>(slash, 1)));
+    if (!folder) return because(folder.error());
+    auto opened = (*folder)->open(file_.path.c_str() + slash + 1, ReadingPlan::everything);
+    if (!opened) return because(opened.error());
+    open_ = std::move(*opened);
+    return checkState();
+  }
+
+  [[nodiscard]] Comparison checkState() {
+    const auto status = open_->status();
+    if (!status) return because(status.error());
+    return {.verdict = status->hasContentOf(file_.status) ? Verdict::equal : Verdict::changed};
+  }
+
+  /// The next bytes: as many as there are, up to a block.
+  [[nodiscard]] Comparison next() {
+    length_ = 0;
+    while (length_ < blockLength) {
+      const auto count = open_->read(offset_, std::span(block_).subspan(length_));
+      if (!count) return because(count.error());
+      if (*count == 0) break;
+      offset_ += *count;
+      length_ += *count;
+    }
+    return {};
+  }
+
+  [[nodiscard]] bool isAtEnd() const { return length_ < blockLength; }
+  [[nodiscard]] std::uint64_t offset() const { return offset_; }
+  [[nodiscard]] bool hasSameBlock(const Reading& other) const {
+    return length_ == other.length_ &&
+           std::equal(block_.begin(), block_.begin() + static_cast<std::ptrdiff_t>(length_),
+                      other.block_.begin());
+  }
+
+ private:
+  const ComparedFile& file_;
+  std::unique_ptr<OpenFile> open_;
+  std::vector<std::byte> block_;
+  std::size_t length_ = 0;  ///< Of what the block holds.
+  std::uint64_t offset_ = 0;
+};
+
+/// The first that is no equality.
+template <typename... Steps>
+Comparison firstOf(const Steps&... steps) {
+  Comparison comparison;
+  static_cast<void>(((comparison = steps(), comparison.verdict == Verdict::equal) && ...));
+  return comparison;
+}
+
+}  // namespace
+
+Comparison compare(const ComparedFile& one, const ComparedFile& other, FileSystem& fileSystem,
+                   Varnel::DiskAccessManager& disks, const std::atomic<bool>& shouldStop) {
+  Reading first(one), second(other);
+  for (bool isOpen = false; !isOpen || !first.isAtEnd();) {
+    const auto firstPlace = placeOnDiskOf(one.path, disks);
+    const auto secondPlace = placeOnDiskOf(other.path, disks);
+    if (!firstPlace || !secondPlace) return {.verdict = Verdict::noAccess};
+    if (!isOpen) {
+      const Comparison opening =
+          firstOf([&] { return first.open(fileSystem); }, [&] { return second.open(fileSystem); });
+      if (opening.verdict != Verdict::equal) return opening;
+      isOpen = true;
+    }
+    const std::uint64_t turnBegan = first.offset();
+    do {
+      if (shouldStop) return {.verdict = Verdict::stopped};
+      const Comparison reading =
+          firstOf([&] { return first.next(); }, [&] { return second.next(); });
+      if (reading.verdict != Verdict::equal) return reading;
+      // Whether a file that changes meanwhile still agrees is chance.
+      const Comparison states =
+          firstOf([&] { return first.checkState(); }, [&] { return second.checkState(); });
+      if (states.verdict != Verdict::equal) return states;
+      if (!first.hasSameBlock(second)) return {.verdict = Verdict::different};
+    } while (!first.isAtEnd() && first.offset() - turnBegan < maxTurn);
+  }
+  return {.verdict =
+              one.status.identity == other.status.identity ? Verdict::different : Verdict::equal};
+}
+
+}  // namespace Orvane

@@ -1,0 +1,235 @@
+// SPDX-License-Identifier: MIT
+#include <orvane/RemovalText.h>
+
+#include <algorithm>
+#include <map>
+#include <nlohmann/json.hpp>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+#include <Removal/Removal.h>
+#include <Varnel/Paths/QNURLResolver.h>
+#include <Varnel/Platform/Text/ByteCountFormatter.h>
+#include <Varnel/Platform/Text/VisibleText.h>
+#include <Varnel/Platform/Values/URL.h>
+#include <Varnel/Platform/Values/UTF8.h>
+#include <orvane/JSONLine.h>
+#include <orvane/ResultText.h>
+#include <orvane/TextColumns.h>
+
+namespace Orvane {
+namespace {
+
+using Outcome = RemovalStep::Outcome;
+using Varnel::Platform::ByteCountStyle;
+
+struct Wording {
+  const char* word;         ///< Behind a path, and in JSON.
+  const char* explanation;  ///< Behind a count of files.
+};
+
+Wording wordingOf(Outcome outcome) {
+  switch (outcome) {
+    case Outcome::planned:
+      return {"planned", ""};
+    case Outcome::moved:
+      return {"moved", ""};
+    case Outcome::inHiddenFolder:
+      return {"hidden folder", "in a hidden folder (--allow-hidden)"};
+    case Outcome::onOtherFileSystem:
+      return {"other volume", "on another volume than the file that stays (--allow-volumes)"};
+    case Outcome::packaged:
+      return {"packaged", "owned by the package system (--allow-packaged)"};
+    case Outcome::hardLinked:
+      return {"hard link", "with other hard links, so that nothing is freed (--allow-hard-links)"};
+    case Outcome::changed:
+      return {"changed", "of a group that has changed since the report"};
+    case Outcome::different:
+      return {"different", "whose content is not that of the file that stays"};
+    case Outcome::unreadable:
+      return {"unreadable", "that cannot be read, or whose group cannot"};
+    case Outcome::noAccess:
+      return {"no access", "on a disk that gives no access"};
+    case Outcome::noTrash:
+      return {"no trash", "on a file system without a trash"};
+    case Outcome::notJournalled:
+      return {"no journal", "that could not be noted in the journal"};
+    case Outcome::failed:
+      return {"failed", "that the system would not move"};
+    case Outcome::misplaced:
+      return {"misplaced", "in whose place something else went to the trash: restore it"};
+    case Outcome::stopped:
+      break;
+  }
+  return {"stopped", "that were not reached"};
+}
+
+bool goes(const RemovalStep& step) {
+  return step.outcome == Outcome::planned || step.outcome == Outcome::moved;
+}
+
+/// Lines in two columns of a terminal, or each path on a line of its own.
+class Lines final {
+ public:
+  explicit Lines(RemovalForm form) : form_(form) {
+    constexpr std::size_t minSideBySide = 60;
+    if (form.columns < minSideBySide) return;
+    left_ = (form.columns - gap_) / 2;
+    right_ = form.columns - gap_ - left_;
+  }
+
+  [[nodiscard]] std::string head() const {
+    return left_ > 0 ? row("Stays", form_.isMade ? "Moved to the trash" : "Goes to the trash") : "";
+  }
+
+  [[nodiscard]] std::string group(std::string kept, bool isTie,
+                                  const std::vector<std::pair<std::string, std::string>>& victims) {
+    const std::string mark = isTie ? " [tie]" : "";
+    std::string text;
+    if (left_ == 0) {
+      text = line("stays ", kept, mark);
+      for (const auto& [path, why] : victims)
+        text += line(!why.empty() ? "left  " : form_.isMade ? "moved " : "trash ", path, why);
+      return text + "\n";
+    }
+    for (bool isFirst = true; const auto& [path, why] : victims) {
+      text += row(isFirst ? cut(kept, mark, left_) : "", cut(path, why, right_));
+      isFirst = false;
+    }
+    return text;
+  }
+
+ private:
+  static constexpr std::size_t gap_ = 2;
+
+  [[nodiscard]] static std::string cut(const std::string& path, const std::string& mark,
+                                       std::size_t columns) {
+    return fitted(path, columns - std::min(columns, mark.size())) + mark;
+  }
+  [[nodiscard]] std::string row(const std::string& left, const std::string& right) const {
+    return padded(left, left_ + gap_) + right + "\n";
+  }
+  [[nodiscard]] std::string line(std::string_view word, const std::string& path,
+                                 const std::string& mark) const {
+    std::string text(word);
+    const bool isCut = form_.columns > text.size();
+    text += isCut ? cut(path, mark, form_.columns - text.size()) : path + mark;
+    return text + "\n";
+  }
+
+  const RemovalForm form_;
+  std::size_t left_ = 0;  ///< 0 where all is in one column.
+  std::size_t right_ = 0;
+};
+
+/// Calls `use(choice, begin, end)` with the steps of each group.
+template <typename Use>
+bool forEachGroup(const Removal& removal, Use use) {
+  const auto& steps = removal.steps();
+  for (auto begin = steps.begin(), end = begin; begin != steps.end(); begin = end) {
+    end = std::find_if(begin, steps.end(),
+                       [&](const RemovalStep& step) { return step.choice != begin->choice; });
+    if (!use(begin, end)) return false;
+  }
+  return true;
+}
+
+// JSON texts must be UTF-8, and paths need not be.
+void addPath(nlohmann::ordered_json& json, const char* key, const char* keyOfURL,
+             const std::string& path) {
+  json[key] = path;
+  if (!Varnel::Platform::isValidUTF8(path))
+    json[keyOfURL] = Varnel::Platform::URL::fileURLWithPath(path).absoluteString();
+}
+
+nlohmann::ordered_json jsonOf(const Removal& removal, const RemovalStep& step) {
+  nlohmann::ordered_json json;
+  addPath(json, "path", "url", removal.pathOf(step));
+  json["outcome"] = wordingOf(step.outcome).word;
+  if (step.code) json["reason"] = step.code.message();
+  if (step.otherNames > 0) json["otherNames"] = step.otherNames;
+  return json;
+}
+
+}  // namespace
+
+bool writeText(const Removal& removal, const Selection& selection, RemovalForm form,
+               const Varnel::QNURLResolver& paths, const TextWriter& write) {
+  const auto shown = [&](const std::string& path) {
+    return Varnel::Platform::visibleText(paths.abbreviatedPath(path));
+  };
+  Lines lines(form);
+  TextParts parts(write);
+  if (!removal.steps().empty() && !parts.add(lines.head())) return false;
+  return forEachGroup(
+             removal,
+             [&](auto begin, auto end) {
+               std::vector<std::pair<std::string, std::string>> victims;
+               for (auto step = begin; step != end; ++step)
+                 victims.emplace_back(
+                     shown(removal.pathOf(*step)),
+                     goes(*step) ? "" : std::string(" [") + wordingOf(step->outcome).word + "]");
+               return parts.add(lines.group(shown(removal.keptFor(*begin)),
+                                            selection[begin->choice].isTie, victims));
+             }) &&
+         parts.flush();
+}
+
+std::string summaryOf(const Removal& removal, RemovalForm form,
+                      const Varnel::Platform::ByteCountFormatter& byteCounts) {
+  std::map<Outcome, std::uint64_t> counts;
+  std::uint64_t linked = 0;
+  for (const RemovalStep& step : removal.steps()) {
+    ++counts[step.outcome];
+    if (goes(step) && step.otherNames > 0) ++linked;
+  }
+  const RemovalTotals totals = removal.totals();
+  const std::string size = byteCounts.string(
+      static_cast<std::int64_t>(form.isMade ? totals.freedBytes : totals.plannedBytes),
+      ByteCountStyle::file);
+  const std::uint64_t count = counts[form.isMade ? Outcome::moved : Outcome::planned];
+  std::string text;
+  if (form.isMade) {
+    text = counted(count, "file was", "files were") + " moved to the trash";
+    if (count > 0) text += ": " + size + " are free once it is emptied";
+  } else {
+    text = counted(count, "file", "files") + " would go to the trash";
+    if (count > 0) text += ": " + size + " would be free once it is emptied";
+  }
+  text += "\n";
+  if (linked > 0)
+    text += counted(linked, "of them frees", "of them free") +
+            " nothing, as other hard links of it stay\n";
+  for (const auto& [outcome, number] : counts)
+    if (const std::string_view why = wordingOf(outcome).explanation; !why.empty())
+      text += counted(number, "file stays", "files stay") + ": " + std::string(why) + "\n";
+  return text;
+}
+
+bool writeJSON(const Removal& removal, const Selection& selection, const TextWriter& write) {
+  const RemovalTotals totals = removal.totals();
+  using Json = nlohmann::ordered_json;
+  std::string head = jsonLine({{"schemaVersion", schemaVersion},
+                               {"removal", removal.number() > 0 ? Json(removal.number()) : Json()},
+                               {"moved", totals.moved},
+                               {"notAllowed", totals.notAllowed},
+                               {"notMoved", totals.notMoved},
+                               {"freedBytes", totals.freedBytes},
+                               {"groups", Json::array()}});
+  const std::string_view tail = "]}\n";
+  head.resize(head.size() - tail.size());
+  TextParts parts(write);
+  const auto add = [&, separator = ""](auto begin, auto end) mutable {
+    Json json = {{"size", removal.sizeOf(*begin)}};
+    addPath(json, "kept", "keptURL", removal.keptFor(*begin));
+    json["tie"] = selection[begin->choice].isTie;
+    for (auto step = begin; step != end; ++step) json["files"].push_back(jsonOf(removal, *step));
+    std::string text = jsonLine(json);
+    text.pop_back();  // The end of the line.
+    return parts.add(std::exchange(separator, ",") + text);
+  };
+  return parts.add(head) && forEachGroup(removal, add) && parts.add(tail) && parts.flush();
+}
+
+}  // namespace Orvane

@@ -1,0 +1,114 @@
+// SPDX-License-Identifier: MIT
+#include <orvane/TrashCommand.h>
+
+#include <chrono>
+#include <string>
+
+#include <Removal/DpkgFiles.h>
+#include <Removal/Removal.h>
+#include <Scan/FileSystem.h>
+#include <Scan/ScanObserver.h>
+#include <Varnel/DiskAccess/DiskAccessManager.h>
+#include <Varnel/Paths/QNURLResolver.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Text/ByteCountFormatter.h>
+#include <orvane/Console.h>
+#include <orvane/Interruption.h>
+#include <orvane/RemovalText.h>
+#include <orvane/ReportSource.h>
+#include <orvane/ResultText.h>
+#include <orvane/StandardStreams.h>
+
+namespace Orvane {
+namespace {
+
+std::string textOf(const Removal::Problem& problem) {
+  using enum Removal::Problem::Reason;
+  switch (problem.reason) {
+    case selection:
+      return "the report names a file twice in one group (" + problem.description + ")";
+    case noTrash:
+      return "there is no trash for \"" + problem.path + "\"";
+    case packages:
+      return "cannot tell what the package system owns: " + problem.description +
+             " (--allow-packaged)";
+    case journal:
+      return "cannot write the journal: " + problem.description;
+    case busy:
+      break;
+  }
+  return "another removal or restoration is at work";
+}
+
+int fail(const Removal::Problem& problem, Console& console) {
+  console.complain(textOf(problem) + "; nothing was moved");
+  return 1;
+}
+
+void move(Removal& removal, Console& console) {
+  using Clock = std::chrono::steady_clock;
+  constexpr std::chrono::milliseconds period(100);
+  const std::string of = " of " + counted(removal.steps().size(), "file", "files");
+  std::size_t done = 0;
+  Clock::time_point next = Clock::now() + period;
+  while (const RemovalStep* step = removal.next()) {
+    done = static_cast<std::size_t>(step - removal.steps().data()) + 1;
+    if (Clock::now() < next || !isStandardErrorATerminal()) continue;
+    console.showStatus("Moving to the trash: " + std::to_string(done) + of);
+    next = Clock::now() + period;
+  }
+  console.clearStatus();
+}
+
+}  // namespace
+
+int TrashCommand::run(Console& console) const {
+  ScanControl control;
+  const Interruption interruption(control.isCancelled);
+  const auto report = reportFrom(operands, console, control);
+  if (!report) return interruption.signal() != 0 ? 128 + interruption.signal() : 1;
+  const Selection selection = select(*report, keep);
+
+  const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
+  RemovalJournal journal({ports.privateFiles, ports.systemLog}, RemovalJournal::productPath());
+  DpkgFiles packagedFiles;
+  Removal removal({.fileSystem = systemFileSystem(CacheUse::traceless),
+                   .disks = Varnel::DiskAccessManager::shared(),
+                   .trash = ports.trash,
+                   .packagedFiles = packagedFiles,
+                   .journal = journal,
+                   .clock = ports.clock},
+                  *report, selection,
+                  {.hiddenFolders = allowsHiddenFolders,
+                   .otherFileSystems = allowsOtherFileSystems,
+                   .packagedFiles = allowsPackagedFiles,
+                   .hardLinks = allowsHardLinks},
+                  control.isCancelled);
+  if (const auto problem = removal.prepare()) return fail(*problem, console);
+  if (moves && !control.isCancelled && removal.totals().planned > 0) {
+    if (const auto problem = removal.begin()) return fail(*problem, console);
+    move(removal, console);
+  }
+
+  const RemovalForm form{.columns = isStandardOutputATerminal() ? standardOutputColumns() : 0,
+                         .isMade = moves};
+  const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.get().numberIdentifier());
+  const auto write = [&](std::string_view text) { return console.writeResult(text); };
+  bool isWritten =
+      isJSON ? writeJSON(removal, selection, write)
+             : writeText(removal, selection, form, Varnel::QNURLResolver::shared(), write);
+  const RemovalTotals totals = removal.totals();
+  if (isWritten && !isJSON) {
+    std::string summary = summaryOf(removal, form, byteCounts);
+    if (!moves && totals.planned > 0) summary += "nothing was moved yet: --yes does it\n";
+    if (totals.moved > 0)
+      summary += "\"orvane restore " + std::to_string(removal.number()) + "\" gives them back\n";
+    isWritten = console.writeResult(summary);
+  }
+  if (interruption.signal() != 0) return 128 + interruption.signal();
+  if (!isWritten) return 1;
+  return moves && totals.notMoved > 0 ? someNotMoved : 0;
+}
+
+}  // namespace Orvane

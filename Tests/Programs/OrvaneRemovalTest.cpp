@@ -1,0 +1,85 @@
+// SPDX-License-Identifier: MIT
+#include <gmock/gmock.h>
+
+#include <filesystem>
+
+#include <Tests/Programs/OrvaneFixture.h>
+#include <orvane/TextColumns.h>
+
+namespace Orvane::Testing {
+namespace {
+
+namespace fs = std::filesystem;
+using ::testing::AllOf;
+using ::testing::HasSubstr;
+
+TEST_F(Orvane, MovesDuplicatesToTheTrashAndRestoresThem) {
+  const std::string kept = folder.write("a", "same");
+  const std::string odd = folder.write("b\xff/line\nbreak", "same");
+  const std::string copy = folder.write("b/copy", "same");
+  const std::vector<std::string> trash = {"trash", "-k", "shortest", folder.path()};
+  const Outcome shown = run(trash);
+  EXPECT_EQ(shown.status, 0);
+  EXPECT_THAT(shown.output, AllOf(HasSubstr("stays " + kept), HasSubstr("b\\xFF/line\\nbreak\n"),
+                                  HasSubstr("2 files would go to the trash: 8 bytes")));
+  EXPECT_TRUE(fs::exists(odd) && fs::exists(copy));
+
+  std::vector<std::string> yes = trash;
+  yes.push_back("--yes");
+  const Outcome moved = run(yes);
+  EXPECT_EQ(moved.status, 0) << moved.errors;
+  EXPECT_THAT(moved.output, HasSubstr("2 files were moved to the trash: 8 bytes"));
+  EXPECT_FALSE(fs::exists(odd) || fs::exists(copy));
+  EXPECT_THAT(run({"restore", "--list"}).output,
+              AllOf(::testing::StartsWith("1  "), HasSubstr("  2 files, 8 bytes\n")));
+
+  folder.write("b/copy", "new");
+  const Outcome half = run({"restore"});
+  EXPECT_EQ(half.status, 3);
+  EXPECT_THAT(half.output, AllOf(HasSubstr("something else has its place"), HasSubstr("1 not\n")));
+  EXPECT_EQ(read(odd) + read(copy), "samenew");
+  fs::remove(copy);
+  EXPECT_EQ(run({"restore", "1"}).status, 0);
+  EXPECT_EQ(read(copy), "same");
+  expectFailure({"restore"}, "something to give back");
+  expectFailure({"restore", "7"}, "no removal 7");
+  expectFailure({"trash", "-k", "oldest", copy}, "no report of a scan");
+}
+
+// A report whose files are no longer those that it names.
+TEST_F(Orvane, TellsThatFilesWereNotMoved) {
+  const std::string report = folder.write("report.json", R"({"schemaVersion": 1, "groups": [
+      {"size": 4, "files": [{"path": ")" + folder.write("a", "same") +
+                                                             R"(", "inode": 1,
+                             "modified": "1.000000000"},
+                            {"path": ")" + folder.write("b", "same") +
+                                                             R"(", "inode": 2,
+                             "modified": "1.000000000"}]}]})");
+  const Outcome outcome = run({"trash", "--keep=oldest", "--yes", report});
+  EXPECT_EQ(outcome.status, 3);
+  EXPECT_THAT(outcome.output, AllOf(HasSubstr("[changed]"), HasSubstr("0 files were moved")));
+}
+
+TEST(TextColumns, CutTextsInTheirMiddle) {
+  const struct {
+    const char* text;
+    std::size_t columns;
+    const char* fitted;
+  } rows[] = {
+      {"/home/ann/a.jpg", 15, "/home/ann/a.jpg"},
+      {"/home/ann/a.jpg", 14, "/ho...nn/a.jpg"},
+      {"/home", 3, "..."},
+      {"/home", 0, ""},
+      {"日本語日本語", 12, "日本語日本語"},
+      {"日本語日本語", 11, "日...本語"},
+      {"e\u0301e\u0301e\u0301e\u0301", 4, "e\u0301e\u0301e\u0301e\u0301"},
+  };
+  for (const auto& row : rows) {
+    EXPECT_EQ(fitted(row.text, row.columns), row.fitted) << row.text;
+    EXPECT_LE(columnsOf(fitted(row.text, row.columns)), row.columns);
+    EXPECT_EQ(columnsOf(padded(row.fitted, row.columns)), row.columns);
+  }
+}
+
+}  // namespace
+}  // namespace Orvane::Testing
