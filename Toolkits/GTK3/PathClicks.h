@@ -37,7 +37,11 @@ class PathClicks : public CommonPathControl::View {
   bool showMenu(const GdkEventButton* event, const CommonPathControl::MouseEvent& click) {
     const auto menu = std::dynamic_pointer_cast<ShownMenu>(control_.menu(click));
     if (!menu) return false;
-    gtk_menu_popup_at_pointer(menu->menu.gobj(), reinterpret_cast<const GdkEvent*>(event));
+    if (event)
+      gtk_menu_popup_at_pointer(menu->menu.gobj(), reinterpret_cast<const GdkEvent*>(event));
+    else
+      gtk_menu_popup_at_widget(menu->menu.gobj(), widget_.gobj(), GDK_GRAVITY_CENTER,
+                               GDK_GRAVITY_NORTH_WEST, nullptr);
     return true;
   }
 
