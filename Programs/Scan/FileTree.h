@@ -82,7 +82,6 @@ class FileTree final {
   [[nodiscard]] const char* nameOf(FileNumber number) const;
   [[nodiscard]] std::string pathOf(FileNumber number) const;
   [[nodiscard]] FileIdentity identityOf(FileNumber number) const;
-  /// Whether the file lies below a given folder of that kind.
 
   [[nodiscard]] const ScanDisk& diskOf(FileNumber number) const {
     return *devices_[file(number).device].disk;

@@ -45,11 +45,9 @@ std::span<const FileLink> ScanResult::linksOf(FileNumber file) const {
   return {begin, end};
 }
 
+// A name in a reference folder goes before the others, and is the one that the file is known by.
 bool ScanResult::isReference(FileNumber file) const {
-  const auto names = linksOf(file);
-  return tree->folderOf(file).isReference ||
-         std::any_of(names.begin(), names.end(),
-                     [&](const FileLink& link) { return tree->folderOf(link.name).isReference; });
+  return tree->folderOf(file).isReference;
 }
 
 bool ScanResult::isImplied(const DuplicateGroup& group) const {
