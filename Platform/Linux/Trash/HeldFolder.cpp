@@ -23,8 +23,9 @@ constexpr int look = O_PATH | O_DIRECTORY | O_NOFOLLOW | O_CLOEXEC;
 
 // Whatever mask of modes the host has: its user could not enter the folder.
 void make(int parent, const std::string& name) {
-  if (::mkdirat(parent, name.c_str(), S_IRWXU) == 0)
-    static_cast<void>(::fchmodat(parent, name.c_str(), S_IRWXU, AT_SYMLINK_NOFOLLOW));
+  if (::mkdirat(parent, name.c_str(), S_IRWXU) != 0) return;
+  [[maybe_unused]] const int failed =
+      ::fchmodat(parent, name.c_str(), S_IRWXU, AT_SYMLINK_NOFOLLOW);
 }
 
 FileDescriptor step(int parent, const std::string& name, Missing missing) {
