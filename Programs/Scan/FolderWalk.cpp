@@ -236,7 +236,10 @@ class Walk::Task final : public TaskGroup::Task {
 
   void refuse() override {
     const Loss loss{Loss::Kind::unreadable, std::make_error_code(std::errc::no_such_device)};
-    if (folder_) walk_.lose(*folder_, loss);
+    if (folder_) {
+      folder_->isWhole = false;
+      walk_.lose(*folder_, loss);
+    }
     while (const Folder* folder = work_.take()) walk_.lose(*folder, loss);
   }
 

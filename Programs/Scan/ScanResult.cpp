@@ -26,6 +26,8 @@ DuplicateFile ScanResult::fileAt(std::uint32_t index) const {
                      .modifiedAt = modifiedAt[index],
                      .isReference = isReference(number)};
   for (const FileLink& link : linksOf(number)) file.names.push_back(tree->pathOf(link.name));
+  // Those that are to stay come first among the links.
+  std::sort(file.names.begin(), file.names.end());
   return file;
 }
 

@@ -23,11 +23,12 @@ struct DuplicateGroup {
 
 /// A file of a group.
 struct DuplicateFile {
-  std::string path;                  ///< The first of its paths, in the order of their bytes.
-  FileIdentity identity;             ///< With the next, the state in which it was compared.
-  std::int64_t modifiedAt;           ///< Nanoseconds since 1970.
-  std::vector<std::string> names{};  ///< Its further paths: hard links that the scan has found.
-  bool isReference = false;          ///< As `ScanResult::isReference`.
+  std::string path;         ///< The first in the order of their bytes; of those to stay, if one is.
+  FileIdentity identity;    ///< With the next, the state in which it was compared.
+  std::int64_t modifiedAt;  ///< Nanoseconds since 1970.
+  std::vector<std::string>
+      names{};               ///< Its further paths, in order: hard links that the scan found.
+  bool isReference = false;  ///< As `ScanResult::isReference`.
 };
 
 /// Folders that hold the same at every depth: files of the same names and contents, and folders of
@@ -79,7 +80,7 @@ struct ScanResult {
   ScanTotals totals{};
   std::vector<FileNumber> files{};         ///< Of all groups.
   std::vector<std::int64_t> modifiedAt{};  ///< Of those files.
-  std::vector<FileLink> links{};           ///< Of those files; sorted by file, and then by path.
+  std::vector<FileLink> links{};           ///< Of those files; sorted by file.
   std::vector<std::uint32_t> folders{};    ///< Of all groups of folders: numbers in the tree.
   /// For each folder of the tree the number of those that hold the same, 0 when it is alone.
   std::vector<std::uint32_t> folderClasses{};

@@ -38,7 +38,7 @@ struct TextForm {
 
 /// The result for people: each group's paths, one a line, abbreviated and as `visibleText` shows
 /// them, and a summary. Folders that hold the same stand for their files. Below a file's path stand
-/// its further names, and a star marks one that is there to be compared with.
+/// its further names, and a star marks one that is to stay.
 ///
 /// Returns whether all could be written, and ends at the first part that could not.
 [[nodiscard]] bool writeText(const ScanResult& result, const TextForm& form,

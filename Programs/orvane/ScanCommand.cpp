@@ -86,7 +86,8 @@ int ScanCommand::run(Console& console) const {
       qos == QoS::background || qos == QoS::utility ? CacheUse::traceless : CacheUse::normal;
   DuplicateFinder finder(
       {.fileSystem = systemFileSystem(cacheUse), .turns = turns, .observer = log});
-  const ScanFacts facts{.startedAt = startOfScan(ports.clock), .folders = asked->folders};
+  ScanFacts facts{.startedAt = startOfScan(ports.clock), .folders = asked->folders};
+  facts.folders.insert(facts.folders.end(), asked->references.begin(), asked->references.end());
   ScanControl control;
   const Interruption interruption(control.isCancelled);
   std::optional<ProgressLine> progress;

@@ -160,7 +160,8 @@ std::vector<JSONField> scanReportFields() {
       {"changedFiles", "files that changed meanwhile"},
       {"unreadableFolders", "folders that could not be read, or only in part"},
       {"duplicateGroups", "groups of files, also those that are not listed"},
-      {"duplicateFiles", "files that could go: all but one of each group"},
+      {"duplicateFiles",
+       "files that could go: of each group all that need not stay, or all but one"},
       {"wastedBytes", "what is free once they have gone"},
       {"folderGroups[].paths", "of folders that hold the same, at every depth"},
       {"folderGroups[].urls", "exact file URLs of them, only where a path is not UTF-8"},
@@ -179,7 +180,7 @@ std::vector<JSONField> scanReportFields() {
        "nanoseconds"},
       {"groups[].files[].names", "only where it has hard links: their paths"},
       {"groups[].files[].nameURLs", "their exact file URLs, only where one is not UTF-8"},
-      {"groups[].files[].reference", "true, only where the file is there to be compared with"},
+      {"groups[].files[].reference", "true, only where the file is to stay"},
   };
 }
 

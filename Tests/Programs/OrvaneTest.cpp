@@ -40,6 +40,11 @@ TEST_F(Orvane, PrintsTheResultAloneAndLogsTheRun) {
   EXPECT_EQ(result["groups"][0]["files"][1]["path"], folder.path("b"));
   EXPECT_EQ(result["wastedBytes"], 12);
   EXPECT_FALSE(result["partial"]);
+  folder.write("kept/a", "same content");
+  const Outcome kept = run({"scan", "-j", "--keep-in", folder.path("kept"), folder.path()});
+  EXPECT_EQ(nlohmann::json::parse(kept.output)["roots"],
+            nlohmann::json({folder.path(), folder.path("kept")}));
+  std::filesystem::remove_all(folder.path("kept"));
   const Outcome list = run({"scan", "-0", folder.path()});
   EXPECT_EQ(list.output,
             folder.path("a") + std::string(1, '\0') + folder.path("b") + std::string(2, '\0'));
