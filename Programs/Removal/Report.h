@@ -36,8 +36,10 @@ struct ReportGroup {
 
 /// What a scan has found, as its JSON object tells it. A plain value.
 struct Report {
-  bool isPartial = false;            ///< The scan was interrupted.
-  std::vector<std::string> roots{};  ///< What was scanned, in the order in which it was named.
+  bool isPartial = false;  ///< The scan was interrupted.
+  /// The folders that were scanned, in the order in which they were named. Those that are not
+  /// absolute tell nothing.
+  std::vector<std::string> roots{};
   std::vector<ReportGroup> groups{};
 
   bool operator==(const Report&) const = default;
@@ -50,8 +52,7 @@ struct Report {
 /// Fails, with a text for people, where it is no such object or too long to be one.
 [[nodiscard]] Varnel::Platform::Result<Report, std::string> readReport(std::istream& text);
 
-/// The same straight from a scan. Files that are no longer as the scan saw them are left out, and
-/// so are groups of which one file remains. Looks at every file.
-[[nodiscard]] Report reportOf(const ScanResult& result, bool isPartial);
+/// The same straight from a scan, but for the roots, which the result does not know.
+[[nodiscard]] Report reportOf(const ScanResult& result);
 
 }  // namespace Orvane

@@ -1,47 +1,33 @@
 // SPDX-License-Identifier: MIT
-#include <memory>
 #include <utility>
 
 #include <Removal/Report.h>
-#include <Scan/OpenFolders.h>
 #include <Scan/ScanResult.h>
 
 namespace Orvane {
 namespace {
 
-constexpr std::int64_t nanosecondsPerSecond = 1'000'000'000;
-
-std::optional<FileStatus> statusOf(FileNumber number, const FileTree& tree, OpenFolders& folders) {
-  const auto folder = folders.open(tree.folderOf(number));
-  if (!folder) return std::nullopt;
-  const auto file = (*folder)->open(tree.nameOf(number), ReadingPlan::parts);
-  if (!file) return std::nullopt;
-  const auto status = (*file)->status();
-  if (!status || !tree.isUnchanged(number, *status)) return std::nullopt;
-  return *status;
+ReportFile reportOf(DuplicateFile found) {
+  constexpr std::int64_t perSecond = 1'000'000'000;
+  // Rounded down, so that nanoseconds are never below 0.
+  const std::int64_t nanoseconds = (found.modifiedAt % perSecond + perSecond) % perSecond;
+  return {.path = std::move(found.path),
+          .inode = found.identity.inode,
+          .modified = (found.modifiedAt - nanoseconds) / perSecond,
+          .nanoseconds = static_cast<std::int32_t>(nanoseconds),
+          .names = std::move(found.names),
+          .isReference = found.isReference};
 }
 
 }  // namespace
 
-Report reportOf(const ScanResult& result, bool isPartial) {
-  Report report{.isPartial = isPartial};
-  OpenFolders folders(systemFileSystem());
+Report reportOf(const ScanResult& result) {
+  Report report{.isPartial = result.isPartial};
   for (const DuplicateGroup& found : result.groups) {
     ReportGroup group{.size = found.size};
-    for (std::uint32_t i = 0; i < found.count; ++i) {
-      const FileNumber number = result.files[found.begin + i];
-      const auto status = statusOf(number, *result.tree, folders);
-      if (!status) continue;
-      // Rounded down, so that nanoseconds are never below 0.
-      const std::int64_t nanoseconds =
-          ((status->modifiedAt % nanosecondsPerSecond) + nanosecondsPerSecond) %
-          nanosecondsPerSecond;
-      group.files.push_back({.path = result.tree->pathOf(number),
-                             .inode = status->identity.inode,
-                             .modified = (status->modifiedAt - nanoseconds) / nanosecondsPerSecond,
-                             .nanoseconds = static_cast<std::int32_t>(nanoseconds)});
-    }
-    if (group.files.size() > 1) report.groups.push_back(std::move(group));
+    for (DuplicateFile& file : result.filesOf(found))
+      group.files.push_back(reportOf(std::move(file)));
+    report.groups.push_back(std::move(group));
   }
   return report;
 }

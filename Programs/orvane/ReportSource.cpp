@@ -59,7 +59,7 @@ std::optional<Report> scan(const std::vector<std::string>& folders, Console& con
   for (const LostPath& lost : result.lostFolders)
     complainThatItCannotScan(lost.path, reasonOf(lost.loss), console);
   if (!result.lostFolders.empty()) return std::nullopt;
-  Report report = reportOf(result, false);
+  Report report = reportOf(result);
   report.roots = request->folders;
   return report;
 }

@@ -71,7 +71,7 @@ TEST(TextColumns, CutTextsInTheirMiddle) {
       {"/home", 3, "..."},
       {"/home", 0, ""},
       {"日本語日本語", 12, "日本語日本語"},
-      {"日本語日本語", 11, "日...本語"},
+      {"日本語日本語", 11, "日...日本語"},
       {"e\u0301e\u0301e\u0301e\u0301", 4, "e\u0301e\u0301e\u0301e\u0301"},
   };
   for (const auto& row : rows) {
