@@ -75,6 +75,8 @@ void FoldersPage::addRow(const std::string& folder) {
   remove->set_tooltip_text(localized("Folders_Remove"));
   remove->get_accessible()->set_name(localized("Folders_Remove"));
   remove->signal_clicked().connect([this, folder] { removed(std::string(folder)); });
+  const std::string number = std::to_string(list_.get_children().size() + 1);
+  identify(*remove, Varnel::AccessibleAction("remove-folder." + number).buttonIdentifier());
   row->set_border_width(6);
   row->pack_start(*icon, Gtk::PACK_SHRINK);
   row->pack_start(*label);
