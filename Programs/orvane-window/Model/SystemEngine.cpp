@@ -10,6 +10,7 @@
 #include <Removal/RemovalJournal.h>
 #include <Scan/DuplicateFinder.h>
 #include <Scan/FileSystem.h>
+#include <Scan/ScanRequest.h>
 #include <Varnel/Context/Globals.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
 #include <Varnel/DiskAccess/DiskReadingQueue.h>
@@ -142,13 +143,13 @@ ScanOutcome SystemEngine::scan(const std::vector<std::string>& folders, ScanCont
 
   analytics_ = std::make_unique<ScanAnalytics>(analyticsEndpoint_, false, console_);
   analytics_->scanStarted(paths.size());
-  ScanLog log;
+  ScanLog log(console_);
   ManagedDiskTurns turns(
       {.queue = Varnel::DiskReadingQueue::shared(), .volumes = processPorts().volumeCatalog},
       Varnel::Platform::QualityOfService::userInitiated, maxReaders());
   DuplicateFinder finder(
       {.fileSystem = systemFileSystem(CacheUse::traceless), .turns = turns, .observer = log});
-  const ScanResult result = finder.find(paths, control);
+  const ScanResult result = finder.find({.folders = paths}, control);
   outcome.lostFolders = result.lostFolders;
   outcome.totals = result.totals;
   if (control.isCancelled) {
