@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <utility>
 
 namespace Orvane {
 namespace {
@@ -12,26 +13,29 @@ constexpr int stamp = 1;
 
 }  // namespace
 
-Glib::RefPtr<DuplicateRows> DuplicateRows::create(const DuplicateList& list) {
-  return Glib::RefPtr<DuplicateRows>(new DuplicateRows(list));
+Glib::RefPtr<DuplicateRows> DuplicateRows::create(std::shared_ptr<const DuplicateList> list) {
+  return Glib::RefPtr<DuplicateRows>(new DuplicateRows(std::move(list)));
 }
 
-DuplicateRows::DuplicateRows(const DuplicateList& list)
-    : Glib::ObjectBase(typeid(DuplicateRows)), list_(list) {}
+DuplicateRows::DuplicateRows(std::shared_ptr<const DuplicateList> list)
+    : Glib::ObjectBase(typeid(DuplicateRows)), list_(std::move(list)) {}
 
 bool DuplicateRows::grow(std::size_t groups) {
-  const std::size_t end = std::min(shown_ + groups, list_.report()->groups.size());
+  const std::size_t end = std::min(shown_ + groups, list_->report()->groups.size());
   while (shown_ < end) {
     iterator position;
     const std::size_t number = shown_++;
     point(position, {number, std::nullopt});
-    const Path path = pathOf({number, 0});
-    Path group;
-    group.push_back(path[0]);
-    row_inserted(group, position);
-    row_has_child_toggled(group, position);
+    const Path path = pathOf(number);
+    row_inserted(path, position);
+    row_has_child_toggled(path, position);
   }
-  return shown_ < list_.report()->groups.size();
+  return shown_ < list_->report()->groups.size();
+}
+
+bool DuplicateRows::shrink(std::size_t groups) {
+  for (; groups > 0 && shown_ > 0; --groups) row_deleted(pathOf(--shown_));
+  return shown_ > 0;
 }
 
 // A position is two numbers, the second one of which is a file's, from 1 on, or 0.
@@ -52,9 +56,14 @@ DuplicateRows::Row DuplicateRows::rowAt(const const_iterator& position) {
 }
 
 DuplicateRows::Path DuplicateRows::pathOf(DuplicateList::Place place) {
-  Path path;
-  path.push_back(static_cast<int>(place.group));
+  Path path = pathOf(place.group);
   path.push_back(static_cast<int>(place.file));
+  return path;
+}
+
+DuplicateRows::Path DuplicateRows::pathOf(std::size_t group) {
+  Path path;
+  path.push_back(static_cast<int>(group));
   return path;
 }
 
@@ -69,7 +78,7 @@ void DuplicateRows::get_value_vfunc(const const_iterator&, int, Glib::ValueBase&
 bool DuplicateRows::iter_next_vfunc(const const_iterator& position, iterator& next) const {
   Row row = rowAt(position);
   if (row.file) {
-    if (++*row.file >= list_.group(row.group).files.size()) return false;
+    if (++*row.file >= list_->group(row.group).files.size()) return false;
   } else if (++row.group >= shown_) {
     return false;
   }
@@ -83,7 +92,7 @@ bool DuplicateRows::get_iter_vfunc(const Path& path, iterator& position) const {
   if (path.size() == 2) {
     if (path[1] < 0) return false;
     row.file = static_cast<std::size_t>(path[1]);
-    if (*row.file >= list_.group(row.group).files.size()) return false;
+    if (*row.file >= list_->group(row.group).files.size()) return false;
   }
   return point(position, row);
 }
@@ -101,7 +110,7 @@ bool DuplicateRows::iter_nth_child_vfunc(const const_iterator& parent, int n,
                                          iterator& child) const {
   const Row row = rowAt(parent);
   const auto file = static_cast<std::size_t>(n);
-  if (row.file || n < 0 || file >= list_.group(row.group).files.size()) return false;
+  if (row.file || n < 0 || file >= list_->group(row.group).files.size()) return false;
   return point(child, {row.group, file});
 }
 
@@ -116,13 +125,12 @@ bool DuplicateRows::iter_has_child_vfunc(const const_iterator& position) const {
 
 int DuplicateRows::iter_n_children_vfunc(const const_iterator& position) const {
   const Row row = rowAt(position);
-  return row.file ? 0 : static_cast<int>(list_.group(row.group).files.size());
+  return row.file ? 0 : static_cast<int>(list_->group(row.group).files.size());
 }
 
 DuplicateRows::Path DuplicateRows::get_path_vfunc(const const_iterator& position) const {
   const Row row = rowAt(position);
-  Path path;
-  path.push_back(static_cast<int>(row.group));
+  Path path = pathOf(row.group);
   if (row.file) path.push_back(static_cast<int>(*row.file));
   return path;
 }

@@ -5,6 +5,7 @@
 #include <gtkmm/treepath.h>
 
 #include <cstddef>
+#include <memory>
 #include <optional>
 
 #include <orvane-window/Model/DuplicateList.h>
@@ -19,13 +20,16 @@ namespace Orvane {
 /// thread.
 class DuplicateRows final : public Gtk::TreeModel, public Glib::Object {
  public:
-  /// The list outlives the model, and stays as it is but for what is chosen.
-  [[nodiscard]] static Glib::RefPtr<DuplicateRows> create(const DuplicateList& list);
+  /// The list stays as it is but for what is chosen.
+  [[nodiscard]] static Glib::RefPtr<DuplicateRows> create(
+      std::shared_ptr<const DuplicateList> list);
 
-  [[nodiscard]] const DuplicateList& list() const { return list_; }
+  [[nodiscard]] const std::shared_ptr<const DuplicateList>& list() const { return list_; }
 
   /// Shows some groups more; false when all are there.
   bool grow(std::size_t groups);
+  /// Takes the last groups away; false when none is left. A view takes time for that too.
+  bool shrink(std::size_t groups);
 
   /// Which group a row belongs to, and which of its files it shows, if it shows one.
   struct Row {
@@ -33,6 +37,7 @@ class DuplicateRows final : public Gtk::TreeModel, public Glib::Object {
     std::optional<std::size_t> file{};
   };
   [[nodiscard]] static Row rowAt(const const_iterator& position);
+  [[nodiscard]] static Path pathOf(std::size_t group);
   [[nodiscard]] static Path pathOf(DuplicateList::Place place);
 
  protected:
@@ -52,10 +57,10 @@ class DuplicateRows final : public Gtk::TreeModel, public Glib::Object {
   Path get_path_vfunc(const const_iterator& position) const override;
 
  private:
-  explicit DuplicateRows(const DuplicateList& list);
+  explicit DuplicateRows(std::shared_ptr<const DuplicateList> list);
   bool point(iterator& position, const Row& row) const;
 
-  const DuplicateList& list_;
+  const std::shared_ptr<const DuplicateList> list_;
   std::size_t shown_ = 0;  ///< Groups.
 };
 

@@ -9,8 +9,10 @@
 #include <gtkmm/cellrenderertext.h>
 #include <gtkmm/cellrenderertoggle.h>
 
+#include <algorithm>
 #include <chrono>
 #include <string>
+#include <utility>
 
 #include <orvane-window/Model/Texts.h>
 
@@ -54,7 +56,8 @@ void pack(Gtk::TreeViewColumn& column, Renderer& renderer, bool isWide, Fill fil
   column.pack_start(renderer, isWide);
   column.set_cell_data_func(
       renderer, [fill, &rows](Gtk::CellRenderer* cell, const Gtk::TreeModel::iterator& position) {
-        if (rows) fill(static_cast<Renderer&>(*cell), rows->list(), DuplicateRows::rowAt(position));
+        if (rows)
+          fill(static_cast<Renderer&>(*cell), *rows->list(), DuplicateRows::rowAt(position));
       });
 }
 
@@ -70,7 +73,7 @@ DuplicateView::DuplicateView() {
     if (path.size() == 1)
       row_expanded(path) ? static_cast<void>(collapse_row(path))
                          : static_cast<void>(expand_row(path, false));
-    else
+    else if (!isLeaving_)
       opened({static_cast<std::size_t>(path[0]), static_cast<std::size_t>(path[1])});
   });
   signal_popup_menu().connect([this] {
@@ -98,11 +101,8 @@ void DuplicateView::addColumns() {
         cell.property_sensitive() = !list.file({row.group, *row.file}).isReference;
       },
       rows_);
-  toggle->signal_toggled().connect([this](const Glib::ustring& text) {
-    const Gtk::TreeModel::Path path(text);
-    if (path.size() == 2)
-      toggled({static_cast<std::size_t>(path[0]), static_cast<std::size_t>(path[1])});
-  });
+  toggle->signal_toggled().connect(
+      [this](const Glib::ustring& path) { this->toggle(Gtk::TreeModel::Path(path)); });
 
   auto& name = added(*this, "Column_Name", 300);
   auto* icon = Gtk::manage(new Gtk::CellRendererPixbuf);
@@ -164,55 +164,54 @@ void DuplicateView::addColumns() {
       rows_);
 }
 
-void DuplicateView::showList(const DuplicateList& list) {
-  clear();
-  rows_ = DuplicateRows::create(list);
-  set_model(rows_);
-  isGrowing_ = rows_->grow(unfoldedAtFirst);
-  for (int i = 0; i < static_cast<int>(rows_->children().size()); ++i)
-    expand_row(Gtk::TreeModel::Path(std::to_string(i)), false);
-  keepGoing();
+void DuplicateView::showList(std::shared_ptr<const DuplicateList> list) {
+  replace(std::move(list), unfoldedAtFirst);
 }
 
-void DuplicateView::clear() {
-  work_.disconnect();
+// All rows go and come again: in a long list that is hardly slower than folding each.
+void DuplicateView::collapseAll() {
+  if (rows_ && !isLeaving_) replace(rows_->list(), 0);
+}
+
+void DuplicateView::expandAll() {
+  if (!rows_ || isLeaving_ || rows_->list()->report()->groups.empty()) return;
+  nextUnfolded_ = 0;
+  if (!work_.connected()) work_ = Glib::signal_idle().connect([this] { return goOn(); });
+}
+
+void DuplicateView::replace(std::shared_ptr<const DuplicateList> list, std::size_t unfolded) {
+  next_ = std::move(list);
+  unfoldedNext_ = unfolded;
+  isLeaving_ = true;
   isGrowing_ = false;
-  nextExpanded_.reset();
+  nextUnfolded_.reset();
+  work_.disconnect();
+  if (goOn()) work_ = Glib::signal_idle().connect([this] { return goOn(); });
+}
+
+void DuplicateView::begin() {
+  isLeaving_ = false;
   unset_model();
   rows_.reset();
-}
-
-void DuplicateView::keepGoing() {
-  if (!work_.connected()) work_ = Glib::signal_idle().connect([this] { return goOn(); });
+  if (!next_) return;
+  rows_ = DuplicateRows::create(std::exchange(next_, nullptr));
+  set_model(rows_);
+  isGrowing_ = rows_->grow(unfoldedAtFirst);
+  for (std::size_t i = 0; i < std::min<std::size_t>(unfoldedNext_, rows_->children().size()); ++i)
+    expand_row(DuplicateRows::pathOf(i), false);
 }
 
 bool DuplicateView::goOn() {
   const auto end = Clock::now() + maxTurn;
+  bool isShrinking = isLeaving_ && rows_;
+  while (isShrinking && Clock::now() < end) isShrinking = rows_->shrink(groupsAtOnce);
+  if (isLeaving_ && !isShrinking) begin();
   while (isGrowing_ && Clock::now() < end) isGrowing_ = rows_->grow(groupsAtOnce);
-  while (!isGrowing_ && nextExpanded_ && Clock::now() < end) {
-    Gtk::TreeModel::Path path;
-    path.push_back(static_cast<int>(*nextExpanded_));
-    expand_row(path, false);
-    if (++*nextExpanded_ >= rows_->list().report()->groups.size()) nextExpanded_.reset();
+  while (!isGrowing_ && nextUnfolded_ && Clock::now() < end) {
+    expand_row(DuplicateRows::pathOf(*nextUnfolded_), false);
+    if (++*nextUnfolded_ >= rows_->list()->report()->groups.size()) nextUnfolded_.reset();
   }
-  return isGrowing_ || nextExpanded_;
-}
-
-void DuplicateView::expandAll() {
-  if (!rows_ || rows_->list().report()->groups.empty()) return;
-  nextExpanded_ = 0;
-  keepGoing();
-}
-
-// A new model has nothing unfolded, which is quicker than folding row by row.
-void DuplicateView::collapseAll() {
-  if (!rows_) return;
-  const DuplicateList& list = rows_->list();
-  clear();
-  rows_ = DuplicateRows::create(list);
-  set_model(rows_);
-  isGrowing_ = rows_->grow(unfoldedAtFirst);
-  keepGoing();
+  return isLeaving_ || isGrowing_ || nextUnfolded_;
 }
 
 void DuplicateView::goTo(Place place) {
@@ -226,16 +225,13 @@ std::optional<DuplicateView::Place> DuplicateView::current() const {
   Gtk::TreeModel::Path path;
   Gtk::TreeViewColumn* column = nullptr;
   const_cast<DuplicateView*>(this)->get_cursor(path, column);
-  if (!rows_ || path.empty()) return std::nullopt;
+  if (!rows_ || isLeaving_ || path.empty()) return std::nullopt;
   return Place{static_cast<std::size_t>(path[0]),
                path.size() > 1 ? static_cast<std::size_t>(path[1]) : 0};
 }
 
-void DuplicateView::toggleCurrent() {
-  Gtk::TreeModel::Path path;
-  Gtk::TreeViewColumn* column = nullptr;
-  get_cursor(path, column);
-  if (path.size() == 2)
+void DuplicateView::toggle(const Gtk::TreeModel::Path& path) {
+  if (path.size() == 2 && !isLeaving_)
     toggled({static_cast<std::size_t>(path[0]), static_cast<std::size_t>(path[1])});
 }
 
@@ -245,11 +241,10 @@ bool DuplicateView::on_key_press_event(GdkEventKey* event) {
   get_cursor(path, column);
   const bool isPlain = (event->state & (GDK_CONTROL_MASK | GDK_MOD1_MASK | GDK_SHIFT_MASK)) == 0;
   if (isPlain && !path.empty()) {
-    Gtk::TreeModel::Path group;
-    group.push_back(path[0]);
+    const auto group = DuplicateRows::pathOf(static_cast<std::size_t>(path[0]));
     switch (event->keyval) {
       case GDK_KEY_space:
-        toggleCurrent();
+        toggle(path);
         return true;
       case GDK_KEY_Right:
         expand_row(group, false);

@@ -6,6 +6,7 @@
 
 #include <cstddef>
 #include <functional>
+#include <memory>
 #include <optional>
 
 #include <orvane-window/Interface/DuplicateRows.h>
@@ -22,9 +23,9 @@ class DuplicateView final : public Gtk::TreeView {
   DuplicateView();
   ~DuplicateView() override;
 
-  /// The list outlives the view, or its next list.
-  void showList(const DuplicateList& list);
-  void clear();
+  /// In place of the one before. The first groups are unfolded.
+  void showList(std::shared_ptr<const DuplicateList> list);
+  void clear() { showList(nullptr); }
   /// Shows anew what is chosen.
   void refresh() { queue_draw(); }
 
@@ -47,13 +48,17 @@ class DuplicateView final : public Gtk::TreeView {
 
  private:
   void addColumns();
-  void toggleCurrent();
+  void toggle(const Gtk::TreeModel::Path& path);
+  void replace(std::shared_ptr<const DuplicateList> list, std::size_t unfolded);
+  void begin();
   bool goOn();
-  void keepGoing();
 
   Glib::RefPtr<DuplicateRows> rows_;
+  bool isLeaving_ = false;  ///< The rows are being taken away, for those of the next list.
   bool isGrowing_ = false;
-  std::optional<std::size_t> nextExpanded_;  ///< While all groups are being unfolded.
+  std::optional<std::size_t> nextUnfolded_;  ///< While all groups are being unfolded.
+  std::shared_ptr<const DuplicateList> next_;
+  std::size_t unfoldedNext_ = 0;  ///< How many of its groups.
   sigc::connection work_;
 };
 

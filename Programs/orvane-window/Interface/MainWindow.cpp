@@ -124,8 +124,7 @@ void MainWindow::follow(Session::Event event) {
       break;
     case Event::started:
       results_.outcome().withdraw();
-      // What is shown of a list must not outlive it.
-      if (session_.stage() != Session::Stage::planning) results_.clear();
+      if (session_.stage() == Session::Stage::scanning) results_.clear();
       break;
     case Event::scanned:
       showScanned();

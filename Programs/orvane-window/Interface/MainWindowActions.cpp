@@ -109,7 +109,7 @@ void MainWindow::select(const std::string& rule) {
 void MainWindow::openCurrent() {
   const auto place = results_.view().current();
   if (!place) return;
-  const std::string& path = session_.list()->file(*place).path;
+  const std::string path = session_.list()->file(*place).path;
   GError* error = nullptr;
   const auto url = Varnel::Platform::URL::fileURLWithPath(path).absoluteString();
   if (gtk_show_uri_on_window(GTK_WINDOW(gobj()), url.c_str(), GDK_CURRENT_TIME, &error)) return;

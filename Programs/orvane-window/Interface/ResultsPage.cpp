@@ -117,14 +117,15 @@ void ResultsPage::addFoot() {
 }
 
 void ResultsPage::showList(const Session& session) {
-  const DuplicateList& list = *session.list();
+  const auto shown = session.list();
+  const DuplicateList& list = *shown;
   const bool isEmpty = list.report()->groups.empty();
   const std::string files = countText(session.outcome().totals.files);
   title_.set_text(localized("Results_Title", {sizeText(list.duplicates().bytes)}));
   detail_.set_text(localized("Results_Detail", {countText(list.report()->groups.size()),
                                                 countText(list.duplicates().files), files}));
   noneDetail_.set_text(localized("Results_NoneDetail", {files}));
-  view_.showList(list);
+  view_.showList(shown);
   head_.set_visible(!isEmpty);
   foot_.set_visible(!isEmpty);
   body_.set_visible_child(isEmpty ? "none" : "list");
@@ -132,7 +133,7 @@ void ResultsPage::showList(const Session& session) {
 }
 
 void ResultsPage::showChosen(const Session& session) {
-  const auto& chosen = session.list()->chosen();
+  const auto chosen = session.list()->chosen();
   chosen_.set_text(chosen.files == 0
                        ? localized("SelectedNone")
                        : localized("Selected", {countText(chosen.files), sizeText(chosen.bytes)}));

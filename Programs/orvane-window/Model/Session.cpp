@@ -60,7 +60,7 @@ void Session::scan() {
       if (control->isCancelled) return end(Stage::choosing, Event::scanStopped);
       outcome_ = std::move(*outcome);
       if (!list) return end(Stage::choosing, Event::scanFailed);
-      list_ = std::move(*list);
+      list_ = list;
       end(Stage::results, Event::scanned);
     };
   });
@@ -99,7 +99,7 @@ void Session::choose(KeepRule rule) {
         list->choose(select(*report, rule));
         return [this, list, lifetime] {
           if (lifetime.expired()) return;
-          list_ = std::move(*list);
+          *list_ = std::move(*list);  // Who shows it keeps it.
           end(Stage::results, Event::chosen);
         };
       });
@@ -142,7 +142,7 @@ void Session::remove() {
       moved_ = std::move(*outcome);
       gone_.insert(moved_.paths.begin(), moved_.paths.end());
       // What is chosen stays so where nothing has come of it.
-      if (!moved_.paths.empty()) list_.emplace(rest);
+      if (!moved_.paths.empty()) list_ = std::make_shared<DuplicateList>(rest);
       end(Stage::results, Event::removed);
     };
   });
@@ -162,7 +162,7 @@ void Session::restore() {
       if (lifetime.expired()) return;
       moved_ = std::move(*outcome);
       gone_ = std::move(*left);
-      if (rest && !moved_.paths.empty()) list_.emplace(rest);
+      if (rest && !moved_.paths.empty()) list_ = std::make_shared<DuplicateList>(rest);
       end(rest ? Stage::results : Stage::choosing, Event::restored);
     };
   });

@@ -3,7 +3,6 @@
 
 #include <functional>
 #include <memory>
-#include <optional>
 #include <set>
 #include <string>
 #include <vector>
@@ -77,7 +76,8 @@ class Session final {
   [[nodiscard]] const MoveProgress& moveProgress() const { return *moveProgress_; }
 
   /// There is a list in all stages but `choosing` and `scanning`.
-  [[nodiscard]] const std::optional<DuplicateList>& list() const { return list_; }
+  /// A new one has another address; who shows it may keep the one before for a while.
+  [[nodiscard]] std::shared_ptr<const DuplicateList> list() const { return list_; }
   [[nodiscard]] const ScanOutcome& outcome() const { return outcome_; }
 
   DuplicateList::Answer choose(DuplicateList::Place place, bool isChosen);
@@ -105,8 +105,8 @@ class Session final {
   std::shared_ptr<ScanControl> scanControl_ = std::make_shared<ScanControl>();
   std::shared_ptr<MoveProgress> moveProgress_ = std::make_shared<MoveProgress>();
   ScanOutcome outcome_;
-  std::optional<DuplicateList> list_;  ///< Of what is left of the outcome.
-  std::set<std::string> gone_;         ///< What was removed of it and not put back.
+  std::shared_ptr<DuplicateList> list_;  ///< Of what is left of the outcome.
+  std::set<std::string> gone_;           ///< What was removed of it and not put back.
   std::shared_ptr<PlannedRemoval> plan_;
   MoveOutcome moved_;
   const std::shared_ptr<bool> lifetime_ = std::make_shared<bool>();
