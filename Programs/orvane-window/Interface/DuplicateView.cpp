@@ -190,9 +190,9 @@ void DuplicateView::replace(std::shared_ptr<const DuplicateList> list, std::size
 }
 
 void DuplicateView::begin() {
-  isLeaving_ = false;
   unset_model();
   rows_.reset();
+  isLeaving_ = false;
   if (!next_) return;
   rows_ = DuplicateRows::create(std::exchange(next_, nullptr));
   set_model(rows_);

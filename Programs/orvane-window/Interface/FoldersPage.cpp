@@ -1,11 +1,14 @@
 // SPDX-License-Identifier: MIT
 #include <orvane-window/Interface/FoldersPage.h>
 
+#include <Varnel/GTK3/Identifiers.h>
 #include <Varnel/Interface/AccessibleAction.h>
-#include <orvane-window/Interface/Identify.h>
+#include <orvane-window/Interface/SetAction.h>
 #include <orvane-window/Model/Texts.h>
 
 namespace Orvane {
+
+using Varnel::GTK3::identify;
 namespace {
 
 constexpr int width = 520;

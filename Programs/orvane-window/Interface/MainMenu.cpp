@@ -7,10 +7,13 @@
 #include <gtkmm/separatormenuitem.h>
 
 #include <Varnel/Context/Globals.h>
-#include <orvane-window/Interface/Identify.h>
+#include <Varnel/GTK3/Identifiers.h>
+#include <orvane-window/Interface/SetAction.h>
 #include <orvane-window/Model/Texts.h>
 
 namespace Orvane {
+
+using Varnel::GTK3::identify;
 namespace {
 
 void showAccelerator(Gtk::MenuItem& item, const std::string& accelerator) {

@@ -7,15 +7,19 @@
 
 #include <Varnel/Context/Globals.h>
 #include <Varnel/Context/TargetKind.h>
+#include <Varnel/GTK3/BringToFront.h>
+#include <Varnel/GTK3/Identifiers.h>
 #include <Varnel/Interface/AccessibleAction.h>
-#include <orvane-window/Interface/Identify.h>
 #include <orvane-window/Interface/MainMenu.h>
 #include <orvane-window/Interface/Questions.h>
+#include <orvane-window/Interface/SetAction.h>
 #include <orvane-window/Interface/TurnTimes.h>
 #include <orvane-window/Model/Preferences.h>
 #include <orvane-window/Model/Texts.h>
 
 namespace Orvane {
+
+using Varnel::GTK3::identify;
 namespace {
 
 // Figures that change more often cannot be read.
@@ -56,7 +60,10 @@ MainWindow::MainWindow(Session::Ports ports, Application application)
     tellRefusal(session_.choose(place, !session_.list()->isChosen(place)));
   };
   view.opened = [this](DuplicateList::Place) { openCurrent(); };
-  view.moved = [this] { updateActions(); };
+  view.moved = [this] {
+    results_.showCurrent(session_);
+    updateActions();
+  };
   view.menu = [this]() -> Gtk::Menu& { return contextMenu_; };
   contextMenu_.attach_to_widget(view);
   takeDrops();
@@ -107,12 +114,10 @@ void MainWindow::addFolders(const std::vector<std::string>& folders) {
     if (Glib::file_test(folder, Glib::FILE_TEST_IS_DIR)) session_.addFolder(folder);
 }
 
-void MainWindow::comeForward(const std::string& activationToken) {
+void MainWindow::comeForward(const std::optional<std::string>& activationToken) {
   // Choices that somebody has made stay.
   if (session_.list() && session_.list()->chosen().files == 0) session_.startOver();
-  if (!activationToken.empty())
-    gtk_window_set_startup_id(GTK_WINDOW(gobj()), activationToken.c_str());
-  present();
+  Varnel::GTK3::bringToFront(*this, activationToken);
   if (session_.stage() == Session::Stage::choosing) folders_.focus();
 }
 

@@ -12,6 +12,7 @@
 
 #include <functional>
 #include <map>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -41,7 +42,7 @@ class MainWindow final : public Gtk::ApplicationWindow {
   /// Takes up folders, from the command line or from another program.
   void addFolders(const std::vector<std::string>& folders);
   /// Comes to the front, ready for a scan of the last folders.
-  void comeForward(const std::string& activationToken);
+  void comeForward(const std::optional<std::string>& activationToken = std::nullopt);
 
  private:
   using Actions = std::map<std::string, Glib::RefPtr<Gio::SimpleAction>>;

@@ -5,6 +5,7 @@
 #include <string_view>
 #include <utility>
 
+#include <Varnel/GTK3/OpenURL.h>
 #include <Varnel/Interface/MainMenuAccessibility.h>
 #include <Varnel/Platform/Values/URL.h>
 #include <orvane-window/Interface/MainMenu.h>
@@ -109,12 +110,8 @@ void MainWindow::select(const std::string& rule) {
 void MainWindow::openCurrent() {
   const auto place = results_.view().current();
   if (!place) return;
-  const std::string path = session_.list()->file(*place).path;
-  GError* error = nullptr;
-  const auto url = Varnel::Platform::URL::fileURLWithPath(path).absoluteString();
-  if (gtk_show_uri_on_window(GTK_WINDOW(gobj()), url.c_str(), GDK_CURRENT_TIME, &error)) return;
-  showProblem(*this, localized("Error_Open"), pathText(path) + ": " + error->message);
-  g_error_free(error);
+  Varnel::GTK3::openURL(*this,
+                        Varnel::Platform::URL::fileURLWithPath(session_.list()->file(*place).path));
 }
 
 void MainWindow::copyPath() {

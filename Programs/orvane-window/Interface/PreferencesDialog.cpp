@@ -6,10 +6,12 @@
 #include <string>
 #include <utility>
 
-#include <orvane-window/Interface/Identify.h>
+#include <Varnel/GTK3/Identifiers.h>
 #include <orvane-window/Model/Texts.h>
 
 namespace Orvane {
+
+using Varnel::GTK3::identify;
 
 using Varnel::SchedulePeriodOption;
 

@@ -3,12 +3,15 @@
 
 #include <algorithm>
 
+#include <Varnel/GTK3/Identifiers.h>
 #include <Varnel/Interface/AccessibleAction.h>
-#include <orvane-window/Interface/Identify.h>
+#include <orvane-window/Interface/SetAction.h>
 #include <orvane-window/Model/Session.h>
 #include <orvane-window/Model/Texts.h>
 
 namespace Orvane {
+
+using Varnel::GTK3::identify;
 namespace {
 
 struct Lines {

@@ -15,10 +15,14 @@
 
 #include <Varnel/Context/Globals.h>
 #include <Varnel/Context/TargetKind.h>
-#include <orvane-window/Interface/Identify.h>
+#include <Varnel/GTK3/ErrorDialog.h>
+#include <Varnel/GTK3/Identifiers.h>
+#include <Varnel/Logging/UserErrorInfo.h>
 #include <orvane-window/Model/Texts.h>
 
 namespace Orvane {
+
+using Varnel::GTK3::identify;
 namespace {
 
 constexpr std::size_t maxLines = 1000;
@@ -69,12 +73,7 @@ void askBeforeRemoval(Gtk::Window& parent, const PlannedRemoval& plan,
 }
 
 void showProblem(Gtk::Window& parent, const std::string& title, const std::string& text) {
-  const auto dialog = std::make_shared<Gtk::MessageDialog>(parent, title, false, Gtk::MESSAGE_ERROR,
-                                                           Gtk::BUTTONS_NONE, true);
-  dialog->set_secondary_text(text);
-  identify(*dialog, "problem");
-  addButton(*dialog, "Close", Gtk::RESPONSE_CLOSE, "problem.close");
-  await(dialog);
+  Varnel::GTK3::presentError(parent, {title, text, {localized("Close")}});
 }
 
 void showText(Gtk::Window& parent, const std::string& title, const std::string& text) {

@@ -4,12 +4,15 @@
 #include <giomm/menu.h>
 #include <gtkmm/image.h>
 
+#include <Varnel/GTK3/Identifiers.h>
 #include <Varnel/Interface/AccessibleAction.h>
-#include <orvane-window/Interface/Identify.h>
+#include <orvane-window/Interface/SetAction.h>
 #include <orvane-window/Model/Session.h>
 #include <orvane-window/Model/Texts.h>
 
 namespace Orvane {
+
+using Varnel::GTK3::identify;
 namespace {
 
 Glib::RefPtr<Gio::Menu> ruleMenu() {
@@ -105,6 +108,12 @@ void ResultsPage::addHead() {
 }
 
 void ResultsPage::addFoot() {
+  path_.set_margin_start(12);
+  path_.set_margin_end(12);
+  path_.set_margin_top(6);
+  path_.set_margin_bottom(6);
+  identify(path_, "results.path");
+  pack_start(path_, Gtk::PACK_SHRINK);
   identify(chosen_, "results.chosen");
   remove_.set_label(localized("Remove"));
   setAction(remove_, "win.remove");
@@ -130,6 +139,14 @@ void ResultsPage::showList(const Session& session) {
   foot_.set_visible(!isEmpty);
   body_.set_visible_child(isEmpty ? "none" : "list");
   showChosen(session);
+  showCurrent(session);
+}
+
+void ResultsPage::showCurrent(const Session& session) {
+  const auto current = view_.current();
+  path_.set_visible(current.has_value());
+  if (current)
+    path_.setURL(Varnel::Platform::URL::fileURLWithPath(session.list()->file(*current).path));
 }
 
 void ResultsPage::showChosen(const Session& session) {

@@ -13,6 +13,7 @@
 #include <functional>
 #include <string>
 
+#include <Varnel/GTK3/PathControl.h>
 #include <orvane-window/Interface/DuplicateView.h>
 
 namespace Orvane {
@@ -45,6 +46,8 @@ class ResultsPage final : public Gtk::Box {
 
   /// The session's list is a new one.
   void showList(const Session& session);
+  /// Another row is the current one.
+  void showCurrent(const Session& session);
   /// Other files are chosen.
   void showChosen(const Session& session);
   void clear() { view_.clear(); }
@@ -70,6 +73,7 @@ class ResultsPage final : public Gtk::Box {
   DuplicateView view_;
   Gtk::Box none_{Gtk::ORIENTATION_VERTICAL, 12};
   Gtk::Label noneDetail_;
+  Varnel::GTK3::PathControl path_;
   Gtk::ActionBar foot_;
   Gtk::Label chosen_;
   Gtk::Button remove_;

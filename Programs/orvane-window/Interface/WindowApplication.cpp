@@ -13,10 +13,10 @@
 #include <Varnel/Context/Bundle.h>
 #include <Varnel/Context/Globals.h>
 #include <Varnel/Context/TargetKind.h>
+#include <Varnel/GTK3/OpenURL.h>
 #include <Varnel/Identification/Links/TDSService.h>
 #include <Varnel/Identification/User/UserIdentificationInfo.h>
 #include <Varnel/Identification/User/UserIdentificator.h>
-#include <Varnel/Platform/Ports/Application.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <orvane-window/Interface/PreferencesDialog.h>
 #include <orvane-window/Interface/Questions.h>
@@ -64,6 +64,10 @@ WindowApplication::WindowApplication(Console& console)
                         "Measure the turns of the main loop and print them at the end");
   add_main_option_entry(OPTION_TYPE_STRING, "analytics", '\0',
                         "Where events go, if the user has agreed", "URL");
+  routing_.emplace(*this, [this](Varnel::UserNotificationRouter& router) {
+    reminding_ = std::make_unique<Reminding>(
+        router, console_, [this](const auto& token) { window().comeForward(token); });
+  });
   signal_handle_local_options().connect(sigc::mem_fun(*this, &WindowApplication::takeOptions),
                                         false);
   signal_shutdown().connect(sigc::mem_fun(*this, &WindowApplication::shutDown), false);
@@ -99,8 +103,6 @@ void WindowApplication::on_startup() {
   links_ = std::make_unique<ThreadBackground>(mainQueue);
   sounds_ = std::make_unique<Varnel::SoundEngine>();
   sounds_->setSoundsEnabled(Preferences::playsSounds());
-  reminding_ = std::make_unique<Reminding>(
-      console_, [this](const std::string& token) { window().comeForward(token); });
   addActions();
   addAccelerators();
 }
@@ -126,22 +128,19 @@ MainWindow& WindowApplication::window() {
                                     static_cast<void>(storeConsent(
                                         isGranted ? Consent::granted : Consent::refused, console_));
                                   }});
-  window_->property_is_active().signal_changed().connect([this] {
-    Varnel::Platform::processPorts().application.get().setActive(window_->is_active());
-  });
   add_window(*window_);
   return *window_;
 }
 
 void WindowApplication::on_activate() {
-  window().comeForward("");
+  window().comeForward();
 }
 
 void WindowApplication::on_open(const type_vec_files& files, const Glib::ustring&) {
   std::vector<std::string> folders;
   for (const auto& file : files) folders.push_back(file->get_path());
   window().addFolders(folders);
-  window().comeForward("");
+  window().comeForward();
 }
 
 // What is being moved comes to its end first: the window's session asks for that.
@@ -229,13 +228,9 @@ void WindowApplication::openLink(const std::string& name) {
         std::make_shared<Varnel::UserIdentificationInfo>(
             std::make_shared<Varnel::UserIdentificator>()));
     const auto link = service.buildURL(name, {});
-    return [this, link] {
-      GError* error = nullptr;
-      if (link && gtk_show_uri_on_window(GTK_WINDOW(window().gobj()),
-                                         link->absoluteString().c_str(), GDK_CURRENT_TIME, &error))
-        return;
-      showProblem(window(), localized("Error_Open"), error ? error->message : "");
-      g_clear_error(&error);
+    return [this, name, link] {
+      if (link) return Varnel::GTK3::openURL(window(), *link);
+      showProblem(window(), localized("Error_Open"), name);
     };
   });
 }

@@ -7,6 +7,8 @@
 #include <optional>
 #include <string>
 
+#include <Varnel/GTK3/ApplicationActivity.h>
+#include <Varnel/GTK3/RouterAtStartup.h>
 #include <Varnel/Interface/SoundEngine.h>
 #include <orvane-window/Interface/MainWindow.h>
 #include <orvane-window/Interface/TurnTimes.h>
@@ -47,12 +49,14 @@ class WindowApplication final : public Gtk::Application {
   Console& console_;
   std::optional<std::string> analyticsEndpoint_;
   std::optional<TurnTimes> turnTimes_;
+  Varnel::GTK3::ApplicationActivity activity_;
   std::unique_ptr<SystemEngine> engine_;
   std::unique_ptr<Reminding> reminding_;  ///< Of the first instance alone.
   std::unique_ptr<Varnel::SoundEngine> sounds_;
   std::unique_ptr<ThreadBackground> work_;
   std::unique_ptr<ThreadBackground> links_;
   std::unique_ptr<MainWindow> window_;
+  std::optional<Varnel::GTK3::RouterAtStartup> routing_;
 };
 
 }  // namespace Orvane

@@ -18,26 +18,23 @@ using Varnel::SchedulePeriodOption;
 using Varnel::SchedulerService;
 using Router = Varnel::UserNotificationRouter;
 
-Reminding::Reminding(Console& console, Clicked clicked)
+Reminding::Reminding(Router& router, Console& console, Clicked clicked)
     : console_(console),
-      router_(std::make_unique<Router>()),
       service_(std::make_unique<SchedulerService>(std::make_shared<Tallyhouse::AnalyticsTracker>(),
-                                                  *router_)) {
-  auto& center = router_->userNotificationCenter();
+                                                  router)) {
+  auto& center = router.userNotificationCenter();
   const auto show = [&center, clicked = std::move(clicked)](
                         const Varnel::Platform::UserNotification& notification,
                         Router::EventKind kind) {
     if (kind == Router::EventKind::didDeliver) return;
     // The service does so for its own; once gone it is none to be removed.
     static_cast<void>(center.removeDeliveredNotification(notification));
-    clicked(notification.activationToken.value_or(""));
+    clicked(notification.activationToken);
   };
-  router_->register_("SchedulerNotification", show);
-  router_->register_(Varnel::NextDayCleanupReminderInfo::userNotificationIdentifier(), show);
+  router.register_("SchedulerNotification", show);
+  router.register_(Varnel::NextDayCleanupReminderInfo::userNotificationIdentifier(), show);
   // Who has chosen nothing keeps what is planned.
   if (const auto period = storedPeriod()) service_->setSchedulePeriod(*period);
-  if (const auto launch = center.takeLaunchNotification(); launch && *launch)
-    router_->handleLaunch(**launch);
 }
 
 Reminding::~Reminding() = default;

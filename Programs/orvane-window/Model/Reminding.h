@@ -22,11 +22,11 @@ class Console;
 /// asks for. To be made at the application's start-up, in the one process that stays. Main thread.
 class Reminding final {
  public:
-  /// The click's token brings a window to the front; empty where the desktop gave none.
-  using Clicked = std::function<void(const std::string& activationToken)>;
+  /// The click's token brings a window to the front; none where the desktop gave none.
+  using Clicked = std::function<void(const std::optional<std::string>& activationToken)>;
 
-  /// The console outlives this.
-  Reminding(Console& console, Clicked clicked);
+  /// The router and the console outlive this.
+  Reminding(Varnel::UserNotificationRouter& router, Console& console, Clicked clicked);
   ~Reminding();
   Reminding(const Reminding&) = delete;
   Reminding& operator=(const Reminding&) = delete;
@@ -41,7 +41,6 @@ class Reminding final {
 
  private:
   Console& console_;
-  const std::unique_ptr<Varnel::UserNotificationRouter> router_;
   const std::unique_ptr<Varnel::SchedulerService> service_;
 };
 
