@@ -1,0 +1,258 @@
+// SPDX-License-Identifier: MIT
+#include <orvane-window/Interface/MainWindow.h>
+
+#include <glibmm/convert.h>
+#include <glibmm/fileutils.h>
+#include <glibmm/main.h>
+
+#include <Varnel/Context/Globals.h>
+#include <Varnel/Context/TargetKind.h>
+#include <Varnel/GTK3/BringToFront.h>
+#include <Varnel/GTK3/Identifiers.h>
+#include <Varnel/Interface/AccessibleAction.h>
+#include <orvane-window/Interface/MainMenu.h>
+#include <orvane-window/Interface/Questions.h>
+#include <orvane-window/Interface/SetAction.h>
+#include <orvane-window/Interface/TurnTimes.h>
+#include <orvane-window/Model/Preferences.h>
+#include <orvane-window/Model/Texts.h>
+
+namespace Orvane {
+
+using Varnel::GTK3::identify;
+namespace {
+
+// Figures that change more often cannot be read.
+constexpr unsigned refreshInterval = 100;  // Milliseconds.
+
+const char* nameOf(Session::Stage stage) {
+  constexpr const char* names[] = {"folders", "scan", "results", "plan", "removal", "restoration"};
+  return names[static_cast<std::size_t>(stage)];
+}
+
+std::string reasonOf(const Loss& loss) {
+  return loss.error ? loss.error.message() : localized("Reason_Changed");
+}
+
+}  // namespace
+
+MainWindow::MainWindow(Session::Ports ports, Application application)
+    : application_(std::move(application)),
+      session_(ports, [this](Session::Event event) { follow(event); }) {
+  set_default_size(980, 640);
+  set_title(Varnel::Globals::applicationName());
+  identify(*this, "main-window");
+  addHeader();
+  addActions();
+  const auto menus = mainMenu({.features = Varnel::TargetKind::current().userFeatures(std::nullopt),
+                               .isDebugMode = Varnel::Globals::isDebugMode()});
+  fillMenuBar(menuBar_, menus);
+  box_.pack_start(menuBar_, Gtk::PACK_SHRINK);
+  pages_.set_transition_type(Gtk::STACK_TRANSITION_TYPE_CROSSFADE);
+  pages_.add(folders_, "folders");
+  pages_.add(progress_, "progress");
+  pages_.add(results_, "results");
+  box_.pack_start(pages_);
+  add(box_);
+  folders_.removed = [this](const std::string& path) { session_.removeFolder(path); };
+  DuplicateView& view = results_.view();
+  view.toggled = [this](DuplicateList::Place place) {
+    tellRefusal(session_.choose(place, !session_.list()->isChosen(place)));
+  };
+  view.opened = [this](DuplicateList::Place) { openCurrent(); };
+  view.moved = [this] {
+    results_.showCurrent(session_);
+    updateActions();
+  };
+  view.menu = [this]() -> Gtk::Menu& { return contextMenu_; };
+  contextMenu_.attach_to_widget(view);
+  takeDrops();
+  box_.show_all();
+  for (const std::string& folder : Preferences::lastFolders()) session_.addFolder(folder);
+  follow(Session::Event::startedOver);
+}
+
+MainWindow::~MainWindow() {
+  clock_.disconnect();
+}
+
+void MainWindow::addHeader() {
+  header_.set_show_close_button(true);
+  const auto add = [](Gtk::Button& button, const char* icon, const char* textKey,
+                      const char* action) {
+    button.set_image_from_icon_name(icon, Gtk::ICON_SIZE_BUTTON);
+    button.set_tooltip_text(localized(textKey));
+    button.get_accessible()->set_name(localized(textKey));
+    setAction(button, std::string("win.") + action);
+    identify(button, Varnel::AccessibleAction(action).buttonIdentifier());
+  };
+  add(startOver_, "go-previous-symbolic", "StartOver", "start-over");
+  add(rescan_, "view-refresh-symbolic", "Rescan", "rescan");
+  header_.pack_start(startOver_);
+  header_.pack_start(rescan_);
+  header_.show_all();
+  set_titlebar(header_);
+}
+
+void MainWindow::takeDrops() {
+  drag_dest_set({Gtk::TargetEntry("text/uri-list")}, Gtk::DEST_DEFAULT_ALL, Gdk::ACTION_COPY);
+  signal_drag_data_received().connect([this](const Glib::RefPtr<Gdk::DragContext>&, int, int,
+                                             const Gtk::SelectionData& data, guint, guint) {
+    std::vector<std::string> folders;
+    for (const auto& uri : data.get_uris()) {
+      const auto file = Gio::File::create_for_uri(uri);
+      if (!file->get_path().empty()) folders.push_back(file->get_path());
+    }
+    addFolders(folders);
+  });
+}
+
+void MainWindow::addFolders(const std::vector<std::string>& folders) {
+  if (folders.empty()) return;
+  session_.startOver();
+  for (const std::string& folder : folders)
+    if (Glib::file_test(folder, Glib::FILE_TEST_IS_DIR)) session_.addFolder(folder);
+}
+
+void MainWindow::comeForward(const std::optional<std::string>& activationToken) {
+  // Choices that somebody has made stay.
+  if (session_.list() && session_.list()->chosen().files == 0) session_.startOver();
+  Varnel::GTK3::bringToFront(*this, activationToken);
+  if (session_.stage() == Session::Stage::choosing) folders_.focus();
+}
+
+void MainWindow::follow(Session::Event event) {
+  using Event = Session::Event;
+  switch (event) {
+    case Event::foldersChanged:
+      folders_.showFolders(session_.folders());
+      break;
+    case Event::started:
+      results_.outcome().withdraw();
+      if (session_.stage() == Session::Stage::scanning) results_.clear();
+      break;
+    case Event::scanned:
+      showScanned();
+      break;
+    case Event::scanFailed: {
+      const LostPath& lost = session_.outcome().lostFolders.front();
+      showProblem(*this, localized("Error_Scan", {pathText(lost.path)}), reasonOf(lost.loss));
+      break;
+    }
+    case Event::startedOver:
+    case Event::scanStopped:
+      results_.clear();
+      folders_.showFolders(session_.folders());
+      break;
+    case Event::chosen:
+      results_.showChosen(session_);
+      break;
+    case Event::planned:
+      confirmRemoval();
+      break;
+    case Event::removed:
+      showMoved("Removed", "NotRemoved", "Error_Remove");
+      break;
+    case Event::restored:
+      showMoved("Restored", "NotRestored", "Error_Restore");
+      break;
+  }
+  showPage();
+  updateActions();
+}
+
+void MainWindow::showPage() {
+  using Stage = Session::Stage;
+  const Stage stage = session_.stage();
+  TurnTimes::beginPhase(nameOf(stage));
+  for (Gtk::Button* button : {&startOver_, &rescan_}) button->set_visible(stage == Stage::results);
+  if (session_.isAtWork()) {
+    if (!clock_.connected())
+      clock_ = Glib::signal_timeout().connect(
+          [this] {
+            showProgress();
+            return true;
+          },
+          refreshInterval);
+    showProgress();
+    pages_.set_visible_child(progress_);
+    progress_.focus();
+    return;
+  }
+  clock_.disconnect();
+  set_title(Varnel::Globals::applicationName());
+  header_.set_title(Varnel::Globals::applicationName());
+  header_.set_subtitle("");
+  const bool isChange = pages_.get_visible_child() == &progress_ || !get_focus();
+  if (stage == Stage::choosing) {
+    pages_.set_visible_child(folders_);
+    if (isChange) folders_.focus();
+  } else {
+    pages_.set_visible_child(results_);
+    if (isChange) results_.focus();
+  }
+}
+
+void MainWindow::showProgress() {
+  const std::string line = progress_.refresh(session_);
+  header_.set_subtitle(line);
+  // What task lists show.
+  set_title(line + " – " + Varnel::Globals::applicationName());
+}
+
+void MainWindow::showScanned() {
+  static_cast<void>(Preferences::setLastFolders(session_.folders()));
+  results_.showList(session_);
+  const ScanTotals& totals = session_.outcome().totals;
+  const std::uint64_t files = totals.unreadableFiles + totals.vanishedFiles + totals.changedFiles;
+  if (files + totals.unreadableFolders > 0)
+    results_.outcome().tell(
+        localized("Results_LeftOut", {countText(files), countText(totals.unreadableFolders)}),
+        Gtk::MESSAGE_WARNING, {{"outcome.close", localized("Close"), {}}});
+  askForConsent();
+  application_.scanned(session_);
+}
+
+void MainWindow::showMoved(const char* movedKey, const char* leftKey, const char* problemKey) {
+  if (session_.list()) results_.showList(session_);
+  const MoveOutcome& moved = session_.moved();
+  if (!moved.problem.empty()) return showProblem(*this, localized(problemKey), moved.problem);
+  std::string text = localized(movedKey, {countText(moved.paths.size()), sizeText(moved.bytes)});
+  if (movedKey == std::string_view("Removed")) text += " " + localized("Confirm_Later");
+  std::vector<Notice::Answer> answers;
+  if (!moved.left.empty()) {
+    text += " " + localized(leftKey, {countText(moved.left.size())});
+    answers.push_back({"outcome.details", localized("Details"),
+                       [this] { showDetails(*this, session_.moved().left); }});
+  }
+  if (movedKey == std::string_view("Removed") && !moved.paths.empty())
+    answers.push_back({"outcome.put-back", localized("PutBack"), [this] { session_.restore(); }});
+  answers.push_back({"outcome.close", localized("Close"), {}});
+  if (session_.list())
+    results_.outcome().tell(text, moved.left.empty() ? Gtk::MESSAGE_INFO : Gtk::MESSAGE_WARNING,
+                            answers);
+  else
+    showText(*this, localized("PutBack"), text);
+  application_.moved(session_);
+}
+
+void MainWindow::askForConsent() {
+  if (!application_.asksConsent()) return;
+  const auto answer = [this](bool isGranted) {
+    return [this, isGranted] { application_.consented(isGranted); };
+  };
+  results_.question().tell(localized("Consent_Question"), Gtk::MESSAGE_QUESTION,
+                           {{"consent.no", localized("No"), answer(false)},
+                            {"consent.yes", localized("Yes"), answer(true)}});
+}
+
+void MainWindow::tellRefusal(DuplicateList::Answer answer) {
+  using Answer = DuplicateList::Answer;
+  if (answer == Answer::done) return results_.outcome().withdraw();
+  error_bell();
+  results_.outcome().tell(
+      localized(answer == Answer::reference ? "Refused_Reference" : "Refused_LastOfGroup"),
+      Gtk::MESSAGE_INFO, {{"outcome.close", localized("Close"), {}}});
+}
+
+}  // namespace Orvane
