@@ -155,7 +155,7 @@ ScanOutcome SystemEngine::scan(const std::vector<std::string>& folders, ScanCont
   if (control.isCancelled) {
     analytics_->scanCancelled();
   } else if (outcome.lostFolders.empty()) {
-    Report report = reportOf(result, false);
+    Report report = reportOf(result);
     report.roots = paths;
     outcome.report = std::make_shared<const Report>(std::move(report));
     analytics_->scanFinished(result.groups.size());
