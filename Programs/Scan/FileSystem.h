@@ -43,7 +43,8 @@ struct FileStatus {
 /// What a file holds together with other files of its volume.
 struct SharedExtents {
   std::uint64_t bytes = 0;
-  std::uint64_t place = 0;  ///< Files of one place share everything with one another.
+  std::uint64_t inlineBytes = 0;  ///< They lie with the file's facts, and are never shared.
+  std::uint64_t place = 0;        ///< Files of one place share everything with one another.
 };
 
 /// A regular file that is open for reading. One thread at a time; closed when destroyed.
@@ -63,6 +64,14 @@ class OpenFile {
 
   /// What it shares with other files; nothing when that cannot be told.
   [[nodiscard]] virtual std::optional<SharedExtents> sharedExtents() = 0;
+
+  /// Lets a part of the file lie where the same part of `source` lies, if the system finds the same
+  /// bytes in both. Bytes and times stay as they are. Returns how many bytes lie there now, from
+  /// the part's beginning on; nothing when they differ. A length of 0 asks whether the system would
+  /// do it. `source` is of the same `FileSystem`.
+  [[nodiscard]] virtual FileResult<std::optional<std::uint64_t>> share(OpenFile& source,
+                                                                       std::uint64_t offset,
+                                                                       std::uint64_t length) = 0;
 };
 
 /// How the reader of a file is going to read.

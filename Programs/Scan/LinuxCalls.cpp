@@ -11,6 +11,7 @@
 #include <sys/vfs.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <array>
 #include <cerrno>
 #include <cstddef>
@@ -56,9 +57,26 @@ class ExtentMap final {
   alignas(fiemap) std::array<std::byte, sizeof(fiemap) + sizeof extents_> answer_{};
 };
 
+/// Extents that follow one another on the volume as they do in the file. How many they are is
+/// chance.
+struct Run {
+  std::uint64_t logical = 0;
+  std::uint64_t physical = 0;
+  std::uint64_t length = 0;
+
+  [[nodiscard]] bool isFollowedBy(const Run& next) const {
+    return physical > 0 && next.logical == logical + length && next.physical == physical + length;
+  }
+};
+
 std::uint64_t mixed(std::uint64_t sum, std::uint64_t fact) {
   sum = (sum ^ fact) * 0x9E37'79B9'7F4A'7C15;
   return sum ^ sum >> 32;
+}
+
+std::uint64_t mixed(std::uint64_t sum, const Run& run) {
+  for (const std::uint64_t fact : {run.logical, run.physical, run.length}) sum = mixed(sum, fact);
+  return sum;
 }
 
 /// A number for the volume. The subvolumes of one have devices of their own, and share extents.
@@ -118,24 +136,59 @@ bool tellsSharedExtents(int folder) {
 
 std::optional<SharedExtents> sharedExtentsOf(int descriptor) {
   const auto volume = volumeOf(descriptor);
-  if (!volume) return std::nullopt;
+  struct stat facts;
+  if (!volume || ::fstat(descriptor, &facts) != 0) return std::nullopt;
+  const auto size = static_cast<std::uint64_t>(facts.st_size);
   SharedExtents found{.place = *volume};
+  Run run;
   std::uint64_t begin = 0;
   unsigned maps = 0;
-  for (bool isLast = false; !isLast;) {
+  // What is set aside behind the end, for a file that might grow, is of no account.
+  for (bool isLast = size == 0; !isLast;) {
     ExtentMap<64> map(begin);
     const auto extents = map.ask(descriptor);
     if (!extents || ++maps > maxMaps) return std::nullopt;
     isLast = extents->empty();
     for (const fiemap_extent& extent : *extents) {
-      for (const std::uint64_t fact : {extent.fe_logical, extent.fe_physical, extent.fe_length})
-        found.place = mixed(found.place, fact);
-      if (extent.fe_flags & FIEMAP_EXTENT_SHARED) found.bytes += extent.fe_length;
       begin = extent.fe_logical + extent.fe_length;
-      isLast = (extent.fe_flags & FIEMAP_EXTENT_LAST) != 0;
+      isLast = begin >= size || (extent.fe_flags & FIEMAP_EXTENT_LAST) != 0;
+      if (extent.fe_logical >= size) break;
+      const Run next{.logical = extent.fe_logical,
+                     .physical = extent.fe_physical,
+                     .length = std::min(begin, size) - extent.fe_logical};
+      if (extent.fe_flags & FIEMAP_EXTENT_SHARED) found.bytes += next.length;
+      if (extent.fe_flags & FIEMAP_EXTENT_DATA_INLINE) found.inlineBytes += next.length;
+      if (run.isFollowedBy(next)) {
+        run.length += next.length;
+        continue;
+      }
+      found.place = mixed(found.place, run);
+      run = next;
     }
   }
+  found.place = mixed(found.place, run);
   return found;
+}
+
+// Both may be open for reading alone: the system asks whether the user may write to the file.
+FileResult<std::optional<std::uint64_t>> shareRange(int source, int file, std::uint64_t offset,
+                                                    std::uint64_t length) {
+  file_dedupe_range head{};
+  head.src_offset = offset;
+  head.src_length = length;
+  head.dest_count = 1;
+  file_dedupe_range_info part{};
+  part.dest_fd = file;
+  part.dest_offset = offset;
+  alignas(file_dedupe_range) std::array<std::byte, sizeof head + sizeof part> request;
+  std::memcpy(request.data(), &head, sizeof head);
+  std::memcpy(request.data() + sizeof head, &part, sizeof part);
+  if (::ioctl(source, FIDEDUPERANGE, request.data()) != 0)
+    return std::error_code(errno, std::generic_category());
+  std::memcpy(&part, request.data() + sizeof head, sizeof part);
+  if (part.status < 0) return std::error_code(-part.status, std::generic_category());
+  if (part.status == FILE_DEDUPE_RANGE_DIFFERS) return std::optional<std::uint64_t>();
+  return std::optional<std::uint64_t>(part.bytes_deduped);
 }
 
 std::optional<std::uint64_t> placeOf(int descriptor) {

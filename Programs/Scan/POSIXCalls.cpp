@@ -36,6 +36,10 @@ std::optional<SharedExtents> sharedExtentsOf(int) {
   return std::nullopt;
 }
 
+FileResult<std::optional<std::uint64_t>> shareRange(int, int, std::uint64_t, std::uint64_t) {
+  return std::make_error_code(std::errc::not_supported);
+}
+
 std::optional<std::uint64_t> placeOf(int) {
   return std::nullopt;
 }

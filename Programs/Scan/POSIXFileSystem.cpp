@@ -119,6 +119,12 @@ class DescriptorFile final : public OpenFile {
     return sharedExtentsOf(descriptor_.get());
   }
 
+  FileResult<std::optional<std::uint64_t>> share(OpenFile& source, std::uint64_t offset,
+                                                 std::uint64_t length) override {
+    const int from = static_cast<DescriptorFile&>(source).descriptor_.get();
+    return shareRange(from, descriptor_.get(), offset, length);
+  }
+
  private:
   Descriptor descriptor_;
   std::optional<Varnel::Platform::TracelessReader> traceless_;

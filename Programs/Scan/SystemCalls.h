@@ -35,6 +35,11 @@ extern const int openToPassThrough;
 /// What the file shares with others, if the system tells.
 [[nodiscard]] std::optional<SharedExtents> sharedExtentsOf(int descriptor);
 
+/// Lets a part of `file` lie where that of `source` does, as `OpenFile::share` says.
+[[nodiscard]] FileResult<std::optional<std::uint64_t>> shareRange(int source, int file,
+                                                                  std::uint64_t offset,
+                                                                  std::uint64_t length);
+
 /// Where on its disk the file begins, if the system tells.
 [[nodiscard]] std::optional<std::uint64_t> placeOf(int descriptor);
 

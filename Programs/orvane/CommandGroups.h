@@ -11,7 +11,7 @@ namespace Orvane {
 
 /// Those that find duplicates.
 [[nodiscard]] std::vector<Command> duplicateCommands();
-/// Those that remove them, and give them back.
+/// Those that remove them, give them back, or let them share their place.
 [[nodiscard]] std::vector<Command> removalCommands();
 /// Those that explain the program.
 [[nodiscard]] std::vector<Command> selfCommands();

@@ -15,4 +15,9 @@ inline constexpr int schemaVersion = 1;
 /// UTF-8, which JSON texts must be, show as U+FFFD.
 [[nodiscard]] std::string jsonLine(const nlohmann::ordered_json& json);
 
+/// Adds a path under `key` and, as one that is not UTF-8 shows as another, its exact file URL under
+/// `keyOfURL` then.
+void addPath(nlohmann::ordered_json& json, const char* key, const char* keyOfURL,
+             const std::string& path);
+
 }  // namespace Orvane

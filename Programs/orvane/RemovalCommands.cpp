@@ -5,10 +5,21 @@
 
 #include <orvane/CommandParts.h>
 #include <orvane/RestoreCommand.h>
+#include <orvane/ShareCommand.h>
 #include <orvane/TrashCommand.h>
 
 namespace Orvane {
 namespace {
+
+template <typename C>
+Operands reportOrFolders(std::shared_ptr<C> command) {
+  return {.value = text("REPORT", command, &C::operands, Value::Kind::file),
+          .description =
+              "What \"orvane scan --json\" has written; \"-\" for standard input. Or else "
+              "folders, which are scanned now",
+          .min = 1,
+          .max = Operands::anyNumber};
+}
 
 Command trash() {
   const auto command = std::make_shared<TrashCommand>();
@@ -63,12 +74,7 @@ Command trash() {
                    .description =
                        "And all names that the report has of a file with several hard links",
                    .value = flag(command, &TrashCommand::allowsHardLinks)}},
-      .operands = {.value = text("REPORT", command, &TrashCommand::operands, Value::Kind::file),
-                   .description =
-                       "What \"orvane scan --json\" has written; \"-\" for standard input. Or else "
-                       "folders, which are scanned now",
-                   .min = 1,
-                   .max = Operands::anyNumber},
+      .operands = reportOrFolders(command),
       .run = runs(command)};
 }
 
@@ -100,10 +106,41 @@ Command restore() {
           .run = runs(command)};
 }
 
+Command share() {
+  const auto command = std::make_shared<ShareCommand>();
+  return {
+      .name = "share",
+      .group = Command::Group::duplicates,
+      .summary =
+          "Keep the content of each group of a report on the disk once, and all its files, where "
+          "the file system can; the system compares them",
+      .output = "Each file, and what became of it; a summary",
+      .fields = {schemaVersionField,
+                 {"planned", "how many files can be shared, with --dry-run"},
+                 {"shared", "how many take the extents of another file now"},
+                 {"sharedBefore", "how many did so before"},
+                 {"notShared", "how many stay as they are because of what was met"},
+                 {"freedBytes", "what is free now; with --dry-run, what would be"},
+                 {"groups[].size", "of each file, in bytes"},
+                 {"groups[].files[].path", "bytes that are not UTF-8 are U+FFFD"},
+                 {"groups[].files[].url", "the exact file URL, only where the path is not UTF-8"},
+                 {"groups[].files[].outcome",
+                  "\"source\", \"planned\", \"shared\", \"shared before\", or why it is not"},
+                 {"groups[].files[].reason", "what the system has said, only where it did"},
+                 {"groups[].files[].freedBytes", "the same of this file"}},
+      .options = {json(command),
+                  {.letter = 'n',
+                   .name = "dry-run",
+                   .description = "Ask what could be shared; compare and change nothing",
+                   .value = flag(command, &ShareCommand::isTrial)}},
+      .operands = reportOrFolders(command),
+      .run = runs(command)};
+}
+
 }  // namespace
 
 std::vector<Command> removalCommands() {
-  return {trash(), restore()};
+  return {trash(), restore(), share()};
 }
 
 }  // namespace Orvane

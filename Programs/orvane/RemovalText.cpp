@@ -12,8 +12,6 @@
 #include <Varnel/Paths/QNURLResolver.h>
 #include <Varnel/Platform/Text/ByteCountFormatter.h>
 #include <Varnel/Platform/Text/VisibleText.h>
-#include <Varnel/Platform/Values/URL.h>
-#include <Varnel/Platform/Values/UTF8.h>
 #include <orvane/JSONLine.h>
 #include <orvane/ResultText.h>
 #include <orvane/TextColumns.h>
@@ -133,14 +131,6 @@ bool forEachGroup(const Removal& removal, Use use) {
     if (!use(begin, end)) return false;
   }
   return true;
-}
-
-// JSON texts must be UTF-8, and paths need not be.
-void addPath(nlohmann::ordered_json& json, const char* key, const char* keyOfURL,
-             const std::string& path) {
-  json[key] = path;
-  if (!Varnel::Platform::isValidUTF8(path))
-    json[keyOfURL] = Varnel::Platform::URL::fileURLWithPath(path).absoluteString();
 }
 
 nlohmann::ordered_json jsonOf(const Removal& removal, const RemovalStep& step) {

@@ -2,8 +2,11 @@
 #include <gmock/gmock.h>
 
 #include <filesystem>
+#include <fstream>
 
 #include <Tests/Programs/OrvaneFixture.h>
+#include <Tests/Support/DiskImage.h>
+#include <Tests/Support/MountNamespace.h>
 #include <orvane/TextColumns.h>
 
 namespace Orvane::Testing {
@@ -58,6 +61,39 @@ TEST_F(Orvane, TellsThatFilesWereNotMoved) {
   const Outcome outcome = run({"trash", "--keep=oldest", "--yes", report});
   EXPECT_EQ(outcome.status, 3);
   EXPECT_THAT(outcome.output, AllOf(HasSubstr("[changed]"), HasSubstr("0 files were moved")));
+}
+
+TEST_F(Orvane, SharesTheExtentsOfDuplicates) {
+  // Files in memory have none.
+  const auto memory = Varnel::Tests::TemporaryFolder::inMemory();
+  for (const char* name : {"a", "b"}) memory.write(name, "same");
+  const Outcome unsupported = run({"share", memory.path()});
+  EXPECT_EQ(unsupported.status, 1);
+  EXPECT_THAT(unsupported.output, HasSubstr("/b [unsupported]\n\n0 files are shared now\n"));
+  EXPECT_THAT(unsupported.errors, HasSubstr("no file system of these files"));
+
+  const std::string reason = Varnel::Tests::enterMountNamespace();
+  if (!reason.empty()) GTEST_SKIP() << reason;
+  const Varnel::Tests::DiskImage image(home.path("image"), Varnel::Tests::DiskImage::btrfs());
+  if (image.name().empty() || !image.mount(folder.path()))
+    GTEST_SKIP() << "no mkfs.btrfs, or no loop devices";
+  for (const char* name : {"a", "b", "c\n"}) folder.write(name, std::string(1 << 20, 'x'));
+  const Outcome scan = run({"scan", "--json", folder.path()});
+  const std::string report = home.path("report");
+  std::ofstream(report) << scan.output;
+  folder.write("b", std::string(1 << 20, 'y'));
+  EXPECT_THAT(run({"share", "-n", report}).output,
+              HasSubstr("1 file would be shared: 1 MB would be free\n"));
+  const Outcome some = run({"share", report});
+  EXPECT_EQ(some.status, 3);
+  EXPECT_THAT(some.output,
+              AllOf(HasSubstr("source  " + folder.path("a")),
+                    HasSubstr("b [changed]\nshared  " + folder.path("c\\n")),
+                    HasSubstr("\n1 file is shared now: 1 MB are free\n1 file stays as it is: ")));
+  const Outcome again = run({"share", "--json", folder.path()});
+  EXPECT_EQ(again.status, 0);
+  EXPECT_THAT(again.output, AllOf(HasSubstr(R"("shared":0,"sharedBefore":1,"notShared":0)"),
+                                  HasSubstr(R"("outcome":"shared before")")));
 }
 
 TEST(TextColumns, CutTextsInTheirMiddle) {

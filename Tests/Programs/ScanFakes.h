@@ -158,6 +158,11 @@ class FaultyFileSystem final : public FileSystem {
   std::function<void(const std::string& path)> beforeList;
   std::function<void(const std::string& path)> beforeOpen;
   std::function<void(const std::string& path)> beforeRead;
+  using ShareResult = FileResult<std::optional<std::uint64_t>>;
+  /// Where given, what the system answers to a wish to share.
+  std::function<ShareResult(const std::string& source, const std::string& path,
+                            std::uint64_t offset, std::uint64_t length)>
+      share;
   std::map<std::string, FileIdentity> identities;  ///< Of folders that are mounted again.
   int maxOpenFolders = 1000;
   int maxFoldersBesideAFile = 1000;
@@ -197,6 +202,12 @@ class FaultyFileSystem final : public FileSystem {
       if (owner_.shared.empty()) return file_->sharedExtents();
       const auto extents = owner_.shared.find(path_);
       return extents == owner_.shared.end() ? std::nullopt : std::optional(extents->second);
+    }
+
+    ShareResult share(OpenFile& source, std::uint64_t offset, std::uint64_t length) override {
+      auto& from = static_cast<File&>(source);
+      if (owner_.share) return owner_.share(from.path_, path_, offset, length);
+      return file_->share(*from.file_, offset, length);
     }
 
    private:
