@@ -43,8 +43,8 @@ struct FileStatus {
 /// What a file holds together with other files of its volume.
 struct SharedExtents {
   std::uint64_t bytes = 0;
-  std::uint64_t inlineBytes = 0;  ///< They lie with the file's facts, and are never shared.
   std::uint64_t place = 0;        ///< Files of one place share everything with one another.
+  std::uint64_t inlineBytes = 0;  ///< They lie with the file's facts, and are never shared.
 };
 
 /// A regular file that is open for reading. One thread at a time; closed when destroyed.
