@@ -6,6 +6,7 @@
 #include <string>
 #include <string_view>
 #include <tuple>
+#include <unordered_map>
 
 #include <Removal/Report.h>
 
@@ -52,25 +53,32 @@ Choice choose(const ReportGroup& group, KeepRule rule, const Report& report) {
   return choice;
 }
 
-std::set<std::string_view> namesOf(const ReportFile& file) {
-  std::set<std::string_view> names(file.names.begin(), file.names.end());
-  names.insert(file.path);
-  return names;
-}
-
-std::optional<Refusal::Reason> objectionTo(const ReportGroup& group, const Choice& choice) {
-  using enum Refusal::Reason;
-  if (choice.kept >= group.files.size()) return unknown;
-  const auto keptNames = namesOf(group.files[choice.kept]);
-  std::set<std::size_t> seen;
-  for (const std::size_t victim : choice.victims) {
-    if (victim >= group.files.size() || !seen.insert(victim).second) return unknown;
-    const ReportFile& file = group.files[victim];
-    if (file.isReference) return reference;
-    for (const std::string_view name : namesOf(file))
-      if (keptNames.contains(name)) return kept;
+/// All names of the files that stay, and why: whatever group names them.
+class Staying final {
+ public:
+  void add(const ReportFile& file, Refusal::Reason reason) {
+    reasons_.emplace(file.path, reason);
+    for (const std::string& name : file.names) reasons_.emplace(name, reason);
   }
-  return std::nullopt;
+
+  [[nodiscard]] std::optional<Refusal::Reason> objectionTo(const ReportFile& victim) const {
+    if (const auto found = reasons_.find(victim.path); found != reasons_.end())
+      return found->second;
+    for (const std::string& name : victim.names)
+      if (const auto found = reasons_.find(name); found != reasons_.end()) return found->second;
+    return std::nullopt;
+  }
+
+ private:
+  std::unordered_map<std::string_view, Refusal::Reason> reasons_;
+};
+
+bool isKnown(const ReportGroup& group, const Choice& choice) {
+  std::set<std::size_t> seen;
+  return choice.kept < group.files.size() &&
+         std::all_of(choice.victims.begin(), choice.victims.end(), [&](std::size_t victim) {
+           return victim < group.files.size() && seen.insert(victim).second;
+         });
 }
 
 }  // namespace
@@ -91,14 +99,23 @@ Selection select(const Report& report, KeepRule rule) {
 }
 
 std::optional<Refusal> check(const Report& report, const Selection& selection) {
+  using enum Refusal::Reason;
+  Staying staying;
+  for (const ReportGroup& group : report.groups)
+    for (const ReportFile& file : group.files)
+      if (file.isReference) staying.add(file, reference);
   std::set<std::size_t> seen;
   for (std::size_t i = 0; i < selection.size(); ++i) {
     const Choice& choice = selection[i];
-    if (choice.group >= report.groups.size() || !seen.insert(choice.group).second)
-      return Refusal{.reason = Refusal::Reason::unknown, .choice = i};
-    if (const auto reason = objectionTo(report.groups[choice.group], choice))
-      return Refusal{.reason = *reason, .choice = i};
+    if (choice.group >= report.groups.size() || !seen.insert(choice.group).second ||
+        !isKnown(report.groups[choice.group], choice))
+      return Refusal{.reason = unknown, .choice = i};
+    staying.add(report.groups[choice.group].files[choice.kept], kept);
   }
+  for (std::size_t i = 0; i < selection.size(); ++i)
+    for (const std::size_t victim : selection[i].victims)
+      if (const auto reason = staying.objectionTo(report.groups[selection[i].group].files[victim]))
+        return Refusal{.reason = *reason, .choice = i};
   return std::nullopt;
 }
 

@@ -39,8 +39,8 @@ using Selection = std::vector<Choice>;
 struct Refusal {
   enum class Reason {
     unknown,    ///< No such group or file, or one named twice.
-    kept,       ///< The file that stays is among the victims, under this or another name.
-    reference,  ///< A victim is a reference.
+    kept,       ///< A victim is a file that stays, of any group and by any of its names.
+    reference,  ///< Likewise a reference.
   };
 
   Reason reason = Reason::unknown;

@@ -27,7 +27,8 @@ std::string textOf(const Removal::Problem& problem) {
   using enum Removal::Problem::Reason;
   switch (problem.reason) {
     case selection:
-      return "the report names a file twice in one group (" + problem.description + ")";
+      return "the report names a file that stays also as one that goes (" + problem.description +
+             ")";
     case noTrash:
       return "there is no trash for \"" + problem.path + "\"";
     case packages:

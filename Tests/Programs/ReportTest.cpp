@@ -124,10 +124,13 @@ TEST(Selection, KeepsOneFileByTheRuleAndSaysWhereItIsATie) {
 }
 
 TEST(Selection, NeverTakesTheLastFileOrAReference) {
-  const Report report = oneGroup({{.path = "/a"},
-                                  {.path = "/b", .names = {"/a"}},
-                                  {.path = "/c", .isReference = true},
-                                  {.path = "/d", .names = {"/e"}}});
+  Report report = oneGroup({{.path = "/a"},
+                            {.path = "/b", .names = {"/a"}},
+                            {.path = "/c", .names = {"/f"}, .isReference = true},
+                            {.path = "/d", .names = {"/e"}}});
+  // Whoever writes this names some files again.
+  report.groups.push_back(
+      {.files = {{.path = "/g"}, {.path = "/e"}, {.path = "/h", .names = {"/f"}}}});
   using enum Refusal::Reason;
   const struct {
     Selection selection;
@@ -141,7 +144,9 @@ TEST(Selection, NeverTakesTheLastFileOrAReference) {
       {{{.kept = 0, .victims = {3, 3}}}, unknown},
       {{{.kept = 4, .victims = {3}}}, unknown},
       {{{.kept = 0, .victims = {4}}}, unknown},
-      {{{.group = 1}}, unknown},
+      {{{.group = 2}}, unknown},
+      {{{.kept = 3, .victims = {0}}, {.group = 1, .kept = 0, .victims = {1}}}, kept},
+      {{{.group = 1, .kept = 0, .victims = {2}}}, reference},
       {{{.kept = 0, .victims = {3}}, {.kept = 3, .victims = {0}}}, unknown},
   };
   for (const auto& row : rows) {
