@@ -42,7 +42,7 @@ FileStatus statusOf(const FileState& state) {
 bool isInHiddenFolder(const std::string& path, const std::vector<std::string>& roots) {
   std::size_t named = 0;
   for (const std::string& root : roots)
-    if (isBelow(path, root)) named = std::max(named, root.size());
+    if (isBelow(path, root)) named = std::max(named, root.find_last_not_of('/') + 1);
   const std::size_t dot = path.find("/.", named);
   return dot != std::string::npos && path.find('/', dot + 1) != std::string::npos;
 }
