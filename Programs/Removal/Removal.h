@@ -47,6 +47,7 @@ struct RemovalStep {
     packaged,
     hardLinked,
     // Left alone because of what was met:
+    inTrash,        ///< It lies in a trash, or the file that would stay does.
     changed,        ///< A file of its group is not what the report tells, or not there.
     different,      ///< Its content is not that of the file that stays.
     unreadable,     ///< It, or the file that stays, cannot be read.

@@ -14,9 +14,10 @@ namespace Orvane {
 namespace {
 
 // What a rule compares: the least one stays.
-using Rank = std::tuple<std::int64_t, std::int64_t>;
+using RuleRank = std::tuple<std::int64_t, std::int64_t>;
+using Rank = std::tuple<bool, RuleRank>;
 
-Rank rankOf(const ReportFile& file, KeepRule rule, const Report& report) {
+RuleRank rankOf(const ReportFile& file, KeepRule rule, const Report& report) {
   switch (rule) {
     case KeepRule::oldest:
       return {file.modified, file.nanoseconds};
@@ -34,7 +35,8 @@ Rank rankOf(const ReportFile& file, KeepRule rule, const Report& report) {
   return {root - report.roots.begin(), 0};
 }
 
-Choice choose(const ReportGroup& group, KeepRule rule, const Report& report) {
+Choice choose(const ReportGroup& group, KeepRule rule, const Report& report,
+              const IsPassing& isPassing) {
   const bool hasReference = std::any_of(group.files.begin(), group.files.end(),
                                         [](const ReportFile& file) { return file.isReference; });
   Choice choice;
@@ -43,7 +45,7 @@ Choice choose(const ReportGroup& group, KeepRule rule, const Report& report) {
     const ReportFile& file = group.files[i];
     if (!file.isReference) choice.victims.push_back(i);
     if (file.isReference != hasReference) continue;
-    const Rank rank = rankOf(file, rule, report);
+    const Rank rank = {isPassing(file.path), rankOf(file, rule, report)};
     choice.isTie = best == rank || (choice.isTie && best < rank);
     if (best && *best <= rank) continue;
     best = rank;
@@ -88,10 +90,10 @@ bool isBelow(std::string_view path, std::string_view folder) {
   return path.starts_with(folder) && path.substr(folder.size()).starts_with('/');
 }
 
-Selection select(const Report& report, KeepRule rule) {
+Selection select(const Report& report, KeepRule rule, const IsPassing& isPassing) {
   Selection selection;
   for (std::size_t i = 0; i < report.groups.size(); ++i) {
-    Choice choice = choose(report.groups[i], rule, report);
+    Choice choice = choose(report.groups[i], rule, report, isPassing);
     choice.group = i;
     if (!choice.victims.empty()) selection.push_back(std::move(choice));
   }

@@ -41,6 +41,8 @@ Wording wordingOf(Outcome outcome) {
       return {"packaged", "owned by the package system (--allow-packaged)"};
     case Outcome::hardLinked:
       return {"hard link", "with other hard links, so that nothing is freed (--allow-hard-links)"};
+    case Outcome::inTrash:
+      return {"in trash", "in the trash already, or of which the one to stay is"};
     case Outcome::changed:
       return {"changed", "of a group that has changed since the report"};
     case Outcome::different:

@@ -69,9 +69,10 @@ int TrashCommand::run(Console& console) const {
   const Interruption interruption(control.isCancelled);
   const auto report = reportFrom(operands, console, control);
   if (!report) return interruption.signal() != 0 ? 128 + interruption.signal() : 1;
-  const Selection selection = select(*report, keep);
-
   const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
+  const Selection selection = select(
+      *report, keep, [&](const std::string& path) { return ports.trash.get().isInTrash(path); });
+
   RemovalJournal journal({ports.privateFiles, ports.systemLog}, RemovalJournal::productPath());
   DpkgFiles packagedFiles;
   Removal removal({.fileSystem = systemFileSystem(CacheUse::traceless),

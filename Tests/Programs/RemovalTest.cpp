@@ -158,11 +158,29 @@ TEST_F(RemovalFixture, MovesOnlyWhatIsAllowed) {
   EXPECT_EQ(allowed.steps()[4].otherNames, 1u);
   EXPECT_EQ(allowed.totals().plannedBytes, 16u) << "the third name keeps those of e";
 
-  // A folder that was named to the scan is no secret.
-  found.roots = {path(".hidden")};
-  Removal named = makeRemoval({});
-  ASSERT_FALSE(named.prepare());
-  EXPECT_EQ(outcomes(named).at(0), planned);
+  // A folder that was named to the scan is no secret, what is hidden in it is.
+  for (const auto& [root, outcome] :
+       {std::pair{path(".hidden"), planned}, {path("") + "/", inHiddenFolder}}) {
+    found.roots = {root};
+    Removal named = makeRemoval({});
+    ASSERT_FALSE(named.prepare());
+    EXPECT_EQ(outcomes(named).at(0), outcome) << root;
+  }
+}
+
+// Or else emptying the trash would take the last one.
+TEST_F(RemovalFixture, CountsOnNothingThatIsInATrash) {
+  for (const std::string old : {".Trash-1000/files/a", ".local/share/Trash/files/a",
+                                "$RECYCLE.BIN/S-1/$RA.jpg", "user/.Trashes/501/a"}) {
+    write(old, "same"), write("b", "same");
+    found.groups.clear();
+    report({old, "b"});
+    for (const Choice& choice : {Choice{.kept = 0, .victims = {1}}, {.kept = 1, .victims = {0}}}) {
+      selection = {choice};
+      EXPECT_THAT(removeAll(), ElementsAre(inTrash)) << old;
+      EXPECT_EQ(bytes(path("b")) + bytes(path(old)), "samesame");
+    }
+  }
 }
 
 TEST_F(RemovalFixture, BeginsOnlyWhereItCanEnd) {

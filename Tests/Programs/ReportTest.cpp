@@ -120,6 +120,9 @@ TEST(Selection, KeepsOneFileByTheRuleAndSaysWhereItIsATie) {
     EXPECT_FALSE(check(oneGroup(row.files), selection)) << &row - rows;
   }
   EXPECT_EQ(select(oneGroup({early}), KeepRule::oldest), Selection{});
+  const auto isEarly = [](const std::string& path) { return path.ends_with("/early"); };
+  const Selection lasting{{.kept = 1, .victims = {0, 2}}};
+  EXPECT_EQ(select(oneGroup({early, later, latest}), KeepRule::oldest, isEarly), lasting);
   EXPECT_EQ(select(oneGroup({stays, staysToo}), KeepRule::oldest), Selection{});
 }
 
