@@ -46,7 +46,7 @@ Wording wordingOf(Outcome outcome) {
     case Outcome::changed:
       return {"changed", "of a group that has changed since the report"};
     case Outcome::different:
-      return {"different", "whose content is not that of the file that stays"};
+      return {"different", "that differ from the one that stays, or are that very file"};
     case Outcome::unreadable:
       return {"unreadable", "that cannot be read, or whose group cannot"};
     case Outcome::noAccess:

@@ -147,8 +147,8 @@ class RemovalFixture : public ::testing::Test {
   }
 
   /// Makes every step, and returns what came of each.
-  std::vector<Outcome> removeAll() {
-    Removal removal = makeRemoval();
+  std::vector<Outcome> removeAll(Allowances allowances = {.hiddenFolders = true}) {
+    Removal removal = makeRemoval(allowances);
     EXPECT_FALSE(removal.prepare());
     EXPECT_FALSE(removal.begin());
     afterPreparing();

@@ -143,6 +143,39 @@ TEST_F(RemovalFixture, MovesOnlyWhatIsAllowed) {
   fs::create_hard_link(path("e"), path("third e"));
   report({"a", ".hidden/b", "c", "d", "e", ".f"});
   found.groups[0].files[4].names = {path("other e")};
+TEST_F(RemovalFixture, LeavesWhatIsNoCopy) {
+  const std::string large(3 << 20, 'x');
+  write("large", large + "1"), write("large, changed", large + "2");
+  report({"large", "large, changed"});
+  write("a", "same");
+  for (const char* name : {"hard link", "seen through another mount"}) {
+    fs::create_hard_link(path("a"), path(name));
+    report({"a", name});
+  }
+  fileSystem.devices[path("seen through another mount")] = 77;
+  trash.devices = fileSystem.devices;
+  EXPECT_THAT(removeAll({.otherFileSystems = true, .hardLinks = true}),
+              ElementsAre(different, different, different));
+}
+
+TEST_F(RemovalFixture, PutsBackWhatHasBecomeTheLastOne) {
+  for (const char* name : {"a", "b", "c"}) write(name, "same");
+  report({"a", "b", "c"});
+  trash.afterMove = [&] { fs::remove(path("a")); };
+  EXPECT_THAT(removeAll(), ElementsAre(changed, changed));
+  EXPECT_EQ(bytes(path("b")) + bytes(path("c")), "samesame");
+  EXPECT_THAT(*journal.removals(), IsEmpty());
+  trash.afterMove = [] {};
+
+  write("a", "same");
+  selection.clear();
+  report({"a", "b"});
+  selection[0].group = 1;
+  trash.afterNote = [&] { write("b", "new"); };
+  EXPECT_THAT(removeAll(), ElementsAre(changed));
+  EXPECT_THAT(*journal.removals(), IsEmpty()) << "of what was not moved there is no note";
+}
+
   trash.devices[path("c")] = 77;
   packages.files = {path("d")};
 
