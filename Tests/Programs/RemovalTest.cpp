@@ -55,6 +55,7 @@ TEST_F(RemovalFixture, LeavesWhatIsNotAsItWas) {
   };
   const auto swapForEqual = [](const std::string& file) {
     fs::copy_file(file, file + " new");
+    fs::last_write_time(file + " new", fs::last_write_time(file));
     fs::rename(file + " new", file);
   };
   const auto linkToThird = [this](const std::string& file) {
@@ -125,6 +126,11 @@ TEST_F(RemovalFixture, LeavesWhatCannotBeComparedOrNoted) {
     trash.answer = TrashError{.reason = reason};
     EXPECT_THAT(removeAll(), ElementsAre(outcome, outcome));
   }
+  EXPECT_THAT(*journal.removals(), IsEmpty());
+  const TrashedFile stranger{.folder = "/trash", .name = "b", .path = path("b"), .state = {}};
+  trash.answer = TrashError{.reason = TrashError::Reason::misplaced, .file = stranger};
+  EXPECT_THAT(removeAll(), ElementsAre(misplaced, misplaced));
+  EXPECT_EQ(journal.entries(journal.removals()->at(0))->at(0).file, stranger);
   trash.answer.reset();
 
   using Varnel::Platform::Testing::Fault;
@@ -137,12 +143,6 @@ TEST_F(RemovalFixture, LeavesWhatCannotBeComparedOrNoted) {
   EXPECT_EQ(copiesInTrash("same"), 1);
 }
 
-TEST_F(RemovalFixture, MovesOnlyWhatIsAllowed) {
-  for (const char* name : {"a", ".hidden/b", "c", "d", "e", ".f"}) write(name, "same");
-  fs::create_hard_link(path("e"), path("other e"));
-  fs::create_hard_link(path("e"), path("third e"));
-  report({"a", ".hidden/b", "c", "d", "e", ".f"});
-  found.groups[0].files[4].names = {path("other e")};
 TEST_F(RemovalFixture, LeavesWhatIsNoCopy) {
   const std::string large(3 << 20, 'x');
   write("large", large + "1"), write("large, changed", large + "2");
@@ -176,6 +176,12 @@ TEST_F(RemovalFixture, PutsBackWhatHasBecomeTheLastOne) {
   EXPECT_THAT(*journal.removals(), IsEmpty()) << "of what was not moved there is no note";
 }
 
+TEST_F(RemovalFixture, MovesOnlyWhatIsAllowed) {
+  for (const char* name : {"a", ".hidden/b", "c", "d", "e", ".f"}) write(name, "same");
+  fs::create_hard_link(path("e"), path("other e"));
+  fs::create_hard_link(path("e"), path("third e"));
+  report({"a", ".hidden/b", "c", "d", "e", ".f"});
+  found.groups[0].files[4].names = {path("other e")};
   trash.devices[path("c")] = 77;
   packages.files = {path("d")};
 
@@ -251,6 +257,7 @@ TEST_F(RemovalFixture, BeginsOnlyWhereItCanEnd) {
 TEST_F(RemovalFixture, RestoresOnlyWhatCanComeBack) {
   for (const char* name : {"a", "b", "c", "d", "e"}) write(name, "same");
   report({"a", "b", "c", "d", "e"});
+  const auto timeOfD = fs::last_write_time(path("d"));
   // The process ends right before the last move.
   int notes = 0;
   struct Killed {};
@@ -265,16 +272,40 @@ TEST_F(RemovalFixture, RestoresOnlyWhatCanComeBack) {
     if (file.path == path("c"))
       fs::remove(placeOf(file)), fs::remove(file.folder + "/info/" + file.name + ".trashinfo");
   write("d", "new");
+  fs::last_write_time(path("d"), timeOfD);
   EXPECT_THAT(outcomesOf(restore()),
               ElementsAre(RestoreOutcome::inPlace, RestoreOutcome::occupied,
                           RestoreOutcome::emptied, RestoreOutcome::restored));
   EXPECT_EQ(bytes(path("d")), "new");
   fs::remove(path("d"));
+  fs::rename(home.path() / "data", home.path() / "disk that is not there");
+  EXPECT_THAT(outcomesOf(restore(1)), ElementsAre(RestoreOutcome::noTrash));
+  fs::remove_all(home.path() / "data");
+  fs::rename(home.path() / "disk that is not there", home.path() / "data");
   EXPECT_THAT(outcomesOf(restore(1)), ElementsAre(RestoreOutcome::restored));
   EXPECT_THAT(restore(1), IsEmpty());
   Restoration none(
       {.disks = Varnel::DiskAccessManager::shared(), .trash = trash, .journal = journal}, {});
   EXPECT_EQ(none.begin()->reason, Restoration::Problem::Reason::unknown);
+}
+
+TEST_F(RemovalFixture, IsKnownUntilNothingIsLeftOfIt) {
+  write("a", "same");
+  const auto removeB = [&] {
+    found.groups.clear();
+    selection.clear();
+    write("b", "same");
+    report({"a", "b"});
+    EXPECT_THAT(removeAll(), ElementsAre(moved));
+  };
+  removeB(), removeB();
+  for (int removal = 2; removal > 0; --removal) {
+    EXPECT_THAT(outcomesOf(restore()), ElementsAre(RestoreOutcome::restored)) << removal;
+    fs::remove(path("b"));
+  }
+  removeB();
+  ASSERT_EQ(journal.removals()->size(), 1u);
+  EXPECT_EQ(journal.removals()->at(0).number, 3);
 }
 
 TEST(DpkgFiles, AreThoseOfTheLists) {
