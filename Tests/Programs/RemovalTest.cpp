@@ -268,9 +268,9 @@ TEST_F(RemovalFixture, RestoresOnlyWhatCanComeBack) {
   trash.afterNote = [] {};
   EXPECT_EQ(copiesInTrash("same"), 3);
 
-  for (const TrashedFile& file : trashed())
-    if (file.path == path("c"))
-      fs::remove(placeOf(file)), fs::remove(file.folder + "/info/" + file.name + ".trashinfo");
+  const TrashedFile fileC = trashed().at(1);
+  for (const char* part : {"/info/c.trashinfo", "/files/c"})
+    fs::rename(fileC.folder + part, fileC.folder + part + " away");
   write("d", "new");
   fs::last_write_time(path("d"), timeOfD);
   EXPECT_THAT(outcomesOf(restore()),
@@ -279,10 +279,14 @@ TEST_F(RemovalFixture, RestoresOnlyWhatCanComeBack) {
   EXPECT_EQ(bytes(path("d")), "new");
   fs::remove(path("d"));
   fs::rename(home.path() / "data", home.path() / "disk that is not there");
-  EXPECT_THAT(outcomesOf(restore(1)), ElementsAre(RestoreOutcome::noTrash));
+  EXPECT_THAT(outcomesOf(restore(1)),
+              ElementsAre(RestoreOutcome::noTrash, RestoreOutcome::noTrash));
   fs::remove_all(home.path() / "data");
   fs::rename(home.path() / "disk that is not there", home.path() / "data");
-  EXPECT_THAT(outcomesOf(restore(1)), ElementsAre(RestoreOutcome::restored));
+  for (const char* part : {"/info/c.trashinfo", "/files/c"})
+    fs::rename(fileC.folder + part + " away", fileC.folder + part);
+  EXPECT_THAT(outcomesOf(restore(1)),
+              ElementsAre(RestoreOutcome::restored, RestoreOutcome::restored));
   EXPECT_THAT(restore(1), IsEmpty());
   Restoration none(
       {.disks = Varnel::DiskAccessManager::shared(), .trash = trash, .journal = journal}, {});
