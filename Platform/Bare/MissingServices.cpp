@@ -72,6 +72,7 @@ class NoSoundPlayer final : public SoundPlayer {
 class NoTrash final : public Trash {
  public:
   Result<FileState, TrashError> state(const std::string&) override { return none_; }
+  bool isInTrash(const std::string&) override { return false; }
   Result<std::string, TrashError> folderFor(const std::string&) override { return none_; }
   Result<TrashedFile, TrashError> move(const std::string&, const FileState&,
                                        const Ready&) override {

@@ -84,6 +84,10 @@ class VARNEL_API Trash {
   /// What the path leads to: the state of a regular file, or `changed` where it is none.
   [[nodiscard]] virtual Result<FileState, TrashError> state(const std::string& path) = 0;
 
+  /// Whether the path lies in a trash: the user's, or, as its name tells, that of a volume, of
+  /// another user or of another system. What is there may be gone at any moment.
+  [[nodiscard]] virtual bool isInTrash(const std::string& path) = 0;
+
   /// The trash that a file with this path would go to, or `noTrash`. Makes it when it is missing,
   /// and touches nothing else. The answer is no promise: `move` has the last word.
   [[nodiscard]] virtual Result<std::string, TrashError> folderFor(const std::string& path) = 0;

@@ -40,6 +40,10 @@ class FakeTrash final : public Trash {
     return found->second;
   }
 
+  [[nodiscard]] bool isInTrash(const std::string& path) override {
+    return path.starts_with(folder + "/");
+  }
+
   [[nodiscard]] Result<std::string, TrashError> folderFor(const std::string& path) override {
     if (!isPath(path)) return invalid();
     if (foldersWithoutTrash.contains(parentOf(path))) return TrashError{.reason = Reason::noTrash};

@@ -17,7 +17,7 @@ namespace Orvane {
 struct Comparison {
   enum class Verdict {
     equal,       ///< Two files, and each byte the same.
-    different,   ///< Not so, though neither has changed.
+    different,   ///< Not so, though neither has changed; or one file seen twice.
     changed,     ///< One of them is not in its state, before or after.
     unreadable,  ///< The system's error says why.
     noAccess,    ///< The framework gives no access to a disk.

@@ -42,7 +42,7 @@ FileStatus statusOf(const FileState& state) {
 bool isInHiddenFolder(const std::string& path, const std::vector<std::string>& roots) {
   std::size_t named = 0;
   for (const std::string& root : roots)
-    if (isBelow(path, root)) named = std::max(named, root.size());
+    if (isBelow(path, root)) named = std::max(named, root.find_last_not_of('/') + 1);
   const std::size_t dot = path.find("/.", named);
   return dot != std::string::npos && path.find('/', dot + 1) != std::string::npos;
 }
@@ -179,6 +179,10 @@ void Removal::lookAtGroup(std::size_t begin, std::size_t end, const Names& packa
     }
     return;
   }
+  if (ports_.trash.isInTrash(keptFor(steps_[begin]))) {
+    for (std::size_t i = begin; i < end; ++i) steps_[i].outcome = Outcome::inTrash;
+    return;
+  }
   const std::uint64_t keptDevice = devices[selection_[steps_[begin].choice].kept];
   for (std::size_t i = begin; i < end; ++i)
     lookAt(steps_[i], devices[steps_[i].file] == keptDevice, packaged);
@@ -191,6 +195,8 @@ void Removal::lookAt(RemovalStep& step, bool isOnFileSystemOfKept, const Names& 
   step.otherNames = links - std::min<std::uint64_t>(links, names);
   if (!allowances_.hiddenFolders && isInHiddenFolder(path, report_.roots)) {
     step.outcome = Outcome::inHiddenFolder;
+  } else if (ports_.trash.isInTrash(path)) {
+    step.outcome = Outcome::inTrash;
   } else if (!allowances_.otherFileSystems && !isOnFileSystemOfKept) {
     step.outcome = Outcome::onOtherFileSystem;
   } else if (packaged.contains(path)) {

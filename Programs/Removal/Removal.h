@@ -47,8 +47,9 @@ struct RemovalStep {
     packaged,
     hardLinked,
     // Left alone because of what was met:
+    inTrash,        ///< It lies in a trash, or the file that would stay does.
     changed,        ///< A file of its group is not what the report tells, or not there.
-    different,      ///< Its content is not that of the file that stays.
+    different,      ///< It is no copy of the file that stays: it differs, or is that very file.
     unreadable,     ///< It, or the file that stays, cannot be read.
     noAccess,       ///< The framework gives no access to its disk.
     noTrash,        ///< Its file system has no trash, after all.

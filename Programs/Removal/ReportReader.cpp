@@ -78,6 +78,14 @@ class ByteIterator final {
   Bytes* bytes_ = nullptr;
 };
 
+// As the file system gives paths, so that equal ones are equal texts.
+bool isPath(const std::string& path) {
+  if (!path.starts_with('/') || Varnel::Platform::isCutShort(path)) return false;
+  const std::string closed = path + "/";
+  return closed.find("//") == closed.npos && closed.find("/./") == closed.npos &&
+         closed.find("/../") == closed.npos;
+}
+
 /// "1732249591.123456789".
 bool readTime(std::string_view text, ReportFile& file) {
   const char* const end = text.data() + text.size();
@@ -96,10 +104,10 @@ class Builder final : public nlohmann::json_sax<nlohmann::json> {
   std::string problem;
 
   bool null() override {
-    return take([](auto&&...) { return true; });
+    return take([] { return true; });
   }
   bool boolean(bool value) override {
-    return take([&] {
+    return takeAny([&] {
       if (isAt(Level::report, "partial")) report.isPartial = value;
       if (isAt(Level::file, "reference")) file().isReference = value;
       return true;
@@ -171,9 +179,17 @@ class Builder final : public nlohmann::json_sax<nlohmann::json> {
   [[nodiscard]] ReportFile& file() { return report.groups.back().files.back(); }
 
   template <typename Use>
-  [[nodiscard]] bool take(const Use& use) {
+  [[nodiscard]] bool takeAny(const Use& use) {
     bytes_.beginToken();
     return levels_.empty() ? fails("it is no object") : use();
+  }
+  // What is no boolean. A reference must not be taken for another file.
+  template <typename Use>
+  [[nodiscard]] bool take(const Use& use) {
+    return takeAny([&] {
+      return isAt(Level::file, "reference") ? fails("\"reference\" is neither true nor false")
+                                            : use();
+    });
   }
   // Where a number is known, it is whole and not below 0.
   [[nodiscard]] bool otherNumber() {
@@ -198,8 +214,7 @@ class Builder final : public nlohmann::json_sax<nlohmann::json> {
   }
 
   [[nodiscard]] bool start(bool isObject) {
-    bytes_.beginToken();
-    if (levels_.empty() && !isObject) return fails("it is no object");
+    if ((!isObject || !levels_.empty()) && !take([] { return true; })) return false;
     if (levels_.size() == maxDepth) return fails("it is too deep");
     levels_.push_back(levelBelow(isObject));
     if (isIn(Level::group)) report.groups.emplace_back();
@@ -221,15 +236,12 @@ class Builder final : public nlohmann::json_sax<nlohmann::json> {
   }
 
   [[nodiscard]] bool checkFile() {
-    const auto isPath = [](const std::string& path) {
-      return path.starts_with('/') && !Varnel::Platform::isCutShort(path);
-    };
     // Paths that are not UTF-8 are whole in their URLs alone.
     if (!exactPath_.empty()) file().path = std::exchange(exactPath_, {});
     if (!exactNames_.empty()) file().names = std::exchange(exactNames_, {});
-    if (!isPath(file().path)) return fails("a file has no absolute path");
+    if (!isPath(file().path)) return fails("a file has no plain, absolute path");
     for (const std::string& name : file().names)
-      if (!isPath(name)) return fails("a name is no absolute path");
+      if (!isPath(name)) return fails("a name is no plain, absolute path");
     return hasTime_ || fails("a file has no time: " + file().path);
   }
 

@@ -74,8 +74,11 @@ std::optional<Problem> Restoration::begin() {
 
   const auto entries = ports_.journal.entries(record_);
   if (!entries) return problem(entries.error());
+  // Another disk may have had the place of the one that has them: who names it looks again.
+  using enum RemovalJournal::State;
   for (auto entry = entries->rbegin(); entry != entries->rend(); ++entry)
-    if (entry->state == RemovalJournal::State::moved) steps_.push_back({.entry = *entry});
+    if (entry->state == moved || (wanted_ && entry->state == lost))
+      steps_.push_back({.entry = *entry});
   return std::nullopt;
 }
 

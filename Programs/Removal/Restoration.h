@@ -65,7 +65,8 @@ class Restoration final {
     std::string description{};
   };
 
-  /// Without a number it is the last removal that has something to give back.
+  /// Without a number it is the last removal that has something to give back. With one, files that
+  /// its trash did not have are looked for again.
   Restoration(Ports ports, std::optional<std::int64_t> number);
 
   /// Takes the lock, and reads the journal. To be called once, before what follows.

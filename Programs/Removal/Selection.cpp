@@ -6,6 +6,7 @@
 #include <string>
 #include <string_view>
 #include <tuple>
+#include <unordered_map>
 
 #include <Removal/Report.h>
 
@@ -13,9 +14,10 @@ namespace Orvane {
 namespace {
 
 // What a rule compares: the least one stays.
-using Rank = std::tuple<std::int64_t, std::int64_t>;
+using RuleRank = std::tuple<std::int64_t, std::int64_t>;
+using Rank = std::tuple<bool, RuleRank>;
 
-Rank rankOf(const ReportFile& file, KeepRule rule, const Report& report) {
+RuleRank rankOf(const ReportFile& file, KeepRule rule, const Report& report) {
   switch (rule) {
     case KeepRule::oldest:
       return {file.modified, file.nanoseconds};
@@ -33,7 +35,8 @@ Rank rankOf(const ReportFile& file, KeepRule rule, const Report& report) {
   return {root - report.roots.begin(), 0};
 }
 
-Choice choose(const ReportGroup& group, KeepRule rule, const Report& report) {
+Choice choose(const ReportGroup& group, KeepRule rule, const Report& report,
+              const IsPassing& isPassing) {
   const bool hasReference = std::any_of(group.files.begin(), group.files.end(),
                                         [](const ReportFile& file) { return file.isReference; });
   Choice choice;
@@ -42,7 +45,7 @@ Choice choose(const ReportGroup& group, KeepRule rule, const Report& report) {
     const ReportFile& file = group.files[i];
     if (!file.isReference) choice.victims.push_back(i);
     if (file.isReference != hasReference) continue;
-    const Rank rank = rankOf(file, rule, report);
+    const Rank rank = {isPassing(file.path), rankOf(file, rule, report)};
     choice.isTie = best == rank || (choice.isTie && best < rank);
     if (best && *best <= rank) continue;
     best = rank;
@@ -52,25 +55,32 @@ Choice choose(const ReportGroup& group, KeepRule rule, const Report& report) {
   return choice;
 }
 
-std::set<std::string_view> namesOf(const ReportFile& file) {
-  std::set<std::string_view> names(file.names.begin(), file.names.end());
-  names.insert(file.path);
-  return names;
-}
-
-std::optional<Refusal::Reason> objectionTo(const ReportGroup& group, const Choice& choice) {
-  using enum Refusal::Reason;
-  if (choice.kept >= group.files.size()) return unknown;
-  const auto keptNames = namesOf(group.files[choice.kept]);
-  std::set<std::size_t> seen;
-  for (const std::size_t victim : choice.victims) {
-    if (victim >= group.files.size() || !seen.insert(victim).second) return unknown;
-    const ReportFile& file = group.files[victim];
-    if (file.isReference) return reference;
-    for (const std::string_view name : namesOf(file))
-      if (keptNames.contains(name)) return kept;
+/// All names of the files that stay, and why: whatever group names them.
+class Staying final {
+ public:
+  void add(const ReportFile& file, Refusal::Reason reason) {
+    reasons_.emplace(file.path, reason);
+    for (const std::string& name : file.names) reasons_.emplace(name, reason);
   }
-  return std::nullopt;
+
+  [[nodiscard]] std::optional<Refusal::Reason> objectionTo(const ReportFile& victim) const {
+    if (const auto found = reasons_.find(victim.path); found != reasons_.end())
+      return found->second;
+    for (const std::string& name : victim.names)
+      if (const auto found = reasons_.find(name); found != reasons_.end()) return found->second;
+    return std::nullopt;
+  }
+
+ private:
+  std::unordered_map<std::string_view, Refusal::Reason> reasons_;
+};
+
+bool isKnown(const ReportGroup& group, const Choice& choice) {
+  std::set<std::size_t> seen;
+  return choice.kept < group.files.size() &&
+         std::all_of(choice.victims.begin(), choice.victims.end(), [&](std::size_t victim) {
+           return victim < group.files.size() && seen.insert(victim).second;
+         });
 }
 
 }  // namespace
@@ -80,10 +90,10 @@ bool isBelow(std::string_view path, std::string_view folder) {
   return path.starts_with(folder) && path.substr(folder.size()).starts_with('/');
 }
 
-Selection select(const Report& report, KeepRule rule) {
+Selection select(const Report& report, KeepRule rule, const IsPassing& isPassing) {
   Selection selection;
   for (std::size_t i = 0; i < report.groups.size(); ++i) {
-    Choice choice = choose(report.groups[i], rule, report);
+    Choice choice = choose(report.groups[i], rule, report, isPassing);
     choice.group = i;
     if (!choice.victims.empty()) selection.push_back(std::move(choice));
   }
@@ -91,14 +101,23 @@ Selection select(const Report& report, KeepRule rule) {
 }
 
 std::optional<Refusal> check(const Report& report, const Selection& selection) {
+  using enum Refusal::Reason;
+  Staying staying;
+  for (const ReportGroup& group : report.groups)
+    for (const ReportFile& file : group.files)
+      if (file.isReference) staying.add(file, reference);
   std::set<std::size_t> seen;
   for (std::size_t i = 0; i < selection.size(); ++i) {
     const Choice& choice = selection[i];
-    if (choice.group >= report.groups.size() || !seen.insert(choice.group).second)
-      return Refusal{.reason = Refusal::Reason::unknown, .choice = i};
-    if (const auto reason = objectionTo(report.groups[choice.group], choice))
-      return Refusal{.reason = *reason, .choice = i};
+    if (choice.group >= report.groups.size() || !seen.insert(choice.group).second ||
+        !isKnown(report.groups[choice.group], choice))
+      return Refusal{.reason = unknown, .choice = i};
+    staying.add(report.groups[choice.group].files[choice.kept], kept);
   }
+  for (std::size_t i = 0; i < selection.size(); ++i)
+    for (const std::size_t victim : selection[i].victims)
+      if (const auto reason = staying.objectionTo(report.groups[selection[i].group].files[victim]))
+        return Refusal{.reason = *reason, .choice = i};
   return std::nullopt;
 }
 

@@ -3,7 +3,9 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <optional>
+#include <string>
 #include <vector>
 
 namespace Orvane {
@@ -31,16 +33,22 @@ struct Choice {
 /// What is to be removed, and what stays for it. A plain value, made by a rule or by hand.
 using Selection = std::vector<Choice>;
 
-/// Keeps one file of each group by the rule, and of each that has references one of those. All
-/// others are victims, but for references. Groups with nothing to remove have no choice.
-[[nodiscard]] Selection select(const Report& report, KeepRule rule);
+/// Whether a file may be gone at any moment, by its path.
+using IsPassing = std::function<bool(const std::string& path)>;
+
+/// Keeps one file of each group by the rule, and of each that has references one of those; one that
+/// is passing only where all are. All others are victims, but for references. Groups with nothing
+/// to remove have no choice.
+[[nodiscard]] Selection select(
+    const Report& report, KeepRule rule,
+    const IsPassing& isPassing = [](const std::string&) { return false; });
 
 /// Why a selection must not be acted on, and where.
 struct Refusal {
   enum class Reason {
     unknown,    ///< No such group or file, or one named twice.
-    kept,       ///< The file that stays is among the victims, under this or another name.
-    reference,  ///< A victim is a reference.
+    kept,       ///< A victim is a file that stays, of any group and by any of its names.
+    reference,  ///< Likewise a reference.
   };
 
   Reason reason = Reason::unknown;

@@ -33,6 +33,7 @@ struct FileStatus {
   std::int64_t modifiedAt = 0;  ///< Nanoseconds since 1970.
   std::uint64_t allocated = 0;  ///< Bytes that it takes up: none for its holes.
   std::uint32_t links = 1;      ///< Its names, wherever they are.
+  std::int64_t changedAt = 0;   ///< As `modifiedAt`, of the status: nobody can set it.
 
   /// Whether both are the same state of one file's content.
   [[nodiscard]] bool hasContentOf(const FileStatus& other) const {

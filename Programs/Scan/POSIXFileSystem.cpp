@@ -76,15 +76,19 @@ Descriptor openWithoutLinks(int base, std::string_view path, int flags) {
   }
 }
 
+// A moment that no 64 bits hold wraps around; it is still another than those near it.
+std::int64_t nanosecondsOf(const struct timespec& moment) {
+  return static_cast<std::int64_t>(static_cast<std::uint64_t>(moment.tv_sec) * 1'000'000'000 +
+                                   static_cast<std::uint64_t>(moment.tv_nsec));
+}
+
 FileStatus statusFrom(const struct stat& facts) {
-  // A moment that no 64 bits hold wraps around; it is still another than those near it.
-  const auto modifiedAt = static_cast<std::uint64_t>(facts.st_mtim.tv_sec) * 1'000'000'000 +
-                          static_cast<std::uint64_t>(facts.st_mtim.tv_nsec);
   return {.identity = {.device = facts.st_dev, .inode = facts.st_ino},
           .size = static_cast<std::uint64_t>(facts.st_size),
-          .modifiedAt = static_cast<std::int64_t>(modifiedAt),
+          .modifiedAt = nanosecondsOf(facts.st_mtim),
           .allocated = static_cast<std::uint64_t>(facts.st_blocks) * 512,
-          .links = static_cast<std::uint32_t>(facts.st_nlink)};
+          .links = static_cast<std::uint32_t>(facts.st_nlink),
+          .changedAt = nanosecondsOf(facts.st_ctim)};
 }
 
 class DescriptorFile final : public OpenFile {

@@ -41,10 +41,12 @@ Wording wordingOf(Outcome outcome) {
       return {"packaged", "owned by the package system (--allow-packaged)"};
     case Outcome::hardLinked:
       return {"hard link", "with other hard links, so that nothing is freed (--allow-hard-links)"};
+    case Outcome::inTrash:
+      return {"in trash", "in the trash already, or of which the one to stay is"};
     case Outcome::changed:
       return {"changed", "of a group that has changed since the report"};
     case Outcome::different:
-      return {"different", "whose content is not that of the file that stays"};
+      return {"different", "that differ from the one that stays, or are that very file"};
     case Outcome::unreadable:
       return {"unreadable", "that cannot be read, or whose group cannot"};
     case Outcome::noAccess:

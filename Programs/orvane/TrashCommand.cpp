@@ -27,7 +27,8 @@ std::string textOf(const Removal::Problem& problem) {
   using enum Removal::Problem::Reason;
   switch (problem.reason) {
     case selection:
-      return "the report names a file twice in one group (" + problem.description + ")";
+      return "the report names a file that stays also as one that goes (" + problem.description +
+             ")";
     case noTrash:
       return "there is no trash for \"" + problem.path + "\"";
     case packages:
@@ -68,9 +69,10 @@ int TrashCommand::run(Console& console) const {
   const Interruption interruption(control.isCancelled);
   const auto report = reportFrom(operands, console, control);
   if (!report) return interruption.signal() != 0 ? 128 + interruption.signal() : 1;
-  const Selection selection = select(*report, keep);
-
   const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
+  const Selection selection = select(
+      *report, keep, [&](const std::string& path) { return ports.trash.get().isInTrash(path); });
+
   RemovalJournal journal({ports.privateFiles, ports.systemLog}, RemovalJournal::productPath());
   DpkgFiles packagedFiles;
   Removal removal({.fileSystem = systemFileSystem(CacheUse::traceless),

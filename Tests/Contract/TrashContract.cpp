@@ -35,6 +35,8 @@ TEST_P(TrashContract, TakesFilesAndGivesBackThoseVeryOnes) {
     EXPECT_EQ(moved->state, state);
     EXPECT_FALSE(world->exists(path));
     EXPECT_EQ(*trash.folderFor(world->folder() + "/a/other"), moved->folder);
+    EXPECT_TRUE(trash.isInTrash(moved->folder + "/files/" + moved->name));
+    EXPECT_FALSE(trash.isInTrash(moved->path));
     gone.push_back(*moved);
     EXPECT_THAT(*trash.contents(moved->folder), testing::UnorderedElementsAreArray(gone));
   }

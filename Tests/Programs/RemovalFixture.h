@@ -49,6 +49,7 @@ class MeddledTrash final : public Trash {
     if (state && devices.contains(path)) state->device = devices[path];
     return state;
   }
+  bool isInTrash(const std::string& path) override { return system_.isInTrash(path); }
   Varnel::Platform::Result<std::string, TrashError> folderFor(const std::string& path) override {
     if (!folderWithoutTrash.empty() && path.starts_with(folderWithoutTrash))
       return TrashError{.reason = TrashError::Reason::noTrash};
@@ -146,8 +147,8 @@ class RemovalFixture : public ::testing::Test {
   }
 
   /// Makes every step, and returns what came of each.
-  std::vector<Outcome> removeAll() {
-    Removal removal = makeRemoval();
+  std::vector<Outcome> removeAll(Allowances allowances = {.hiddenFolders = true}) {
+    Removal removal = makeRemoval(allowances);
     EXPECT_FALSE(removal.prepare());
     EXPECT_FALSE(removal.begin());
     afterPreparing();

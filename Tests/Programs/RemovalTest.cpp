@@ -55,6 +55,7 @@ TEST_F(RemovalFixture, LeavesWhatIsNotAsItWas) {
   };
   const auto swapForEqual = [](const std::string& file) {
     fs::copy_file(file, file + " new");
+    fs::last_write_time(file + " new", fs::last_write_time(file));
     fs::rename(file + " new", file);
   };
   const auto linkToThird = [this](const std::string& file) {
@@ -125,6 +126,11 @@ TEST_F(RemovalFixture, LeavesWhatCannotBeComparedOrNoted) {
     trash.answer = TrashError{.reason = reason};
     EXPECT_THAT(removeAll(), ElementsAre(outcome, outcome));
   }
+  EXPECT_THAT(*journal.removals(), IsEmpty());
+  const TrashedFile stranger{.folder = "/trash", .name = "b", .path = path("b"), .state = {}};
+  trash.answer = TrashError{.reason = TrashError::Reason::misplaced, .file = stranger};
+  EXPECT_THAT(removeAll(), ElementsAre(misplaced, misplaced));
+  EXPECT_EQ(journal.entries(journal.removals()->at(0))->at(0).file, stranger);
   trash.answer.reset();
 
   using Varnel::Platform::Testing::Fault;
@@ -135,6 +141,39 @@ TEST_F(RemovalFixture, LeavesWhatCannotBeComparedOrNoted) {
   EXPECT_THAT(removeAll(), ElementsAre(moved, stopped));
   EXPECT_EQ(totals.notMoved, 1u);
   EXPECT_EQ(copiesInTrash("same"), 1);
+}
+
+TEST_F(RemovalFixture, LeavesWhatIsNoCopy) {
+  const std::string large(3 << 20, 'x');
+  write("large", large + "1"), write("large, changed", large + "2");
+  report({"large", "large, changed"});
+  write("a", "same");
+  for (const char* name : {"hard link", "seen through another mount"}) {
+    fs::create_hard_link(path("a"), path(name));
+    report({"a", name});
+  }
+  fileSystem.devices[path("seen through another mount")] = 77;
+  trash.devices = fileSystem.devices;
+  EXPECT_THAT(removeAll({.otherFileSystems = true, .hardLinks = true}),
+              ElementsAre(different, different, different));
+}
+
+TEST_F(RemovalFixture, PutsBackWhatHasBecomeTheLastOne) {
+  for (const char* name : {"a", "b", "c"}) write(name, "same");
+  report({"a", "b", "c"});
+  trash.afterMove = [&] { fs::remove(path("a")); };
+  EXPECT_THAT(removeAll(), ElementsAre(changed, changed));
+  EXPECT_EQ(bytes(path("b")) + bytes(path("c")), "samesame");
+  EXPECT_THAT(*journal.removals(), IsEmpty());
+  trash.afterMove = [] {};
+
+  write("a", "same");
+  selection.clear();
+  report({"a", "b"});
+  selection[0].group = 1;
+  trash.afterNote = [&] { write("b", "new"); };
+  EXPECT_THAT(removeAll(), ElementsAre(changed));
+  EXPECT_THAT(*journal.removals(), IsEmpty()) << "of what was not moved there is no note";
 }
 
 TEST_F(RemovalFixture, MovesOnlyWhatIsAllowed) {
@@ -158,11 +197,29 @@ TEST_F(RemovalFixture, MovesOnlyWhatIsAllowed) {
   EXPECT_EQ(allowed.steps()[4].otherNames, 1u);
   EXPECT_EQ(allowed.totals().plannedBytes, 16u) << "the third name keeps those of e";
 
-  // A folder that was named to the scan is no secret.
-  found.roots = {path(".hidden")};
-  Removal named = makeRemoval({});
-  ASSERT_FALSE(named.prepare());
-  EXPECT_EQ(outcomes(named).at(0), planned);
+  // A folder that was named to the scan is no secret, what is hidden in it is.
+  for (const auto& [root, outcome] :
+       {std::pair{path(".hidden"), planned}, {path("") + "/", inHiddenFolder}}) {
+    found.roots = {root};
+    Removal named = makeRemoval({});
+    ASSERT_FALSE(named.prepare());
+    EXPECT_EQ(outcomes(named).at(0), outcome) << root;
+  }
+}
+
+// Or else emptying the trash would take the last one.
+TEST_F(RemovalFixture, CountsOnNothingThatIsInATrash) {
+  for (const std::string old : {".Trash-1000/files/a", ".local/share/Trash/files/a",
+                                "$RECYCLE.BIN/S-1/$RA.jpg", "user/.Trashes/501/a"}) {
+    write(old, "same"), write("b", "same");
+    found.groups.clear();
+    report({old, "b"});
+    for (const Choice& choice : {Choice{.kept = 0, .victims = {1}}, {.kept = 1, .victims = {0}}}) {
+      selection = {choice};
+      EXPECT_THAT(removeAll(), ElementsAre(inTrash)) << old;
+      EXPECT_EQ(bytes(path("b")) + bytes(path(old)), "samesame");
+    }
+  }
 }
 
 TEST_F(RemovalFixture, BeginsOnlyWhereItCanEnd) {
@@ -200,6 +257,7 @@ TEST_F(RemovalFixture, BeginsOnlyWhereItCanEnd) {
 TEST_F(RemovalFixture, RestoresOnlyWhatCanComeBack) {
   for (const char* name : {"a", "b", "c", "d", "e"}) write(name, "same");
   report({"a", "b", "c", "d", "e"});
+  const auto timeOfD = fs::last_write_time(path("d"));
   // The process ends right before the last move.
   int notes = 0;
   struct Killed {};
@@ -210,20 +268,48 @@ TEST_F(RemovalFixture, RestoresOnlyWhatCanComeBack) {
   trash.afterNote = [] {};
   EXPECT_EQ(copiesInTrash("same"), 3);
 
-  for (const TrashedFile& file : trashed())
-    if (file.path == path("c"))
-      fs::remove(placeOf(file)), fs::remove(file.folder + "/info/" + file.name + ".trashinfo");
+  const TrashedFile fileC = trashed().at(1);
+  for (const char* part : {"/info/c.trashinfo", "/files/c"})
+    fs::rename(fileC.folder + part, fileC.folder + part + " away");
   write("d", "new");
+  fs::last_write_time(path("d"), timeOfD);
   EXPECT_THAT(outcomesOf(restore()),
               ElementsAre(RestoreOutcome::inPlace, RestoreOutcome::occupied,
                           RestoreOutcome::emptied, RestoreOutcome::restored));
   EXPECT_EQ(bytes(path("d")), "new");
   fs::remove(path("d"));
-  EXPECT_THAT(outcomesOf(restore(1)), ElementsAre(RestoreOutcome::restored));
+  fs::rename(home.path() / "data", home.path() / "disk that is not there");
+  EXPECT_THAT(outcomesOf(restore(1)),
+              ElementsAre(RestoreOutcome::noTrash, RestoreOutcome::noTrash));
+  fs::remove_all(home.path() / "data");
+  fs::rename(home.path() / "disk that is not there", home.path() / "data");
+  for (const char* part : {"/info/c.trashinfo", "/files/c"})
+    fs::rename(fileC.folder + part + " away", fileC.folder + part);
+  EXPECT_THAT(outcomesOf(restore(1)),
+              ElementsAre(RestoreOutcome::restored, RestoreOutcome::restored));
   EXPECT_THAT(restore(1), IsEmpty());
   Restoration none(
       {.disks = Varnel::DiskAccessManager::shared(), .trash = trash, .journal = journal}, {});
   EXPECT_EQ(none.begin()->reason, Restoration::Problem::Reason::unknown);
+}
+
+TEST_F(RemovalFixture, IsKnownUntilNothingIsLeftOfIt) {
+  write("a", "same");
+  const auto removeB = [&] {
+    found.groups.clear();
+    selection.clear();
+    write("b", "same");
+    report({"a", "b"});
+    EXPECT_THAT(removeAll(), ElementsAre(moved));
+  };
+  removeB(), removeB();
+  for (int removal = 2; removal > 0; --removal) {
+    EXPECT_THAT(outcomesOf(restore()), ElementsAre(RestoreOutcome::restored)) << removal;
+    fs::remove(path("b"));
+  }
+  removeB();
+  ASSERT_EQ(journal.removals()->size(), 1u);
+  EXPECT_EQ(journal.removals()->at(0).number, 3);
 }
 
 TEST(DpkgFiles, AreThoseOfTheLists) {

@@ -62,8 +62,14 @@ TEST(Report, IsRefusedWithTheReason) {
       {R"({"schemaVersion": 1, "groups": [)", "ends too early"},
       {R"({"schemaVersion": 1} {})", "not JSON"},
       {R"({"schemaVersion": 1, "groups": [{"size": 1.5}]})", "odd number"},
-      {withFile(R"("path": "a", "modified": "1.000000000")"), "no absolute path"},
-      {withFile(R"("path": "/a\u0000b", "modified": "1.000000000")"), "no absolute path"},
+      {withFile(R"("path": "a", "modified": "1.000000000")"), "no plain, absolute path"},
+      {withFile(R"("path": "/a\u0000b", "modified": "1.000000000")"), "no plain, absolute path"},
+      {withFile(R"("path": "/a/../b", "modified": "1.000000000")"), "no plain, absolute path"},
+      {withFile(R"("path": "/a/.", "modified": "1.000000000")"), "no plain, absolute path"},
+      {withFile(R"("path": "/a//b", "modified": "1.000000000")"), "no plain, absolute path"},
+      {withFile(R"("path": "/a/", "modified": "1.000000000")"), "no plain, absolute path"},
+      {withFile(R"("reference": "true")"), "neither true nor false"},
+      {withFile(R"("reference": [true])"), "neither true nor false"},
       {withFile(R"("path": "/a", "names": ["b"], "modified": "1.000000000")"), "absolute"},
       {withFile(R"("path": "/a", "url": "https://quennel.example/a")"), "URL"},
       {withFile(R"("path": "/a")"), "no time"},
@@ -114,14 +120,20 @@ TEST(Selection, KeepsOneFileByTheRuleAndSaysWhereItIsATie) {
     EXPECT_FALSE(check(oneGroup(row.files), selection)) << &row - rows;
   }
   EXPECT_EQ(select(oneGroup({early}), KeepRule::oldest), Selection{});
+  const auto isEarly = [](const std::string& path) { return path.ends_with("/early"); };
+  const Selection lasting{{.kept = 1, .victims = {0, 2}}};
+  EXPECT_EQ(select(oneGroup({early, later, latest}), KeepRule::oldest, isEarly), lasting);
   EXPECT_EQ(select(oneGroup({stays, staysToo}), KeepRule::oldest), Selection{});
 }
 
 TEST(Selection, NeverTakesTheLastFileOrAReference) {
-  const Report report = oneGroup({{.path = "/a"},
-                                  {.path = "/b", .names = {"/a"}},
-                                  {.path = "/c", .isReference = true},
-                                  {.path = "/d", .names = {"/e"}}});
+  Report report = oneGroup({{.path = "/a"},
+                            {.path = "/b", .names = {"/a"}},
+                            {.path = "/c", .names = {"/f"}, .isReference = true},
+                            {.path = "/d", .names = {"/e"}}});
+  // Whoever writes this names some files again.
+  report.groups.push_back(
+      {.files = {{.path = "/g"}, {.path = "/e"}, {.path = "/h", .names = {"/f"}}}});
   using enum Refusal::Reason;
   const struct {
     Selection selection;
@@ -135,7 +147,9 @@ TEST(Selection, NeverTakesTheLastFileOrAReference) {
       {{{.kept = 0, .victims = {3, 3}}}, unknown},
       {{{.kept = 4, .victims = {3}}}, unknown},
       {{{.kept = 0, .victims = {4}}}, unknown},
-      {{{.group = 1}}, unknown},
+      {{{.group = 2}}, unknown},
+      {{{.kept = 3, .victims = {0}}, {.group = 1, .kept = 0, .victims = {1}}}, kept},
+      {{{.group = 1, .kept = 0, .victims = {2}}}, reference},
       {{{.kept = 0, .victims = {3}}, {.kept = 3, .victims = {0}}}, unknown},
   };
   for (const auto& row : rows) {

@@ -152,8 +152,9 @@ class FaultyFileSystem final : public FileSystem {
   std::map<std::string, std::errc> interruptions;  ///< Of listings.
   std::map<std::string, std::errc> openFaults;
   std::map<std::string, std::errc> readFaults;
-  std::map<std::string, std::uint64_t> places;  ///< Where given, of all files.
-  std::map<std::string, SharedExtents> shared;  ///< Where given, of all files.
+  std::map<std::string, std::uint64_t> places;     ///< Where given, of all files.
+  std::map<std::string, std::uint64_t> devices{};  ///< Where given, of files.
+  std::map<std::string, SharedExtents> shared;     ///< Where given, of all files.
   std::function<void(const std::string& path)> beforeOpenFolder;
   std::function<void(const std::string& path)> beforeList;
   std::function<void(const std::string& path)> beforeOpen;
@@ -189,7 +190,12 @@ class FaultyFileSystem final : public FileSystem {
       return file_->read(offset, buffer);
     }
 
-    FileResult<FileStatus> status() override { return file_->status(); }
+    FileResult<FileStatus> status() override {
+      auto status = file_->status();
+      if (status && owner_.devices.contains(path_))
+        status->identity.device = owner_.devices.at(path_);
+      return status;
+    }
 
     std::optional<std::uint64_t> place() override {
       ++owner_.placesAsked;

@@ -89,7 +89,7 @@ Result<Place, TrashError> presentPlace(const std::string& path) {
 // What is in the trash stays as it is: its first place would be forgotten.
 Result<Place, TrashError> placeOutsideTrash(const std::string& path) {
   auto place = presentPlace(path);
-  if (place && TrashFolder::isInOne(place->folder, homePath())) return noTrash({});
+  if (place && TrashFolder::isInOne(place->folder.path + "/", homePath())) return noTrash({});
   return place;
 }
 
@@ -114,6 +114,10 @@ class DesktopTrash final : public Trash {
     if (!place) return place.error();
     if (const auto state = place->state()) return *state;
     return TrashError{.reason = Reason::changed};
+  }
+
+  bool isInTrash(const std::string& path) override {
+    return TrashFolder::isInOne(path, homePath());
   }
 
   Result<std::string, TrashError> folderFor(const std::string& path) override {

@@ -22,6 +22,10 @@ using POSIX::lastError;
 
 constexpr std::string_view sharedName = ".Trash";
 constexpr std::string_view ownPrefix = ".Trash-";
+// Of volumes, of other users, and of the other systems that a volume comes from.
+constexpr std::string_view namesOfTrashes[] = {
+    "/.Trash-",   "/.Trash/",       "/.local/share/Trash/",
+    "/.Trashes/", "/$RECYCLE.BIN/", "/$Recycle.Bin/"};
 constexpr std::size_t maxInfoSize = 64u << 10;
 constexpr long maxName = 255;
 
@@ -130,10 +134,11 @@ Result<TrashFolder, std::error_code> TrashFolder::ofVolume(const HeldFolder& fol
   return openOwnIn(folder.volume.get(), std::string(ownPrefix) + user, folder.volumePath);
 }
 
-bool TrashFolder::isInOne(const HeldFolder& folder, const std::string& home) {
-  const std::string path = folder.path + "/";
-  return path.starts_with(home + "/") || path.find("/" + std::string(ownPrefix)) != path.npos ||
-         path.find("/" + std::string(sharedName) + "/") != path.npos;
+bool TrashFolder::isInOne(std::string_view path, const std::string& home) {
+  const std::string_view folder = path.substr(0, path.rfind('/') + 1);
+  return folder.starts_with(home + "/") ||
+         std::any_of(std::begin(namesOfTrashes), std::end(namesOfTrashes),
+                     [&](std::string_view name) { return folder.find(name) != folder.npos; });
 }
 
 // Some file systems count characters, and tell how many bytes those could be.

@@ -40,8 +40,8 @@ class TrashFolder final {
   /// The user's on the volume that the folder lies on. What is missing is made.
   [[nodiscard]] static Result<TrashFolder, std::error_code> ofVolume(const HeldFolder& folder);
 
-  /// Whether the folder lies in a trash, at home or of a volume.
-  [[nodiscard]] static bool isInOne(const HeldFolder& folder, const std::string& home);
+  /// Whether the path lies in the trash `home`, or in what has the name of another one.
+  [[nodiscard]] static bool isInOne(std::string_view path, const std::string& home);
 
   [[nodiscard]] const std::string& path() const { return path_; }
   [[nodiscard]] int files() const { return files_.get(); }

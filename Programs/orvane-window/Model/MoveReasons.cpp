@@ -26,6 +26,8 @@ std::string textOf(RemovalStep::Outcome outcome, std::error_code code) {
       return localized("Reason_Packaged");
     case Outcome::hardLinked:
       return localized("Reason_HardLinked");
+    case Outcome::inTrash:
+      return localized("Reason_InTrash");
     case Outcome::changed:
       return localized("Reason_Changed");
     case Outcome::different:
