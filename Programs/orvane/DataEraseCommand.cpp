@@ -47,7 +47,7 @@ int DataEraseCommand::run(Console& console) const {
   }
   for (const std::string& folder : folders)
     if (std::error_code error; !fs::remove(folder, error) && error && isAllGone)
-      text += "left " + pathText(folder) + ": it holds something else\n";
+      text += "left " + pathText(folder) + ": it holds other files, or new ones\n";
   if (!console.writeResult(text)) return 1;
   return isAllGone ? 0 : someNotMoved;
 }

@@ -24,7 +24,7 @@ using Varnel::Platform::PrivateFiles;
 using Varnel::Platform::UserNotificationCenter;
 
 constexpr auto pause = std::chrono::milliseconds(10);
-constexpr auto maxWait = std::chrono::seconds(2);
+constexpr auto maxWait = std::chrono::seconds(1);
 
 PrivateFiles& privateFiles() {
   return Varnel::Platform::processPorts().privateFiles;
