@@ -1,8 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/DataErasure.h>
 
-#include <algorithm>
-#include <filesystem>
+#include <chrono>
 #include <memory>
 #include <thread>
 
@@ -18,7 +17,6 @@
 namespace Orvane {
 namespace {
 
-namespace fs = std::filesystem;
 using Varnel::Platform::FileLock;
 using Varnel::Platform::PrivateFiles;
 using Varnel::Platform::UserNotificationCenter;
@@ -53,14 +51,8 @@ class Locks final {
 
 // The order is that of the part: locks, which are held, come last.
 void removeFiles(const DataPart& part, Erasure& erasure) {
-  for (const DataFile& file : filesOf(part)) {
-    std::error_code error;
-    if (file.objection) {
-      erasure.left.push_back({file.path, *file.objection});
-    } else if (!fs::remove(file.path, error) && error) {
-      erasure.left.push_back({file.path, error.message()});
-    }
-  }
+  for (const DataFile& file : filesOf(part))
+    if (const auto reason = removeFile(file)) erasure.left.push_back({file.path, *reason});
 }
 
 // Whoever shows their banners takes them away, and forgets what it was to show.

@@ -21,7 +21,7 @@ bool isOld(const DataFile& log, Varnel::Platform::Date now) {
 
 void removeOldLogs(Varnel::Platform::Date now) {
   for (const DataFile& log : productLogs())
-    if (std::error_code ignored; !log.objection && isOld(log, now)) fs::remove(log.path, ignored);
+    if (!log.objection && isOld(log, now)) static_cast<void>(removeFile(log));
 }
 
 }  // namespace Orvane

@@ -9,6 +9,8 @@
 
 #include <Removal/RemovalJournal.h>
 #include <Varnel/Context/ApplicationData.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/PrivateFiles.h>
 
 namespace Orvane {
 namespace {
@@ -81,6 +83,15 @@ std::vector<DataFile> filesOf(const DataPart& part) {
     for (const auto journal : journals) look(file, journal);
   for (const auto lock : locks) look(lock, {});
   return found;
+}
+
+std::optional<std::string> removeFile(const DataFile& file) {
+  if (file.objection) return file.objection;
+  // Root may be in the home of somebody else.
+  Varnel::Platform::PrivateFiles& files = Varnel::Platform::processPorts().privateFiles;
+  if (const auto path = files.prepare(file.path); !path) return path.error().localizedDescription();
+  const std::error_code failure = files.remove(file.path);
+  return failure ? std::optional(failure.message()) : std::nullopt;
 }
 
 bool hasContent(const DataFile& file) {

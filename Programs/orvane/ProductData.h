@@ -44,6 +44,9 @@ struct DataPart {
 /// The files of a part that are there now.
 [[nodiscard]] std::vector<DataFile> filesOf(const DataPart& part);
 
+/// Removes one that is this user's own; returns why it stays, or nothing.
+[[nodiscard]] std::optional<std::string> removeFile(const DataFile& file);
+
 /// Whether it holds what a part keeps, and is no lock or journal beside that.
 [[nodiscard]] bool hasContent(const DataFile& file);
 

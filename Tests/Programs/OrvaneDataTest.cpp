@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <gmock/gmock.h>
+#include <unistd.h>
 
 #include <chrono>
 #include <filesystem>
@@ -140,6 +141,21 @@ TEST_F(OrvaneData, LeavesToOthersWhatTheyAreAtWorkWith) {
   EXPECT_THAT(run({"data", "erase", "--yes"}).output, HasSubstr("what was in it is gone\n"));
   EXPECT_TRUE(journal.removals()->empty());
   EXPECT_THAT(read(path) + read(path + "-wal"), Not(HasSubstr(folder.path())));
+}
+
+// Root may run with the home of somebody else.
+TEST_F(OrvaneData, TouchesNothingOfAnotherUser) {
+  keepAll();
+  std::ofstream(logs + "2020-01-01.log") << "x";
+  fs::last_write_time(logs + "2020-01-01.log",
+                      fs::file_time_type::clock::now() - std::chrono::days(31));
+  const auto files = allFiles();
+  for (const std::string& each : files)
+    if (::chown(each.c_str(), 1234, static_cast<gid_t>(-1)) != 0) GTEST_SKIP() << "not root";
+  for (const std::string& each : {settings, state, logs})
+    ASSERT_EQ(::chown(fs::path(each).parent_path().c_str(), 1234, static_cast<gid_t>(-1)), 0);
+  EXPECT_EQ(run({"data", "erase", "--yes"}).status, 3);
+  EXPECT_EQ(allFiles(), files);
 }
 
 TEST_F(OrvaneData, RemovesLogsThirtyDaysAfterTheirLastEntry) {
