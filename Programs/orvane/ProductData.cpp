@@ -19,7 +19,7 @@ namespace fs = std::filesystem;
 
 // A file comes first, then what nobody must take for another file's: its journals, and what was set
 // aside or half written. Locks come last.
-constexpr std::array<std::string_view, 4> files = {"", ".salvage", ".damaged", ".new"};
+constexpr std::array<std::string_view, 4> contents = {"", ".salvage", ".damaged", ".new"};
 constexpr std::array<std::string_view, 4> journals = {"", "-journal", "-wal", "-shm"};
 constexpr std::array<std::string_view, 4> locks = {".deliverer", ".removing", ".lock", ".opening"};
 
@@ -79,7 +79,7 @@ std::vector<DataFile> filesOf(const DataPart& part) {
     if (auto file = fileAt(part.path + std::string(suffix) + std::string(more)))
       found.push_back(*std::move(file));
   };
-  for (const auto file : files)
+  for (const auto file : contents)
     for (const auto journal : journals) look(file, journal);
   for (const auto lock : locks) look(lock, {});
   return found;
