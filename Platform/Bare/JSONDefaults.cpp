@@ -76,8 +76,8 @@ void JSONDefaults::complain(const std::string& trouble) const {
 
 std::unique_ptr<ApplicationStorage> makeApplicationStorage(PrivateFiles& files,
                                                            SystemLog& systemLog) {
-  return POSIX::makeApplicationStorage([&](const std::string& folder) {
-    return std::make_unique<JSONDefaults>(files, systemLog, folder + "/settings.json");
+  return POSIX::makeApplicationStorage("settings.json", [&](const std::string& path) {
+    return std::make_unique<JSONDefaults>(files, systemLog, path);
   });
 }
 

@@ -27,10 +27,10 @@ namespace Varnel::Platform::POSIX {
 
 [[nodiscard]] std::unique_ptr<AppendFiles> makeAppendFiles();
 
-/// The settings of an application, whose files lie in `folder`, in the form that the system has for
-/// them.
-using MakeDefaults = std::function<std::unique_ptr<UserDefaults>(const std::string& folder)>;
-[[nodiscard]] std::unique_ptr<ApplicationStorage> makeApplicationStorage(MakeDefaults makeDefaults);
+/// The settings of an application in the file at `path`, whose name and form the system chooses.
+using MakeDefaults = std::function<std::unique_ptr<UserDefaults>(const std::string& path)>;
+[[nodiscard]] std::unique_ptr<ApplicationStorage> makeApplicationStorage(std::string settingsName,
+                                                                         MakeDefaults makeDefaults);
 
 [[nodiscard]] std::unique_ptr<Clock> makeClock();
 [[nodiscard]] std::unique_ptr<CookieStorage> makeCookieStorage(const ProcessInfo& process,

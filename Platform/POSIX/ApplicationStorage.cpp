@@ -15,13 +15,18 @@ namespace {
 
 class UserFoldersStorage final : public ApplicationStorage {
  public:
-  explicit UserFoldersStorage(MakeDefaults makeDefaults) : makeDefaults_(std::move(makeDefaults)) {}
+  UserFoldersStorage(std::string settingsName, MakeDefaults makeDefaults)
+      : settingsName_(std::move(settingsName)), makeDefaults_(std::move(makeDefaults)) {}
 
   UserDefaults& userDefaults(const std::string& identifier) override {
     const std::lock_guard lock(mutex_);
     auto& defaults = defaults_[identifier];
-    if (!defaults) defaults = makeDefaults_(settingsFolder(identifier).string());
+    if (!defaults) defaults = makeDefaults_(settingsPath(identifier));
     return *defaults;
+  }
+
+  std::string settingsPath(const std::string& identifier) const override {
+    return (settingsFolder(identifier) / settingsName_).string();
   }
 
   std::string analyticsSpoolPath(const std::string& identifier) const override {
@@ -29,6 +34,7 @@ class UserFoldersStorage final : public ApplicationStorage {
   }
 
  private:
+  const std::string settingsName_;
   const MakeDefaults makeDefaults_;
   std::mutex mutex_;  ///< Owns `defaults_`.
   std::map<std::string, std::unique_ptr<UserDefaults>> defaults_;
@@ -36,8 +42,9 @@ class UserFoldersStorage final : public ApplicationStorage {
 
 }  // namespace
 
-std::unique_ptr<ApplicationStorage> makeApplicationStorage(MakeDefaults makeDefaults) {
-  return std::make_unique<UserFoldersStorage>(std::move(makeDefaults));
+std::unique_ptr<ApplicationStorage> makeApplicationStorage(std::string settingsName,
+                                                           MakeDefaults makeDefaults) {
+  return std::make_unique<UserFoldersStorage>(std::move(settingsName), std::move(makeDefaults));
 }
 
 }  // namespace Varnel::Platform::POSIX

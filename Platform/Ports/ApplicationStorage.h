@@ -25,6 +25,10 @@ class VARNEL_API ApplicationStorage {
   /// this one.
   [[nodiscard]] virtual UserDefaults& userDefaults(const std::string& identifier) = 0;
 
+  /// The absolute path of the file with the settings. Beside it may lie others whose names begin
+  /// with its own. Neither the file nor its folder need exist.
+  [[nodiscard]] virtual std::string settingsPath(const std::string& identifier) const = 0;
+
   /// The absolute path of the file where an application's analytics events wait. Neither the file
   /// nor its folder need exist.
   [[nodiscard]] virtual std::string analyticsSpoolPath(const std::string& identifier) const = 0;

@@ -24,6 +24,9 @@ class FakeApplicationStorage final : public ApplicationStorage {
     const std::lock_guard lock(mutex_);
     return userDefaults_[identifier];
   }
+  [[nodiscard]] std::string settingsPath(const std::string& identifier) const override {
+    return folder_ + '/' + fileNameFor(identifier) + "/settings";
+  }
   [[nodiscard]] std::string analyticsSpoolPath(const std::string& identifier) const override {
     return folder_ + '/' + fileNameFor(identifier) + "/analytics.sqlite";
   }

@@ -13,6 +13,8 @@ namespace Orvane {
 [[nodiscard]] std::vector<Command> duplicateCommands();
 /// Those that remove them, give them back, or let them share their place.
 [[nodiscard]] std::vector<Command> removalCommands();
+/// Those that tell what the program has kept, and erase it.
+[[nodiscard]] std::vector<Command> dataCommands();
 /// Those that explain the program.
 [[nodiscard]] std::vector<Command> selfCommands();
 /// Those that show the framework's services.

@@ -24,8 +24,8 @@ CommandTable::CommandTable()
               {.name = "log-to-stdout",
                .description = "Print it on standard output instead",
                .value = flag(wishes, &Wishes::logToStandardOutput)}} {
-  for (const auto& group :
-       {duplicateCommands, removalCommands, selfCommands, serviceCommands, reminderCommands})
+  for (const auto& group : {duplicateCommands, removalCommands, dataCommands, selfCommands,
+                            serviceCommands, reminderCommands})
     for (Command& command : group()) commands.push_back(std::move(command));
 }
 

@@ -42,7 +42,7 @@ inline constexpr ExitStatus exitStatuses[] = {
      "failed: a folder is missing or cannot be opened, the result could not be written, an answer "
      "not kept"},
     {"2", "wrong arguments"},
-    {"3", "some files were not moved, shared or put back"},
+    {"3", "some files were not moved, shared, put back or erased"},
     {"129, 130, 143", "ended by SIGHUP, SIGINT, SIGTERM; a second signal ends it at once"},
     {"141", "the reader of the result went away; nothing is said then"},
 };

@@ -6,10 +6,9 @@
 
 #include <Varnel/Context/ApplicationData.h>
 #include <Varnel/Identification/Analytics/CustomDimensionsHolder.h>
-#include <Varnel/Identification/User/KeptDownloadSource.h>
-#include <Varnel/Identification/User/UserIdentificationInfo.h>
-#include <Varnel/Identification/User/UserIdentificator.h>
+#include <Varnel/Platform/Values/UUID.h>
 #include <orvane/AnalyticsConsent.h>
+#include <orvane/ClientIdentifier.h>
 #include <orvane/Console.h>
 
 namespace Orvane {
@@ -32,13 +31,11 @@ bool isOnThisMachine(const URL& url) {
   return url.hasHost("127.0.0.1") || url.hasHost("localhost") || url.hasHost("[::1]");
 }
 
-// Found here together. The holder would find each by itself, and the download twice.
-void identifyUser() {
-  using Holder = Varnel::CustomDimensionsHolder;
-  const auto user =
-      std::make_shared<Varnel::KeptDownloadSource>(std::make_shared<Varnel::UserIdentificator>());
-  Holder::setClientIdentifier(Varnel::UserIdentificationInfo(user).uniqueClientIdentifier());
-  Holder::setDownloadSourceURL(user->downloadSourceURLString());
+// Without consent there is no identifier to tell runs by: what is printed then shows one of its
+// kind, which nobody keeps.
+void identifyClient(Consent consent) {
+  Varnel::CustomDimensionsHolder::setClientIdentifier(
+      consent == Consent::granted ? keptClientIdentifier() : Varnel::Platform::randomUUIDString());
 }
 
 std::shared_ptr<SpoolingTransport> transportTo(const URL& endpoint) {
@@ -93,7 +90,7 @@ ScanAnalytics::ScanAnalytics(const std::optional<std::string>& endpoint, bool pr
   // The command that kept the refusal may have been killed before it came to that.
   if (endpoint && consent == Consent::refused) discardEvents(std::chrono::milliseconds(0));
   if (!sends && !printsEvents) return;
-  identifyUser();
+  identifyClient(consent);
   if (sends) transport_ = transportTo(*URL::parse(*endpoint));
   auto tracker = std::make_shared<Tallyhouse::AnalyticsTracker>(transport_, consent);
   tracker->setShouldPrintEvents(printsEvents);

@@ -33,6 +33,17 @@ Command consent() {
           .run = runs(command)};
 }
 
+Command reset() {
+  const auto command = std::make_shared<AnalyticsCommand>();
+  command->resets = true;
+  return {.name = "analytics reset",
+          .summary =
+              "Forget the random identifier that events carry, and throw away those that wait; the "
+              "next ones carry another",
+          .output = "The answer to whether events may be sent",
+          .run = runs(command)};
+}
+
 Command identify() {
   const auto command = std::make_shared<IdentifyCommand>();
   return {.name = "identify",
@@ -131,7 +142,7 @@ Command sound() {
 }  // namespace
 
 std::vector<Command> serviceCommands() {
-  return {analytics(), consent(), identify(), link(), menu(), origin(), path(), sound()};
+  return {analytics(), consent(), reset(), identify(), link(), menu(), origin(), path(), sound()};
 }
 
 }  // namespace Orvane

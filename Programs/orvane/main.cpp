@@ -2,10 +2,13 @@
 // orvane: finds duplicate files, reading each disk with no more threads than it bears.
 #include <exception>
 
+#include <Varnel/Platform/Ports/Clock.h>
+#include <Varnel/Platform/Ports/Ports.h>
 #include <orvane/CommandLine.h>
 #include <orvane/Console.h>
 #include <orvane/HelpText.h>
 #include <orvane/LogOutput.h>
+#include <orvane/OldLogs.h>
 #include <orvane/StandardStreams.h>
 
 namespace Orvane {
@@ -25,6 +28,7 @@ int run(int count, const char* const* arguments, Console& console) {
   }
   const auto& invocation = std::get<Invocation>(parsed);
   sendLog(invocation.logOutput, console);
+  removeOldLogs(Varnel::Platform::processPorts().clock.get().now());
   return invocation.command(console);
 }
 

@@ -25,8 +25,14 @@ class VARNEL_API ApplicationData final {
   /// Lives as long as the process.
   [[nodiscard]] static Platform::UserDefaults& settings();
 
+  /// The file with the settings. Beside it may lie others whose names begin with its own.
+  [[nodiscard]] static std::string settingsPath();
+
   /// The file where the events of all the product's processes wait to be sent.
   [[nodiscard]] static std::string analyticsSpoolPath();
+
+  /// The folder with the log of each day, named by it: "2026-03-14.log".
+  [[nodiscard]] static std::string logFolder();
 };
 
 }  // namespace Varnel

@@ -105,6 +105,7 @@ TEST_P(UserDefaultsContract, EachIdentifierHasItsOwnBelowTheUsersFolders) {
   EXPECT_EQ(&storage.userDefaults("com.a.One"), &one);
   EXPECT_EQ(one.set("key", true), std::nullopt);
   EXPECT_EQ(storage.userDefaults("com.a.Two").text("key"), std::nullopt);
+  EXPECT_NE(storage.settingsPath("com.a.One"), storage.settingsPath("com.a.Two"));
   EXPECT_NE(storage.analyticsSpoolPath("com.a.One"), storage.analyticsSpoolPath("com.a.Two"));
   EXPECT_EQ(storage.analyticsSpoolPath("com.a.One"),
             world->storageOfAnother().analyticsSpoolPath("com.a.One"));

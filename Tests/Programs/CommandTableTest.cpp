@@ -2,6 +2,7 @@
 #include <gmock/gmock.h>
 
 #include <fstream>
+#include <iterator>
 #include <nlohmann/json.hpp>
 #include <set>
 #include <sstream>
@@ -106,7 +107,8 @@ TEST_F(Orvane, PrintsTheMembersThatItsHelpNames) {
   std::filesystem::create_hard_link(folder.write("c\xff", "same"), folder.path("d\xff"));
   for (const Command& command : CommandTable().commands) {
     if (command.fields.empty()) continue;
-    std::vector<std::string> arguments = {command.name, "--json"};
+    std::istringstream words(command.name + " --json");
+    std::vector<std::string> arguments{std::istream_iterator<std::string>(words), {}};
     if (command.operands.max > 0) arguments.push_back(folder.path());
     for (const Option& option : command.options)
       if (option.isRequired)

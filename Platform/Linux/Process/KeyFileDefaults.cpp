@@ -86,8 +86,8 @@ void KeyFileDefaults::complain(const std::string& trouble) const {
 
 std::unique_ptr<ApplicationStorage> makeApplicationStorage(PrivateFiles& files,
                                                            SystemLog& systemLog) {
-  return POSIX::makeApplicationStorage([&](const std::string& folder) {
-    return std::make_unique<KeyFileDefaults>(files, systemLog, folder + "/settings.ini");
+  return POSIX::makeApplicationStorage("settings.ini", [&](const std::string& path) {
+    return std::make_unique<KeyFileDefaults>(files, systemLog, path);
   });
 }
 

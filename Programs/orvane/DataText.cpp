@@ -1,0 +1,65 @@
+// SPDX-License-Identifier: MIT
+#include <orvane/DataText.h>
+
+#include <algorithm>
+
+#include <Varnel/Context/Globals.h>
+#include <Varnel/Paths/QNURLResolver.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Text/ByteCountFormatter.h>
+#include <Varnel/Platform/Text/VisibleText.h>
+#include <orvane/ClientIdentifier.h>
+#include <orvane/ResultText.h>
+#include <orvane/StoredRows.h>
+
+namespace Orvane {
+namespace {
+
+std::string lineOf(const DataPart& part) {
+  std::string text = part.name + ": ";
+  if (part.files.empty()) {
+    text += "none";
+  } else {
+    if (const auto entries = entriesOf(part))
+      text += counted(static_cast<std::uint64_t>(*entries), "entry", "entries") + ", ";
+    text += sizeText(part.bytes()) + " in " + pathText(part.path);
+  }
+  text += "  (" + part.content + ")\n";
+  for (const DataFile& file : part.files)
+    if (file.objection) text += "  " + pathText(file.path) + " " + *file.objection + "\n";
+  return text;
+}
+
+}  // namespace
+
+std::optional<std::int64_t> entriesOf(const DataPart& part) {
+  if (part.form == DataPart::Form::text) return std::nullopt;
+  if (part.form == DataPart::Form::logs) return static_cast<std::int64_t>(part.files.size());
+  const auto main = std::find_if(part.files.begin(), part.files.end(),
+                                 [&](const DataFile& file) { return file.path == part.path; });
+  // One that is empty was made by a process that has kept nothing yet.
+  if (main == part.files.end() || main->objection || main->bytes == 0) return std::nullopt;
+  const auto count = countRows(part.path, part.table);
+  return count ? std::optional(*count) : std::nullopt;
+}
+
+std::string textOf(const std::vector<DataPart>& parts) {
+  std::string text = "product: " + Varnel::Globals::baseIdentifier() + "\n" +
+                     "client identifier: " + storedClientIdentifier().value_or("none") + "\n";
+  for (const DataPart& part : parts) text += lineOf(part);
+  return text;
+}
+
+std::string sizeText(std::uint64_t bytes) {
+  static const Varnel::Platform::ByteCountFormatter byteCounts(
+      Varnel::Platform::processPorts().userLocale.get().numberIdentifier());
+  return byteCounts.string(static_cast<std::int64_t>(bytes),
+                           Varnel::Platform::ByteCountStyle::file);
+}
+
+std::string pathText(const std::string& path) {
+  return Varnel::Platform::visibleText(Varnel::QNURLResolver::shared().abbreviatedPath(path));
+}
+
+}  // namespace Orvane
