@@ -36,7 +36,8 @@ template <std::uint32_t maxCount>
 class ExtentMap final {
  public:
   explicit ExtentMap(std::uint64_t begin) {
-    fiemap head{};
+    fiemap head;  // Braces would list its array of no length, which is no standard C++.
+    std::memset(&head, 0, sizeof head);
     head.fm_start = begin;
     head.fm_length = FIEMAP_MAX_OFFSET - begin;
     head.fm_extent_count = maxCount;
