@@ -174,7 +174,8 @@ std::optional<SharedExtents> sharedExtentsOf(int descriptor) {
 // Both may be open for reading alone: the system asks whether the user may write to the file.
 FileResult<std::optional<std::uint64_t>> shareRange(int source, int file, std::uint64_t offset,
                                                     std::uint64_t length) {
-  file_dedupe_range head{};
+  file_dedupe_range head;
+  std::memset(&head, 0, sizeof head);
   head.src_offset = offset;
   head.src_length = length;
   head.dest_count = 1;
