@@ -1,8 +1,12 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/DataCommand.h>
 
-#include <filesystem>
+#include <unistd.h>
+
+#include <cerrno>
+#include <optional>
 #include <set>
+#include <system_error>
 
 #include <orvane/Console.h>
 #include <orvane/DataErasure.h>
@@ -11,8 +15,6 @@
 
 namespace Orvane {
 namespace {
-
-namespace fs = std::filesystem;
 
 std::string plan(const std::vector<DataPart>& parts) {
   std::string text = textOf(parts);
@@ -31,6 +33,14 @@ std::string resultOf(const DataPart& part, const Erasure& erasure) {
   return text;
 }
 
+// Unlike other ways to remove, this one takes no file or link that is in the folder's place.
+std::optional<std::string> removeFolder(const std::string& folder) {
+  if (::rmdir(folder.c_str()) == 0 || errno == ENOENT) return std::nullopt;
+  if (errno == ENOTDIR) return "it is no folder, but a file or a link";
+  if (errno == ENOTEMPTY || errno == EEXIST) return "it holds other files, or new ones";
+  return std::generic_category().message(errno);
+}
+
 }  // namespace
 
 int DataEraseCommand::run(Console& console) const {
@@ -46,8 +56,8 @@ int DataEraseCommand::run(Console& console) const {
     folders.insert(folderOf(part));
   }
   for (const std::string& folder : folders)
-    if (std::error_code error; !fs::remove(folder, error) && error && isAllGone)
-      text += "left " + pathText(folder) + ": it holds other files, or new ones\n";
+    if (const auto reason = removeFolder(folder); reason && isAllGone)
+      text += "left " + pathText(folder) + ": " + *reason + "\n";
   if (!console.writeResult(text)) return 1;
   return isAllGone ? 0 : someNotMoved;
 }

@@ -35,7 +35,9 @@ std::string lineOf(const DataPart& part) {
 
 std::optional<std::int64_t> entriesOf(const DataPart& part) {
   if (part.form == DataPart::Form::text) return std::nullopt;
-  if (part.form == DataPart::Form::logs) return static_cast<std::int64_t>(part.files.size());
+  if (part.form == DataPart::Form::logs)
+    return std::count_if(part.files.begin(), part.files.end(),
+                         [](const DataFile& file) { return !file.objection; });
   const auto main = std::find_if(part.files.begin(), part.files.end(),
                                  [&](const DataFile& file) { return file.path == part.path; });
   // One that is empty was made by a process that has kept nothing yet.

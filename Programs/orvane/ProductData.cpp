@@ -46,11 +46,14 @@ bool isLogName(const std::string& name) {
       [](unsigned char c, char p) { return p == '0' ? std::isdigit(c) != 0 : c == p; });
 }
 
-// A folder that is a link may be anybody's.
+// A folder that is a link may be anybody's, and so may the files in it.
 std::vector<DataFile> logsIn(const fs::path& folder) {
   std::vector<DataFile> found;
   std::error_code error;
-  if (!fs::is_directory(fs::symlink_status(folder, error))) return found;
+  const fs::file_status status = fs::symlink_status(folder, error);
+  if (!fs::exists(status)) return found;
+  if (!fs::is_directory(status))
+    return {{.path = folder, .objection = fs::is_symlink(status) ? "is a link" : "is no folder"}};
   for (fs::directory_iterator each(folder, error), end; !error && each != end;
        each.increment(error))
     if (isLogName(each->path().filename()))

@@ -122,6 +122,32 @@ TEST_F(OrvaneData, ShowsAndErasesAllThatItKeeps) {
   EXPECT_EQ(run({"restore", "--list"}).output, "");
 }
 
+TEST_F(OrvaneData, LeavesWhatLiesInThePlaceOfItsFolders) {
+  const std::string file = home.write("file", "the user's");
+  const std::string log = home.write("target/2020-01-01.log", "the user's");
+  const fs::path folders[] = {fs::path(settings).parent_path(), fs::path(state).parent_path(),
+                              fs::path(logs).parent_path()};
+  for (const bool isLink : {true, false}) {
+    for (const fs::path& each : folders) {
+      fs::remove(each);
+      fs::create_directories(each.parent_path());
+      if (isLink) fs::create_directory_symlink(fs::path(log).parent_path(), each);
+      if (!isLink) fs::copy_file(file, each);
+    }
+    if (isLink) run({"analytics", "consent", "yes"});
+    const char* const objection = isLink ? " is a link\n" : " is no folder\n";
+    EXPECT_THAT(run({"data", "show"}).output,
+                HasSubstr("com.quennel.Orvane2" + std::string(objection)));
+    const Outcome erased = run({"data", "erase", "--yes"});
+    EXPECT_EQ(erased.status, 3);
+    EXPECT_THAT(erased.output, AllOf(HasSubstr("logs: left "),
+                                     HasSubstr(isLink ? "settings: erased" : "settings: none")));
+    for (const fs::path& each : folders) EXPECT_EQ(fs::is_symlink(each), isLink) << each;
+    for (const fs::path& each : folders) EXPECT_TRUE(fs::exists(each)) << each;
+    EXPECT_TRUE(fs::exists(log));
+  }
+}
+
 // Whoever is at work goes on; whoever has a file open brings nothing back.
 TEST_F(OrvaneData, LeavesToOthersWhatTheyAreAtWorkWith) {
   keepAll();
