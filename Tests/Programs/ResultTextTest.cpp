@@ -66,7 +66,8 @@ TEST_F(ResultText, SaysWhereNothingIsWastedAndWhereFilesAreMissing) {
   EXPECT_THAT(textOf({}), AllOf(StartsWith("2 files of 4 bytes, nothing wasted\n"),
                                 EndsWith(": 1 duplicate in 1 group, nothing wasted\n")));
   fileSystem.beforeOpen = [&](const std::string&) { control.isCancelled = true; };
-  EXPECT_THAT(textOf({}), StartsWith("interrupted; so far 2 files in 1 folder: "));
+  // Readers that were at work already may still find a group.
+  EXPECT_THAT(textOf({.maxGroups = 0}), StartsWith("interrupted; so far 2 files in 1 folder: "));
 }
 
 TEST_F(ResultText, ReportsTheStateOfEachFile) {
