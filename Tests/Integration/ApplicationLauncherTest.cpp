@@ -3,7 +3,6 @@
 
 #include <gio/gio.h>
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <sys/stat.h>
 
 #include <chrono>

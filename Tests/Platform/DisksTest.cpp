@@ -3,7 +3,6 @@
 
 #include <chrono>
 #include <future>
-#include <map>
 #include <random>
 
 #include <Tests/Support/SysfsMachine.h>

@@ -121,18 +121,6 @@ TEST_F(Quarantine, AMissingFileIsCreatedEmpty) {
   EXPECT_EQ(log.text(), "");
 }
 
-TEST_F(Quarantine, ReadsAHundredThousandRows) {
-  const auto file = database(
-      Tests::createQuarantineTable() +
-      "WITH RECURSIVE n(i) AS (SELECT 0 UNION ALL SELECT i + 1 FROM n WHERE i < 99999) "
-      "INSERT INTO LSQuarantineEvent (LSQuarantineEventIdentifier, LSQuarantineDataURLString) "
-      "SELECT 'E' || i, printf('%.*c', iif(i % 10000 = 0, 100000, 9), 'x') FROM n");
-  const Fields entries = read(file);
-  ASSERT_EQ(entries.size(), 100'000U);
-  EXPECT_EQ(entries[20'000], "E20000 " + std::string(100'000, 'x'));
-  EXPECT_EQ(entries.back(), "E99999 xxxxxxxxx");
-}
-
 TEST(QuarantinePaths, TheCurrentDatabaseComesBeforeTheEarlierOne) {
   Platform::Testing::FakeUserAccount account;
   account.realHome = "/elsewhere";
