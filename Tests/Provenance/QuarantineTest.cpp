@@ -107,18 +107,15 @@ TEST_F(Quarantine, ALockedDatabaseIsEmptyAndNotWaitedFor) {
   EXPECT_EQ(log.text(), "");
 }
 
-TEST_F(Quarantine, WhatCannotBeOpenedIsLogged) {
-  EXPECT_THAT(read(folder.path()), ElementsAre());
-  EXPECT_EQ(log.text(), "Failed to open database!\n");
-  EXPECT_THAT(read(folder.path() / "missing" / "events"), ElementsAre());
-  EXPECT_EQ(log.text(), "Failed to open database!\nFailed to open database!\n");
-}
-
-TEST_F(Quarantine, AMissingFileIsCreatedEmpty) {
+TEST_F(Quarantine, AMissingFileIsCreatedEmptyAndWhatCannotBeOpenedIsLogged) {
   const fs::path file = folder.path() / "new";
   EXPECT_THAT(read(file), ElementsAre());
   EXPECT_EQ(fs::file_size(file), 0U);
   EXPECT_EQ(log.text(), "");
+  EXPECT_THAT(read(folder.path()), ElementsAre());
+  EXPECT_EQ(log.text(), "Failed to open database!\n");
+  EXPECT_THAT(read(folder.path() / "missing" / "events"), ElementsAre());
+  EXPECT_EQ(log.text(), "Failed to open database!\nFailed to open database!\n");
 }
 
 TEST(QuarantinePaths, TheCurrentDatabaseComesBeforeTheEarlierOne) {
