@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <condition_variable>
 #include <random>
-#include <set>
 
 #include <Tests/DiskAccess/DiskReadingFixture.h>
 #include <Tests/Support/Crew.h>

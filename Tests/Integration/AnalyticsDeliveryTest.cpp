@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <cctype>
 #include <chrono>
 #include <cstdlib>
@@ -126,25 +125,6 @@ std::unique_ptr<Process> recording(const Server& server, const std::string& spoo
       std::vector<std::string>{VARNEL_ANALYTICS_PROCESS, server.url(), spool, "1000", "drain"});
 }
 
-// How often each event is seen until so many different ones are.
-std::map<std::string, int> seenBy(Server& server, std::size_t different) {
-  std::map<std::string, int> seen;
-  while (seen.size() < different)
-    for (const std::string& hit : server.next().hits()) ++seen[parameter(hit, "z")];
-  return seen;
-}
-
-TEST_F(AnalyticsDeliveryTest, OfFourProcessesOneSendsEachEventOnce) {
-  Server server({"200"});
-  std::vector<std::unique_ptr<Process>> processes;
-  for (int i = 0; i < 4; ++i) processes.push_back(recording(server, spoolPath()));
-  for (const auto& [uuid, times] : seenBy(server, 4000)) EXPECT_EQ(times, 1) << uuid;
-  for (const auto& process : processes) {
-    EXPECT_EQ(lastWord(*process), "tracked");
-    EXPECT_EQ(process->readLine(), "delivered");
-  }
-}
-
 TEST_F(AnalyticsDeliveryTest, WhenTheDelivererDiesAnotherTakesOver) {
   Server server({"200", "200", "hang", "200"});
   auto deliverer = recording(server, spoolPath());
@@ -165,37 +145,6 @@ TEST_F(AnalyticsDeliveryTest, WhenTheDelivererDiesAnotherTakesOver) {
   // The server had taken the last batch, but nobody could note that.
   for (const auto& [uuid, times] : seen) EXPECT_EQ(times, underway.contains(uuid) ? 2 : 1) << uuid;
   for (const auto& process : others) EXPECT_EQ(process->readLine(), "delivered");
-}
-
-TEST_F(AnalyticsDeliveryTest, AKilledProcessDeliversOnTheNextStart) {
-  constexpr std::size_t count = 250;
-  std::set<std::string> before;
-  {
-    Server server({"200", "hang"});
-    Varnel::Tests::ChildProcess process(
-        {VARNEL_ANALYTICS_PROCESS, server.url(), spoolPath(), std::to_string(count)});
-    EXPECT_EQ(lastWord(process), "tracked");
-    // Killed in the midst of it: some have arrived, some hang, some have never been sent.
-    for (const std::string& hit : server.next().hits()) before.insert(parameter(hit, "z"));
-    server.next();
-    process.kill();
-  }
-  Server server({"200"});
-  const auto transport = this->transport(server.url());
-  AnalyticsTracker tracker(transport, Consent::granted);
-  EXPECT_TRUE(transport->drain(60s));
-  std::set<std::string> actions;
-  std::set<std::string> uuids = before;
-  while (uuids.size() < count) {
-    const auto request = server.next();
-    ASSERT_FALSE(request.hits().empty());
-    for (const std::string& hit : request.hits()) {
-      uuids.insert(parameter(hit, "z"));
-      actions.insert(parameter(hit, "ea"));
-    }
-  }
-  EXPECT_EQ(uuids.size(), count);
-  EXPECT_EQ(actions.size(), count - before.size());
 }
 
 // The exit status of the host.

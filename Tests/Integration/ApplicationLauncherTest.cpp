@@ -3,7 +3,6 @@
 
 #include <gio/gio.h>
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <sys/stat.h>
 
 #include <chrono>
@@ -86,14 +85,10 @@ class ApplicationLauncherTest : public testing::Test {
 };
 
 TEST_F(ApplicationLauncherTest, ALineIsRunAsTheDesktopWould) {
-  const std::string here = fs::current_path().string(),
-                    action = "[Desktop Action scan]\nName=Scan\n";
+  const std::string here = fs::current_path().string();
   install("plain", R"(%U one "two \\$ words" --part=100%% %c %i)", "");
   install("elsewhere", "", "Path=/\n");
   install("translated", "%c", "Name[de]=Welt\n");
-  install("action", "body",
-          "Actions=scan;\n" + action + "Exec=\"" + folder_.path().string() +
-              R"(/my \\"\\$app" button)" + "\n");
   // One of these cannot be the name of a service.
   for (const char* name : {"unserved", ":1.5"}) install(name, "line", "DBusActivatable=true\n");
   const struct {
@@ -104,9 +99,6 @@ TEST_F(ApplicationLauncherTest, ALineIsRunAsTheDesktopWould) {
        "one|two $ words|--part=100%|Velt|--icon|velt|" + here + "|token|token||"},
       {{.desktopEntry = "elsewhere"}, "/||||"},
       {{.desktopEntry = "translated"}, "Velt|" + here + "||||"},
-      {{.desktopEntry = "action", .action = "scan", .activationToken = "t"},
-       "button|" + here + "|t|t||"},
-      {{.desktopEntry = "action", .action = "other"}, "body|" + here + "||||"},
       {{.desktopEntry = "unserved"}, "line|" + here + "||||"},
       {{.desktopEntry = ":1.5"}, "line|" + here + "||||"},
   };

@@ -4,7 +4,6 @@
 #include <gio/gio.h>
 
 #include <cstdio>
-#include <cstdlib>
 
 namespace {
 

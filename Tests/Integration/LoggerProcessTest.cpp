@@ -1,17 +1,15 @@
 // SPDX-License-Identifier: MIT
 #include <algorithm>
 #include <filesystem>
-#include <fstream>
-#include <iterator>
 #include <map>
 #include <sstream>
 #include <string>
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include <Tests/Support/ChildProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Ports/ReadFile.h>
 
 namespace Varnel {
 namespace {
@@ -44,10 +42,7 @@ class LoggerProcessTest : public testing::Test {
       if (entry.path().extension() == ".log") return entry.path();
     return {};
   }
-  [[nodiscard]] std::string log() const {
-    std::ifstream file(logPath());
-    return {std::istreambuf_iterator<char>(file), {}};
-  }
+  [[nodiscard]] std::string log() const { return Platform::readFile(logPath()).valueOr(""); }
 
   Tests::TemporaryFolder home;
 };

@@ -1,10 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <dlfcn.h>
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include <chrono>
-#include <functional>
 #include <map>
 #include <mutex>
 #include <string>

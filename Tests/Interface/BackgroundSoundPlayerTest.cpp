@@ -2,7 +2,6 @@
 #include <Varnel/Platform/Generic/BackgroundSoundPlayer.h>
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <sys/syscall.h>
 
 #include <atomic>

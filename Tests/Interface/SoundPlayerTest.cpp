@@ -5,9 +5,7 @@
 
 #include <algorithm>
 #include <cmath>
-#include <fstream>
 #include <mutex>
-#include <sstream>
 #include <vector>
 
 #include <Tests/Support/DrainUntil.h>
@@ -16,6 +14,7 @@
 #include <Varnel/Platform/Generic/BackgroundSoundPlayer.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/Sounds/GStreamer/Output.h>
+#include <Varnel/Platform/Ports/ReadFile.h>
 
 namespace Varnel {
 namespace {
@@ -84,9 +83,7 @@ class Recording {
 };
 
 std::string bytesOf(Sound sound) {
-  std::ostringstream bytes;
-  bytes << std::ifstream(VARNEL_SOUNDS "/" + sound.fileName(), std::ios::binary).rdbuf();
-  return std::move(bytes).str();
+  return *Platform::readFile(VARNEL_SOUNDS "/" + sound.fileName());
 }
 
 // An engine whose sounds are recorded, one recording a sound played.

@@ -4,7 +4,6 @@
 #include <gtest/gtest.h>
 #include <sys/syscall.h>
 
-#include <algorithm>
 #include <filesystem>
 #include <fstream>
 #include <thread>
@@ -18,7 +17,6 @@ namespace {
 
 using namespace std::chrono_literals;
 using Platform::Testing::Fault;
-using Platform::Testing::sweepFaults;
 
 constexpr auto longTime = std::chrono::hours(1);
 const std::string line = std::string(63, 'x') + "\n";
@@ -107,15 +105,6 @@ TEST_F(LogFileChannelTest, WritesAtOnceInAProcessThatMayHaveNoMoreThreads) {
     channel.append("entry\n");
     EXPECT_EQ(text(), "entry\n");
   });
-}
-
-TEST_F(LogFileChannelTest, WritesThroughOnceItIsTold) {
-  LogFileChannel channel(files, output, "/log", {.interval = longTime});
-  channel.append("waiting\n");
-  channel.writeThrough();
-  EXPECT_EQ(text(), "waiting\n");
-  channel.append("late\n");
-  EXPECT_EQ(text(), "waiting\nlate\n");
 }
 
 }  // namespace

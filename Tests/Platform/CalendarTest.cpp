@@ -37,6 +37,15 @@ TEST(Calendar, EachRepetitionIsCountedFromTheOriginalDate) {
   const Date firstOfTwo = utc(2026y / October / 25, 30min);
   EXPECT_EQ(berlin.adding({.day = 1}, firstOfTwo + days(1) + 1h, -1), firstOfTwo);
   EXPECT_EQ(berlin.adding({.hour = 1}, firstOfTwo), firstOfTwo + 1h);
+  EXPECT_EQ(berlin.adding({.day = 1}, firstOfTwo - days(1)), firstOfTwo);
+  EXPECT_EQ(berlin.adding({.day = 1}, firstOfTwo - days(1) + 30min), firstOfTwo + 90min);
+  // What the clocks skip on 29 March is as much later; 03:00 is their first time again.
+  const Date skipped = utc(2026y / March / 29, 1h + 30min);
+  EXPECT_EQ(berlin.adding({.day = 1}, skipped - days(1)), skipped);
+  EXPECT_EQ(berlin.adding({.day = 1}, skipped - days(1) + 30min), skipped - 30min);
+  EXPECT_EQ(berlin.adding({.day = 2}, skipped - days(1)), skipped + days(1) - 1h);
+  EXPECT_EQ(berlin.adding(month, utc(2026y / March / 1, 1h + 30min)),
+            utc(2026y / April / 1, 30min));
 }
 
 TEST(Calendar, CountsInTheCalendarOfTheLocale) {

@@ -2,10 +2,11 @@
 #include <gmock/gmock.h>
 
 #include <chrono>
+#include <fstream>
 #include <future>
-#include <map>
 #include <random>
 
+#include <Tests/Support/MountNamespace.h>
 #include <Tests/Support/SysfsMachine.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Linux/Disks/BlockDevices.h>
@@ -14,6 +15,7 @@
 #include <Varnel/Platform/Linux/Disks/MountInfo.h>
 #include <Varnel/Platform/Linux/Disks/UdevDatabase.h>
 #include <Varnel/Platform/Linux/Disks/VirtioSerials.h>
+#include <Varnel/Platform/Ports/ReadFile.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
@@ -99,15 +101,37 @@ TEST(BlockTree, DisksOnUSBAndRemovableOnesAreNotCapable) {
   EXPECT_EQ(devicesOf(machine).areInternal({"odd0"}), std::nullopt);
 }
 
-TEST(BlockTree, ADiskWithoutASerialNumberIsKnownByItsNameOrItsPlace) {
+TEST(BlockTree, ADiskIsKnownByItsSerialNumberOrElseItsNameOrItsPlace) {
   Tests::SysfsMachine machine;
   machine.setSubsystem("pci0/nvme/nvme0", "nvme");
   machine.add("pci0/nvme/nvme0/nvme0n1", {{"wwid", "eui.0025\n"}, {"device/serial", " \n"}});
   machine.add("pci0/nvme/nvme0/nvme0c0n1", {{"hidden", "1\n"}});
+  machine.setSubsystem("pci0/nvme/nvme1", "nvme");
+  machine.add("pci0/nvme/nvme1/nvme1n1", {{"device/serial", "NVME-1  \n"}});
   machine.setSubsystem("pci0/virtio3", "virtio");
   machine.add("pci0/virtio3/block/vdya", {{"serial", ""}});
   EXPECT_THAT(drawn(machine), ElementsAre("-[nvme0c0n1]", "+(Rotational,eui.0025)[nvme0n1]",
+                                          "+(Rotational,NVME-1)[nvme1n1]",
                                           "+(Rotational,devices/pci0/virtio3)[vdya]"));
+}
+
+// In a folder of this test's own, for a device that the machine has.
+TEST(BlockTree, ADiskIsKnownByWhatUdevHasRecorded) {
+  const auto number = readFile("/sys/class/block/loop0/dev");
+  if (!number) GTEST_SKIP() << "The machine has no loop device.";
+  if (const std::string reason = Tests::enterMountNamespace(); !reason.empty())
+    GTEST_SKIP() << reason;
+  ASSERT_TRUE(Tests::mountMemory("/run"));
+  fs::create_directories("/run/udev/data");
+  std::ofstream("/run/udev/data/b" + number->substr(0, number->find('\n')))
+      << "E:ID_SERIAL=QEMU-7\nE:ID_SERIAL_SHORT=WD-7\n";
+  Tests::SysfsMachine disk;
+  disk.addSCSIDisk("pci0/ata1", "loop0", {});
+  EXPECT_THAT(drawn(disk), ElementsAre("+(Rotational,WD-7)[loop0]"));
+  Tests::SysfsMachine virtualDisk;
+  virtualDisk.setSubsystem("pci0/virtio1", "virtio");
+  virtualDisk.add("pci0/virtio1/block/loop0", {{"serial", "other"}});
+  EXPECT_THAT(drawn(virtualDisk), ElementsAre("+(Rotational,QEMU-7)[loop0]"));
 }
 
 TEST(VirtioSerials, EachDiskIsAskedOnceAndNobodyWaitsForOneThatDoesNotAnswer) {

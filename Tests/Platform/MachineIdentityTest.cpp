@@ -2,12 +2,7 @@
 #include <Varnel/Platform/Ports/MachineIdentity.h>
 
 #include <gmock/gmock.h>
-#include <sched.h>
 
-#include <cstdlib>
-
-#include <Tests/Support/MountNamespace.h>
-#include <Tests/Support/OtherProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/Linux/Identity/DefaultRoutes.h>
@@ -167,33 +162,6 @@ TEST(DefaultRoutes, LinesThatAreNoUsableDefaultRouteArePassedOver) {
       " 00 " + none + " 00 " + none + " 00000006 00000001 00000000 00000003 better\n";
   EXPECT_THAT(interfacesOfDefaultRoutes(ipv4, ipv6), ElementsAre("better", "good"));
   EXPECT_THAT(interfacesOfDefaultRoutes("", ""), ElementsAre());
-}
-
-// The kernel's own tables, in a network of this test: two default routes on virtual interfaces,
-// which a folder of files declares to be physical.
-TEST_F(MockedMachine, ReadsTheKernelsTablesOfTwoDefaultRoutes) {
-  addPhysical("first0", 1);
-  addPhysical("second0", 2);
-  const auto shell = [](const std::string& command) {
-    return std::system(("(" + command + ") >/dev/null 2>&1").c_str()) == 0;
-  };
-  const Tests::OtherProcess network([&] {
-    if (!Tests::enterNamespace(CLONE_NEWNET).empty()) return false;
-    if (!shell("ip link add first0 type veth peer name first1 && ip link add second0 type veth"
-               " peer name second1 && ip addr add 192.0.2.1/24 dev first0 && ip addr add"
-               " 198.51.100.1/24 dev second0 && for i in first0 first1 second0 second1;"
-               " do ip link set $i up || exit 1; done"
-               " && ip route add default via 192.0.2.9 dev first0 metric 600"
-               " && ip route add default via 198.51.100.9 dev second0 metric 100"))
-      return false;
-    return shell("cat /proc/net/route > " + (folder.path() / "route").string() +
-                 " && cat /proc/net/ipv6_route > " + (folder.path() / "ipv6_route").string());
-  });
-  if (!network.isReady()) GTEST_SKIP() << "This machine grants no network namespace with veth.";
-  fs::create_directories(folder.path() / "proc/net");
-  fs::rename(folder.path() / "route", folder.path() / "proc/net/route");
-  fs::rename(folder.path() / "ipv6_route", folder.path() / "proc/net/ipv6_route");
-  EXPECT_EQ(primary(), 2);
 }
 
 }  // namespace

@@ -8,14 +8,13 @@
 #include <filesystem>
 #include <fstream>
 #include <limits>
-#include <sstream>
 #include <string>
 #include <vector>
 
 #include <Tests/Support/TemporaryFolder.h>
 #include <Tests/Support/Zones.h>
 #include <Varnel/Platform/Linux/Adapters.h>
-#include <Varnel/Platform/Text/Calendar.h>
+#include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/Text/DateFormatter.h>
 
 namespace Varnel::Platform {
@@ -51,27 +50,6 @@ seconds offsetByLibrary(Date date) {
   tm local{};
   ::localtime_r(&time, &local);
   return seconds(local.tm_gmtoff);
-}
-
-local_seconds shownAt(sys_seconds time) {
-  return local_seconds((time + offsetByLibrary(time)).time_since_epoch());
-}
-
-// The first moment at which the clocks show `local`; of what they skip, as much later.
-sys_seconds momentOf(local_seconds local) {
-  const sys_seconds utc(local.time_since_epoch());
-  const sys_seconds before = utc - offsetByLibrary(utc - 24h);
-  const sys_seconds after = utc - offsetByLibrary(utc + 24h);
-  const auto isShown = [local](sys_seconds time) { return shownAt(time) == local; };
-  if (isShown(before) && isShown(after)) return std::min(before, after);
-  return isShown(after) ? after : before;
-}
-
-local_seconds monthLater(local_seconds local) {
-  const auto day = floor<days>(local);
-  year_month_day date = year_month_day(day) + months(1);
-  if (!date.ok()) date = date.year() / date.month() / last;
-  return local_days(date) + (local - day);
 }
 
 std::vector<sys_seconds> changesOf(const TimeZone& zone, Date begin, Date end) {
@@ -110,27 +88,6 @@ TEST(TimeZones, EveryZoneOfTheSystemHasTheOffsetsThatTheCLibraryHas) {
   }
 }
 
-TEST(TimeZones, DailyAndMonthlyRepetitionsKeepTheWallClockOverEachChangeOfEachZone) {
-  int count = 0;
-  for (const std::string& identifier : identifiers()) {
-    const Tests::LocalZone local(identifier.c_str());
-    const Calendar calendar("en_US", identifier, *system);
-    for (const sys_seconds change :
-         changesOf(*system->zone(identifier), sys_days(2015y / January / 1),
-                   sys_days(2037y / January / 1)))
-      for (const minutes distance : {-90min, -60min, -30min, -1min, 0min, 30min, 60min, 90min}) {
-        const sys_seconds day = momentOf(shownAt(change) + distance - 24h);
-        EXPECT_EQ(calendar.adding({.day = 1}, day), momentOf(shownAt(day) + 24h))
-            << identifier << " " << change.time_since_epoch().count() << " " << distance.count();
-        const sys_seconds month = momentOf(shownAt(change) + distance - days(30));
-        EXPECT_EQ(calendar.adding({.month = 1}, month), momentOf(monthLater(shownAt(month))))
-            << identifier << " " << change.time_since_epoch().count() << " " << distance.count();
-        ++count;
-      }
-  }
-  EXPECT_GT(count, 32 * 8) << "The rules alone change that often.";
-}
-
 TEST(TimeZones, TakeEveryFormOfTheVariableAndAnythingElseForUTC) {
   const Date summer = sys_days(2026y / July / 1) + 12h;
   const struct {
@@ -163,9 +120,7 @@ TEST(TimeZones, TakeEveryFormOfTheVariableAndAnythingElseForUTC) {
 
 TEST(TimeZones, ADamagedFileIsNoZone) {
   const fs::path whole = "/usr/share/zoneinfo/Europe/Berlin";
-  std::stringstream content;
-  content << std::ifstream(whole, std::ios::binary).rdbuf();
-  const std::string bytes = content.str();
+  const std::string bytes = readFile(whole).valueOr("");
   if (bytes.empty()) GTEST_SKIP() << "The system has no table of time zones.";
   const Tests::TemporaryFolder folder;
   const auto offsetWith = [&](const std::string& damaged) {

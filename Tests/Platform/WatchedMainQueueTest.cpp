@@ -2,7 +2,6 @@
 #include <Varnel/Platform/Generic/WatchedMainQueue.h>
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include <chrono>
 #include <memory>

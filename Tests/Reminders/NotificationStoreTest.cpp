@@ -8,15 +8,14 @@
 #include <atomic>
 #include <barrier>
 #include <filesystem>
-#include <fstream>
 #include <memory>
-#include <sstream>
 #include <thread>
 
 #include <Tests/Support/TemporaryFolder.h>
 #include <Tests/Support/Zones.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/Ports/PrivateFiles.h>
+#include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Platform/Text/Calendar.h>
@@ -112,12 +111,10 @@ TEST_F(NotificationStoreTest, ReadsItsFirstFormat) {
   const fs::path fresh = folder.path() / "fresh.sqlite";
   EXPECT_TRUE(
       NotificationStore({*files, log}, fresh.string(), Migrating::allowed).deliveries({planned}));
-  std::ostringstream golden;
-  golden << std::ifstream(VARNEL_TEST_GOLDEN).rdbuf();
   fs::create_directories(file.parent_path());
   {
     auto database = SQLiteDatabase::open(file.string());
-    ASSERT_FALSE(database->execute(golden.str()));
+    ASSERT_FALSE(database->execute(*readFile(VARNEL_TEST_GOLDEN)));
   }
   // A program that may not migrate it reads it as it is.
   NotificationStore visitor({*files, log}, file.string(), Migrating::never);
@@ -195,33 +192,6 @@ TEST_F(NotificationStoreTest, ADeliveryGoesFromStateToState) {
   EXPECT_EQ(only(store, hidden).schedule.key, third.schedule.key);
   EXPECT_FALSE(store.remove(only(store, hidden).number));
   EXPECT_THAT(all(store), IsEmpty());
-}
-
-TEST_F(NotificationStoreTest, CallsTogetherAreDoneAsAWhole) {
-  NotificationStore store = open();
-  EXPECT_FALSE(store.plan(weekly(), start, calendar));
-  for (const bool isFailing : {true, false}) {
-    const auto failure = store.change([&]() -> NotificationStore::Failure {
-      EXPECT_FALSE(store.remove(only(store, planned).number));
-      EXPECT_FALSE(store.plan(weekly("other"), start, calendar));
-      if (isFailing) return PlatformError("Test", 1);
-      return std::nullopt;
-    });
-    EXPECT_EQ(failure.has_value(), isFailing);
-    EXPECT_EQ(only(store, planned).schedule.notification.identifier,
-              isFailing ? "weekly" : "other");
-  }
-}
-
-TEST_F(NotificationStoreTest, AFileThatCannotBeReadIsNotAnEmptyList) {
-  NotificationStore store = open();
-  EXPECT_FALSE(store.plan(weekly(), start, calendar));
-  auto holder = SQLiteDatabase::open(file.string());
-  ASSERT_FALSE(holder->execute("BEGIN EXCLUSIVE"));
-  EXPECT_FALSE(store.deliveries({planned}));
-  EXPECT_TRUE(store.claimDue(start, calendar));
-  ASSERT_FALSE(holder->execute("COMMIT"));
-  EXPECT_THAT(all(store), SizeIs(1));
 }
 
 TEST_F(NotificationStoreTest, SurvivesWhateverStandsInItsColumns) {

@@ -8,13 +8,13 @@
 #include <fstream>
 #include <functional>
 #include <optional>
-#include <sstream>
 #include <string>
 
 #include <Tests/Reminders/CenterProcess.h>
 #include <Tests/Support/AsUser.h>
 #include <Tests/Support/ChildProcess.h>
 #include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 
 namespace Varnel::Platform {
@@ -31,12 +31,6 @@ using ::testing::SizeIs;
 
 constexpr Date start = std::chrono::sys_days(std::chrono::year(2026) / 3 / 1);
 constexpr auto week = std::chrono::days(7);
-
-std::string contentOf(const fs::path& file) {
-  std::ostringstream text;
-  text << std::ifstream(file, std::ios::binary).rdbuf();
-  return text.str();
-}
 
 // A user's home folder.
 class Home final {
@@ -55,8 +49,8 @@ class Home final {
             {"/usr/bin/env", "-i", "HOME=" + folder.path().string(), "/bin/sh", "-c",
              "exec " ORVANE_PROGRAM " " + arguments + " >$HOME/output 2>$HOME/errors"})
             .wait();
-    output = contentOf(folder.path() / "output");
-    errors = contentOf(folder.path() / "errors");
+    output = readFile(folder.path() / "output").valueOr("");
+    errors = readFile(folder.path() / "errors").valueOr("");
     return status;
   }
   void sql(const std::string& statements) const {
@@ -134,7 +128,7 @@ void orvaneSaysSo(Home& home, const Trouble& trouble) {
   trouble.begin(home);
   // To open and close a locked file would free it.
   const bool isLeftAlone = trouble.store == Trouble::isLeftAlone;
-  const std::string before = isLeftAlone ? contentOf(home.store) : "";
+  const std::string before = isLeftAlone ? readFile(home.store).valueOr("") : "";
   const bool isReplaced = trouble.store == Trouble::isReplaced;
   // Also where the plan of before is one of the same period.
   for (const char* period : {"weekly", "monthly"}) {
@@ -145,7 +139,7 @@ void orvaneSaysSo(Home& home, const Trouble& trouble) {
   }
   EXPECT_EQ(fs::exists(home.store.string() + ".damaged"), isReplaced);
   if (isLeftAlone) {
-    EXPECT_TRUE(contentOf(home.store) == before);
+    EXPECT_TRUE(readFile(home.store).valueOr("") == before);
   }
   trouble.end(home);
   const auto saysSo = HasSubstr("the plan is not that of the period");

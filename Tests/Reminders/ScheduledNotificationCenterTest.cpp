@@ -58,17 +58,6 @@ TEST_F(ScheduledNotificationCenterTest, AYearAwakeDeliversEveryWeek) {
       (Banner{.title = "Week", .text = "Text", .actionTitle = "Do", .dismissTitle = "Later"}));
 }
 
-TEST_F(ScheduledNotificationCenterTest, AClockSetBackDeliversNothingTwice) {
-  process.listen();
-  process.schedule(weekly());
-  process.timer.advanceTo(start + 2 * week);
-  process.timer.setClock(start + week - 1h);
-  process.timer.advanceTo(start + 3 * week - 1s);
-  EXPECT_THAT(process.server.history(), SizeIs(2));
-  process.timer.advanceTo(start + 3 * week);
-  EXPECT_THAT(process.server.history(), SizeIs(3));
-}
-
 TEST_F(ScheduledNotificationCenterTest, AMoveToAnotherZoneKeepsTheTimeOfDay) {
   process.zones.local = "Europe/Berlin";
   process.listen();
@@ -93,23 +82,6 @@ TEST_F(ScheduledNotificationCenterTest, WhatCameDueBeforeTheLaunchIsDeliveredOnc
   EXPECT_THAT(next.listener->events, ElementsAre("delivered Week"));
   next.listen();
   EXPECT_THAT(next.server.history(), SizeIs(1));
-}
-
-TEST_F(ScheduledNotificationCenterTest, TwoProcessesNeverDeliverTheSame) {
-  Process other(file, start);
-  process.listen();
-  other.listen();
-  process.schedule(weekly());
-  other.deliverer.changed();  // What the watch on the store does.
-  ASSERT_EQ(other.timer.armedDate(), start + week);
-  constexpr int weeks = 3;  // One of the two looks every few minutes whether the other still lives.
-  for (int i = 1; i <= weeks; ++i) {
-    Process& first = i % 2 == 0 ? process : other;
-    Process& second = i % 2 == 0 ? other : process;
-    first.timer.advanceTo(start + i * week);
-    second.timer.advanceTo(start + i * week);
-  }
-  EXPECT_EQ(process.server.history().size() + other.server.history().size(), weeks);
 }
 
 TEST_F(ScheduledNotificationCenterTest, ClicksComeBackOnceAndDismissalLeavesTheList) {
@@ -199,49 +171,6 @@ TEST_F(ScheduledNotificationCenterTest, WithoutADelegateWhatIsDueWaits) {
   EXPECT_THAT(process.server.history(), SizeIs(2));
 }
 
-// A banner that was promised comes, once, whatever became of the first try.
-TEST_F(ScheduledNotificationCenterTest, ABannerThatDidNotComeIsShownLater) {
-  const struct {
-    const char* name;
-    std::function<void(Testing::FakeNotificationServer&)> fail, mend;
-    bool isRetriedByTime;  ///< Otherwise the server's appearance is enough.
-  } rows[] = {
-      {"no server", [](auto& server) { server.isPresent = false; },
-       [](auto& server) { server.appear(); }, false},
-      {"an error as the answer",
-       [](auto& server) { server.faults->plan(Testing::Fault::fails, 1); },
-       [](auto& server) { server.faults->mend(); }, true},
-  };
-  for (const auto& row : rows)
-    for (const bool isNextRun : {false, true}) {
-      const Tests::TemporaryFolder own;
-      std::optional<Process> run(std::in_place, own.path() / "store.sqlite", start);
-      row.fail(run->server);
-      run->listen();
-      run->schedule(weekly());
-      run->timer.advanceTo(start + week);
-      run->settle();
-      EXPECT_THAT(run->delivered(), SizeIs(1)) << row.name;
-      // The pauses grow.
-      run->timer.advanceTo(start + week + 1h);
-      run->settle();
-      if (isNextRun) {
-        run.emplace(own.path() / "store.sqlite", start + week + 1h);
-        run->listen();
-      } else {
-        row.mend(run->server);
-        if (row.isRetriedByTime)
-          run->timer.advanceTo(start + week + 1h + ScheduledNotificationCenter::maxPause);
-      }
-      run->settle();
-      EXPECT_THAT(run->server.history(), SizeIs(1)) << row.name << isNextRun;
-      run->timer.advanceTo(start + week + 3h);
-      run->settle();
-      EXPECT_THAT(run->server.history(), SizeIs(1)) << row.name << isNextRun;
-      EXPECT_EQ(run->timer.armedDate(), start + 2 * week) << row.name << isNextRun;
-    }
-}
-
 TEST_F(ScheduledNotificationCenterTest, AClockSetBackPutsNoRetryOff) {
   process.listen();
   process.schedule(weekly());
@@ -285,18 +214,6 @@ TEST_F(ScheduledNotificationCenterTest, WhatCannotBeNotedIsNotedLater) {
   process.settle();
   EXPECT_THAT(process.server.history(), SizeIs(1));
   EXPECT_THAT(process.delivered(), IsEmpty());
-}
-
-TEST_F(ScheduledNotificationCenterTest, AnotherProcessTakesOverWhenTheDelivererEnds) {
-  std::optional<Process> first(std::in_place, file, start);
-  first->listen();
-  first->deliver(weekly());  // Its banner has yet to come.
-  process.clock.set(start);
-  process.listen();
-  EXPECT_THAT(process.server.history(), IsEmpty());
-  first.reset();
-  process.timer.advanceTo(start + ScheduledNotificationCenter::maxPause);
-  EXPECT_THAT(process.server.history(), SizeIs(1));
 }
 
 // Only a delivery that was promised makes a program without a delegate show banners.

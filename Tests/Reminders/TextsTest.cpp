@@ -2,10 +2,10 @@
 #include <gtest/gtest.h>
 
 #include <filesystem>
-#include <fstream>
 #include <map>
 #include <set>
 
+#include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/Text/StringsTable.h>
 #include <Varnel/Platform/Text/TextFormat.h>
 #include <Varnel/Reminders/SchedulePeriodOption.h>
@@ -16,11 +16,6 @@ namespace {
 namespace fs = std::filesystem;
 
 constexpr std::string_view argument = "<argument>";
-
-std::string bytesOf(const fs::path& file) {
-  std::ifstream stream(file, std::ios::binary);
-  return {std::istreambuf_iterator<char>(stream), {}};
-}
 
 // Every prefixed literal is a key; one looked up as an argument of `formatted(` is a format.
 void addKeys(const std::string& code, std::map<std::string, int>& keys) {
@@ -40,7 +35,7 @@ std::map<std::string, int> keysOfTheCode() {
                              "Once In Three Months", "Once In Six Months", "Annually"})
     keys[period] = 0;
   for (const auto& entry : fs::recursive_directory_iterator(VARNEL_TEST_SOURCES))
-    if (entry.path().extension() == ".cpp") addKeys(bytesOf(entry.path()), keys);
+    if (entry.path().extension() == ".cpp") addKeys(*Platform::readFile(entry.path()), keys);
   return keys;
 }
 
@@ -56,8 +51,8 @@ TEST(Texts, EveryLanguageHasEveryKeyWithTheArgumentsThatTheCodeGives) {
   EXPECT_EQ(keys.size(), 17u);
   EXPECT_EQ(languages(), (std::set<std::string>{"de", "en", "es", "fr", "ja", "uk"}));
   for (const std::string& language : languages()) {
-    const auto table = Platform::parseStringsTable(
-        bytesOf(fs::path(VARNEL_TEST_RESOURCES) / (language + ".lproj") / "Localizable.strings"));
+    const auto table = Platform::parseStringsTable(*Platform::readFile(
+        fs::path(VARNEL_TEST_RESOURCES) / (language + ".lproj") / "Localizable.strings"));
     ASSERT_TRUE(table) << language;
     for (const auto& [key, argumentCount] : keys) {
       const auto text = table->find(key);

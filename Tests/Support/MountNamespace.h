@@ -13,24 +13,19 @@
 
 namespace Varnel::Tests {
 
-/// Gives this process a namespace of its own, as of CLONE_NEWNET, also where it is not root: then
-/// it becomes the root of a user namespace. To be called before the process has further threads.
-/// Returns the reason why it cannot be done, or nothing.
-[[nodiscard]] inline std::string enterNamespace(int kind) {
+/// Gives this process mounts of its own, which no other process sees and which go away with it,
+/// also where it is not root: then it becomes the root of a user namespace. To be called before the
+/// process has further threads. Returns the reason why it cannot be done, or nothing.
+[[nodiscard]] inline std::string enterMountNamespace() {
   const uid_t user = ::geteuid();
   const gid_t group = ::getegid();
-  if (::unshare(kind) == 0) return {};
-  if (::unshare(CLONE_NEWUSER | kind) != 0)
-    return std::string("no namespace of its own: ") + std::strerror(errno);
-  std::ofstream("/proc/self/setgroups") << "deny";
-  std::ofstream("/proc/self/uid_map") << "0 " << user << " 1";
-  std::ofstream("/proc/self/gid_map") << "0 " << group << " 1";
-  return {};
-}
-
-/// The same for mounts, which no other process sees and which go away with this one.
-[[nodiscard]] inline std::string enterMountNamespace() {
-  if (std::string reason = enterNamespace(CLONE_NEWNS); !reason.empty()) return reason;
+  if (::unshare(CLONE_NEWNS) != 0) {
+    if (::unshare(CLONE_NEWUSER | CLONE_NEWNS) != 0)
+      return std::string("no namespace of its own: ") + std::strerror(errno);
+    std::ofstream("/proc/self/setgroups") << "deny";
+    std::ofstream("/proc/self/uid_map") << "0 " << user << " 1";
+    std::ofstream("/proc/self/gid_map") << "0 " << group << " 1";
+  }
   if (::mount("none", "/", nullptr, MS_REC | MS_PRIVATE, nullptr) != 0)
     return std::string("mounts stay shared: ") + std::strerror(errno);
   return {};

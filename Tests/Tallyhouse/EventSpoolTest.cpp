@@ -4,10 +4,10 @@
 #include <sys/stat.h>
 
 #include <fstream>
-#include <functional>
 #include <future>
 
 #include <Tests/Tallyhouse/SpoolFixture.h>
+#include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/Testing/FaultyPrivateFiles.h>
 
 namespace Tallyhouse {
@@ -21,9 +21,8 @@ using Tests::OtherConnection;
 
 bool isFound(const std::string& secret, const fs::path& folder) {
   for (const auto& entry : fs::directory_iterator(folder)) {
-    std::ifstream file(entry.path(), std::ios::binary);
-    const std::string bytes(std::istreambuf_iterator<char>(file), {});
-    if (bytes.find(secret) != std::string::npos) return true;
+    const auto bytes = Varnel::Platform::readFile(entry.path());
+    if (bytes && bytes->find(secret) != std::string::npos) return true;
   }
   return false;
 }

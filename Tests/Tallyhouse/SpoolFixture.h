@@ -25,6 +25,10 @@ class OtherConnection final {
 
   OtherConnection(const std::string& path, const std::string& sql)
       : database_(Database::open(path, Database::Access::readWrite).value()) {
+    run(sql);
+  }
+
+  void run(const std::string& sql) {
     const auto error = database_->execute(sql);
     EXPECT_FALSE(error) << error->localizedDescription();
   }

@@ -6,6 +6,7 @@
 #include <sys/stat.h>
 
 #include <fstream>
+#include <limits>
 
 #include <Tests/Contract/UserWorlds.h>
 #include <Tests/Support/TemporaryFolder.h>
@@ -46,6 +47,8 @@ class DesktopWithoutBus final : public ApplicationLauncherWorld {
     ApplicationLaunch launch;
     for (std::string* line : {&launch.desktopEntry, &launch.action, &launch.activationToken})
       std::getline(told, *line);
+    // To the end, so that the next one to read does not meet this writer.
+    told.ignore(std::numeric_limits<std::streamsize>::max());
     return launch;
   }
 
