@@ -171,7 +171,7 @@ bool Notifier::run() {
     if (isOver()) break;
     static_cast<void>(ownsName("ReleaseName"));
   } while (!isOver() && !isIdle());
-  if (isReplaced()) handOver();
+  if (!isDisconnected_) handOver();
   return true;
 }
 
@@ -186,7 +186,9 @@ bool Notifier::isReplaced() {
                      [](const auto& each) { return each.second->isQuiet(); });
 }
 
-// Where there is anything left to do, the bus starts what lies in this program's place by now.
+// Where there is anything left to do, the bus starts what it finds by now: what lies in this
+// program's place, or the program of another version in that one's. Where all of them are gone it
+// starts nothing.
 void Notifier::handOver() {
   if (isIdle()) return;
   static_cast<void>(ownsName("ReleaseName"));

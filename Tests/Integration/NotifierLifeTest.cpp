@@ -160,6 +160,24 @@ TEST_F(NotifierTest, AProgramThatIsReplacedTakesOverOnceNoBannerIsUp) {
   }));
 }
 
+// As an upgrade does that brings another version's folder and takes the old one's away.
+TEST_F(NotifierTest, AProgramElsewhereTakesOverFromOneThatHasGone) {
+  const std::string copy = home_ + "/varnel-notifier", next = copy + "-of-the-next-version";
+  fs::copy_file(VARNEL_NOTIFIER, copy);
+  install(copy);
+  Product(home_ + "/upgraded").planForLater();
+  callBus("StartServiceByName", std::string(notifierName) + " 0");
+  const pid_t old = ownerOf(notifierName);
+  ASSERT_NE(old, 0);
+  fs::copy_file(copy, next);
+  install(next);
+  fs::remove(copy);
+  EXPECT_TRUE(comesTrue([&] {
+    const pid_t present = ownerOf(notifierName);
+    return present != 0 && present != old;
+  }));
+}
+
 TEST_F(NotifierTest, OneThatIsKilledAtItsStartIsStartedAgain) {
   write("start", "#!/bin/sh\n[ -e " + home_ + "/killed ] && exec " + home_ + "/notifier\n: >" +
                      home_ + "/killed\nkill -KILL $$\n");
