@@ -6,6 +6,7 @@
 #include <sys/stat.h>
 
 #include <fstream>
+#include <sstream>
 
 #include <Tests/Contract/UserWorlds.h>
 #include <Tests/Support/TemporaryFolder.h>
@@ -41,8 +42,10 @@ class DesktopWithoutBus final : public ApplicationLauncherWorld {
                       ";\n[Desktop Action " + action + "]\nName=Act\n" + line + " " + action +
                       "\n");
   }
+  // To the end: an application that still held the pipe would take the place of the next one.
   ApplicationLaunch started() override {
-    std::ifstream told(output());
+    std::stringstream told;
+    told << std::ifstream(output()).rdbuf();
     ApplicationLaunch launch;
     for (std::string* line : {&launch.desktopEntry, &launch.action, &launch.activationToken})
       std::getline(told, *line);
