@@ -11,6 +11,7 @@
 #include <fstream>
 #include <memory>
 #include <optional>
+#include <stdexcept>
 #include <string>
 #include <vector>
 
@@ -57,13 +58,24 @@ inline pid_t ownerOf(const std::string& name) {
   return answer.empty() ? 0 : std::stoi(answer.substr(answer.find(' ')));
 }
 
+/// A busy machine starts a service in seconds.
+inline constexpr std::chrono::seconds maxWait = 60s;
+
 /// Asks again and again, as services are started and end by themselves.
 template <typename Condition>
 bool comesTrue(Condition condition) {
-  const auto end = std::chrono::steady_clock::now() + 20s;
+  const auto end = std::chrono::steady_clock::now() + maxWait;
   while (!condition())
     if (std::chrono::steady_clock::now() > end) return false;
   return true;
+}
+
+/// The notifier's process, once the bus has started it.
+inline pid_t startedNotifier() {
+  pid_t notifier = 0;
+  if (!comesTrue([&] { return (notifier = ownerOf(notifierName)) != 0; }))
+    throw std::runtime_error("The notifier is not started.");
+  return notifier;
 }
 
 inline std::string displayed() {
@@ -170,7 +182,7 @@ class Host final {
     return launch;
   }
   void settle() {
-    queue_->runWhile([this] { return center.isBusy(); }, 10s);
+    queue_->runWhile([this] { return center.isBusy(); }, maxWait);
   }
 
  private:

@@ -29,8 +29,7 @@ TEST_F(NotifierTest, AReminderComesToAnApplicationThatDoesNotRunAndAClickStartsI
   constexpr int almostAWeek = 7 * 24 * 60 * 60 - 2;
   moveClock("+" + std::to_string(almostAWeek));
   EXPECT_EQ(ChildProcess({example, "plan"}).wait(), 0);
-  const pid_t notifier = ownerOf(notifierName);
-  EXPECT_NE(notifier, 0);
+  const pid_t notifier = startedNotifier();
   EXPECT_TRUE(comesTrue([] { return displayed() == "1\n"; }));
   EXPECT_EQ(ownerOf(notifierName), notifier);
   moveClock("+0");
