@@ -102,10 +102,15 @@ TEST_F(NotifierTest, OneThatHangsIsNotWaitedForAndDeliversWhenItGoesOnOrHasEnded
   host.settle();
   for (const int end : {SIGCONT, SIGKILL}) {
     const pid_t notifier = startedNotifier();
-    ::kill(notifier, SIGSTOP);
     const std::string title = end == SIGCONT ? "goes on" : "has ended";
-    host.schedule(
-        {.identifier = "note", .title = title, .deliveryDate = std::chrono::system_clock::now()});
+    // Not while it has the store locked.
+    EXPECT_TRUE(comesTrue([&] {
+      ::kill(notifier, SIGSTOP);
+      const bool isPlanned = !host.center.scheduleNotification(
+          {.identifier = "note", .title = title, .deliveryDate = std::chrono::system_clock::now()});
+      if (!isPlanned) ::kill(notifier, SIGCONT);
+      return isPlanned;
+    }));
     host.synchronise();
     EXPECT_TRUE(host.center.isBusy());
     EXPECT_THAT(host.delivered, Not(Contains(title)));

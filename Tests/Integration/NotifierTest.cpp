@@ -76,7 +76,9 @@ TEST_F(NotifierTest, EachProductHasItsOwnClicksAndAnOnlookerGivesWay) {
               .desktopEntry = "com.example.First",
               .icon = icon},
              Standing::application);
-  Host second("second"), onlooker("second", Standing::onlooker);
+  Host onlooker("second", Standing::onlooker);
+  onlooker.synchronise();
+  Host second("second");
   second.deliver("second");
   second.await([] { return displayed() == "1\n"; });
   first.deliver("first");
