@@ -12,6 +12,8 @@
 namespace Varnel::Tests {
 namespace {
 
+using ::testing::Contains;
+using ::testing::ElementsAre;
 using ::testing::HasSubstr;
 using ::testing::Not;
 
@@ -42,7 +44,7 @@ TEST_F(NotifierTest, ANotifierWithNothingToDoEnds) {
   EXPECT_EQ(ChildProcess({VARNEL_NOTIFIER}).wait(), 0);
   const std::string orvane = ORVANE_PROGRAM;
   outputOf(orvane + " remind every weekly");
-  EXPECT_TRUE(isOnBus(notifierName));
+  startedNotifier();
   EXPECT_EQ(outputOf("ls " + home_ + "/foreign"), "notifications.sqlite\n");
   // There is one of them.
   EXPECT_EQ(ChildProcess({VARNEL_NOTIFIER}).wait(), 0);
@@ -53,7 +55,7 @@ TEST_F(NotifierTest, ANotifierWithNothingToDoEnds) {
 // Asleep it has little memory of its own, and nothing wakes it.
 TEST_F(NotifierTest, ANotifierSleeps) {
   outputOf(std::string(ORVANE_PROGRAM) + " remind every weekly");
-  const std::string process = "/proc/" + std::to_string(ownerOf(notifierName));
+  const std::string process = "/proc/" + std::to_string(startedNotifier());
   const auto figure = [&](const char* file, const char* name) {
     std::ifstream lines(process + file);
     for (std::string line; std::getline(lines, line);)
@@ -61,10 +63,12 @@ TEST_F(NotifierTest, ANotifierSleeps) {
     return -1l;
   };
   EXPECT_LT(figure("/smaps_rollup", "Private_Dirty:"), 1200);
-  std::this_thread::sleep_for(1s);
-  const long switches = figure("/status", "voluntary_ctxt_switches:");
-  std::this_thread::sleep_for(3s);
-  EXPECT_EQ(figure("/status", "voluntary_ctxt_switches:"), switches);
+  // Once it has fallen asleep.
+  EXPECT_TRUE(comesTrue([&] {
+    const long switches = figure("/status", "voluntary_ctxt_switches:");
+    std::this_thread::sleep_for(3s);
+    return figure("/status", "voluntary_ctxt_switches:") == switches;
+  }));
 }
 
 TEST_F(NotifierTest, WithoutItsProgramItEndsAndTheHostDeliversItself) {
@@ -76,8 +80,7 @@ TEST_F(NotifierTest, WithoutItsProgramItEndsAndTheHostDeliversItself) {
   host.schedule({.identifier = "later", .deliveryDate = std::chrono::system_clock::now() + 24h});
   host.settle();
   // Its host calls it back when it was killed, but not when it has gone.
-  const pid_t killed = ownerOf(notifierName);
-  ASSERT_NE(killed, 0);
+  const pid_t killed = startedNotifier();
   ::kill(killed, SIGKILL);
   host.await([&] { return ownerOf(notifierName) != killed && isOnBus(notifierName); });
   host.settle();
@@ -89,6 +92,36 @@ TEST_F(NotifierTest, WithoutItsProgramItEndsAndTheHostDeliversItself) {
   host.await([] { return displayed() == "1\n"; });
   outputOf("dunstctl action 0");
   host.await([&] { return !host.clicked.empty(); });
+}
+
+// Its host goes on meanwhile, and what it has planned comes once.
+TEST_F(NotifierTest, OneThatHangsIsNotWaitedForAndDeliversWhenItGoesOnOrHasEnded) {
+  const Server server;
+  Host host("patient");
+  host.schedule({.identifier = "later", .deliveryDate = std::chrono::system_clock::now() + 24h});
+  host.settle();
+  for (const int end : {SIGCONT, SIGKILL}) {
+    const pid_t notifier = startedNotifier();
+    const std::string title = end == SIGCONT ? "goes on" : "has ended";
+    // Not while it has the store locked.
+    EXPECT_TRUE(comesTrue([&] {
+      ::kill(notifier, SIGSTOP);
+      const bool isPlanned = !host.center.scheduleNotification(
+          {.identifier = "note", .title = title, .deliveryDate = std::chrono::system_clock::now()});
+      if (!isPlanned) ::kill(notifier, SIGCONT);
+      return isPlanned;
+    }));
+    host.synchronise();
+    EXPECT_TRUE(host.center.isBusy());
+    EXPECT_THAT(host.delivered, Not(Contains(title)));
+    ::kill(notifier, end);
+    host.await([&] {
+      return outputOf("dunstctl close; dunstctl history").find(title) != std::string::npos &&
+             host.delivered.size() == (end == SIGCONT ? 1 : 2);
+    });
+    EXPECT_EQ(startedNotifier() == notifier, end == SIGCONT);
+  }
+  EXPECT_THAT(host.delivered, ElementsAre("goes on", "has ended"));
 }
 
 // As a session starts: the notifier first, and the desktop later.

@@ -11,6 +11,7 @@
 #include <fstream>
 #include <memory>
 #include <optional>
+#include <stdexcept>
 #include <string>
 #include <vector>
 
@@ -57,13 +58,24 @@ inline pid_t ownerOf(const std::string& name) {
   return answer.empty() ? 0 : std::stoi(answer.substr(answer.find(' ')));
 }
 
+/// A busy machine starts a service in seconds.
+inline constexpr std::chrono::seconds maxWait = 60s;
+
 /// Asks again and again, as services are started and end by themselves.
 template <typename Condition>
 bool comesTrue(Condition condition) {
-  const auto end = std::chrono::steady_clock::now() + 20s;
+  const auto end = std::chrono::steady_clock::now() + maxWait;
   while (!condition())
     if (std::chrono::steady_clock::now() > end) return false;
   return true;
+}
+
+/// The notifier's process, once the bus has started it.
+inline pid_t startedNotifier() {
+  pid_t notifier = 0;
+  if (!comesTrue([&] { return (notifier = ownerOf(notifierName)) != 0; }))
+    throw std::runtime_error("The notifier is not started.");
+  return notifier;
 }
 
 inline std::string displayed() {
@@ -82,7 +94,6 @@ class Server final {
 class NotifierTest : public testing::Test {
  protected:
   NotifierTest() {
-    fs::remove_all(home_);
     fs::create_directories(home_ + "/share/applications");
     for (const char* variable : {"HOME", "XDG_STATE_HOME", "XDG_CONFIG_HOME"})
       ::setenv(variable, home_.c_str(), 1);
@@ -90,11 +101,16 @@ class NotifierTest : public testing::Test {
     moveClock("+0");
     install(VARNEL_NOTIFIER);
   }
+  // One that the bus is just starting ends as well.
   ~NotifierTest() override {
-    if (const pid_t notifier = ownerOf(notifierName)) ::kill(notifier, SIGKILL);
-    EXPECT_TRUE(comesTrue([] { return !isOnBus(notifierName); }));
     for (const auto& service : fs::directory_iterator(desktop + "/services"))
       fs::remove(service.path());
+    callBus("ReloadConfig", "");
+    EXPECT_TRUE(comesTrue([] {
+      const pid_t notifier = ownerOf(notifierName);
+      if (notifier != 0) ::kill(notifier, SIGKILL);
+      return notifier == 0;
+    }));
   }
 
   void write(const std::string& name, const std::string& text) const {
@@ -118,7 +134,9 @@ class NotifierTest : public testing::Test {
   // By a number of seconds, with its sign.
   void moveClock(const std::string& seconds) const { write("clock", seconds + "\n"); }
 
-  const std::string home_ = desktop + "/home";
+  /// Its own, because what an earlier test has started may still write.
+  const std::string home_ =
+      desktop + "/" + testing::UnitTest::GetInstance()->current_test_info()->name();
 };
 
 /// One process of a product, as far as the bus knows; it remembers its events.
@@ -170,7 +188,7 @@ class Host final {
     return launch;
   }
   void settle() {
-    queue_->runWhile([this] { return center.isBusy(); }, 10s);
+    queue_->runWhile([this] { return center.isBusy(); }, maxWait);
   }
 
  private:

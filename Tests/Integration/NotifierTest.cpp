@@ -29,8 +29,7 @@ TEST_F(NotifierTest, AReminderComesToAnApplicationThatDoesNotRunAndAClickStartsI
   constexpr int almostAWeek = 7 * 24 * 60 * 60 - 2;
   moveClock("+" + std::to_string(almostAWeek));
   EXPECT_EQ(ChildProcess({example, "plan"}).wait(), 0);
-  const pid_t notifier = ownerOf(notifierName);
-  EXPECT_NE(notifier, 0);
+  const pid_t notifier = startedNotifier();
   EXPECT_TRUE(comesTrue([] { return displayed() == "1\n"; }));
   EXPECT_EQ(ownerOf(notifierName), notifier);
   moveClock("+0");
@@ -77,7 +76,9 @@ TEST_F(NotifierTest, EachProductHasItsOwnClicksAndAnOnlookerGivesWay) {
               .desktopEntry = "com.example.First",
               .icon = icon},
              Standing::application);
-  Host second("second"), onlooker("second", Standing::onlooker);
+  Host onlooker("second", Standing::onlooker);
+  onlooker.synchronise();
+  Host second("second");
   second.deliver("second");
   second.await([] { return displayed() == "1\n"; });
   first.deliver("first");

@@ -169,6 +169,7 @@ TEST_F(NotificationDelivererTest, IsIdleWhenNothingIsLeftNowAndLater) {
   EXPECT_EQ(notifier.deliverer->earliestDate(), start + 1h);
   notifier.timer.advanceTo(start + 1h);
   EXPECT_FALSE(isIdle()) << "due";
+  EXPECT_FALSE(notifier.deliverer->isQuiet());
   notifier.server.isPresent = false;
   notifier.hosts.questions.at("A")(true);
   EXPECT_FALSE(isIdle()) << "to show";
@@ -197,20 +198,27 @@ TEST_F(NotificationDelivererTest, IsIdleWhenNothingIsLeftNowAndLater) {
   }
 }
 
-TEST_F(NotificationDelivererTest, LeavesAProcessThatDeliversItselfAloneUntilItEnds) {
-  std::optional<Testing::Process> other(std::in_place, file, start);
-  other->listen();
-  other->deliver(at(start, "its own"));  // Its banner has yet to come.
-  Notifier notifier(file, start);
-  for (const bool isTold : {true, false}) {
-    host.schedule(at(start, isTold ? "told" : "not told"));
-    notifier.deliverer->recheck();
-    EXPECT_THAT(notifier.hosts.questions, IsEmpty());
-    if (isTold) continue;
-    other.reset();
-    notifier.timer.advanceTo(start + NotificationDeliverer::maxPause);
+TEST_F(NotificationDelivererTest, LeavesAProcessThatDeliversItselfAloneWhileItListens) {
+  for (const bool ends : {false, true}) {
+    std::optional<Testing::Process> other(std::in_place, file, start);
+    other->listen();
+    other->schedule(at(start, "its own"));  // Its banner has yet to come.
+    Notifier notifier(file, start);
+    for (const bool isTold : {true, false}) {
+      host.schedule(at(start, isTold ? "told" : "not told"));
+      notifier.deliverer->recheck();
+      EXPECT_THAT(notifier.hosts.questions, IsEmpty()) << ends;
+      if (isTold) continue;
+      if (ends) {
+        other.reset();
+      } else {
+        other->center.setDelegate({});
+        other->settle();
+      }
+      notifier.timer.advanceTo(start + NotificationDeliverer::maxPause);
+    }
+    EXPECT_THAT(notifier.hosts.questions, SizeIs(2)) << ends;
   }
-  EXPECT_THAT(notifier.hosts.questions, SizeIs(2));
 }
 
 // One that is due for another process keeps the next one from nobody.
