@@ -16,6 +16,7 @@ class PrivateFiles;
 class ProcessInfo;
 class ProcessLauncher;
 class ReadingPriority;
+class SessionBoard;
 class SoundPlayer;
 class StandardOutput;
 class SystemLog;
@@ -51,6 +52,7 @@ namespace Varnel::Platform::Bare {
 [[nodiscard]] std::unique_ptr<MachineIdentity> noMachineIdentity();
 [[nodiscard]] std::unique_ptr<ProcessLauncher> noProcessLauncher();
 [[nodiscard]] std::unique_ptr<ReadingPriority> noReadingPriority();
+[[nodiscard]] std::unique_ptr<SessionBoard> noSessionBoard();
 [[nodiscard]] std::unique_ptr<SoundPlayer> noSoundPlayer();
 [[nodiscard]] std::unique_ptr<Trash> noTrash();
 [[nodiscard]] std::unique_ptr<UserNotificationCenters> noUserNotificationCenters(MainQueue& queue);

@@ -8,6 +8,7 @@
 #include <Varnel/Platform/Ports/MachineIdentity.h>
 #include <Varnel/Platform/Ports/ProcessLauncher.h>
 #include <Varnel/Platform/Ports/ReadingPriority.h>
+#include <Varnel/Platform/Ports/SessionBoard.h>
 #include <Varnel/Platform/Ports/SoundPlayer.h>
 #include <Varnel/Platform/Ports/Trash.h>
 #include <Varnel/Platform/Ports/Workspace.h>
@@ -63,6 +64,16 @@ class NoReadingPriority final : public ReadingPriority {
   Level lowered(Level normal) override { return normal; }
 };
 
+class NoSessionBoard final : public SessionBoard {
+ public:
+  std::unique_ptr<Place> takePlace(const std::string&, unsigned, Wait) override {
+    return std::make_unique<Place>();
+  }
+  std::error_code post(std::string_view) override { return notSupported(); }
+  void withdraw() override {}
+  std::vector<Note> notes() override { return {}; }
+};
+
 class NoSoundPlayer final : public SoundPlayer {
  public:
   std::shared_ptr<PlayableSound> load(std::string) override { return nullptr; }
@@ -112,6 +123,10 @@ std::unique_ptr<ProcessLauncher> noProcessLauncher() {
 std::unique_ptr<ReadingPriority> noReadingPriority() {
   return std::make_unique<NoReadingPriority>();
 }
+std::unique_ptr<SessionBoard> noSessionBoard() {
+  return std::make_unique<NoSessionBoard>();
+}
+
 std::unique_ptr<SoundPlayer> noSoundPlayer() {
   return std::make_unique<NoSoundPlayer>();
 }

@@ -16,6 +16,7 @@
 #include <Varnel/Platform/Ports/ProcessLauncher.h>
 #include <Varnel/Platform/Ports/ReadingPriority.h>
 #include <Varnel/Platform/Ports/SecurityScope.h>
+#include <Varnel/Platform/Ports/SessionBoard.h>
 #include <Varnel/Platform/Ports/SoundPlayer.h>
 #include <Varnel/Platform/Ports/StandardOutput.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
@@ -66,6 +67,7 @@ const Ports& systemPorts() {
       .processLauncher = keep(Bare::noProcessLauncher()),
       .readingPriority = keep(Bare::noReadingPriority()),
       .securityScope = keep(POSIX::makeSecurityScope()),
+      .sessionBoard = keep(Bare::noSessionBoard()),
       .soundPlayer = keep(Bare::noSoundPlayer()),
       .standardOutput = keep(Bare::makeStandardOutput()),
       .systemLog = systemLog,

@@ -16,6 +16,7 @@
 #include <Varnel/Platform/Ports/ProcessLauncher.h>
 #include <Varnel/Platform/Ports/ReadingPriority.h>
 #include <Varnel/Platform/Ports/SecurityScope.h>
+#include <Varnel/Platform/Ports/SessionBoard.h>
 #include <Varnel/Platform/Ports/SoundPlayer.h>
 #include <Varnel/Platform/Ports/StandardOutput.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
@@ -71,6 +72,7 @@ const Ports& systemPorts() {
       .processLauncher = keep(Linux::makeProcessLauncher()),
       .readingPriority = keep(Linux::makeReadingPriority()),
       .securityScope = keep(POSIX::makeSecurityScope()),
+      .sessionBoard = keep(POSIX::makeSessionBoard(privateFiles)),
       .soundPlayer = keep(Linux::makeSoundPlayer(systemLog, mainQueue)),
       .standardOutput = keep(Linux::makeStandardOutput()),
       .systemLog = systemLog,

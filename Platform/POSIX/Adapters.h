@@ -15,6 +15,7 @@ class HTTPClient;
 class PrivateFiles;
 class ProcessInfo;
 class SecurityScope;
+class SessionBoard;
 class SystemLog;
 class UserAccount;
 class UserDefaults;
@@ -41,6 +42,8 @@ using MakeDefaults = std::function<std::unique_ptr<UserDefaults>(const std::stri
 /// `executable` is the absolute path of the running program, which an update may rename meanwhile.
 [[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo(const std::string& executable);
 [[nodiscard]] std::unique_ptr<SecurityScope> makeSecurityScope();
+/// In $XDG_RUNTIME_DIR. The files outlive it.
+[[nodiscard]] std::unique_ptr<SessionBoard> makeSessionBoard(PrivateFiles& files);
 [[nodiscard]] std::unique_ptr<SystemLog> makeSystemLog();
 [[nodiscard]] std::unique_ptr<UserAccount> makeUserAccount();
 [[nodiscard]] std::unique_ptr<UserLocale> makeUserLocale();

@@ -23,6 +23,7 @@ class ProcessInfo;
 class ProcessLauncher;
 class ReadingPriority;
 class SecurityScope;
+class SessionBoard;
 class SoundPlayer;
 class StandardOutput;
 class SystemLog;
@@ -61,6 +62,7 @@ struct Ports {
   std::reference_wrapper<ProcessLauncher> processLauncher;
   std::reference_wrapper<ReadingPriority> readingPriority;
   std::reference_wrapper<SecurityScope> securityScope;
+  std::reference_wrapper<SessionBoard> sessionBoard;
   std::reference_wrapper<SoundPlayer> soundPlayer;
   std::reference_wrapper<StandardOutput> standardOutput;
   std::reference_wrapper<SystemLog> systemLog;

@@ -21,6 +21,7 @@
 #include <Varnel/Platform/Testing/FakeProcessLauncher.h>
 #include <Varnel/Platform/Testing/FakeReadingPriority.h>
 #include <Varnel/Platform/Testing/FakeSecurityScope.h>
+#include <Varnel/Platform/Testing/FakeSessionBoard.h>
 #include <Varnel/Platform/Testing/FakeSoundPlayer.h>
 #include <Varnel/Platform/Testing/FakeTimeZones.h>
 #include <Varnel/Platform/Testing/FakeTrash.h>
@@ -73,6 +74,7 @@ struct FakePorts {
   FakeProcessLauncher processLauncher;
   FakeReadingPriority readingPriority;
   FakeSecurityScope securityScope;
+  FakeSessionBoard sessionBoard;
   FakeSoundPlayer soundPlayer;
   CapturedOutput standardOutput;
   CapturedSystemLog systemLog;
@@ -102,6 +104,7 @@ struct FakePorts {
         .processLauncher = processLauncher,
         .readingPriority = readingPriority,
         .securityScope = securityScope,
+        .sessionBoard = sessionBoard,
         .soundPlayer = soundPlayer,
         .standardOutput = standardOutput,
         .systemLog = systemLog,

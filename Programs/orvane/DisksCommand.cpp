@@ -7,9 +7,11 @@
 #include <string>
 
 #include <Varnel/DiskAccess/OVDiskInfo.h>
+#include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Text/VisibleText.h>
 #include <orvane/Console.h>
 #include <orvane/JSONLine.h>
+#include <orvane/LiveDisks.h>
 
 namespace Orvane {
 namespace {
@@ -69,9 +71,18 @@ nlohmann::ordered_json jsonOf(const OVDiskInfo& disk, const Identifier& identifi
   return json;
 }
 
+int showLive(bool isJSON, Console& console) {
+  const auto notes = Varnel::Platform::processPorts().sessionBoard.get().notes();
+  if (!isJSON) return console.writeResult(textOfLiveDisks(notes)) ? 0 : 1;
+  const nlohmann::ordered_json json = {{"schemaVersion", schemaVersion},
+                                       {"processes", jsonOfLiveDisks(notes)}};
+  return console.writeResult(jsonLine(json)) ? 0 : 1;
+}
+
 }  // namespace
 
 int DisksCommand::run(Console& console) const {
+  if (isLive) return showLive(isJSON, console);
   std::string text;
   nlohmann::ordered_json json = {{"schemaVersion", schemaVersion},
                                  {"disks", nlohmann::ordered_json::array()}};

@@ -148,17 +148,35 @@ Command scan() {
 
 Command disks() {
   const auto command = std::make_shared<DisksCommand>();
-  return {.name = "disks",
-          .group = Command::Group::duplicates,
-          .summary = "List the disks, their kinds, limits and volumes",
-          .output = "A line a disk, and below it the folders that its volumes are mounted on",
-          .fields = {schemaVersionField,
-                     {"disks[].uniqueID", "the disk's lasting identifier; null when it has none"},
-                     {"disks[].kind", "unknown, solid state, rotational, external or network"},
-                     {"disks[].maxReaders", "how many threads may read it at once"},
-                     {"disks[].volumes", "file URLs of the folders its volumes are mounted on"}},
-          .options = {json(command)},
-          .run = runs(command)};
+  return {
+      .name = "disks",
+      .group = Command::Group::duplicates,
+      .summary = "List the disks, their kinds, limits and volumes",
+      .output =
+          "A line a disk, and below it the folders that its volumes are mounted on; live, a "
+          "line a process, and below it the disks where it has places or waits for them",
+      .fields = {schemaVersionField,
+                 {"disks[].uniqueID", "the disk's lasting identifier; null when it has none"},
+                 {"disks[].kind", "unknown, solid state, rotational, external or network"},
+                 {"disks[].maxReaders", "how many threads may read it at once"},
+                 {"disks[].volumes", "file URLs of the folders its volumes are mounted on"},
+                 {"processes[].process", "its number; of the live form alone, as what follows"},
+                 {"processes[].program", "its name"},
+                 {"processes[].disks[].uniqueID", "the identifier, for this process perhaps alone"},
+                 {"processes[].disks[].volume", "the path of one of its volumes"},
+                 {"processes[].disks[].maxReaders", "how many it admits now"},
+                 {"processes[].disks[].places[].propose", "what a place is held for"},
+                 {"processes[].disks[].places[].seconds", "for how long"},
+                 {"processes[].disks[].waiters",
+                  "how many threads wait, from the most to the least urgent class"},
+                 {"processes[].disks[].waitersForProcesses",
+                  "how many wait for what other processes have"}},
+      .options = {{.letter = 'l',
+                   .name = "live",
+                   .description = "Tell which programs read which disks at this moment",
+                   .value = flag(command, &DisksCommand::isLive)},
+                  json(command)},
+      .run = runs(command)};
 }
 
 }  // namespace

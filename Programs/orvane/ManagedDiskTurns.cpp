@@ -6,9 +6,11 @@
 #include <system_error>
 #include <utility>
 
+#include <Varnel/DiskAccess/DiskAccessManager.h>
 #include <Varnel/DiskAccess/DiskReadingQueue.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
 #include <Varnel/Platform/Concurrency/StartThread.h>
+#include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/VolumeCatalog.h>
 
 namespace Orvane {
@@ -89,6 +91,14 @@ class ManagedDiskTurns::QueueTask final : public Varnel::DiskReadingTask {
   const std::shared_ptr<DiskTask> task_;
   const DiskReadingFile file_;
 };
+
+Varnel::DiskReadingQueue& ManagedDiskTurns::sharedQueue() {
+  const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
+  static auto& queue = *new Varnel::DiskReadingQueue(
+      Varnel::DiskAccessManager::shared(),
+      {.readingPriority = ports.readingPriority, .sharedPlaces = &ports.sessionBoard.get()});
+  return queue;
+}
 
 ManagedDiskTurns::ManagedDiskTurns(Ports ports, Varnel::Platform::QualityOfService qos,
                                    unsigned maxTasks)

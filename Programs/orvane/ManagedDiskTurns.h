@@ -31,6 +31,10 @@ class ManagedDiskTurns final : public DiskTurns {
     Varnel::Platform::VolumeCatalog& volumes;
   };
 
+  /// The queue of the process that shares the places of its disks with other processes. Never
+  /// destroyed; throws as `DiskReadingQueue` does.
+  [[nodiscard]] static Varnel::DiskReadingQueue& sharedQueue();
+
   /// `maxTasks`: how many tasks share a disk, however many it admits.
   ManagedDiskTurns(Ports ports, Varnel::Platform::QualityOfService qos, unsigned maxTasks);
   /// Waits for tasks on no known volume. Those on disks must be done.

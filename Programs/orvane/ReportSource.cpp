@@ -12,7 +12,7 @@
 #include <Scan/DuplicateFinder.h>
 #include <Scan/FileSystem.h>
 #include <Scan/ScanObserver.h>
-#include <Varnel/DiskAccess/DiskReadingQueue.h>
+#include <Varnel/DiskWatch/DiskAccessWatcher.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <orvane/Console.h>
 #include <orvane/ManagedDiskTurns.h>
@@ -44,7 +44,8 @@ std::optional<Report> scan(const std::vector<std::string>& folders, Console& con
   const auto request = choice.request(console);
   if (!request) return std::nullopt;
   const unsigned maxReaders = std::max(2u, std::thread::hardware_concurrency() / 2);
-  ManagedDiskTurns turns({.queue = Varnel::DiskReadingQueue::shared(),
+  const Varnel::DiskAccessWatcher watcher("orvane");
+  ManagedDiskTurns turns({.queue = ManagedDiskTurns::sharedQueue(),
                           .volumes = Varnel::Platform::processPorts().volumeCatalog},
                          Varnel::Platform::QualityOfService::utility, maxReaders);
   ScanLog log(console);

@@ -7,6 +7,7 @@
 
 #include <Removal/Restoration.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
+#include <Varnel/DiskWatch/DiskAccessWatcher.h>
 #include <Varnel/Paths/QNURLResolver.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
@@ -88,6 +89,7 @@ int RestoreCommand::run(Console& console) const {
   const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
   RemovalJournal journal({ports.privateFiles, ports.systemLog}, RemovalJournal::productPath());
   if (lists) return list(journal, console);
+  const Varnel::DiskAccessWatcher watcher("orvane");
   Restoration restoration(
       {.disks = Varnel::DiskAccessManager::shared(), .trash = ports.trash, .journal = journal},
       number);

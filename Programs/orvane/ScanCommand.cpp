@@ -12,7 +12,7 @@
 #include <Scan/FileSystem.h>
 #include <Scan/ScanObserver.h>
 #include <Varnel/Context/Globals.h>
-#include <Varnel/DiskAccess/DiskReadingQueue.h>
+#include <Varnel/DiskWatch/DiskAccessWatcher.h>
 #include <Varnel/Logging/Logger.h>
 #include <Varnel/Logging/LoggingObject.h>
 #include <Varnel/Paths/QNURLResolver.h>
@@ -78,9 +78,9 @@ int ScanCommand::run(Console& console) const {
     for (const std::string& path : *paths) log.log("Will scan", URL::fileURLWithPath(path + "/"));
 
   const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
-  ManagedDiskTurns turns(
-      {.queue = Varnel::DiskReadingQueue::shared(), .volumes = ports.volumeCatalog}, qos,
-      maxReaders());
+  const Varnel::DiskAccessWatcher watcher("orvane");
+  ManagedDiskTurns turns({.queue = ManagedDiskTurns::sharedQueue(), .volumes = ports.volumeCatalog},
+                         qos, maxReaders());
   using QoS = Varnel::Platform::QualityOfService;
   const CacheUse cacheUse =
       qos == QoS::background || qos == QoS::utility ? CacheUse::traceless : CacheUse::normal;

@@ -7,6 +7,7 @@
 #include <Removal/Sharing.h>
 #include <Scan/ScanObserver.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
+#include <Varnel/DiskWatch/DiskAccessWatcher.h>
 #include <Varnel/Paths/QNURLResolver.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
@@ -59,6 +60,7 @@ int ShareCommand::run(Console& console) const {
   const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
   const ByteCountFormatter byteCounts(ports.userLocale.get().numberIdentifier());
   Progress progress(console, byteCounts);
+  const Varnel::DiskAccessWatcher watcher("orvane");
   Sharing sharing({.fileSystem = systemFileSystem(), .disks = Varnel::DiskAccessManager::shared()},
                   *report, isTrial ? Sharing::Mode::trial : Sharing::Mode::real,
                   control.isCancelled);

@@ -9,6 +9,7 @@
 #include <Scan/FileSystem.h>
 #include <Scan/ScanObserver.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
+#include <Varnel/DiskWatch/DiskAccessWatcher.h>
 #include <Varnel/Paths/QNURLResolver.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
@@ -75,6 +76,7 @@ int TrashCommand::run(Console& console) const {
 
   RemovalJournal journal({ports.privateFiles, ports.systemLog}, RemovalJournal::productPath());
   DpkgFiles packagedFiles;
+  const Varnel::DiskAccessWatcher watcher("orvane");
   Removal removal({.fileSystem = systemFileSystem(CacheUse::traceless),
                    .disks = Varnel::DiskAccessManager::shared(),
                    .trash = ports.trash,

@@ -85,6 +85,10 @@ void DiskAccessManager::setIsBackgroundMode(bool isBackgroundMode) {
   state_->setIsBackgroundMode(isBackgroundMode);
 }
 
+std::vector<DiskAccessSnapshot> DiskAccessManager::snapshots() const {
+  return state_->snapshots();
+}
+
 std::unique_ptr<DiskAccessingSession> DiskAccessManager::beginAccessingURL(
     const Platform::URL& url, std::string propose, Platform::QualityOfService qos,
     bool enableSecureScopedAccess, std::optional<Platform::TimeInterval> accessWaitingTimeout,

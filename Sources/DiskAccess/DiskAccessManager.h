@@ -7,6 +7,7 @@
 #include <vector>
 
 #include <Varnel/Basalt/NotificationCenter.h>
+#include <Varnel/DiskAccess/DiskAccessSnapshot.h>
 #include <Varnel/DiskAccess/DiskAccessingSession.h>
 #include <Varnel/Platform/Api.h>
 #include <Varnel/Platform/Values/Date.h>
@@ -73,6 +74,10 @@ class VARNEL_API DiskAccessManager final {
   /// In background mode every disk admits one thread only. Threads that are in stay in.
   [[nodiscard]] bool isBackgroundMode() const;
   void setIsBackgroundMode(bool isBackgroundMode);
+
+  /// The disks on which somebody has a place, or waits for one, at this moment. Waits for an
+  /// inventory that is under way. A session that was dropped without its end shows here for ever.
+  [[nodiscard]] std::vector<DiskAccessSnapshot> snapshots() const;
 
   /// Begins access to a file or folder and waits for a place on its disk, at most
   /// `accessWaitingTimeout` seconds of the wall clock. Without a value, or with one that is not a

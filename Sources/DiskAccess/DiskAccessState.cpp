@@ -3,6 +3,7 @@
 
 #include <utility>
 
+#include <Varnel/Basalt/Digest.h>
 #include <Varnel/Basalt/SecurityScopeBookkeeping.h>
 #include <Varnel/Basalt/SerialQueue.h>
 #include <Varnel/DiskAccess/DiskData.h>
@@ -82,6 +83,30 @@ std::shared_ptr<const OVDiskInfo> DiskAccessState::knownDiskOfVolume(
     const Platform::URL& volumeURL) const {
   const auto record = settledRecordOfVolume(volumeURL);
   return record == unknownDiskData_ ? nullptr : record->diskInfo();
+}
+
+std::optional<std::string> DiskAccessState::sharedNameOf(const DiskData& record) const {
+  const auto& identifier = record.diskInfo()->uniqueID();
+  if (&record == unknownDiskData_.get() || !identifier || identifier->empty()) return std::nullopt;
+  const bool isInvented =
+      planningQueue_->sync([&] { return identifiers_.hasInvented(*identifier); });
+  if (isInvented) return std::nullopt;
+  // A serial number may hold any characters, and be long.
+  return Basalt::hexadecimal(Basalt::sha256(*identifier));
+}
+
+void DiskAccessState::setWaitsForProcesses(const std::shared_ptr<DiskData>& record,
+                                           int urgencyClass, bool waits) const {
+  planningQueue_->sync([&] {
+    if (waits)
+      records_->addWaiterForProcesses(record, urgencyClass);
+    else
+      records_->removeWaiterForProcesses(record, urgencyClass);
+  });
+}
+
+std::vector<DiskAccessSnapshot> DiskAccessState::snapshots() const {
+  return planningQueue_->sync([&] { return records_->snapshots(); });
 }
 
 std::shared_ptr<DiskData> DiskAccessState::recordOfVolume(const Platform::URL& volumeURL) {

@@ -5,6 +5,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <vector>
 
 #include <Varnel/DiskAccess/DiskAccessManager.h>
 #include <Varnel/DiskAccess/InventedIdentifiers.h>
@@ -56,6 +57,14 @@ class DiskAccessState final : public std::enable_shared_from_this<DiskAccessStat
   /// Null when the volume lies on no known disk. Waits for the planning queue.
   [[nodiscard]] std::shared_ptr<const OVDiskInfo> knownDiskOfVolume(
       const Platform::URL& volumeURL) const;
+
+  /// What the disk is called among processes that share its places; absent when another process
+  /// would call it otherwise, as the identifier is invented. Waits for the planning queue, as all
+  /// three.
+  [[nodiscard]] std::optional<std::string> sharedNameOf(const DiskData& record) const;
+  void setWaitsForProcesses(const std::shared_ptr<DiskData>& record, int urgencyClass,
+                            bool waits) const;
+  [[nodiscard]] std::vector<DiskAccessSnapshot> snapshots() const;
 
   /// Null when the security scope cannot be opened or the time is up.
   [[nodiscard]] std::unique_ptr<DiskAccessingSession> begin(std::shared_ptr<DiskData> record,

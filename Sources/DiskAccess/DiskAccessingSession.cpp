@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/DiskAccess/DiskAccessingSession.h>
 
+#include <chrono>
 #include <utility>
 
 #include <Varnel/Basalt/SecurityScopeBookkeeping.h>
@@ -44,7 +45,7 @@ bool DiskAccessingSession::waitForAdmission(Platform::QualityOfService qos,
   const auto request = queue.sync([&] {
     if (auto used = records_->usedBy(thread, volumeURL_)) diskData_ = std::move(used);
     auto pending = diskData_->requestAccess(thread, qos);
-    if (!pending) records_->add({thread, diskData_, volumeURL_});
+    if (!pending) addUseBy(thread);
     return pending;
   });
   if (!request) return true;
@@ -54,16 +55,24 @@ bool DiskAccessingSession::waitForAdmission(Platform::QualityOfService qos,
   if (!isSignalled && request->claim()) return false;
   queue.sync([&] {
     diskData_->confirmAccess(thread);
-    records_->add({thread, diskData_, volumeURL_});
+    addUseBy(thread);
   });
   return true;
+}
+
+void DiskAccessingSession::addUseBy(Basalt::ThreadID thread) const {
+  records_->add({.thread = thread,
+                 .record = diskData_,
+                 .volumeURL = volumeURL_,
+                 .propose = propose_,
+                 .since = std::chrono::steady_clock::now()});
 }
 
 void DiskAccessingSession::passFrom(Basalt::ThreadID thread) {
   const Basalt::ThreadID current = Basalt::currentThreadID();
   diskData_->queue().sync([&] {
     diskData_->confirmAccess(current);
-    records_->add({current, diskData_, volumeURL_});
+    addUseBy(current);
     diskData_->releaseAccess(thread);
     records_->remove(thread, diskData_, volumeURL_);
   });

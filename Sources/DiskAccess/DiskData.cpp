@@ -67,6 +67,13 @@ void DiskData::grantPendingRequests() {
   });
 }
 
+std::array<std::size_t, urgencyClassCount> DiskData::waiterCounts() const {
+  std::array<std::size_t, urgencyClassCount> counts{};
+  for (const auto& request : requests_)
+    if (!request->isClaimed()) ++counts[static_cast<std::size_t>(request->urgencyClass())];
+  return counts;
+}
+
 DiskData::Requests DiskData::claimPendingRequests() {
   Requests granted = std::exchange(requests_, {});
   std::erase_if(granted, [](const auto& request) { return !request->claim(); });

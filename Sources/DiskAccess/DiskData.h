@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <array>
 #include <atomic>
 #include <cstddef>
 #include <cstdint>
@@ -90,13 +91,18 @@ class VARNEL_API DiskData final : public std::enable_shared_from_this<DiskData> 
   /// How many places are taken, a thread counting once for each that it has.
   [[nodiscard]] std::size_t accessCount() const { return accessingThreads_.count(); }
 
+  /// How many threads wait in each class.
+  [[nodiscard]] std::array<std::size_t, urgencyClassCount> waiterCounts() const;
+
+  /// How many places there are now.
+  [[nodiscard]] std::int64_t maxThreads() const { return isBackgroundMode_ ? 1 : maxThreads_; }
+
   /// How many requests stand in line, perhaps including some whose thread has given up.
   [[nodiscard]] std::size_t requestCount() const { return requests_.size(); }
 
  private:
   [[nodiscard]] bool hasFreePlace() const {
-    return static_cast<std::int64_t>(accessingThreads_.count()) <
-           (isBackgroundMode_ ? 1 : maxThreads_);
+    return static_cast<std::int64_t>(accessingThreads_.count()) < maxThreads();
   }
 
   const std::shared_ptr<Basalt::SerialQueue> queue_;

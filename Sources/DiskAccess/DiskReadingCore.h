@@ -23,6 +23,7 @@
 #include <Varnel/DiskAccess/DiskReadingWatch.h>
 #include <Varnel/DiskAccess/DiskReadingWorkers.h>
 #include <Varnel/Platform/Ports/ReadingPriority.h>
+#include <Varnel/Platform/Ports/SessionBoard.h>
 
 namespace Varnel {
 
@@ -81,7 +82,15 @@ class DiskReadingCore final : public std::enable_shared_from_this<DiskReadingCor
   using Request = std::shared_ptr<DiskReadingRequest>;
   struct Application;
   struct Stay;
+  /// Where the disk is shared by processes, its place among them belongs to the session.
+  struct Admission {
+    std::unique_ptr<DiskAccessingSession> session{};
+    std::unique_ptr<Platform::SessionBoard::Place> place{};
+  };
   class PriorityOfThread;
+
+  /// Beyond these, readers of one disk only cost threads, whatever a kind of the host's own admits.
+  static constexpr std::int64_t maxWorkers = 64;
 
   void add(DiskReadingJobs& jobs, Basalt::Block block);
 
@@ -105,6 +114,10 @@ class DiskReadingCore final : public std::enable_shared_from_this<DiskReadingCor
   void serve(DiskReadingLane& lane);
   void forgetInheritedPriority();
   [[nodiscard]] std::optional<Application> apply(DiskReadingLane& lane);
+  [[nodiscard]] std::optional<std::string> sharedNameOf(const DiskData& record) const;
+  [[nodiscard]] Admission admit(const std::shared_ptr<DiskData>& record,
+                                const std::optional<std::string>& sharedName,
+                                const DiskAccessState::Access& access) const;
   void endImpatientRequests(const DiskReadingLane& lane);
   void removeIfUnused(const DiskReadingLane& lane);
 

@@ -11,6 +11,7 @@
 
 namespace Varnel::Platform {
 class ReadingPriority;
+class SessionBoard;
 struct Ports;
 }  // namespace Varnel::Platform
 
@@ -52,6 +53,12 @@ class VARNEL_API DiskReadingQueue final {
   struct Ports {
     Platform::ReadingPriority& readingPriority;
     DiskReadingTurn::Now now = DiskReadingTurn::Clock::now;  ///< Measures turns.
+
+    /// Where queues of several processes share the places of their disks: of all together, no more
+    /// run at once on a disk than it admits. None: each process has the disk for itself. Disks that
+    /// tell no identifier, and sessions that the queue does not begin, are not shared. A board
+    /// outlives every thread that waits for it, and so is best never destroyed.
+    Platform::SessionBoard* sharedPlaces = nullptr;
   };
 
   /// The manager outlives the queue. All throw `std::system_error` when the system grants no

@@ -15,9 +15,6 @@ namespace {
 
 using namespace std::chrono_literals;
 
-/// Beyond these, readers of one disk only cost threads, whatever a kind of the host's own admits.
-constexpr std::int64_t maxWorkers = 64;
-
 /// How long a request whose executor is slow to begin stays out of the line at last. It starts with
 /// the time of a turn, and doubles.
 constexpr std::chrono::milliseconds maxPause = 1s;
@@ -81,6 +78,7 @@ struct DiskReadingCore::Stay {
   PriorityOfThread priority;
   int urgency = 0;  ///< In which it was admitted.
   std::unique_ptr<DiskAccessingSession> session{};
+  std::unique_ptr<Platform::SessionBoard::Place> sharedPlace{};
   std::atomic<bool> isTurnEnded = false;
   enum class Offer { open, taken, done };
   Offer offer = Offer::open;  ///< What has become of the place on the executor.
@@ -143,6 +141,7 @@ void DiskReadingCore::serve(DiskReadingLane& lane) {
       stay.priority.restore();
     return application;
   };
+  const auto sharedName = sharedNameOf(*lane.record);
   Lock lock(mutex_);
   --lane.starting;
   if (!isClosed_) forgetInheritedPriority();
@@ -150,17 +149,20 @@ void DiskReadingCore::serve(DiskReadingLane& lane) {
   while (application) {
     lock.unlock();
     stay.urgency = application->urgency;
-    stay.session = disks_->begin(lane.record, std::move(application->access));
+    Admission admission = admit(lane.record, sharedName, application->access);
+    stay.session = std::move(admission.session);
+    stay.sharedPlace = std::move(admission.place);
     lock.lock();
     if (!stay.session) endImpatientRequests(lane);
     --lane.applying[static_cast<std::size_t>(stay.urgency)];
     if (stay.session) takeTurn(lock, stay);
     // Before it leaves the disk, so that nobody else is called for the work that it goes on with.
     application = applyOrLeave();
-    if (!stay.session) continue;
+    if (!stay.session && !stay.sharedPlace) continue;
     lock.unlock();
-    stay.session->endAccessing();
+    if (stay.session) stay.session->endAccessing();
     stay.session.reset();
+    stay.sharedPlace.reset();
     lock.lock();
   }
 }

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/DiskAccess/DiskRecords.h>
 
+#include <algorithm>
 #include <utility>
 
 #include <Varnel/Basalt/SerialQueue.h>
@@ -67,6 +68,37 @@ void DiskRecords::remove(Basalt::ThreadID thread, const std::shared_ptr<DiskData
     if (use->volumeURL == volumeURL) break;
   }
   if (found != uses_.end()) uses_.erase(found);
+}
+
+void DiskRecords::addWaiterForProcesses(std::shared_ptr<DiskData> record, int urgencyClass) {
+  waitersForProcesses_.emplace_back(std::move(record), urgencyClass);
+}
+
+void DiskRecords::removeWaiterForProcesses(const std::shared_ptr<DiskData>& record,
+                                           int urgencyClass) {
+  const auto found = std::find(waitersForProcesses_.begin(), waitersForProcesses_.end(),
+                               WaiterForProcesses(record, urgencyClass));
+  if (found != waitersForProcesses_.end()) waitersForProcesses_.erase(found);
+}
+
+std::vector<DiskAccessSnapshot> DiskRecords::snapshots() const {
+  Basalt::QNAssertOnQueue(*queue_);
+  std::vector<DiskAccessSnapshot> snapshots;
+  std::unordered_map<const DiskData*, std::size_t> indices;
+  // A record on which nobody is has nobody waiting either, but for what other processes have.
+  const auto snapshotOf = [&](const DiskData& record) -> DiskAccessSnapshot& {
+    const auto [index, isNew] = indices.try_emplace(&record, snapshots.size());
+    if (isNew)
+      snapshots.push_back({.disk = record.diskInfo(),
+                           .maxReaders = record.maxThreads(),
+                           .waiters = record.waiterCounts()});
+    return snapshots[index->second];
+  };
+  for (const Use& use : uses_)
+    snapshotOf(*use.record).places.push_back({use.thread, use.propose, use.since});
+  for (const auto& [record, urgencyClass] : waitersForProcesses_)
+    ++snapshotOf(*record).waitersForProcesses[static_cast<std::size_t>(urgencyClass)];
+  return snapshots;
 }
 
 }  // namespace Varnel

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include <Varnel/Basalt/ThreadID.h>
+#include <Varnel/DiskAccess/DiskAccessSnapshot.h>
 #include <Varnel/DiskAccess/OVDiskInfo.h>
 #include <Varnel/Platform/Values/URL.h>
 
@@ -46,6 +47,8 @@ class DiskRecords final {
     Basalt::ThreadID thread;
     std::shared_ptr<DiskData> record;
     Platform::URL volumeURL;
+    std::string propose{};
+    DiskAccessSnapshot::Time since{};
   };
 
   void add(Use use) { uses_.push_back(std::move(use)); }
@@ -55,11 +58,21 @@ class DiskRecords final {
   void remove(Basalt::ThreadID thread, const std::shared_ptr<DiskData>& record,
               const Platform::URL& volumeURL);
 
+  /// A thread of a class waits for a place that other processes have, or has stopped waiting.
+  void addWaiterForProcesses(std::shared_ptr<DiskData> record, int urgencyClass);
+  void removeWaiterForProcesses(const std::shared_ptr<DiskData>& record, int urgencyClass);
+
+  /// The disks on which somebody has a place or waits for one.
+  [[nodiscard]] std::vector<DiskAccessSnapshot> snapshots() const;
+
  private:
+  using WaiterForProcesses = std::pair<std::shared_ptr<DiskData>, int>;
+
   const std::shared_ptr<Basalt::SerialQueue> queue_;
   std::unordered_map<Platform::URL, std::string> diskUniqueIDsByVolumeURL_;
   std::unordered_map<std::string, std::shared_ptr<DiskData>> diskDataByUniqueID_;
   std::vector<Use> uses_;
+  std::vector<WaiterForProcesses> waitersForProcesses_;
 };
 
 }  // namespace Varnel

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/DiskAccess/InventedIdentifiers.h>
 
+#include <algorithm>
 #include <utility>
 
 #include <Varnel/Platform/Values/UUID.h>
@@ -19,6 +20,11 @@ std::string InventedIdentifiers::identifierFor(const OVDiskInfo::VolumeURLs& vol
   if (identifier.empty()) identifier = Platform::randomUUIDString();
   for (const Platform::URL& volume : volumes) asked_.emplace(volume, identifier);
   return identifier;
+}
+
+bool InventedIdentifiers::hasInvented(const std::string& identifier) const {
+  return std::any_of(known_.begin(), known_.end(),
+                     [&](const auto& entry) { return entry.second == identifier; });
 }
 
 void InventedIdentifiers::endInventory() {

@@ -22,6 +22,9 @@ class InventedIdentifiers final {
   /// Forgets what this inventory has not asked for.
   void endInventory();
 
+  /// Whether the identifier is one of these. Of disks that are gone it is not known for ever.
+  [[nodiscard]] bool hasInvented(const std::string& identifier) const;
+
   /// A volume was unmounted: what is mounted there next may be another one.
   void forget(const Platform::URL& volumeURL) { known_.erase(volumeURL); }
 

@@ -1,14 +1,18 @@
 // SPDX-License-Identifier: MIT
 #include <Tests/Contract/ProcessWorlds.h>
 
+#include <atomic>
 #include <map>
+#include <set>
 #include <sstream>
 #include <thread>
 
+#include <Tests/Support/Crew.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
 #include <Varnel/Platform/Testing/FakeProcessInfo.h>
 #include <Varnel/Platform/Testing/FakeProcessLauncher.h>
 #include <Varnel/Platform/Testing/FakeReadingPriority.h>
+#include <Varnel/Platform/Testing/FakeSessionBoard.h>
 
 namespace Varnel::Platform::Contract {
 namespace {
@@ -112,6 +116,56 @@ TEST_P(ReadingPriorityContract, IsTheThreadsOwnAndCanBeRestored) {
   EXPECT_EQ(priority.current(), normal);
   std::thread([&] { EXPECT_EQ(priority.current(), normal); }).join();
 }
+
+TEST_P(SessionBoardContract, GivesSoManyPlacesOfANameAndNobodyWaitsForEver) {
+  using Wait = SessionBoard::Wait;
+  SessionBoard& board = world->port();
+  auto first = board.takePlace("disk/1", 2, Wait::no);
+  const auto second = board.takePlace("disk/1", 2, Wait::forPlace);
+  EXPECT_TRUE(first && second);
+  EXPECT_FALSE(board.takePlace("disk/1", 2, Wait::no));
+  EXPECT_TRUE(board.takePlace("disk/2", 1, Wait::no));
+  first.reset();
+  EXPECT_TRUE(board.takePlace("disk/1", 2, Wait::no));
+  for (const unsigned count : {1u, 3u}) {
+    std::atomic<unsigned> inside = 0;
+    Tests::Crew crew(6, [&](unsigned) {
+      for (int i = 0; i < 50; ++i) {
+        const auto place = board.takePlace(std::to_string(count), count, Wait::forPlace);
+        EXPECT_LE(++inside, count);
+        std::this_thread::yield();
+        --inside;
+      }
+    });
+  }
+}
+
+TEST_P(SessionBoardContract, ShowsTheLastNoteOfEachProcessThatRuns) {
+  SessionBoard& board = world->port();
+  const auto texts = [&] {
+    std::multiset<std::string> all;
+    for (const auto& note : board.notes()) all.insert(note.text);
+    return all;
+  };
+  using Texts = std::multiset<std::string>;
+  EXPECT_EQ(texts(), Texts());
+  EXPECT_FALSE(board.post("first"));
+  EXPECT_FALSE(board.post("second"));
+  world->postByAnother("another's");
+  EXPECT_EQ(texts(), (Texts{"second", "another's"}));
+  EXPECT_TRUE(board.post(std::string(SessionBoard::maxNoteSize + 1, ' ')));
+  world->endAnother();
+  EXPECT_EQ(texts(), Texts{"second"});
+  board.withdraw();
+  EXPECT_EQ(texts(), Texts());
+}
+
+class FakeSession final : public FakeColumn<SessionBoardWorld, Testing::FakeSessionBoard> {
+ public:
+  void postByAnother(const std::string& text) override { port_.setNotesOfOthers({{2, text}}); }
+  void endAnother() override { port_.setNotesOfOthers({}); }
+};
+INSTANTIATE_TEST_SUITE_P(Fake, SessionBoardContract, on<FakeSession>());
 
 INSTANTIATE_TEST_SUITE_P(Fake, ReadingPriorityContract, on<Testing::FakeReadingPriority>());
 

@@ -5,6 +5,7 @@
 #include <Varnel/Platform/Ports/ProcessInfo.h>
 #include <Varnel/Platform/Ports/ProcessLauncher.h>
 #include <Varnel/Platform/Ports/ReadingPriority.h>
+#include <Varnel/Platform/Ports/SessionBoard.h>
 #include <Varnel/Platform/Ports/StandardOutput.h>
 #include <Varnel/Platform/Ports/SystemLog.h>
 
@@ -32,6 +33,14 @@ class ProcessLauncherWorld : public WorldOf<ProcessLauncher> {
 using ProcessLauncherContract = Suite<ProcessLauncherWorld>;
 
 using ReadingPriorityContract = Suite<WorldOf<ReadingPriority>>;
+
+/// The board of a session in which another process runs.
+class SessionBoardWorld : public WorldOf<SessionBoard> {
+ public:
+  virtual void postByAnother(const std::string& text) = 0;
+  virtual void endAnother() = 0;
+};
+using SessionBoardContract = Suite<SessionBoardWorld>;
 
 class StandardOutputWorld : public WorldOf<StandardOutput> {
  public:

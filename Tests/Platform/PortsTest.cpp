@@ -20,10 +20,10 @@ constexpr bool areAssignable(const std::reference_wrapper<Port>&...) {
 // through to the service.
 TEST(Ports, CannotBeAssignedThemselves) {
   FakePorts fakes;
-  const auto& [a, b, c, d, e, f, g, h, i, j, k, l, m, n, o, p, q, r, s, t, u, v, w, x, y, z] =
+  const auto& [a, b, c, d, e, f, g, h, i, j, k, l, m, n, o, p, q, r, s, t, u, v, w, x, y, z, aa] =
       fakes.ports();
-  EXPECT_FALSE(
-      areAssignable(a, b, c, d, e, f, g, h, i, j, k, l, m, n, o, p, q, r, s, t, u, v, w, x, y, z));
+  EXPECT_FALSE(areAssignable(a, b, c, d, e, f, g, h, i, j, k, l, m, n, o, p, q, r, s, t, u, v, w, x,
+                             y, z, aa));
 }
 
 TEST(FakePorts, TakeTheirFilesAwayWithThem) {

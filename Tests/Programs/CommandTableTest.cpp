@@ -8,9 +8,11 @@
 #include <sstream>
 
 #include <Tests/Programs/OrvaneFixture.h>
+#include <Varnel/DiskWatch/DiskAccessNote.h>
 #include <orvane/Arguments.h>
 #include <orvane/CommandTable.h>
 #include <orvane/HelpText.h>
+#include <orvane/LiveDisks.h>
 #include <orvane/ScanReport.h>
 
 namespace Orvane::Testing {
@@ -101,6 +103,28 @@ std::set<std::string> membersOf(const nlohmann::json& object) {
   return members;
 }
 
+Notes notesOfAReader() {
+  Varnel::DiskAccessNote note;
+  note.program = "a\nb";
+  note.disks.push_back({.uniqueID = "DISK",
+                        .volume = "/",
+                        .maxReaders = 1,
+                        .places = {{"read\x1b", 0.25}},
+                        .waiters = {1, 0, 2, 0},
+                        .waitersForProcesses = {0, 0, 0, 3}});
+  return {{8, note.text()}, {7, "{}"}, {6, "no note"}};
+}
+
+TEST(LiveDisks, ShowWhoReadsWhat) {
+  EXPECT_EQ(textOfLiveDisks(notesOfAReader()),
+            "a\\nb (8)\n"
+            "  DISK (/): 1 of 1 place\n"
+            "    for 0.250 s: read\\x1B\n"
+            "    waiting: 1 user-interactive, 2 utility\n"
+            "    waiting for other processes: 3 background\n");
+  EXPECT_EQ(textOfLiveDisks({}), "no process tells of its disks\n");
+}
+
 TEST_F(Orvane, PrintsTheMembersThatItsHelpNames) {
   folder.write("a\xfe/x", "same");
   folder.write("b/x", "same");
@@ -113,7 +137,9 @@ TEST_F(Orvane, PrintsTheMembersThatItsHelpNames) {
     for (const Option& option : command.options)
       if (option.isRequired)
         arguments.insert(arguments.end(), {"--" + option.name, option.value.words.at(0)});
-    const auto printed = membersOf(nlohmann::json::parse(run(arguments).output));
+    auto printed = membersOf(nlohmann::json::parse(run(arguments).output));
+    if (command.name == "disks")
+      printed.merge(membersOf({{"processes", jsonOfLiveDisks(notesOfAReader())}}));
     std::set<std::string> named;
     // One that is printed only where it says something may be missing.
     for (const JSONField& field : command.fields)

@@ -13,7 +13,7 @@
 #include <Scan/ScanRequest.h>
 #include <Varnel/Context/Globals.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
-#include <Varnel/DiskAccess/DiskReadingQueue.h>
+#include <Varnel/DiskWatch/DiskAccessWatcher.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <orvane-window/Model/MoveReasons.h>
 #include <orvane-window/Model/Texts.h>
@@ -144,8 +144,9 @@ ScanOutcome SystemEngine::scan(const std::vector<std::string>& folders, ScanCont
   analytics_ = std::make_unique<ScanAnalytics>(analyticsEndpoint_, false, console_);
   analytics_->scanStarted(paths.size());
   ScanLog log(console_);
+  const Varnel::DiskAccessWatcher watcher("orvane-window");
   ManagedDiskTurns turns(
-      {.queue = Varnel::DiskReadingQueue::shared(), .volumes = processPorts().volumeCatalog},
+      {.queue = ManagedDiskTurns::sharedQueue(), .volumes = processPorts().volumeCatalog},
       Varnel::Platform::QualityOfService::userInitiated, maxReaders());
   DuplicateFinder finder(
       {.fileSystem = systemFileSystem(CacheUse::traceless), .turns = turns, .observer = log});

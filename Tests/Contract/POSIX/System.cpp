@@ -4,10 +4,14 @@
 
 #include <cstdarg>
 #include <cstdio>
+#include <cstdlib>
 
 #include <Tests/Contract/MainLoopWorlds.h>
 #include <Tests/Contract/ProcessWorlds.h>
+#include <Tests/Support/OtherProcess.h>
+#include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/Ports.h>
 
 namespace {
 std::string written;
@@ -36,6 +40,30 @@ class Syslog final : public AdapterColumn<SystemLogWorld, POSIX::makeSystemLog> 
   std::string text() override { return written; }
 };
 INSTANTIATE_TEST_SUITE_P(POSIX, SystemLogContract, on<Syslog>());
+
+/// Places and notes in a folder of the test's, beside a process that ends without a word.
+class RuntimeFolder final : public SessionBoardWorld {
+ public:
+  RuntimeFolder() { ::setenv("XDG_RUNTIME_DIR", folder_.path().c_str(), 1); }
+  SessionBoard& port() override { return *board_; }
+  void postByAnother(const std::string& text) override {
+    other_ = std::make_unique<Tests::OtherProcess>([&] {
+      auto board = makeBoard();
+      return board->post(text) ? nullptr : std::move(board);
+    });
+    ASSERT_TRUE(other_->isReady());
+  }
+  void endAnother() override { other_.reset(); }
+
+ private:
+  static std::unique_ptr<SessionBoard> makeBoard() {
+    return POSIX::makeSessionBoard(systemPorts().privateFiles);
+  }
+  const Tests::TemporaryFolder folder_;
+  const std::unique_ptr<SessionBoard> board_ = makeBoard();
+  std::unique_ptr<Tests::OtherProcess> other_;
+};
+INSTANTIATE_TEST_SUITE_P(POSIX, SessionBoardContract, on<RuntimeFolder>());
 
 class POSIXClock final : public AdapterColumn<ClockWorld, POSIX::makeClock> {
  public:

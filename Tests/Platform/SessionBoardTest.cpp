@@ -1,0 +1,65 @@
+// SPDX-License-Identifier: MIT
+#include <fcntl.h>
+#include <sys/stat.h>
+
+#include <filesystem>
+
+#include <gtest/gtest.h>
+
+#include <Tests/Support/TemporaryFolder.h>
+#include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/Ports.h>
+#include <Varnel/Platform/Ports/SessionBoard.h>
+
+namespace Varnel::Platform {
+namespace {
+
+namespace fs = std::filesystem;
+using Wait = SessionBoard::Wait;
+
+std::unique_ptr<SessionBoard> makeBoard() {
+  return POSIX::makeSessionBoard(systemPorts().privateFiles);
+}
+
+TEST(SessionBoard, KeepsItsFilesToTheUserAndTakesNoneThatOthersPutThere) {
+  const Tests::TemporaryFolder folder;
+  ::setenv("XDG_RUNTIME_DIR", folder.path().c_str(), 1);
+  const auto board = makeBoard();
+  const mode_t before = ::umask(0);
+  ASSERT_FALSE(board->post("note"));
+  const auto place = board->takePlace("../../disk", 1, Wait::no);
+  ::umask(before);
+  std::size_t files = 0;
+  for (const auto& each : fs::recursive_directory_iterator(folder.path()))
+    if (each.is_regular_file()) {
+      struct stat facts {};
+      ASSERT_EQ(::stat(each.path().c_str(), &facts), 0);
+      EXPECT_EQ(facts.st_mode & 0777, 0600u) << each.path();
+      ++files;
+    }
+  EXPECT_EQ(files, 2u) << "nothing lies outside";
+
+  const fs::path notes = folder.path() / "varnel" / "processes";
+  ASSERT_EQ(::mkfifo((notes / "1.fifo").c_str(), 0600), 0);
+  fs::create_symlink("/etc/passwd", notes / "1.link");
+  fs::create_directory(notes / "1.folder");
+  const fs::path left = folder.write("varnel/processes/1.left", "of a process that was killed");
+  EXPECT_EQ(board->notes(), (std::vector<SessionBoard::Note>{{::getpid(), "note"}}));
+  EXPECT_FALSE(fs::exists(left));
+}
+
+TEST(SessionBoard, MeansNothingWhereTheSessionHasNoFolder) {
+  const Tests::TemporaryFolder folder;
+  const std::string file = folder.write("file", "").string();
+  for (const std::string value : {"", "relative", "/proc/missing", file.c_str()}) {
+    ::setenv("XDG_RUNTIME_DIR", value.c_str(), 1);
+    const auto board = makeBoard();
+    const auto first = board->takePlace("disk", 1, Wait::no);
+    EXPECT_TRUE(first && board->takePlace("disk", 1, Wait::forPlace)) << value;
+    EXPECT_TRUE(board->post("note")) << value;
+    EXPECT_TRUE(board->notes().empty()) << value;
+  }
+}
+
+}  // namespace
+}  // namespace Varnel::Platform
