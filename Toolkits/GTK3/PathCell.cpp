@@ -46,7 +46,7 @@ int naturalWidth(const Gtk::CellRenderer& cell, Gtk::Widget& widget) {
 
 }  // namespace
 
-PathCell::PathCell() : Glib::ObjectBase(typeid(PathCell)), Gtk::CellRenderer() {
+PathCell::PathCell() : Glib::ObjectBase(typeid(PathCell)) {
   text_.property_single_paragraph_mode() = true;
   text_.property_ellipsize() = Pango::ELLIPSIZE_MIDDLE;
   text_.property_xpad() = 0;
@@ -55,6 +55,7 @@ PathCell::PathCell() : Glib::ObjectBase(typeid(PathCell)), Gtk::CellRenderer() {
 
 void PathCell::setURL(const std::optional<Platform::URL>& url, PathKind kind) {
   components_.clear();
+  property_text() = url ? pathText(*url, kind) : std::string();
   if (!url) return;
   const auto& resolver = QNURLResolver::shared();
   const auto full = Platform::pathComponents(*url);

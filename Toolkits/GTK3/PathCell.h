@@ -20,8 +20,9 @@ namespace Varnel::GTK3 {
 /// Draws a path as a row of components, each with an icon: in a list (`PathColumn`), or as a widget
 /// of its own (`PathControl`). A path too long for its place loses components at its start.
 ///
-/// The file system is not asked. Main thread only.
-class VARNEL_API PathCell final : public Gtk::CellRenderer {
+/// Its text, which a screen reader reads, is the path's short form. The file system is not asked.
+/// Main thread only.
+class VARNEL_API PathCell final : public Gtk::CellRendererText {
  public:
   using ComponentCell = CommonPathControl::PathComponentCell;
 

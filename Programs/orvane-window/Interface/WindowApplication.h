@@ -38,7 +38,6 @@ class WindowApplication final : public Gtk::Application {
   int takeOptions(const Glib::RefPtr<Glib::VariantDict>& options);
   void shutDown();
   void addActions();
-  void addAccelerators();
   MainWindow& window();
   void showPreferences();
   void showLicense();
