@@ -199,9 +199,10 @@ void MainWindow::showPage() {
 
 void MainWindow::showProgress() {
   const std::string line = progress_.refresh(session_);
-  header_.set_subtitle(line);
-  // What task lists show.
+  // What task lists show; the header would follow it.
   set_title(line + " – " + Varnel::Globals::applicationName());
+  header_.set_title(Varnel::Globals::applicationName());
+  header_.set_subtitle(line);
 }
 
 void MainWindow::showScanned() {

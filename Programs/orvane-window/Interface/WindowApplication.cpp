@@ -59,8 +59,9 @@ WindowApplication::WindowApplication(Console& console)
   add_main_option_entry(OPTION_TYPE_STRING, "analytics", '\0',
                         "Where events go, if the user has agreed", "URL");
   routing_.emplace(*this, [this](Varnel::UserNotificationRouter& router) {
-    reminding_ = std::make_unique<Reminding>(
-        router, console_, [this](const auto& token) { window().comeForward(token); });
+    reminding_ = std::make_unique<Reminding>(router, console_, [this](const auto& token) {
+      withWindow([token](MainWindow& window) { window.comeForward(token); });
+    });
   });
   signal_handle_local_options().connect(sigc::mem_fun(*this, &WindowApplication::takeOptions),
                                         false);
@@ -125,15 +126,27 @@ MainWindow& WindowApplication::window() {
   return *window_;
 }
 
+void WindowApplication::withWindow(std::function<void(MainWindow&)> act) {
+  if (window_) return act(*window_);
+  // The toolkit's start and the window together would be too long a turn of the main loop.
+  hold();
+  Glib::signal_idle().connect_once([this, act = std::move(act)] {
+    act(window());
+    release();
+  });
+}
+
 void WindowApplication::on_activate() {
-  window().comeForward();
+  withWindow([](MainWindow& window) { window.comeForward(); });
 }
 
 void WindowApplication::on_open(const type_vec_files& files, const Glib::ustring&) {
   std::vector<std::string> folders;
   for (const auto& file : files) folders.push_back(file->get_path());
-  window().addFolders(folders);
-  window().comeForward();
+  withWindow([folders](MainWindow& window) {
+    window.addFolders(folders);
+    window.comeForward();
+  });
 }
 
 // What is being moved comes to its end first: the window's session asks for that.

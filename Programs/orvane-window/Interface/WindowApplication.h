@@ -3,6 +3,7 @@
 
 #include <gtkmm/application.h>
 
+#include <functional>
 #include <memory>
 #include <optional>
 #include <string>
@@ -39,6 +40,8 @@ class WindowApplication final : public Gtk::Application {
   void shutDown();
   void addActions();
   MainWindow& window();
+  /// Does so at once, or as soon as there is a window.
+  void withWindow(std::function<void(MainWindow&)> act);
   void showPreferences();
   void showLicense();
   void openLink(const std::string& name);
