@@ -146,6 +146,11 @@ TEST(PathCell, ALongPathLosesItsStart) {
   EXPECT_TRUE(firstAt(full / 2).starts_with("/nowhere/")) << firstAt(full / 2);
   EXPECT_EQ(firstAt(30), "/nowhere/in/the/middle/of/cat.jpg");
   EXPECT_EQ(cell.componentAt(window, full, full + 5), nullptr);
+  // However narrow, it takes one line.
+  int heights[2][2];
+  cell.get_preferred_height(window, heights[0][0], heights[0][1]);
+  cell.get_preferred_height_for_width(window, 30, heights[1][0], heights[1][1]);
+  EXPECT_EQ(heights[1][1], heights[0][1]);
 }
 
 TEST(ApplicationActivity, AChangeBetweenTheApplicationsWindowsIsNone) {

@@ -125,6 +125,12 @@ void PathCell::get_preferred_height_vfunc(Gtk::Widget& widget, int& minimum, int
   text_.get_preferred_height(widget, minimum, natural);
 }
 
+// A text that is too long would take another line.
+void PathCell::get_preferred_height_for_width_vfunc(Gtk::Widget& widget, int, int& minimum,
+                                                    int& natural) const {
+  get_preferred_height_vfunc(widget, minimum, natural);
+}
+
 void PathCell::render_vfunc(const Cairo::RefPtr<Cairo::Context>& context, Gtk::Widget& widget,
                             const Gdk::Rectangle& background, const Gdk::Rectangle& area,
                             Gtk::CellRendererState flags) {

@@ -41,6 +41,8 @@ class VARNEL_API PathCell final : public Gtk::CellRendererText {
  protected:
   void get_preferred_width_vfunc(Gtk::Widget& widget, int& minimum, int& natural) const override;
   void get_preferred_height_vfunc(Gtk::Widget& widget, int& minimum, int& natural) const override;
+  void get_preferred_height_for_width_vfunc(Gtk::Widget& widget, int width, int& minimum,
+                                            int& natural) const override;
   void render_vfunc(const Cairo::RefPtr<Cairo::Context>& context, Gtk::Widget& widget,
                     const Gdk::Rectangle& background, const Gdk::Rectangle& area,
                     Gtk::CellRendererState flags) override;

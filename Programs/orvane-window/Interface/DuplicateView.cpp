@@ -36,6 +36,13 @@ std::string timeOf(const ReportFile& file) {
   return Glib::DateTime::create_now_local(file.modified).format("%x %R");
 }
 
+// Of one line, whatever the width: all rows are of one height.
+Gtk::CellRendererText* textCell() {
+  auto* cell = Gtk::manage(new Gtk::CellRendererText);
+  cell->property_ellipsize() = Pango::ELLIPSIZE_MIDDLE;
+  return cell;
+}
+
 Gtk::TreeViewColumn& added(Gtk::TreeView& view, const char* titleKey, int width) {
   auto* column = Gtk::manage(
       new Gtk::TreeViewColumn(titleKey ? Glib::ustring(localized(titleKey)) : Glib::ustring()));
@@ -117,8 +124,7 @@ void DuplicateView::addName() {
         cell.property_gicon() = Gio::content_type_get_icon(type);
       },
       rows_);
-  auto* title = Gtk::manage(new Gtk::CellRendererText);
-  title->property_ellipsize() = Pango::ELLIPSIZE_MIDDLE;
+  auto* title = textCell();
   pack(
       name, *title, true,
       [](Gtk::CellRendererText& cell, const DuplicateList& list, const Row& row) {
@@ -141,7 +147,7 @@ void DuplicateView::addFolder() {
   folder_->set_sizing(Gtk::TREE_VIEW_COLUMN_FIXED);
   folder_->set_fixed_width(330);
   folder_->set_resizable();
-  auto* count = Gtk::manage(new Gtk::CellRendererText);
+  auto* count = textCell();
   count->property_sensitive() = false;
   pack(
       *folder_, *count, true,
@@ -157,7 +163,7 @@ void DuplicateView::addFolder() {
 void DuplicateView::addFigures() {
   auto& size = added(*this, "Column_Size", 110);
   size.set_alignment(1.0f);
-  auto* bytes = Gtk::manage(new Gtk::CellRendererText);
+  auto* bytes = textCell();
   bytes->property_xalign() = 1.0f;
   pack(
       size, *bytes, true,
@@ -167,7 +173,7 @@ void DuplicateView::addFigures() {
       },
       rows_);
   auto& modified = added(*this, "Column_Modified", 150);
-  auto* time = Gtk::manage(new Gtk::CellRendererText);
+  auto* time = textCell();
   pack(
       modified, *time, true,
       [](Gtk::CellRendererText& cell, const DuplicateList& list, const Row& row) {
