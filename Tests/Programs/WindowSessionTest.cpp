@@ -2,6 +2,9 @@
 #include <gtest/gtest.h>
 
 #include <deque>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
 #include <memory>
 #include <set>
 #include <string>
@@ -48,11 +51,19 @@ TEST(DuplicateList, NeverHasAWholeGroupNorAReferenceChosen) {
     EXPECT_EQ(list.choose(step.place, step.isChosen), step.answer);
     EXPECT_EQ(list.chosen(), step.chosen);
   }
-  const Selection byHand = list.selection();
+  const auto nothing = [](const std::string&) { return false; };
+  const Selection byHand = list.selection(nothing);
   ASSERT_EQ(byHand.size(), 2u);
   EXPECT_EQ(byHand[0], (Choice{.group = 0, .kept = 0, .victims = {1, 2}}));
   EXPECT_EQ(byHand[1], (Choice{.group = 1, .kept = 1, .victims = {0}}));
   EXPECT_FALSE(check(*list.report(), byHand));
+
+  // What lies in a trash stays for no other file, unless nothing else is left.
+  list.choose({0, 1}, false);
+  const auto isFirst = [](const std::string& path) { return path == "/a"; };
+  EXPECT_EQ(list.selection(isFirst)[0], (Choice{.group = 0, .kept = 1, .victims = {2}}));
+  list.choose({0, 1}, true);
+  EXPECT_EQ(list.selection(isFirst)[0].kept, 0u);
 
   EXPECT_EQ(list.nextChosen({0, 2}), (DuplicateList::Place{1, 0}));
   EXPECT_EQ(list.nextChosen({1, 0}), (DuplicateList::Place{0, 1}));
@@ -88,16 +99,23 @@ class StepBackground final : public Background {
 
 class FakeEngine final : public Engine {
  public:
-  ScanOutcome scan(const std::vector<std::string>& folders, ScanControl&) override {
-    if (folders.front() == "/gone") return {.lostFolders = {{"/gone", {}}}};
-    return {.report = twoGroups()};
+  ScanOutcome scan(ScanRequest request, ScanControl& control) override {
+    if (request.folders.front() == "/gone") return {.lostFolders = {{"/gone", {}}}};
+    Report report = *twoGroups();
+    if (request.minSize > 10) report.groups.clear();
+    report.isPartial = control.isCancelled;
+    return {.report = std::make_shared<const Report>(report),
+            .jsonReport = [](const TextWriter& write) { return write("{}"); }};
   }
+  bool isPassing(const std::string& path) const override { return trash.contains(path); }
   std::shared_ptr<PlannedRemoval> plan(std::shared_ptr<const Report> report, Selection selection,
                                        std::shared_ptr<MoveProgress>) override {
+    planned = selection;
     return std::make_shared<Plan>(*this, std::move(report), std::move(selection));
   }
   MoveOutcome restore(MoveProgress&) override { return {.paths = std::exchange(trash, {})}; }
 
+  Selection planned;
   std::set<std::string> trash;
   std::set<std::string> stubborn;  ///< What cannot be moved.
 
@@ -189,16 +207,18 @@ TEST_F(SessionFixture, ScansRemovesAndPutsBack) {
   EXPECT_EQ(session->folders(), (std::vector<std::string>{"/f"}));
 }
 
-TEST_F(SessionFixture, StopsAndFailsWithoutAResult) {
+TEST_F(SessionFixture, AScanThatIsStoppedHasWhatItFoundAndOneThatFailsNothing) {
   session->addFolder("/f");
   session->addFolder("/f");
   EXPECT_EQ(session->folders().size(), 1u);
-  session->scan();
-  session->stop();
-  EXPECT_TRUE(session->isStopping());
-  background.run();
-  EXPECT_EQ(events.back(), Event::scanStopped);
-  EXPECT_FALSE(session->list());
+  for (const std::uint64_t minSize : {0u, 100u}) {
+    session->scan({.minSize = minSize});
+    session->stop();
+    EXPECT_TRUE(session->isStopping());
+    background.run();
+    EXPECT_EQ(events.back(), minSize == 0 ? Event::scanned : Event::scanStopped);
+    EXPECT_EQ(session->list() && session->list()->report()->isPartial, minSize == 0);
+  }
 
   session->removeFolder("/f");
   session->addFolder("/gone");
@@ -217,6 +237,53 @@ TEST_F(SessionFixture, StoppedWhileItLooksAsksNothing) {
   EXPECT_FALSE(session->plan());
   session->remove();
   EXPECT_EQ(session->stage(), Stage::results);
+}
+
+TEST_F(SessionFixture, NeitherARuleNorAPlanKeepsWhatLiesInATrash) {
+  engine.trash = {"/b"};
+  scan();
+  session->choose(KeepRule::oldest);  // That is "/b".
+  background.run();
+  EXPECT_FALSE(session->list()->isChosen({0, 2}));
+  session->choose({0, 1}, false);
+  session->choose({0, 0}, true);
+  session->planRemoval();
+  background.run();
+  EXPECT_EQ(engine.planned[0], (Choice{.group = 0, .kept = 2, .victims = {0}}));
+}
+
+TEST_F(SessionFixture, ExportsItsReportAndTheChosenFilesOrLeavesWhatIsThere) {
+  scan();
+  const auto folder = std::filesystem::path(testing::TempDir()) / "orvane-export";
+  std::filesystem::create_directories(folder / "taken" / "full");
+  const auto exported = [&](const char* name, Session::ExportKind kind) {
+    session->exportTo(folder / name, kind);
+    background.run();
+    EXPECT_EQ(session->stage(), Stage::results);
+    std::ifstream file(folder / name);
+    return std::string(std::istreambuf_iterator<char>(file), {});
+  };
+  EXPECT_EQ(exported("all", Session::ExportKind::scanReport), "{}");
+  session->choose({0, 0}, true);
+  session->choose({0, 1}, true);
+  EXPECT_EQ(exported("chosen", Session::ExportKind::chosenFiles), "/a\n/b\n");
+  EXPECT_FALSE(session->exportFailure());
+  session->exportTo(folder / "taken", Session::ExportKind::chosenFiles);
+  background.run();
+  EXPECT_TRUE(session->exportFailure());
+  EXPECT_TRUE(std::filesystem::exists(folder / "taken" / "full"));
+  EXPECT_EQ(std::distance(std::filesystem::directory_iterator(folder), {}), 3);
+  std::filesystem::remove_all(folder);
+
+  const DuplicateList odd(std::make_shared<const Report>(
+      Report{.groups = {{1, {file("/a\nb"), file("/\xff"), file("/plain")}}}}));
+  std::string text;
+  for (DuplicateList list = odd; const std::size_t place : {0u, 1u}) {
+    list.choose({0, place}, true);
+    text.clear();
+    EXPECT_TRUE(writeChosenFiles(list, [&](std::string_view part) { return text += part, true; }));
+  }
+  EXPECT_EQ(text, "file:///a%0Ab\nfile:///%FF\n");
 }
 
 TEST_F(SessionFixture, EndsWhileWorkGoesOn) {

@@ -41,7 +41,10 @@ std::string take(char* text) {
 
 class Window : public testing::Test {
  protected:
-  Window() { EXPECT_EQ(process_.readLine(), "started"); }
+  Window() {
+    EXPECT_EQ(process_.readLine(), "listens");
+    EXPECT_EQ(process_.readLine(), "started");
+  }
 
   // The bus tells of a new window or dialog a moment later.
   static Held<AtspiAccessible> find(const std::string& identifier) {
@@ -90,6 +93,12 @@ TEST_F(Window, MenuItemsAreFoundByTheirIdentifierAndDoTheirAction) {
   EXPECT_TRUE(isChecked("main-menu.view.toggle-full-screen"));
   click("main-menu.edit.action-copy");
   EXPECT_EQ(process_.readLine(), "copied");
+}
+
+TEST_F(Window, ASecondInstanceHandsOverAndNeverListens) {
+  Tests::ChildProcess second({VARNEL_GTK3_WINDOW});
+  EXPECT_EQ(second.readAll(), "does not listen\n");
+  EXPECT_EQ(second.wait(), 0);
 }
 
 TEST_F(Window, PathsAndSizesAreReadAloudInTheirShortForm) {

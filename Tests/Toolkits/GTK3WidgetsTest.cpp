@@ -105,6 +105,19 @@ TEST(PathColumn, ARowIsSelectedByEitherButtonAndItsLastComponentIsKept) {
   const auto pressAt = [&](GdkEventType type, guint button, int row, double x) {
     press(view, view.get_bin_window(), type, button, x, rowAt(row));
   };
+  // The second press of a double click, behind which that stands, must not reach the row.
+  const auto reachesTheRow = [&](double x) {
+    view.get_selection()->unselect_all();
+    GdkEvent* both = gdk_event_new(GDK_2BUTTON_PRESS);
+    both->button.window = GDK_WINDOW(g_object_ref(view.get_bin_window()->gobj()));
+    gdk_event_put(both);
+    gdk_event_free(both);
+    pressAt(GDK_BUTTON_PRESS, 1, 1, x);
+    gdk_event_free(gdk_event_get());
+    return view.get_selection()->count_selected_rows() == 1;
+  };
+  EXPECT_FALSE(reachesTheRow(6));
+  EXPECT_TRUE(reachesTheRow(480));
   pressAt(GDK_2BUTTON_PRESS, 1, 1, 6);
   EXPECT_EQ(list.opened, Texts{"/"});
   pressAt(GDK_BUTTON_PRESS, 3, 1, 6);
@@ -133,6 +146,11 @@ TEST(PathCell, ALongPathLosesItsStart) {
   EXPECT_TRUE(firstAt(full / 2).starts_with("/nowhere/")) << firstAt(full / 2);
   EXPECT_EQ(firstAt(30), "/nowhere/in/the/middle/of/cat.jpg");
   EXPECT_EQ(cell.componentAt(window, full, full + 5), nullptr);
+  // However narrow, it takes one line.
+  int heights[2][2];
+  cell.get_preferred_height(window, heights[0][0], heights[0][1]);
+  cell.get_preferred_height_for_width(window, 30, heights[1][0], heights[1][1]);
+  EXPECT_EQ(heights[1][1], heights[0][1]);
 }
 
 TEST(ApplicationActivity, AChangeBetweenTheApplicationsWindowsIsNone) {

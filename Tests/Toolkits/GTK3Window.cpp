@@ -6,6 +6,7 @@
 #include <Varnel/GTK3/Identifiers.h>
 #include <Varnel/GTK3/Menus.h>
 #include <Varnel/GTK3/PathControl.h>
+#include <Varnel/GTK3/RouterAtStartup.h>
 #include <Varnel/Interface/MainMenuAccessibility.h>
 #include <Varnel/Logging/UserErrorInfo.h>
 #include <gtkmm/application.h>
@@ -49,6 +50,7 @@ void presentFailure(Gtk::Window& window) {
 
 int main() {
   auto application = Gtk::Application::create("com.example.GTK3Window");
+  const GTK3::RouterAtStartup routing(*application.get(), [](auto&) { say("listens"); });
   application->signal_startup().connect([&] {
     auto* window = new Gtk::ApplicationWindow(application);
     window->add_action("copy", [] { say("copied"); });
@@ -76,5 +78,7 @@ int main() {
     say("started");
   });
   application->signal_activate().connect([] {});
-  return application->run();
+  const int status = application->run();
+  if (!routing.router()) say("does not listen");
+  return status;
 }

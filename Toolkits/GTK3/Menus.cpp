@@ -12,11 +12,17 @@
 namespace Varnel::GTK3 {
 namespace {
 
-Gtk::MenuItem* makeItem(const MenuEntry& entry) {
+Gtk::MenuItem* makeItem(const MenuEntry& entry, Gtk::Application& application) {
   Gtk::MenuItem* item = entry.kind == MenuItemKind::toggle
                             ? Gtk::make_managed<Gtk::CheckMenuItem>(entry.title, true)
                             : Gtk::make_managed<Gtk::MenuItem>(entry.title, true);
   identify(*item, entry.identifier);
+  if (!entry.submenu.empty()) {
+    auto* menu = Gtk::make_managed<Gtk::Menu>();
+    appendSections(*menu, application, entry.submenu);
+    item->set_submenu(*menu);
+    return item;
+  }
   gtk_actionable_set_detailed_action_name(GTK_ACTIONABLE(item->gobj()), entry.action.c_str());
   if (auto* label = dynamic_cast<Gtk::AccelLabel*>(item->get_child());
       label && !entry.accelerators.empty()) {
@@ -34,7 +40,7 @@ void appendSections(Gtk::MenuShell& menu, Gtk::Application& application,
     if (!section.empty() && !menu.get_children().empty())
       menu.append(*Gtk::make_managed<Gtk::SeparatorMenuItem>());
     for (const MenuEntry& entry : section) {
-      menu.append(*makeItem(entry));
+      menu.append(*makeItem(entry, application));
       if (!entry.accelerators.empty())
         application.set_accels_for_action(entry.action,
                                           {entry.accelerators.begin(), entry.accelerators.end()});

@@ -26,6 +26,8 @@ struct MenuEntry {
   std::string action;
   std::vector<std::string> accelerators = {};  ///< As "<Primary>q"; the item shows the first.
   MenuItemKind kind = MenuItemKind::command;
+  /// Sections of a menu of its own, in place of the action.
+  std::vector<std::vector<MenuEntry>> submenu = {};
 };
 
 /// Items between two separators.

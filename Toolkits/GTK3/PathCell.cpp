@@ -46,7 +46,7 @@ int naturalWidth(const Gtk::CellRenderer& cell, Gtk::Widget& widget) {
 
 }  // namespace
 
-PathCell::PathCell() : Glib::ObjectBase(typeid(PathCell)), Gtk::CellRenderer() {
+PathCell::PathCell() : Glib::ObjectBase(typeid(PathCell)) {
   text_.property_single_paragraph_mode() = true;
   text_.property_ellipsize() = Pango::ELLIPSIZE_MIDDLE;
   text_.property_xpad() = 0;
@@ -55,6 +55,7 @@ PathCell::PathCell() : Glib::ObjectBase(typeid(PathCell)), Gtk::CellRenderer() {
 
 void PathCell::setURL(const std::optional<Platform::URL>& url, PathKind kind) {
   components_.clear();
+  property_text() = url ? pathText(*url, kind) : std::string();
   if (!url) return;
   const auto& resolver = QNURLResolver::shared();
   const auto full = Platform::pathComponents(*url);
@@ -122,6 +123,12 @@ void PathCell::get_preferred_width_vfunc(Gtk::Widget&, int& minimum, int& natura
 
 void PathCell::get_preferred_height_vfunc(Gtk::Widget& widget, int& minimum, int& natural) const {
   text_.get_preferred_height(widget, minimum, natural);
+}
+
+// A text that is too long would take another line.
+void PathCell::get_preferred_height_for_width_vfunc(Gtk::Widget& widget, int, int& minimum,
+                                                    int& natural) const {
+  get_preferred_height_vfunc(widget, minimum, natural);
 }
 
 void PathCell::render_vfunc(const Cairo::RefPtr<Cairo::Context>& context, Gtk::Widget& widget,

@@ -20,8 +20,9 @@ namespace Varnel::GTK3 {
 /// Draws a path as a row of components, each with an icon: in a list (`PathColumn`), or as a widget
 /// of its own (`PathControl`). A path too long for its place loses components at its start.
 ///
-/// The file system is not asked. Main thread only.
-class VARNEL_API PathCell final : public Gtk::CellRenderer {
+/// Its text, which a screen reader reads, is the path's short form. The file system is not asked.
+/// Main thread only.
+class VARNEL_API PathCell final : public Gtk::CellRendererText {
  public:
   using ComponentCell = CommonPathControl::PathComponentCell;
 
@@ -40,6 +41,8 @@ class VARNEL_API PathCell final : public Gtk::CellRenderer {
  protected:
   void get_preferred_width_vfunc(Gtk::Widget& widget, int& minimum, int& natural) const override;
   void get_preferred_height_vfunc(Gtk::Widget& widget, int& minimum, int& natural) const override;
+  void get_preferred_height_for_width_vfunc(Gtk::Widget& widget, int width, int& minimum,
+                                            int& natural) const override;
   void render_vfunc(const Cairo::RefPtr<Cairo::Context>& context, Gtk::Widget& widget,
                     const Gdk::Rectangle& background, const Gdk::Rectangle& area,
                     Gtk::CellRendererState flags) override;

@@ -22,7 +22,18 @@ class PathColumn::View final : public PathClicks, public sigc::trackable {
     if (event->window != view_.get_bin_window()->gobj()) return false;
     if (gdk_event_triggers_context_menu(reinterpret_cast<const GdkEvent*>(event)))
       selectAt(static_cast<int>(event->x), static_cast<int>(event->y));
+    // The second press of a double click would activate the row; the component opens instead.
+    if (isFirstOfTwo(*event) && pathComponentCellAt({event->x, event->y})) return true;
     return press(*event, {event->x, event->y});
+  }
+
+  // GDK puts the double click right behind the press that makes it one.
+  static bool isFirstOfTwo(const GdkEventButton& event) {
+    if (event.type != GDK_BUTTON_PRESS || event.button != GDK_BUTTON_PRIMARY) return false;
+    GdkEvent* next = gdk_event_peek();
+    const bool is = next && next->type == GDK_2BUTTON_PRESS;
+    if (next) gdk_event_free(next);
+    return is;
   }
 
   bool popUp() {

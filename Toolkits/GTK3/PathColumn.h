@@ -30,8 +30,7 @@ namespace Varnel::GTK3 {
 ///     });
 ///
 /// Rows without a location show what the host packs besides. The column appends itself to the view
-/// and goes before it. On the accessibility bus the cell has no text of its own: the host packs a
-/// text cell as well, or names the row. Main thread only.
+/// and goes before it. Main thread only.
 class VARNEL_API PathColumn final : public Gtk::TreeViewColumn {
  public:
   struct Location {

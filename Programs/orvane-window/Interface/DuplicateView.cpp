@@ -20,6 +20,7 @@ namespace Orvane {
 namespace {
 
 using Clock = std::chrono::steady_clock;
+using Row = DuplicateRows::Row;
 
 // So much of a turn may go into rows; the rest is left to drawing and to the user's keys.
 constexpr auto maxTurn = std::chrono::milliseconds(8);
@@ -31,12 +32,15 @@ std::string nameOf(const std::string& path) {
   return pathText(path.substr(path.rfind('/') + 1));
 }
 
-std::string folderOf(const std::string& path) {
-  return pathText(path.substr(0, std::max<std::size_t>(path.rfind('/'), 1)), true);
-}
-
 std::string timeOf(const ReportFile& file) {
   return Glib::DateTime::create_now_local(file.modified).format("%x %R");
+}
+
+// Of one line, whatever the width: all rows are of one height.
+Gtk::CellRendererText* textCell() {
+  auto* cell = Gtk::manage(new Gtk::CellRendererText);
+  cell->property_ellipsize() = Pango::ELLIPSIZE_MIDDLE;
+  return cell;
 }
 
 Gtk::TreeViewColumn& added(Gtk::TreeView& view, const char* titleKey, int width) {
@@ -63,8 +67,15 @@ void pack(Gtk::TreeViewColumn& column, Renderer& renderer, bool isWide, Fill fil
 
 }  // namespace
 
+Varnel::Platform::URL folderOf(const std::string& path) {
+  return Varnel::Platform::URL::fileURLWithPath(path.substr(0, path.rfind('/') + 1));
+}
+
 DuplicateView::DuplicateView() {
-  addColumns();
+  addChoice();
+  addName();
+  addFolder();
+  addFigures();
   set_fixed_height_mode(true);
   set_enable_search(false);
   set_headers_visible(true);
@@ -76,10 +87,6 @@ DuplicateView::DuplicateView() {
     else if (!isLeaving_)
       opened({static_cast<std::size_t>(path[0]), static_cast<std::size_t>(path[1])});
   });
-  signal_popup_menu().connect([this] {
-    menu().popup_at_widget(this, Gdk::GRAVITY_CENTER, Gdk::GRAVITY_NORTH_WEST, nullptr);
-    return true;
-  });
   signal_cursor_changed().connect([this] { moved(); });
 }
 
@@ -87,14 +94,12 @@ DuplicateView::~DuplicateView() {
   work_.disconnect();
 }
 
-void DuplicateView::addColumns() {
-  using Row = DuplicateRows::Row;
-  using List = DuplicateList;
+void DuplicateView::addChoice() {
   auto& choice = added(*this, nullptr, 34);
   auto* toggle = Gtk::manage(new Gtk::CellRendererToggle);
   pack(
       choice, *toggle, true,
-      [](Gtk::CellRendererToggle& cell, const List& list, const Row& row) {
+      [](Gtk::CellRendererToggle& cell, const DuplicateList& list, const Row& row) {
         cell.property_visible() = row.file.has_value();
         if (!row.file) return;
         cell.property_active() = list.isChosen({row.group, *row.file});
@@ -103,12 +108,14 @@ void DuplicateView::addColumns() {
       rows_);
   toggle->signal_toggled().connect(
       [this](const Glib::ustring& path) { this->toggle(Gtk::TreeModel::Path(path)); });
+}
 
+void DuplicateView::addName() {
   auto& name = added(*this, "Column_Name", 300);
   auto* icon = Gtk::manage(new Gtk::CellRendererPixbuf);
   pack(
       name, *icon, false,
-      [](Gtk::CellRendererPixbuf& cell, const List& list, const Row& row) {
+      [](Gtk::CellRendererPixbuf& cell, const DuplicateList& list, const Row& row) {
         cell.property_visible() = !row.file;
         if (row.file) return;
         bool isUncertain = false;
@@ -117,48 +124,59 @@ void DuplicateView::addColumns() {
         cell.property_gicon() = Gio::content_type_get_icon(type);
       },
       rows_);
-  auto* title = Gtk::manage(new Gtk::CellRendererText);
-  title->property_ellipsize() = Pango::ELLIPSIZE_MIDDLE;
+  auto* title = textCell();
   pack(
       name, *title, true,
-      [](Gtk::CellRendererText& cell, const List& list, const Row& row) {
+      [](Gtk::CellRendererText& cell, const DuplicateList& list, const Row& row) {
         cell.property_text() = nameOf(list.file({row.group, row.file.value_or(0)}).path);
         cell.property_weight() = row.file ? PANGO_WEIGHT_NORMAL : PANGO_WEIGHT_BOLD;
       },
       rows_);
   set_expander_column(name);
+}
 
-  auto& folder = added(*this, "Column_Folder", 330);
-  folder.set_expand(true);
-  auto* place = Gtk::manage(new Gtk::CellRendererText);
-  place->property_ellipsize() = Pango::ELLIPSIZE_MIDDLE;
+void DuplicateView::addFolder() {
+  using Location = Varnel::GTK3::PathColumn::Location;
+  folder_.emplace(*this, localized("Column_Folder"),
+                  [this](const auto& position) -> std::optional<Location> {
+                    const Row row = DuplicateRows::rowAt(position);
+                    if (!rows_ || !row.file) return std::nullopt;
+                    const auto& path = rows_->list()->file({row.group, *row.file}).path;
+                    return Location{folderOf(path), Varnel::GTK3::PathKind::folder};
+                  });
+  folder_->set_sizing(Gtk::TREE_VIEW_COLUMN_FIXED);
+  folder_->set_fixed_width(330);
+  folder_->set_resizable();
+  auto* count = textCell();
+  count->property_sensitive() = false;
   pack(
-      folder, *place, true,
-      [](Gtk::CellRendererText& cell, const List& list, const Row& row) {
-        const auto& files = list.group(row.group).files;
-        cell.property_text() = row.file ? folderOf(files[*row.file].path)
-                                        : localized("Group_Files", {countText(files.size())});
-        cell.property_sensitive() = row.file.has_value();
+      *folder_, *count, true,
+      [](Gtk::CellRendererText& cell, const DuplicateList& list, const Row& row) {
+        cell.property_visible() = !row.file;
+        if (!row.file)
+          cell.property_text() =
+              localized("Group_Files", {countText(list.group(row.group).files.size())});
       },
       rows_);
+}
 
+void DuplicateView::addFigures() {
   auto& size = added(*this, "Column_Size", 110);
   size.set_alignment(1.0f);
-  auto* bytes = Gtk::manage(new Gtk::CellRendererText);
+  auto* bytes = textCell();
   bytes->property_xalign() = 1.0f;
   pack(
       size, *bytes, true,
-      [](Gtk::CellRendererText& cell, const List& list, const Row& row) {
+      [](Gtk::CellRendererText& cell, const DuplicateList& list, const Row& row) {
         cell.property_text() = sizeText(list.group(row.group).size);
         cell.property_sensitive() = !row.file.has_value();
       },
       rows_);
-
   auto& modified = added(*this, "Column_Modified", 150);
-  auto* time = Gtk::manage(new Gtk::CellRendererText);
+  auto* time = textCell();
   pack(
       modified, *time, true,
-      [](Gtk::CellRendererText& cell, const List& list, const Row& row) {
+      [](Gtk::CellRendererText& cell, const DuplicateList& list, const Row& row) {
         cell.property_text() = row.file ? timeOf(list.file({row.group, *row.file})) : std::string();
       },
       rows_);
@@ -260,17 +278,6 @@ bool DuplicateView::on_key_press_event(GdkEventKey* event) {
     }
   }
   return Gtk::TreeView::on_key_press_event(event);
-}
-
-bool DuplicateView::on_button_press_event(GdkEventButton* event) {
-  if (event->type == GDK_BUTTON_PRESS && event->button == GDK_BUTTON_SECONDARY) {
-    Gtk::TreeModel::Path path;
-    if (get_path_at_pos(static_cast<int>(event->x), static_cast<int>(event->y), path))
-      set_cursor(path);
-    menu().popup_at_pointer(reinterpret_cast<GdkEvent*>(event));
-    return true;
-  }
-  return Gtk::TreeView::on_button_press_event(event);
 }
 
 }  // namespace Orvane

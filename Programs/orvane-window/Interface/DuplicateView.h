@@ -1,21 +1,25 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <gtkmm/menu.h>
 #include <gtkmm/treeview.h>
 
 #include <cstddef>
 #include <functional>
 #include <memory>
 #include <optional>
+#include <string>
 
+#include <Varnel/GTK3/PathColumn.h>
 #include <orvane-window/Interface/DuplicateRows.h>
 
 namespace Orvane {
 
+/// The folder of a file.
+[[nodiscard]] Varnel::Platform::URL folderOf(const std::string& path);
+
 /// The list of groups and files. Space chooses a file, Return opens it, the arrows to the left and
-/// right fold a group; a right click or the menu key opens the menu. What takes long in a long list
-/// is spread over many turns of the main loop. Main thread.
+/// right fold a group. What takes long in a long list is spread over many turns of the main loop.
+/// Main thread.
 class DuplicateView final : public Gtk::TreeView {
  public:
   using Place = DuplicateList::Place;
@@ -40,20 +44,22 @@ class DuplicateView final : public Gtk::TreeView {
   std::function<void(Place)> toggled;
   std::function<void(Place)> opened;
   std::function<void()> moved;  ///< Another row is the current one.
-  std::function<Gtk::Menu&()> menu;
 
  protected:
   bool on_key_press_event(GdkEventKey* event) override;
-  bool on_button_press_event(GdkEventButton* event) override;
 
  private:
-  void addColumns();
+  void addChoice();
+  void addName();
+  void addFolder();
+  void addFigures();
   void toggle(const Gtk::TreeModel::Path& path);
   void replace(std::shared_ptr<const DuplicateList> list, std::size_t unfolded);
   void begin();
   bool goOn();
 
   Glib::RefPtr<DuplicateRows> rows_;
+  std::optional<Varnel::GTK3::PathColumn> folder_;
   bool isLeaving_ = false;  ///< The rows are being taken away, for those of the next list.
   bool isGrowing_ = false;
   std::optional<std::size_t> nextUnfolded_;  ///< While all groups are being unfolded.

@@ -36,10 +36,12 @@ FoldersPage::FoldersPage()
   scroll_.set_policy(Gtk::POLICY_NEVER, Gtk::POLICY_AUTOMATIC);
   scroll_.set_propagate_natural_height(true);
   scroll_.set_max_content_height(260);
+  scroll_.set_can_focus(false);
   scroll_.add(list_);
   frame_.add(scroll_);
   frame_.set_size_request(width, -1);
   identify(list_, "folders");
+  list_.get_accessible()->set_name(localized("Column_Folder"));
   setAction(add_, "win.add-folder");
   setAction(scan_, "win.scan");
   scan_.get_style_context()->add_class("suggested-action");
@@ -68,15 +70,16 @@ void FoldersPage::addRow(const std::string& folder) {
   auto* row = Gtk::manage(new Gtk::Box(Gtk::ORIENTATION_HORIZONTAL, 10));
   auto* icon = Gtk::manage(new Gtk::Image);
   icon->set_from_icon_name("folder", Gtk::ICON_SIZE_LARGE_TOOLBAR);
-  auto* label = Gtk::manage(new Gtk::Label(pathText(folder, true)));
+  const std::string text = pathText(folder, true);
+  auto* label = Gtk::manage(new Gtk::Label(text));
   label->set_xalign(0);
   label->set_ellipsize(Pango::ELLIPSIZE_MIDDLE);
-  label->set_tooltip_text(pathText(folder, true));
+  label->set_tooltip_text(text);
   auto* remove = Gtk::manage(new Gtk::Button);
   remove->set_image_from_icon_name("list-remove-symbolic", Gtk::ICON_SIZE_BUTTON);
   remove->set_relief(Gtk::RELIEF_NONE);
   remove->set_tooltip_text(localized("Folders_Remove"));
-  remove->get_accessible()->set_name(localized("Folders_Remove"));
+  remove->get_accessible()->set_name(localized("Folders_Remove") + ": " + text);
   remove->signal_clicked().connect([this, folder] { removed(std::string(folder)); });
   const std::string number = std::to_string(list_.get_children().size() + 1);
   identify(*remove, Varnel::AccessibleAction("remove-folder." + number).buttonIdentifier());
@@ -85,6 +88,7 @@ void FoldersPage::addRow(const std::string& folder) {
   row->pack_start(*label);
   row->pack_start(*remove, Gtk::PACK_SHRINK);
   list_.append(*row);
+  row->get_parent()->get_accessible()->set_name(text);
   row->get_parent()->show_all();
 }
 

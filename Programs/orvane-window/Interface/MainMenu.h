@@ -1,20 +1,19 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
-#include <gtkmm/accelgroup.h>
-#include <gtkmm/menubar.h>
-
 #include <vector>
 
+#include <Varnel/GTK3/Menus.h>
 #include <orvane-window/Model/Menu.h>
 
 namespace Orvane {
 
-/// Fills the bar with the menus. Their items call the actions of the window and the application,
-/// and are as sensitive as those. The application knows the accelerators: see `setAccelerators`.
-void fillMenuBar(Gtk::MenuBar& bar, const std::vector<MenuGroup>& groups);
+/// The entries in the user's language, as the toolkit takes them.
+[[nodiscard]] std::vector<Varnel::GTK3::MenuSection> sectionsOf(
+    const std::vector<MenuEntry>& entries);
 
-/// Fills a menu with entries.
-void fillMenu(Gtk::Menu& menu, const std::vector<MenuEntry>& entries);
+/// The menus likewise.
+[[nodiscard]] std::vector<Varnel::GTK3::MenuDescription> descriptionsOf(
+    const std::vector<MenuGroup>& groups);
 
 }  // namespace Orvane

@@ -26,7 +26,8 @@ namespace {
 constexpr unsigned refreshInterval = 100;  // Milliseconds.
 
 const char* nameOf(Session::Stage stage) {
-  constexpr const char* names[] = {"folders", "scan", "results", "plan", "removal", "restoration"};
+  constexpr const char* names[] = {"folders", "scan",        "results", "plan",
+                                   "removal", "restoration", "export"};
   return names[static_cast<std::size_t>(stage)];
 }
 
@@ -36,7 +37,7 @@ std::string reasonOf(const Loss& loss) {
 
 }  // namespace
 
-MainWindow::MainWindow(Session::Ports ports, Application application)
+MainWindow::MainWindow(Gtk::Application& owner, Session::Ports ports, Application application)
     : application_(std::move(application)),
       session_(ports, [this](Session::Event event) { follow(event); }) {
   set_default_size(980, 640);
@@ -46,7 +47,8 @@ MainWindow::MainWindow(Session::Ports ports, Application application)
   addActions();
   const auto menus = mainMenu({.features = Varnel::TargetKind::current().userFeatures(std::nullopt),
                                .isDebugMode = Varnel::Globals::isDebugMode()});
-  fillMenuBar(menuBar_, menus);
+  Varnel::GTK3::appendMenus(menuBar_, owner, descriptionsOf(menus));
+  addListMenu(owner);
   box_.pack_start(menuBar_, Gtk::PACK_SHRINK);
   pages_.set_transition_type(Gtk::STACK_TRANSITION_TYPE_CROSSFADE);
   pages_.add(folders_, "folders");
@@ -64,8 +66,6 @@ MainWindow::MainWindow(Session::Ports ports, Application application)
     results_.showCurrent(session_);
     updateActions();
   };
-  view.menu = [this]() -> Gtk::Menu& { return contextMenu_; };
-  contextMenu_.attach_to_widget(view);
   takeDrops();
   box_.show_all();
   for (const std::string& folder : Preferences::lastFolders()) session_.addFolder(folder);
@@ -153,6 +153,10 @@ void MainWindow::follow(Session::Event event) {
     case Event::removed:
       showMoved("Removed", "NotRemoved", "Error_Remove");
       break;
+    case Event::exported:
+      if (const auto failure = session_.exportFailure())
+        showProblem(*this, localized("Error_Export"), failure.message());
+      break;
     case Event::restored:
       showMoved("Restored", "NotRestored", "Error_Restore");
       break;
@@ -195,9 +199,10 @@ void MainWindow::showPage() {
 
 void MainWindow::showProgress() {
   const std::string line = progress_.refresh(session_);
-  header_.set_subtitle(line);
-  // What task lists show.
+  // What task lists show; the header would follow it.
   set_title(line + " – " + Varnel::Globals::applicationName());
+  header_.set_title(Varnel::Globals::applicationName());
+  header_.set_subtitle(line);
 }
 
 void MainWindow::showScanned() {
@@ -205,10 +210,16 @@ void MainWindow::showScanned() {
   results_.showList(session_);
   const ScanTotals& totals = session_.outcome().totals;
   const std::uint64_t files = totals.unreadableFiles + totals.vanishedFiles + totals.changedFiles;
+  std::string warning;
+  if (session_.list()->report()->isPartial) warning = localized("Results_Stopped");
   if (files + totals.unreadableFolders > 0)
-    results_.outcome().tell(
-        localized("Results_LeftOut", {countText(files), countText(totals.unreadableFolders)}),
-        Gtk::MESSAGE_WARNING, {{"outcome.close", localized("Close"), {}}});
+    warning +=
+        (warning.empty() ? "" : " ") +
+        localized("Results_LeftOut", {countText(files), countText(totals.unreadableFolders)});
+  if (!warning.empty())
+    results_.outcome().tell(warning, Gtk::MESSAGE_WARNING,
+                            {{"outcome.close", localized("Close"), {}}});
+  if (session_.list()->report()->isPartial) return;
   askForConsent();
   application_.scanned(session_);
 }
@@ -218,20 +229,22 @@ void MainWindow::showMoved(const char* movedKey, const char* leftKey, const char
   const MoveOutcome& moved = session_.moved();
   if (!moved.problem.empty()) return showProblem(*this, localized(problemKey), moved.problem);
   std::string text = localized(movedKey, {countText(moved.paths.size()), sizeText(moved.bytes)});
-  if (movedKey == std::string_view("Removed")) text += " " + localized("Confirm_Later");
   std::vector<Notice::Answer> answers;
   if (!moved.left.empty()) {
     text += " " + localized(leftKey, {countText(moved.left.size())});
+    const std::string titleKey = std::string(problemKey) + (moved.paths.empty() ? "" : "Part");
+    showPartlyMoved(*this, localized(titleKey), text, moved.left);
     answers.push_back({"outcome.details", localized("Details"),
                        [this] { showDetails(*this, session_.moved().left); }});
   }
+  if (movedKey == std::string_view("Removed")) text += " " + localized("Confirm_Later");
   if (movedKey == std::string_view("Removed") && !moved.paths.empty())
     answers.push_back({"outcome.put-back", localized("PutBack"), [this] { session_.restore(); }});
   answers.push_back({"outcome.close", localized("Close"), {}});
   if (session_.list())
     results_.outcome().tell(text, moved.left.empty() ? Gtk::MESSAGE_INFO : Gtk::MESSAGE_WARNING,
                             answers);
-  else
+  else if (moved.left.empty())
     showText(*this, localized("PutBack"), text);
   application_.moved(session_);
 }

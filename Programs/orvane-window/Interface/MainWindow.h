@@ -2,6 +2,7 @@
 #pragma once
 
 #include <giomm/simpleaction.h>
+#include <gtkmm/application.h>
 #include <gtkmm/applicationwindow.h>
 #include <gtkmm/box.h>
 #include <gtkmm/button.h>
@@ -16,6 +17,7 @@
 #include <string>
 #include <vector>
 
+#include <Varnel/Platform/Values/URL.h>
 #include <orvane-window/Interface/FoldersPage.h>
 #include <orvane-window/Interface/ProgressPage.h>
 #include <orvane-window/Interface/ResultsPage.h>
@@ -36,7 +38,7 @@ class MainWindow final : public Gtk::ApplicationWindow {
   };
 
   /// The ports outlive the window.
-  MainWindow(Session::Ports ports, Application application);
+  MainWindow(Gtk::Application& owner, Session::Ports ports, Application application);
   ~MainWindow() override;
 
   /// Takes up folders, from the command line or from another program.
@@ -60,6 +62,7 @@ class MainWindow final : public Gtk::ApplicationWindow {
 
   // MainWindowActions.cpp: what the user asks for.
   void addActions();
+  void addListMenu(Gtk::Application& owner);
   void addAction(const std::string& name, std::function<void()> act);
   void updateActions();
   void select(const std::string& rule);
@@ -67,6 +70,7 @@ class MainWindow final : public Gtk::ApplicationWindow {
   void copyPath();
   void chooseSomeFolders();
   void confirmRemoval();
+  void exportTo(Session::ExportKind kind);
 
   const Application application_;
   Session session_;  ///< Outlives the pages that show it.
@@ -81,6 +85,7 @@ class MainWindow final : public Gtk::ApplicationWindow {
   ProgressPage progress_;
   ResultsPage results_;
   Actions actions_;
+  std::optional<Varnel::Platform::URL> clickedFolder_;  ///< By the last right click, if any.
   sigc::connection clock_;
 };
 

@@ -5,12 +5,15 @@
 #include <string_view>
 #include <utility>
 
+#include <Varnel/GTK3/ListMenu.h>
 #include <Varnel/GTK3/OpenURL.h>
 #include <Varnel/Interface/MainMenuAccessibility.h>
+#include <Varnel/Paths/CommonPathControl.h>
 #include <Varnel/Platform/Values/URL.h>
 #include <orvane-window/Interface/MainMenu.h>
 #include <orvane-window/Interface/MainWindow.h>
 #include <orvane-window/Interface/Questions.h>
+#include <orvane-window/Model/Preferences.h>
 #include <orvane-window/Model/Texts.h>
 
 namespace Orvane {
@@ -33,7 +36,8 @@ void MainWindow::addAction(const std::string& name, std::function<void()> act) {
 }
 
 void MainWindow::addActions() {
-  for (const char* name : {"scan", "rescan"}) addAction(name, [this] { session_.scan(); });
+  for (const char* name : {"scan", "rescan"})
+    addAction(name, [this] { session_.scan(Preferences::scanRequest()); });
   for (const char* name : {"stop", "stop-scan", "stop-removing"})
     addAction(name, [this] {
       session_.stop();
@@ -65,12 +69,32 @@ void MainWindow::addActions() {
     select(Glib::VariantBase::cast_dynamic<Glib::Variant<Glib::ustring>>(rule).get());
   });
   Gtk::ApplicationWindow::add_action(actions_["select"]);
+  addAction("export-selected", [this] { exportTo(Session::ExportKind::chosenFiles); });
+  addAction("export-json", [this] { exportTo(Session::ExportKind::scanReport); });
+  addAction("open-folder", [this] {
+    if (clickedFolder_) Varnel::GTK3::openURL(*this, *clickedFolder_);
+  });
+}
 
+void MainWindow::addListMenu(Gtk::Application& owner) {
   const auto& duplicates = Varnel::MainMenuAccessibility::instance().duplicates();
-  fillMenu(contextMenu_,
-           {{duplicates.selectDuplicate() + ".context", "SelectDuplicate", "win.toggle", ""},
-            {duplicates.quickLook() + ".context", "QuickLook", "win.open", ""},
-            {"copy.context", "CopyPath", "win.copy", "", true}});
+  Varnel::GTK3::appendSections(
+      contextMenu_, owner,
+      sectionsOf({{duplicates.selectDuplicate() + ".context", "SelectDuplicate", "win.toggle", ""},
+                  {duplicates.quickLook() + ".context", "QuickLook", "win.open", ""},
+                  {"open-folder.context", "OpenFolder", "win.open-folder", ""},
+                  {"copy.context", "CopyPath", "win.copy", "", true}}));
+  contextMenu_.attach_to_widget(results_.view());
+  Varnel::GTK3::setListMenu(results_.view(), [this](const Varnel::CommonPathControl& path) {
+    const auto& clicked = path.rightClickedPathComponentCell();
+    clickedFolder_.reset();
+    if (clicked)
+      clickedFolder_ = clicked->url();
+    else if (const auto place = results_.view().current())
+      clickedFolder_ = folderOf(session_.list()->file(*place).path);
+    actions_.at("open-folder")->set_enabled(clickedFolder_.has_value());
+    return &contextMenu_;
+  });
 }
 
 void MainWindow::updateActions() {
@@ -83,7 +107,7 @@ void MainWindow::updateActions() {
   const std::pair<const char*, bool> states[] = {
       {"scan", stage == Stage::choosing && !session_.folders().empty()},
       {"rescan", stage == Stage::results},
-      {"stop", goesOn},
+      {"stop", goesOn && stage != Stage::exporting},
       {"stop-scan", goesOn && stage == Stage::scanning},
       {"stop-removing", goesOn && stage == Stage::removing},
       {"start-over", stage == Stage::results},
@@ -95,6 +119,8 @@ void MainWindow::updateActions() {
       {"put-back", isRestful},
       {"select", hasGroups},
       {"remove", hasChosen},
+      {"export-selected", hasChosen},
+      {"export-json", hasGroups},
       {"toggle", hasRow},
       {"open", hasRow}};
   for (const auto& state : states) actions_.at(state.first)->set_enabled(state.second);
@@ -121,6 +147,11 @@ void MainWindow::copyPath() {
 
 void MainWindow::chooseSomeFolders() {
   chooseFolders(*this, [this](const std::vector<std::string>& folders) { addFolders(folders); });
+}
+
+void MainWindow::exportTo(Session::ExportKind kind) {
+  const char* name = kind == Session::ExportKind::scanReport ? "duplicates.json" : "duplicates.txt";
+  chooseFile(*this, name, [this, kind](const std::string& path) { session_.exportTo(path, kind); });
 }
 
 void MainWindow::confirmRemoval() {

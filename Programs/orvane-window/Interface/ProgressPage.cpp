@@ -51,6 +51,8 @@ Lines linesOf(const Session& session) {
       return linesOf(session.moveProgress(), "Restoring");
     case Session::Stage::planning:
       return linesOf(session.moveProgress(), "Preparing");
+    case Session::Stage::exporting:
+      return {localized("Exporting")};
     case Session::Stage::choosing:
     case Session::Stage::results:
       break;

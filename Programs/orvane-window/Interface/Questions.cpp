@@ -26,6 +26,14 @@ using Varnel::GTK3::identify;
 namespace {
 
 constexpr std::size_t maxLines = 1000;
+constexpr std::size_t maxExamples = 3;
+
+std::string linesOf(const std::vector<MoveOutcome::Left>& left, std::size_t max) {
+  std::string text;
+  for (std::size_t i = 0; i < std::min(left.size(), max); ++i)
+    text += (i > 0 ? "\n" : "") + pathText(left[i].path) + ": " + left[i].reason;
+  return left.size() > max ? text + "\n…" : text;
+}
 
 /// Shows the dialog, and keeps it until it is answered.
 void await(const std::shared_ptr<Gtk::Dialog>& dialog, std::function<void(int)> answer = {}) {
@@ -54,11 +62,9 @@ void askBeforeRemoval(Gtk::Window& parent, const PlannedRemoval& plan,
     text += "\n" + localized("Confirm_Destination", {pathText(folder, true)});
   text += "\n" + localized("Confirm_Later");
   const auto left = plan.left();
-  if (!left.empty()) {
-    text += "\n\n" + localized("Confirm_Stay", {countText(left.size())});
-    for (std::size_t i = 0; i < std::min<std::size_t>(left.size(), 3); ++i)
-      text += "\n" + pathText(left[i].path) + ": " + left[i].reason;
-  }
+  if (!left.empty())
+    text += "\n\n" + localized("Confirm_Stay", {countText(left.size())}) + "\n" +
+            linesOf(left, maxExamples);
   dialog->set_secondary_text(text);
   identify(*dialog, "confirmation");
   addButton(*dialog, "Cancel", Gtk::RESPONSE_CANCEL, "confirmation.cancel");
@@ -74,6 +80,17 @@ void askBeforeRemoval(Gtk::Window& parent, const PlannedRemoval& plan,
 
 void showProblem(Gtk::Window& parent, const std::string& title, const std::string& text) {
   Varnel::GTK3::presentError(parent, {title, text, {localized("Close")}});
+}
+
+void showPartlyMoved(Gtk::Window& parent, const std::string& title, const std::string& figures,
+                     const std::vector<MoveOutcome::Left>& left) {
+  Varnel::GTK3::presentError(parent,
+                             {title,
+                              figures + "\n\n" + linesOf(left, maxExamples),
+                              {localized("Details"), localized("Close")}},
+                             [&parent, left](auto option) {
+                               if (option == 0u) showDetails(parent, left);
+                             });
 }
 
 void showText(Gtk::Window& parent, const std::string& title, const std::string& text) {
@@ -94,11 +111,7 @@ void showText(Gtk::Window& parent, const std::string& title, const std::string& 
 }
 
 void showDetails(Gtk::Window& parent, const std::vector<MoveOutcome::Left>& left) {
-  std::string text;
-  for (std::size_t i = 0; i < std::min(left.size(), maxLines); ++i)
-    text += pathText(left[i].path) + ": " + left[i].reason + "\n";
-  if (left.size() > maxLines) text += "…\n";
-  showText(parent, localized("Details"), text);
+  showText(parent, localized("Details"), linesOf(left, maxLines));
 }
 
 void chooseFolders(Gtk::Window& parent,
@@ -116,6 +129,24 @@ void chooseFolders(Gtk::Window& parent,
     if (response != Gtk::RESPONSE_ACCEPT) return;
     const auto names = dialog->get_filenames();
     chosen(std::vector<std::string>(names.begin(), names.end()));
+  });
+}
+
+void chooseFile(Gtk::Window& parent, const std::string& suggestedName,
+                std::function<void(const std::string&)> chosen) {
+  const auto dialog = std::make_shared<Gtk::FileChooserDialog>(
+      parent, localized("ExportTitle"), Gtk::FILE_CHOOSER_ACTION_SAVE,
+      Gtk::DIALOG_MODAL | Gtk::DIALOG_USE_HEADER_BAR);
+  identify(*dialog, "choose-file");
+  addButton(*dialog, "Cancel", Gtk::RESPONSE_CANCEL, "choose-file.cancel");
+  addButton(*dialog, "Save", Gtk::RESPONSE_ACCEPT, "choose-file.save");
+  dialog->set_default_response(Gtk::RESPONSE_ACCEPT);
+  dialog->set_do_overwrite_confirmation();
+  dialog->set_current_folder(Glib::get_home_dir());
+  dialog->set_current_name(suggestedName);
+  await(dialog, [dialog = dialog.get(), chosen = std::move(chosen)](int response) {
+    if (response == Gtk::RESPONSE_ACCEPT && !dialog->get_filename().empty())
+      chosen(dialog->get_filename());
   });
 }
 

@@ -21,6 +21,10 @@ void askBeforeRemoval(Gtk::Window& parent, const PlannedRemoval& plan,
 /// Tells of something that went wrong.
 void showProblem(Gtk::Window& parent, const std::string& title, const std::string& text);
 
+/// Tells that some files were not moved: how many were, and why the first of the others were not.
+void showPartlyMoved(Gtk::Window& parent, const std::string& title, const std::string& figures,
+                     const std::vector<MoveOutcome::Left>& left);
+
 /// Shows a long text.
 void showText(Gtk::Window& parent, const std::string& title, const std::string& text);
 
@@ -30,6 +34,10 @@ void showDetails(Gtk::Window& parent, const std::vector<MoveOutcome::Left>& left
 /// Lets the user choose folders.
 void chooseFolders(Gtk::Window& parent,
                    std::function<void(const std::vector<std::string>&)> chosen);
+
+/// Lets the user choose a file to write; one that is there only once that was confirmed.
+void chooseFile(Gtk::Window& parent, const std::string& suggestedName,
+                std::function<void(const std::string&)> chosen);
 
 void showAbout(Gtk::Window& parent);
 

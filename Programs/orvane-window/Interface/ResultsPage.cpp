@@ -65,6 +65,7 @@ ResultsPage::ResultsPage() : Gtk::Box(Gtk::ORIENTATION_VERTICAL) {
   pack_start(outcome_, Gtk::PACK_SHRINK);
   pack_start(question_, Gtk::PACK_SHRINK);
   scroll_.set_policy(Gtk::POLICY_AUTOMATIC, Gtk::POLICY_ALWAYS);
+  scroll_.set_can_focus(false);
   scroll_.add(view_);
   identify(view_, "duplicates");
   auto* icon = Gtk::manage(new Gtk::Image);

@@ -20,7 +20,6 @@
 #include <Varnel/Platform/Ports/Ports.h>
 #include <orvane-window/Interface/PreferencesDialog.h>
 #include <orvane-window/Interface/Questions.h>
-#include <orvane-window/Model/Menu.h>
 #include <orvane-window/Model/Preferences.h>
 #include <orvane-window/Model/Texts.h>
 #include <orvane/AnalyticsConsent.h>
@@ -33,11 +32,6 @@ namespace {
 using Tallyhouse::Consent;
 
 constexpr const char* style = ".orvane-title { font-size: 150%; font-weight: bold; }";
-
-MenuFacts menuFacts() {
-  return {.features = Varnel::TargetKind::current().userFeatures(std::nullopt),
-          .isDebugMode = Varnel::Globals::isDebugMode()};
-}
 
 void printKeyViewLoop(Gtk::Widget& widget, int depth) {
   if (!widget.get_mapped()) return;
@@ -65,8 +59,9 @@ WindowApplication::WindowApplication(Console& console)
   add_main_option_entry(OPTION_TYPE_STRING, "analytics", '\0',
                         "Where events go, if the user has agreed", "URL");
   routing_.emplace(*this, [this](Varnel::UserNotificationRouter& router) {
-    reminding_ = std::make_unique<Reminding>(
-        router, console_, [this](const auto& token) { window().comeForward(token); });
+    reminding_ = std::make_unique<Reminding>(router, console_, [this](const auto& token) {
+      withWindow([token](MainWindow& window) { window.comeForward(token); });
+    });
   });
   signal_handle_local_options().connect(sigc::mem_fun(*this, &WindowApplication::takeOptions),
                                         false);
@@ -104,13 +99,12 @@ void WindowApplication::on_startup() {
   sounds_ = std::make_unique<Varnel::SoundEngine>();
   sounds_->setSoundsEnabled(Preferences::playsSounds());
   addActions();
-  addAccelerators();
 }
 
 MainWindow& WindowApplication::window() {
   if (window_) return *window_;
   window_ = std::make_unique<MainWindow>(
-      Session::Ports{*engine_, *work_},
+      *this, Session::Ports{*engine_, *work_},
       MainWindow::Application{.scanned =
                                   [this](const Session& session) {
                                     sounds_->play(Varnel::Sound::scanComplete);
@@ -132,15 +126,27 @@ MainWindow& WindowApplication::window() {
   return *window_;
 }
 
+void WindowApplication::withWindow(std::function<void(MainWindow&)> act) {
+  if (window_) return act(*window_);
+  // The toolkit's start and the window together would be too long a turn of the main loop.
+  hold();
+  Glib::signal_idle().connect_once([this, act = std::move(act)] {
+    act(window());
+    release();
+  });
+}
+
 void WindowApplication::on_activate() {
-  window().comeForward();
+  withWindow([](MainWindow& window) { window.comeForward(); });
 }
 
 void WindowApplication::on_open(const type_vec_files& files, const Glib::ustring&) {
   std::vector<std::string> folders;
   for (const auto& file : files) folders.push_back(file->get_path());
-  window().addFolders(folders);
-  window().comeForward();
+  withWindow([folders](MainWindow& window) {
+    window.addFolders(folders);
+    window.comeForward();
+  });
 }
 
 // What is being moved comes to its end first: the window's session asks for that.
@@ -173,12 +179,6 @@ void WindowApplication::addActions() {
     add("debug", [this](const std::string& name) { debug(name); });
 }
 
-void WindowApplication::addAccelerators() {
-  for (const MenuGroup& group : mainMenu(menuFacts()))
-    for (const MenuEntry& entry : group.entries)
-      if (!entry.accelerator.empty()) set_accels_for_action(entry.action, {entry.accelerator});
-}
-
 bool WindowApplication::kept(const std::optional<Varnel::Platform::PlatformError>& failure) {
   if (failure) showProblem(window(), localized("Error_NotKept"), failure->localizedDescription());
   return !failure;
@@ -192,10 +192,14 @@ void WindowApplication::showPreferences() {
   const auto dialog = std::make_shared<PreferencesDialog>(
       window(),
       PreferencesDialog::Values{.period = reminding_->period(),
+                                .scan = Preferences::scanRequest(),
                                 .playsSounds = Preferences::playsSounds(),
                                 .sendsFigures = storedConsent() == Consent::granted},
       PreferencesDialog::Choices{
           .period = [this, told](auto period) { return told(reminding_->setPeriod(period)); },
+          .minSize = [this](auto bytes) { return kept(Preferences::setMinSize(bytes)); },
+          .includesHidden =
+              [this](bool includes) { return kept(Preferences::setSkipsHidden(!includes)); },
           .playsSounds =
               [this](bool plays) {
                 if (!kept(Preferences::setPlaysSounds(plays))) return false;

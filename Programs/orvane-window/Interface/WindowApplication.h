@@ -3,6 +3,7 @@
 
 #include <gtkmm/application.h>
 
+#include <functional>
 #include <memory>
 #include <optional>
 #include <string>
@@ -38,8 +39,9 @@ class WindowApplication final : public Gtk::Application {
   int takeOptions(const Glib::RefPtr<Glib::VariantDict>& options);
   void shutDown();
   void addActions();
-  void addAccelerators();
   MainWindow& window();
+  /// Does so at once, or as soon as there is a window.
+  void withWindow(std::function<void(MainWindow&)> act);
   void showPreferences();
   void showLicense();
   void openLink(const std::string& name);

@@ -66,20 +66,21 @@ void DuplicateList::count(Place place, bool isChosen) {
   }
 }
 
-Selection DuplicateList::selection() const {
+Selection DuplicateList::selection(const IsPassing& isPassing) const {
   Selection selection;
   for (std::size_t number = 0; number < report_->groups.size(); ++number) {
     if (chosenOfGroups_[number] == 0) continue;
     Choice choice{.group = number};
     const auto& files = group(number).files;
-    bool isKeptFound = false;
+    int worth = -1;  // Of the file that stays so far.
     for (std::size_t i = 0; i < files.size(); ++i) {
       if (isChosen({number, i})) {
         choice.victims.push_back(i);
-      } else if (!isKeptFound || (files[i].isReference && !files[choice.kept].isReference)) {
-        choice.kept = i;
-        isKeptFound = true;
+        continue;
       }
+      const int itsWorth = files[i].isReference ? 2 : isPassing(files[i].path) ? 0 : 1;
+      if (itsWorth > worth) choice.kept = i;
+      worth = std::max(worth, itsWorth);
     }
     selection.push_back(std::move(choice));
   }

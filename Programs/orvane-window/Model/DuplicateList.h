@@ -61,9 +61,9 @@ class DuplicateList final {
   /// Chooses the victims of the selection, and nothing else. It comes from this report.
   void choose(const Selection& selection);
 
-  /// What is chosen, with the first file of each group that is not, or a reference, as the one that
-  /// stays.
-  [[nodiscard]] Selection selection() const;
+  /// What is chosen. Of the files of a group that are not, a reference stays for them, else the
+  /// first that is not passing, else the first.
+  [[nodiscard]] Selection selection(const IsPassing& isPassing) const;
 
   /// The next chosen file behind a place, from the beginning again after the last; the place itself
   /// when there is no other.

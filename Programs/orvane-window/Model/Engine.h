@@ -14,7 +14,9 @@
 #include <Removal/Restoration.h>
 #include <Removal/Selection.h>
 #include <Scan/ScanObserver.h>
+#include <Scan/ScanRequest.h>
 #include <Scan/ScanResult.h>
+#include <orvane-window/Model/FileExport.h>
 
 namespace Orvane {
 
@@ -30,6 +32,7 @@ struct ScanOutcome {
   std::vector<LostPath> lostFolders{};  ///< Of those to scan. With any there is nothing else.
   std::shared_ptr<const Report> report{};
   ScanTotals totals{};
+  TextSource jsonReport{};  ///< As `orvane scan --json` prints it.
 };
 
 /// What has become of the files that were to be moved.
@@ -41,7 +44,7 @@ struct MoveOutcome {
 
   std::set<std::string> paths{};  ///< Those that were moved.
   std::uint64_t bytes = 0;
-  std::vector<Left> left{};  ///< Those that were not.
+  std::vector<Left> left{};  ///< Those that were to be, and were not.
   std::string problem{};     ///< What was in the way of all of them, for the user.
 };
 
@@ -69,9 +72,11 @@ class Engine {
  public:
   virtual ~Engine() = default;
 
-  /// The outcome is of no use once `control` asks to stop.
-  [[nodiscard]] virtual ScanOutcome scan(const std::vector<std::string>& folders,
-                                         ScanControl& control) = 0;
+  /// Once `control` asks to stop, the report is partial.
+  [[nodiscard]] virtual ScanOutcome scan(ScanRequest request, ScanControl& control) = 0;
+
+  /// Whether a file may be gone at any moment, because it is in a trash. Fast; any thread.
+  [[nodiscard]] virtual bool isPassing(const std::string& path) const = 0;
 
   /// Looks at what is to be moved, and moves nothing.
   [[nodiscard]] virtual std::shared_ptr<PlannedRemoval> plan(

@@ -57,7 +57,9 @@ Entries duplicatesEntries() {
             rule("none", "SelectNone")}},
           {menu.remove(), "Remove", "win.remove", "<Primary>Delete"},
           {menu.selectDuplicate(), "SelectDuplicate", "win.toggle", "<Primary>d"},
-          {menu.quickLook(), "QuickLook", "win.open", "<Primary>y", true}};
+          {menu.quickLook(), "QuickLook", "win.open", "<Primary>y", true},
+          {menu.exportSelectedDuplicates(), "ExportSelected", "win.export-selected", "", true},
+          {menu.exportEquivalencesJSON(), "ExportJSON", "win.export-json", ""}};
 }
 
 Entries helpEntries(const MenuFacts& facts) {

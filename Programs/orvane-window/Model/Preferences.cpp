@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <orvane-window/Model/Preferences.h>
 
+#include <algorithm>
 #include <utility>
 
 #include <Varnel/Basalt/JSON.h>
@@ -16,6 +17,8 @@ using Varnel::Platform::URL;
 
 constexpr const char* soundsKey = "playsSounds";
 constexpr const char* foldersKey = "lastFolders";
+constexpr const char* hiddenKey = "skipsHidden";
+constexpr const char* sizeKey = "minSize";
 
 }  // namespace
 
@@ -25,6 +28,21 @@ bool Preferences::playsSounds() {
 
 Preferences::Failure Preferences::setPlaysSounds(bool playsSounds) {
   return ApplicationData::settings().set(soundsKey, playsSounds);
+}
+
+ScanRequest Preferences::scanRequest() {
+  const auto& settings = ApplicationData::settings();
+  const std::int64_t minSize = settings.integer(sizeKey).value_or(0);
+  return {.minSize = static_cast<std::uint64_t>(std::max<std::int64_t>(minSize, 0)),
+          .skipsHidden = settings.truthValue(hiddenKey).value_or(true)};
+}
+
+Preferences::Failure Preferences::setSkipsHidden(bool skipsHidden) {
+  return ApplicationData::settings().set(hiddenKey, skipsHidden);
+}
+
+Preferences::Failure Preferences::setMinSize(std::uint64_t bytes) {
+  return ApplicationData::settings().set(sizeKey, static_cast<std::int64_t>(bytes));
 }
 
 // Paths are bytes and settings are text, so folders are kept as URLs.

@@ -1,10 +1,12 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <cstdint>
 #include <optional>
 #include <string>
 #include <vector>
 
+#include <Scan/ScanRequest.h>
 #include <Varnel/Platform/Values/PlatformError.h>
 
 namespace Orvane {
@@ -20,6 +22,12 @@ class Preferences final {
   /// No until the user has chosen sounds.
   [[nodiscard]] static bool playsSounds();
   [[nodiscard]] static Failure setPlaysSounds(bool playsSounds);
+
+  /// Which files of the folders take part in a scan: no hidden ones, and of any size, unless the
+  /// user has chosen otherwise.
+  [[nodiscard]] static ScanRequest scanRequest();
+  [[nodiscard]] static Failure setSkipsHidden(bool skipsHidden);
+  [[nodiscard]] static Failure setMinSize(std::uint64_t bytes);
 
   /// The folders that were last scanned, byte for byte.
   [[nodiscard]] static std::vector<std::string> lastFolders();

@@ -7,6 +7,13 @@
 #include <orvane-window/Model/Background.h>
 
 namespace Orvane {
+namespace {
+
+IsPassing passingFilesOf(const Engine& engine) {
+  return [&engine](const std::string& path) { return engine.isPassing(path); };
+}
+
+}  // namespace
 
 Session::Session(Ports ports, Observer observer) : ports_(ports), observer_(std::move(observer)) {}
 
@@ -44,20 +51,22 @@ void Session::removeFolder(const std::string& path) {
   if (stage_ == Stage::choosing && std::erase(folders_, path) > 0) observer_(Event::foldersChanged);
 }
 
-void Session::scan() {
+void Session::scan(ScanRequest request) {
   if (isAtWork() || folders_.empty()) return;
   plan_.reset();
+  request.folders = folders_;
   begin(Stage::scanning);
-  ports_.background.start([this, &engine = ports_.engine, folders = folders_,
+  ports_.background.start([this, &engine = ports_.engine, request = std::move(request),
                            control = scanControl_, lifetime = std::weak_ptr(lifetime_)] {
-    auto outcome = std::make_shared<ScanOutcome>(engine.scan(folders, *control));
+    auto outcome = std::make_shared<ScanOutcome>(engine.scan(request, *control));
     std::shared_ptr<DuplicateList> list;
     if (outcome->report) list = std::make_shared<DuplicateList>(outcome->report);
     return [this, outcome, list, control, lifetime] {
       if (lifetime.expired()) return;
       list_.reset();
       gone_.clear();
-      if (control->isCancelled) return end(Stage::choosing, Event::scanStopped);
+      if (control->isCancelled && (!list || list->report()->groups.empty()))
+        return end(Stage::choosing, Event::scanStopped);
       outcome_ = std::move(*outcome);
       if (!list) return end(Stage::choosing, Event::scanFailed);
       list_ = list;
@@ -93,16 +102,16 @@ void Session::choose(KeepRule rule) {
   if (stage_ != Stage::results) return;
   // A copy of the list is prepared behind the window: there may be a million files.
   begin(Stage::planning);
-  ports_.background.start(
-      [this, rule, report = list_->report(), lifetime = std::weak_ptr(lifetime_)] {
-        auto list = std::make_shared<DuplicateList>(report);
-        list->choose(select(*report, rule));
-        return [this, list, lifetime] {
-          if (lifetime.expired()) return;
-          *list_ = std::move(*list);  // Who shows it keeps it.
-          end(Stage::results, Event::chosen);
-        };
-      });
+  ports_.background.start([this, rule, &engine = ports_.engine, report = list_->report(),
+                           lifetime = std::weak_ptr(lifetime_)] {
+    auto list = std::make_shared<DuplicateList>(report);
+    list->choose(select(*report, rule, passingFilesOf(engine)));
+    return [this, list, lifetime] {
+      if (lifetime.expired()) return;
+      *list_ = std::move(*list);  // Who shows it keeps it.
+      end(Stage::results, Event::chosen);
+    };
+  });
 }
 
 void Session::chooseNothing() {
@@ -114,10 +123,9 @@ void Session::chooseNothing() {
 void Session::planRemoval() {
   if (stage_ != Stage::results || list_->chosen().files == 0) return;
   begin(Stage::planning);
-  ports_.background.start([this, &engine = ports_.engine, report = list_->report(),
-                           selection = list_->selection(), progress = moveProgress_,
+  ports_.background.start([this, &engine = ports_.engine, list = *list_, progress = moveProgress_,
                            lifetime = std::weak_ptr(lifetime_)] {
-    auto plan = engine.plan(report, selection, progress);
+    auto plan = engine.plan(list.report(), list.selection(passingFilesOf(engine)), progress);
     return [this, plan, progress, lifetime] {
       if (lifetime.expired()) return;
       plan_ = progress->shouldStop ? nullptr : plan;
@@ -164,6 +172,25 @@ void Session::restore() {
       gone_ = std::move(*left);
       if (rest && !moved_.paths.empty()) list_ = std::make_shared<DuplicateList>(rest);
       end(rest ? Stage::results : Stage::choosing, Event::restored);
+    };
+  });
+}
+
+void Session::exportTo(std::string path, ExportKind kind) {
+  if (stage_ != Stage::results) return;
+  begin(Stage::exporting);
+  const auto list = std::make_shared<const DuplicateList>(*list_);
+  const TextSource chosen = [list](const TextWriter& write) {
+    return writeChosenFiles(*list, write);
+  };
+  ports_.background.start([this, path = std::move(path),
+                           source = kind == ExportKind::chosenFiles ? chosen : outcome_.jsonReport,
+                           lifetime = std::weak_ptr(lifetime_)] {
+    const auto failure = writeFile(path, source);
+    return [this, failure, lifetime] {
+      if (lifetime.expired()) return;
+      exportFailure_ = failure;
+      end(Stage::results, Event::exported);
     };
   });
 }

@@ -5,6 +5,7 @@
 #include <memory>
 #include <set>
 #include <string>
+#include <system_error>
 #include <vector>
 
 #include <orvane-window/Model/DuplicateList.h>
@@ -27,17 +28,18 @@ class Background;
 /// behind it, and none of it is lost by ending the program.
 class Session final {
  public:
-  enum class Stage { choosing, scanning, results, planning, removing, restoring };
+  enum class Stage { choosing, scanning, results, planning, removing, restoring, exporting };
   enum class Event {
     foldersChanged,
     started,  ///< The stage tells what.
     scanned,
-    scanFailed,  ///< `lostFolders` of the outcome tell why.
-    scanStopped,
+    scanFailed,   ///< `lostFolders` of the outcome tell why.
+    scanStopped,  ///< Before anything was found.
     chosen,
     planned,
     removed,
     restored,
+    exported,
     startedOver,
   };
   /// It may call the session.
@@ -65,8 +67,9 @@ class Session final {
   void addFolder(std::string path);
   void removeFolder(const std::string& path);
 
-  /// From the folders, or again from the result.
-  void scan();
+  /// From the folders, or again from the result; the request says what of them takes part. A scan
+  /// that is stopped has what it found by then as its result.
+  void scan(ScanRequest request = {});
   /// Ends whatever is being done, soon.
   void stop();
   /// Back to the folders.
@@ -93,6 +96,12 @@ class Session final {
   /// Of the last removal or restoration.
   [[nodiscard]] const MoveOutcome& moved() const { return moved_; }
 
+  /// Writes to a file what the scan has found, as JSON, or which files are chosen.
+  enum class ExportKind { scanReport, chosenFiles };
+  void exportTo(std::string path, ExportKind kind);
+  /// Why the last export has failed, if it has.
+  [[nodiscard]] std::error_code exportFailure() const { return exportFailure_; }
+
  private:
   void begin(Stage stage);
   void end(Stage stage, Event event);
@@ -109,6 +118,7 @@ class Session final {
   std::set<std::string> gone_;           ///< What was removed of it and not put back.
   std::shared_ptr<PlannedRemoval> plan_;
   MoveOutcome moved_;
+  std::error_code exportFailure_;
   const std::shared_ptr<bool> lifetime_ = std::make_shared<bool>();
 };
 

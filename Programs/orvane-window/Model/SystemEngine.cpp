@@ -2,7 +2,9 @@
 #include <orvane-window/Model/SystemEngine.h>
 
 #include <algorithm>
+#include <chrono>
 #include <filesystem>
+#include <limits>
 #include <thread>
 #include <utility>
 
@@ -14,12 +16,14 @@
 #include <Varnel/Context/Globals.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
 #include <Varnel/DiskWatch/DiskAccessWatcher.h>
+#include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <orvane-window/Model/MoveReasons.h>
 #include <orvane-window/Model/Texts.h>
 #include <orvane/ManagedDiskTurns.h>
 #include <orvane/ScanAnalytics.h>
 #include <orvane/ScanLog.h>
+#include <orvane/ScanReport.h>
 
 namespace Orvane {
 namespace {
@@ -88,32 +92,37 @@ class SystemRemoval final : public PlannedRemoval {
   std::vector<MoveOutcome::Left> left() const override {
     std::vector<MoveOutcome::Left> left;
     for (const RemovalStep& step : removal_.steps())
-      if (step.outcome != RemovalStep::Outcome::planned &&
-          step.outcome != RemovalStep::Outcome::moved &&
-          // Whoever stopped it knows that.
-          step.outcome != RemovalStep::Outcome::stopped)
-        left.push_back({removal_.pathOf(step), textOf(step.outcome, step.code)});
+      if (step.outcome != RemovalStep::Outcome::planned) addTo(left, step);
     return left;
   }
 
   MoveOutcome carryOut() override {
     MoveOutcome outcome;
     progress_->all = files();
+    std::vector<const RemovalStep*> planned;
+    for (const RemovalStep& step : removal_.steps())
+      if (step.outcome == RemovalStep::Outcome::planned) planned.push_back(&step);
     if (const auto problem = removal_.begin()) {
       outcome.problem = textOf(*problem);
       return outcome;
     }
-    while (const RemovalStep* step = removal_.next()) {
-      ++progress_->done;
+    while (removal_.next()) ++progress_->done;
+    for (const RemovalStep* step : planned)  // One that fails may end others.
       if (step->outcome == RemovalStep::Outcome::moved)
         outcome.paths.insert(removal_.pathOf(*step));
-    }
+      else
+        addTo(outcome.left, *step);
     outcome.bytes = removal_.totals().freedBytes;
-    outcome.left = left();
     return outcome;
   }
 
  private:
+  void addTo(std::vector<MoveOutcome::Left>& left, const RemovalStep& step) const {
+    // Whoever stopped it knows that.
+    if (step.outcome != RemovalStep::Outcome::stopped)
+      left.push_back({removal_.pathOf(step), textOf(step.outcome, step.code)});
+  }
+
   const std::shared_ptr<const Report> report_;
   const Selection selection_;
   const std::shared_ptr<MoveProgress> progress_;
@@ -136,13 +145,20 @@ SystemEngine::SystemEngine(Console& console, std::optional<std::string> analytic
 
 SystemEngine::~SystemEngine() = default;
 
-ScanOutcome SystemEngine::scan(const std::vector<std::string>& folders, ScanControl& control) {
+bool SystemEngine::isPassing(const std::string& path) const {
+  return processPorts().trash.get().isInTrash(path);
+}
+
+ScanOutcome SystemEngine::scan(ScanRequest request, ScanControl& control) {
   ScanOutcome outcome;
-  const auto paths = resolved(folders, outcome.lostFolders);
+  request.folders = resolved(request.folders, outcome.lostFolders);
   if (!outcome.lostFolders.empty()) return outcome;
+  const ScanFacts facts{
+      .startedAt = std::chrono::floor<std::chrono::seconds>(processPorts().clock.get().now()),
+      .folders = request.folders};
 
   analytics_ = std::make_unique<ScanAnalytics>(analyticsEndpoint_, false, console_);
-  analytics_->scanStarted(paths.size());
+  analytics_->scanStarted(request.folders.size());
   ScanLog log(console_);
   const Varnel::DiskAccessWatcher watcher("orvane-window");
   ManagedDiskTurns turns(
@@ -150,17 +166,20 @@ ScanOutcome SystemEngine::scan(const std::vector<std::string>& folders, ScanCont
       Varnel::Platform::QualityOfService::userInitiated, maxReaders());
   DuplicateFinder finder(
       {.fileSystem = systemFileSystem(CacheUse::traceless), .turns = turns, .observer = log});
-  const ScanResult result = finder.find({.folders = paths}, control);
-  outcome.lostFolders = result.lostFolders;
-  outcome.totals = result.totals;
-  if (control.isCancelled) {
+  const auto result = std::make_shared<const ScanResult>(finder.find(request, control));
+  outcome.lostFolders = result->lostFolders;
+  outcome.totals = result->totals;
+  if (!outcome.lostFolders.empty()) return outcome;
+  Report report = reportOf(*result);
+  report.roots = request.folders;
+  outcome.report = std::make_shared<const Report>(std::move(report));
+  outcome.jsonReport = [result, facts](const TextWriter& write) {
+    return writeReport(*result, facts, std::numeric_limits<std::size_t>::max(), write);
+  };
+  if (result->isPartial)
     analytics_->scanCancelled();
-  } else if (outcome.lostFolders.empty()) {
-    Report report = reportOf(result);
-    report.roots = paths;
-    outcome.report = std::make_shared<const Report>(std::move(report));
-    analytics_->scanFinished(result.groups.size());
-  }
+  else
+    analytics_->scanFinished(result->groups.size());
   return outcome;
 }
 

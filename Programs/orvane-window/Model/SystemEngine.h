@@ -21,7 +21,8 @@ class SystemEngine final : public Engine {
   SystemEngine(Console& console, std::optional<std::string> analyticsEndpoint);
   ~SystemEngine() override;
 
-  ScanOutcome scan(const std::vector<std::string>& folders, ScanControl& control) override;
+  ScanOutcome scan(ScanRequest request, ScanControl& control) override;
+  bool isPassing(const std::string& path) const override;
   std::shared_ptr<PlannedRemoval> plan(std::shared_ptr<const Report> report, Selection selection,
                                        std::shared_ptr<MoveProgress> progress) override;
   MoveOutcome restore(MoveProgress& progress) override;

@@ -1,0 +1,25 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <functional>
+#include <string>
+#include <system_error>
+
+#include <orvane/TextParts.h>
+
+namespace Orvane {
+
+class DuplicateList;
+
+/// Writes a text part by part; false when a part could not be written.
+using TextSource = std::function<bool(const TextWriter&)>;
+
+/// Puts a file with the text into its place, where nothing changes before all is written. Any
+/// thread.
+[[nodiscard]] std::error_code writeFile(const std::string& path, const TextSource& source);
+
+/// The paths of the chosen files, a line each. One that is no line of text, for its bytes or a line
+/// break, stands there as a file URL.
+[[nodiscard]] bool writeChosenFiles(const DuplicateList& list, const TextWriter& write);
+
+}  // namespace Orvane
