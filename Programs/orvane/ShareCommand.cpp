@@ -50,6 +50,7 @@ int ShareCommand::run(Console& console) const {
   if (!report) return interruption.signal() != 0 ? 128 + interruption.signal() : 1;
 
   Progress progress(console);
+  const Varnel::DiskAccessWatcher watcher("orvane");
   Sharing sharing({.fileSystem = systemFileSystem(), .disks = Varnel::DiskAccessManager::shared()},
                   *report, isTrial ? Sharing::Mode::trial : Sharing::Mode::real,
                   control.isCancelled);
