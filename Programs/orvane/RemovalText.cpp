@@ -79,6 +79,9 @@ class Lines final {
     return left_ > 0 ? row("Stays", form_.isMade ? "Moved to the trash" : "Goes to the trash") : "";
   }
 
+  /// Before what follows. In one column, each group ends with it.
+  [[nodiscard]] std::string tail() const { return left_ > 0 ? "\n" : ""; }
+
   [[nodiscard]] std::string group(std::string kept, bool isTie,
                                   const std::vector<std::pair<std::string, std::string>>& victims) {
     const std::string mark = isTie ? " [tie]" : "";
@@ -147,18 +150,16 @@ bool writeText(const Removal& removal, const Selection& selection, RemovalForm f
   Lines lines(form);
   TextParts parts(write);
   if (!removal.steps().empty() && !parts.add(lines.head())) return false;
-  return forEachGroup(
-             removal,
-             [&](auto begin, auto end) {
-               std::vector<std::pair<std::string, std::string>> victims;
-               for (auto step = begin; step != end; ++step)
-                 victims.emplace_back(
-                     shownPath(removal.pathOf(*step)),
-                     goes(*step) ? "" : std::string(" [") + wordingOf(step->outcome).word + "]");
-               return parts.add(lines.group(shownPath(removal.keptFor(*begin)),
-                                            selection[begin->choice].isTie, victims));
-             }) &&
-         parts.flush();
+  const bool isWritten = forEachGroup(removal, [&](auto begin, auto end) {
+    std::vector<std::pair<std::string, std::string>> victims;
+    for (auto step = begin; step != end; ++step)
+      victims.emplace_back(
+          shownPath(removal.pathOf(*step)),
+          goes(*step) ? "" : std::string(" [") + wordingOf(step->outcome).word + "]");
+    return parts.add(
+        lines.group(shownPath(removal.keptFor(*begin)), selection[begin->choice].isTie, victims));
+  });
+  return isWritten && (removal.steps().empty() || parts.add(lines.tail())) && parts.flush();
 }
 
 std::string summaryOf(const Removal& removal, RemovalForm form) {

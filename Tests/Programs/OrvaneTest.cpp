@@ -293,6 +293,10 @@ TEST_F(Orvane, ShowsProgressAndEmphasisOnTerminalsAlone) {
   EXPECT_THAT(onTerminal("scan --progress --no-progress " + folder.path()), Not(HasSubstr("\x1b")));
   EXPECT_THAT(onTerminal(scan + " 2>errors"), Not(HasSubstr("\x1b")));
   EXPECT_THAT(run({"scan", "-p", folder.path()}).errors, IsEmpty());
+  folder.write("b", "same");
+  EXPECT_THAT(onTerminal("trash --keep oldest " + folder.path()),
+              HasSubstr("\n1 file would go to the trash:\r\n4 bytes would be free once it\r\nis "
+                        "emptied\r\nnothing was moved yet: --yes\r\ndoes it\r\n"));
 }
 
 TEST_F(Orvane, ShowsPathsAndTheMenu) {
