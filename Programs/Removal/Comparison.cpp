@@ -6,6 +6,7 @@
 #include <vector>
 
 #include <Removal/DiskPlace.h>
+#include <Removal/OpenedFile.h>
 #include <Scan/Loss.h>
 
 namespace Orvane {
@@ -29,12 +30,7 @@ class Reading final {
   explicit Reading(const ComparedFile& file) : file_(file), block_(blockLength) {}
 
   [[nodiscard]] Comparison open(FileSystem& fileSystem) {
-    const std::size_t slash = file_.path.rfind('/');
-    if (slash == std::string::npos) return {.verdict = Verdict::changed};
-    auto folder =
-        fileSystem.openFolder(nullptr, file_.path.substr(0, std::max<std::size_t>(slash, 1)));
-    if (!folder) return because(folder.error());
-    auto opened = (*folder)->open(file_.path.c_str() + slash + 1, ReadingPlan::everything);
+    auto opened = openFile(file_.path, fileSystem);
     if (!opened) return because(opened.error());
     open_ = std::move(*opened);
     return checkState();
@@ -123,6 +119,12 @@ Comparison compare(const ComparedFile& one, const ComparedFile& other, FileSyste
     } while (!first.isAtEnd() && first.offset() - turnBegan < maxTurn);
   }
   return {.verdict = first.isOfSameFile(second) ? Verdict::different : Verdict::equal};
+}
+
+bool isStillThere(const ComparedFile& file, FileSystem& fileSystem) {
+  const auto opened = openFile(file.path, fileSystem);
+  const auto status = opened ? (*opened)->status() : opened.error();
+  return status && status->hasContentOf(file.status);
 }
 
 }  // namespace Orvane

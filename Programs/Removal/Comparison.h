@@ -40,4 +40,8 @@ struct ComparedFile {
                                  FileSystem& fileSystem, Varnel::DiskAccessManager& disks,
                                  const std::atomic<bool>& shouldStop);
 
+/// Whether the file is there, and in its state. It is opened for that: a look-up may tell what the
+/// file system remembers of it.
+[[nodiscard]] bool isStillThere(const ComparedFile& file, FileSystem& fileSystem);
+
 }  // namespace Orvane

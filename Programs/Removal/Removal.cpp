@@ -7,6 +7,7 @@
 
 #include <Removal/Comparison.h>
 #include <Removal/DiskPlace.h>
+#include <Removal/OpenedFile.h>
 #include <Removal/PackagedFiles.h>
 #include <Scan/FileSystem.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
@@ -56,6 +57,16 @@ std::uint64_t linksTo(const std::string& path) {
   std::error_code unknown;
   const auto count = std::filesystem::hard_link_count(path, unknown);
   return unknown ? 1 : count;
+}
+
+// Where it cannot be told, as scans count it then.
+FileSpace spaceOf(const std::string& path, std::uint64_t size, FileSystem& fileSystem) {
+  FileSpace space{.bytes = size};
+  const auto file = openFile(path, fileSystem);
+  if (!file) return space;
+  if (const auto status = (*file)->status()) space.bytes = std::min(size, status->allocated);
+  space.shared = (*file)->sharedExtents();
+  return space;
 }
 
 Outcome outcomeOf(Comparison::Verdict verdict) {
@@ -132,8 +143,10 @@ std::optional<Problem> Removal::prepare() {
     return Problem{.reason = Problem::Reason::selection,
                    .description = "choice " + std::to_string(refusal->choice + 1)};
   steps_.clear();
+  spaces_.clear();
   for (std::size_t choice = 0; choice < selection_.size(); ++choice) {
     const ReportGroup& group = report_.groups[selection_[choice].group];
+    spaces_.emplace_back(group.files.size(), FileSpace{.bytes = group.size});
     for (const std::size_t victim : selection_[choice].victims) {
       const std::size_t names = allowances_.hardLinks ? group.files[victim].names.size() : 0;
       for (std::size_t name = 0; name <= names; ++name)
@@ -163,6 +176,8 @@ void Removal::lookAtGroup(std::size_t begin, std::size_t end, const Names& packa
     const auto place = placeOnDiskOf(file.path, ports_.disks);
     const auto state = ports_.trash.state(file.path);
     if (place && state && isAsReported(*state, file, group.size)) {
+      spaces_[steps_[begin].choice][devices.size()] =
+          spaceOf(file.path, group.size, ports_.fileSystem);
       devices.push_back(state->device);
       continue;
     }
@@ -284,9 +299,10 @@ void Removal::move(RemovalStep& step) {
     step.outcome = Outcome::noAccess;
     return;
   }
+  const ComparedFile compared{.path = kept, .status = statusOf(*keptState)};
   const auto staysAsCompared = [&] {
     const auto now = trash.state(kept);
-    return now && *now == *keptState;
+    return now && *now == *keptState && isStillThere(compared, ports_.fileSystem);
   };
   bool isNoted = false, isKept = true;
   const auto moved = trash.move(path, *state, [&](const TrashedFile& planned) {
@@ -306,7 +322,8 @@ void Removal::move(RemovalStep& step) {
     return;
   }
   step.outcome = Outcome::moved;
-  // Somebody else may have removed the other file in that very moment, for the sake of this one.
+  // Somebody else may have removed the other file in that very moment, for the sake of this one; or
+  // both were one, seen through a file system that tells nothing of it.
   if (staysAsCompared() || trash.restore(*moved, Trash::Folders::leave)) return;
   step.outcome = Outcome::changed;
   static_cast<void>(ports_.journal.forget(record_, path));
@@ -314,22 +331,33 @@ void Removal::move(RemovalStep& step) {
 
 RemovalTotals Removal::totals() const {
   RemovalTotals totals;
-  bool isWholeFileMoved = true, isWholeFilePlanned = true;
-  for (std::size_t i = 0; i < steps_.size(); ++i) {
-    const RemovalStep& step = steps_[i];
-    const bool isMoved = step.outcome == Outcome::moved;
-    const bool isPlanned = isMoved || step.outcome == Outcome::planned;
-    totals.planned += isPlanned && !isMoved;
-    totals.moved += isMoved;
-    if (!isPlanned) ++(isForWantOfAllowance(step.outcome) ? totals.notAllowed : totals.notMoved);
-    isWholeFileMoved = (step.name == 0 || isWholeFileMoved) && isMoved;
-    isWholeFilePlanned = (step.name == 0 || isWholeFilePlanned) && isPlanned;
-    const bool isLastName = i + 1 == steps_.size() || steps_[i + 1].name == 0;
-    if (!isLastName || step.otherNames > 0) continue;
-    if (isWholeFileMoved) totals.freedBytes += sizeOf(step);
-    if (isWholeFilePlanned) totals.plannedBytes += sizeOf(step);
+  for (std::size_t begin = 0, end = 0; begin < steps_.size(); begin = end) {
+    for (end = begin; end < steps_.size() && steps_[end].choice == steps_[begin].choice; ++end) {
+      const Outcome outcome = steps_[end].outcome;
+      totals.planned += outcome == Outcome::planned;
+      totals.moved += outcome == Outcome::moved;
+      totals.notAllowed += isForWantOfAllowance(outcome);
+    }
+    totals.freedBytes += freedBytes(begin, end, {Outcome::moved});
+    totals.plannedBytes += freedBytes(begin, end, {Outcome::moved, Outcome::planned});
   }
+  totals.notMoved = steps_.size() - totals.planned - totals.moved - totals.notAllowed;
   return totals;
+}
+
+// A file goes with the last of its names.
+std::uint64_t Removal::freedBytes(std::size_t begin, std::size_t end,
+                                  const std::set<Outcome>& leaving) const {
+  std::vector<FileSpace> files = spaces_[steps_[begin].choice];
+  for (FileSpace& file : files) file.isHeld = true;
+  for (std::size_t i = begin; i < end; ++i) {
+    const RemovalStep& step = steps_[i];
+    bool& isHeld = files[step.file].isHeld;
+    isHeld = (step.name > 0 && isHeld) || step.otherNames > 0 || !leaving.contains(step.outcome);
+  }
+  FreedSpace space;
+  for (const FileSpace& file : files) space.add(file);
+  return space.sum();
 }
 
 }  // namespace Orvane

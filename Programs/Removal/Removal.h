@@ -14,6 +14,7 @@
 #include <Removal/RemovalJournal.h>
 #include <Removal/Report.h>
 #include <Removal/Selection.h>
+#include <Scan/FreedSpace.h>
 #include <Varnel/Platform/Ports/Trash.h>
 
 namespace Varnel {
@@ -73,7 +74,8 @@ struct RemovalTotals {
   std::uint64_t moved = 0;
   std::uint64_t notAllowed = 0;  ///< Left alone for want of an allowance.
   std::uint64_t notMoved = 0;    ///< Left alone because of what was met.
-  /// What is free once the trash is emptied, and what would be if all that is planned were moved.
+  /// What is free once the trash is emptied, and what would be if all that is planned were moved:
+  /// holes and what other files share do not count, as far as the file system tells.
   std::uint64_t freedBytes = 0;
   std::uint64_t plannedBytes = 0;
 };
@@ -157,6 +159,8 @@ class Removal final {
   [[nodiscard]] std::optional<Problem> findTrashes();
   void move(RemovalStep& step);
   void end(std::size_t from, std::size_t to, RemovalStep::Outcome outcome);
+  [[nodiscard]] std::uint64_t freedBytes(std::size_t begin, std::size_t end,
+                                         const std::set<RemovalStep::Outcome>& leaving) const;
 
   const Ports ports_;
   const Report& report_;
@@ -164,6 +168,7 @@ class Removal final {
   const Allowances allowances_;
   const std::atomic<bool>& shouldStop_;
   std::vector<RemovalStep> steps_;
+  std::vector<std::vector<FileSpace>> spaces_;  ///< Of the files of each choice's group.
   std::size_t nextStep_ = 0;
   RemovalRecord record_;
   RemovalJournal::Lock lock_;

@@ -6,6 +6,7 @@
 #include <utility>
 
 #include <Removal/DiskPlace.h>
+#include <Removal/OpenedFile.h>
 #include <Scan/Loss.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
 
@@ -94,12 +95,7 @@ Sharing::Source Sharing::open(SharingStep& step) {
   const auto place = placeOnDiskOf(path, ports_.disks);
   if (!place) return {};
   step.outcome = Outcome::changed;
-  const std::size_t slash = path.rfind('/');
-  if (slash == std::string::npos) return {};
-  auto folder =
-      ports_.fileSystem.openFolder(nullptr, path.substr(0, std::max<std::size_t>(slash, 1)));
-  if (!folder) return lost(folder.error());
-  auto file = (*folder)->open(path.c_str() + slash + 1, ReadingPlan::everything);
+  auto file = openFile(path, ports_.fileSystem);
   if (!file) return lost(file.error());
   const auto status = (*file)->status();
   if (!status) return lost(status.error());

@@ -111,7 +111,21 @@ class Walk final {
   void sayIfNetwork(const ScanMount& mount) {
     if (mount.kind != ScanMount::Kind::network) return;
     const std::lock_guard lock(saying_);
-    if (said_.insert(&mount).second) observer_.networkEntered(mount.path);
+    if (said_.insert(mount.path).second) observer_.networkEntered(mount.path);
+  }
+
+  /// Whether to go on in a folder of another device than the one above. What is mounted since the
+  /// scan began, perhaps by its coming there, is met like this.
+  [[nodiscard]] bool entersDevice(std::uint64_t identifier, const std::string& path) {
+    {
+      const std::lock_guard lock(mutex_);
+      if (devices_.contains(identifier)) return true;
+    }
+    const Mounts now(turns_.mounts());
+    const ScanMount* const mount = now.around(path);
+    if (mount && mount->kind == ScanMount::Kind::pseudo && !mounts_.at(mount->path)) return false;
+    if (mount) sayIfNetwork(*mount);
+    return true;
   }
 
   /// The device, looked up by the path of something on it. Never under the lock, for a share that
@@ -209,7 +223,7 @@ class Walk final {
   WalkResult result_;
 
   std::mutex saying_;  ///< Held while the observer hears of what follows.
-  std::set<const ScanMount*> said_;
+  std::set<std::string> said_;
 };
 
 /// Lists folders of one disk. A folder with many entries goes on in the next turn.
@@ -256,6 +270,9 @@ class Walk::Task final : public TaskGroup::Task {
     if (folder_->parent) {
       if (isOnTheWay(identity, *folder_->parent)) return false;
       if (walk_.request_.staysOnFileSystem && identity.device != folder_->parent->identity.device)
+        return false;
+      if (identity.device != folder_->parent->identity.device &&
+          !walk_.entersDevice(identity.device, pathOf(*folder_)))
         return false;
       // A given folder that lies in another one is walked by itself.
       if (walk_.givenIdentities_.contains(identity) && walk_.given_.contains(pathOf(*folder_)))

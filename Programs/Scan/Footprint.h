@@ -17,7 +17,7 @@ struct Footprint {
 };
 
 /// What a file shares with others.
-struct Sharing {
+struct FileSharing {
   FileNumber file;
   SharedExtents extents;
 };

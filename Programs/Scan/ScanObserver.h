@@ -19,8 +19,8 @@ class ScanObserver {
   virtual void folderLeftOut(const std::string& path, const Loss& loss) = 0;
 
   /// The scan is going to read a file system whose files lie on another machine, mounted on this
-  /// folder. Once for each, before it is touched, but where it was given; on any thread, one call
-  /// at a time.
+  /// folder. Once for each, before it is touched, but where it was given or is mounted only while
+  /// the scan runs; on any thread, one call at a time.
   virtual void networkEntered(const std::string& /*folder*/) {}
 };
 

@@ -22,7 +22,7 @@ constexpr std::size_t worthATask = 1000;
 /// The findings of all tasks.
 struct Findings {
   std::mutex mutex;
-  std::vector<Sharing> all;
+  std::vector<FileSharing> all;
 };
 
 /// Asks about some files of one disk, folder by folder.
@@ -71,14 +71,14 @@ class SharingTask final : public TaskGroup::Task {
   const TaskGroup& group_;
   Findings& findings_;
   std::map<std::uint32_t, bool> isTold_;
-  std::vector<Sharing> found_;
+  std::vector<FileSharing> found_;
 };
 
 }  // namespace
 
-std::vector<Sharing> findSharedSpace(const FileTree& tree, std::vector<FileNumber> files,
-                                     FileSystem& fileSystem, DiskTurns& turns,
-                                     const ScanControl& control) {
+std::vector<FileSharing> findSharedSpace(const FileTree& tree, std::vector<FileNumber> files,
+                                         FileSystem& fileSystem, DiskTurns& turns,
+                                         const ScanControl& control) {
   if (control.isCancelled) return {};
   const auto placeOf = [&](FileNumber file) {
     return std::tuple(&tree.diskOf(file), tree.file(file).folder, tree.file(file).inode);

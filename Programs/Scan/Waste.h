@@ -15,6 +15,6 @@ namespace Orvane {
 /// nothing. Of the files of reference none goes; of a group without one, the one that would free
 /// least stays.
 void computeWaste(ScanResult& result, const std::vector<Footprint>& footprints,
-                  const std::vector<Sharing>& sharings);
+                  const std::vector<FileSharing>& sharings);
 
 }  // namespace Orvane

@@ -4,6 +4,7 @@
 #include <Varnel/Context/ApplicationData.h>
 #include <Varnel/Platform/Ports/UserDefaults.h>
 #include <Varnel/Platform/Values/UUID.h>
+#include <orvane/AnalyticsConsent.h>
 #include <orvane/Console.h>
 
 namespace Orvane {
@@ -23,6 +24,11 @@ std::string keptClientIdentifier() {
   if (const auto stored = storedClientIdentifier()) return *stored;
   const std::string drawn = Varnel::Platform::randomUUIDString();
   if (ApplicationData::settings().set(identifierKey, drawn)) return drawn;
+  // Another process may have taken the consent back, and the identifier with it, meanwhile.
+  if (storedConsent() != Tallyhouse::Consent::granted) {
+    static_cast<void>(ApplicationData::settings().remove(identifierKey));
+    return drawn;
+  }
   // Another process may have drawn one at the same time: the last one stays.
   return storedClientIdentifier().value_or(drawn);
 }

@@ -5,6 +5,7 @@
 
 #include <Varnel/Platform/Text/VisibleText.h>
 #include <orvane/StandardStreams.h>
+#include <orvane/TextColumns.h>
 
 namespace Orvane {
 namespace {
@@ -41,10 +42,12 @@ void Console::eraseStatusInHandler() {
   if (isStatusShown) writeStandardErrorInHandler(eraseLine);
 }
 
-void Console::showStatus(std::string status) {
+void Console::showStatus(const std::string& status) {
   const std::lock_guard lock(mutex_);
-  if (status == status_) return;
-  status_ = std::move(status);
+  // One that fills the last column would go on in the next line on some terminals, and stay there.
+  std::string line = fitted(status, standardErrorColumns() - 1);
+  if (line == status_) return;
+  status_ = std::move(line);
   isStatusShown = !status_.empty();
   writeStandardError(std::string(eraseLine) + status_);
 }

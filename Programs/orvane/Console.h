@@ -32,8 +32,8 @@ class Console final {
   [[nodiscard]] bool writeResult(std::string_view text);
   [[nodiscard]] bool hasLostReader() const { return hasLostReader_; }
 
-  /// Replaces the status line. Only for terminals.
-  void showStatus(std::string status);
+  /// Replaces the status line, and cuts one that is wider than the terminal. Only for terminals.
+  void showStatus(const std::string& status);
   void clearStatus() { showStatus({}); }
 
   /// Erases the status line of any console from the terminal. For signal handlers that end the

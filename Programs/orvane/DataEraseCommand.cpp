@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/DataCommand.h>
 
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -11,6 +12,7 @@
 #include <orvane/Console.h>
 #include <orvane/DataErasure.h>
 #include <orvane/DataText.h>
+#include <orvane/ShownText.h>
 #include <orvane/TrashCommand.h>
 
 namespace Orvane {
@@ -26,15 +28,22 @@ std::string plan(const std::vector<DataPart>& parts) {
 
 std::string resultOf(const DataPart& part, const Erasure& erasure) {
   if (part.files.empty()) return part.name + ": none\n";
-  if (erasure.left.empty()) return part.name + ": erased, " + sizeText(part.bytes()) + "\n";
+  if (erasure.left.empty()) return part.name + ": erased, " + shownSize(part.bytes()) + "\n";
   std::string text;
   for (const LeftFile& left : erasure.left)
-    text += part.name + ": left " + pathText(left.path) + ": " + left.reason + "\n";
+    text += part.name + ": left " + shownPath(left.path) + ": " + left.reason + "\n";
   return text;
+}
+
+// Root may be in the home of somebody else, and be let.
+bool isOthers(const std::string& folder) {
+  struct stat facts {};
+  return ::lstat(folder.c_str(), &facts) == 0 && facts.st_uid != ::geteuid();
 }
 
 // Unlike other ways to remove, this one takes no file or link that is in the folder's place.
 std::optional<std::string> removeFolder(const std::string& folder) {
+  if (isOthers(folder)) return "it belongs to somebody else";
   if (::rmdir(folder.c_str()) == 0 || errno == ENOENT) return std::nullopt;
   if (errno == ENOTDIR) return "it is no folder, but a file or a link";
   if (errno == ENOTEMPTY || errno == EEXIST) return "it holds other files, or new ones";
@@ -57,7 +66,7 @@ int DataEraseCommand::run(Console& console) const {
   }
   for (const std::string& folder : folders)
     if (const auto reason = removeFolder(folder); reason && isAllGone)
-      text += "left " + pathText(folder) + ": " + *reason + "\n";
+      text += "left " + shownPath(folder) + ": " + *reason + "\n";
   if (!console.writeResult(text)) return 1;
   return isAllGone ? 0 : someNotMoved;
 }

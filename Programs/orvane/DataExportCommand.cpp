@@ -18,7 +18,9 @@ using nlohmann::ordered_json;
 
 /// A file with what is in it, or with why that cannot be told.
 ordered_json toJSON(const DataFile& file, DataPart::Form form) {
-  ordered_json object = {{"path", file.path}, {"bytes", file.bytes}};
+  ordered_json object;
+  addPath(object, "path", "url", file.path);
+  object["bytes"] = file.bytes;
   if (file.objection) {
     object["notRead"] = *file.objection;
   } else if (!hasContent(file) || file.bytes == 0) {
@@ -31,7 +33,7 @@ ordered_json toJSON(const DataFile& file, DataPart::Form form) {
       object["notRead"] = rows.error().localizedDescription();
     }
   } else if (std::ifstream stream(file.path, std::ios::binary); stream) {
-    object["text"] = std::string(std::istreambuf_iterator<char>(stream), {});
+    addText(object, "text", std::string(std::istreambuf_iterator<char>(stream), {}));
   } else {
     object["notRead"] = "cannot be opened";
   }

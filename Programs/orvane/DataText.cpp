@@ -4,13 +4,8 @@
 #include <algorithm>
 
 #include <Varnel/Context/Globals.h>
-#include <Varnel/Paths/QNURLResolver.h>
-#include <Varnel/Platform/Ports/Ports.h>
-#include <Varnel/Platform/Ports/UserLocale.h>
-#include <Varnel/Platform/Text/ByteCountFormatter.h>
-#include <Varnel/Platform/Text/VisibleText.h>
 #include <orvane/ClientIdentifier.h>
-#include <orvane/ResultText.h>
+#include <orvane/ShownText.h>
 #include <orvane/StoredRows.h>
 
 namespace Orvane {
@@ -23,11 +18,11 @@ std::string lineOf(const DataPart& part) {
   } else {
     if (const auto entries = entriesOf(part))
       text += counted(static_cast<std::uint64_t>(*entries), "entry", "entries") + ", ";
-    text += sizeText(part.bytes()) + " in " + pathText(part.path);
+    text += shownSize(part.bytes()) + " in " + shownPath(part.path);
   }
   text += "  (" + part.content + ")\n";
   for (const DataFile& file : part.files)
-    if (file.objection) text += "  " + pathText(file.path) + " " + *file.objection + "\n";
+    if (file.objection) text += "  " + shownPath(file.path) + " " + *file.objection + "\n";
   return text;
 }
 
@@ -51,17 +46,6 @@ std::string textOf(const std::vector<DataPart>& parts) {
                      "client identifier: " + storedClientIdentifier().value_or("none") + "\n";
   for (const DataPart& part : parts) text += lineOf(part);
   return text;
-}
-
-std::string sizeText(std::uint64_t bytes) {
-  static const Varnel::Platform::ByteCountFormatter byteCounts(
-      Varnel::Platform::processPorts().userLocale.get().numberIdentifier());
-  return byteCounts.string(static_cast<std::int64_t>(bytes),
-                           Varnel::Platform::ByteCountStyle::file);
-}
-
-std::string pathText(const std::string& path) {
-  return Varnel::Platform::visibleText(Varnel::QNURLResolver::shared().abbreviatedPath(path));
 }
 
 }  // namespace Orvane

@@ -17,10 +17,4 @@ namespace Orvane {
 /// What the product keeps, for people: a line a part.
 [[nodiscard]] std::string textOf(const std::vector<DataPart>& parts);
 
-/// "4.1 KB".
-[[nodiscard]] std::string sizeText(std::uint64_t bytes);
-
-/// A path as people read it, with "~" for the home folder.
-[[nodiscard]] std::string pathText(const std::string& path);
-
 }  // namespace Orvane

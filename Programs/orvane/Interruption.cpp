@@ -1,51 +1,59 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/Interruption.h>
 
-#include <csignal>
+#include <pthread.h>
+#include <signal.h>
 
+#include <Varnel/Platform/Concurrency/StartThread.h>
 #include <orvane/Console.h>
 
 namespace Orvane {
 namespace {
 
 constexpr int signals[] = {SIGINT, SIGTERM, SIGHUP};
+constexpr int wakeUp = SIGURG;  ///< Nobody minds one that comes from elsewhere.
 
-// What a signal handler may touch: atomics that need no lock.
-std::atomic<std::atomic<bool>*> flagToSet{nullptr};
-std::atomic<int> caughtSignal{0};
-static_assert(std::atomic<std::atomic<bool>*>::is_always_lock_free);
+// What the program was started to ignore (by nohup, say) stays ignored.
+bool isIgnored(int signal) {
+  struct sigaction action {};
+  return ::sigaction(signal, nullptr, &action) == 0 && action.sa_handler == SIG_IGN;
+}
 
-extern "C" void interrupt(int signal) {
-  // The signal is blocked here, and ends the program when this returns.
-  if (caughtSignal.exchange(signal) != 0) {
-    Console::eraseStatusInHandler();
-    (void)std::signal(signal, SIG_DFL);
-    (void)std::raise(signal);
-    return;
-  }
-  if (std::atomic<bool>* flag = flagToSet) *flag = true;
+void end(int signal) {
+  Console::eraseStatusInHandler();
+  sigset_t only{};
+  ::sigemptyset(&only);
+  ::sigaddset(&only, signal);
+  ::pthread_sigmask(SIG_UNBLOCK, &only, nullptr);
+  (void)::raise(signal);
 }
 
 }  // namespace
 
-Interruption::Interruption(std::atomic<bool>& flag) {
-  caughtSignal = 0;
-  flagToSet = &flag;
-  for (const int signal : signals) {
-    // What the program was started to ignore (by nohup, say) stays ignored.
-    if (std::signal(signal, interrupt) == SIG_IGN) (void)std::signal(signal, SIG_IGN);
-  }
+// All threads of the framework have signals blocked, so that those of the process come to this one.
+Interruption::Interruption(std::atomic<bool>& flag) : flag_(flag) {
+  ::sigemptyset(&awaited_);
+  ::sigaddset(&awaited_, wakeUp);
+  for (const int signal : signals)
+    if (!isIgnored(signal)) ::sigaddset(&awaited_, signal);
+  ::pthread_sigmask(SIG_BLOCK, &awaited_, &blockedBefore_);
+  thread_ = Varnel::Platform::startThread("signals", [this] { wait(); });
 }
 
 Interruption::~Interruption() {
-  for (const int signal : signals) {
-    if (std::signal(signal, SIG_DFL) == SIG_IGN) (void)std::signal(signal, SIG_IGN);
-  }
-  flagToSet = nullptr;
+  isOver_ = true;
+  ::pthread_kill(thread_.native_handle(), wakeUp);
+  thread_.join();
+  ::pthread_sigmask(SIG_SETMASK, &blockedBefore_, nullptr);
 }
 
-int Interruption::signal() const {
-  return caughtSignal;
+void Interruption::wait() {
+  int signal = 0;
+  while (::sigwait(&awaited_, &signal) == 0 && !isOver_) {
+    if (signal == wakeUp) continue;
+    if (signal_.exchange(signal) != 0) end(signal);
+    flag_ = true;
+  }
 }
 
 }  // namespace Orvane

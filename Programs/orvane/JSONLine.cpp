@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/JSONLine.h>
 
+#include <fmt/format.h>
+
 #include <nlohmann/json.hpp>
 
 #include <Varnel/Platform/Values/URL.h>
@@ -10,6 +12,14 @@ namespace Orvane {
 
 std::string jsonLine(const nlohmann::ordered_json& json) {
   return json.dump(-1, ' ', false, nlohmann::ordered_json::error_handler_t::replace) + "\n";
+}
+
+void addText(nlohmann::ordered_json& json, const std::string& key, const std::string& text) {
+  json[key] = text;
+  if (Varnel::Platform::isValidUTF8(text)) return;
+  std::string digits;
+  for (const char byte : text) digits += fmt::format("{:02x}", static_cast<unsigned char>(byte));
+  json[key + "Bytes"] = digits;
 }
 
 void addPath(nlohmann::ordered_json& json, const char* key, const char* keyOfURL,

@@ -15,6 +15,10 @@ inline constexpr int schemaVersion = 1;
 /// UTF-8, which JSON texts must be, show as U+FFFD.
 [[nodiscard]] std::string jsonLine(const nlohmann::ordered_json& json);
 
+/// Adds a text under `key` and, where it is not UTF-8, all its bytes in hexadecimal digits under
+/// the same with "Bytes" behind it.
+void addText(nlohmann::ordered_json& json, const std::string& key, const std::string& text);
+
 /// Adds a path under `key` and, as one that is not UTF-8 shows as another, its exact file URL under
 /// `keyOfURL` then.
 void addPath(nlohmann::ordered_json& json, const char* key, const char* keyOfURL,

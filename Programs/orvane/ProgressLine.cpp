@@ -10,7 +10,7 @@
 #include <Scan/ScanObserver.h>
 #include <Varnel/Platform/Concurrency/StartThread.h>
 #include <orvane/Console.h>
-#include <orvane/ResultText.h>
+#include <orvane/ShownText.h>
 #include <orvane/StandardStreams.h>
 
 namespace Orvane {

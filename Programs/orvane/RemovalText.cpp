@@ -9,18 +9,14 @@
 #include <vector>
 
 #include <Removal/Removal.h>
-#include <Varnel/Paths/QNURLResolver.h>
-#include <Varnel/Platform/Text/ByteCountFormatter.h>
-#include <Varnel/Platform/Text/VisibleText.h>
 #include <orvane/JSONLine.h>
-#include <orvane/ResultText.h>
+#include <orvane/ShownText.h>
 #include <orvane/TextColumns.h>
 
 namespace Orvane {
 namespace {
 
 using Outcome = RemovalStep::Outcome;
-using Varnel::Platform::ByteCountStyle;
 
 struct Wording {
   const char* word;         ///< Behind a path, and in JSON.
@@ -82,6 +78,9 @@ class Lines final {
   [[nodiscard]] std::string head() const {
     return left_ > 0 ? row("Stays", form_.isMade ? "Moved to the trash" : "Goes to the trash") : "";
   }
+
+  /// Before what follows. In one column, each group ends with it.
+  [[nodiscard]] std::string tail() const { return left_ > 0 ? "\n" : ""; }
 
   [[nodiscard]] std::string group(std::string kept, bool isTie,
                                   const std::vector<std::pair<std::string, std::string>>& victims) {
@@ -147,29 +146,23 @@ nlohmann::ordered_json jsonOf(const Removal& removal, const RemovalStep& step) {
 }  // namespace
 
 bool writeText(const Removal& removal, const Selection& selection, RemovalForm form,
-               const Varnel::QNURLResolver& paths, const TextWriter& write) {
-  const auto shown = [&](const std::string& path) {
-    return Varnel::Platform::visibleText(paths.abbreviatedPath(path));
-  };
+               const TextWriter& write) {
   Lines lines(form);
   TextParts parts(write);
   if (!removal.steps().empty() && !parts.add(lines.head())) return false;
-  return forEachGroup(
-             removal,
-             [&](auto begin, auto end) {
-               std::vector<std::pair<std::string, std::string>> victims;
-               for (auto step = begin; step != end; ++step)
-                 victims.emplace_back(
-                     shown(removal.pathOf(*step)),
-                     goes(*step) ? "" : std::string(" [") + wordingOf(step->outcome).word + "]");
-               return parts.add(lines.group(shown(removal.keptFor(*begin)),
-                                            selection[begin->choice].isTie, victims));
-             }) &&
-         parts.flush();
+  const bool isWritten = forEachGroup(removal, [&](auto begin, auto end) {
+    std::vector<std::pair<std::string, std::string>> victims;
+    for (auto step = begin; step != end; ++step)
+      victims.emplace_back(
+          shownPath(removal.pathOf(*step)),
+          goes(*step) ? "" : std::string(" [") + wordingOf(step->outcome).word + "]");
+    return parts.add(
+        lines.group(shownPath(removal.keptFor(*begin)), selection[begin->choice].isTie, victims));
+  });
+  return isWritten && (removal.steps().empty() || parts.add(lines.tail())) && parts.flush();
 }
 
-std::string summaryOf(const Removal& removal, RemovalForm form,
-                      const Varnel::Platform::ByteCountFormatter& byteCounts) {
+std::string summaryOf(const Removal& removal, RemovalForm form) {
   std::map<Outcome, std::uint64_t> counts;
   std::uint64_t linked = 0;
   for (const RemovalStep& step : removal.steps()) {
@@ -177,9 +170,7 @@ std::string summaryOf(const Removal& removal, RemovalForm form,
     if (goes(step) && step.otherNames > 0) ++linked;
   }
   const RemovalTotals totals = removal.totals();
-  const std::string size = byteCounts.string(
-      static_cast<std::int64_t>(form.isMade ? totals.freedBytes : totals.plannedBytes),
-      ByteCountStyle::file);
+  const std::string size = shownSize(form.isMade ? totals.freedBytes : totals.plannedBytes);
   const std::uint64_t count = counts[form.isMade ? Outcome::moved : Outcome::planned];
   std::string text;
   if (form.isMade) {

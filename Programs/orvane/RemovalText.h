@@ -7,14 +7,6 @@
 #include <Removal/Selection.h>
 #include <orvane/TextParts.h>
 
-namespace Varnel {
-class QNURLResolver;
-}
-
-namespace Varnel::Platform {
-class ByteCountFormatter;
-}
-
 namespace Orvane {
 
 class Removal;
@@ -28,11 +20,10 @@ struct RemovalForm {
 /// The removal for people: the file that stays of each group, beside those that go, or below one
 /// another where there is no terminal, or a narrow one. Returns whether all could be written.
 [[nodiscard]] bool writeText(const Removal& removal, const Selection& selection, RemovalForm form,
-                             const Varnel::QNURLResolver& paths, const TextWriter& write);
+                             const TextWriter& write);
 
 /// What is said behind it: how many files, what they free, and why others stay where they are.
-[[nodiscard]] std::string summaryOf(const Removal& removal, RemovalForm form,
-                                    const Varnel::Platform::ByteCountFormatter& byteCounts);
+[[nodiscard]] std::string summaryOf(const Removal& removal, RemovalForm form);
 
 /// The removal for programs: one JSON object on one line.
 [[nodiscard]] bool writeJSON(const Removal& removal, const Selection& selection,

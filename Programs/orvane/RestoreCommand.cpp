@@ -2,21 +2,16 @@
 #include <orvane/RestoreCommand.h>
 
 #include <atomic>
-#include <map>
 #include <string>
 
 #include <Removal/Restoration.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
 #include <Varnel/DiskWatch/DiskAccessWatcher.h>
-#include <Varnel/Paths/QNURLResolver.h>
 #include <Varnel/Platform/Ports/Ports.h>
-#include <Varnel/Platform/Ports/UserLocale.h>
-#include <Varnel/Platform/Text/ByteCountFormatter.h>
 #include <Varnel/Platform/Text/DateFormatter.h>
-#include <Varnel/Platform/Text/VisibleText.h>
 #include <orvane/Console.h>
 #include <orvane/Interruption.h>
-#include <orvane/ResultText.h>
+#include <orvane/ShownText.h>
 #include <orvane/TrashCommand.h>
 
 namespace Orvane {
@@ -25,14 +20,10 @@ namespace {
 using Outcome = RestorationStep::Outcome;
 
 std::string textOf(const RemovalRecord& record) {
-  const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
-  static const Varnel::Platform::DateFormatter dates("yyyy-MM-dd HH:mm", "en_US", ports.timeZones);
-  static const Varnel::Platform::ByteCountFormatter byteCounts(
-      ports.userLocale.get().numberIdentifier());
+  static const Varnel::Platform::DateFormatter dates("yyyy-MM-dd HH:mm", "en_US",
+                                                     Varnel::Platform::processPorts().timeZones);
   std::string text = std::to_string(record.number) + "  " + dates.string(record.began) + "  " +
-                     counted(record.files, "file", "files") + ", " +
-                     byteCounts.string(static_cast<std::int64_t>(record.bytes),
-                                       Varnel::Platform::ByteCountStyle::file);
+                     counted(record.files, "file", "files") + ", " + shownSize(record.bytes);
   if (record.restored > 0) text += ", " + std::to_string(record.restored) + " back in place";
   if (record.lost > 0) text += ", " + std::to_string(record.lost) + " no more in the trash";
   return text + "\n";
@@ -100,7 +91,6 @@ int RestoreCommand::run(Console& console) const {
 
   std::atomic<bool> shouldStop = false;
   const Interruption interruption(shouldStop);
-  const auto& paths = Varnel::QNURLResolver::shared();
   std::uint64_t restored = 0, left = 0, unnoted = 0;
   bool isWritten = true;
   while (!shouldStop) {
@@ -109,7 +99,7 @@ int RestoreCommand::run(Console& console) const {
     const std::string why = whyNot(step->outcome);
     ++(why.empty() ? restored : left);
     unnoted += step->isUnnoted;
-    std::string line = Varnel::Platform::visibleText(paths.abbreviatedPath(step->entry.file.path));
+    std::string line = shownPath(step->entry.file.path);
     if (!why.empty()) line += " " + why;
     if (!why.empty() && step->code) line += " (" + step->code.message() + ")";
     isWritten = console.writeResult(line + "\n") && isWritten;
@@ -117,9 +107,9 @@ int RestoreCommand::run(Console& console) const {
   if (unnoted > 0)
     console.complain("the journal could not be written, and still names " +
                      counted(unnoted, "file that is back", "files that are back"));
-  isWritten = console.writeResult(counted(restored, "file is", "files are") + " back in place" +
-                                  (left > 0 ? ", " + std::to_string(left) + " not" : "") + "\n") &&
-              isWritten;
+  const std::string summary = counted(restored, "file is", "files are") + " back in place" +
+                              (left > 0 ? ", " + std::to_string(left) + " not" : "") + "\n";
+  isWritten = console.writeResult(summary) && isWritten;
   if (interruption.signal() != 0) return 128 + interruption.signal();
   if (!isWritten) return 1;
   return left > 0 ? someNotMoved : 0;

@@ -2,13 +2,13 @@
 #include <orvane/ResultText.h>
 
 #include <algorithm>
-#include <sstream>
 #include <vector>
 
 #include <Scan/ScanResult.h>
 #include <Varnel/Paths/QNURLResolver.h>
 #include <Varnel/Platform/Text/ByteCountFormatter.h>
 #include <Varnel/Platform/Text/VisibleText.h>
+#include <orvane/ShownText.h>
 
 namespace Orvane {
 namespace {
@@ -120,19 +120,9 @@ class Text final {
     return bytes == 0 ? "nothing wasted" : size(bytes) + " wasted";
   }
 
-  /// The words, in lines of the form's columns.
+  /// In lines of the form's columns.
   [[nodiscard]] std::string prominent(const std::string& words) const {
-    std::string text;
-    std::size_t column = 0;
-    std::istringstream stream(words);
-    for (std::string word; stream >> word; column += word.size()) {
-      if (column > 0) {
-        const bool hasRoom = form_.columns == 0 || column + 1 + word.size() <= form_.columns;
-        text += hasRoom ? ' ' : '\n';
-        column = hasRoom ? column + 1 : 0;
-      }
-      text += word;
-    }
+    const std::string text = wrapped(words, form_.columns);
     return form_.isBold ? "\x1b[1m" + text + "\x1b[0m\n" : text + "\n";
   }
 
@@ -144,10 +134,6 @@ class Text final {
 };
 
 }  // namespace
-
-std::string counted(std::uint64_t count, const char* singular, const char* plural) {
-  return std::to_string(count) + " " + (count == 1 ? singular : plural);
-}
 
 bool writeText(const ScanResult& result, const TextForm& form, const ByteCountFormatter& byteCounts,
                const Varnel::QNURLResolver& paths, const TextWriter& write) {

@@ -21,9 +21,6 @@ namespace Orvane {
 
 struct ScanResult;
 
-/// "1 file", "2 files".
-[[nodiscard]] std::string counted(std::uint64_t count, const char* singular, const char* plural);
-
 /// How a result looks.
 struct TextForm {
   static constexpr std::size_t allGroups = std::numeric_limits<std::size_t>::max();

@@ -88,7 +88,10 @@ ScanAnalytics::ScanAnalytics(const std::optional<std::string>& endpoint, bool pr
                                                              : "the user has not been asked") +
                      " (orvane analytics consent yes)");
   // The command that kept the refusal may have been killed before it came to that.
-  if (endpoint && consent == Consent::refused) discardEvents(std::chrono::milliseconds(0));
+  if (endpoint && consent == Consent::refused) {
+    discardEvents(std::chrono::milliseconds(0));
+    static_cast<void>(forgetClientIdentifier(console));
+  }
   if (!sends && !printsEvents) return;
   identifyClient(consent);
   if (sends) transport_ = transportTo(*URL::parse(*endpoint));

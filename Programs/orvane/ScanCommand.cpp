@@ -6,13 +6,8 @@
 #include <cstdint>
 #include <limits>
 #include <optional>
-#include <thread>
 
-#include <Scan/DuplicateFinder.h>
-#include <Scan/FileSystem.h>
 #include <Scan/ScanObserver.h>
-#include <Varnel/Context/Globals.h>
-#include <Varnel/DiskWatch/DiskAccessWatcher.h>
 #include <Varnel/Logging/Logger.h>
 #include <Varnel/Logging/LoggingObject.h>
 #include <Varnel/Paths/QNURLResolver.h>
@@ -22,7 +17,6 @@
 #include <Varnel/Platform/Text/ByteCountFormatter.h>
 #include <orvane/Console.h>
 #include <orvane/Interruption.h>
-#include <orvane/ManagedDiskTurns.h>
 #include <orvane/ProgressLine.h>
 #include <orvane/ReminderPlanner.h>
 #include <orvane/Reminders.h>
@@ -30,13 +24,14 @@
 #include <orvane/ScanAnalytics.h>
 #include <orvane/ScanLog.h>
 #include <orvane/ScanReport.h>
+#include <orvane/Search.h>
+#include <orvane/ShownText.h>
 #include <orvane/SoundCommand.h>
 #include <orvane/StandardStreams.h>
 
 namespace Orvane {
 namespace {
 
-using Varnel::Globals;
 using Varnel::Platform::URL;
 
 // A period from now on the user is reminded of what this scan has found. Who chose none is not.
@@ -60,11 +55,6 @@ std::chrono::sys_seconds startOfScan(const Varnel::Platform::Clock& clock) {
   return std::chrono::floor<std::chrono::seconds>(clock.now());
 }
 
-unsigned maxReaders() {
-  const unsigned cores = std::thread::hardware_concurrency();
-  return std::max(2u, Globals::canUseAllCores() ? cores : cores / 2);
-}
-
 }  // namespace
 
 int ScanCommand::run(Console& console) const {
@@ -77,23 +67,13 @@ int ScanCommand::run(Console& console) const {
   for (const auto* paths : {&asked->folders, &asked->references})
     for (const std::string& path : *paths) log.log("Will scan", URL::fileURLWithPath(path + "/"));
 
-  const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
-  const Varnel::DiskAccessWatcher watcher("orvane");
-  ManagedDiskTurns turns({.queue = ManagedDiskTurns::sharedQueue(), .volumes = ports.volumeCatalog},
-                         qos, maxReaders());
-  using QoS = Varnel::Platform::QualityOfService;
-  const CacheUse cacheUse =
-      qos == QoS::background || qos == QoS::utility ? CacheUse::traceless : CacheUse::normal;
-  DuplicateFinder finder(
-      {.fileSystem = systemFileSystem(cacheUse), .turns = turns, .observer = log});
-  ScanFacts facts{.startedAt = startOfScan(ports.clock), .folders = asked->folders};
+  ScanFacts facts{.startedAt = startOfScan(Varnel::Platform::processPorts().clock),
+                  .folders = asked->folders};
   facts.folders.insert(facts.folders.end(), asked->references.begin(), asked->references.end());
   ScanControl control;
   const Interruption interruption(control.isCancelled);
-  std::optional<ProgressLine> progress;
-  if (showsProgress && isStandardErrorATerminal()) progress.emplace(console, control);
-  const ScanResult result = finder.find(*asked, control);
-  progress.reset();
+  const ScanResult result =
+      search(*asked, {.qos = qos, .showsProgress = showsProgress}, log, console, control);
   if (!result.lostFolders.empty()) {
     for (const LostPath& lost : result.lostFolders)
       complainThatItCannotScan(lost.path, reasonOf(lost.loss), console);

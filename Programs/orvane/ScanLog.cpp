@@ -4,7 +4,7 @@
 #include <Varnel/Logging/Logger.h>
 #include <Varnel/Platform/Values/URL.h>
 #include <orvane/Console.h>
-#include <orvane/ResultText.h>
+#include <orvane/ShownText.h>
 
 namespace Orvane {
 

@@ -2,41 +2,32 @@
 #include <orvane/ShareCommand.h>
 
 #include <chrono>
-#include <cstdint>
 
 #include <Removal/Sharing.h>
 #include <Scan/ScanObserver.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
 #include <Varnel/DiskWatch/DiskAccessWatcher.h>
-#include <Varnel/Paths/QNURLResolver.h>
-#include <Varnel/Platform/Ports/Ports.h>
-#include <Varnel/Platform/Ports/UserLocale.h>
-#include <Varnel/Platform/Text/ByteCountFormatter.h>
 #include <orvane/Console.h>
 #include <orvane/Interruption.h>
 #include <orvane/ReportSource.h>
-#include <orvane/ResultText.h>
 #include <orvane/SharingText.h>
+#include <orvane/ShownText.h>
 #include <orvane/StandardStreams.h>
 #include <orvane/TrashCommand.h>
 
 namespace Orvane {
 namespace {
 
-using Varnel::Platform::ByteCountFormatter;
-
 /// Makes all steps, with a line of progress on a terminal.
 class Progress final {
  public:
-  Progress(Console& console, const ByteCountFormatter& byteCounts)
-      : console_(console), byteCounts_(byteCounts), isShown_(isStandardErrorATerminal()) {}
+  explicit Progress(Console& console) : console_(console), isShown_(isStandardErrorATerminal()) {}
 
   void show(const Sharing& sharing) {
     if (!isShown_ || Clock::now() < next_) return;
-    const auto bytes = static_cast<std::int64_t>(sharing.comparedBytes());
     console_.showStatus("Sharing: " + std::to_string(sharing.countMade()) + " of " +
                         counted(sharing.steps().size(), "file", "files") + ", " +
-                        byteCounts_.string(bytes, Varnel::Platform::ByteCountStyle::file));
+                        shownSize(sharing.comparedBytes()));
     next_ = Clock::now() + std::chrono::milliseconds(100);
   }
 
@@ -44,7 +35,6 @@ class Progress final {
   using Clock = std::chrono::steady_clock;
 
   Console& console_;
-  const ByteCountFormatter& byteCounts_;
   const bool isShown_;
   Clock::time_point next_ = Clock::now();
 };
@@ -52,14 +42,14 @@ class Progress final {
 }  // namespace
 
 int ShareCommand::run(Console& console) const {
+  auto source = findSource(operands, console);
+  if (!source) return 1;
   ScanControl control;
   const Interruption interruption(control.isCancelled);
-  const auto report = reportFrom(operands, console, control);
+  const auto report = reportFrom(*std::move(source), console, control);
   if (!report) return interruption.signal() != 0 ? 128 + interruption.signal() : 1;
 
-  const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
-  const ByteCountFormatter byteCounts(ports.userLocale.get().numberIdentifier());
-  Progress progress(console, byteCounts);
+  Progress progress(console);
   const Varnel::DiskAccessWatcher watcher("orvane");
   Sharing sharing({.fileSystem = systemFileSystem(), .disks = Varnel::DiskAccessManager::shared()},
                   *report, isTrial ? Sharing::Mode::trial : Sharing::Mode::real,
@@ -70,10 +60,9 @@ int ShareCommand::run(Console& console) const {
   const SharingForm form{.columns = isStandardOutputATerminal() ? standardOutputColumns() : 0,
                          .isTrial = isTrial};
   const auto write = [&](std::string_view text) { return console.writeResult(text); };
-  const bool isWritten = isJSON
-                             ? writeJSON(sharing, write)
-                             : writeText(sharing, form, Varnel::QNURLResolver::shared(), write) &&
-                                   write(summaryOf(sharing, form, byteCounts));
+  const bool isWritten = isJSON ? writeJSON(sharing, write)
+                                : writeText(sharing, form, write) &&
+                                      write(wrapped(summaryOf(sharing, form), form.columns));
   if (interruption.signal() != 0) return 128 + interruption.signal();
   if (!isWritten) return 1;
   const SharingTotals totals = sharing.totals();

@@ -7,11 +7,8 @@
 #include <string_view>
 
 #include <Removal/Sharing.h>
-#include <Varnel/Paths/QNURLResolver.h>
-#include <Varnel/Platform/Text/ByteCountFormatter.h>
-#include <Varnel/Platform/Text/VisibleText.h>
 #include <orvane/JSONLine.h>
-#include <orvane/ResultText.h>
+#include <orvane/ShownText.h>
 #include <orvane/TextColumns.h>
 
 namespace Orvane {
@@ -90,23 +87,18 @@ nlohmann::ordered_json jsonOf(const Sharing& sharing, const SharingStep& step) {
 
 }  // namespace
 
-bool writeText(const Sharing& sharing, SharingForm form, const Varnel::QNURLResolver& paths,
-               const TextWriter& write) {
+bool writeText(const Sharing& sharing, SharingForm form, const TextWriter& write) {
   TextParts parts(write);
   for (const SharingStep& step : sharing.steps()) {
-    const std::string path =
-        Varnel::Platform::visibleText(paths.abbreviatedPath(sharing.pathOf(step)));
-    if (!parts.add(lineOf(step, path, form.columns))) return false;
+    if (!parts.add(lineOf(step, shownPath(sharing.pathOf(step)), form.columns))) return false;
     if (isLastOfGroup(sharing, step) && !parts.add("\n")) return false;
   }
   return parts.flush();
 }
 
-std::string summaryOf(const Sharing& sharing, SharingForm form,
-                      const Varnel::Platform::ByteCountFormatter& byteCounts) {
+std::string summaryOf(const Sharing& sharing, SharingForm form) {
   const SharingTotals totals = sharing.totals();
-  const std::string size = byteCounts.string(static_cast<std::int64_t>(totals.freedBytes),
-                                             Varnel::Platform::ByteCountStyle::file);
+  const std::string size = shownSize(totals.freedBytes);
   std::string text = form.isTrial ? counted(totals.planned, "file", "files") + " would be shared"
                                   : counted(totals.shared, "file is", "files are") + " shared now";
   if (totals.freedBytes > 0) text += ": " + size + (form.isTrial ? " would be free" : " are free");

@@ -6,14 +6,6 @@
 
 #include <orvane/TextParts.h>
 
-namespace Varnel {
-class QNURLResolver;
-}
-
-namespace Varnel::Platform {
-class ByteCountFormatter;
-}
-
 namespace Orvane {
 
 class Sharing;
@@ -26,12 +18,10 @@ struct SharingForm {
 
 /// The sharing for people: each file on a line, and an empty line behind each group. Returns
 /// whether all could be written.
-[[nodiscard]] bool writeText(const Sharing& sharing, SharingForm form,
-                             const Varnel::QNURLResolver& paths, const TextWriter& write);
+[[nodiscard]] bool writeText(const Sharing& sharing, SharingForm form, const TextWriter& write);
 
 /// What is said behind it: how many files, what that freed, and why others stay as they are.
-[[nodiscard]] std::string summaryOf(const Sharing& sharing, SharingForm form,
-                                    const Varnel::Platform::ByteCountFormatter& byteCounts);
+[[nodiscard]] std::string summaryOf(const Sharing& sharing, SharingForm form);
 
 /// The sharing for programs: one JSON object on one line.
 [[nodiscard]] bool writeJSON(const Sharing& sharing, const TextWriter& write);

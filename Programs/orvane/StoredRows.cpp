@@ -10,6 +10,7 @@
 
 #include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 #include <Varnel/Platform/SQLite/SQLiteFailure.h>
+#include <orvane/JSONLine.h>
 
 namespace Orvane {
 namespace {
@@ -73,9 +74,11 @@ Failure readTable(SQLiteDatabase& database, const std::string& table, ordered_js
     int index = 0;
     for (const Column& column : columns) {
       ordered_json& value = object[column.name];
-      if (const auto text = row.text(index); text && column.type != "INTEGER") value = *text;
-      if (const auto number = row.integer(index); number && column.type == "INTEGER")
-        value = *number;
+      if (column.type == "INTEGER") {
+        if (const auto number = row.integer(index)) value = *number;
+      } else if (const auto text = row.text(index)) {
+        addText(object, column.name, std::string(*text));
+      }
       ++index;
     }
     rows.push_back(std::move(object));

@@ -10,15 +10,12 @@
 #include <Scan/ScanObserver.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
 #include <Varnel/DiskWatch/DiskAccessWatcher.h>
-#include <Varnel/Paths/QNURLResolver.h>
 #include <Varnel/Platform/Ports/Ports.h>
-#include <Varnel/Platform/Ports/UserLocale.h>
-#include <Varnel/Platform/Text/ByteCountFormatter.h>
 #include <orvane/Console.h>
 #include <orvane/Interruption.h>
 #include <orvane/RemovalText.h>
 #include <orvane/ReportSource.h>
-#include <orvane/ResultText.h>
+#include <orvane/ShownText.h>
 #include <orvane/StandardStreams.h>
 
 namespace Orvane {
@@ -66,9 +63,11 @@ void move(Removal& removal, Console& console) {
 }  // namespace
 
 int TrashCommand::run(Console& console) const {
+  auto source = findSource(operands, console);
+  if (!source) return 1;
   ScanControl control;
   const Interruption interruption(control.isCancelled);
-  const auto report = reportFrom(operands, console, control);
+  const auto report = reportFrom(*std::move(source), console, control);
   if (!report) return interruption.signal() != 0 ? 128 + interruption.signal() : 1;
   const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
   const Selection selection = select(
@@ -97,18 +96,16 @@ int TrashCommand::run(Console& console) const {
 
   const RemovalForm form{.columns = isStandardOutputATerminal() ? standardOutputColumns() : 0,
                          .isMade = moves};
-  const Varnel::Platform::ByteCountFormatter byteCounts(ports.userLocale.get().numberIdentifier());
   const auto write = [&](std::string_view text) { return console.writeResult(text); };
   bool isWritten =
-      isJSON ? writeJSON(removal, selection, write)
-             : writeText(removal, selection, form, Varnel::QNURLResolver::shared(), write);
+      isJSON ? writeJSON(removal, selection, write) : writeText(removal, selection, form, write);
   const RemovalTotals totals = removal.totals();
   if (isWritten && !isJSON) {
-    std::string summary = summaryOf(removal, form, byteCounts);
+    std::string summary = summaryOf(removal, form);
     if (!moves && totals.planned > 0) summary += "nothing was moved yet: --yes does it\n";
     if (totals.moved > 0)
       summary += "\"orvane restore " + std::to_string(removal.number()) + "\" gives them back\n";
-    isWritten = console.writeResult(summary);
+    isWritten = console.writeResult(wrapped(summary, form.columns));
   }
   if (interruption.signal() != 0) return 128 + interruption.signal();
   if (!isWritten) return 1;

@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <Varnel/Platform/Ports/MainQueue.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Testing/FakePorts.h>
 
@@ -24,6 +25,11 @@ TEST(Ports, CannotBeAssignedThemselves) {
       fakes.ports();
   EXPECT_FALSE(areAssignable(a, b, c, d, e, f, g, h, i, j, k, l, m, n, o, p, q, r, s, t, u, v, w, x,
                              y, z, aa));
+}
+
+// A program of the command line may never run it, and would be told so after a while.
+TEST(Ports, PostNothingOnTheirOwn) {
+  EXPECT_FALSE(systemPorts().mainQueue.get().drain());
 }
 
 TEST(FakePorts, TakeTheirFilesAwayWithThem) {

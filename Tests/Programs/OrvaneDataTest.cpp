@@ -39,6 +39,7 @@ class OrvaneData : public Orvane {
   void keepAll() {
     folder.write("a", "same");
     folder.write("b", "same");
+    folder.write("c\xff", "same");
     run({"analytics", "consent", "yes"});
     run(scan);
     run({"remind", "every", "weekly"});
@@ -83,6 +84,11 @@ TEST_F(OrvaneData, HasARandomIdentifierOnlyWithConsent) {
   EXPECT_THAT(exported()["events"].dump(), AllOf(HasSubstr(second), Not(HasSubstr(first))));
   run({"analytics", "consent", "no"});
   EXPECT_EQ(identifier(), nullptr);
+  // One that was drawn with the consent, and kept once that was taken back by another process.
+  std::ofstream(settings, std::ios::app) << "analyticsClientIdentifier=late\n";
+  EXPECT_EQ(identifier(), "late");
+  run(scan);
+  EXPECT_EQ(identifier(), nullptr);
 }
 
 TEST_F(OrvaneData, ShowsAndErasesAllThatItKeeps) {
@@ -96,7 +102,11 @@ TEST_F(OrvaneData, ShowsAndErasesAllThatItKeeps) {
   EXPECT_EQ(told, allFiles());
   const nlohmann::json all = exported();
   EXPECT_THAT(all["settings"].dump(), HasSubstr("analyticsConsent=true"));
-  EXPECT_EQ(all["removals"][0]["tables"]["files"][0]["path"], folder.path("b"));
+  const auto& moved = all["removals"][0]["tables"]["files"];
+  EXPECT_EQ(moved[0]["path"], folder.path("b"));
+  EXPECT_EQ(moved[0].count("pathBytes"), 0u);
+  EXPECT_EQ(moved[1]["path"], folder.path("c\uFFFD"));
+  EXPECT_THAT(moved[1]["pathBytes"], ::testing::EndsWith("2f63ff"));
   EXPECT_EQ(all["reminders"][0]["tables"]["deliveries"][0]["state"], "planned");
   EXPECT_THAT(all["logs"][0]["text"], HasSubstr("Will scan"));
 
@@ -182,6 +192,10 @@ TEST_F(OrvaneData, TouchesNothingOfAnotherUser) {
     ASSERT_EQ(::chown(fs::path(each).parent_path().c_str(), 1234, static_cast<gid_t>(-1)), 0);
   EXPECT_EQ(run({"data", "erase", "--yes"}).status, 3);
   EXPECT_EQ(allFiles(), files);
+  for (const std::string& each : files) fs::remove(each);
+  EXPECT_THAT(run({"data", "erase", "--yes"}).output, HasSubstr("it belongs to somebody else"));
+  for (const std::string& each : {settings, state, logs})
+    EXPECT_TRUE(fs::exists(fs::path(each).parent_path())) << each;
 }
 
 TEST_F(OrvaneData, RemovesLogsThirtyDaysAfterTheirLastEntry) {

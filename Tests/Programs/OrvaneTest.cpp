@@ -6,9 +6,11 @@
 
 #include <csignal>
 #include <filesystem>
+#include <fstream>
 #include <nlohmann/json.hpp>
 #include <optional>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include <Tests/Programs/OrvaneFixture.h>
@@ -81,6 +83,24 @@ class LeasedFile final {
   sigset_t opening_{}, before_{};
 };
 
+/// Whether the thread that takes the process's signals has taken all, and waits again.
+bool hasTakenSignals(pid_t process) {
+  const auto line = [](const std::string& file, const char* name) {
+    std::ifstream lines(file);
+    for (std::string text; std::getline(lines, text);)
+      if (text.starts_with(name)) return text.substr(text.find('\t') + 1);
+    return std::string();
+  };
+  const std::string tasks = "/proc/" + std::to_string(process) + "/task/";
+  for (const auto& task : std::filesystem::directory_iterator(tasks)) {
+    const std::string status = task.path() / "status";
+    if (line(status, "Name:") == "signals")
+      return line(status, "ShdPnd:") == std::string(16, '0') &&
+             line(status, "State:").starts_with('S');
+  }
+  return false;
+}
+
 TEST_F(Orvane, KeepsWhatItHasWhenItIsInterrupted) {
   for (const char* name : {"a", "b"}) folder.write(name, "same");
   for (const char* option : {"--json", "--print0", "--no-progress"}) {
@@ -91,6 +111,7 @@ TEST_F(Orvane, KeepsWhatItHasWhenItIsInterrupted) {
                                          ORVANE_PROGRAM, "scan", option, folder.path()});
     held->waitUntilItIsOpened();
     program.signal(SIGTERM);
+    while (!hasTakenSignals(program.identifier())) std::this_thread::yield();
     held.reset();
     const std::string output = program.readAll();
     EXPECT_EQ(program.wait(), 128 + SIGTERM);
@@ -293,6 +314,10 @@ TEST_F(Orvane, ShowsProgressAndEmphasisOnTerminalsAlone) {
   EXPECT_THAT(onTerminal("scan --progress --no-progress " + folder.path()), Not(HasSubstr("\x1b")));
   EXPECT_THAT(onTerminal(scan + " 2>errors"), Not(HasSubstr("\x1b")));
   EXPECT_THAT(run({"scan", "-p", folder.path()}).errors, IsEmpty());
+  folder.write("b", "same");
+  EXPECT_THAT(onTerminal("trash --keep oldest " + folder.path()),
+              HasSubstr("\n1 file would go to the trash:\r\n4 bytes would be free once it\r\nis "
+                        "emptied\r\nnothing was moved yet: --yes\r\ndoes it\r\n"));
 }
 
 TEST_F(Orvane, ShowsPathsAndTheMenu) {

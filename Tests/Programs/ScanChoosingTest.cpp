@@ -254,5 +254,17 @@ TEST_F(ScanChoice, ReadsWhatIsMountedAtItsOwnDiskAndNoPseudoFileSystems) {
   }
 }
 
+// By the scan itself, where file systems are mounted on demand.
+TEST_F(ScanChoice, KnowsWhatIsMountedOnlyMeanwhile) {
+  using enum ScanMount::Kind;
+  writeAll({"here/1", "home/2", "kernel/3"});
+  turns.mounted = {{"/", local}};
+  turns.mountedMeanwhile = {{folder.path("home"), network}, {folder.path("kernel"), pseudo}};
+  fileSystem.identities = {{folder.path("home"), {92, 1}}, {folder.path("kernel"), {93, 1}}};
+  EXPECT_THAT(paths(scan()),
+              ElementsAre(ElementsAre(folder.path("here/1"), folder.path("home/2"))));
+  EXPECT_THAT(losses.networks, ElementsAre(folder.path("home")));
+}
+
 }  // namespace
 }  // namespace Orvane::Testing

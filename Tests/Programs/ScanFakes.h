@@ -24,7 +24,12 @@ class FakeTurns final : public DiskTurns {
  public:
   ~FakeTurns() override { join(); }
 
-  std::vector<ScanMount> mounts() override { return mounted; }
+  std::vector<ScanMount> mounts() override {
+    std::vector<ScanMount> all = mounted;
+    if (isAsked_.exchange(true))
+      all.insert(all.end(), mountedMeanwhile.begin(), mountedMeanwhile.end());
+    return all;
+  }
   const ScanDisk& diskOf(const std::string& path) override {
     const auto other = mountedDisks.find(path);
     return other == mountedDisks.end() ? disk : other->second;
@@ -70,6 +75,7 @@ class FakeTurns final : public DiskTurns {
 
   ScanDisk disk{.places = 4, .isOrdered = false};
   std::vector<ScanMount> mounted;
+  std::vector<ScanMount> mountedMeanwhile;       ///< After the first look.
   std::map<std::string, ScanDisk> mountedDisks;  ///< Of some of them.
   unsigned stepsPerTurn = 1000;
   bool refuses = false;
@@ -102,6 +108,7 @@ class FakeTurns final : public DiskTurns {
   }
 
   std::mutex mutex_;
+  std::atomic<bool> isAsked_{false};
   std::condition_variable left_;
   std::vector<std::thread> threads_;
   unsigned taken_ = 0;

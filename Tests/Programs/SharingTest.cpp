@@ -21,6 +21,10 @@ using Answer = FaultyFileSystem::ShareResult;
 
 constexpr std::uint64_t part = 16 << 20;
 
+// Before any test of this process: the catalogue goes on in the namespace in which it was first
+// asked.
+const std::string obstacleToMounts = Varnel::Tests::enterMountNamespace();
+
 class SharedFiles : public RemovalFixture {
  protected:
   /// Makes every step, and returns what came of each.
@@ -48,8 +52,7 @@ auto timesOf(const std::string& path) {
 
 // What the file systems themselves do, in a mount of each.
 TEST_F(SharedFiles, LieInOnePlace) {
-  static const std::string reason = Varnel::Tests::enterMountNamespace();
-  if (!reason.empty()) GTEST_SKIP() << reason;
+  if (!obstacleToMounts.empty()) GTEST_SKIP() << obstacleToMounts;
   unsigned tried = 0;
   const Varnel::Tests::TemporaryFolder images;
   const std::string mounted = path("mounted");

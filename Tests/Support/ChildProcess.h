@@ -64,6 +64,7 @@ class ChildProcess final {
   }
 
   void signal(int number) const { ::kill(process_, number); }
+  [[nodiscard]] ::pid_t identifier() const { return process_; }
 
   /// Ends the process as a crash would, if it runs.
   void kill() {

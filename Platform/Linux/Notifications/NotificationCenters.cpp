@@ -82,7 +82,10 @@ class StoredCenters final : public UserNotificationCenters {
  public:
   StoredCenters(const NotificationPorts& ports, HostedApplication& application)
       : ports_(ports), application_(application) {
-    application.setObserver([&queue = ports.mainQueue, life = std::weak_ptr(life_)](bool isActive) {
+    // What is known is not posted: a program that shows nothing need not run its main queue.
+    application.setObserver([&queue = ports.mainQueue, life = std::weak_ptr(life_),
+                             wasActive = isActive_](bool isActive) mutable {
+      if (std::exchange(wasActive, isActive) == isActive) return;
       queue.post([life, isActive] {
         if (const auto self = life.lock()) (*self)->setActive(isActive);
       });

@@ -1,0 +1,24 @@
+// SPDX-License-Identifier: MIT
+#pragma once
+
+#include <Scan/ScanRequest.h>
+#include <Scan/ScanResult.h>
+#include <Varnel/Platform/Values/QualityOfService.h>
+
+namespace Orvane {
+
+class Console;
+class ScanObserver;
+struct ScanControl;
+
+/// How a search is made.
+struct SearchManner {
+  Varnel::Platform::QualityOfService qos = Varnel::Platform::QualityOfService::utility;
+  bool showsProgress = true;  ///< While standard error is a terminal.
+};
+
+/// Finds the duplicates in the process's turns at the disks of this machine.
+[[nodiscard]] ScanResult search(const ScanRequest& request, SearchManner manner,
+                                ScanObserver& observer, Console& console, ScanControl& control);
+
+}  // namespace Orvane
