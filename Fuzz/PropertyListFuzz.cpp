@@ -1,16 +1,15 @@
 // SPDX-License-Identifier: MIT
-#include <Varnel/Platform/Text/PropertyListParser.h>
-
+// Property lists and strings tables. What is written again is read as the same.
 #include <algorithm>
-#include <cstddef>
-#include <cstdint>
-#include <cstdlib>
 
-namespace {
+#include <Fuzz/Fuzz.h>
+#include <Varnel/Platform/Text/PropertyListParser.h>
+#include <Varnel/Platform/Text/PropertyListWriter.h>
+#include <Varnel/Platform/Text/StringsTable.h>
 
 using namespace Varnel::Platform;
 
-std::size_t depthOf(const PropertyValue& value) {
+static std::size_t depthOf(const PropertyValue& value) {
   std::size_t deepest = 0;
   if (const auto* list = value.as<PropertyList>()) {
     for (const PropertyValue& element : *list) deepest = std::max(deepest, depthOf(element));
@@ -23,10 +22,17 @@ std::size_t depthOf(const PropertyValue& value) {
   return 0;
 }
 
-}  // namespace
-
-extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
-  const auto value = parsePropertyList({reinterpret_cast<const char*>(data), size});
-  if (value && depthOf(*value) > 512) std::abort();
-  return 0;
+static void fuzz(std::string_view input) {
+  const auto value = parsePropertyList(input);
+  const auto* dictionary = value ? value->as<PropertyDictionary>() : nullptr;
+  const auto table = parseStringsTable(input);
+  require(table.has_value() == (dictionary != nullptr));
+  if (table)
+    for (const auto& [key, text] : *table) require(*findAs<std::string>(*dictionary, key) == text);
+  if (!value) return;
+  require(depthOf(*value) <= 512);
+  if (const auto written = writePropertyList(*value)) {
+    const auto again = parsePropertyList(*written);
+    require(again && writePropertyList(*again) == written);
+  }
 }

@@ -1,21 +1,12 @@
 // SPDX-License-Identifier: MIT
 // What parses reads back as itself, whatever the base; queries survive decoding and encoding.
-#include <cstdint>
-#include <cstdlib>
-#include <string_view>
-
+#include <Fuzz/Fuzz.h>
 #include <Varnel/Platform/Values/URL.h>
 #include <Varnel/Platform/Values/URLQuery.h>
 
 using namespace Varnel::Platform;
 
-namespace {
-
-void require(bool holds) {
-  if (!holds) std::abort();
-}
-
-void checkStable(const URL& url) {
+static void checkStable(const URL& url) {
   const auto again = URL::parse(url.absoluteString());
   require(again && *again == url);
   require(url.components().text() == url.absoluteString());
@@ -24,13 +15,8 @@ void checkStable(const URL& url) {
   static_cast<void>(url.pathExtension());
 }
 
-}  // namespace
-
-extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
-  const std::string_view text(reinterpret_cast<const char*>(data), size);
-  const std::string_view front = text.substr(0, text.find('\n'));
-  const std::string_view back = front.size() < size ? text.substr(front.size() + 1) : "";
-
+static void fuzz(std::string_view input) {
+  const auto [front, back] = cutAt('\n', input);
   const auto base = URL::parse(front);
   if (base) checkStable(*base);
   if (base && base->components().scheme)
@@ -40,8 +26,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     require(URL::parse(url->absoluteString())->components().host == url->components().host);
   }
 
-  const auto items = decodedURLQuery(text);
+  const auto items = decodedURLQuery(input);
   if (items != std::vector<URLQueryItem>{{"", std::nullopt}})
     require(decodedURLQuery(encodedURLQuery(items)) == items);
-  return 0;
 }

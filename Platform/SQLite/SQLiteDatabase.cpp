@@ -52,6 +52,9 @@ void SQLiteDatabase::close(sqlite3* connection) {
 Result<SQLiteDatabase> SQLiteDatabase::opened(sqlite3* connection, int status) {
   Connection owned(connection);
   if (status != SQLITE_OK) return sqliteError(connection, status);
+  // Views and triggers are programs that whoever made the file has written, and may never end.
+  ::sqlite3_db_config(connection, SQLITE_DBCONFIG_ENABLE_VIEW, 0, nullptr);
+  ::sqlite3_db_config(connection, SQLITE_DBCONFIG_ENABLE_TRIGGER, 0, nullptr);
   return SQLiteDatabase(std::move(owned));
 }
 

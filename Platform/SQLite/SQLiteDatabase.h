@@ -29,7 +29,8 @@ class LockDeadline;
 ///     }, date);
 ///     error = database->row("SELECT count(*), min(born) FROM person", std::tie(count, oldest));
 ///
-/// Parameters are what `SQLiteStatement::bind` takes, results what its `read` gives.
+/// Parameters are what `SQLiteStatement::bind` takes, results what its `read` gives. A file's views
+/// cannot be used, and its triggers do nothing.
 ///
 /// One thread at a time. Statements must be gone before their database. An error has the domain
 /// "SQLite", the library's extended result code, and its message; `meaningOf` tells what to make of

@@ -151,8 +151,9 @@ Result<std::vector<RemovalRecord>> RemovalJournal::removals() {
   if (!file_.isThere()) return found;
   const auto error = file_.read([&](SQLiteDatabase& database) {
     found.clear();
+    // A sum of whole numbers fails where it does not fit; one odd row would hide all removals.
     return database.each(
-        "SELECT identifier, removals.number, began, count(*), sum(size), sum(state = ?), "
+        "SELECT identifier, removals.number, began, count(*), total(size), sum(state = ?), "
         "sum(state = ?) FROM removals JOIN files ON removal = identifier "
         "GROUP BY identifier ORDER BY removals.number DESC",
         [&](SQLiteStatement& row) { found.push_back(recordIn(row)); }, numberOf(State::restored),

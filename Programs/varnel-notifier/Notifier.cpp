@@ -260,9 +260,7 @@ bool Notifier::isIdle() const {
 
 // The one method is `Changed`.
 void Notifier::receive(GVariant* arguments, GDBusMethodInvocation* call) {
-  const char* store = nullptr;
-  g_variant_get_child(arguments, 0, "^&ay", &store);
-  Product* const concerned = product(store);
+  Product* const concerned = product(storeIn(arguments));
   if (concerned) concerned->deliverer().recheck();
   const bool stays = concerned && !concerned->isIdle();
   g_dbus_method_invocation_return_value(call, g_variant_new("(b)", static_cast<gboolean>(stays)));

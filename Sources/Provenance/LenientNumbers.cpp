@@ -27,9 +27,19 @@ std::string_view numberIn(std::string_view text) {
   return text;
 }
 
-// The parser reports numbers too close to zero as it reports numbers too large.
+// The parser reports numbers too close to zero as it reports numbers too large. Which it is tells
+// the place of the first digit that counts, as the exponent moves it.
 bool isTiny(std::string_view number) {
-  return number.find("e-") != number.npos || number.find("E-") != number.npos;
+  const std::size_t end = std::min(number.find_first_of("eE"), number.size());
+  const std::string_view mantissa = number.substr(0, end);
+  std::string_view digits = number.substr(std::min(end + 1, number.size()));
+  if (digits.starts_with('+')) digits.remove_prefix(1);
+  std::int32_t exponent = 0;
+  const auto status = std::from_chars(digits.data(), digits.data() + digits.size(), exponent).ec;
+  if (status == std::errc::result_out_of_range) return isNegative(digits);
+  const auto point = static_cast<std::int64_t>(std::min(mantissa.find('.'), mantissa.size()));
+  const auto first = static_cast<std::int64_t>(mantissa.find_first_of("123456789"));
+  return point - first + exponent < 0;
 }
 
 // A number that does not fit becomes the largest or the smallest.

@@ -179,6 +179,8 @@ TEST(QuarantineEntry, NumbersAreReadFromWhateverCanBeOne) {
       {"99999999999999999999", 1e20, largest},
       {"1e999 e-", std::numeric_limits<double>::max(), 1},
       {"1e-999", 0, 1},
+      {"." + std::string(400, '0') + "1", 0, 0},
+      {"1" + std::string(400, '0') + "e-5", std::numeric_limits<double>::max(), largest},
       {1e300, 1e300, largest},
       {std::numeric_limits<double>::infinity(), std::numeric_limits<double>::infinity(), largest},
       {PropertyDictionary(), 0, 0},

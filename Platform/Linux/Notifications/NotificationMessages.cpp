@@ -3,7 +3,6 @@
 
 #include <array>
 #include <charconv>
-#include <string_view>
 
 namespace Varnel::Platform::Linux {
 namespace {
@@ -116,6 +115,24 @@ std::optional<std::uint32_t> bannerNumberIn(GDBusMessage* reply) {
   guint32 number = 0;
   g_variant_get(body, "(u)", &number);
   return number;
+}
+
+std::optional<BannerSignal> bannerSignalIn(std::string_view name, GVariant* body) {
+  using enum BannerSignal::Kind;
+  BannerSignal signal{.kind = name == "ActionInvoked"     ? invoked
+                              : name == "ActivationToken" ? token
+                                                          : closed};
+  if (signal.kind == closed) {
+    if (name != "NotificationClosed" || !g_variant_is_of_type(body, G_VARIANT_TYPE("(uu)")))
+      return std::nullopt;
+    g_variant_get(body, "(uu)", &signal.number, &signal.reason);
+    return signal;
+  }
+  if (!g_variant_is_of_type(body, G_VARIANT_TYPE("(us)"))) return std::nullopt;
+  const char* text = nullptr;
+  g_variant_get(body, "(u&s)", &signal.number, &text);
+  signal.text = text;
+  return signal;
 }
 
 BusMessage closeRequest(const BannerAddress& banner) {

@@ -6,6 +6,7 @@
 #include <cstdint>
 #include <optional>
 #include <string>
+#include <string_view>
 
 #include <Varnel/Platform/Linux/Notifications/BusNotificationServer.h>
 #include <Varnel/Platform/Ports/NotificationServer.h>
@@ -55,6 +56,19 @@ struct BannerAddress final {
                                        const Banner& banner, ServerCapabilities capabilities,
                                        std::uint32_t replaced);
 [[nodiscard]] std::optional<std::uint32_t> bannerNumberIn(GDBusMessage* reply);
+
+/// What the server tells of a banner.
+struct BannerSignal final {
+  enum class Kind { invoked, token, closed };
+
+  Kind kind = Kind::closed;
+  std::uint32_t number = 0;
+  std::string text = {};     ///< The action, or the token with which a window comes to the front.
+  std::uint32_t reason = 0;  ///< Why it was closed.
+};
+
+/// Absent for a signal that tells nothing of a banner, or not as is specified.
+[[nodiscard]] std::optional<BannerSignal> bannerSignalIn(std::string_view name, GVariant* body);
 
 [[nodiscard]] BusMessage closeRequest(const BannerAddress& banner);
 

@@ -152,17 +152,16 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
   }
 
   void receive(const char* sender, std::string_view name, GVariant* body) {
-    guint32 number = 0;
-    const char* text = nullptr;
-    if (g_variant_is_of_type(body, G_VARIANT_TYPE("(us)"))) {
-      g_variant_get(body, "(u&s)", &number, &text);
-      if (name == "ActionInvoked") invoke({bus_->name(), sender, number}, text);
-      if (name == "ActivationToken") keepToken({bus_->name(), sender, number}, text);
-    }
-    if (name == "NotificationClosed" && g_variant_is_of_type(body, G_VARIANT_TYPE("(uu)"))) {
-      guint32 reason = 0;
-      g_variant_get(body, "(uu)", &number, &reason);
-      close({bus_->name(), sender, number}, reason);
+    const auto signal = bannerSignalIn(name, body);
+    if (!signal) return;
+    const BannerAddress address{bus_->name(), sender, signal->number};
+    switch (signal->kind) {
+      case BannerSignal::Kind::invoked:
+        return invoke(address, signal->text);
+      case BannerSignal::Kind::token:
+        return keepToken(address, signal->text);
+      case BannerSignal::Kind::closed:
+        return close(address, signal->reason);
     }
   }
 
@@ -177,7 +176,7 @@ class Desktop final : public std::enable_shared_from_this<Desktop> {
     return std::nullopt;
   }
 
-  void keepToken(const BannerAddress& address, const char* activationToken) {
+  void keepToken(const BannerAddress& address, const std::string& activationToken) {
     for (auto& [token, shown] : shown_)
       if (shown.address == address) shown.activationToken = activationToken;
   }

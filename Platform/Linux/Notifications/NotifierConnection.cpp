@@ -11,8 +11,6 @@
 namespace Varnel::Platform::Linux {
 namespace {
 
-using Variant = UniqueHandle<GVariant*, g_variant_unref>;
-
 BusMessage changedMessage(const std::string& store) {
   BusMessage message(
       g_dbus_message_new_method_call(notifierName, notifierPath, notifierName, "Changed"));
@@ -102,16 +100,11 @@ class NotifierConnection::Conversation final : public std::enable_shared_from_th
   static constexpr int maxStarts = 3;
 
   static GVariant* receive(NotificationHost& host, std::string_view method, GVariant* arguments) {
-    const Variant dictionary(g_variant_get_child_value(arguments, 0));
-    const UserNotification notification = notificationIn(dictionary.get());
+    const NotificationActivation call = activationIn(arguments);
     if (method == "ShouldPresent")
-      return g_variant_new("(b)", static_cast<gboolean>(host.shouldPresent(notification)));
-    if (method == "DidDeliver") host.didDeliver(notification);
-    if (method == "DidActivate") {
-      gboolean isActionButton = FALSE;
-      g_variant_get_child(arguments, 1, "b", &isActionButton);
-      host.didActivate({notification, isActionButton != FALSE});
-    }
+      return g_variant_new("(b)", static_cast<gboolean>(host.shouldPresent(call.notification)));
+    if (method == "DidDeliver") host.didDeliver(call.notification);
+    if (method == "DidActivate") host.didActivate(call);
     return nullptr;
   }
 

@@ -86,4 +86,17 @@ UserNotification notificationIn(GVariant* dictionary) {
   return notification;
 }
 
+NotificationActivation activationIn(GVariant* arguments) {
+  const Variant dictionary(g_variant_get_child_value(arguments, 0));
+  gboolean isActionButton = FALSE;
+  if (g_variant_n_children(arguments) > 1) g_variant_get_child(arguments, 1, "b", &isActionButton);
+  return {notificationIn(dictionary.get()), isActionButton != FALSE};
+}
+
+std::string storeIn(GVariant* arguments) {
+  const char* store = nullptr;
+  g_variant_get_child(arguments, 0, "^&ay", &store);
+  return store;
+}
+
 }  // namespace Varnel::Platform::Linux

@@ -47,4 +47,9 @@ inline constexpr const char* hostInterface = R"(<node>
 /// What has not the right type is left out.
 [[nodiscard]] UserNotification notificationIn(GVariant* dictionary);
 
+/// The arguments of a call to a host. Without a second one it is no click on the action button.
+[[nodiscard]] NotificationActivation activationIn(GVariant* arguments);
+/// The argument of `Changed`.
+[[nodiscard]] std::string storeIn(GVariant* arguments);
+
 }  // namespace Varnel::Platform::Linux

@@ -1,0 +1,1 @@
+DROP TABLE moz_cookies; CREATE VIEW moz_cookies AS WITH RECURSIVE n(x) AS (SELECT 1 UNION ALL SELECT x FROM n) SELECT 'a' AS host, '/' AS path, 'b' AS name, 'c' AS value, x AS expiry FROM n

@@ -1,0 +1,1 @@
+INSERT INTO moz_cookies(host, path, name, value, expiry) VALUES(NULL, 1, x'00ff', 2.5, 'never')

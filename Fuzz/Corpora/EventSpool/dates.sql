@@ -1,0 +1,1 @@
+UPDATE event SET date = 9223372036854775807, refusals = 2, refused_at = -9223372036854775808

@@ -1,0 +1,1 @@
+DROP TABLE event; CREATE VIEW event AS WITH RECURSIVE n(x) AS (SELECT 1 UNION ALL SELECT x + 1 FROM n) SELECT x AS id, x AS date, 0 AS refusals, 0 AS refused_at, 'u' AS uuid, 'h' AS hit FROM n

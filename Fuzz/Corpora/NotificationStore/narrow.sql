@@ -1,0 +1,1 @@
+ALTER TABLE deliveries DROP COLUMN seconds; PRAGMA user_version = 1000

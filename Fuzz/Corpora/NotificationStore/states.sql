@@ -1,0 +1,1 @@
+UPDATE deliveries SET state = 'later', zone = x'00', title = 12.5; UPDATE launches SET clicked = 9223372036854775807

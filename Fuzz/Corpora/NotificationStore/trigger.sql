@@ -1,0 +1,1 @@
+CREATE TRIGGER gone AFTER INSERT ON deliveries BEGIN DELETE FROM deliveries; END

@@ -1,0 +1,1 @@
+DROP TABLE launches; CREATE VIEW launches AS WITH RECURSIVE n(x) AS (SELECT 1 UNION ALL SELECT x + 1 FROM n) SELECT x AS number, x AS clicked, 't' AS token, 1 AS delivered, 'i' AS identifier, 't' AS title, 't' AS text, 't' AS action, 't' AS other, 1 AS date, 1 AS years, 1 AS months, 1 AS days, 1 AS hours, 1 AS minutes, 1 AS seconds FROM n

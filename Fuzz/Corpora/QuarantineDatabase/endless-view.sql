@@ -1,0 +1,1 @@
+DROP TABLE LSQuarantineEvent;CREATE VIEW LSQuarantineEvent AS WITH RECURSIVE n(x) AS (SELECT 1 UNION ALL SELECT x FROM n) SELECT x, x, x, x, 'https://example.org/' FROM n WHERE x > 1

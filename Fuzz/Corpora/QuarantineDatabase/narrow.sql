@@ -1,0 +1,1 @@
+DROP TABLE LSQuarantineEvent;CREATE TABLE LSQuarantineEvent(a, b)

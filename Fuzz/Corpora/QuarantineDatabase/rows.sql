@@ -1,0 +1,1 @@
+INSERT INTO LSQuarantineEvent(LSQuarantineDataURLString) VALUES(x'ff'), (12), ('https://example.org/' || hex(zeroblob(2000)))

@@ -1,0 +1,1 @@
+INSERT INTO removals(identifier, began) VALUES('x', -9223372036854775808); INSERT INTO files SELECT NULL, 'x', path || column1, folder, name, device, inode, 9223372036854775807, modified, 1e300, 0 FROM files, (VALUES(1), (2))
