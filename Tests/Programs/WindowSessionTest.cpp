@@ -219,6 +219,10 @@ TEST_F(SessionFixture, AScanThatIsStoppedHasWhatItFoundAndOneThatFailsNothing) {
     EXPECT_EQ(events.back(), minSize == 0 ? Event::scanned : Event::scanStopped);
     EXPECT_EQ(session->list() && session->list()->report()->isPartial, minSize == 0);
   }
+  engine.trash = {"/a"};  // Of the result before, which is shown no more.
+  session->restore();
+  background.run();
+  EXPECT_EQ(session->stage(), Stage::choosing);
 
   session->removeFolder("/f");
   session->addFolder("/gone");
@@ -231,6 +235,8 @@ TEST_F(SessionFixture, AScanThatIsStoppedHasWhatItFoundAndOneThatFailsNothing) {
 TEST_F(SessionFixture, StoppedWhileItLooksAsksNothing) {
   scan();
   session->choose({0, 0}, true);
+  session->addFolder("/next");  // Nothing that is chosen is lost by that.
+  EXPECT_EQ(session->folders().size(), 2u);
   session->planRemoval();
   session->stop();
   background.run();

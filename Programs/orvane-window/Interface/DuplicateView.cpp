@@ -186,9 +186,16 @@ void DuplicateView::showList(std::shared_ptr<const DuplicateList> list) {
   replace(std::move(list), unfoldedAtFirst);
 }
 
-// All rows go and come again: in a long list that is hardly slower than folding each.
+// All rows go and come again: in a long list that is hardly slower than folding each. The user sees
+// those folded at once that are on the screen.
 void DuplicateView::collapseAll() {
-  if (rows_ && !isLeaving_) replace(rows_->list(), 0);
+  if (!rows_ || isLeaving_) return;
+  const auto place = current();
+  Gtk::TreeModel::Path first, last;
+  if (get_visible_range(first, last))
+    for (int i = 0; i < static_cast<int>(unfoldedAtFirst); ++i)
+      collapse_row(DuplicateRows::pathOf(static_cast<std::size_t>(first[0] + i)));
+  replace(rows_->list(), 0, place ? std::optional(place->group) : std::nullopt);
 }
 
 void DuplicateView::expandAll() {
@@ -197,9 +204,11 @@ void DuplicateView::expandAll() {
   if (!work_.connected()) work_ = Glib::signal_idle().connect([this] { return goOn(); });
 }
 
-void DuplicateView::replace(std::shared_ptr<const DuplicateList> list, std::size_t unfolded) {
+void DuplicateView::replace(std::shared_ptr<const DuplicateList> list, std::size_t unfolded,
+                            std::optional<std::size_t> group) {
   next_ = std::move(list);
   unfoldedNext_ = unfolded;
+  groupNext_ = group;
   isLeaving_ = true;
   isGrowing_ = false;
   nextUnfolded_.reset();
@@ -225,6 +234,10 @@ bool DuplicateView::goOn() {
   while (isShrinking && Clock::now() < end) isShrinking = rows_->shrink(groupsAtOnce);
   if (isLeaving_ && !isShrinking) begin();
   while (isGrowing_ && Clock::now() < end) isGrowing_ = rows_->grow(groupsAtOnce);
+  if (!isLeaving_ && !isGrowing_ && groupNext_) {
+    if (!current()) set_cursor(DuplicateRows::pathOf(*groupNext_));
+    groupNext_.reset();
+  }
   while (!isGrowing_ && nextUnfolded_ && Clock::now() < end) {
     expand_row(DuplicateRows::pathOf(*nextUnfolded_), false);
     if (++*nextUnfolded_ >= rows_->list()->report()->groups.size()) nextUnfolded_.reset();

@@ -54,7 +54,8 @@ class DuplicateView final : public Gtk::TreeView {
   void addFolder();
   void addFigures();
   void toggle(const Gtk::TreeModel::Path& path);
-  void replace(std::shared_ptr<const DuplicateList> list, std::size_t unfolded);
+  void replace(std::shared_ptr<const DuplicateList> list, std::size_t unfolded,
+               std::optional<std::size_t> group = std::nullopt);
   void begin();
   bool goOn();
 
@@ -64,7 +65,8 @@ class DuplicateView final : public Gtk::TreeView {
   bool isGrowing_ = false;
   std::optional<std::size_t> nextUnfolded_;  ///< While all groups are being unfolded.
   std::shared_ptr<const DuplicateList> next_;
-  std::size_t unfoldedNext_ = 0;  ///< How many of its groups.
+  std::size_t unfoldedNext_ = 0;          ///< How many of its groups.
+  std::optional<std::size_t> groupNext_;  ///< The current one, once all rows are there.
   sigc::connection work_;
 };
 

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <orvane-window/Interface/MainWindow.h>
 
-#include <glibmm/convert.h>
+#include <gdk/gdkkeysyms.h>
 #include <glibmm/fileutils.h>
 #include <glibmm/main.h>
 
@@ -68,7 +68,7 @@ MainWindow::MainWindow(Gtk::Application& owner, Session::Ports ports, Applicatio
   };
   takeDrops();
   box_.show_all();
-  for (const std::string& folder : Preferences::lastFolders()) session_.addFolder(folder);
+  fillIn();
   follow(Session::Event::startedOver);
 }
 
@@ -107,18 +107,47 @@ void MainWindow::takeDrops() {
   });
 }
 
-void MainWindow::addFolders(const std::vector<std::string>& folders) {
-  if (folders.empty()) return;
-  session_.startOver();
-  for (const std::string& folder : folders)
-    if (Glib::file_test(folder, Glib::FILE_TEST_IS_DIR)) session_.addFolder(folder);
+void MainWindow::fillIn() {
+  for (const std::string& folder : Preferences::lastFolders()) session_.addFolder(folder);
+}
+
+bool MainWindow::hasChoices() const {
+  return session_.list() && session_.list()->chosen().files > 0;
+}
+
+void MainWindow::addFolders(std::vector<std::string> folders) {
+  std::erase_if(folders, [](const std::string& path) {
+    return !Glib::file_test(path, Glib::FILE_TEST_IS_DIR);
+  });
+  if (folders.empty() || session_.isAtWork()) return error_bell();
+  // Choices that somebody has made stay.
+  if (!hasChoices()) session_.startOver();
+  for (const std::string& folder : folders) session_.addFolder(folder);
+  if (session_.stage() == Session::Stage::choosing)
+    folders_.focus();
+  else
+    results_.outcome().tell(
+        localized("Folders_Added", {countText(session_.folders().size())}), Gtk::MESSAGE_INFO,
+        {{"outcome.rescan", localized("Rescan"), [this] { activate_action("rescan"); }},
+         {"outcome.close", localized("Close"), {}}});
 }
 
 void MainWindow::comeForward(const std::optional<std::string>& activationToken) {
-  // Choices that somebody has made stay.
-  if (session_.list() && session_.list()->chosen().files == 0) session_.startOver();
   Varnel::GTK3::bringToFront(*this, activationToken);
+}
+
+void MainWindow::suggestScan(const std::optional<std::string>& activationToken) {
+  if (!hasChoices()) session_.startOver();
+  if (session_.folders().empty()) fillIn();
+  comeForward(activationToken);
   if (session_.stage() == Session::Stage::choosing) folders_.focus();
+}
+
+// The toolkit's own way leads to the buttons of the header first.
+bool MainWindow::on_key_press_event(GdkEventKey* event) {
+  if (event->keyval == GDK_KEY_F10 && (event->state & gtk_accelerator_get_default_mod_mask()) == 0)
+    return menuBar_.get_children().front()->mnemonic_activate(false);
+  return Gtk::ApplicationWindow::on_key_press_event(event);
 }
 
 void MainWindow::follow(Session::Event event) {
@@ -209,7 +238,7 @@ void MainWindow::showScanned() {
   static_cast<void>(Preferences::setLastFolders(session_.folders()));
   results_.showList(session_);
   const ScanTotals& totals = session_.outcome().totals;
-  const std::uint64_t files = totals.unreadableFiles + totals.vanishedFiles + totals.changedFiles;
+  const std::uint64_t files = session_.outcome().leftOutFiles();
   std::string warning;
   if (session_.list()->report()->isPartial) warning = localized("Results_Stopped");
   if (files + totals.unreadableFolders > 0)

@@ -41,10 +41,15 @@ class MainWindow final : public Gtk::ApplicationWindow {
   MainWindow(Gtk::Application& owner, Session::Ports ports, Application application);
   ~MainWindow() override;
 
-  /// Takes up folders, from the command line or from another program.
-  void addFolders(const std::vector<std::string>& folders);
-  /// Comes to the front, ready for a scan of the last folders.
+  /// Takes up folders, from the command line or from another program. Choices that somebody has
+  /// made stay; the folders are then for the next scan.
+  void addFolders(std::vector<std::string> folders);
   void comeForward(const std::optional<std::string>& activationToken = std::nullopt);
+  /// Comes to the front, ready for a scan of the last folders.
+  void suggestScan(const std::optional<std::string>& activationToken);
+
+ protected:
+  bool on_key_press_event(GdkEventKey* event) override;
 
  private:
   using Actions = std::map<std::string, Glib::RefPtr<Gio::SimpleAction>>;
@@ -52,6 +57,8 @@ class MainWindow final : public Gtk::ApplicationWindow {
   // MainWindow.cpp: what is shown.
   void addHeader();
   void takeDrops();
+  void fillIn();
+  [[nodiscard]] bool hasChoices() const;
   void follow(Session::Event event);
   void showPage();
   void showProgress();

@@ -60,7 +60,7 @@ WindowApplication::WindowApplication(Console& console)
                         "Where events go, if the user has agreed", "URL");
   routing_.emplace(*this, [this](Varnel::UserNotificationRouter& router) {
     reminding_ = std::make_unique<Reminding>(router, console_, [this](const auto& token) {
-      withWindow([token](MainWindow& window) { window.comeForward(token); });
+      withWindow([token](MainWindow& window) { window.suggestScan(token); });
     });
   });
   signal_handle_local_options().connect(sigc::mem_fun(*this, &WindowApplication::takeOptions),

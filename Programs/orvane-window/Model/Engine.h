@@ -33,6 +33,11 @@ struct ScanOutcome {
   std::shared_ptr<const Report> report{};
   ScanTotals totals{};
   TextSource jsonReport{};  ///< As `orvane scan --json` prints it.
+
+  /// Files that were found and could not be looked at.
+  [[nodiscard]] std::uint64_t leftOutFiles() const {
+    return totals.unreadableFiles + totals.vanishedFiles + totals.changedFiles;
+  }
 };
 
 /// What has become of the files that were to be moved.

@@ -42,7 +42,7 @@ void Session::end(Stage stage, Event event) {
 }
 
 void Session::addFolder(std::string path) {
-  if (stage_ != Stage::choosing || std::count(folders_.begin(), folders_.end(), path) > 0) return;
+  if (isAtWork() || std::count(folders_.begin(), folders_.end(), path) > 0) return;
   folders_.push_back(std::move(path));
   observer_(Event::foldersChanged);
 }
@@ -64,6 +64,7 @@ void Session::scan(ScanRequest request) {
     return [this, outcome, list, control, lifetime] {
       if (lifetime.expired()) return;
       list_.reset();
+      outcome_ = {};
       gone_.clear();
       if (control->isCancelled && (!list || list->report()->groups.empty()))
         return end(Stage::choosing, Event::scanStopped);

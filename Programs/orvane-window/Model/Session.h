@@ -64,6 +64,7 @@ class Session final {
 
   /// In the order in which they were added; each once.
   [[nodiscard]] const std::vector<std::string>& folders() const { return folders_; }
+  /// A result stays as it is: the folder is for the next scan.
   void addFolder(std::string path);
   void removeFolder(const std::string& path);
 
