@@ -187,6 +187,8 @@ void Removal::lookAtGroup(std::size_t begin, std::size_t end, const Names& packa
     } else if (!state && state.error().reason == TrashError::Reason::failed) {
       ending.outcome = Outcome::unreadable;
       ending.code = state.error().code;
+    } else if (!state && state.error().reason == TrashError::Reason::noTrash) {
+      ending.outcome = Outcome::noTrash;
     }
     for (std::size_t i = begin; i < end; ++i) {
       steps_[i].outcome = ending.outcome;

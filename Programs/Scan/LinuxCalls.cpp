@@ -124,10 +124,6 @@ bool isInMemory(int folder) {
          (facts.f_type == TMPFS_MAGIC || facts.f_type == RAMFS_MAGIC);
 }
 
-bool isHole(int descriptor) {
-  return ::lseek(descriptor, 0, SEEK_DATA) < 0 && errno == ENXIO;
-}
-
 bool tellsSharedExtents(int folder) {
   struct statfs facts;
   if (::fstatfs(folder, &facts) != 0) return false;

@@ -24,10 +24,6 @@ bool isInMemory(int) {
   return false;
 }
 
-bool isHole(int) {
-  return false;
-}
-
 bool tellsSharedExtents(int) {
   return false;
 }

@@ -39,6 +39,11 @@ class Descriptor final {
   int number_;
 };
 
+/// Whether the file has no content but holes.
+bool isHole(int descriptor) {
+  return ::lseek(descriptor, 0, SEEK_DATA) < 0 && errno == ENXIO;
+}
+
 /// How far one step of `openWithoutLinks` goes.
 enum class Stride { longest, oneName };
 

@@ -26,9 +26,6 @@ extern const int openToPassThrough;
 /// of them.
 [[nodiscard]] bool isInMemory(int folder);
 
-/// Whether the system knows that the file has no content but holes.
-[[nodiscard]] bool isHole(int descriptor);
-
 /// Whether the file system of the folder lets files share extents, and tells which do.
 [[nodiscard]] bool tellsSharedExtents(int folder);
 
