@@ -50,7 +50,7 @@ TEST_F(Orvane, MovesDuplicatesToTheTrashAndRestoresThem) {
 }
 
 // A report whose files are no longer those that it names.
-TEST_F(Orvane, TellsThatFilesWereNotMoved) {
+TEST_F(Orvane, TellsThatFilesWereNotMovedToTheTrash) {
   const std::string report = folder.write("report.json", R"({"schemaVersion": 1, "groups": [
       {"size": 4, "files": [{"path": ")" + folder.write("a", "same") +
                                                              R"(", "inode": 1,
