@@ -34,6 +34,9 @@ gboolean note(gpointer isOver) noexcept {
 // source of its own. So a nested loop, which a block runs, still reaches the other blocks.
 class DefaultContextQueue final : public MainQueue {
  public:
+  // GLib makes the context at its first use, whose thread the thread sanitizer could not tell from
+  // others that use it at once.
+  DefaultContextQueue() { g_main_context_default(); }
   ~DefaultContextQueue() override {
     while (g_source_remove_by_user_data(this)) {
     }
