@@ -11,8 +11,8 @@
 #include <Scan/FileChoice.h>
 #include <Scan/Mounts.h>
 #include <Scan/NamedFiles.h>
+#include <Scan/NetworkNotice.h>
 #include <Scan/OpenFolders.h>
-#include <Scan/ScanObserver.h>
 #include <Scan/ScanRequest.h>
 #include <Scan/TaskGroup.h>
 
@@ -27,7 +27,7 @@ class Walk final {
       : request_(request),
         fileSystem_(fileSystem),
         turns_(turns),
-        observer_(observer),
+        notice_(observer),
         control_(control),
         group_(turns, control),
         choice_(request),
@@ -84,7 +84,7 @@ class Walk final {
     root.isReference =
         std::any_of(request_.references.begin(), request_.references.end(),
                     [&](const std::string& reference) { return liesIn(path, reference); });
-    if (const ScanMount* const mount = mounts_.around(path)) sayIfNetwork(*mount);
+    if (const ScanMount* const mount = mounts_.around(path)) notice_.sayIfNetwork(*mount);
     return root;
   }
 
@@ -108,12 +108,6 @@ class Walk final {
     group_.wait();
   }
 
-  void sayIfNetwork(const ScanMount& mount) {
-    if (mount.kind != ScanMount::Kind::network) return;
-    const std::lock_guard lock(saying_);
-    if (said_.insert(mount.path).second) observer_.networkEntered(mount.path);
-  }
-
   /// Whether to go on in a folder of another device than the one above. What is mounted since the
   /// scan began, perhaps by its coming there, is met like this.
   [[nodiscard]] bool entersDevice(std::uint64_t identifier, const std::string& path) {
@@ -124,7 +118,7 @@ class Walk final {
     const Mounts now(turns_.mounts());
     const ScanMount* const mount = now.around(path);
     if (mount && mount->kind == ScanMount::Kind::pseudo && !mounts_.at(mount->path)) return false;
-    if (mount) sayIfNetwork(*mount);
+    if (mount) notice_.sayIfNetwork(*mount);
     return true;
   }
 
@@ -181,7 +175,7 @@ class Walk final {
       }
       return false;
     }
-    sayIfNetwork(mount);
+    notice_.sayIfNetwork(mount);
     Folder& folder = tree_->addMounted(above, way);
     folder.leadsToMounts = mounts_.hasBelow(mount.path);
     enqueue(workOf(mount.path), {&folder});
@@ -207,7 +201,7 @@ class Walk final {
   const ScanRequest& request_;
   FileSystem& fileSystem_;
   DiskTurns& turns_;
-  ScanObserver& observer_;
+  NetworkNotice notice_;
   ScanControl& control_;
   TaskGroup group_;
   const FileChoice choice_;
@@ -221,9 +215,6 @@ class Walk final {
   std::map<const ScanDisk*, DiskWork> works_;
   std::map<std::uint64_t, Device> devices_;
   WalkResult result_;
-
-  std::mutex saying_;  ///< Held while the observer hears of what follows.
-  std::set<std::string> said_;
 };
 
 /// Lists folders of one disk. A folder with many entries goes on in the next turn.
