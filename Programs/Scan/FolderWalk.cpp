@@ -352,18 +352,10 @@ class Walk::Task final : public TaskGroup::Task {
       if (entry.kind == FolderEntry::Kind::file) {
         take(entry);
       } else {
-        walk_.lose(*folder_, entry.name, lossOf(entry));
+        walk_.lose(*folder_, entry.name, NamedFiles::lossOf(entry));
       }
     }
     return nextNamed_ != named_.end();
-  }
-
-  /// Why something that was given for a file is none.
-  static Loss lossOf(const FolderEntry& entry) {
-    if (entry.kind == FolderEntry::Kind::failure) return Loss::because(entry.error);
-    const bool isFolder = entry.kind == FolderEntry::Kind::folder;
-    return {Loss::Kind::unreadable,
-            std::make_error_code(isFolder ? std::errc::is_a_directory : std::errc::not_supported)};
   }
 
   /// Makes `device_` the one of the folder or of a file in it.

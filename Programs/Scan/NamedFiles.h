@@ -6,9 +6,12 @@
 #include <mutex>
 #include <set>
 #include <string>
+#include <system_error>
 #include <vector>
 
+#include <Scan/FileSystem.h>
 #include <Scan/FileTree.h>
+#include <Scan/Loss.h>
 
 namespace Orvane {
 
@@ -42,6 +45,14 @@ class NamedFiles final {
     std::sort(names.begin(), names.end());
     names.erase(std::unique(names.begin(), names.end()), names.end());
     return names;
+  }
+
+  /// Why something that was given for a file is none.
+  [[nodiscard]] static Loss lossOf(const FolderEntry& entry) {
+    if (entry.kind == FolderEntry::Kind::failure) return Loss::because(entry.error);
+    const bool isFolder = entry.kind == FolderEntry::Kind::folder;
+    return {Loss::Kind::unreadable,
+            std::make_error_code(isFolder ? std::errc::is_a_directory : std::errc::not_supported)};
   }
 
  private:
