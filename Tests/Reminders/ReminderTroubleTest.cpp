@@ -3,6 +3,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <sys/mount.h>
+#include <unistd.h>
 
 #include <filesystem>
 #include <fstream>
@@ -130,13 +131,13 @@ void orvaneSaysSo(Home& home, const Trouble& trouble) {
   const bool isLeftAlone = trouble.store == Trouble::isLeftAlone;
   const std::string before = isLeftAlone ? readFile(home.store).valueOr("") : "";
   const bool isReplaced = trouble.store == Trouble::isReplaced;
-  // Also where the plan of before is one of the same period.
-  for (const char* period : {"weekly", "monthly"}) {
-    const int status = home.orvane(std::string("remind every ") + period);
-    EXPECT_EQ(status, isReplaced ? 0 : 1) << period;
-    EXPECT_THAT(home.errors, HasSubstr(isReplaced ? "" : "orvane: the "));
-    EXPECT_THAT(home.errors, ContainsRegex(trouble.complaint));
-  }
+  // Also where the plan of before is one of the same period. The program waits a while for the
+  // store, so one user tries the one, and the other the other.
+  const bool isSame = ::getuid() == 0;
+  const int status = home.orvane(isSame ? "remind every weekly" : "remind every monthly");
+  EXPECT_EQ(status, isReplaced ? 0 : 1);
+  EXPECT_THAT(home.errors, HasSubstr(isReplaced ? "" : "orvane: the "));
+  EXPECT_THAT(home.errors, ContainsRegex(trouble.complaint));
   EXPECT_EQ(fs::exists(home.store.string() + ".damaged"), isReplaced);
   if (isLeftAlone) {
     EXPECT_TRUE(readFile(home.store).valueOr("") == before);
@@ -144,10 +145,11 @@ void orvaneSaysSo(Home& home, const Trouble& trouble) {
   trouble.end(home);
   const auto saysSo = HasSubstr("the plan is not that of the period");
   EXPECT_EQ(home.orvane("remind status"), 0);
-  EXPECT_EQ(testing::Matches(saysSo)(home.errors), !isReplaced) << home.errors;
+  EXPECT_EQ(testing::Matches(saysSo)(home.errors), !isReplaced && !isSame) << home.errors;
   EXPECT_EQ(home.orvane("remind tomorrow --found 1 --selected 0"), 0) << home.errors;
   EXPECT_THAT(home.output,
-              AllOf(HasSubstr("period: Every Month\n"), HasSubstr("  SchedulerNotification: ")));
+              AllOf(HasSubstr(isSame ? "period: Every Week\n" : "period: Every Month\n"),
+                    HasSubstr("  SchedulerNotification: ")));
   EXPECT_EQ(home.orvane("remind status"), 0);
   EXPECT_THAT(home.errors, Not(saysSo));
 }
