@@ -3,11 +3,11 @@
 
 #include <dlfcn.h>
 
-#include <cinttypes>
+#include <charconv>
 #include <cstdint>
-#include <cstdio>
 #include <fstream>
 #include <string>
+#include <system_error>
 
 namespace Varnel::Platform::POSIX {
 namespace {
@@ -19,7 +19,10 @@ fs::path fileMappedAt(std::uintptr_t address) {
   for (std::string line; std::getline(maps, line);) {
     std::uintptr_t begin = 0;
     std::uintptr_t end = 0;
-    if (std::sscanf(line.c_str(), "%" SCNxPTR "-%" SCNxPTR, &begin, &end) != 2) continue;
+    const char* const last = line.data() + line.size();
+    const auto [dash, failed] = std::from_chars(line.data(), last, begin, 16);
+    if (failed != std::errc() || dash == last) continue;
+    if (std::from_chars(dash + 1, last, end, 16).ec != std::errc()) continue;
     if (address < begin || address >= end) continue;
     const std::size_t path = line.find('/');
     return path == std::string::npos ? fs::path() : fs::path(line.substr(path));

@@ -144,7 +144,7 @@ std::vector<Mount> parseMountInfo(std::string_view bytes) {
   return mounts;
 }
 
-std::vector<Mount> reachableMounts(std::vector<Mount> mounts) {
+std::vector<Mount> reachableMounts(const std::vector<Mount>& mounts) {
   Reachability reachability(mounts);
   std::vector<Mount> result;
   for (const Mount& mount : mounts)

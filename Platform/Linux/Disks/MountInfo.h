@@ -24,6 +24,6 @@ struct Mount {
 [[nodiscard]] std::vector<Mount> parseMountInfo(std::string_view bytes);
 
 /// The mounts that a path can lead to, in their order: none that another one was mounted over.
-[[nodiscard]] std::vector<Mount> reachableMounts(std::vector<Mount> mounts);
+[[nodiscard]] std::vector<Mount> reachableMounts(const std::vector<Mount>& mounts);
 
 }  // namespace Varnel::Platform::Linux

@@ -84,6 +84,7 @@ std::vector<std::string> interfacesOfDefaultRoutes(std::string_view ipv4Table,
   std::stable_sort(routes.begin(), routes.end(),
                    [](const Route& a, const Route& b) { return a.metric < b.metric; });
   std::vector<std::string> interfaces;
+  interfaces.reserve(routes.size());
   for (Route& route : routes) interfaces.push_back(std::move(route.interface));
   return interfaces;
 }

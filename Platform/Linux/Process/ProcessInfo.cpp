@@ -27,6 +27,7 @@ fs::path withoutMarkOfDeletion(const fs::path& path, const fs::path& link) {
 // Without /proc (in a bare sandbox, or early in a machine's start) there is still the name by which
 // the program was called. Even if that leads nowhere from here, its last component is right.
 fs::path pathThatWasCalled() {
+  // The kernel hands the address over as a number. NOLINTNEXTLINE(performance-no-int-to-ptr)
   const auto* name = reinterpret_cast<const char*>(::getauxval(AT_EXECFN));
   if (!name) return {};
   std::error_code failed;
