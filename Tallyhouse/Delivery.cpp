@@ -32,7 +32,7 @@ Delivery::Delivery(Ports ports, EventSpool& spool, Endpoint endpoint, DeliveryPo
       policy_(policy),
       random_(std::move(random)) {}
 
-Delivery::Step Delivery::step(Haste haste, std::stop_token stop) {
+Delivery::Step Delivery::step(Haste haste, const std::stop_token& stop) {
   if (!saveOutcome()) return fileIsAway();
   for (bool hasSent = false;;) {
     const auto outlook = spool_.look(endpoint_.url, policy_.maxBatchEvents, policy_.maxRefusals);
@@ -99,7 +99,7 @@ Delivery::Step Delivery::fileIsAway() {
 }
 
 void Delivery::send(std::vector<SpooledEvent> events, const DeliveryState& before,
-                    std::stop_token stop) {
+                    const std::stop_token& stop) {
   const auto answer = ports_.httpClient.post(HTTPPost{.url = endpoint_.url,
                                                       .contentType = "text/plain; charset=utf-8",
                                                       .body = batchOf(events, ports_.clock.now()),

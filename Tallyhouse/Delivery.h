@@ -63,7 +63,7 @@ class Delivery final {
            std::function<double()> random);
 
   /// Sends a batch if one is due and waits for the answer. After `stop` nothing more is sent.
-  [[nodiscard]] Step step(Haste haste, std::stop_token stop);
+  [[nodiscard]] Step step(Haste haste, const std::stop_token& stop);
 
   /// Lets others deliver, and forgets what it has not noted: the spool is being emptied.
   void rest();
@@ -76,7 +76,8 @@ class Delivery final {
                                                                   Haste haste) const;
   [[nodiscard]] bool saveOutcome();
   [[nodiscard]] Step fileIsAway();
-  void send(std::vector<SpooledEvent> events, const DeliveryState& before, std::stop_token stop);
+  void send(std::vector<SpooledEvent> events, const DeliveryState& before,
+            const std::stop_token& stop);
 
   const Ports ports_;
   EventSpool& spool_;

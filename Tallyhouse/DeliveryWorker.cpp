@@ -110,7 +110,8 @@ std::optional<Date> DeliveryWorker::work(std::unique_lock<std::mutex>& lock) {
   return earlier(step.next, unsettled);
 }
 
-Delivery::Step DeliveryWorker::deliver(Haste haste, bool isPaused, std::stop_token transfer) {
+Delivery::Step DeliveryWorker::deliver(Haste haste, bool isPaused,
+                                       const std::stop_token& transfer) {
   // What is to be forgotten is not sent.
   if (isPaused || recorder_.mustEmpty()) {
     delivery_.rest();

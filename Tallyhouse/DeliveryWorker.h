@@ -57,7 +57,7 @@ class DeliveryWorker final {
   std::optional<Varnel::Platform::Date> work(std::unique_lock<std::mutex>& lock);
   void waitForNext(std::unique_lock<std::mutex>& lock, std::optional<Varnel::Platform::Date> next);
   // Called without it.
-  Delivery::Step deliver(Delivery::Haste haste, bool isPaused, std::stop_token transfer);
+  Delivery::Step deliver(Delivery::Haste haste, bool isPaused, const std::stop_token& transfer);
 
   Varnel::Platform::Clock& clock_;
   EventRecorder& recorder_;

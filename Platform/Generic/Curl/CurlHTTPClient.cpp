@@ -28,7 +28,7 @@ constexpr long maxTransferSeconds = 30;
 constexpr int pollingInMilliseconds = 1000;
 // Waiting for the content lets the connection be used again. More than this is not worth it.
 constexpr auto maxContentTime = std::chrono::seconds(1);
-constexpr std::size_t maxContentBytes = 64 * 1024;
+constexpr std::size_t maxContentBytes = 64UL * 1024;
 constexpr int firstFinalStatus = 200;
 
 using Easy = UniqueHandle<CURL*, curl_easy_cleanup>;

@@ -191,7 +191,7 @@ void SessionBus::start() {
   timer_ = AttachedSource(attach(
       g_timeout_source_new(static_cast<guint>(patience_.count())), G_PRIORITY_DEFAULT + 1, [this] {
         g_cancellable_cancel(attempt_->cancellable.get());
-        finish(attempt_, {}, {BusFailure::noReply, "The session bus does not answer."});
+        finish(attempt_.get(), {}, {BusFailure::noReply, "The session bus does not answer."});
       }));
   try {
     startThread("session-bus", [weak = weak_from_this(), attempt] {
@@ -199,11 +199,12 @@ void SessionBus::start() {
       const auto connection =
           std::make_shared<Connection>(open(attempt->cancellable.get(), failure));
       runOnMainLoop([weak, attempt, connection, failure] {
-        if (const auto self = weak.lock()) self->finish(attempt, std::move(*connection), failure);
+        if (const auto self = weak.lock())
+          self->finish(attempt.get(), std::move(*connection), failure);
       });
     }).detach();
   } catch (const std::system_error& error) {
-    finish(attempt, {}, {BusFailure::noReply, error.what()});
+    finish(attempt.get(), {}, {BusFailure::noReply, error.what()});
   }
 }
 
@@ -222,10 +223,9 @@ SessionBus::Connection SessionBus::open(GCancellable* cancellable, BusFailure& f
   return connection;
 }
 
-void SessionBus::finish(std::shared_ptr<Attempt> attempt, Connection connection,
-                        const BusFailure& failure) {
+void SessionBus::finish(const Attempt* attempt, Connection connection, const BusFailure& failure) {
   // The attempt was given up.
-  if (attempt != attempt_) return;
+  if (attempt != attempt_.get()) return;
   const bool hasSucceeded{connection};
   if (hasSucceeded) adopt(std::move(connection));
   attempt_.reset();
@@ -269,11 +269,12 @@ void SessionBus::send(const BusMessage& message, std::chrono::milliseconds time,
 
 void SessionBus::ask(BusMessage message, std::chrono::milliseconds time, Reply reply) {
   const auto kept = std::make_shared<BusMessage>(std::move(message));
-  connect([weak = weak_from_this(), kept, time, reply](const BusFailure* failure) {
-    const auto self = weak.lock();
-    if (self && !failure) return self->send(*kept, time, reply);
-    reply(nullptr, failure ? *failure : BusFailure());
-  });
+  connect(
+      [weak = weak_from_this(), kept, time, reply = std::move(reply)](const BusFailure* failure) {
+        const auto self = weak.lock();
+        if (self && !failure) return self->send(*kept, time, reply);
+        reply(nullptr, failure ? *failure : BusFailure());
+      });
 }
 
 void SessionBus::tell(const BusMessage& message) {

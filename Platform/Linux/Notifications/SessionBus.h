@@ -119,7 +119,7 @@ class SessionBus final : public std::enable_shared_from_this<SessionBus> {
   static void replied(GObject* connection, GAsyncResult* result, gpointer awaited) noexcept;
   static void closed(GDBusConnection* connection, gboolean, GError*, gpointer self) noexcept;
   static Connection open(GCancellable* cancellable, BusFailure& failure);
-  void finish(std::shared_ptr<Attempt> attempt, Connection connection, const BusFailure& failure);
+  void finish(const Attempt* attempt, Connection connection, const BusFailure& failure);
   void adopt(Connection connection);
   void release();
   void publish(const ServedObject& object) const;

@@ -45,7 +45,7 @@ class GLibTimeZone final : public TimeZone {
     std::int64_t before = secondsOf(date);
     const int interval = intervalAt(before);
     if (intervalAt(secondsOf(Date::max())) == interval) return std::nullopt;
-    std::int64_t step = 24 * 60 * 60;
+    std::int64_t step = std::chrono::seconds(std::chrono::days(1)).count();
     for (; intervalAt(before + step) == interval; step *= 2) before += step;
     for (; step > 1; step -= step / 2)
       if (intervalAt(before + step / 2) == interval) before += step / 2;
