@@ -59,6 +59,7 @@ class Scan final {
     keepSharedSizes(candidates);
     FileReading reading({*tree_, ports_.fileSystem, ports_.turns}, control_);
     std::vector<Candidates> equal = readEqual(reading, std::move(candidates));
+    totals_.unreachedFiles = reading.unreachedFiles();
     return resultFrom(std::move(equal), reading.takeFootprints());
   }
 
