@@ -82,13 +82,14 @@ int TrashCommand::moveOrShow(const Report& report, const std::atomic<bool>& shou
                    .hardLinks = allowsHardLinks},
                   shouldStop);
   if (const auto problem = removal.prepare()) return fail(*problem, console);
-  if (moves && !shouldStop && removal.totals().planned > 0) {
+  const bool isMade = moves && !shouldStop;
+  if (isMade && removal.totals().planned > 0) {
     if (const auto problem = removal.begin()) return fail(*problem, console);
     move(removal, console);
   }
 
   const RemovalForm form{.columns = isStandardOutputATerminal() ? standardOutputColumns() : 0,
-                         .isMade = moves};
+                         .isMade = isMade};
   const auto write = [&](std::string_view text) { return console.writeResult(text); };
   bool isWritten =
       isJSON ? writeJSON(removal, selection, write) : writeText(removal, selection, form, write);
