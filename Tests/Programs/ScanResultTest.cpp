@@ -146,7 +146,7 @@ TEST_F(ScanResults, KnowWhichExtentsFilesShare) {
     constexpr std::size_t size = 200'000;
     for (const char* name : {"in/1", "in/2", "out/1"}) mounted.write(name, bytes(size, *name));
     fs::create_directory(mounted.path("copies"));
-    ::sync();
+    Varnel::Tests::synchronise(mounted.path());
     EXPECT_EQ(scan({mounted.path("in")}).totals.wastedBytes, size);
     EXPECT_TRUE(share(mounted.path("copies/1"), mounted.path("in/1")));
     EXPECT_EQ(scan({mounted.path("in"), mounted.path("copies")}).totals.wastedBytes, size);
