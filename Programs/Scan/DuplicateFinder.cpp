@@ -59,6 +59,7 @@ class Scan final {
     keepSharedSizes(candidates);
     FileReading reading({*tree_, ports_.fileSystem, ports_.turns}, control_);
     std::vector<Candidates> equal = readEqual(reading, std::move(candidates));
+    totals_.unreachedFiles = reading.unreachedFiles();
     return resultFrom(std::move(equal), reading.takeFootprints());
   }
 
@@ -221,7 +222,11 @@ class Scan final {
     look(Look::rest, rest);
     rest.insert(rest.end(), known.begin(), known.end());
     keepAgreeing(rest);
-    return {std::move(candidates), std::move(large), std::move(rest)};
+    std::vector<Candidates> equal(3);  // A list of them would copy them.
+    equal[0].swap(candidates);
+    equal[1].swap(large);
+    equal[2].swap(rest);
+    return equal;
   }
 
   void leaveOut(const FileReading::Losses& losses) {
@@ -234,7 +239,7 @@ class Scan final {
 
   /// The result from groups that are numbered from 1 in each part.
   ScanResult resultFrom(std::vector<Candidates> parts, const std::vector<Footprint>& footprints) {
-    std::vector<std::uint32_t> contents(tree_->endOfNumbers());
+    std::vector<std::uint32_t> contents;
     ScanResult result = groupFiles(std::move(parts), contents);
     setContentsOfLinks(contents, static_cast<std::uint32_t>(result.groups.size()));
     std::erase_if(links_,
@@ -251,22 +256,37 @@ class Scan final {
     return result;
   }
 
-  /// The groups by their first path. Gives the content of each a number, from 1 on.
+  /// The groups by their first path. Gives the content of each a number, from 1 on. A million
+  /// candidates take the most memory of all, so that little is made beside them.
   ScanResult groupFiles(std::vector<Candidates> parts, std::vector<std::uint32_t>& contents) {
-    std::vector<std::int64_t> modifiedAt(tree_->endOfNumbers());
+    std::size_t fileCount = 0, groupCount = 0;
+    for (const Candidates& part : parts) {
+      fileCount += part.size();
+      if (!part.empty()) groupCount += part.back().group;
+    }
+    // Of the same file each.
     std::vector<FileNumber> files;
-    std::vector<DuplicateGroup> groups;
-    for (Candidates& part : parts) {
-      const auto first = static_cast<std::uint32_t>(groups.size());
+    std::vector<std::uint32_t> groupOf;
+    std::vector<std::int64_t> modifiedAt;
+    files.reserve(fileCount);
+    groupOf.reserve(fileCount);
+    modifiedAt.reserve(fileCount);
+    for (std::uint32_t first = 0; Candidates & part : parts) {
       for (const Candidate& candidate : part) {
-        const std::uint32_t group = first + candidate.group;
-        if (group > groups.size()) groups.push_back({.size = sizeOf(candidate)});
-        ++groups[group - 1].count;
-        contents[candidate.file] = group;
-        modifiedAt[candidate.file] = candidate.modifiedAt;
         files.push_back(candidate.file);
+        groupOf.push_back(first + candidate.group - 1);
+        modifiedAt.push_back(candidate.modifiedAt);
       }
+      if (!part.empty()) first += part.back().group;
       Candidates().swap(part);
+    }
+    contents.resize(tree_->endOfNumbers());
+    std::vector<DuplicateGroup> groups(groupCount);
+    for (std::uint32_t i = 0; i < files.size(); ++i) {
+      contents[files[i]] = i;
+      DuplicateGroup& group = groups[groupOf[i]];
+      group.size = tree_->file(files[i]).size;
+      ++group.count;
     }
     for (std::uint32_t end = 0; DuplicateGroup & group : groups) {
       group.begin = end;
@@ -274,18 +294,19 @@ class Scan final {
     }
     sortByPath(*tree_, files);
     ScanResult result{.totals = totals_,
-                      .files = std::vector<FileNumber>(files.size()),
-                      .modifiedAt = std::vector<std::int64_t>(files.size()),
+                      .files = std::vector<FileNumber>(fileCount),
+                      .modifiedAt = std::vector<std::int64_t>(fileCount),
                       .tree = tree_};
     std::vector<std::uint32_t> byFirstPath;
     for (const FileNumber file : files) {
-      DuplicateGroup& group = groups[contents[file] - 1];
-      if (group.count == 0) byFirstPath.push_back(contents[file] - 1);
+      const std::uint32_t place = std::exchange(contents[file], groupOf[contents[file]] + 1);
+      DuplicateGroup& group = groups[groupOf[place]];
+      if (group.count == 0) byFirstPath.push_back(groupOf[place]);
       const std::uint32_t index = group.begin + group.count++;
       result.files[index] = file;
-      result.modifiedAt[index] = modifiedAt[file];
+      result.modifiedAt[index] = modifiedAt[place];
     }
-    result.groups.reserve(groups.size());
+    result.groups.reserve(groupCount);
     for (const std::uint32_t group : byFirstPath) result.groups.push_back(groups[group]);
     return result;
   }

@@ -300,7 +300,10 @@ void FileReading::DiskPass::startReading(unsigned count) {
 FileReading::~FileReading() = default;
 
 void FileReading::read(Look look, std::vector<Candidate>& candidates) {
-  if (control_.isCancelled) return candidates.clear();
+  if (control_.isCancelled) {
+    unreachedFiles_ += candidates.size();
+    return candidates.clear();
+  }
   control_.filesToRead.fetch_add(candidates.size(), std::memory_order_relaxed);
   std::uint64_t bytes = 0;
   for (Candidate& candidate : candidates) {
@@ -327,9 +330,9 @@ void FileReading::read(Look look, std::vector<Candidate>& candidates) {
   group.wait();
   for (const auto& [disk, pass] : passes)
     if (pass->isCold()) coldDisks_.insert(disk);
-  std::erase_if(candidates, [](const Candidate& file) {
-    return file.file == Candidate::lost || file.modifiedAt == Candidate::unread;
-  });
+  std::erase_if(candidates, [](const Candidate& file) { return file.file == Candidate::lost; });
+  unreachedFiles_ += std::erase_if(
+      candidates, [](const Candidate& file) { return file.modifiedAt == Candidate::unread; });
   std::sort(restDigests_.begin(), restDigests_.end());
 }
 

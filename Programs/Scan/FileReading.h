@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <cstdint>
 #include <mutex>
 #include <optional>
 #include <set>
@@ -46,6 +47,9 @@ class FileReading final {
   /// read, and those whose turn did not come because the scan was cancelled.
   void read(Look look, std::vector<Candidate>& candidates);
 
+  /// How many files were dropped because the scan was cancelled.
+  [[nodiscard]] std::uint64_t unreachedFiles() const { return unreachedFiles_; }
+
   /// What was lost since the last call, in no order.
   [[nodiscard]] Losses takeLosses() { return std::exchange(losses_, {}); }
 
@@ -63,6 +67,7 @@ class FileReading final {
   Ports ports_;
   ScanControl& control_;
   const DigestSecret secret_;
+  std::uint64_t unreachedFiles_ = 0;
   std::set<const ScanDisk*> coldDisks_;  ///< Those that were seen to work for what is read.
 
   std::mutex mutex_;  ///< Guards these while tasks run.

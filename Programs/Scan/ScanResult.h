@@ -54,6 +54,7 @@ struct ScanTotals {
   std::uint64_t unreadableFiles = 0;
   std::uint64_t vanishedFiles = 0;
   std::uint64_t changedFiles = 0;
+  std::uint64_t unreachedFiles = 0;  ///< Those that were to be read when the scan was cancelled.
   std::uint64_t unreadableFolders = 0;
   std::uint64_t duplicateFiles = 0;  ///< Files that could go: see `DuplicateGroup::removable`.
   std::uint64_t wastedBytes = 0;

@@ -4,6 +4,7 @@
 #include <utility>
 
 #include <Varnel/Platform/Text/VisibleText.h>
+#include <orvane/ShownText.h>
 #include <orvane/StandardStreams.h>
 #include <orvane/TextColumns.h>
 
@@ -25,7 +26,8 @@ void Console::print(std::string_view text) {
 }
 
 void Console::complain(std::string_view message) {
-  print("orvane: " + visibleText(std::string(message)) + "\n");
+  print(wrapped("orvane: " + visibleText(std::string(message)) + "\n",
+                isStandardErrorATerminal() ? standardErrorColumns() : 0));
 }
 
 bool Console::writeResult(std::string_view text) {

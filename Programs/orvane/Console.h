@@ -24,7 +24,7 @@ class Console final {
   /// Writes text that ends a line to standard error.
   void print(std::string_view text);
 
-  /// Prints "orvane: " and the message on one line.
+  /// Prints "orvane: " and the message on one line, or as many as the terminal needs.
   void complain(std::string_view message);
 
   /// Writes the result to standard output; complains and returns false when that fails. Says

@@ -40,12 +40,6 @@ ordered_json toJSON(const DataFile& file, DataPart::Form form) {
   return object;
 }
 
-std::string textOf(const ordered_json& json) {
-  std::string line = jsonLine(json);
-  line.pop_back();
-  return line;
-}
-
 }  // namespace
 
 // A file at a time: years of a journal, or a month of logs, need not fit into memory.
@@ -55,13 +49,13 @@ int DataExportCommand::run(Console& console) const {
     isWritten = isWritten && console.writeResult(text);
   };
   write("{\"schemaVersion\":" + std::to_string(schemaVersion) +
-        ",\"product\":" + textOf(Varnel::Globals::baseIdentifier()));
+        ",\"product\":" + jsonText(Varnel::Globals::baseIdentifier()));
   for (const DataPart& part : productData()) {
-    write("," + textOf(part.name) + ":[");
+    write("," + jsonText(part.name) + ":[");
     std::string comma;
     for (const DataFile& file : part.files) {
       if (!isWritten) return 1;
-      write(comma + textOf(toJSON(file, part.form)));
+      write(comma + jsonText(toJSON(file, part.form)));
       comma = ",";
     }
     write("]");

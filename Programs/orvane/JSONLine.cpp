@@ -10,8 +10,18 @@
 
 namespace Orvane {
 
+std::string jsonText(const nlohmann::ordered_json& json) {
+  return json.dump(-1, ' ', false, nlohmann::ordered_json::error_handler_t::replace);
+}
+
+std::string openJSONText(const nlohmann::ordered_json& json) {
+  std::string text = jsonText(json);
+  text.pop_back();
+  return text;
+}
+
 std::string jsonLine(const nlohmann::ordered_json& json) {
-  return json.dump(-1, ' ', false, nlohmann::ordered_json::error_handler_t::replace) + "\n";
+  return jsonText(json) + "\n";
 }
 
 void addText(nlohmann::ordered_json& json, const std::string& key, const std::string& text) {

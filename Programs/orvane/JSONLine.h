@@ -15,6 +15,12 @@ inline constexpr int schemaVersion = 1;
 /// UTF-8, which JSON texts must be, show as U+FFFD.
 [[nodiscard]] std::string jsonLine(const nlohmann::ordered_json& json);
 
+/// The same within a line.
+[[nodiscard]] std::string jsonText(const nlohmann::ordered_json& json);
+
+/// The text of an object to which members can be added: "}" is still to come.
+[[nodiscard]] std::string openJSONText(const nlohmann::ordered_json& json);
+
 /// Adds a text under `key` and, where it is not UTF-8, all its bytes in hexadecimal digits under
 /// the same with "Bytes" behind it.
 void addText(nlohmann::ordered_json& json, const std::string& key, const std::string& text);

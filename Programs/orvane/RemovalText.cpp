@@ -2,7 +2,6 @@
 #include <orvane/RemovalText.h>
 
 #include <algorithm>
-#include <map>
 #include <nlohmann/json.hpp>
 #include <string_view>
 #include <utility>
@@ -10,18 +9,15 @@
 
 #include <Removal/Removal.h>
 #include <orvane/JSONLine.h>
+#include <orvane/JSONList.h>
 #include <orvane/ShownText.h>
+#include <orvane/StepText.h>
 #include <orvane/TextColumns.h>
 
 namespace Orvane {
 namespace {
 
 using Outcome = RemovalStep::Outcome;
-
-struct Wording {
-  const char* word;         ///< Behind a path, and in JSON.
-  const char* explanation;  ///< Behind a count of files.
-};
 
 Wording wordingOf(Outcome outcome) {
   switch (outcome) {
@@ -122,18 +118,6 @@ class Lines final {
   std::size_t right_ = 0;
 };
 
-/// Calls `use(choice, begin, end)` with the steps of each group.
-template <typename Use>
-bool forEachGroup(const Removal& removal, Use use) {
-  const auto& steps = removal.steps();
-  for (auto begin = steps.begin(), end = begin; begin != steps.end(); begin = end) {
-    end = std::find_if(begin, steps.end(),
-                       [&](const RemovalStep& step) { return step.choice != begin->choice; });
-    if (!use(begin, end)) return false;
-  }
-  return true;
-}
-
 nlohmann::ordered_json jsonOf(const Removal& removal, const RemovalStep& step) {
   nlohmann::ordered_json json;
   addPath(json, "path", "url", removal.pathOf(step));
@@ -150,28 +134,27 @@ bool writeText(const Removal& removal, const Selection& selection, RemovalForm f
   Lines lines(form);
   TextParts parts(write);
   if (!removal.steps().empty() && !parts.add(lines.head())) return false;
-  const bool isWritten = forEachGroup(removal, [&](auto begin, auto end) {
+  for (const auto group : groupsOf(removal.steps(), &RemovalStep::choice)) {
     std::vector<std::pair<std::string, std::string>> victims;
-    for (auto step = begin; step != end; ++step)
+    for (const RemovalStep& step : group)
       victims.emplace_back(
-          shownPath(removal.pathOf(*step)),
-          goes(*step) ? "" : std::string(" [") + wordingOf(step->outcome).word + "]");
-    return parts.add(
-        lines.group(shownPath(removal.keptFor(*begin)), selection[begin->choice].isTie, victims));
-  });
-  return isWritten && (removal.steps().empty() || parts.add(lines.tail())) && parts.flush();
+          shownPath(removal.pathOf(step)),
+          goes(step) ? "" : std::string(" [") + wordingOf(step.outcome).word + "]");
+    const RemovalStep& any = group.front();
+    if (!parts.add(
+            lines.group(shownPath(removal.keptFor(any)), selection[any.choice].isTie, victims)))
+      return false;
+  }
+  return (removal.steps().empty() || parts.add(lines.tail())) && parts.flush();
 }
 
 std::string summaryOf(const Removal& removal, RemovalForm form) {
-  std::map<Outcome, std::uint64_t> counts;
-  std::uint64_t linked = 0;
-  for (const RemovalStep& step : removal.steps()) {
-    ++counts[step.outcome];
-    if (goes(step) && step.otherNames > 0) ++linked;
-  }
+  const auto linked = static_cast<std::uint64_t>(
+      std::count_if(removal.steps().begin(), removal.steps().end(),
+                    [](const RemovalStep& step) { return goes(step) && step.otherNames > 0; }));
   const RemovalTotals totals = removal.totals();
   const std::string size = shownSize(form.isMade ? totals.freedBytes : totals.plannedBytes);
-  const std::uint64_t count = counts[form.isMade ? Outcome::moved : Outcome::planned];
+  const std::uint64_t count = form.isMade ? totals.moved : totals.planned;
   std::string text;
   if (form.isMade) {
     text = counted(count, "file was", "files were") + " moved to the trash";
@@ -184,35 +167,30 @@ std::string summaryOf(const Removal& removal, RemovalForm form) {
   if (linked > 0)
     text += counted(linked, "of them frees", "of them free") +
             " nothing, as other hard links of it stay\n";
-  for (const auto& [outcome, number] : counts)
-    if (const std::string_view why = wordingOf(outcome).explanation; !why.empty())
-      text += counted(number, "file stays", "files stay") + ": " + std::string(why) + "\n";
-  return text;
+  return text + explanationsOf(removal.steps(), wordingOf, "file stays", "files stay");
 }
 
 bool writeJSON(const Removal& removal, const Selection& selection, const TextWriter& write) {
   const RemovalTotals totals = removal.totals();
   using Json = nlohmann::ordered_json;
-  std::string head = jsonLine({{"schemaVersion", schemaVersion},
-                               {"removal", removal.number() > 0 ? Json(removal.number()) : Json()},
-                               {"moved", totals.moved},
-                               {"notAllowed", totals.notAllowed},
-                               {"notMoved", totals.notMoved},
-                               {"freedBytes", totals.freedBytes},
-                               {"groups", Json::array()}});
-  const std::string_view tail = "]}\n";
-  head.resize(head.size() - tail.size());
+  const Json head = {{"schemaVersion", schemaVersion},
+                     {"removal", removal.number() > 0 ? Json(removal.number()) : Json()},
+                     {"moved", totals.moved},
+                     {"notAllowed", totals.notAllowed},
+                     {"notMoved", totals.notMoved},
+                     {"freedBytes", totals.freedBytes}};
   TextParts parts(write);
-  const auto add = [&, separator = ""](auto begin, auto end) mutable {
-    Json json = {{"size", removal.sizeOf(*begin)}};
-    addPath(json, "kept", "keptURL", removal.keptFor(*begin));
-    json["tie"] = selection[begin->choice].isTie;
-    for (auto step = begin; step != end; ++step) json["files"].push_back(jsonOf(removal, *step));
-    std::string text = jsonLine(json);
-    text.pop_back();  // The end of the line.
-    return parts.add(std::exchange(separator, ",") + text);
+  const auto groups = groupsOf(removal.steps(), &RemovalStep::choice);
+  const auto add = [&](std::size_t index, const char* comma) {
+    const RemovalStep& any = groups[index].front();
+    Json json = {{"size", removal.sizeOf(any)}};
+    addPath(json, "kept", "keptURL", removal.keptFor(any));
+    json["tie"] = selection[any.choice].isTie;
+    for (const RemovalStep& step : groups[index]) json["files"].push_back(jsonOf(removal, step));
+    return parts.add(comma + jsonText(json));
   };
-  return parts.add(head) && forEachGroup(removal, add) && parts.add(tail) && parts.flush();
+  return parts.add(openJSONText(head)) && addJSONList(parts, "groups", groups.size(), add) &&
+         parts.add("}\n") && parts.flush();
 }
 
 }  // namespace Orvane

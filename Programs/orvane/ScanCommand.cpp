@@ -44,6 +44,12 @@ void planReminder(std::uint64_t bytesLeftToClean, Console& console) {
       *period, static_cast<std::int64_t>(std::min(bytesLeftToClean, max))));
 }
 
+/// Who asks for urgent reading may want the files again.
+CacheUse cacheUseOf(Varnel::Platform::QualityOfService qos) {
+  using enum Varnel::Platform::QualityOfService;
+  return qos == background || qos == utility ? CacheUse::traceless : CacheUse::normal;
+}
+
 std::string howFar(const ScanControl& control) {
   if (control.filesToRead == 0)
     return counted(control.filesFound, "file was found", "files were found");
@@ -72,8 +78,9 @@ int ScanCommand::run(Console& console) const {
   facts.folders.insert(facts.folders.end(), asked->references.begin(), asked->references.end());
   ScanControl control;
   const Interruption interruption(control.isCancelled);
-  const ScanResult result =
-      search(*asked, {.qos = qos, .showsProgress = showsProgress}, log, console, control);
+  const SearchManner manner{
+      .qos = qos, .cacheUse = cacheUseOf(qos), .showsProgress = showsProgress};
+  const ScanResult result = search(*asked, manner, log, console, control);
   if (!result.lostFolders.empty()) {
     for (const LostPath& lost : result.lostFolders)
       complainThatItCannotScan(lost.path, reasonOf(lost.loss), console);

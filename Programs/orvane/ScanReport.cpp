@@ -13,6 +13,7 @@
 #include <Varnel/Platform/Values/UTF8.h>
 #include <orvane/CommandParts.h>
 #include <orvane/JSONLine.h>
+#include <orvane/JSONList.h>
 
 namespace Orvane {
 namespace {
@@ -82,34 +83,13 @@ Json headOf(const ScanResult& result, const ScanFacts& facts) {
   };
 }
 
-std::string textOf(const Json& json) {
-  std::string line = jsonLine(json);
-  line.pop_back();
-  return line;
-}
-
-/// An object to which members can be added.
-std::string openTextOf(const Json& json) {
-  std::string text = textOf(json);
-  text.pop_back();
-  return text;
-}
-
-/// Adds a member with a list, whose elements `add` adds, each with what stands before it.
-template <typename Add>
-bool addList(TextParts& parts, const char* key, std::size_t count, const Add& add) {
-  bool isWritten = parts.add(",\"" + std::string(key) + "\":[");
-  for (std::size_t i = 0; i < count && isWritten; ++i) isWritten = add(i, i == 0 ? "" : ",");
-  return isWritten && parts.add("]");
-}
-
 bool addGroup(TextParts& parts, const ScanResult& result, const DuplicateGroup& group) {
   const Json head = {{"size", group.size}, {"wastedBytes", group.wastedBytes}};
   const auto addFile = [&](std::size_t index, const char* comma) {
     const auto place = group.begin + static_cast<std::uint32_t>(index);
-    return parts.add(comma + textOf(jsonOf(result.fileAt(place))));
+    return parts.add(comma + jsonText(jsonOf(result.fileAt(place))));
   };
-  return parts.add(openTextOf(head)) && addList(parts, "files", group.count, addFile) &&
+  return parts.add(openJSONText(head)) && addJSONList(parts, "files", group.count, addFile) &&
          parts.add("}");
 }
 
@@ -119,15 +99,15 @@ bool writeReport(const ScanResult& result, const ScanFacts& facts, std::size_t m
                  const TextWriter& write) {
   TextParts parts(write);
   const auto addFolders = [&](std::size_t index, const char* comma) {
-    return parts.add(comma + textOf(jsonOf(result.folderGroups[index], result)));
+    return parts.add(comma + jsonText(jsonOf(result.folderGroups[index], result)));
   };
   const auto addFiles = [&](std::size_t index, const char* comma) {
     return parts.add(comma) && addGroup(parts, result, result.groups[index]);
   };
-  return parts.add(openTextOf(headOf(result, facts))) &&
-         addList(parts, "folderGroups", std::min(result.folderGroups.size(), maxGroups),
-                 addFolders) &&
-         addList(parts, "groups", std::min(result.groups.size(), maxGroups), addFiles) &&
+  return parts.add(openJSONText(headOf(result, facts))) &&
+         addJSONList(parts, "folderGroups", std::min(result.folderGroups.size(), maxGroups),
+                     addFolders) &&
+         addJSONList(parts, "groups", std::min(result.groups.size(), maxGroups), addFiles) &&
          parts.add("}\n") && parts.flush();
 }
 

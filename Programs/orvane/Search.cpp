@@ -6,7 +6,6 @@
 #include <thread>
 
 #include <Scan/DuplicateFinder.h>
-#include <Scan/FileSystem.h>
 #include <Varnel/Context/Globals.h>
 #include <Varnel/DiskWatch/DiskAccessWatcher.h>
 #include <Varnel/Platform/Ports/Ports.h>
@@ -26,16 +25,12 @@ unsigned maxReaders() {
 
 ScanResult search(const ScanRequest& request, SearchManner manner, ScanObserver& observer,
                   Console& console, ScanControl& control) {
-  using QoS = Varnel::Platform::QualityOfService;
-  const Varnel::DiskAccessWatcher watcher("orvane");
+  const Varnel::DiskAccessWatcher watcher(manner.program);
   ManagedDiskTurns turns({.queue = ManagedDiskTurns::sharedQueue(),
                           .volumes = Varnel::Platform::processPorts().volumeCatalog},
                          manner.qos, maxReaders());
-  const bool isModest = manner.qos == QoS::background || manner.qos == QoS::utility;
   DuplicateFinder finder(
-      {.fileSystem = systemFileSystem(isModest ? CacheUse::traceless : CacheUse::normal),
-       .turns = turns,
-       .observer = observer});
+      {.fileSystem = systemFileSystem(manner.cacheUse), .turns = turns, .observer = observer});
   std::optional<ProgressLine> progress;
   if (manner.showsProgress && isStandardErrorATerminal()) progress.emplace(console, control);
   return finder.find(request, control);

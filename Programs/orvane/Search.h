@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <Scan/FileSystem.h>
 #include <Scan/ScanRequest.h>
 #include <Scan/ScanResult.h>
 #include <Varnel/Platform/Values/QualityOfService.h>
@@ -13,7 +14,9 @@ struct ScanControl;
 
 /// How a search is made.
 struct SearchManner {
+  const char* program = "orvane";  ///< As it is called where all programs' reading is shown.
   Varnel::Platform::QualityOfService qos = Varnel::Platform::QualityOfService::utility;
+  CacheUse cacheUse = CacheUse::traceless;
   bool showsProgress = true;  ///< While standard error is a terminal.
 };
 

@@ -1,15 +1,14 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/ShareCommand.h>
 
-#include <chrono>
+#include <atomic>
 
 #include <Removal/Sharing.h>
-#include <Scan/ScanObserver.h>
+#include <Scan/FileSystem.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
-#include <Varnel/DiskWatch/DiskAccessWatcher.h>
+#include <orvane/ActOnReport.h>
 #include <orvane/Console.h>
-#include <orvane/Interruption.h>
-#include <orvane/ReportSource.h>
+#include <orvane/PeriodicStatus.h>
 #include <orvane/SharingText.h>
 #include <orvane/ShownText.h>
 #include <orvane/StandardStreams.h>
@@ -18,44 +17,30 @@
 namespace Orvane {
 namespace {
 
-/// Makes all steps, with a line of progress on a terminal.
-class Progress final {
- public:
-  explicit Progress(Console& console) : console_(console), isShown_(isStandardErrorATerminal()) {}
-
-  void show(const Sharing& sharing) {
-    if (!isShown_ || Clock::now() < next_) return;
-    console_.showStatus("Sharing: " + std::to_string(sharing.countMade()) + " of " +
-                        counted(sharing.steps().size(), "file", "files") + ", " +
-                        shownSize(sharing.comparedBytes()));
-    next_ = Clock::now() + std::chrono::milliseconds(100);
-  }
-
- private:
-  using Clock = std::chrono::steady_clock;
-
-  Console& console_;
-  const bool isShown_;
-  Clock::time_point next_ = Clock::now();
-};
+void makeAllSteps(Sharing& sharing, Console& console) {
+  PeriodicStatus status(console);
+  const auto text = [&] {
+    return "Sharing: " + std::to_string(sharing.countMade()) + " of " +
+           counted(sharing.steps().size(), "file", "files") + ", " +
+           shownSize(sharing.comparedBytes());
+  };
+  while (sharing.next([&] { status.show(text); })) continue;
+}
 
 }  // namespace
 
 int ShareCommand::run(Console& console) const {
-  auto source = findSource(operands, console);
-  if (!source) return 1;
-  ScanControl control;
-  const Interruption interruption(control.isCancelled);
-  const auto report = reportFrom(*std::move(source), console, control);
-  if (!report) return interruption.signal() != 0 ? 128 + interruption.signal() : 1;
+  return actOnReport(operands, console,
+                     [&](const Report& report, const std::atomic<bool>& shouldStop) {
+                       return share(report, shouldStop, console);
+                     });
+}
 
-  Progress progress(console);
-  const Varnel::DiskAccessWatcher watcher("orvane");
+int ShareCommand::share(const Report& report, const std::atomic<bool>& shouldStop,
+                        Console& console) const {
   Sharing sharing({.fileSystem = systemFileSystem(), .disks = Varnel::DiskAccessManager::shared()},
-                  *report, isTrial ? Sharing::Mode::trial : Sharing::Mode::real,
-                  control.isCancelled);
-  while (sharing.next([&] { progress.show(sharing); })) continue;
-  console.clearStatus();
+                  report, isTrial ? Sharing::Mode::trial : Sharing::Mode::real, shouldStop);
+  makeAllSteps(sharing, console);
 
   const SharingForm form{.columns = isStandardOutputATerminal() ? standardOutputColumns() : 0,
                          .isTrial = isTrial};
@@ -63,7 +48,6 @@ int ShareCommand::run(Console& console) const {
   const bool isWritten = isJSON ? writeJSON(sharing, write)
                                 : writeText(sharing, form, write) &&
                                       write(wrapped(summaryOf(sharing, form), form.columns));
-  if (interruption.signal() != 0) return 128 + interruption.signal();
   if (!isWritten) return 1;
   const SharingTotals totals = sharing.totals();
   if (!totals.isSupported) {

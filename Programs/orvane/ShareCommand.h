@@ -1,12 +1,14 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <atomic>
 #include <string>
 #include <vector>
 
 namespace Orvane {
 
 class Console;
+struct Report;
 
 /// `orvane share`: lets the duplicates of a report lie in the same place of their disk.
 struct ShareCommand {
@@ -16,6 +18,10 @@ struct ShareCommand {
 
   /// Runs the command and returns the program's exit status.
   [[nodiscard]] int run(Console& console) const;
+
+ private:
+  [[nodiscard]] int share(const Report& report, const std::atomic<bool>& shouldStop,
+                          Console& console) const;
 };
 
 }  // namespace Orvane

@@ -1,25 +1,20 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/SharingText.h>
 
-#include <algorithm>
-#include <map>
 #include <nlohmann/json.hpp>
 #include <string_view>
 
 #include <Removal/Sharing.h>
 #include <orvane/JSONLine.h>
+#include <orvane/JSONList.h>
 #include <orvane/ShownText.h>
+#include <orvane/StepText.h>
 #include <orvane/TextColumns.h>
 
 namespace Orvane {
 namespace {
 
 using Outcome = SharingStep::Outcome;
-
-struct Wording {
-  const char* word;         ///< Behind a path, and in JSON.
-  const char* explanation;  ///< Behind a count of files that stay as they are.
-};
 
 Wording wordingOf(Outcome outcome) {
   switch (outcome) {
@@ -72,10 +67,6 @@ std::string lineOf(const SharingStep& step, const std::string& path, std::size_t
   return line + mark + "\n";
 }
 
-bool isLastOfGroup(const Sharing& sharing, const SharingStep& step) {
-  return &step == &sharing.steps().back() || (&step)[1].group != step.group;
-}
-
 nlohmann::ordered_json jsonOf(const Sharing& sharing, const SharingStep& step) {
   nlohmann::ordered_json json;
   addPath(json, "path", "url", sharing.pathOf(step));
@@ -89,9 +80,10 @@ nlohmann::ordered_json jsonOf(const Sharing& sharing, const SharingStep& step) {
 
 bool writeText(const Sharing& sharing, SharingForm form, const TextWriter& write) {
   TextParts parts(write);
-  for (const SharingStep& step : sharing.steps()) {
-    if (!parts.add(lineOf(step, shownPath(sharing.pathOf(step)), form.columns))) return false;
-    if (isLastOfGroup(sharing, step) && !parts.add("\n")) return false;
+  for (const auto group : groupsOf(sharing.steps(), &SharingStep::group)) {
+    for (const SharingStep& step : group)
+      if (!parts.add(lineOf(step, shownPath(sharing.pathOf(step)), form.columns))) return false;
+    if (!parts.add("\n")) return false;
   }
   return parts.flush();
 }
@@ -103,42 +95,25 @@ std::string summaryOf(const Sharing& sharing, SharingForm form) {
                                   : counted(totals.shared, "file is", "files are") + " shared now";
   if (totals.freedBytes > 0) text += ": " + size + (form.isTrial ? " would be free" : " are free");
   text += "\n";
-  std::map<Outcome, std::uint64_t> counts;
-  for (const SharingStep& step : sharing.steps()) ++counts[step.outcome];
-  for (const auto& [outcome, number] : counts)
-    if (const std::string_view why = wordingOf(outcome).explanation; !why.empty())
-      text += counted(number, "file stays as it is", "files stay as they are") + ": " +
-              std::string(why) + "\n";
-  return text;
+  return text + explanationsOf(sharing.steps(), wordingOf, "file stays as it is",
+                               "files stay as they are");
 }
 
 bool writeJSON(const Sharing& sharing, const TextWriter& write) {
   const SharingTotals totals = sharing.totals();
   using Json = nlohmann::ordered_json;
-  std::string head = jsonLine({{"schemaVersion", schemaVersion},
-                               {"planned", totals.planned},
-                               {"shared", totals.shared},
-                               {"sharedBefore", totals.alreadyShared},
-                               {"notShared", totals.notShared},
-                               {"freedBytes", totals.freedBytes},
-                               {"groups", Json::array()}});
-  const std::string_view tail = "]}\n";
-  head.resize(head.size() - tail.size());
+  const Json head = {{"schemaVersion", schemaVersion}, {"planned", totals.planned},
+                     {"shared", totals.shared},        {"sharedBefore", totals.alreadyShared},
+                     {"notShared", totals.notShared},  {"freedBytes", totals.freedBytes}};
   TextParts parts(write);
-  if (!parts.add(head)) return false;
-  Json group;
-  std::string_view separator;
-  for (const SharingStep& step : sharing.steps()) {
-    if (group.empty()) group["size"] = sharing.sizeOf(step);
-    group["files"].push_back(jsonOf(sharing, step));
-    if (!isLastOfGroup(sharing, step)) continue;
-    std::string text = jsonLine(group);
-    text.pop_back();  // The end of the line.
-    if (!parts.add(std::string(separator) + text)) return false;
-    separator = ",";
-    group.clear();
-  }
-  return parts.add(tail) && parts.flush();
+  const auto groups = groupsOf(sharing.steps(), &SharingStep::group);
+  const auto add = [&](std::size_t index, const char* comma) {
+    Json json = {{"size", sharing.sizeOf(groups[index].front())}};
+    for (const SharingStep& step : groups[index]) json["files"].push_back(jsonOf(sharing, step));
+    return parts.add(comma + jsonText(json));
+  };
+  return parts.add(openJSONText(head)) && addJSONList(parts, "groups", groups.size(), add) &&
+         parts.add("}\n") && parts.flush();
 }
 
 }  // namespace Orvane

@@ -27,12 +27,27 @@ std::string shownPath(const std::string& path) {
   return Varnel::Platform::visibleText(Varnel::QNURLResolver::shared().abbreviatedPath(path));
 }
 
+namespace {
+
+/// Where the first word ends. A quote that closes has punctuation behind it, if anything: others
+/// belong to what is quoted.
+std::size_t endOfWord(std::string_view text) {
+  std::size_t end = 0;
+  if (text.starts_with('"')) do
+      end = text.find('"', end + 1);
+    while (end != text.npos && end + 1 < text.size() &&
+           std::string_view(" \n,:;.)").find(text[end + 1]) == text.npos);
+  return std::min(text.find_first_of(" \n", end), text.size());
+}
+
+}  // namespace
+
 std::string wrapped(std::string_view text, std::size_t columns) {
   if (columns == 0) return std::string(text);
   std::string lines;
   std::size_t column = 0;
   while (!text.empty()) {
-    const std::size_t length = std::min(text.find_first_of(" \n"), text.size());
+    const std::size_t length = endOfWord(text);
     const std::string_view word = text.substr(0, length);
     const std::size_t width = columnsOf(word);
     if (column > 0) {

@@ -20,7 +20,8 @@ namespace Orvane {
 [[nodiscard]] std::string shownPath(const std::string& path);
 
 /// The text in lines of at most so many columns, broken between words: 0 where they may be of any
-/// length. A longer word has a line of its own.
+/// length. A longer word has a line of its own. What stands in quotes, as a path with blanks, is
+/// one word.
 [[nodiscard]] std::string wrapped(std::string_view text, std::size_t columns);
 
 }  // namespace Orvane

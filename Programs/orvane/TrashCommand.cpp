@@ -1,20 +1,18 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/TrashCommand.h>
 
-#include <chrono>
+#include <atomic>
 #include <string>
 
 #include <Removal/DpkgFiles.h>
 #include <Removal/Removal.h>
 #include <Scan/FileSystem.h>
-#include <Scan/ScanObserver.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
-#include <Varnel/DiskWatch/DiskAccessWatcher.h>
 #include <Varnel/Platform/Ports/Ports.h>
+#include <orvane/ActOnReport.h>
 #include <orvane/Console.h>
-#include <orvane/Interruption.h>
+#include <orvane/PeriodicStatus.h>
 #include <orvane/RemovalText.h>
-#include <orvane/ReportSource.h>
 #include <orvane/ShownText.h>
 #include <orvane/StandardStreams.h>
 
@@ -46,56 +44,52 @@ int fail(const Removal::Problem& problem, Console& console) {
 }
 
 void move(Removal& removal, Console& console) {
-  using Clock = std::chrono::steady_clock;
-  constexpr std::chrono::milliseconds period(100);
+  PeriodicStatus status(console);
   const std::string of = " of " + counted(removal.steps().size(), "file", "files");
-  std::size_t done = 0;
-  Clock::time_point next = Clock::now() + period;
-  while (const RemovalStep* step = removal.next()) {
-    done = static_cast<std::size_t>(step - removal.steps().data()) + 1;
-    if (Clock::now() < next || !isStandardErrorATerminal()) continue;
-    console.showStatus("Moving to the trash: " + std::to_string(done) + of);
-    next = Clock::now() + period;
-  }
-  console.clearStatus();
+  while (const RemovalStep* step = removal.next())
+    status.show([&] {
+      return "Moving to the trash: " + std::to_string(step - removal.steps().data() + 1) + of;
+    });
 }
 
 }  // namespace
 
 int TrashCommand::run(Console& console) const {
-  auto source = findSource(operands, console);
-  if (!source) return 1;
-  ScanControl control;
-  const Interruption interruption(control.isCancelled);
-  const auto report = reportFrom(*std::move(source), console, control);
-  if (!report) return interruption.signal() != 0 ? 128 + interruption.signal() : 1;
+  return actOnReport(operands, console,
+                     [&](const Report& report, const std::atomic<bool>& shouldStop) {
+                       return moveOrShow(report, shouldStop, console);
+                     });
+}
+
+int TrashCommand::moveOrShow(const Report& report, const std::atomic<bool>& shouldStop,
+                             Console& console) const {
   const Varnel::Platform::Ports& ports = Varnel::Platform::processPorts();
   const Selection selection = select(
-      *report, keep, [&](const std::string& path) { return ports.trash.get().isInTrash(path); });
+      report, keep, [&](const std::string& path) { return ports.trash.get().isInTrash(path); });
 
   RemovalJournal journal({ports.privateFiles, ports.systemLog}, RemovalJournal::productPath());
   DpkgFiles packagedFiles;
-  const Varnel::DiskAccessWatcher watcher("orvane");
   Removal removal({.fileSystem = systemFileSystem(CacheUse::traceless),
                    .disks = Varnel::DiskAccessManager::shared(),
                    .trash = ports.trash,
                    .packagedFiles = packagedFiles,
                    .journal = journal,
                    .clock = ports.clock},
-                  *report, selection,
+                  report, selection,
                   {.hiddenFolders = allowsHiddenFolders,
                    .otherFileSystems = allowsOtherFileSystems,
                    .packagedFiles = allowsPackagedFiles,
                    .hardLinks = allowsHardLinks},
-                  control.isCancelled);
+                  shouldStop);
   if (const auto problem = removal.prepare()) return fail(*problem, console);
-  if (moves && !control.isCancelled && removal.totals().planned > 0) {
+  const bool isMade = moves && !shouldStop;
+  if (isMade && removal.totals().planned > 0) {
     if (const auto problem = removal.begin()) return fail(*problem, console);
     move(removal, console);
   }
 
   const RemovalForm form{.columns = isStandardOutputATerminal() ? standardOutputColumns() : 0,
-                         .isMade = moves};
+                         .isMade = isMade};
   const auto write = [&](std::string_view text) { return console.writeResult(text); };
   bool isWritten =
       isJSON ? writeJSON(removal, selection, write) : writeText(removal, selection, form, write);
@@ -107,7 +101,6 @@ int TrashCommand::run(Console& console) const {
       summary += "\"orvane restore " + std::to_string(removal.number()) + "\" gives them back\n";
     isWritten = console.writeResult(wrapped(summary, form.columns));
   }
-  if (interruption.signal() != 0) return 128 + interruption.signal();
   if (!isWritten) return 1;
   return moves && totals.notMoved > 0 ? someNotMoved : 0;
 }

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <atomic>
 #include <string>
 #include <vector>
 
@@ -9,6 +10,7 @@
 namespace Orvane {
 
 class Console;
+struct Report;
 
 /// `orvane trash`: moves the duplicates of a report to the trash, but for one of each group.
 struct TrashCommand {
@@ -23,6 +25,10 @@ struct TrashCommand {
 
   /// Runs the command and returns the program's exit status.
   [[nodiscard]] int run(Console& console) const;
+
+ private:
+  [[nodiscard]] int moveOrShow(const Report& report, const std::atomic<bool>& shouldStop,
+                               Console& console) const;
 };
 
 /// The exit status of commands that left files alone because of what they met.

@@ -35,7 +35,7 @@ class DurableFileTest : public testing::TestWithParam<Journal> {
     EXPECT_FALSE(database->execute("PRAGMA wal_checkpoint(TRUNCATE)"));
   }
 
-  TemporaryFolder folder_;
+  TemporaryFolder folder_ = TemporaryFolder::inMemory();
   const fs::path path_ = folder_.path() / "state" / "notes.sqlite";
 };
 

@@ -315,6 +315,9 @@ TEST_F(Orvane, ShowsProgressAndEmphasisOnTerminalsAlone) {
   EXPECT_THAT(onTerminal("scan --progress --no-progress " + folder.path()), Not(HasSubstr("\x1b")));
   EXPECT_THAT(onTerminal(scan + " 2>errors"), Not(HasSubstr("\x1b")));
   EXPECT_THAT(run({"scan", "-p", folder.path()}).errors, IsEmpty());
+  EXPECT_THAT(onTerminal("scan \"a\\\"b path with blanks, no end\""),
+              HasSubstr("orvane: cannot scan\r\n\"a\"b path with blanks, no end\":\r\n"
+                        "No such file or directory\r\n"));
   folder.write("b", "same");
   EXPECT_THAT(
       onTerminal("trash --keep oldest " + folder.path()),

@@ -54,7 +54,7 @@ auto timesOf(const std::string& path) {
 TEST_F(SharedFiles, LieInOnePlace) {
   if (!obstacleToMounts.empty()) GTEST_SKIP() << obstacleToMounts;
   unsigned tried = 0;
-  const Varnel::Tests::TemporaryFolder images;
+  const auto images = Varnel::Tests::TemporaryFolder::inMemory();
   const std::string mounted = path("mounted");
   fs::create_directories(mounted);
   for (const auto& kind : {Varnel::Tests::DiskImage::xfs(), Varnel::Tests::DiskImage::btrfs()}) {
@@ -72,7 +72,7 @@ TEST_F(SharedFiles, LieInOnePlace) {
       // The file system sets some space aside for what may follow.
       std::ofstream(path(name), std::ios::app) << content.substr(part);
     }
-    ::sync();
+    Varnel::Tests::synchronise(mounted);
     found.groups.clear();
     report(all);
     found.groups[0].files[2].isReference = true;
@@ -102,7 +102,7 @@ TEST_F(SharedFiles, LieInOnePlace) {
     EXPECT_THAT(shareAll(), ElementsAre(source, different));
     EXPECT_TRUE(bytes(path("mounted/c")) == content.substr(1) + "y");
     write("mounted/c", content);
-    ::sync();
+    Varnel::Tests::synchronise(mounted);
     found.groups.clear();
     report({"mounted/a", "mounted/c"});
     EXPECT_EQ(::mount(nullptr, mounted.c_str(), nullptr, MS_REMOUNT | MS_RDONLY, nullptr), 0);

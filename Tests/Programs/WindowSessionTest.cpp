@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 
 #include <deque>
 #include <filesystem>
@@ -11,6 +12,7 @@
 #include <utility>
 #include <vector>
 
+#include <Tests/Programs/ScanFolder.h>
 #include <Varnel/Interface/MainMenuAccessibility.h>
 #include <orvane-window/Model/Background.h>
 #include <orvane-window/Model/Menu.h>
@@ -19,6 +21,7 @@
 namespace Orvane {
 namespace {
 
+namespace fs = std::filesystem;
 using Answer = DuplicateList::Answer;
 using Event = Session::Event;
 using Stage = Session::Stage;
@@ -260,26 +263,37 @@ TEST_F(SessionFixture, NeitherARuleNorAPlanKeepsWhatLiesInATrash) {
 
 TEST_F(SessionFixture, ExportsItsReportAndTheChosenFilesOrLeavesWhatIsThere) {
   scan();
-  const auto folder = std::filesystem::path(testing::TempDir()) / "orvane-export";
-  std::filesystem::create_directories(folder / "taken" / "full");
-  const auto exported = [&](const char* name, Session::ExportKind kind) {
-    session->exportTo(folder / name, kind);
-    background.run();
-    EXPECT_EQ(session->stage(), Stage::results);
-    std::ifstream file(folder / name);
+  const Testing::ScanFolder folder;
+  folder.write("all.part", "somebody else's");
+  folder.write("taken/full", "");
+  fs::permissions(folder.write("private", "before"),
+                  fs::perms::owner_read | fs::perms::owner_write);
+  fs::create_symlink("private", folder.path("all"));
+  ASSERT_EQ(::mkfifo(folder.path("pipe").c_str(), 0600), 0);
+  const auto textOf = [&](const char* name) {
+    std::ifstream file(folder.path(name));
     return std::string(std::istreambuf_iterator<char>(file), {});
   };
-  EXPECT_EQ(exported("all", Session::ExportKind::scanReport), "{}");
+  const auto exportTo = [&](const char* name, Session::ExportKind kind) {
+    session->exportTo(folder.path(name), kind);
+    background.run();
+    EXPECT_EQ(session->stage(), Stage::results);
+    return session->exportFailure();
+  };
+  EXPECT_FALSE(exportTo("all", Session::ExportKind::scanReport));
+  EXPECT_EQ(textOf("private"), "{}");
+  EXPECT_EQ(fs::status(folder.path("private")).permissions(), fs::perms(0600));
   session->choose({0, 0}, true);
   session->choose({0, 1}, true);
-  EXPECT_EQ(exported("chosen", Session::ExportKind::chosenFiles), "/a\n/b\n");
-  EXPECT_FALSE(session->exportFailure());
-  session->exportTo(folder / "taken", Session::ExportKind::chosenFiles);
-  background.run();
-  EXPECT_TRUE(session->exportFailure());
-  EXPECT_TRUE(std::filesystem::exists(folder / "taken" / "full"));
-  EXPECT_EQ(std::distance(std::filesystem::directory_iterator(folder), {}), 3);
-  std::filesystem::remove_all(folder);
+  EXPECT_FALSE(exportTo("chosen", Session::ExportKind::chosenFiles));
+  EXPECT_EQ(textOf("chosen"), "/a\n/b\n");
+  for (const char* name : {"taken", "pipe", "taken/full/file"})
+    EXPECT_TRUE(exportTo(name, Session::ExportKind::chosenFiles)) << name;
+  const TextSource broken = [](const TextWriter& write) { return write("half") && false; };
+  EXPECT_EQ(writeFile(folder.path("chosen"), broken), std::errc::io_error);
+  EXPECT_EQ(textOf("chosen"), "/a\n/b\n");
+  EXPECT_EQ(textOf("all.part"), "somebody else's");
+  EXPECT_EQ(std::distance(fs::directory_iterator(folder.path()), {}), 6) << "something was left";
 
   const DuplicateList odd(std::make_shared<const Report>(
       Report{.groups = {{1, {file("/a\nb"), file("/\xff"), file("/plain")}}}}));

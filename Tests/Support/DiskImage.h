@@ -5,6 +5,7 @@
 #include <linux/loop.h>
 #include <sys/ioctl.h>
 #include <sys/mount.h>
+#include <unistd.h>
 
 #include <cstdint>
 #include <cstdlib>
@@ -16,6 +17,13 @@
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
 
 namespace Varnel::Tests {
+
+/// Gives what was written in the folder's file system its places there, and waits for no other.
+inline void synchronise(const std::filesystem::path& folder) {
+  const Platform::POSIX::FileDescriptor opened(
+      ::open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+  ::syncfs(opened.get());
+}
 
 /// A file system in a file, behind a loop device that is detached when the last user has gone.
 class DiskImage final {

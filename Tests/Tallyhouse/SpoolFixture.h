@@ -70,7 +70,7 @@ class SpoolFixture : public testing::Test {
   /// What a process finds that opens the spool now.
   std::string names() { return namesOf(*openSpool()); }
 
-  Varnel::Tests::TemporaryFolder folder;
+  Varnel::Tests::TemporaryFolder folder = Varnel::Tests::TemporaryFolder::inMemory();
   std::unique_ptr<Varnel::Platform::PrivateFiles> files =
       Varnel::Platform::POSIX::makePrivateFiles();
   Varnel::Platform::Testing::CapturedSystemLog log;

@@ -46,8 +46,23 @@ void await(const std::shared_ptr<Gtk::Dialog>& dialog, std::function<void(int)> 
   dialog->show();
 }
 
-void addButton(Gtk::Dialog& dialog, const char* textKey, int response, const char* identifier) {
+void addButton(Gtk::Dialog& dialog, const char* textKey, int response,
+               const std::string& identifier) {
   identify(*dialog.add_button(localized(textKey), response), identifier);
+}
+
+std::shared_ptr<Gtk::FileChooserDialog> fileChooser(Gtk::Window& parent, const char* titleKey,
+                                                    Gtk::FileChooserAction action,
+                                                    const std::string& identifier,
+                                                    const char* acceptKey, const char* acceptName) {
+  auto dialog = std::make_shared<Gtk::FileChooserDialog>(
+      parent, localized(titleKey), action, Gtk::DIALOG_MODAL | Gtk::DIALOG_USE_HEADER_BAR);
+  identify(*dialog, identifier);
+  addButton(*dialog, "Cancel", Gtk::RESPONSE_CANCEL, identifier + ".cancel");
+  addButton(*dialog, acceptKey, Gtk::RESPONSE_ACCEPT, identifier + acceptName);
+  dialog->set_default_response(Gtk::RESPONSE_ACCEPT);
+  dialog->set_current_folder(Glib::get_home_dir());
+  return dialog;
 }
 
 }  // namespace
@@ -116,15 +131,9 @@ void showDetails(Gtk::Window& parent, const std::vector<MoveOutcome::Left>& left
 
 void chooseFolders(Gtk::Window& parent,
                    std::function<void(const std::vector<std::string>&)> chosen) {
-  const auto dialog = std::make_shared<Gtk::FileChooserDialog>(
-      parent, localized("ChooseFolders"), Gtk::FILE_CHOOSER_ACTION_SELECT_FOLDER,
-      Gtk::DIALOG_MODAL | Gtk::DIALOG_USE_HEADER_BAR);
-  identify(*dialog, "choose-folders");
-  addButton(*dialog, "Cancel", Gtk::RESPONSE_CANCEL, "choose-folders.cancel");
-  addButton(*dialog, "Choose", Gtk::RESPONSE_ACCEPT, "choose-folders.choose");
-  dialog->set_default_response(Gtk::RESPONSE_ACCEPT);
+  const auto dialog = fileChooser(parent, "ChooseFolders", Gtk::FILE_CHOOSER_ACTION_SELECT_FOLDER,
+                                  "choose-folders", "Choose", ".choose");
   dialog->set_select_multiple(true);
-  dialog->set_current_folder(Glib::get_home_dir());
   await(dialog, [dialog = dialog.get(), chosen = std::move(chosen)](int response) {
     if (response != Gtk::RESPONSE_ACCEPT) return;
     const auto names = dialog->get_filenames();
@@ -134,15 +143,9 @@ void chooseFolders(Gtk::Window& parent,
 
 void chooseFile(Gtk::Window& parent, const std::string& suggestedName,
                 std::function<void(const std::string&)> chosen) {
-  const auto dialog = std::make_shared<Gtk::FileChooserDialog>(
-      parent, localized("ExportTitle"), Gtk::FILE_CHOOSER_ACTION_SAVE,
-      Gtk::DIALOG_MODAL | Gtk::DIALOG_USE_HEADER_BAR);
-  identify(*dialog, "choose-file");
-  addButton(*dialog, "Cancel", Gtk::RESPONSE_CANCEL, "choose-file.cancel");
-  addButton(*dialog, "Save", Gtk::RESPONSE_ACCEPT, "choose-file.save");
-  dialog->set_default_response(Gtk::RESPONSE_ACCEPT);
+  const auto dialog = fileChooser(parent, "ExportTitle", Gtk::FILE_CHOOSER_ACTION_SAVE,
+                                  "choose-file", "Save", ".save");
   dialog->set_do_overwrite_confirmation();
-  dialog->set_current_folder(Glib::get_home_dir());
   dialog->set_current_name(suggestedName);
   await(dialog, [dialog = dialog.get(), chosen = std::move(chosen)](int response) {
     if (response == Gtk::RESPONSE_ACCEPT && !dialog->get_filename().empty())

@@ -130,8 +130,7 @@ void ResultsPage::showList(const Session& session) {
   const auto shown = session.list();
   const DuplicateList& list = *shown;
   const bool isEmpty = list.report()->groups.empty();
-  const std::string files =
-      countText(session.outcome().totals.files - session.outcome().leftOutFiles());
+  const std::string files = countText(session.outcome().lookedAtFiles());
   title_.set_text(localized("Results_Title", {sizeText(list.duplicates().bytes)}));
   detail_.set_text(localized("Results_Detail", {countText(list.report()->groups.size()),
                                                 countText(list.duplicates().files), files}));

@@ -38,6 +38,11 @@ struct ScanOutcome {
   [[nodiscard]] std::uint64_t leftOutFiles() const {
     return totals.unreadableFiles + totals.vanishedFiles + totals.changedFiles;
   }
+
+  /// Files that were found, and could be and were looked at.
+  [[nodiscard]] std::uint64_t lookedAtFiles() const {
+    return totals.files - leftOutFiles() - totals.unreachedFiles;
+  }
 };
 
 /// What has become of the files that were to be moved.

@@ -14,8 +14,8 @@ class DuplicateList;
 /// Writes a text part by part; false when a part could not be written.
 using TextSource = std::function<bool(const TextWriter&)>;
 
-/// Puts a file with the text into its place, where nothing changes before all is written. Any
-/// thread.
+/// Puts a file with the text into its place, where nothing changes before all is written, and
+/// leaves everything beside it alone. One that it replaces gives it its permissions. Any thread.
 [[nodiscard]] std::error_code writeFile(const std::string& path, const TextSource& source);
 
 /// The paths of the chosen files, a line each. One that is no line of text, for its bytes or a line

@@ -1,29 +1,24 @@
 // SPDX-License-Identifier: MIT
 #include <orvane-window/Model/SystemEngine.h>
 
-#include <algorithm>
 #include <chrono>
 #include <filesystem>
 #include <limits>
-#include <thread>
 #include <utility>
 
 #include <Removal/DpkgFiles.h>
 #include <Removal/RemovalJournal.h>
-#include <Scan/DuplicateFinder.h>
 #include <Scan/FileSystem.h>
 #include <Scan/ScanRequest.h>
-#include <Varnel/Context/Globals.h>
 #include <Varnel/DiskAccess/DiskAccessManager.h>
-#include <Varnel/DiskWatch/DiskAccessWatcher.h>
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <orvane-window/Model/MoveReasons.h>
 #include <orvane-window/Model/Texts.h>
-#include <orvane/ManagedDiskTurns.h>
 #include <orvane/ScanAnalytics.h>
 #include <orvane/ScanLog.h>
 #include <orvane/ScanReport.h>
+#include <orvane/Search.h>
 
 namespace Orvane {
 namespace {
@@ -45,11 +40,6 @@ std::vector<std::string> resolved(const std::vector<std::string>& folders,
       paths.push_back(path.string());
   }
   return paths;
-}
-
-unsigned maxReaders() {
-  const unsigned cores = std::thread::hardware_concurrency();
-  return std::max(2u, Varnel::Globals::canUseAllCores() ? cores : cores / 2);
 }
 
 std::unique_ptr<RemovalJournal> productJournal() {
@@ -160,13 +150,11 @@ ScanOutcome SystemEngine::scan(ScanRequest request, ScanControl& control) {
   analytics_ = std::make_unique<ScanAnalytics>(analyticsEndpoint_, false, console_);
   analytics_->scanStarted(request.folders.size());
   ScanLog log(console_);
-  const Varnel::DiskAccessWatcher watcher("orvane-window");
-  ManagedDiskTurns turns(
-      {.queue = ManagedDiskTurns::sharedQueue(), .volumes = processPorts().volumeCatalog},
-      Varnel::Platform::QualityOfService::userInitiated, maxReaders());
-  DuplicateFinder finder(
-      {.fileSystem = systemFileSystem(CacheUse::traceless), .turns = turns, .observer = log});
-  const auto result = std::make_shared<const ScanResult>(finder.find(request, control));
+  const SearchManner manner{.program = "orvane-window",
+                            .qos = Varnel::Platform::QualityOfService::userInitiated,
+                            .showsProgress = false};
+  const auto result =
+      std::make_shared<const ScanResult>(search(request, manner, log, console_, control));
   outcome.lostFolders = result->lostFolders;
   outcome.totals = result->totals;
   if (!outcome.lostFolders.empty()) return outcome;

@@ -1,14 +1,17 @@
 // SPDX-License-Identifier: MIT
-#include <orvane/ReportSource.h>
+#include <orvane/ActOnReport.h>
 
 #include <cerrno>
 #include <filesystem>
 #include <fstream>
 #include <iostream>
 #include <utility>
+#include <variant>
 
 #include <Scan/ScanObserver.h>
+#include <Varnel/DiskWatch/DiskAccessWatcher.h>
 #include <orvane/Console.h>
+#include <orvane/Interruption.h>
 #include <orvane/ScanChoice.h>
 #include <orvane/ScanLog.h>
 #include <orvane/Search.h>
@@ -17,6 +20,9 @@ namespace Orvane {
 namespace {
 
 namespace fs = std::filesystem;
+
+/// A report, or what is to be scanned for one.
+using ReportSource = std::variant<Report, ScanRequest>;
 
 std::optional<Report> read(std::istream& text, const std::string& name, Console& console) {
   auto report = readReport(text);
@@ -48,8 +54,7 @@ std::optional<ReportSource> sourceOf(std::optional<Source> found) {
   return *std::move(found);
 }
 
-}  // namespace
-
+/// None after a complaint. Looks up and reads, which may take for ever.
 std::optional<ReportSource> findSource(const std::vector<std::string>& operands, Console& console) {
   const std::string& name = operands.front();
   std::error_code ignored;
@@ -67,9 +72,25 @@ std::optional<ReportSource> findSource(const std::vector<std::string>& operands,
   return std::nullopt;
 }
 
+/// None after a complaint, or once `control` asks to stop.
 std::optional<Report> reportFrom(ReportSource source, Console& console, ScanControl& control) {
   if (auto* report = std::get_if<Report>(&source)) return std::move(*report);
   return scan(std::get<ScanRequest>(source), console, control);
+}
+
+}  // namespace
+
+int actOnReport(const std::vector<std::string>& operands, Console& console, const ReportAct& act) {
+  auto source = findSource(operands, console);
+  if (!source) return 1;
+  ScanControl control;
+  const Interruption interruption(control.isCancelled);
+  int status = 1;
+  if (const auto report = reportFrom(*std::move(source), console, control)) {
+    const Varnel::DiskAccessWatcher watcher("orvane");
+    status = act(*report, control.isCancelled);
+  }
+  return interruption.signal() != 0 ? 128 + interruption.signal() : status;
 }
 
 }  // namespace Orvane
