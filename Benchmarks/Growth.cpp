@@ -321,20 +321,25 @@ void plot(Drawing& drawing, const Curve& curve, double exponent, Drawing::Point 
     const Drawing::Point place = at(left, y);
     drawing.text({place.x - 5, place.y + 4}, timeText(std::pow(10, y)), Drawing::Anchor::end);
   }
+  const auto label = [&](double x) {
+    const Drawing::Point place = at(x, bottom);
+    drawing.text({place.x, place.y + 20}, countText(std::round(std::pow(10, x))),
+                 Drawing::Anchor::middle);
+  };
   for (double x = std::ceil(left); x <= right; ++x) {
     drawing.line({at(x, bottom), at(x, top)}, Drawing::grid);
-    const Drawing::Point place = at(x, bottom);
-    drawing.text({place.x, place.y + 20}, countText(std::pow(10, x)), Drawing::Anchor::middle);
+    label(x);
   }
+  if (right > std::floor(right)) label(right);
   drawing.text({topLeft.x + width, topLeft.y + height + 38}, curve.subject.of,
                Drawing::Anchor::end);
   drawing.line({at(left, top), at(left, bottom), at(right, bottom)}, Drawing::axis);
 
-  // What is to be expected, through the last point and as far as there is room.
+  // What is to be expected: the first cost for all, or growth to the last as far as there is room.
   const double slope = curve.subject.expected;
-  const double last = std::log10(points.back().y);
-  const double begin = slope > 0 ? std::max(left, right - (last - bottom) / slope) : left;
-  drawing.line({at(begin, last - slope * (right - begin)), at(right, last)}, Drawing::comparison);
+  const double end = std::log10(slope > 0 ? points.back().y : points.front().y);
+  const double begin = slope > 0 ? std::max(left, right - (end - bottom) / slope) : left;
+  drawing.line({at(begin, end - slope * (right - begin)), at(right, end)}, Drawing::comparison);
   std::vector<Drawing::Point> line;
   for (const auto& [count, cost] : points) line.push_back(at(std::log10(count), std::log10(cost)));
   drawing.line(line, Drawing::curve);
