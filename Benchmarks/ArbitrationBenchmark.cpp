@@ -267,8 +267,8 @@ void compareUrgentReaders(Managed& managed) {
     append(comparison.ours, urgentWaits(managed, 60));
     append(comparison.standIn, urgentWaits(standIn, 60));
   }
-  comparison.report("urgent reader's wait / strict hand-over, p50", 0.5, 0.25);
-  comparison.report("urgent reader's wait / strict hand-over, p99", 0.99, 0.4);
+  comparison.report("urgent reader's wait, p50 / strict hand-over", 0.5, 0.25);
+  comparison.report("urgent reader's wait, p99 / strict hand-over", 0.99, 0.4);
 }
 
 /// From the release of a place until the thread that slept for it has it.
@@ -295,8 +295,8 @@ void compareHandOver(Managed& managed) {
   Comparison comparison;
   comparison.measure(
       4000, [&] { return handOver(managed); }, [&] { return handOver(standIn); });
-  comparison.report("hand-over to a sleeping waiter / mutex + semaphore, p50", 0.5, 1.0);
-  comparison.report("hand-over to a sleeping waiter / mutex + semaphore, p99", 0.99, 1.1);
+  comparison.report("hand-over to a sleeping waiter, p50 / mutex + semaphore", 0.5, 1.0);
+  comparison.report("hand-over to a sleeping waiter, p99 / mutex + semaphore", 0.99, 1.1);
 }
 
 }  // namespace
