@@ -1,15 +1,15 @@
 // SPDX-License-Identifier: MIT
 // The caller's time for `trackEvent` with eight dimensions, beside the bare insertion of the same
-// row with the same durability. The server is not there, so that nothing else touches the spool.
+// row with the same durability, and while the file is locked. The server is not there, so that
+// nothing else touches the spool.
 #include <sqlite3.h>
 
-#include <algorithm>
 #include <chrono>
 #include <cstdlib>
 #include <filesystem>
-#include <functional>
 #include <vector>
 
+#include <Benchmarks/Measurements.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/PrivateFiles.h>
@@ -18,11 +18,11 @@
 #include <Varnel/Tallyhouse/AnalyticsTracker.h>
 #include <Varnel/Tallyhouse/MeasurementProtocol.h>
 #include <Varnel/Tallyhouse/SpoolingTransport.h>
-#include <fmt/format.h>
 
 namespace {
 
 namespace fs = std::filesystem;
+using namespace Varnel::Benchmarks;
 using namespace Varnel::Platform;
 
 // Rounds shorter than a time slice, so that the median knows nothing of other programs.
@@ -31,20 +31,6 @@ constexpr int repetitions = 25;
 
 const Tallyhouse::CustomDimensions dimensions = {
     "1234567890.1456789012", std::nullopt, "13.0", "3", "12", "40", "1000001", "null"};
-
-// Microseconds a call.
-double timeOf(const std::function<void()>& operation) {
-  using Clock = std::chrono::steady_clock;
-  const auto start = Clock::now();
-  for (int i = 0; i < repetitions; ++i) operation();
-  const std::chrono::duration<double, std::micro> taken = Clock::now() - start;
-  return taken.count() / repetitions;
-}
-
-double median(std::vector<double> values) {
-  std::nth_element(values.begin(), values.begin() + rounds / 2, values.end());
-  return values[rounds / 2];
-}
 
 void require(int status) {
   if (status != SQLITE_OK && status != SQLITE_DONE) std::abort();
@@ -96,6 +82,21 @@ class BareInsertion {
   std::string hit_;
 };
 
+// Holds the file's lock, as another process would.
+class OtherProcess {
+ public:
+  explicit OtherProcess(const fs::path& path) {
+    require(::sqlite3_open(path.c_str(), &database_));
+    require(::sqlite3_exec(database_, "BEGIN IMMEDIATE", nullptr, nullptr, nullptr));
+  }
+  ~OtherProcess() { ::sqlite3_close(database_); }
+  OtherProcess(const OtherProcess&) = delete;
+  OtherProcess& operator=(const OtherProcess&) = delete;
+
+ private:
+  sqlite3* database_ = nullptr;
+};
+
 }  // namespace
 
 int main() {
@@ -120,16 +121,18 @@ int main() {
                                            .policy = patient}),
       Tallyhouse::Consent::granted);
   BareInsertion insertion(folder / "bare.db");
-  std::vector<double> ours, bare;
-  for (int round = 0; round < rounds; ++round) {
-    ours.push_back(timeOf([&] {
-      tracker.context()->trackEvent("Scan", "Finished", "Pictures", 12, dimensions, {});
-    }));
-    bare.push_back(timeOf([&] { insertion(); }));
-  }
-  fmt::print("{:40}{:8.2f} µs\n", "trackEvent, eight dimensions", median(ours));
-  fmt::print("{:40}{:8.2f} µs\n", "bare insertion of the same row", median(bare));
-  fmt::print("{:40}{:8.2f}     (goal 1.20)\n", "trackEvent to insertion",
-             median(ours) / median(bare));
+  const auto track = [&] {
+    tracker.context()->trackEvent("Scan", "Finished", "Pictures", 12, dimensions, {});
+  };
+  Comparison comparison;
+  comparison.measure(
+      rounds, [&] { return timeOfOne(repetitions, track); },
+      [&] { return timeOfOne(repetitions, [&] { insertion(); }); });
+  comparison.report("trackEvent, eight dimensions / bare insertion", 0.5, 1.2);
+
+  const OtherProcess other(folder / "Analytics.db");
+  std::vector<Nanoseconds> waits;
+  for (int i = 0; i < repetitions; ++i) waits.push_back(timeOf(track));
+  report("trackEvent, file locked by others, worst / 20 ms", percentile(waits, 1), 20e6, 1.0);
   fs::remove_all(folder);
 }

@@ -177,15 +177,8 @@ class Managed final {
   std::shared_ptr<DiskData> disk_;
 };
 
-/// How long one of very many calls takes. A round of them is over before others want the processor.
-template <typename Function>
-Nanoseconds timeOfOne(Function&& function) {
-  constexpr int calls = 5000;
-  return timeOf([&] {
-           for (int i = 0; i < calls; ++i) function();
-         }) /
-         calls;
-}
+// A round of so many is over before others want the processor.
+constexpr int callsARound = 5000;
 
 void compareGrants() {
   const auto queue = std::make_shared<Basalt::SerialQueue>("benchmark");
@@ -198,7 +191,7 @@ void compareGrants() {
   std::size_t allocations = 0;
   const auto grantAndRelease = [&] {
     const std::size_t before = allocationCount();
-    const Nanoseconds time = timeOfOne([&] {
+    const Nanoseconds time = timeOfOne(callsARound, [&] {
       if (queue->sync([&] { return disk->requestAccess(thread, QoS::utility); })) std::abort();
       queue->sync([&] { disk->releaseAccess(thread); });
     });
@@ -206,7 +199,7 @@ void compareGrants() {
     return time;
   };
   const auto lockTwice = [&] {
-    return timeOfOne([&] {
+    return timeOfOne(callsARound, [&] {
       for (int i = 0; i < 2; ++i) {
         const std::lock_guard lock(mutex);
         counter = counter + 1;
@@ -215,51 +208,27 @@ void compareGrants() {
   };
   Comparison comparison;
   comparison.measure(1001, grantAndRelease, lockTwice);
-  comparison.print("grant and release, free disk / two mutex pairs", 0.5, 1.8);
-  std::printf("  allocations: %zu\n", allocations);
-}
-
-/// The time that one of very many calls takes when several threads make them at once.
-template <typename Function>
-Nanoseconds timeOfOneAmong(int threadCount, Function&& function) {
-  using Time = std::chrono::steady_clock::time_point;
-  constexpr int calls = 400'000;
-  std::latch ready(threadCount);
-  std::mutex mutex;
-  Time begin = Time::max();
-  Time end = Time::min();
-  std::vector<std::thread> threads;
-  for (int i = 0; i < threadCount; ++i) {
-    threads.emplace_back([&] {
-      ready.arrive_and_wait();
-      const Time own = std::chrono::steady_clock::now();
-      for (int call = 0; call < calls; ++call) function();
-      const Time now = std::chrono::steady_clock::now();
-      const std::lock_guard lock(mutex);
-      begin = std::min(begin, own);
-      end = std::max(end, now);
-    });
-  }
-  for (std::thread& thread : threads) thread.join();
-  return std::chrono::duration<double, std::nano>(end - begin).count() / (calls * threadCount);
+  comparison.report("grant and release, free disk / two mutex pairs", 0.5, 1.3);
+  if (allocations > 0) fmt::print("  allocations: {}\n", allocations);
 }
 
 void compareContention(int threadCount, const char* what) {
   Basalt::SerialQueue queue("benchmark");
   std::mutex mutex;
   volatile int counter = 0;
+  constexpr int calls = 400'000;
   const auto inQueue = [&] {
-    return timeOfOneAmong(threadCount, [&] { queue.sync([&] { counter = counter + 1; }); });
+    return timeOfOneAmong(threadCount, calls, [&] { queue.sync([&] { counter = counter + 1; }); });
   };
   const auto inMutex = [&] {
-    return timeOfOneAmong(threadCount, [&] {
+    return timeOfOneAmong(threadCount, calls, [&] {
       const std::lock_guard lock(mutex);
       counter = counter + 1;
     });
   };
   Comparison comparison;
   comparison.measure(25, inQueue, inMutex);
-  comparison.print(what, 0.5, 1.5);
+  comparison.report(what, 0.5, 0.8);
 }
 
 /// The waits of an urgent reader that comes again and again to a disk with three background
@@ -298,8 +267,8 @@ void compareUrgentReaders(Managed& managed) {
     append(comparison.ours, urgentWaits(managed, 60));
     append(comparison.standIn, urgentWaits(standIn, 60));
   }
-  comparison.print("urgent reader's wait / strict hand-over, p50", 0.5, 0.3);
-  comparison.print("urgent reader's wait / strict hand-over, p99", 0.99, 0.6);
+  comparison.report("urgent reader's wait, p50 / strict hand-over", 0.5, 0.25);
+  comparison.report("urgent reader's wait, p99 / strict hand-over", 0.99, 0.4);
 }
 
 /// From the release of a place until the thread that slept for it has it.
@@ -326,8 +295,8 @@ void compareHandOver(Managed& managed) {
   Comparison comparison;
   comparison.measure(
       4000, [&] { return handOver(managed); }, [&] { return handOver(standIn); });
-  comparison.print("hand-over to a sleeping waiter / mutex + semaphore, p50", 0.5, 1.0);
-  comparison.print("hand-over to a sleeping waiter / mutex + semaphore, p99", 0.99, 1.1);
+  comparison.report("hand-over to a sleeping waiter, p50 / mutex + semaphore", 0.5, 1.0);
+  comparison.report("hand-over to a sleeping waiter, p99 / mutex + semaphore", 0.99, 1.1);
 }
 
 }  // namespace
@@ -337,7 +306,6 @@ int main() {
   using namespace Varnel::Benchmarks;
   // From the first thread on, the C library locks in earnest.
   std::thread([] {}).join();
-  Comparison::printHeader();
   compareGrants();
   compareContention(2, "serial section, 2 threads / mutex");
   compareContention(4, "serial section, 4 threads / mutex");

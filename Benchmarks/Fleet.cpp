@@ -4,22 +4,24 @@
 // fails for an hour, in several ways. Prints how many requests its busiest minute had to bear, and
 // draws them into a file. Exits with 1 when the hour after the failure was too uneven, or an event
 // was lost.
-#include <fmt/os.h>
-
 #include <algorithm>
 #include <cmath>
-#include <cstdio>
 #include <cstdlib>
 #include <numbers>
+#include <numeric>
 #include <random>
+#include <string>
 #include <vector>
 
+#include <Benchmarks/Drawing.h>
+#include <Benchmarks/Measurements.h>
 #include <Varnel/Tallyhouse/DeliveryPolicy.h>
 #include <Varnel/Tallyhouse/EventRecorder.h>
 
 namespace {
 
 using namespace Tallyhouse;
+using namespace Varnel::Benchmarks;
 using namespace std::chrono_literals;
 using std::chrono::seconds;
 using Varnel::Platform::Date;
@@ -118,7 +120,6 @@ void live(const Server& server, const DeliveryPolicy& policy, Random& random, Fl
 struct Hour {
   int busiest;
   double mean;
-  [[nodiscard]] double unevenness() const { return busiest / mean; }
 };
 
 Hour hourFrom(const Fleet& fleet, Date start) {
@@ -135,31 +136,27 @@ void plot(const std::vector<Fleet>& fleets, const char* file) {
   int max = 1;
   for (const Fleet& fleet : fleets)
     max = std::max(max, *std::max_element(fleet.load.begin(), fleet.load.end()));
-  auto svg = fmt::output_file(file);
-  svg.print(
-      "<svg xmlns='http://www.w3.org/2000/svg' viewBox='0 0 {} {}' font-family='sans-serif' "
-      "font-size='12'>\n<rect width='100%' height='100%' fill='white'/>\n",
-      width + left + 20, static_cast<int>(fleets.size()) * (height + gap) + 30);
+  Drawing drawing(width + left + 20, static_cast<int>(fleets.size()) * (height + gap) + 30);
   const auto x = [&](int minute) { return left + width * (minute - first) / (hours * 60.0); };
   int top = gap;
   for (std::size_t i = 0; i < fleets.size(); ++i, top += height + gap) {
     const int bottom = top + height;
-    svg.print("<rect x='{}' y='{}' width='{:.0f}' height='{}' fill='#f3dede'/>\n", x(first + 60),
-              top, x(first + 120) - x(first + 60), height);
-    svg.print("<text x='{}' y='{}'>{}</text>\n", left, top - 6, servers[i].name);
-    svg.print("<text x='{}' y='{}' text-anchor='end'>{}</text>\n", left - 6, top + 10, max);
-    svg.print("<path d='M{} {}V{}H{}' fill='none' stroke='#999'/>\n", left, top, bottom,
-              left + width);
-    svg.print("<polyline fill='none' stroke='#1c6f8c' points='");
+    drawing.area({x(first + 60), 1.0 * top}, x(first + 120) - x(first + 60), height, "#f3dede");
+    drawing.text({left, top - 6.0}, servers[i].name);
+    drawing.text({left - 6, top + 10.0}, std::to_string(max), Drawing::Anchor::end);
+    drawing.line({{left, 1.0 * top}, {left, 1.0 * bottom}, {left + width, 1.0 * bottom}},
+                 Drawing::axis);
+    std::vector<Drawing::Point> points;
     for (int minute = first; minute < first + hours * 60; ++minute)
-      svg.print("{:.0f},{:.1f} ", x(minute),
-                bottom - 1.0 * height * fleets[i].load[static_cast<std::size_t>(minute)] / max);
-    svg.print("'/>\n");
+      points.push_back(
+          {x(minute),
+           bottom - 1.0 * height * fleets[i].load[static_cast<std::size_t>(minute)] / max});
+    drawing.line(points, Drawing::curve);
   }
   for (int hour = 0; hour <= hours; ++hour)
-    svg.print("<text x='{:.0f}' y='{}' text-anchor='middle'>{}:00</text>\n", x(first + hour * 60),
-              top - gap + 16, first / 60 + hour);
-  svg.print("</svg>\n");
+    drawing.text({x(first + hour * 60), top - gap + 16.0}, fmt::format("{}:00", first / 60 + hour),
+                 Drawing::Anchor::middle);
+  drawing.write(file);
 }
 
 }  // namespace
@@ -170,19 +167,19 @@ int main(int count, char** arguments) {
   const auto maxWaiting = static_cast<std::size_t>(SpoolLimits().maxEvents);
   bool isGood = true;
   std::vector<Fleet> fleets;
-  std::printf("%-32s %10s %25s %25s %8s %5s\n", "", "requests", "busiest/mean, 12 to 13",
-              "busiest/mean, 13 to 14", "waiting", "lost");
   for (const Server& server : servers) {
     Random random(1);
     Fleet& fleet = fleets.emplace_back();
     for (long i = 0; i < installations; ++i) live(server, policy, random, fleet);
     const Hour during = hourFrom(fleet, failing), after = hourFrom(fleet, mended);
-    long requests = 0;
-    for (const int each : fleet.load) requests += each;
-    std::printf("%-32s %10ld %8d/%8.0f = %5.2f %8d/%8.0f = %5.2f %8zu %5ld\n", server.name,
-                requests, during.busiest, during.mean, during.unevenness(), after.busiest,
-                after.mean, after.unevenness(), fleet.maxWaiting, fleet.undelivered);
-    isGood = isGood && after.unevenness() <= maxUnevenness && fleet.undelivered == 0 &&
+    report(fmt::format("{}: busiest minute / mean, 12 to 13", server.name), during.busiest,
+           during.mean, std::nullopt, "");
+    report(fmt::format("{}: busiest minute / mean, 13 to 14", server.name), after.busiest,
+           after.mean, maxUnevenness, "");
+    const long requests = std::accumulate(fleet.load.begin(), fleet.load.end(), 0L);
+    fmt::print("  {:.1f} million requests, at most {} events wait, {} are lost\n",
+               static_cast<double>(requests) / 1e6, fleet.maxWaiting, fleet.undelivered);
+    isGood = isGood && after.busiest <= maxUnevenness * after.mean && fleet.undelivered == 0 &&
              fleet.maxWaiting <= maxWaiting;
   }
   if (count > 2) plot(fleets, arguments[2]);

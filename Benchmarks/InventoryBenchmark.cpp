@@ -28,7 +28,7 @@ using Enumeration = UniqueHandle<udev_enumerate*, udev_enumerate_unref>;
 using UdevDevice = UniqueHandle<udev_device*, udev_device_unref>;
 
 constexpr std::size_t rounds = 2000;
-constexpr double median = 0.5;
+constexpr double atMedian = 0.5;
 
 void libmountParse() {
   libmnt_table* table = mnt_new_table_from_file("/proc/self/mountinfo");
@@ -68,8 +68,8 @@ void compareMountTable() {
       libmount);
   cached.measure(
       rounds, [&] { return timeOf([&] { (void)table->current(); }); }, libmount);
-  parse.print("mount table, read and parsed / libmount", median, 0.7);
-  cached.print("mount table, unchanged / libmount", median, 0.7);
+  parse.report("mount table, read and parsed / libmount", atMedian, 0.7);
+  cached.report("mount table, unchanged / libmount", atMedian, 0.7);
 }
 
 void compareInventory() {
@@ -87,21 +87,20 @@ void compareInventory() {
         });
       },
       [] { return timeOf(udevEnumeration); });
-  inventory.print("inventory / udev enumeration with 5 attributes each", median, 0.3);
+  inventory.report("inventory / udev enumeration with 5 attributes each", atMedian, 0.3);
 
   const auto url = Platform::URL::fileURLWithPath("/usr/share/doc");
   Comparison lookup;
   lookup.measure(
       rounds, [&] { return timeOf([&] { (void)volumes->volumeURL(url); }); },
       [] { return 2000.0; });
-  lookup.print("volume of a path / two microseconds", median, 1.0);
+  lookup.report("volume of a path / two microseconds", atMedian, 1.0);
 }
 
 }  // namespace
 }  // namespace Varnel::Benchmarks
 
 int main() {
-  Varnel::Benchmarks::Comparison::printHeader();
   Varnel::Benchmarks::compareMountTable();
   Varnel::Benchmarks::compareInventory();
 }

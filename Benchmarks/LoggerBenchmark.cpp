@@ -1,8 +1,11 @@
 // SPDX-License-Identifier: MIT
+#include <unistd.h>
+
 #include <algorithm>
 #include <barrier>
 #include <chrono>
 #include <cstdio>
+#include <cstdlib>
 #include <filesystem>
 #include <functional>
 #include <memory>
@@ -16,19 +19,22 @@
 #include <spdlog/sinks/stdout_sinks.h>
 #include <spdlog/spdlog.h>
 
+#include <Benchmarks/Measurements.h>
 #include <Varnel/Logging/Logger.h>
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Platform/Testing/FakeUser.h>
 
 // What a log entry of about 105 bytes costs its author, against the work that cannot be avoided and
-// against spdlog. Everything prints to /dev/null and writes to a file of its own; the figures go to
-// standard error. Only the ratios within one run mean anything.
+// against spdlog. Everything prints to /dev/null and writes to a file of its own. Only the ratios
+// within one run mean anything.
 
 namespace {
 
 namespace fs = std::filesystem;
 using Clock = std::chrono::steady_clock;
+using Varnel::Benchmarks::median;
+using Varnel::Benchmarks::percentile;
 using Log = std::function<void(const std::string& message)>;
 
 constexpr int rounds = 7;
@@ -39,15 +45,8 @@ constexpr int longBurst = 1000;
 const std::string author = "DuplicateScanner";
 const std::string message = "Did compare two files of the same size and found them equal: scan.pdf";
 
-struct Subject {
-  const char* name;
-  std::function<Log(const fs::path& folder)> open;  ///< The returned function keeps the log open.
-};
-
-double median(std::vector<double> values) {
-  std::ranges::sort(values);
-  return values[values.size() / 2];
-}
+/// The returned function keeps the log open.
+using Opening = Log (*)(const fs::path& folder);
 
 double nanosecondsSince(Clock::time_point start) {
   return std::chrono::duration<double, std::nano>(Clock::now() - start).count();
@@ -70,17 +69,16 @@ double callerTime(const Log& log, int threads) {
   return median(times);
 }
 
-// The time that all but one in a hundred bursts stay below, in microseconds.
+// The time that all but one in a hundred bursts stay below.
 double burstTime(const Log& log, int messages) {
   std::vector<double> times;
   for (int i = 0; i < bursts; ++i) {
     const auto begin = Clock::now();
     for (int j = 0; j < messages; ++j) log(message);
-    times.push_back(nanosecondsSince(begin) / 1000);
+    times.push_back(nanosecondsSince(begin));
     std::this_thread::sleep_for(std::chrono::milliseconds(2));
   }
-  std::ranges::sort(times);
-  return times[times.size() * 99 / 100];
+  return percentile(std::move(times), 0.99);
 }
 
 // Formats an entry and writes it twice, nothing else.
@@ -137,22 +135,20 @@ struct Figures {
 }  // namespace
 
 int main() {
-  const Subject subjects[] = {{"required work, inline", openRequiredWork},
-                              {"Logger", openLogger},
-                              {"spdlog, asynchronous", openAsynchronousPeer},
-                              {"spdlog, synchronous", openSynchronousPeer}};
-  constexpr std::size_t required = 0;
-  constexpr std::size_t ours = 1;
-  constexpr std::size_t asynchronous = 2;
+  enum : std::size_t { required, ours, asynchronous, synchronous, subjectCount };
+  const Opening subjects[subjectCount] = {openRequiredWork, openLogger, openAsynchronousPeer,
+                                          openSynchronousPeer};
 
+  std::fflush(stdout);
+  const int terminal = ::dup(STDOUT_FILENO);
   if (!std::freopen("/dev/null", "w", stdout)) return EXIT_FAILURE;
   const fs::path folder = fs::temp_directory_path() / "varnel-logger-benchmark";
-  Figures figures[std::size(subjects)];
+  Figures figures[subjectCount];
   for (int round = 0; round < rounds; ++round) {
-    for (std::size_t i = 0; i < std::size(subjects); ++i) {
+    for (std::size_t i = 0; i < subjectCount; ++i) {
       fs::remove_all(folder);
       fs::create_directories(folder);
-      const Log log = subjects[i].open(folder);
+      const Log log = subjects[i](folder);
       figures[i].oneThread.push_back(callerTime(log, 1));
       figures[i].twoThreads.push_back(callerTime(log, 2));
       figures[i].shortBursts.push_back(burstTime(log, shortBurst));
@@ -161,25 +157,20 @@ int main() {
   }
   fs::remove_all(folder);
 
-  fmt::print(stderr, "{:24}{:>14}{:>15}{:>18}{:>18}\n", "", "1 thread, ns", "2 threads, ns",
-             "p99 of 100, µs", "p99 of 1000, µs");
-  for (std::size_t i = 0; i < std::size(subjects); ++i)
-    fmt::print(stderr, "{:24}{:14.0f}{:15.0f}{:18.0f}{:18.0f}\n", subjects[i].name,
-               median(figures[i].oneThread), median(figures[i].twoThreads),
-               median(figures[i].shortBursts), median(figures[i].longBursts));
-  const auto report = [&](const char* what, double ratio, double goal) {
-    fmt::print(stderr, "{:52}{:6.2f}  (goal {:.2f})\n", what, ratio, goal);
+  std::fflush(stdout);
+  ::dup2(terminal, STDOUT_FILENO);
+  const auto report = [&](const char* what, auto figure, std::size_t peer,
+                          std::optional<double> goal = std::nullopt) {
+    Varnel::Benchmarks::report(what, median(figures[ours].*figure), median(figures[peer].*figure),
+                               goal);
   };
-  const auto ratio = [&](auto figure, std::size_t peer) {
-    return median(figures[ours].*figure) / median(figures[peer].*figure);
-  };
-  report("Logger to required work, 1 thread", ratio(&Figures::oneThread, required), 1.1);
-  report("Logger to required work, 2 threads", ratio(&Figures::twoThreads, required), 0.7);
-  report("Logger to asynchronous spdlog, 1 thread", ratio(&Figures::oneThread, asynchronous), 0.25);
-  report("Logger to asynchronous spdlog, 2 threads", ratio(&Figures::twoThreads, asynchronous),
-         0.25);
-  report("Logger to asynchronous spdlog, bursts of 100", ratio(&Figures::shortBursts, asynchronous),
+  report("log entry, 1 thread / required work", &Figures::oneThread, required, 0.8);
+  report("log entry, 2 threads / required work", &Figures::twoThreads, required, 0.7);
+  report("log entry, 1 thread / asynchronous spdlog", &Figures::oneThread, asynchronous, 0.25);
+  report("log entry, 2 threads / asynchronous spdlog", &Figures::twoThreads, asynchronous, 0.25);
+  report("bursts of 100 entries, p99 / asynchronous spdlog", &Figures::shortBursts, asynchronous,
          1.0);
-  report("Logger to asynchronous spdlog, bursts of 1000", ratio(&Figures::longBursts, asynchronous),
+  report("bursts of 1000 entries, p99 / asynchronous spdlog", &Figures::longBursts, asynchronous,
          1.0);
+  report("log entry, 1 thread / synchronous spdlog", &Figures::oneThread, synchronous);
 }

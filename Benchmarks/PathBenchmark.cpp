@@ -7,18 +7,18 @@
 
 #include <algorithm>
 #include <array>
-#include <chrono>
-#include <cstdio>
 #include <cstdlib>
 #include <filesystem>
 #include <string_view>
 #include <vector>
 
+#include <Benchmarks/Measurements.h>
 #include <Varnel/Paths/QNURLResolver.h>
 
 namespace {
 
 namespace fs = std::filesystem;
+using namespace Varnel::Benchmarks;
 using Varnel::Platform::URL;
 
 using BasePair = std::array<const char*, 2>;
@@ -92,27 +92,15 @@ std::size_t byGLib(const Prepared& one) {
   return length;
 }
 
-// Nanoseconds a path.
 template <typename Operation>
-double timeOf(const std::vector<Prepared>& paths, Operation operation) {
-  using Clock = std::chrono::steady_clock;
+void measure(std::vector<Nanoseconds>& samples, const std::vector<Prepared>& paths,
+             Operation operation) {
   std::size_t sum = 0;
-  const auto start = Clock::now();
-  for (int i = 0; i < repetitions; ++i)
+  const Nanoseconds time = timeOfOne(repetitions, [&] {
     for (const Prepared& one : paths) sum += operation(one);
-  const std::chrono::duration<double, std::nano> taken = Clock::now() - start;
+  });
   if (sum == 0) std::abort();
-  return taken.count() / (repetitions * static_cast<double>(paths.size()));
-}
-
-double median(std::vector<double> values) {
-  std::nth_element(values.begin(), values.begin() + rounds / 2, values.end());
-  return values[rounds / 2];
-}
-
-void print(const char* peer, double ours, double theirs, double goal) {
-  std::printf("%-58s %8.1f %8.1f %7.2f %7.2f  %s\n", peer, ours, theirs, ours / theirs, goal,
-              ours <= goal * theirs ? "met" : "NOT met");
+  samples.push_back(time / static_cast<double>(paths.size()));
 }
 
 }  // namespace
@@ -127,19 +115,15 @@ int main() {
                      .path = one.path,
                      .bases = {one.bases[0], one.bases[1]}});
 
-  std::vector<double> ours, mismatch, mismatchWithText, canonical;
+  std::vector<Nanoseconds> ours, mismatch, mismatchWithText, canonical;
   for (int round = 0; round < rounds; ++round) {
-    ours.push_back(timeOf(paths, byResolver));
-    mismatch.push_back(timeOf(paths, byMismatch));
-    mismatchWithText.push_back(timeOf(paths, byMismatchWithText));
-    canonical.push_back(timeOf(paths, byGLib));
+    measure(ours, paths, byResolver);
+    measure(mismatch, paths, byMismatch);
+    measure(mismatchWithText, paths, byMismatchWithText);
+    measure(canonical, paths, byGLib);
   }
-  std::printf("%-58s %8s %8s %7s %7s\n", "4 bases, paths of 55 bytes; ns a path", "ours",
-              "stand-in", "ratio", "goal");
-  print("std::filesystem mismatch, and the text to show", median(ours), median(mismatchWithText),
-        0.25);
-  print("GLib canonicalize and compare, and the text to show", median(ours), median(canonical),
-        0.5);
-  std::printf("%-58s %8.1f %8.1f %7.2f\n", "std::filesystem mismatch alone", median(ours),
-              median(mismatch), median(ours) / median(mismatch));
+  report("path of 55 bytes, 4 bases / std::filesystem and its text", median(ours),
+         median(mismatchWithText), 0.25);
+  report("path of 55 bytes, 4 bases / GLib and its text", median(ours), median(canonical), 0.5);
+  report("path of 55 bytes, 4 bases / std::filesystem, no text", median(ours), median(mismatch));
 }

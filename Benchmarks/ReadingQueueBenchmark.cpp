@@ -8,11 +8,11 @@
 #include <algorithm>
 #include <atomic>
 #include <chrono>
-#include <cstdio>
 #include <functional>
 #include <latch>
 #include <memory>
 #include <mutex>
+#include <numeric>
 #include <string>
 #include <thread>
 #include <vector>
@@ -87,14 +87,11 @@ class Occupancy final {
  public:
   void enter() { change(1); }
   void leave() { change(-1); }
-  void print(const char* what) const {
-    double all = 0;
-    double above = 0;
-    for (std::size_t i = 0; i < times_.size(); ++i) {
-      all += times_[i];
-      if (i > 2) above += times_[i];
-    }
-    std::printf("%-66s %6.1f %%   at most %zu inside\n", what, 100 * above / all, max_);
+  [[nodiscard]] double max() const { return static_cast<double>(max_); }
+  /// The share of the time in which more than two were.
+  [[nodiscard]] double above() const {
+    const double all = std::accumulate(times_.begin(), times_.end(), 0.0);
+    return std::accumulate(times_.begin() + 3, times_.end(), 0.0) / all;
   }
 
  private:
@@ -136,7 +133,6 @@ void compareCrowds() {
       }
     });
   for (std::thread& thread : threads) thread.join();
-  occupancy.print("two places, 8 threads of 5 ms: above two, plain sessions");
 
   std::vector<std::shared_ptr<Job>> jobs;
   for (int i = 0; i < readers; ++i)
@@ -149,13 +145,9 @@ void compareCrowds() {
           return left > 0 ? DiskReadingNext::again() : DiskReadingNext::done();
         }));
   for (const auto& job : jobs) job->wait();
-  strict.print("the same with the queue");
-}
-
-void printWaits(const char* what, std::vector<Nanoseconds> waits) {
-  std::sort(waits.begin(), waits.end());
-  std::printf("%-66s %6.1f ms   p99 %5.1f   max %5.1f\n", what, waits[waits.size() / 2] / 1e6,
-              waits[waits.size() * 99 / 100] / 1e6, waits.back() / 1e6);
+  report("8 readers at once by the queue, most inside / two places", strict.max(), 2, 1.0, "");
+  report("time with more than two inside, queue / sessions", 100 * strict.above(),
+         100 * occupancy.above(), std::nullopt, "%");
 }
 
 // A turn is over at 20 ms, and the reading that is under way then takes up to 5 ms more.
@@ -182,8 +174,12 @@ void compareUrgentReaders() {
   }
   isOver = true;
   for (const auto& job : jobs) job->wait();
-  printWaits("urgent session behind turns of background reading, p50", std::move(sessions));
-  printWaits("urgent task behind turns of background reading, p50", std::move(tasks));
+  // A turn, and the reading that is under way at its end.
+  const Nanoseconds turn = 25e6;
+  report("urgent session behind turns of reading, p50 / a turn", median(sessions), turn);
+  report("urgent session behind turns of reading, p99 / a turn", percentile(sessions, 0.99), turn);
+  report("urgent task behind turns of reading, p50 / a turn", median(tasks), turn);
+  report("urgent task behind turns of reading, p99 / a turn", percentile(tasks, 0.99), turn);
 }
 
 long contextSwitches() {
@@ -198,19 +194,21 @@ void measureSmallFiles() {
     const auto end = Clock::now() + 4us;
     while (Clock::now() < end) continue;
   };
-  const auto print = [](const char* what, auto&& work) {
+  struct Cost {
+    Nanoseconds time;
+    double switches;
+  };
+  const auto costOf = [](auto&& work) {
     const long before = contextSwitches();
-    const Nanoseconds time = timeOf(work);
-    const long switches = contextSwitches() - before;
-    std::printf("%-66s %6.2f us a file   %.3f switches in a hundred\n", what, time / files / 1e3,
-                100.0 * static_cast<double>(switches) / files);
+    const Nanoseconds time = timeOf(work) / files;
+    return Cost{time, static_cast<double>(contextSwitches() - before)};
   };
   Machine machine;
   machine.manager.setIsBackgroundMode(true);  // one reader
-  print("300,000 files of 4 us, one place, nothing between", [&] {
+  const Cost nothing = costOf([&] {
     for (int i = 0; i < files; ++i) readOne();
   });
-  print("the same in one task of the queue", [&] {
+  const Cost task = costOf([&] {
     submit(machine, QoS::utility, [&, left = files](DiskReadingTurn& turn) mutable {
       while (left > 0 && !turn.isOver()) {
         readOne();
@@ -219,7 +217,7 @@ void measureSmallFiles() {
       return left > 0 ? DiskReadingNext::again() : DiskReadingNext::done();
     })->wait();
   });
-  print("the same, a session for each file on two threads", [&] {
+  const Cost sessions = costOf([&] {
     std::vector<std::thread> threads;
     for (int i = 0; i < 2; ++i)
       threads.emplace_back([&] {
@@ -230,7 +228,7 @@ void measureSmallFiles() {
       });
     for (std::thread& thread : threads) thread.join();
   });
-  print("the same as a list of files", [&] {
+  const Cost list = costOf([&] {
     std::latch left(files);
     machine.queue.read(
         std::vector<DiskReadingFile>(
@@ -244,6 +242,11 @@ void measureSmallFiles() {
         [&](const DiskReadingFile&, DiskReadingResult) { left.count_down(); });
     left.wait();
   });
+  report("a file of 4 µs in a task of the queue / nothing between", task.time, nothing.time);
+  report("a file of 4 µs in a list of the queue / nothing between", list.time, nothing.time);
+  report("a file of 4 µs in a session of its own / nothing between", sessions.time, nothing.time);
+  report("switches of a task of 300,000 files / one in 100", task.switches, files / 100, 1.0, "");
+  report("switches of a list of 300,000 files / one in 100", list.switches, files / 100, 1.0, "");
 }
 
 }  // namespace

@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 // How long the main thread waits for a sound: the calls of the engine, beside the start of the same
 // sound in place, which is what a thread of its own does for them.
-#include <cstdio>
 #include <fstream>
 #include <memory>
 #include <sstream>
@@ -19,19 +18,15 @@
 namespace {
 
 using namespace Varnel;
-using Benchmarks::Nanoseconds;
-using Benchmarks::percentile;
-using Benchmarks::timeOf;
+using namespace Benchmarks;
 
 constexpr int rounds = 30;
-constexpr Nanoseconds goal = 1e6;
+constexpr Nanoseconds millisecond = 1e6;
 
 class Silent final : public Platform::SystemLog {
  public:
   void write(std::string_view) override {}
 };
-
-enum class Goal { met, none };
 
 std::string pathOf(Sound sound) {
   return VARNEL_SOUNDS "/" + sound.fileName();
@@ -41,14 +36,6 @@ std::string bytesOf(Sound sound) {
   std::ostringstream bytes;
   bytes << std::ifstream(pathOf(sound), std::ios::binary).rdbuf();
   return std::move(bytes).str();
-}
-
-void print(const char* what, const std::vector<Nanoseconds>& samples, Goal wanted = Goal::met) {
-  const Nanoseconds worst = percentile(samples, 1);
-  std::printf("%-44s %10.3f %10.3f  %s\n", what, percentile(samples, 0.5) / 1e6, worst / 1e6,
-              wanted == Goal::none ? ""
-              : worst <= goal      ? "met"
-                                   : "NOT met");
 }
 
 }  // namespace
@@ -61,9 +48,8 @@ int main() {
   const auto play = [&] { engine.play(Sound::scanComplete); };
   const auto awaitEnd = [&] { mainQueue->runWhile([&] { return !!engine.currentSound(); }); };
 
-  std::printf("%-44s %10s %10s  goal: %.0f ms\n", "", "median, ms", "worst, ms", goal / 1e6);
   // GStreamer starts meanwhile, elsewhere.
-  print("the first sound of the process", {timeOf(play)});
+  report("the first sound / 1 ms", timeOf(play), millisecond, 1.0);
   awaitEnd();
   std::vector<Nanoseconds> plays, replacements, stops;
   for (int round = 0; round < rounds; ++round) {
@@ -71,9 +57,10 @@ int main() {
     replacements.push_back(timeOf(play));
     stops.push_back(timeOf([&] { engine.stop(); }));
   }
-  print("a later sound", plays);
-  print("a sound that cuts off another", replacements);
-  print("stop", stops);
+  report("a later sound, worst / 1 ms", percentile(plays, 1), millisecond, 1.0);
+  report("a sound that cuts off another, worst / 1 ms", percentile(replacements, 1), millisecond,
+         1.0);
+  report("stop of a sound, worst / 1 ms", percentile(stops, 1), millisecond, 1.0);
   play();
   awaitEnd();
 
@@ -82,5 +69,5 @@ int main() {
   std::vector<Nanoseconds> starts;
   for (int round = 0; round < rounds; ++round)
     starts.push_back(timeOf([&] { static_cast<void>(output->start(bytes, [](bool) {})); }));
-  print("for comparison: start and stop in place", starts, Goal::none);
+  report("a later sound, median / start and stop in place", median(plays), median(starts));
 }

@@ -27,7 +27,8 @@ class FakeDiskArbitration final : public DiskArbitration {
   /// with.
   void setMountURLs(const std::string& deviceName, std::vector<URL> urls) {
     const std::lock_guard lock(mutex_);
-    mounts_.insert_or_assign(deviceName, std::move(urls));
+    if (mounts_.use_count() > 1) mounts_ = std::make_shared<Mounts>(*mounts_);
+    mounts_->insert_or_assign(deviceName, std::move(urls));
   }
 
   /// A service out of reach opens no session.
@@ -57,7 +58,8 @@ class FakeDiskArbitration final : public DiskArbitration {
 
   class FakeSession final : public Session {
    public:
-    FakeSession(Mounts mounts, std::shared_ptr<Counts> counts, std::shared_ptr<FaultPlan> faults)
+    FakeSession(std::shared_ptr<const Mounts> mounts, std::shared_ptr<Counts> counts,
+                std::shared_ptr<FaultPlan> faults)
         : mounts_(std::move(mounts)), counts_(std::move(counts)), faults_(std::move(faults)) {
       ++counts_->live;
       ++counts_->opened;
@@ -66,19 +68,20 @@ class FakeDiskArbitration final : public DiskArbitration {
 
     std::vector<URL> mountURLs(const std::string& deviceName) override {
       if (faults_->strikes()) return {};
-      const auto found = mounts_.find(deviceName);
-      return found == mounts_.end() ? std::vector<URL>() : found->second;
+      const auto found = mounts_->find(deviceName);
+      return found == mounts_->end() ? std::vector<URL>() : found->second;
     }
 
    private:
-    const Mounts mounts_;
+    const std::shared_ptr<const Mounts> mounts_;
     const std::shared_ptr<Counts> counts_;
     const std::shared_ptr<FaultPlan> faults_;
   };
 
   const std::shared_ptr<Counts> counts_ = std::make_shared<Counts>();
   std::mutex mutex_;  ///< Owns what follows.
-  Mounts mounts_;
+  std::shared_ptr<Mounts> mounts_ =
+      std::make_shared<Mounts>();  ///< Changed while no session has it.
   bool reachable_ = true;
 };
 

@@ -8,6 +8,7 @@
 #include <memory>
 #include <mutex>
 #include <optional>
+#include <set>
 #include <string>
 #include <utility>
 #include <vector>
@@ -92,11 +93,12 @@ class FakeVolumeCatalog final : public VolumeCatalog {
   std::vector<MountedVolume> mountedVolumes() override {
     if (faults->strikes()) return {};
     const std::lock_guard lock(mutex_);
+    // What is mounted over another volume hides it.
     std::vector<MountedVolume> visible;
-    for (const MountedVolume& volume : volumes_) {
-      std::erase_if(visible, [&](const MountedVolume& each) { return each.url == volume.url; });
-      visible.push_back(volume);
-    }
+    std::set<URL> urls;
+    for (auto volume = volumes_.rbegin(); volume != volumes_.rend(); ++volume)
+      if (urls.insert(volume->url).second) visible.push_back(*volume);
+    std::reverse(visible.begin(), visible.end());
     return visible;
   }
 

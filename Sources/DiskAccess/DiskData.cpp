@@ -40,13 +40,7 @@ std::shared_ptr<DiskData::AccessRequest> DiskData::requestAccess(Basalt::ThreadI
   // Requests of threads that gave up must not pile up while a disk stays full.
   if (requests_.size() == requests_.capacity())
     std::erase_if(requests_, [](const auto& other) { return other->isClaimed(); });
-  auto request = std::make_shared<AccessRequest>(urgencyClassOf(qos));
-  const auto place = std::upper_bound(requests_.begin(), requests_.end(), request,
-                                      [](const auto& one, const auto& other) {
-                                        return one->urgencyClass() < other->urgencyClass();
-                                      });
-  requests_.insert(place, request);
-  return request;
+  return requests_.emplace_back(std::make_shared<AccessRequest>(urgencyClassOf(qos)));
 }
 
 void DiskData::releaseAccess(Basalt::ThreadID thread) {
@@ -77,6 +71,9 @@ std::array<std::size_t, urgencyClassCount> DiskData::waiterCounts() const {
 DiskData::Requests DiskData::claimPendingRequests() {
   Requests granted = std::exchange(requests_, {});
   std::erase_if(granted, [](const auto& request) { return !request->claim(); });
+  std::stable_sort(granted.begin(), granted.end(), [](const auto& one, const auto& other) {
+    return one->urgencyClass() < other->urgencyClass();
+  });
   return granted;
 }
 

@@ -109,7 +109,7 @@ class VARNEL_API DiskData final : public std::enable_shared_from_this<DiskData> 
   const std::shared_ptr<const OVDiskInfo> diskInfo_;
   const std::int64_t maxThreads_;  ///< Outside background mode.
   bool isBackgroundMode_;
-  Requests requests_;  ///< The line, by class and within a class in the order of coming.
+  Requests requests_;  ///< In the order of coming.
   Basalt::Bag<Basalt::ThreadID> accessingThreads_;
 };
 
