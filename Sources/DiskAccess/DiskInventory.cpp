@@ -31,7 +31,7 @@ void collectNames(const RegistryEntry& entry, std::set<std::string>& names) {
   }
 }
 
-std::shared_ptr<const OVDiskInfo> diskOfService(std::shared_ptr<const RegistryEntry> service,
+std::shared_ptr<const OVDiskInfo> diskOfService(const std::shared_ptr<const RegistryEntry>& service,
                                                 Platform::DiskArbitration& disks,
                                                 InventedIdentifiers& identifiers) {
   const auto device = serviceForDevice(service);

@@ -148,7 +148,7 @@ void DiskReadingFiles::readFound(std::uint64_t unmountCount) {
     found.swap(found_);
     foundVolumes_.clear();
   }
-  for (auto& volume : found) readVolume(std::move(volume), unmountCount);
+  for (const auto& volume : found) readVolume(volume, unmountCount);
 }
 
 std::optional<Platform::URL> DiskReadingFiles::volumeOf(const DiskReadingFile& file) const {
@@ -157,7 +157,8 @@ std::optional<Platform::URL> DiskReadingFiles::volumeOf(const DiskReadingFile& f
   return found ? *found : std::nullopt;
 }
 
-void DiskReadingFiles::readVolume(std::shared_ptr<Volume> volume, std::uint64_t unmountCount) {
+void DiskReadingFiles::readVolume(const std::shared_ptr<Volume>& volume,
+                                  std::uint64_t unmountCount) {
   const auto disk = core_->disks().settledRecordOfVolume(volume->url)->diskInfo();
   if (disk->kind() != OVDiskKindSolidState)
     std::stable_sort(volume->files.begin(), volume->files.end(), [this](Index one, Index other) {

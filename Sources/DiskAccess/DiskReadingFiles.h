@@ -47,7 +47,7 @@ class DiskReadingFiles final : public std::enable_shared_from_this<DiskReadingFi
   void readFoundLater(std::uint64_t unmountCount);
   void readFound(std::uint64_t unmountCount);
   [[nodiscard]] std::optional<Platform::URL> volumeOf(const DiskReadingFile& file) const;
-  void readVolume(std::shared_ptr<Volume> volume, std::uint64_t unmountCount);
+  void readVolume(const std::shared_ptr<Volume>& volume, std::uint64_t unmountCount);
   [[nodiscard]] bool isImpatient() const;
 
   // Any thread.

@@ -42,7 +42,9 @@ DiskReadingQueue::~DiskReadingQueue() {
   if (process_ == currentProcess())
     core_->close();
   else
-    new auto(core_);  // Its locks are as the threads of the parent left them.
+    // Its locks are as the threads of the parent left them.
+    // NOLINTNEXTLINE(bugprone-unhandled-exception-at-new)
+    new auto(core_);
 }
 
 DiskReadingQueue& DiskReadingQueue::shared() {

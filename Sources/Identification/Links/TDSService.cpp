@@ -16,7 +16,6 @@
 namespace Varnel {
 
 using Platform::URL;
-using Platform::URLQueryItem;
 
 namespace {
 
