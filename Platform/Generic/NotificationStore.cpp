@@ -208,8 +208,11 @@ Result<std::optional<NotificationSource>> NotificationStore::source() {
 }
 
 Failure NotificationStore::keepLaunch(const UserNotification& notification, Date now) {
+  // An application may never take one.
   return write([&](SQLiteDatabase& database) {
-    return insertLaunch(database, {notification, now});
+    auto error = database.run("DELETE FROM launches WHERE clicked <= ? OR clicked >= ?",
+                              now - maxLaunchAge, now + maxLaunchAge);
+    return error ? error : insertLaunch(database, {notification, now});
   });
 }
 
