@@ -18,7 +18,7 @@ constexpr Date yearEnd = sys_days(2027y / January / 1);
 class Year final {
  public:
   Year(std::uint32_t seed, int plans) : machine_(seed) {
-    for (int i = 0; i < 40; ++i)
+    for (int i = 0; i < plans / 25; ++i)
       products_.push_back(
           std::make_unique<Product>(machine_, folder_.path() / (std::to_string(i) + ".sqlite"),
                                     i % 2 > 0, [this] { begin(); }));
@@ -64,7 +64,7 @@ class Year final {
     if (what < 80) return any().plan();
     if (what < 84) return any().deliverAtOnce();
     if (what < 88) return any().removeOne(machine_.below(2) == 0);
-    if (what < 95) return any().touch();
+    if (what < 95) return touch();
     if (what < 96) return lockAStore();
     if (what < 98) return begin();
     endSoon([this] { kill(); });
@@ -72,6 +72,12 @@ class Year final {
 
   // Some have much to tell.
   Product& any() { return *products_[machine_.below(1 + machine_.below(products_.size()))]; }
+
+  // A kill at this moment loses what the user has done.
+  void touch() {
+    trouble_ = nullptr;
+    any().touch();
+  }
 
   void begin() {
     if (timers_) return;
