@@ -94,11 +94,12 @@ NotificationDeliverer::Failure NotificationDeliverer::deliver() {
   if (!all) return all.error();
   if (auto error = becomeDeliverer(*all)) return error;
   // Where nothing is due, a schedule may still have to go on from a clock that was set back.
-  if (duty_ == Duty::everything && !isBehind_)
+  if (duty_ == Duty::everything && !isBehind_) {
     if (auto error = store_->claimDue(ports_.clock.now(), calendar())) return error;
+    if (all = store_->deliveries(every); !all) return all.error();
+  }
   const bool mayDeliver = lock_ && duty_ != Duty::nothing;
   if (mayDeliver) {
-    if (all = store_->deliveries(every); !all) return all.error();
     ask(*all);
     if (auto error = decide()) return error;
     if (all = store_->deliveries(every); !all) return all.error();

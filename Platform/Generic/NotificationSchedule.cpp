@@ -16,19 +16,21 @@ constexpr std::chrono::days sameMoment(2);
 class Dates final {
  public:
   Dates(const NotificationSchedule& schedule, const Calendar& calendar)
-      : calendar_(calendar), interval_(schedule.notification.deliveryRepeatInterval) {
-    origin_ = schedule.notification.deliveryDate.value_or(Date());
+      : calendar_(calendar),
+        interval_(schedule.notification.deliveryRepeatInterval),
+        origin_(schedule.notification.deliveryDate.value_or(Date())) {
     if (schedule.timeZone != calendar.timeZoneIdentifier())
-      origin_ = calendar.withWallClockOf(origin_, schedule.timeZone).value_or(origin_);
-    const auto second = interval_ ? calendar.adding(*interval_, origin_) : std::nullopt;
-    repeats_ = second && *second > origin_;
+      local_ = calendar.wallClock(origin_, schedule.timeZone);
+    first_ = after(DateComponents(), 1).value_or(origin_);
+    const auto second = interval_ ? after(*interval_, 1) : std::nullopt;
+    repeats_ = second && *second > first_;
   }
 
   bool repeats() const { return repeats_; }
 
   std::optional<Date> at(std::int64_t number) const {
-    if (number == 0) return origin_;
-    return repeats_ ? calendar_.adding(*interval_, origin_, number) : std::nullopt;
+    if (number == 0) return first_;
+    return repeats_ ? after(*interval_, number) : std::nullopt;
   }
 
   bool isAfter(std::int64_t number, Date now) const {
@@ -53,9 +55,16 @@ class Dates final {
   }
 
  private:
+  std::optional<Date> after(const DateComponents& interval, std::int64_t count) const {
+    return local_ ? calendar_.adding(interval, *local_, count)
+                  : calendar_.adding(interval, origin_, count);
+  }
+
   const Calendar& calendar_;
   const std::optional<DateComponents> interval_;
-  Date origin_;
+  const Date origin_;
+  std::optional<Calendar::LocalTime> local_;  // Of the origin, where that is in another zone.
+  Date first_;
   bool repeats_ = false;
 };
 

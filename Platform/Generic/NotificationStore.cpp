@@ -33,6 +33,15 @@ Failure update(SQLiteDatabase& database, std::string_view sql, const Parameters&
   return database.run("DELETE FROM deliveries WHERE state = 'removed' AND banner IS NULL");
 }
 
+// Whatever the clock was when they were delivered, they came before what is delivered now.
+Failure endFuture(SQLiteDatabase& database, Date now) {
+  return database.run(
+      "UPDATE deliveries SET delivered = ? - rank FROM (SELECT number AS future,"
+      " row_number() OVER (ORDER BY delivered DESC, date DESC) AS rank FROM deliveries"
+      " WHERE delivered > ?) WHERE number = future",
+      now, now);
+}
+
 // In the place of the last delivery with this key, and of its banner.
 Failure insertDue(SQLiteDatabase& database, Delivery delivery, Date now) {
   delivery.state = due;
@@ -121,6 +130,7 @@ Failure NotificationStore::claimDue(Date now, const Calendar& calendar) {
     return std::nullopt;
   return write([&](SQLiteDatabase& database) -> Failure {
     std::vector<Delivery> present;
+    if (auto error = endFuture(database, now)) return error;
     if (auto error = selectDeliveries(database, {planned}, present)) return error;
     for (const Delivery& each : present)
       if (changes(each.schedule, now, calendar))
@@ -132,7 +142,10 @@ Failure NotificationStore::claimDue(Date now, const Calendar& calendar) {
 Failure NotificationStore::makeDue(const UserNotification& notification, Date now) {
   const Delivery delivery{
       .schedule = {.key = keyOf(notification), .notification = notification, .timeZone = ""}};
-  return write([&](SQLiteDatabase& database) { return insertDue(database, delivery, now); });
+  return write([&](SQLiteDatabase& database) {
+    auto error = endFuture(database, now);
+    return error ? error : insertDue(database, delivery, now);
+  });
 }
 
 Result<std::vector<Delivery>> NotificationStore::decideDue(
@@ -208,8 +221,11 @@ Result<std::optional<NotificationSource>> NotificationStore::source() {
 }
 
 Failure NotificationStore::keepLaunch(const UserNotification& notification, Date now) {
+  // An application may never take one.
   return write([&](SQLiteDatabase& database) {
-    return insertLaunch(database, {notification, now});
+    auto error = database.run("DELETE FROM launches WHERE clicked <= ? OR clicked >= ?",
+                              now - maxLaunchAge, now + maxLaunchAge);
+    return error ? error : insertLaunch(database, {notification, now});
   });
 }
 

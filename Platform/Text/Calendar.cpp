@@ -11,8 +11,7 @@ namespace Varnel::Platform {
 namespace {
 
 using std::chrono::milliseconds;
-using Time = std::chrono::sys_time<milliseconds>;
-using LocalTime = std::chrono::local_time<milliseconds>;
+using LocalTime = Calendar::LocalTime;
 
 // How far a calculation may lead; `Date` reaches 292,000 years.
 constexpr milliseconds maxMilliseconds(9'000'000'000'000'000);
@@ -22,14 +21,14 @@ bool isWithinReach(Time time) {
   return time.time_since_epoch() <= maxMilliseconds && time.time_since_epoch() >= -maxMilliseconds;
 }
 
-LocalTime wallClock(Time time, const TimeZone& zone) {
-  return LocalTime(time.time_since_epoch() + zone.offsetAt(time).fromUTC);
+LocalTime wallClockAt(Date date, const TimeZone& zone) {
+  return LocalTime(date.time_since_epoch() + zone.offsetAt(date).fromUTC);
 }
 
 // For a time that comes twice, the first one. For a time that is skipped, the offset before the
 // change applies and moves it forward.
-Time resolved(LocalTime local, const TimeZone& zone) {
-  const Time utc(local.time_since_epoch());
+Date resolved(LocalTime local, const TimeZone& zone) {
+  const Date utc(local.time_since_epoch());
   // No offset is as long as a day.
   Date begin = utc - std::chrono::days(1);
   auto offset = zone.offsetAt(begin).fromUTC;
@@ -41,6 +40,10 @@ Time resolved(LocalTime local, const TimeZone& zone) {
     begin = *change;
   }
   return utc - offset;
+}
+
+bool hasDays(const DateComponents& components) {
+  return components.year || components.month || components.day;
 }
 
 // A product that does not overflow and that the calendar can count with.
@@ -67,7 +70,26 @@ struct Calendar::State {
     const auto months = product(components.month.value_or(0), count);
     const auto days = product(components.day.value_or(0), count);
     if (!calendar || !years || !months || !days) return std::nullopt;
-    return calendar->adding(*years, *months, *days, local);
+    const auto whole = std::chrono::floor<milliseconds>(local);
+    const auto sum = calendar->adding(*years, *months, *days, whole);
+    return sum && isWithinReach(*sum) ? std::optional(*sum + (local - whole)) : std::nullopt;
+  }
+
+  static std::optional<Date> addingTime(const DateComponents& components, Date date,
+                                        std::int64_t count) {
+    // Milliseconds count further than microseconds.
+    auto time = std::chrono::floor<milliseconds>(date);
+    const auto rest = date - time;
+    const auto add = [&](const std::optional<std::int64_t>& amount, auto unit) {
+      const auto total = product(amount.value_or(0), count);
+      if (total) time += *total * milliseconds(unit);
+      return total.has_value();
+    };
+    if (!add(components.hour, std::chrono::hours(1)) ||
+        !add(components.minute, std::chrono::minutes(1)) ||
+        !add(components.second, std::chrono::seconds(1)) || !isWithinReach(time))
+      return std::nullopt;
+    return time + rest;
   }
 };
 
@@ -92,32 +114,22 @@ const std::string& Calendar::timeZoneIdentifier() const {
 std::optional<Date> Calendar::adding(const DateComponents& components, Date date,
                                      std::int64_t count) const {
   if (!isWithinReach(date)) return std::nullopt;
-  auto time = std::chrono::floor<milliseconds>(date);
-  const auto rest = date - time;
-  if (components.year || components.month || components.day) {
-    const auto sum = state_->addingDays(components, wallClock(time, *state_->zone), count);
-    if (!sum) return std::nullopt;
-    time = resolved(*sum, *state_->zone);
-  }
-  const auto add = [&](const std::optional<std::int64_t>& amount, auto unit) {
-    const auto total = product(amount.value_or(0), count);
-    if (total) time += *total * milliseconds(unit);
-    return total.has_value();
-  };
-  if (!add(components.hour, std::chrono::hours(1)) ||
-      !add(components.minute, std::chrono::minutes(1)) ||
-      !add(components.second, std::chrono::seconds(1)))
-    return std::nullopt;
-  if (!isWithinReach(time)) return std::nullopt;
-  return time + rest;
+  if (hasDays(components)) return adding(components, wallClockAt(date, *state_->zone), count);
+  return State::addingTime(components, date, count);
 }
 
-std::optional<Date> Calendar::withWallClockOf(Date date,
-                                              const std::string& timeZoneIdentifier) const {
-  if (!isWithinReach(date)) return std::nullopt;
-  const auto time = std::chrono::floor<milliseconds>(date);
-  const LocalTime local = wallClock(time, *state_->zones.zone(timeZoneIdentifier));
-  return resolved(local, *state_->zone) + (date - time);
+std::optional<Date> Calendar::adding(const DateComponents& components, LocalTime time,
+                                     std::int64_t count) const {
+  if (!isWithinReach(time)) return std::nullopt;
+  const auto sum =
+      hasDays(components) ? state_->addingDays(components, time, count) : std::optional(time);
+  if (!sum) return std::nullopt;
+  return State::addingTime(components, resolved(*sum, *state_->zone), count);
+}
+
+LocalTime Calendar::wallClock(Date date, const std::string& timeZoneIdentifier) const {
+  return isWithinReach(date) ? wallClockAt(date, *state_->zones.zone(timeZoneIdentifier))
+                             : LocalTime(date.time_since_epoch());
 }
 
 std::optional<int> Calendar::weekdayCount() const {

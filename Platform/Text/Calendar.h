@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <cstdint>
 #include <memory>
 #include <optional>
@@ -26,6 +27,9 @@ class UserLocale;
 /// of time. A month that is too short gives its last day. Immutable; any thread.
 class VARNEL_API Calendar final {
  public:
+  /// What clocks show, wherever they are.
+  using LocalTime = std::chrono::local_time<std::chrono::microseconds>;
+
   /// The locale is an ICU identifier; it names a calendar ("@calendar=hebrew") or has its region's.
   /// An unknown time zone counts as UTC. The time zones outlive the calendar.
   Calendar(const std::string& localeIdentifier, const std::string& timeZoneIdentifier,
@@ -43,10 +47,13 @@ class VARNEL_API Calendar final {
   [[nodiscard]] std::optional<Date> adding(const DateComponents& components, Date date,
                                            std::int64_t count = 1) const;
 
-  /// The moment at which this calendar's clocks show the time that the other zone's clocks show at
-  /// `date`.
-  [[nodiscard]] std::optional<Date> withWallClockOf(Date date,
-                                                    const std::string& timeZoneIdentifier) const;
+  /// The same from the moment at which this calendar's clocks show this time. Though they may skip
+  /// the time itself, what is added to it comes at that time of the day.
+  [[nodiscard]] std::optional<Date> adding(const DateComponents& components, LocalTime time,
+                                           std::int64_t count = 1) const;
+
+  /// What the clocks of a time zone show at `date`.
+  [[nodiscard]] LocalTime wallClock(Date date, const std::string& timeZoneIdentifier) const;
 
   /// How many days a week has; absent when the calendar knows no weeks.
   [[nodiscard]] std::optional<int> weekdayCount() const;

@@ -44,8 +44,8 @@ const Type& valueOf(const PropertyDictionary& object, std::string_view key) {
   return *value;
 }
 
-std::int64_t countFrom(const JSON& json) {
-  const auto* count = json.as<std::int64_t>();
+std::int64_t countFrom(const JSON* json) {
+  const auto* count = json ? json->as<std::int64_t>() : nullptr;
   if (!count || *count < 0) throw JSONError::withMessage("no count");
   return *count;
 }
@@ -62,7 +62,8 @@ double secondsFrom(const JSON* json) {
 DiskAccessNote::Waiters waitersFrom(const PropertyList& list) {
   DiskAccessNote::Waiters waiters{};
   if (list.size() != waiters.size()) throw JSONError::withMessage("other classes");
-  std::transform(list.begin(), list.end(), waiters.begin(), countFrom);
+  std::transform(list.begin(), list.end(), waiters.begin(),
+                 [](const JSON& each) { return countFrom(&each); });
   return waiters;
 }
 
@@ -77,7 +78,7 @@ DiskAccessNote::Disk diskFrom(const JSON& json) {
   DiskAccessNote::Disk disk{
       .uniqueID = valueOf<std::string>(object, "uniqueID"),
       .volume = valueOf<std::string>(object, "volume"),
-      .maxReaders = valueOf<std::int64_t>(object, "maxReaders"),
+      .maxReaders = countFrom(Platform::find(object, "maxReaders")),
       .waiters = waitersFrom(valueOf<PropertyList>(object, "waiters")),
       .waitersForProcesses = waitersFrom(valueOf<PropertyList>(object, "waitersForProcesses"))};
   for (const JSON& each : valueOf<PropertyList>(object, "places")) {

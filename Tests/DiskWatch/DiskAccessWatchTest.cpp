@@ -80,7 +80,8 @@ TEST(DiskAccessNote, ComesBackFromItsTextAndFromNothingElse) {
                                 changed("0.25", "-0.25"),
                                 changed("0.25", "null"),
                                 changed("\"/\"", "7"),
-                                changed("4", "\"4\"")};
+                                changed("4", "\"4\""),
+                                changed("4", "-4")};
   for (const std::string& other : others) EXPECT_FALSE(DiskAccessNote::fromText(other)) << other;
 }
 

@@ -63,10 +63,16 @@ TEST(Calendar, CountsInTheCalendarOfTheLocale) {
 
 TEST(Calendar, MovesAWallClockTimeIntoAnotherZone) {
   const Calendar newYork("en_US", "America/New_York", zones);
-  EXPECT_EQ(newYork.withWallClockOf(utc(2026y / July / 1, 7h) + 123456us, "Europe/Berlin"),
-            utc(2026y / July / 1, 13h) + 123456us);
-  EXPECT_EQ(newYork.withWallClockOf(utc(2026y / July / 1, 7h), "No/Such_Zone"),
-            utc(2026y / July / 1, 11h));
+  const auto moved = [&](Date date, const char* zone, const DateComponents& components = {}) {
+    return newYork.adding(components, newYork.wallClock(date, zone));
+  };
+  const Date summer = utc(2026y / July / 1, 7h);
+  EXPECT_EQ(moved(summer + 123456us, "Europe/Berlin"), summer + 6h + 123456us);
+  EXPECT_EQ(moved(summer, "No/Such_Zone"), summer + 4h);
+  // New York skips this time, and no other day's.
+  const Date skipped = utc(2026y / March / 8, 2h + 30min);
+  EXPECT_EQ(moved(skipped, "UTC"), utc(2026y / March / 8, 7h + 30min));
+  EXPECT_EQ(moved(skipped, "UTC", {.day = 1}), utc(2026y / March / 9, 6h + 30min));
 }
 
 TEST(Calendar, AnswersNothingBeyondWhatItCanCount) {
@@ -82,7 +88,7 @@ TEST(Calendar, AnswersNothingBeyondWhatItCanCount) {
   EXPECT_EQ(calendar.adding({.hour = 2'000'000'000}, *late), std::nullopt);
   EXPECT_EQ(calendar.adding({.year = 1}, Date::max()), std::nullopt);
   for (const Date edge : {Date::min(), Date::max()}) {
-    EXPECT_EQ(calendar.withWallClockOf(edge, "UTC"), std::nullopt);
+    EXPECT_EQ(calendar.adding({}, calendar.wallClock(edge, "UTC")), std::nullopt);
     EXPECT_EQ(calendar.adding({}, edge), std::nullopt);
   }
   EXPECT_EQ(calendar.adding({}, now), now);
