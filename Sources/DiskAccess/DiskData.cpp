@@ -47,8 +47,12 @@ void DiskData::releaseAccess(Basalt::ThreadID thread) {
   accessingThreads_.remove(thread);
   // A request joins only a full disk, and the disk's next release sees it. So if there is none now,
   // a pass has nothing to do.
-  if (!requests_.empty())
+  if (requests_.empty()) return;
+  // What was submitted before comes first: it may change how many places there are.
+  if (queue_->hasSubmittedBlocks())
     queue_->submit([self = shared_from_this()] { self->grantPendingRequests(); });
+  else
+    grantPendingRequests();
 }
 
 void DiskData::grantPendingRequests() {
