@@ -74,6 +74,10 @@ class SerialQueue::Core final {
     return runningThread_.load(std::memory_order_relaxed) == currentThreadID();
   }
 
+  [[nodiscard]] bool hasSubmittedBlocks() const {
+    return briefBlockCount_ > 0 || (word_.load(std::memory_order_acquire) & queued);
+  }
+
   void acquire();
   // Aligned so that its speed does not depend on the length of the code before it.
   [[gnu::aligned(cacheLine)]] void release() noexcept;
@@ -352,6 +356,10 @@ void SerialQueue::submit(Block&& block) {
 
 void SerialQueue::afterRelease(Block&& block) {
   core_->afterRelease(std::move(block));
+}
+
+bool SerialQueue::hasSubmittedBlocks() const {
+  return core_->hasSubmittedBlocks();
 }
 
 bool SerialQueue::isCurrent() const {

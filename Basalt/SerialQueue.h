@@ -54,6 +54,10 @@ class VARNEL_API SerialQueue final {
   /// the queue is given up.
   void submit(Block&& block);
 
+  /// From a block of the queue alone: whether blocks wait to run. If none does, a block may do at
+  /// its end what it would submit there.
+  [[nodiscard]] bool hasSubmittedBlocks() const;
+
   /// From a block of the queue alone: runs `block` on this thread once the queue has been given up.
   /// Use it to wake other threads: woken earlier, they would find the queue held.
   void afterRelease(Block&& block);

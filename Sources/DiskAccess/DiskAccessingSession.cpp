@@ -11,6 +11,21 @@
 #include <Varnel/DiskAccess/WaitingDeadline.h>
 
 namespace Varnel {
+namespace {
+
+using Use = DiskRecords::Use;
+
+// A place that the thread has from now on.
+std::unique_ptr<Use> useBy(Basalt::ThreadID thread, const DiskAccessingSession& session,
+                           const Platform::URL& volumeURL) {
+  return std::make_unique<Use>(Use{.thread = thread,
+                                   .record = session.diskData(),
+                                   .volumeURL = volumeURL,
+                                   .propose = session.propose(),
+                                   .since = std::chrono::steady_clock::now()});
+}
+
+}  // namespace
 
 DiskAccessingSession::DiskAccessingSession(Platform::URL url, std::string propose, bool secureScope,
                                            std::shared_ptr<DiskData> diskData,
@@ -40,12 +55,14 @@ bool DiskAccessingSession::waitForAdmission(Platform::QualityOfService qos,
                                             std::optional<Platform::TimeInterval> waitingTimeout) {
   const Basalt::ThreadID thread = Basalt::currentThreadID();
   Basalt::SerialQueue& queue = diskData_->queue();
+  auto use = useBy(thread, *this, volumeURL_);
   // The granting thread shares the request, because it may still be signalling when this thread
   // goes on.
   const auto request = queue.sync([&] {
     if (auto used = records_->usedBy(thread, volumeURL_)) diskData_ = std::move(used);
+    use->record = diskData_;
     auto pending = diskData_->requestAccess(thread, qos);
-    if (!pending) addUseBy(thread);
+    if (!pending) records_->add(std::move(use));
     return pending;
   });
   if (!request) return true;
@@ -53,37 +70,32 @@ bool DiskAccessingSession::waitForAdmission(Platform::QualityOfService qos,
       std::chrono::floor<Platform::Date::duration>(std::chrono::system_clock::now());
   const bool isSignalled = request->sema.waitUntil(waitingDeadline(now, waitingTimeout));
   if (!isSignalled && request->claim()) return false;
+  use->since = std::chrono::steady_clock::now();
   queue.sync([&] {
     diskData_->confirmAccess(thread);
-    addUseBy(thread);
+    records_->add(std::move(use));
   });
   return true;
 }
 
-void DiskAccessingSession::addUseBy(Basalt::ThreadID thread) const {
-  records_->add({.thread = thread,
-                 .record = diskData_,
-                 .volumeURL = volumeURL_,
-                 .propose = propose_,
-                 .since = std::chrono::steady_clock::now()});
-}
-
 void DiskAccessingSession::passFrom(Basalt::ThreadID thread) {
   const Basalt::ThreadID current = Basalt::currentThreadID();
+  auto use = useBy(current, *this, volumeURL_);
+  std::unique_ptr<Use> removed;
   diskData_->queue().sync([&] {
     diskData_->confirmAccess(current);
-    addUseBy(current);
+    records_->add(std::move(use));
     diskData_->releaseAccess(thread);
-    records_->remove(thread, diskData_, volumeURL_);
+    removed = records_->remove(thread, diskData_, volumeURL_);
   });
 }
 
 void DiskAccessingSession::endAccessing() {
   isAccessing_ = false;
   const Basalt::ThreadID thread = Basalt::currentThreadID();
-  diskData_->queue().sync([&] {
+  const auto removed = diskData_->queue().sync([&] {
     diskData_->releaseAccess(thread);
-    records_->remove(thread, diskData_, volumeURL_);
+    return records_->remove(thread, diskData_, volumeURL_);
   });
   if (secureScope_) scopes_->endAccessingSecurityScopedResource(url_, propose_);
 }

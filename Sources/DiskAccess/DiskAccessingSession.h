@@ -63,8 +63,6 @@ class VARNEL_API DiskAccessingSession final {
 
   [[nodiscard]] bool beginAccessing(Platform::QualityOfService qos,
                                     std::optional<Platform::TimeInterval> waitingTimeout);
-  /// On the queue of the records.
-  void addUseBy(Basalt::ThreadID thread) const;
   /// Makes the place, and the session, the calling thread's.
   void passFrom(Basalt::ThreadID thread);
   [[nodiscard]] bool waitForAdmission(Platform::QualityOfService qos,

@@ -47,11 +47,17 @@ void DiskData::releaseAccess(Basalt::ThreadID thread) {
   accessingThreads_.remove(thread);
   // A request joins only a full disk, and the disk's next release sees it. So if there is none now,
   // a pass has nothing to do.
-  if (!requests_.empty())
+  if (requests_.empty()) [[likely]]
+    return;
+  // What was submitted before comes first: it may change how many places there are.
+  if (queue_->hasSubmittedBlocks())
     queue_->submit([self = shared_from_this()] { self->grantPendingRequests(); });
+  else
+    grantPendingRequests();
 }
 
-void DiskData::grantPendingRequests() {
+// Out of line, so that a release which nobody waits for stays short.
+[[gnu::noinline]] void DiskData::grantPendingRequests() {
   Basalt::QNAssertOnQueue(*queue_);
   if (!hasFreePlace()) return;
   Requests granted = claimPendingRequests();

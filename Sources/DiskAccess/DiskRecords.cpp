@@ -54,20 +54,25 @@ std::shared_ptr<DiskData> DiskRecords::usedBy(Basalt::ThreadID thread,
     const auto disk = ofVolume(volumeURL);
     return disk && (disk == use.record || disk == ofVolume(use.volumeURL));
   };
-  for (const Use& use : uses_)
-    if (use.thread == thread && (use.volumeURL == volumeURL || isOfItsDisk(use))) return use.record;
+  for (const auto& use : uses_)
+    if (use->thread == thread && (use->volumeURL == volumeURL || isOfItsDisk(*use)))
+      return use->record;
   return nullptr;
 }
 
-void DiskRecords::remove(Basalt::ThreadID thread, const std::shared_ptr<DiskData>& record,
-                         const Platform::URL& volumeURL) {
+std::unique_ptr<DiskRecords::Use> DiskRecords::remove(Basalt::ThreadID thread,
+                                                      const std::shared_ptr<DiskData>& record,
+                                                      const Platform::URL& volumeURL) {
   auto found = uses_.end();
   for (auto use = uses_.begin(); use != uses_.end(); ++use) {
-    if (use->thread != thread || use->record != record) continue;
+    if ((*use)->thread != thread || (*use)->record != record) continue;
     found = use;
-    if (use->volumeURL == volumeURL) break;
+    if ((*use)->volumeURL == volumeURL) break;
   }
-  if (found != uses_.end()) uses_.erase(found);
+  if (found == uses_.end()) return nullptr;
+  auto removed = std::move(*found);
+  uses_.erase(found);
+  return removed;
 }
 
 void DiskRecords::addWaiterForProcesses(std::shared_ptr<DiskData> record, int urgencyClass) {
@@ -94,8 +99,8 @@ std::vector<DiskAccessSnapshot> DiskRecords::snapshots() const {
                            .waiters = record.waiterCounts()});
     return snapshots[index->second];
   };
-  for (const Use& use : uses_)
-    snapshotOf(*use.record).places.push_back({use.thread, use.propose, use.since});
+  for (const auto& use : uses_)
+    snapshotOf(*use->record).places.push_back({use->thread, use->propose, use->since});
   for (const auto& [record, urgencyClass] : waitersForProcesses_)
     ++snapshotOf(*record).waitersForProcesses[static_cast<std::size_t>(urgencyClass)];
   return snapshots;

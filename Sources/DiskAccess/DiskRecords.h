@@ -51,12 +51,14 @@ class DiskRecords final {
     DiskAccessSnapshot::Time since{};
   };
 
-  void add(Use use) { uses_.push_back(std::move(use)); }
+  /// Takes over a use that was made before there was a place for it: what a woken thread does here
+  /// keeps it from its disk.
+  void add(std::unique_ptr<Use> use) { uses_.push_back(std::move(use)); }
 
-  /// Takes one such use out or, if there is none, any other use of the record by the thread. So the
-  /// thread stands here as often as the record counts it.
-  void remove(Basalt::ThreadID thread, const std::shared_ptr<DiskData>& record,
-              const Platform::URL& volumeURL);
+  /// Hands out one such use or, if there is none, any other use of the record by the thread. So the
+  /// thread stands here as often as the record counts it. Destroy it once others have been woken.
+  std::unique_ptr<Use> remove(Basalt::ThreadID thread, const std::shared_ptr<DiskData>& record,
+                              const Platform::URL& volumeURL);
 
   /// A thread of a class waits for a place that other processes have, or has stopped waiting.
   void addWaiterForProcesses(std::shared_ptr<DiskData> record, int urgencyClass);
@@ -71,7 +73,7 @@ class DiskRecords final {
   const std::shared_ptr<Basalt::SerialQueue> queue_;
   std::unordered_map<Platform::URL, std::string> diskUniqueIDsByVolumeURL_;
   std::unordered_map<std::string, std::shared_ptr<DiskData>> diskDataByUniqueID_;
-  std::vector<Use> uses_;
+  std::vector<std::unique_ptr<Use>> uses_;  ///< In the order in which the places were taken.
   std::vector<WaiterForProcesses> waitersForProcesses_;
 };
 

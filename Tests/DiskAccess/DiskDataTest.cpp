@@ -94,6 +94,20 @@ TEST_F(DiskDataTest, OneFreePlaceWakesEveryWaiter) {
   EXPECT_TRUE(isSignalled(*late));
 }
 
+TEST_F(DiskDataTest, GrantsAfterWhatWasSubmittedBeforeTheRelease) {
+  const auto data = disk(OVDiskKindRotational);
+  EXPECT_FALSE(request(*data, first));
+  EXPECT_FALSE(request(*data, second));
+  const auto waiting = request(*data, third);
+  queue_->sync([&] {
+    queue_->submit([&] { data->setIsBackgroundMode(true); });
+    data->releaseAccess(first);
+  });
+  EXPECT_FALSE(isSignalled(*waiting)) << "the one place of background mode is taken";
+  release(*data, second);
+  EXPECT_TRUE(isSignalled(*waiting));
+}
+
 TEST_F(DiskDataTest, ThreadsThatGiveUpDoNotPileUp) {
   const auto data = disk(OVDiskKindUnknown);
   EXPECT_FALSE(request(*data, first));

@@ -24,16 +24,22 @@ class BrokenPipeIsNoSignal final {
     ::sigemptyset(&brokenPipe_);
     ::sigaddset(&brokenPipe_, SIGPIPE);
     ::pthread_sigmask(SIG_BLOCK, &brokenPipe_, &before_);
-    wasPending_ = isPending();
+    wasBlocked_ = ::sigismember(&before_, SIGPIPE) == 1;
+    // A signal that is not blocked does not stay pending.
+    wasPending_ = wasBlocked_ && isPending();
   }
   ~BrokenPipeIsNoSignal() {
-    constexpr timespec atOnce{};
-    if (!wasPending_ && isPending())
-      while (::sigtimedwait(&brokenPipe_, nullptr, &atOnce) < 0 && errno == EINTR) continue;
-    ::pthread_sigmask(SIG_SETMASK, &before_, nullptr);
+    if (!wasBlocked_) ::pthread_sigmask(SIG_SETMASK, &before_, nullptr);
   }
   BrokenPipeIsNoSignal(const BrokenPipeIsNoSignal&) = delete;
   BrokenPipeIsNoSignal& operator=(const BrokenPipeIsNoSignal&) = delete;
+
+  /// After a write that failed: no other brings the signal.
+  void consume() {
+    constexpr timespec atOnce{};
+    if (!wasPending_)
+      while (::sigtimedwait(&brokenPipe_, nullptr, &atOnce) < 0 && errno == EINTR) continue;
+  }
 
  private:
   static bool isPending() {
@@ -44,6 +50,7 @@ class BrokenPipeIsNoSignal final {
 
   sigset_t brokenPipe_;
   sigset_t before_;
+  bool wasBlocked_ = false;
   bool wasPending_ = false;
 };
 
@@ -61,12 +68,14 @@ class LockedStream final {
 
 // Called with the stream's lock held, and only for a write that may go beyond the buffer.
 void write(std::FILE* stream, std::string_view text, bool flushes) {
-  const BrokenPipeIsNoSignal guard;
+  BrokenPipeIsNoSignal guard;
   errno = 0;  // A stream of wide text refuses this one and sets none.
   const bool isWritten = ::fwrite_unlocked(text.data(), 1, text.size(), stream) == text.size() &&
                          (!flushes || ::fflush_unlocked(stream) == 0);
+  if (errno != EPIPE) return;
+  guard.consume();
   // Text that nobody can read any more would be written again, at the latest when the process ends.
-  if (!isWritten && errno == EPIPE) ::__fpurge(stream);
+  if (!isWritten) ::__fpurge(stream);
 }
 
 std::atomic<bool> isProcessEnding = false;
