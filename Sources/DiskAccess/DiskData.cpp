@@ -77,9 +77,11 @@ std::array<std::size_t, urgencyClassCount> DiskData::waiterCounts() const {
 DiskData::Requests DiskData::claimPendingRequests() {
   Requests granted = std::exchange(requests_, {});
   std::erase_if(granted, [](const auto& request) { return !request->claim(); });
-  std::stable_sort(granted.begin(), granted.end(), [](const auto& one, const auto& other) {
-    return one->urgencyClass() < other->urgencyClass();
-  });
+  // One alone needs no room for sorting.
+  if (granted.size() > 1)
+    std::stable_sort(granted.begin(), granted.end(), [](const auto& one, const auto& other) {
+      return one->urgencyClass() < other->urgencyClass();
+    });
   return granted;
 }
 
