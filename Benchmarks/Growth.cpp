@@ -232,7 +232,7 @@ Nanoseconds scannedFiles(int count) {
     std::ofstream(below / std::to_string(i)) << fmt::format("{:020}", content);
   }
   const std::string command =
-      fmt::format("HOME={0} {1} scan --json {0}/files >{0}/found", folder.path().string(),
+      fmt::format("HOME={0} '{1}' scan --json {0}/files >{0}/found", folder.path().string(),
                   (fs::canonical("/proc/self/exe").parent_path() / "orvane").string());
   return fastest([&] {
     return costOf(

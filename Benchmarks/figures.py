@@ -10,8 +10,9 @@ import sys
 from dataclasses import dataclass
 
 # At least two spaces part the columns.
-LINE = re.compile(r"(?P<what>\S.*? / .*?)  +(?P<ours>[\d.]+)(?: (?P<unit>[^\s\d]+))?  +(?P<stand_in>[\d.]+)(?: [^\s\d]+)?"
-                  r"  +(?P<ratio>\d+\.\d\d)  +(?P<goal>\d+\.\d\d|-)(?:  +\w+)?\s*")
+NUMBER = r"-?(?:[\d.]+|nan|inf)"
+LINE = re.compile(rf"(?P<what>\S.*? / .*?)  +(?P<ours>{NUMBER})(?: (?P<unit>[^\s\d]+))?  +(?P<stand_in>{NUMBER})"
+                  rf"(?: [^\s\d]+)?  +(?P<ratio>{NUMBER})  +(?P<goal>\d+\.\d\d|-)(?:  +\w+)?\s*")
 
 
 @dataclass(frozen=True)

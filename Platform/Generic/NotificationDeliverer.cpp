@@ -92,10 +92,11 @@ NotificationDeliverer::Failure NotificationDeliverer::deliver() {
   const std::vector every{planned, due, hidden, toShow, shown, expired, removed};
   auto all = store_->deliveries(every);
   if (!all) return all.error();
-  if (auto error = becomeDeliverer(*all)) return error;
+  const Date now = ports_.clock.now();
+  if (auto error = becomeDeliverer(*all, now)) return error;
   // Where nothing is due, a schedule may still have to go on from a clock that was set back.
   if (duty_ == Duty::everything && !isBehind_) {
-    if (auto error = store_->claimDue(ports_.clock.now(), calendar())) return error;
+    if (auto error = store_->claimDue(now, calendar())) return error;
     if (all = store_->deliveries(every); !all) return all.error();
   }
   const bool mayDeliver = lock_ && duty_ != Duty::nothing;
@@ -110,10 +111,9 @@ NotificationDeliverer::Failure NotificationDeliverer::deliver() {
 
 // Where there is something to deliver. Succeeds also where somebody else is the deliverer.
 NotificationDeliverer::Failure NotificationDeliverer::becomeDeliverer(
-    const std::vector<Delivery>& all) {
+    const std::vector<Delivery>& all, Date now) {
   if (duty_ == Duty::nothing && !isBusy()) lock_.reset();
   if (duty_ == Duty::nothing || lock_) return std::nullopt;
-  const Date now = ports_.clock.now();
   const Calendar present = calendar();
   const auto isDue = [&](const Delivery& each) {
     if (each.state != planned) return each.state == due || banners_->isToShow(each);

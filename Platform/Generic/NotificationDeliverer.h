@@ -97,7 +97,7 @@ class NotificationDeliverer final {
   [[nodiscard]] bool isStoreThere() const;
   [[nodiscard]] Failure follow();
   [[nodiscard]] Failure deliver();
-  [[nodiscard]] Failure becomeDeliverer(const std::vector<Delivery>& all);
+  [[nodiscard]] Failure becomeDeliverer(const std::vector<Delivery>& all, Date now);
   void ask(const std::vector<Delivery>& all);
   void take(std::int64_t number, bool isToShow);
   [[nodiscard]] bool isOverdue(const Question& question) const;

@@ -27,7 +27,7 @@ class FakeDiskArbitration final : public DiskArbitration {
   /// with.
   void setMountURLs(const std::string& deviceName, std::vector<URL> urls) {
     const std::lock_guard lock(mutex_);
-    if (mounts_.use_count() > 1) mounts_ = std::make_shared<Mounts>(*mounts_);
+    if (std::exchange(isHandedOut_, false)) mounts_ = std::make_shared<Mounts>(*mounts_);
     mounts_->insert_or_assign(deviceName, std::move(urls));
   }
 
@@ -45,6 +45,7 @@ class FakeDiskArbitration final : public DiskArbitration {
     if (faults->strikes()) return nullptr;
     const std::lock_guard lock(mutex_);
     if (!reachable_) return nullptr;
+    isHandedOut_ = true;
     return std::make_unique<FakeSession>(mounts_, counts_, faults);
   }
 
@@ -80,8 +81,8 @@ class FakeDiskArbitration final : public DiskArbitration {
 
   const std::shared_ptr<Counts> counts_ = std::make_shared<Counts>();
   std::mutex mutex_;  ///< Owns what follows.
-  std::shared_ptr<Mounts> mounts_ =
-      std::make_shared<Mounts>();  ///< Changed while no session has it.
+  std::shared_ptr<Mounts> mounts_ = std::make_shared<Mounts>();
+  bool isHandedOut_ = false;  ///< Then `mounts_` is replaced, not changed.
   bool reachable_ = true;
 };
 

@@ -62,7 +62,10 @@ bool DiskAccessingSession::waitForAdmission(Platform::QualityOfService qos,
     if (auto used = records_->usedBy(thread, volumeURL_)) diskData_ = std::move(used);
     use->record = diskData_;
     auto pending = diskData_->requestAccess(thread, qos);
-    if (!pending) records_->add(std::move(use));
+    if (!pending) {
+      use->since = std::chrono::steady_clock::now();
+      records_->add(std::move(use));
+    }
     return pending;
   });
   if (!request) return true;

@@ -7,6 +7,7 @@
 
 #include <atomic>
 #include <cerrno>
+#include <climits>
 #include <cstdio>
 #include <cstdlib>
 #include <ctime>
@@ -34,7 +35,7 @@ class BrokenPipeIsNoSignal final {
   BrokenPipeIsNoSignal(const BrokenPipeIsNoSignal&) = delete;
   BrokenPipeIsNoSignal& operator=(const BrokenPipeIsNoSignal&) = delete;
 
-  /// After a write that failed: no other brings the signal.
+  /// To be called after a write that may have brought the signal.
   void consume() {
     constexpr timespec atOnce{};
     if (!wasPending_)
@@ -68,14 +69,17 @@ class LockedStream final {
 
 // Called with the stream's lock held, and only for a write that may go beyond the buffer.
 void write(std::FILE* stream, std::string_view text, bool flushes) {
+  // A pipe takes a part of what is larger and sends the signal, while the rest may meet its next
+  // reader.
+  const bool mayBeParted = ::__fpending(stream) + text.size() > PIPE_BUF;
   BrokenPipeIsNoSignal guard;
   errno = 0;  // A stream of wide text refuses this one and sets none.
   const bool isWritten = ::fwrite_unlocked(text.data(), 1, text.size(), stream) == text.size() &&
                          (!flushes || ::fflush_unlocked(stream) == 0);
-  if (errno != EPIPE) return;
-  guard.consume();
+  const bool isBroken = errno == EPIPE;
+  if (isBroken || mayBeParted) guard.consume();
   // Text that nobody can read any more would be written again, at the latest when the process ends.
-  if (!isWritten) ::__fpurge(stream);
+  if (isBroken && !isWritten) ::__fpurge(stream);
 }
 
 std::atomic<bool> isProcessEnding = false;

@@ -50,14 +50,16 @@ class Replacement final {
         path_(target_.parent_path() / (".orvane-" + Varnel::Platform::randomUUIDString())) {
     struct stat before {};
     const bool replaces = ::stat(target_.c_str(), &before) == 0;
-    const ::mode_t mode = replaces ? before.st_mode & 0777 : 0666;
-    const int made = ::open(path_.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, mode);
+    // Who could not read what was there reads nothing of this, not even before the group is its
+    // own.
+    const int made =
+        ::open(path_.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, replaces ? 0600 : 0666);
     if (made < 0) return;
     isThere_ = true;
-    // Who could not read what was there reads nothing of this. Some file systems know no modes.
+    // Some file systems know no modes.
     if (replaces) {
       const bool isOfGroup = ::fchown(made, static_cast<::uid_t>(-1), before.st_gid) == 0;
-      (void)::fchmod(made, mode & (isOfGroup ? 0777u : 0707u));
+      (void)::fchmod(made, before.st_mode & (isOfGroup ? 0777u : 0707u));
     }
     file_ = File(::fdopen(made, "wb"));
     if (!file_) ::close(made);
