@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <clocale>
+#include <mutex>
 
 #include <Scan/Glob.h>
 #include <Tests/Programs/ScanFixture.h>
@@ -85,8 +86,12 @@ TEST_F(ScanChoice, TakesTheFilesThatAreAskedFor) {
        {".hidden/3.jpg", "sub/5.jpg"}},
   };
   for (const auto& [request, names] : cases) EXPECT_EQ(found(request), names);
+  std::mutex mutex;
   std::vector<std::string> entered;
-  fileSystem.beforeOpenFolder = [&](const std::string& path) { entered.push_back(path); };
+  fileSystem.beforeOpenFolder = [&](const std::string& path) {
+    const std::lock_guard lock(mutex);
+    entered.push_back(path);
+  };
   EXPECT_THAT(found({.exclude = {"sub/cache/", ".*", "large?"}}),
               ElementsAre("1.jpg", "2.txt", "sub/5.jpg"));
   for (const std::string& path : entered)
