@@ -9,7 +9,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <string>
-#include <utility>
+#include <thread>
 #include <vector>
 
 #include <Tests/Support/ForbiddenCalls.h>
@@ -75,34 +75,44 @@ std::size_t readAll(const CachedFile& file) {
   }
 }
 
-TEST(TracelessReader, LeavesInTheCacheWhatWasThere) {
-  struct Kernel {
-    std::vector<Tests::ForbiddenCall> lacks;
-    std::ptrdiff_t maxLeft;  ///< Pages that were read ahead while the reader asked for them.
-  };
+struct Kernel {
+  std::vector<Tests::ForbiddenCall> lacks;
+  std::ptrdiff_t maxLeft;  ///< Pages that were read ahead while the reader asked for them.
+};
+
+/// What differs in the cache after a cold, a warm and a mixed file were read; empty for nothing.
+std::string traces(const Kernel& kernel) {
   constexpr std::size_t pageCount = 2000;
+  const CachedFile cold(pageCount);
+  const CachedFile warm(pageCount);
+  const CachedFile mixed(pageCount);
+  for (std::size_t page = 0; page < pageCount; ++page) warm.load(page);
+  for (const std::size_t page : {0u, 7u, 8u, 1999u}) mixed.load(page);
+  const std::string before = mixed.pages();
+  Tests::onAKernelThatForbids(kernel.lacks, EOPNOTSUPP, [&] {
+    for (const CachedFile* file : {&cold, &warm, &mixed})
+      EXPECT_EQ(readAll(*file), pageCount * pageSize);
+  });
+  const std::string after = mixed.pages();
+  const auto present = [](const std::string& pages) { return std::ranges::count(pages, '1'); };
+  std::string result;
+  if (present(warm.pages()) != pageCount) result += " fewer of the warm file";
+  if (present(cold.pages()) > kernel.maxLeft) result += " pages of the cold file";
+  if (present(after) - present(before) > kernel.maxLeft) result += " pages of the mixed file";
+  for (std::size_t page = 0; page < pageCount; ++page)
+    if (before[page] > after[page]) result += " not page " + std::to_string(page);
+  return result;
+}
+
+TEST(TracelessReader, LeavesInTheCacheWhatWasThere) {
+  if (CachedFile(1).pages() != "0")
+    GTEST_SKIP() << "the file system of temporary files is a cache itself";
   for (const Kernel& kernel :
        {Kernel{{}, 0}, Kernel{{{SYS_preadv2, dropBehind}}, 256}, Kernel{{SYS_preadv2}, 0}}) {
-    const CachedFile cold(pageCount);
-    if (cold.pages().find('1') != std::string::npos)
-      GTEST_SKIP() << "the file system of temporary files is a cache itself";
-    const CachedFile warm(pageCount);
-    const CachedFile mixed(pageCount);
-    for (std::size_t page = 0; page < pageCount; ++page) warm.load(page);
-    for (const std::size_t page : {0u, 7u, 8u, 1999u}) mixed.load(page);
-    const std::string before = mixed.pages();
-    ASSERT_NE(before.find('0'), std::string::npos);
-    Tests::onAKernelThatForbids(kernel.lacks, EOPNOTSUPP, [&] {
-      for (const CachedFile* file : {&cold, &warm, &mixed})
-        EXPECT_EQ(readAll(*file), pageCount * pageSize);
-    });
-    EXPECT_EQ(warm.pages(), std::string(pageCount, '1')) << kernel.maxLeft;
-    const std::string after = mixed.pages();
-    for (const auto& [pages, present] :
-         {std::pair(cold.pages(), std::ptrdiff_t(0)), {after, std::ranges::count(before, '1')}})
-      EXPECT_LE(std::ranges::count(pages, '1') - present, kernel.maxLeft);
-    for (std::size_t page = 0; page < pageCount; ++page)
-      EXPECT_LE(before[page], after[page]) << page;
+    // A kernel may take any page at any time, and some do; the reader's own faults come each time.
+    std::string found = traces(kernel);
+    for (int again = 0; again < 9 && !found.empty(); ++again) found = traces(kernel);
+    EXPECT_EQ(found, "") << kernel.lacks.size() << ", " << kernel.maxLeft;
   }
 }
 
