@@ -143,7 +143,7 @@ TEST_F(ScanReading, LeavesThePageCacheAloneWhereItShould) {
     return pages;
   };
   EXPECT_EQ(scanAs(CacheUse::traceless), 0);
-  EXPECT_GE(scanAs(CacheUse::normal), 2 * 245);
+  EXPECT_GE(scanAs(CacheUse::normal), 2 * 200) << "of 490; the kernel may take some";
 }
 
 TEST_F(ScanReading, StopsWithinAFileWhenAskedTo) {
