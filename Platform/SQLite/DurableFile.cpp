@@ -279,8 +279,8 @@ DurableFile::Failure DurableFile::check() {
   std::string verdict = "no verdict";
   if (auto error = connection_->database.row("PRAGMA quick_check(1)", std::tie(verdict)))
     return error;
-  if (verdict == "ok") return std::nullopt;
-  return fileError(SQLiteFailure::damaged, verdict);
+  if (verdict != "ok") return fileError(SQLiteFailure::damaged, verdict);
+  return judgeColumns(connection_->database, format_);
 }
 
 PlatformError DurableFile::said(const PlatformError& error) {

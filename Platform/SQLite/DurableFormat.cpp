@@ -2,6 +2,7 @@
 #include <Varnel/Platform/SQLite/DurableFormat.h>
 
 #include <algorithm>
+#include <set>
 
 #include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 #include <Varnel/Platform/SQLite/SQLiteFailure.h>
@@ -58,6 +59,17 @@ Failure missingTable(SQLiteDatabase& database, const DurableFormat& format) {
   return std::nullopt;
 }
 
+// What the schema says of a table's columns, all that an insertion or a search relies on.
+Result<std::set<std::string>> columnsOf(SQLiteDatabase& database, const std::string& table) {
+  std::set<std::string> columns;
+  const auto error = database.each(
+      "SELECT printf('%s %s %d %s %d', name, type, \"notnull\", dflt_value, pk)"
+      " FROM pragma_table_info(?)",
+      [&](SQLiteStatement& row) { columns.emplace(row.text(0).value_or("")); }, table);
+  if (error) return *error;
+  return columns;
+}
+
 Failure stamp(SQLiteDatabase& database, const DurableFormat& format) {
   return database.execute(
       fmt::format("PRAGMA application_id = {}; PRAGMA user_version = {}", format.applicationID,
@@ -92,6 +104,25 @@ Failure judgeFormat(SQLiteDatabase& database, const DurableFormat& format, Migra
   if (version.major < format.version.major && !canMigrate(format, version, migrating))
     return fileError(SQLiteFailure::older, named);
   return version == format.version ? missingTable(database, format) : std::nullopt;
+}
+
+Failure judgeColumns(SQLiteDatabase& database, const DurableFormat& format) {
+  const auto found = formatOf(database);
+  if (!found) return found.error();
+  if (found->version != format.version) return std::nullopt;
+  auto model = SQLiteDatabase::open(":memory:");
+  if (!model) return model.error();
+  if (auto error = create(*model, format)) return error;
+  for (const SavedTable& table : format.tables) {
+    const auto there = columnsOf(database, table.name);
+    if (!there) return there.error();
+    const auto expected = columnsOf(*model, table.name);
+    if (!expected) return expected.error();
+    if (!std::ranges::includes(*there, *expected))
+      return fileError(SQLiteFailure::damaged,
+                       fmt::format("the table {} has other columns", table.name));
+  }
+  return std::nullopt;
 }
 
 Failure applyFormat(SQLiteDatabase& database, const DurableFormat& format, Migrating migrating) {

@@ -14,7 +14,7 @@ namespace {
 
 using Verdict = Comparison::Verdict;
 
-constexpr std::size_t blockLength = 1024 * 1024;
+constexpr std::size_t blockLength = std::size_t{1} << 20;
 /// Then others come in, who read more urgently.
 constexpr std::uint64_t maxTurn = 16 * blockLength;
 

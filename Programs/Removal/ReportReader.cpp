@@ -128,14 +128,19 @@ class Builder final : public nlohmann::json_sax<nlohmann::json> {
   }
   bool string(string_t& value) override {
     return take([&] {
-      if (isIn(Level::roots)) report.roots.push_back(std::move(value));
-      if (isIn(Level::names)) file().names.push_back(std::move(value));
       if (isIn(Level::nameURLs)) return takeURL(value, exactNames_.emplace_back());
-      if (isAt(Level::file, "path")) file().path = std::move(value);
       if (isAt(Level::file, "url")) return takeURL(value, exactPath_);
-      if (!isAt(Level::file, "modified")) return true;
-      hasTime_ = readTime(value, file());
-      return hasTime_ || fails("\"modified\" has no time");
+      if (isAt(Level::file, "modified")) {
+        hasTime_ = readTime(value, file());
+        return hasTime_ || fails("\"modified\" has no time");
+      }
+      if (isIn(Level::roots))
+        report.roots.push_back(std::move(value));
+      else if (isIn(Level::names))
+        file().names.push_back(std::move(value));
+      else if (isAt(Level::file, "path"))
+        file().path = std::move(value);
+      return true;
     });
   }
   bool binary(binary_t&) override { return otherNumber(); }

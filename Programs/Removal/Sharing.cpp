@@ -16,7 +16,7 @@ namespace {
 using Outcome = SharingStep::Outcome;
 
 /// A multiple of every block length, so that all parts but a file's last can be shared.
-constexpr std::uint64_t maxPart = 16 * 1024 * 1024;
+constexpr std::uint64_t maxPart = std::uint64_t{16} << 20;
 
 bool isAsReported(const FileStatus& status, const ReportFile& file, std::uint64_t size) {
   // Wraps around as the time in the status does.

@@ -36,10 +36,10 @@ enum class Look {
 
 /// How much of a file is looked at first. The system reads this much in one go anyway, and most
 /// files are not larger.
-constexpr std::uint64_t headLength = 16 * 1024;
+constexpr std::uint64_t headLength = std::uint64_t{16} << 10;
 
 /// From this size on, a look at samples costs little beside reading everything, even on a disk that
 /// reads five megabytes in the time of the look's two seeks.
-constexpr std::uint64_t worthSamples = 8 * 1024 * 1024;
+constexpr std::uint64_t worthSamples = std::uint64_t{8} << 20;
 
 }  // namespace Orvane

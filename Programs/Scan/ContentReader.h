@@ -65,7 +65,7 @@ class ContentReader final {
   [[nodiscard]] static std::uint64_t lengthOf(Look look, std::uint64_t size);
 
   /// How large a file may be to be read in one block.
-  static constexpr std::uint64_t blockLength = 256 * 1024;
+  static constexpr std::uint64_t blockLength = std::uint64_t{256} << 10;
 
   /// Where the file lies on its volume, if that can be told. Reads nothing.
   [[nodiscard]] std::optional<std::uint64_t> placeOf(FileNumber file);

@@ -16,11 +16,11 @@ namespace {
 
 /// Files from this size on are read one after the other on an ordered disk, as its head would go
 /// back and forth between two. Less is read at once where the disk must work.
-constexpr std::uint64_t largeLength = 1024 * 1024;
+constexpr std::uint64_t largeLength = std::uint64_t{1} << 20;
 
 /// A turn that was over after fewer files and bytes than these was spent waiting for the disk.
 constexpr unsigned warmFiles = 8;
-constexpr std::uint64_t warmBytes = 1024 * 1024;
+constexpr std::uint64_t warmBytes = std::uint64_t{1} << 20;
 
 /// After this many files of a volume without a known place, the others are not asked for theirs.
 constexpr unsigned maxUnplaced = 8;

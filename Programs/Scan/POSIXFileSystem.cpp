@@ -185,7 +185,7 @@ class DescriptorFolder final : public OpenFolder {
  private:
   /// Each may cost a disk that must work, or a share, some milliseconds.
   static constexpr std::size_t maxVisits = 32;
-  static constexpr std::size_t bufferLength = 64 * 1024;
+  static constexpr std::size_t bufferLength = std::size_t{64} << 10;
 
   /// Fetches the next entries from the system, in the order in which their facts lie on most disks.
   FileResult<bool> readEntries() {

@@ -28,10 +28,10 @@ Value flag(std::shared_ptr<Command> command, T Command::*member,
 
 /// Any text, or what a check has no complaint about.
 template <typename Command, typename Text>
-Value text(std::string name, std::shared_ptr<Command> command, Text Command::*member,
+Value text(const std::string& name, std::shared_ptr<Command> command, Text Command::*member,
            Value::Kind kind = Value::Kind::text,
-           std::function<Complaint(const std::string&)> check = {}) {
-  return {.name = std::move(name), .kind = kind, .take = [=](const std::string& given) {
+           const std::function<Complaint(const std::string&)>& check = {}) {
+  return {.name = name, .kind = kind, .take = [=](const std::string& given) {
             Complaint complaint = check ? check(given) : std::nullopt;
             if constexpr (std::is_same_v<Text, std::vector<std::string>>) {
               ((*command).*member).push_back(given);
@@ -64,9 +64,9 @@ Value word(std::string name, std::shared_ptr<Command> command, T Command::*membe
 
 /// Digits and nothing else: no sign, no other base.
 template <typename Command, typename T>
-Value wholeNumber(std::string name, std::string thing, std::shared_ptr<Command> command,
-                  T Command::*member) {
-  return {.name = std::move(name), .take = [=](const std::string& given) {
+Value wholeNumber(const std::string& name, const std::string& thing,
+                  std::shared_ptr<Command> command, T Command::*member) {
+  return {.name = name, .take = [=](const std::string& given) {
             const char* const end = given.data() + given.size();
             T& count = (*command).*member;
             const auto [stop, status] = std::from_chars(given.data(), end, count);

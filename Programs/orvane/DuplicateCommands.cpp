@@ -13,8 +13,6 @@
 namespace Orvane {
 namespace {
 
-using Varnel::Platform::QualityOfService;
-
 Complaint checkFolder(const std::string& name) {
   return name.empty() ? Complaint("the name of a folder is empty") : std::nullopt;
 }
@@ -76,7 +74,7 @@ std::vector<Option> choosingOptions(const std::shared_ptr<ScanChoice>& choice) {
 
 /// The options of a scan that do not choose.
 std::vector<Option> workingOptions(const std::shared_ptr<ScanCommand>& command) {
-  using enum QualityOfService;
+  using enum Varnel::Platform::QualityOfService;
   return {
       {.letter = 'j',
        .name = "json",

@@ -86,7 +86,7 @@ Varnel::Platform::Result<FilesByFolder, std::string> readFileList(const std::str
   const Input input(name);
   Collector files;
   std::string path;
-  std::array<char, 64 * 1024> buffer;
+  std::array<char, std::size_t{64} << 10> buffer;
   for (ssize_t count; (count = input.read(buffer)) != 0;) {
     if (count < 0) return std::generic_category().message(errno);
     std::string_view text(buffer.data(), static_cast<std::size_t>(count));

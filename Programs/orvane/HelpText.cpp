@@ -60,6 +60,7 @@ std::string wrapped(const std::string& words, std::size_t indent = 0) {
 
 std::vector<Line> linesOf(const std::vector<Option>& options) {
   std::vector<Line> lines;
+  lines.reserve(options.size());
   for (const Option& option : options)
     lines.push_back({(option.letter == 0 ? "    " : "") + formsOf(option), descriptionOf(option)});
   return lines;

@@ -180,7 +180,7 @@ void ManagedDiskTurns::submit(const Disk& disk, std::shared_ptr<DiskTask> task,
 // What the task reads may lie on any volume of the disk. What lay on the one that is gone shows
 // when it is opened.
 void ManagedDiskTurns::goOnWithout(const DiskReadingFile& vanished, const Disk& disk,
-                                   std::shared_ptr<DiskTask> task) {
+                                   const std::shared_ptr<DiskTask>& task) {
   std::unique_lock lock(mutex_);
   std::vector<DiskReadingFile>& files = disk.files;
   if (files.size() > 1)

@@ -52,7 +52,7 @@ class ManagedDiskTurns final : public DiskTurns {
   void submit(const Disk& disk, std::shared_ptr<DiskTask> task,
               const Varnel::DiskReadingFile& file);
   void goOnWithout(const Varnel::DiskReadingFile& vanished, const Disk& disk,
-                   std::shared_ptr<DiskTask> task);
+                   const std::shared_ptr<DiskTask>& task);
 
   const Ports ports_;
   const Varnel::Platform::QualityOfService qos_;

@@ -3,7 +3,6 @@
 
 #include <algorithm>
 #include <array>
-#include <cctype>
 #include <filesystem>
 #include <string_view>
 
@@ -41,9 +40,8 @@ std::optional<DataFile> fileAt(const fs::path& path) {
 // "2026-03-14.log"
 bool isLogName(const std::string& name) {
   constexpr std::string_view pattern = "0000-00-00.log";
-  return std::equal(
-      name.begin(), name.end(), pattern.begin(), pattern.end(),
-      [](unsigned char c, char p) { return p == '0' ? std::isdigit(c) != 0 : c == p; });
+  return std::equal(name.begin(), name.end(), pattern.begin(), pattern.end(),
+                    [](char c, char p) { return p == '0' ? c >= '0' && c <= '9' : c == p; });
 }
 
 // A folder that is a link may be anybody's, and so may the files in it.

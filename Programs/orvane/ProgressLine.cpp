@@ -5,6 +5,7 @@
 #include <condition_variable>
 #include <mutex>
 #include <optional>
+#include <string_view>
 #include <vector>
 
 #include <Scan/ScanObserver.h>
@@ -78,9 +79,9 @@ std::string ProgressLine::text(const ScanControl& control, std::chrono::millisec
   }
   std::string line;
   for (const std::string& part : parts) {
-    const std::string longer = line.empty() ? part : line + ", " + part;
-    if (longer.size() > columns) break;
-    line = longer;
+    const std::string_view separator = line.empty() ? "" : ", ";
+    if (line.size() + separator.size() + part.size() > columns) break;
+    line.append(separator).append(part);
   }
   return line.empty() ? parts.front().substr(0, columns) : line;
 }

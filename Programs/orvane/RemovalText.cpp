@@ -78,7 +78,7 @@ class Lines final {
   /// Before what follows. In one column, each group ends with it.
   [[nodiscard]] std::string tail() const { return left_ > 0 ? "\n" : ""; }
 
-  [[nodiscard]] std::string group(std::string kept, bool isTie,
+  [[nodiscard]] std::string group(const std::string& kept, bool isTie,
                                   const std::vector<std::pair<std::string, std::string>>& victims) {
     const std::string mark = isTie ? " [tie]" : "";
     std::string text;

@@ -35,7 +35,7 @@ class TextParts final {
   }
 
  private:
-  static constexpr std::size_t maxPart = 64 * 1024;
+  static constexpr std::size_t maxPart = std::size_t{64} << 10;
 
   const TextWriter& write_;
   std::string part_;

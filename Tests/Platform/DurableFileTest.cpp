@@ -188,6 +188,14 @@ TEST_P(DurableFileTest, SetsADamagedFileAsideAndSavesItsRows) {
          EXPECT_FALSE(database->execute("DROP TABLE note"));
        },
        false},
+      {"with another column under the old name",
+       [&] {
+         auto database = SQLiteDatabase::open(path_, SQLiteDatabase::Access::readWrite);
+         EXPECT_FALSE(database->execute(
+             "PRAGMA writable_schema = ON;"
+             "UPDATE sqlite_master SET sql = replace(sql, 'TEXT NOT NULL', 'TEXT NULL')"));
+       },
+       true},
   };
   for (const Case& one : cases) {
     SCOPED_TRACE(one.what);

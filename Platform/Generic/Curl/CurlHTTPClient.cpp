@@ -30,6 +30,7 @@ constexpr int pollingInMilliseconds = 1000;
 constexpr auto maxContentTime = std::chrono::seconds(1);
 constexpr std::size_t maxContentBytes = 64UL * 1024;
 constexpr int firstFinalStatus = 200;
+constexpr int lastStatus = 999;
 
 using Easy = UniqueHandle<CURL*, curl_easy_cleanup>;
 using Headers = UniqueHandle<curl_slist*, curl_slist_free_all>;
@@ -57,7 +58,7 @@ std::optional<HTTPResponse> responseOf(CURL* easy) {
   long status = 0;
   curl_off_t retryAfter = 0;
   curl_easy_getinfo(easy, CURLINFO_RESPONSE_CODE, &status);
-  if (status < firstFinalStatus) return std::nullopt;
+  if (status < firstFinalStatus || status > lastStatus) return std::nullopt;
   curl_easy_getinfo(easy, CURLINFO_RETRY_AFTER, &retryAfter);
   HTTPResponse response{.status = static_cast<int>(status), .retryAfter = {}};
   if (retryAfter > 0) response.retryAfter = std::chrono::seconds(retryAfter);
