@@ -118,6 +118,14 @@ TEST_F(LoggerProcessTest, OutlivesTheReaderOfItsStandardOutput) {
   }
 }
 
+TEST_F(LoggerProcessTest, PrintsIntoNoFileThatHasTheNumberOfAClosedStream) {
+  for (const std::string arguments : {"exit A 3 0 >&-", "standard-error A 2000 0 2>&-"}) {
+    EXPECT_EQ(start(arguments).wait(), 0);
+    EXPECT_EQ(*Platform::readFile(home.path() / "document"), "") << arguments;
+  }
+  EXPECT_THAT(log(), EndsWith("A:  1999\n"));
+}
+
 TEST_F(LoggerProcessTest, WritesEachEntryOnceThoughTheProcessForks) {
   const std::string printed = entriesIn(run("forked A 3 0"));
   EXPECT_EQ(std::ranges::count(printed, '\n'), 5) << printed;

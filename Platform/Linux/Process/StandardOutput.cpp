@@ -13,6 +13,7 @@
 #include <ctime>
 
 #include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/POSIX/StandardStreams.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
@@ -112,6 +113,7 @@ class StandardStream : public StandardOutput {
   explicit StandardStream(std::FILE* stream) : stream_(stream) {}
 
   void print(std::string_view text) override {
+    if (!isThere_) return;
     const LockedStream lock(stream_);
     if (staysInBuffer(text.size()))
       (void)::fwrite_unlocked(text.data(), 1, text.size(), stream_);
@@ -127,6 +129,7 @@ class StandardStream : public StandardOutput {
   }
 
   std::FILE* stream_;
+  const bool isThere_ = POSIX::wasOpenAtStart(stream_);
 };
 
 // A host that never prints here keeps its standard output to itself.
