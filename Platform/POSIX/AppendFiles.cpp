@@ -6,6 +6,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <filesystem>
 
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
@@ -33,10 +34,19 @@ class DescriptorAppendFile final : public AppendFile {
   FileDescriptor descriptor_;
 };
 
+// Root would lock the owner of the folder out of a file that it makes there, and follow the owner's
+// links to any other.
+bool isAnothersFolder(const std::filesystem::path& folder) {
+  struct stat facts {};
+  return ::geteuid() == 0 && ::stat(folder.c_str(), &facts) == 0 && facts.st_uid != 0;
+}
+
 class DescriptorAppendFiles final : public AppendFiles {
  public:
   Result<std::unique_ptr<AppendFile>, std::error_code> open(const std::string& path) override {
     if (isCutShort(path)) return std::make_error_code(std::errc::invalid_argument);
+    if (isAnothersFolder(std::filesystem::path(path).parent_path()))
+      return std::make_error_code(std::errc::operation_not_permitted);
     // O_APPEND makes the system choose the end anew for each write, so that two processes may share
     // the file.
     FileDescriptor descriptor(
