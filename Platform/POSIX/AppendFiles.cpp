@@ -11,6 +11,7 @@
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
 #include <Varnel/Platform/POSIX/LastError.h>
+#include <Varnel/Platform/POSIX/SuppressedSignal.h>
 #include <Varnel/Platform/Values/SystemText.h>
 
 namespace Varnel::Platform::POSIX {
@@ -21,10 +22,15 @@ class DescriptorAppendFile final : public AppendFile {
   explicit DescriptorAppendFile(FileDescriptor descriptor) : descriptor_(std::move(descriptor)) {}
 
   std::error_code append(std::string_view bytes) override {
+    SuppressedSignal tooLarge(SIGXFSZ);
     while (!bytes.empty()) {
       const ssize_t written = ::write(descriptor_.get(), bytes.data(), bytes.size());
       if (written < 0 && errno == EINTR) continue;
-      if (written < 0) return lastError();
+      if (written < 0) {
+        const std::error_code error = lastError();
+        if (error == std::errc::file_too_large) tooLarge.consume();
+        return error;
+      }
       bytes.remove_prefix(static_cast<std::size_t>(written));
     }
     return {};

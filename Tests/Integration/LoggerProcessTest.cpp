@@ -21,9 +21,10 @@ using testing::HasSubstr;
 // Runs the logging process in a home folder of its own.
 class LoggerProcessTest : public testing::Test {
  protected:
-  [[nodiscard]] Tests::ChildProcess start(const std::string& arguments) const {
+  [[nodiscard]] Tests::ChildProcess start(const std::string& arguments,
+                                          const std::string& before = "") const {
     return Tests::ChildProcess({"/bin/sh", "-c",
-                                "HOME='" + home.path().string() +
+                                before + "HOME='" + home.path().string() +
                                     "' TSAN_OPTIONS=\"$TSAN_OPTIONS die_after_fork=0\" exec '" +
                                     VARNEL_LOGGER_PROCESS "' " + arguments});
   }
@@ -107,6 +108,11 @@ TEST_F(LoggerProcessTest, GoesOnWhenTheDiskIsFull) {
   EXPECT_EQ(entriesIn(printed).size(), 3 * entriesIn(run("exit A 1 0")).size());
   const std::string report = "Did fail to write log to file with error No space left on device\n";
   EXPECT_THAT(printed, HasSubstr(report + report + report));
+
+  fs::remove(path);
+  Tests::ChildProcess limited = start("exit A 3 0", "ulimit -f 0; ");
+  EXPECT_THAT(limited.readAll(), HasSubstr("log to file with error File too large\n"));
+  EXPECT_EQ(limited.wait(), 0) << "not killed";
 }
 
 TEST_F(LoggerProcessTest, OutlivesTheReaderOfItsStandardOutput) {
