@@ -3,10 +3,21 @@
 
 #include <pthread.h>
 
+#include <atomic>
+
 namespace Varnel::Platform {
 
 void callInForkedChildren(void (*function)()) {
   ::pthread_atfork(nullptr, nullptr, function);
+}
+
+int forksSoFar() {
+  static std::atomic<int> forks = 0;
+  [[maybe_unused]] static const bool isTold = [] {
+    callInForkedChildren([] { ++forks; });
+    return true;
+  }();
+  return forks.load(std::memory_order_relaxed);
 }
 
 }  // namespace Varnel::Platform
