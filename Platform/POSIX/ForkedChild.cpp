@@ -11,6 +11,10 @@ void callInForkedChildren(void (*function)()) {
   ::pthread_atfork(nullptr, nullptr, function);
 }
 
+void callBeforeForks(void (*function)()) {
+  ::pthread_atfork(function, nullptr, nullptr);
+}
+
 int forksSoFar() {
   static std::atomic<int> forks = 0;
   [[maybe_unused]] static const bool isTold = [] {

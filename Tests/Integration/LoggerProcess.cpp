@@ -99,6 +99,7 @@ int main(int argc, char** argv) {
   }
   if (ending == "forked") logInChild(author);
   if (ending == "forked-in-between") logInChildWithTheStreamHeld(author);
+  if (ending == "daemon" && ::daemon(1, 1) != 0) std::abort();
   if (ending == "killed") std::raise(SIGKILL);
   if (ending == "quick-exit") std::quick_exit(EXIT_SUCCESS);
   if (ending == "late-entry" || ending == "without-reader") logsAtTheVeryEnd.author = author;

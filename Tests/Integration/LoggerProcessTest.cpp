@@ -141,6 +141,9 @@ TEST_F(LoggerProcessTest, WritesEachEntryOnceThoughTheProcessForks) {
   EXPECT_THAT(log(), HasSubstr("A:  grown\n"));
   const std::string printedInBetween = entriesIn(run("forked-in-between B 3 0"));
   EXPECT_EQ(std::ranges::count(printedInBetween, '\n'), 5) << printedInBetween;
+
+  (void)run("daemon C 3 0");
+  EXPECT_THAT(log(), EndsWith("C:  2\n")) << "of the parent, which ends without its exit handlers";
 }
 
 TEST_F(LoggerProcessTest, LeavesStandardOutputToAHostThatAsksForIt) {
