@@ -7,15 +7,23 @@
 #include <fmt/format.h>
 
 namespace Basalt {
+namespace {
+
+// `fmt::print` would throw where standard error is closed or full, and the process would go on.
+void tell(const std::string& line) {
+  std::fputs(line.c_str(), stderr);
+}
+
+}  // namespace
 
 void assertUnreachable(std::string_view file, int line) {
-  fmt::print(stderr, "Unreachable code was reached at {}:{}\n", file, line);
+  tell(fmt::format("Unreachable code was reached at {}:{}\n", file, line));
   std::abort();
 }
 
 void QNAssertAbstract([[maybe_unused]] std::string_view operation) {
 #ifndef NDEBUG
-  fmt::print(stderr, "{} is abstract: a subclass must override it\n", operation);
+  tell(fmt::format("{} is abstract: a subclass must override it\n", operation));
   std::abort();
 #endif
 }

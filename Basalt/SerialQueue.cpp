@@ -27,8 +27,9 @@ constexpr std::size_t maxBriefBlocks = 16;
 
 constexpr std::size_t cacheLine = 64;
 
+// Without an exception where standard error is closed: the process is to stop.
 [[noreturn]] void stop(const char* reason, const std::string& label) {
-  fmt::print(stderr, "{} (queue {})\n", reason, label);
+  std::fputs(fmt::format("{} (queue {})\n", reason, label).c_str(), stderr);
   std::abort();
 }
 

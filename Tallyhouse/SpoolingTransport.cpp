@@ -6,6 +6,7 @@
 #include <random>
 #include <utility>
 
+#include <Varnel/Platform/Concurrency/ForkedChild.h>
 #include <Varnel/Platform/Ports/Ports.h>
 #include <Varnel/Tallyhouse/Delivery.h>
 #include <Varnel/Tallyhouse/DeliveryWorker.h>
@@ -47,6 +48,11 @@ struct SpoolingTransport::Parts {
                          .allowsPlainHTTP = configuration.plainHTTP == PlainHTTP::allowed},
                         configuration.policy, randomNumbers())) {}
 
+  // In a forked child: the thread is missing there, locks may be held for ever, and what is freed
+  // of the locks on files is freed for the parent too.
+  [[nodiscard]] bool areTheParents() const { return forksBefore != Varnel::Platform::forksSoFar(); }
+
+  const int forksBefore = Varnel::Platform::forksSoFar();
   const AnalyticsIdentity identity;
   const std::int64_t maxBatchEvents;
   const int maxRefusals;
@@ -74,9 +80,12 @@ std::unique_ptr<SpoolingTransport> SpoolingTransport::make(const Varnel::Platfor
 
 SpoolingTransport::SpoolingTransport(std::unique_ptr<Parts> parts) : parts_(std::move(parts)) {}
 
-SpoolingTransport::~SpoolingTransport() = default;
+SpoolingTransport::~SpoolingTransport() {
+  if (parts_->areTheParents()) static_cast<void>(parts_.release());
+}
 
 void SpoolingTransport::start() noexcept try {
+  if (parts_->areTheParents()) return;
   parts_->recorder.begin();
   parts_->worker.resume();
 } catch (const std::exception&) {
@@ -84,6 +93,7 @@ void SpoolingTransport::start() noexcept try {
 }
 
 void SpoolingTransport::accept(const AnalyticsEvent& event) noexcept try {
+  if (parts_->areTheParents()) return;
   const std::string hit = encodedHit(event, parts_->identity);
   if (hit.size() > maxHitBytes) {
     parts_->recorder.countDropped();
@@ -98,6 +108,7 @@ void SpoolingTransport::accept(const AnalyticsEvent& event) noexcept try {
 }
 
 void SpoolingTransport::discardAll() noexcept try {
+  if (parts_->areTheParents()) return;
   parts_->worker.pause();
   parts_->recorder.discard();
   parts_->worker.wake();
@@ -106,7 +117,7 @@ void SpoolingTransport::discardAll() noexcept try {
 }
 
 bool SpoolingTransport::drain(std::chrono::milliseconds timeout) {
-  return parts_->worker.drain(timeout);
+  return !parts_->areTheParents() && parts_->worker.drain(timeout);
 }
 
 bool SpoolingTransport::hasDiscardedAll() const {

@@ -36,8 +36,8 @@ namespace Tallyhouse {
 /// `accept` costs the insertion of a row and never waits for the network, nor for more than 20 ms
 /// for another process that has the file locked: events that the file does not take now are held in
 /// memory, as far as that is sensible, and written later; `counts().held` tells whether there are
-/// any. Destruction interrupts a transfer, which
-/// the next run repeats; call `drain` before it where a process is short-lived.
+/// any. Destruction interrupts a transfer, which the next run repeats; call `drain` before it where
+/// a process is short-lived. A forked child records and sends nothing with its parent's transport.
 ///
 /// Processes may share a spool; one of them delivers at a time. When one of them refuses consent,
 /// the others' events are thrown away as well, and they take none until their next `start`.
@@ -94,7 +94,7 @@ class VARNEL_API SpoolingTransport final : public AnalyticsTransport {
   struct Parts;
   explicit SpoolingTransport(std::unique_ptr<Parts> parts);
 
-  const std::unique_ptr<Parts> parts_;
+  std::unique_ptr<Parts> parts_;  ///< Never null.
 };
 
 }  // namespace Tallyhouse

@@ -9,6 +9,7 @@
 #include <cstdio>
 
 #include <Varnel/Platform/Bare/Adapters.h>
+#include <Varnel/Platform/POSIX/StandardStreams.h>
 
 namespace Varnel::Platform::Bare {
 namespace {
@@ -51,6 +52,7 @@ class UnbufferedStream final : public StandardOutput {
   explicit UnbufferedStream(std::FILE* stream) : stream_(stream) {}
 
   void print(std::string_view text) override {
+    if (!isThere_) return;
     const BrokenPipeIsNoSignal guard;
     ::flockfile(stream_);
     if (std::fflush(stream_) == 0) write(text);
@@ -68,6 +70,7 @@ class UnbufferedStream final : public StandardOutput {
   }
 
   std::FILE* stream_;
+  const bool isThere_ = POSIX::wasOpenAtStart(stream_);
 };
 
 }  // namespace

@@ -29,7 +29,8 @@ class VARNEL_API AppendFiles {
   AppendFiles& operator=(const AppendFiles&) = delete;
 
   /// Opens the file, and creates it readable and writable by its owner alone (0600) when missing.
-  /// A path with a null character is refused (`invalid_argument`).
+  /// A path with a null character is refused (`invalid_argument`), and for root one in another
+  /// user's folder (`operation_not_permitted`).
   [[nodiscard]] virtual Result<std::unique_ptr<AppendFile>, std::error_code> open(
       const std::string& path) = 0;
 };

@@ -15,7 +15,8 @@ class VARNEL_API StandardOutput {
   StandardOutput& operator=(const StandardOutput&) = delete;
 
   /// Prints the text as it is, with no terminator. Texts of different threads never mix. A stream
-  /// that is closed or full, or whose reader has gone, loses the text without a report or a signal.
+  /// that is closed or full, or whose reader has gone, loses the text without a report or a signal;
+  /// one that the process began without stays closed, whatever file has its number since.
   /// A slow reader may make the call block.
   virtual void print(std::string_view text) = 0;
 };

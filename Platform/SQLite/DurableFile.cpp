@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/SQLite/DurableFile.h>
 
-#include <atomic>
 #include <filesystem>
 #include <utility>
 
@@ -42,17 +41,6 @@ bool isOfAnotherFormat(const std::optional<PlatformError>& error) {
 
 bool isDamage(const std::optional<PlatformError>& error) {
   return error && meaningOf(*error) == SQLiteFailure::damaged;
-}
-
-// The library's connections are of no use in a forked child, and not even to be closed there.
-std::atomic<int> forks = 0;
-
-int forksSoFar() {
-  [[maybe_unused]] static const bool isWatched = [] {
-    callInForkedChildren([] { ++forks; });
-    return true;
-  }();
-  return forks.load(std::memory_order_relaxed);
 }
 
 }  // namespace

@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/DiskAccess/DiskReadingQueue.h>
 
-#include <atomic>
 #include <utility>
 
 #include <Varnel/DiskAccess/DiskAccessManager.h>
@@ -16,12 +15,7 @@ namespace Varnel {
 namespace {
 
 unsigned currentProcess() {
-  static std::atomic<unsigned> forks = 0;
-  [[maybe_unused]] static const bool isTold = [] {
-    Platform::callInForkedChildren([] { ++forks; });
-    return true;
-  }();
-  return forks;
+  return static_cast<unsigned>(Platform::forksSoFar());
 }
 
 }  // namespace

@@ -58,6 +58,10 @@ Logger& Logger::instance() {
     };
     std::atexit(endGathering);
     std::at_quick_exit(endGathering);
+    // The parent may end at once, as it does where a program goes into the background.
+    Platform::callBeforeForks([] {
+      if (logger.fileChannel_) logger.fileChannel_->flush();
+    });
     Platform::callInForkedChildren([] { logger.beginAnewInForkedChild(); });
     return logger;
   }();

@@ -2,7 +2,9 @@
 #include <Varnel/Basalt/SerialQueue.h>
 
 #include <gtest/gtest.h>
+#include <unistd.h>
 
+#include <csignal>
 #include <memory>
 #include <random>
 #include <stdexcept>
@@ -212,12 +214,16 @@ TEST(SerialQueueDeathTest, StopsCodeOnTheWrongQueue) {
         queue.sync([&] { queue.sync([] {}); });
       },
       "own queue");
-  EXPECT_DEATH(
-      {
-        const SerialQueue queue("other queue");
-        QNAssertOnQueue(queue);
-      },
-      "other queue");
+  const auto runElsewhere = [] {
+    const SerialQueue queue("other queue");
+    QNAssertOnQueue(queue);
+  };
+  EXPECT_DEATH(runElsewhere(), "other queue");
+  const auto runElsewhereUnheard = [&] {
+    ::close(STDERR_FILENO);
+    runElsewhere();
+  };
+  EXPECT_EXIT(runElsewhereUnheard(), testing::KilledBySignal(SIGABRT), "");
 }
 
 }  // namespace

@@ -2,6 +2,9 @@
 #include <Varnel/Context/TargetKind.h>
 
 #include <gtest/gtest.h>
+#include <unistd.h>
+
+#include <csignal>
 
 #include <Varnel/Context/BuildSwitches.h>
 #include <Varnel/Platform/Testing/FakeWorkspace.h>
@@ -44,6 +47,11 @@ TEST(TargetKind, FirstSwitchOfTheFixedOrderDecides) {
   EXPECT_EQ(TargetKind::of({.isSiteVersion = true, .isMarkettaVersion = true}), TargetKind::site);
   EXPECT_EQ(TargetKind::of({.isMarkettaVersion = true}), TargetKind::marketta);
   EXPECT_DEATH((void)TargetKind::of({}), "TargetKind:");
+  const auto stopUnheard = [] {
+    ::close(STDERR_FILENO);
+    (void)TargetKind::of({});
+  };
+  EXPECT_EXIT(stopUnheard(), testing::KilledBySignal(SIGABRT), "");
 }
 
 TEST(TargetKind, FindsInstalledChannelsInTheirOrder) {

@@ -103,10 +103,10 @@ TEST_F(CommonAnalyticsSenderTest, EchoesToTheLetterWhileTheTrackerPrints) {
   EXPECT_EQ(sent_->events().size(), 1u);
 
   tracker_->setShouldPrintEvents(true);
-  sender_.trackCustomEvent("Scan", "Go", "a", -1, {"say \"\\\n\"", std::nullopt, "{}"}, {});
+  sender_.trackCustomEvent("Scan", "Go", "a", -1, {"say \"\\\n\"\x1B", std::nullopt, "{}"}, {});
   EXPECT_EQ(lastEntry(),
             "CommonAnalyticsSender:  Category: `Scan` Action: `Go` Label: `a` Value: `-1` "
-            "CustomDimensions: [Optional(\"say \\\"\\\\\\n\\\"\"), nil, Optional(\"{}\")]\n");
+            "CustomDimensions: [Optional(\"say \\\"\\\\\\n\\\"\\x1B\"), nil, Optional(\"{}\")]\n");
   sender_.trackEvent("Go", std::nullopt, std::nullopt, {std::nullopt}, {});
   EXPECT_EQ(lastEntry(),
             "CommonAnalyticsSender:  Category: `Scanner` Action: `Go` Label: `nil` Value: `nil` "

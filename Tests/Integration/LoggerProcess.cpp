@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: MIT
+#include <fcntl.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -72,10 +73,17 @@ void logInChildWithTheStreamHeld(const std::string& author) {
   holder.join();
 }
 
+// A host's own file. It gets the number of a standard stream that the process was not given.
+void openDocument() {
+  const std::string path = std::string(std::getenv("HOME")) + "/document";
+  if (::open(path.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, S_IRUSR | S_IWUSR) < 0) std::abort();
+}
+
 }  // namespace
 
 int main(int argc, char** argv) {
   if (argc != 5) return EXIT_FAILURE;
+  openDocument();
   const std::string_view ending = argv[1];
   const std::string author = argv[2];
   const int count = std::atoi(argv[3]);
@@ -91,6 +99,7 @@ int main(int argc, char** argv) {
   }
   if (ending == "forked") logInChild(author);
   if (ending == "forked-in-between") logInChildWithTheStreamHeld(author);
+  if (ending == "daemon" && ::daemon(1, 1) != 0) std::abort();
   if (ending == "killed") std::raise(SIGKILL);
   if (ending == "quick-exit") std::quick_exit(EXIT_SUCCESS);
   if (ending == "late-entry" || ending == "without-reader") logsAtTheVeryEnd.author = author;

@@ -21,9 +21,10 @@ using testing::HasSubstr;
 // Runs the logging process in a home folder of its own.
 class LoggerProcessTest : public testing::Test {
  protected:
-  [[nodiscard]] Tests::ChildProcess start(const std::string& arguments) const {
+  [[nodiscard]] Tests::ChildProcess start(const std::string& arguments,
+                                          const std::string& before = "") const {
     return Tests::ChildProcess({"/bin/sh", "-c",
-                                "HOME='" + home.path().string() +
+                                before + "HOME='" + home.path().string() +
                                     "' TSAN_OPTIONS=\"$TSAN_OPTIONS die_after_fork=0\" exec '" +
                                     VARNEL_LOGGER_PROCESS "' " + arguments});
   }
@@ -107,6 +108,11 @@ TEST_F(LoggerProcessTest, GoesOnWhenTheDiskIsFull) {
   EXPECT_EQ(entriesIn(printed).size(), 3 * entriesIn(run("exit A 1 0")).size());
   const std::string report = "Did fail to write log to file with error No space left on device\n";
   EXPECT_THAT(printed, HasSubstr(report + report + report));
+
+  fs::remove(path);
+  Tests::ChildProcess limited = start("exit A 3 0", "ulimit -f 0; ");
+  EXPECT_THAT(limited.readAll(), HasSubstr("log to file with error File too large\n"));
+  EXPECT_EQ(limited.wait(), 0) << "not killed";
 }
 
 TEST_F(LoggerProcessTest, OutlivesTheReaderOfItsStandardOutput) {
@@ -118,6 +124,14 @@ TEST_F(LoggerProcessTest, OutlivesTheReaderOfItsStandardOutput) {
   }
 }
 
+TEST_F(LoggerProcessTest, PrintsIntoNoFileThatHasTheNumberOfAClosedStream) {
+  for (const std::string arguments : {"exit A 3 0 >&-", "standard-error A 2000 0 2>&-"}) {
+    EXPECT_EQ(start(arguments).wait(), 0);
+    EXPECT_EQ(*Platform::readFile(home.path() / "document"), "") << arguments;
+  }
+  EXPECT_THAT(log(), EndsWith("A:  1999\n"));
+}
+
 TEST_F(LoggerProcessTest, WritesEachEntryOnceThoughTheProcessForks) {
   const std::string printed = entriesIn(run("forked A 3 0"));
   EXPECT_EQ(std::ranges::count(printed, '\n'), 5) << printed;
@@ -127,6 +141,9 @@ TEST_F(LoggerProcessTest, WritesEachEntryOnceThoughTheProcessForks) {
   EXPECT_THAT(log(), HasSubstr("A:  grown\n"));
   const std::string printedInBetween = entriesIn(run("forked-in-between B 3 0"));
   EXPECT_EQ(std::ranges::count(printedInBetween, '\n'), 5) << printedInBetween;
+
+  (void)run("daemon C 3 0");
+  EXPECT_THAT(log(), EndsWith("C:  2\n")) << "of the parent, which ends without its exit handlers";
 }
 
 TEST_F(LoggerProcessTest, LeavesStandardOutputToAHostThatAsksForIt) {

@@ -14,6 +14,7 @@
 #include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/Linux/Process/KeyFileDefaults.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
+#include <Varnel/Platform/Ports/AppendFiles.h>
 #include <Varnel/Platform/Ports/PrivateFiles.h>
 #include <Varnel/Platform/Ports/ReadFile.h>
 #include <Varnel/Platform/Testing/CapturedOutput.h>
@@ -92,6 +93,7 @@ TEST_F(UserDefaultsTest, NothingIsMadeInTheFoldersOfOthers) {
     GTEST_SKIP() << "Only root can write there.";
   Linux::KeyFileDefaults defaults(*files_, log, (home / ".config/app/settings.ini").string());
   EXPECT_TRUE(defaults.set("key", true));
+  EXPECT_FALSE(POSIX::makeAppendFiles()->open(home / "day.log"));
   EXPECT_TRUE(fs::is_empty(home));
 }
 

@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Tallyhouse/SpoolingTransport.h>
 
+#include <sys/wait.h>
+#include <unistd.h>
+
 #include <semaphore>
 
 #include <Tests/Support/Crew.h>
@@ -74,6 +77,30 @@ TEST_F(SpoolingTransportTest, AWithdrawnConsentStopsTransfersAndForgets) {
   ASSERT_EQ(posts.size(), 2u);
   EXPECT_NE(posts[1].body.find("ea=After"), std::string::npos);
   EXPECT_EQ(posts[1].body.find('\n'), std::string::npos);
+}
+
+// The child has no thread to wait for, and frees no lock that is its parent's too.
+TEST_F(SpoolingTransportTest, AForkedChildEndsAndLeavesAllToItsParent) {
+  http.setServer([](const HTTPPost&) { return HTTPResponse{.status = 503, .retryAfter = {}}; });
+  auto transport = std::shared_ptr(make());
+  auto tracker = std::make_unique<AnalyticsTracker>(AnalyticsContext::Ports{clock}, transport,
+                                                    Consent::granted);
+  track(*tracker, "Before");
+  EXPECT_FALSE(transport->drain(30s));
+  const pid_t child = ::fork();
+  if (child == 0) {
+    ::alarm(10);
+    track(*tracker, "Child");
+    const bool isDrained = transport->drain(30s);
+    tracker.reset();
+    transport.reset();
+    ::_exit(isDrained ? 1 : 0);
+  }
+  int status = -1;
+  ::waitpid(child, &status, 0);
+  EXPECT_EQ(status, 0);
+  track(*tracker, "After");
+  EXPECT_EQ(transport->counts().waiting, 2);
 }
 
 TEST_F(SpoolingTransportTest, WhatEarlierRunsLeftGoesWithConsentAlone) {

@@ -10,50 +10,13 @@
 #include <climits>
 #include <cstdio>
 #include <cstdlib>
-#include <ctime>
 
 #include <Varnel/Platform/Linux/Adapters.h>
+#include <Varnel/Platform/POSIX/StandardStreams.h>
+#include <Varnel/Platform/POSIX/SuppressedSignal.h>
 
 namespace Varnel::Platform::Linux {
 namespace {
-
-// While it lives, a write to a pipe without a reader only fails. The signal that comes with it goes
-// to the writing thread, and is consumed here whatever the process does with signals.
-class BrokenPipeIsNoSignal final {
- public:
-  BrokenPipeIsNoSignal() {
-    ::sigemptyset(&brokenPipe_);
-    ::sigaddset(&brokenPipe_, SIGPIPE);
-    ::pthread_sigmask(SIG_BLOCK, &brokenPipe_, &before_);
-    wasBlocked_ = ::sigismember(&before_, SIGPIPE) == 1;
-    // A signal that is not blocked does not stay pending.
-    wasPending_ = wasBlocked_ && isPending();
-  }
-  ~BrokenPipeIsNoSignal() {
-    if (!wasBlocked_) ::pthread_sigmask(SIG_SETMASK, &before_, nullptr);
-  }
-  BrokenPipeIsNoSignal(const BrokenPipeIsNoSignal&) = delete;
-  BrokenPipeIsNoSignal& operator=(const BrokenPipeIsNoSignal&) = delete;
-
-  /// To be called after a write that may have brought the signal.
-  void consume() {
-    constexpr timespec atOnce{};
-    if (!wasPending_)
-      while (::sigtimedwait(&brokenPipe_, nullptr, &atOnce) < 0 && errno == EINTR) continue;
-  }
-
- private:
-  static bool isPending() {
-    sigset_t pending;
-    ::sigpending(&pending);
-    return ::sigismember(&pending, SIGPIPE) == 1;
-  }
-
-  sigset_t brokenPipe_;
-  sigset_t before_;
-  bool wasBlocked_ = false;
-  bool wasPending_ = false;
-};
 
 // Holds the stream's lock, so that entries of several threads stay whole.
 class LockedStream final {
@@ -72,12 +35,12 @@ void write(std::FILE* stream, std::string_view text, bool flushes) {
   // A pipe takes a part of what is larger and sends the signal, while the rest may meet its next
   // reader.
   const bool mayBeParted = ::__fpending(stream) + text.size() > PIPE_BUF;
-  BrokenPipeIsNoSignal guard;
+  POSIX::SuppressedSignal brokenPipe(SIGPIPE);
   errno = 0;  // A stream of wide text refuses this one and sets none.
   const bool isWritten = ::fwrite_unlocked(text.data(), 1, text.size(), stream) == text.size() &&
                          (!flushes || ::fflush_unlocked(stream) == 0);
   const bool isBroken = errno == EPIPE;
-  if (isBroken || mayBeParted) guard.consume();
+  if (isBroken || mayBeParted) brokenPipe.consume();
   // Text that nobody can read any more would be written again, at the latest when the process ends.
   if (isBroken && !isWritten) ::__fpurge(stream);
 }
@@ -112,6 +75,7 @@ class StandardStream : public StandardOutput {
   explicit StandardStream(std::FILE* stream) : stream_(stream) {}
 
   void print(std::string_view text) override {
+    if (!isThere_) return;
     const LockedStream lock(stream_);
     if (staysInBuffer(text.size()))
       (void)::fwrite_unlocked(text.data(), 1, text.size(), stream_);
@@ -127,6 +91,7 @@ class StandardStream : public StandardOutput {
   }
 
   std::FILE* stream_;
+  const bool isThere_ = POSIX::wasOpenAtStart(stream_);
 };
 
 // A host that never prints here keeps its standard output to itself.

@@ -3,6 +3,8 @@
 
 #include <fmt/format.h>
 
+#include <Varnel/Platform/Text/VisibleText.h>
+
 namespace Varnel {
 namespace {
 
@@ -43,7 +45,8 @@ std::string listText(const Tallyhouse::CustomDimensions& dimensions) {
     if (text.size() > 1) text += ", ";
     text += dimension ? "Optional(" + literal(*dimension) + ")" : "nil";
   }
-  return text += ']';
+  // Campaigns and cookies hold what others wrote, which must not control the terminal.
+  return Platform::visibleText(text += ']', Platform::Backslashes::kept);
 }
 
 }  // namespace
