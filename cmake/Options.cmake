@@ -11,10 +11,14 @@ set(VARNEL_SOURCE_VERSION "${source_version}" CACHE STRING "The source revision 
 set(VARNEL_SYSTEM "${CMAKE_SYSTEM_NAME}" CACHE STRING "Linux, or Bare: POSIX alone")
 set_property(CACHE VARNEL_SYSTEM PROPERTY STRINGS Linux Bare)
 
-option(BUILD_SHARED_LIBS "Build the framework as a shared library" ON)
+if(PROJECT_IS_TOP_LEVEL)
+  option(BUILD_SHARED_LIBS "Build the framework as a shared library" ON)
+elseif(NOT DEFINED BUILD_SHARED_LIBS)
+  set(BUILD_SHARED_LIBS ON)  # Here alone: what a host that contains this tree makes of its libraries is its own.
+endif()
 option(VARNEL_BUILD_TESTS "Build the tests" ${PROJECT_IS_TOP_LEVEL})
 option(VARNEL_BUILD_EXAMPLES "Build the examples" ${PROJECT_IS_TOP_LEVEL})
-option(VARNEL_BUILD_BENCHMARKS "Build the benchmarks" OFF)
+option(VARNEL_BUILD_BENCHMARKS "Build the benchmarks, which are Linux's" OFF)
 option(VARNEL_BUILD_FUZZERS "Build the fuzzers (Clang)" OFF)
 option(VARNEL_WARNINGS_AS_ERRORS "Treat warnings as errors" ${PROJECT_IS_TOP_LEVEL})
 set(VARNEL_SANITIZE "" CACHE STRING "Sanitizers, separated by commas: address,undefined or thread")

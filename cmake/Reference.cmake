@@ -1,7 +1,7 @@
 # The target "reference": pages of the public headers and of docs/, in the build folder's reference/. It
-# compiles nothing, and fails with a warning of Doxygen's.
+# compiles nothing, and fails with a warning of Doxygen's. A host that contains this tree may have one of its own.
 find_program(VARNEL_DOXYGEN doxygen)
-if(NOT VARNEL_DOXYGEN)
+if(NOT VARNEL_DOXYGEN OR NOT PROJECT_IS_TOP_LEVEL)
   return()
 endif()
 get_property(reference_input GLOBAL PROPERTY VARNEL_TESTING_HEADERS)

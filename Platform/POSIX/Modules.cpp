@@ -20,8 +20,9 @@ fs::path fileOf(const char* module) {
   if (own.empty()) return {};
   const fs::path folder = own.parent_path();
   const std::array candidates = {
-      folder / VARNEL_VERSIONED_NAME / module, folder.parent_path() / VARNEL_LIB_FOLDER / module,
-      folder.parent_path().parent_path() / VARNEL_LIB_FOLDER / module,  // for libexec/NAME/program
+      folder / VARNEL_VERSIONED_NAME / module,
+      folder / VARNEL_LIBRARIES_FROM_PROGRAMS / VARNEL_VERSIONED_NAME / module,
+      folder / VARNEL_LIBRARIES_FROM_NOTIFIER / VARNEL_VERSIONED_NAME / module,
   };
   for (const fs::path& candidate : candidates) {
     std::error_code failed;

@@ -34,39 +34,45 @@ std::uint64_t nextIdentity() {
   return ++last;
 }
 
-// Whether the pattern has fractions of a second (S) or milliseconds of the day (A) outside quotes.
-bool isFinerThanSeconds(std::string_view pattern) {
+constexpr std::string_view unitsBelowASecond = "SA";
+constexpr std::string_view unitsBelowADay = "abBhHkKmsSA";
+
+// Whether the pattern has one of the units outside quotes.
+bool hasOneOf(std::string_view units, std::string_view pattern) {
   bool isQuoted = false;
   for (const char character : pattern) {
     if (character == '\'') isQuoted = !isQuoted;
-    if (!isQuoted && (character == 'S' || character == 'A')) return true;
+    if (!isQuoted && units.find(character) != std::string_view::npos) return true;
   }
   return false;
 }
 
 // For patterns that cannot be used, and without the library of locales.
-std::string plainText(Date date, const TimeZone& zone) {
-  const auto second = std::chrono::floor<std::chrono::seconds>(date);
-  return fmt::format("{:%F %T}", second + zone.offsetAt(date).fromUTC);
+std::string plainText(Date date, const TimeZone& zone, bool hasTime) {
+  const auto second = std::chrono::floor<std::chrono::seconds>(date) + zone.offsetAt(date).fromUTC;
+  return hasTime ? fmt::format("{:%F %T}", second) : fmt::format("{:%F}", second);
 }
 
 }  // namespace
 
 struct DateFormatter::State {
   State(std::string_view pattern, const std::string& locale, const TimeZones& timeZones)
-      : isCached(!isFinerThanSeconds(pattern)) {
+      : isCached(!hasOneOf(unitsBelowASecond, pattern)) {
     const std::string identifier = timeZones.localIdentifier();
     zone = timeZones.zone(identifier);
     if (const LocaleLibrary* library = localeLibrary())
       format = library->datePattern(pattern, locale, identifier, zone);
+    else
+      hasTime = hasOneOf(unitsBelowADay, pattern);  // The day's log is to be the day's.
   }
 
   [[nodiscard]] std::string compute(Date date) const {
-    return format ? format->text(date) : plainText(date, *zone);
+    return format ? format->text(date) : plainText(date, *zone, hasTime);
   }
 
   const std::uint64_t identity = nextIdentity();
   const bool isCached;
+  bool hasTime = true;
   std::shared_ptr<const TimeZone> zone;
   std::unique_ptr<const LocaleLibrary::DatePattern> format;
 };

@@ -144,9 +144,10 @@ TEST_F(Orvane, SaysWhatItLacksToPlayASound) {
   // A copy of the library has its resources, but no modules beside it.
   namespace fs = std::filesystem;
   const fs::path library = VARNEL_LIBRARY;
+  if (library.extension() == ".a") GTEST_SKIP() << "The program contains the library.";
   const fs::path modules = folder.path("lib/" VARNEL_MODULES_NAME);
   fs::create_directories(modules);
-  fs::copy_file(library, modules.parent_path() / VARNEL_LIBRARY_NAME);
+  fs::copy_file(library, modules.parent_path() / library.stem());  // libvarnel.so.0.1
   fs::create_directory_symlink(library.parent_path() / "../share", folder.path("share"));
   moreEnvironment = {"LD_LIBRARY_PATH=" + modules.parent_path().string()};
   expectFailure({"sound", "start"}, "libvarnel-gstreamer.so, was not built or is not installed\n");

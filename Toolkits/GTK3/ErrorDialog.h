@@ -24,8 +24,8 @@ using ErrorAnswer = std::function<void(std::optional<std::size_t> option)>;
 
 /// Tells the user of an error in a dialog above the window, and returns at once:
 ///
-///     presentError(window, {"The folder is gone.", "Choose another folder.", {"Choose…",
-///     "Cancel"}},
+///     presentError(window,
+///                  {"The folder is gone.", "Choose another folder.", {"Choose…", "Cancel"}},
 ///                  [this](auto option) { if (option == 0) chooseFolder(); });
 ///
 /// The description is the main sentence, the suggestion the second, and the options are the buttons

@@ -14,8 +14,10 @@ namespace Varnel::GTK3 {
 /// Brings values from any thread to the main thread, and of those that came since the last time the
 /// latest alone: for progress, which comes faster than it can be drawn.
 ///
-///     LatestValue<Progress> progress_{[this](const Progress& now) { bar_.set_fraction(now.part);
-///     }}; start([send = progress_.sender()] { …; send(now); });
+///     LatestValue<Progress> progress_{
+///         [this](const Progress& now) { bar_.set_fraction(now.part); }};
+///     …
+///     start([send = progress_.sender()] { …; send(now); });
 ///
 /// Made and destroyed on the main thread, where `show` is called, some thirty times a second at
 /// most and behind input and drawing. The last value sent always comes. A sender may be copied and

@@ -14,8 +14,10 @@ namespace Varnel::GTK3 {
 /// not run when the object goes are dropped, so that they may use the object freely:
 ///
 ///     class Window {
-///       void scan() { start([this, post = posts_.sender()] { …; post([this] { showDone(); }); });
-///       } OwnedPosts posts_;  // the last member, so that it goes first
+///       void scan() {
+///         start([this, post = posts_.sender()] { …; post([this] { showDone(); }); });
+///       }
+///       OwnedPosts posts_;  // the last member, so that it goes first
 ///     };
 ///
 /// It is made and destroyed on the main thread, where the blocks run, in the order of each sender's

@@ -31,8 +31,7 @@ class TDSServiceValidator;
 ///
 ///     TDSService links(std::make_shared<TDSConfiguration>("Orvane", "ov2"), identificator);
 ///     links.buildURL("buy", {{"coupon", "spring"}});
-///     //
-///     http://links.quennel.example/index.php?ov2&product=Orvane&version=…&coupon=spring&action=buy
+///     // http://links.quennel.example/index.php?ov2&product=Orvane&…&coupon=spring&action=buy
 ///
 /// One thread at a time. Each call reads the system's facts anew and asks the identificator, which
 /// may wait: keep it off the main thread where that matters. Parts that make no URL give an absent
