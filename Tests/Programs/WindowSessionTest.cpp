@@ -235,9 +235,13 @@ TEST_F(SessionFixture, AScanThatIsStoppedHasWhatItFoundAndOneThatFailsNothing) {
   EXPECT_EQ(session->stage(), Stage::choosing);
 }
 
-TEST_F(SessionFixture, StoppedWhileItLooksAsksNothing) {
+TEST_F(SessionFixture, StoppedWhileItLooksChoosesAndAsksNothing) {
   scan();
   session->choose({0, 0}, true);
+  session->choose(KeepRule::oldest);
+  session->stop();
+  background.run();
+  EXPECT_EQ(session->list()->chosen().files, 1u);
   session->addFolder("/next");  // Nothing that is chosen is lost by that.
   EXPECT_EQ(session->folders().size(), 2u);
   session->planRemoval();

@@ -14,6 +14,7 @@ namespace Varnel {
 namespace {
 
 using ::testing::HasSubstr;
+using ::testing::StartsWith;
 
 template <typename Object>
 using Held = std::unique_ptr<Object, decltype(&g_object_unref)>;
@@ -76,6 +77,15 @@ class Window : public testing::Test {
     g_object_unref(action);
   }
 
+  static int widthOf(const std::string& identifier) {
+    const auto object = find(identifier);
+    AtspiRect* area = atspi_component_get_extents(ATSPI_COMPONENT(object.get()),
+                                                  ATSPI_COORD_TYPE_SCREEN, nullptr);
+    const int width = area->width;
+    g_free(area);
+    return width;
+  }
+
   static bool isChecked(const std::string& identifier) {
     const auto object = find(identifier);
     AtspiStateSet* states = atspi_accessible_get_state_set(object.get());
@@ -110,7 +120,8 @@ TEST_F(Window, PathsAndSizesAreReadAloudInTheirShortForm) {
 TEST_F(Window, AnErrorsDialogShowsItsTextsAndTellsTheOptionThatWasChosen) {
   click("fail.button");
   EXPECT_THAT(nameOf("error-dialog.description"), HasSubstr("Cannot read \xef\xbf\xbd<b>"));
-  EXPECT_EQ(nameOf("error-dialog.suggestion"), "Try_again.");
+  EXPECT_THAT(nameOf("error-dialog.suggestion"), StartsWith("Try_again."));
+  EXPECT_LT(widthOf("error-dialog"), 800);  // The name of a file may be longer than a line.
   EXPECT_EQ(nameOf("error-dialog.0.button"), "One_more");
   click("error-dialog.1.button");
   EXPECT_EQ(process_.readLine(), "answer 1");

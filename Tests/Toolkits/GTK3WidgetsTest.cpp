@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/GTK3/ApplicationActivity.h>
 #include <Varnel/GTK3/ListMenu.h>
+#include <Varnel/GTK3/Menus.h>
 #include <Varnel/GTK3/PathColumn.h>
 #include <Varnel/GTK3/PathControl.h>
 #include <Varnel/Platform/Generic/HostedApplication.h>
@@ -77,6 +78,24 @@ TEST(PathControl, OneClickIsTheRowsTwoOpenAndTheRightOneKnowsTheComponent) {
   EXPECT_TRUE(press(path, window, GDK_BUTTON_PRESS, 3, start, 5));
   EXPECT_TRUE(press(path, window, GDK_BUTTON_PRESS, 3, 480, 5));
   EXPECT_EQ(list.clicked, (Texts{"/", "none"}));
+}
+
+TEST(Menus, ASubmenuThatIsChosenUnseenTakesNoClicksFromTheWindow) {
+  const auto application =
+      Gtk::Application::create("com.example.Menus", Gio::APPLICATION_NON_UNIQUE);
+  const MenuEntry choice{
+      "choice", "Choice", "", {}, MenuItemKind::command, {{{"one", "One", "app.one"}}}};
+  Gtk::Window window;
+  Gtk::MenuBar bar;
+  appendMenus(bar, *application.get(), {{"menu", "Menu", {{choice}}}});
+  window.add(bar);
+  window.show_all();
+  settle();
+  auto* title = dynamic_cast<Gtk::MenuItem*>(bar.get_children().front());
+  Gtk::Widget* item = title->get_submenu()->get_children().front();
+  EXPECT_TRUE(atk_action_do_action(ATK_ACTION(gtk_widget_get_accessible(item->gobj())), 0));
+  settle();
+  EXPECT_FALSE(gtk_grab_get_current());
 }
 
 struct Columns : Gtk::TreeModel::ColumnRecord {

@@ -40,7 +40,8 @@ std::vector<GTK3::MenuDescription> menus() {
 }
 
 void presentFailure(Gtk::Window& window) {
-  const UserErrorInfo info("Cannot read \xff<b>", "Try_again.", {"One_more", "Leave"});
+  const UserErrorInfo info("Cannot read \xff<b>", "Try_again.\n" + std::string(250, 'x'),
+                           {"One_more", "Leave"});
   GTK3::presentError(window, info, [](auto option) {
     say(option ? "answer " + std::to_string(*option) : "no answer");
   });

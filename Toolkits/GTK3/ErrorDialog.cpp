@@ -2,6 +2,7 @@
 #include <Varnel/Basalt/Identifier.h>
 #include <Varnel/GTK3/ErrorDialog.h>
 #include <Varnel/GTK3/Identifiers.h>
+#include <Varnel/GTK3/LongWords.h>
 #include <Varnel/Logging/UserErrorType.h>
 #include <gtkmm/window.h>
 
@@ -77,6 +78,7 @@ void presentError(Gtk::Window& window, const UserErrorInfo& info, ErrorAnswer an
                                              shownSentence(info.recoverySuggestion).c_str());
   GTK3::identify(*Glib::wrap(dialog), std::string(dialogIdentifier));
   identifyTexts(GTK_MESSAGE_DIALOG(dialog));
+  breakLongWords(GTK_MESSAGE_DIALOG(dialog));
   addButtons(GTK_DIALOG(dialog), info.recoveryOptions);
   g_signal_connect_data(
       dialog, "response", G_CALLBACK(&respond), new ErrorAnswer(std::move(answer)),

@@ -1,16 +1,32 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/GTK3/Identifiers.h>
 #include <Varnel/GTK3/Menus.h>
+#include <glibmm/main.h>
 #include <gtkmm/accellabel.h>
 #include <gtkmm/application.h>
 #include <gtkmm/checkmenuitem.h>
 #include <gtkmm/menu.h>
 #include <gtkmm/separatormenuitem.h>
+#include <sigc++/sigc++.h>
 
 #include <algorithm>
 
 namespace Varnel::GTK3 {
 namespace {
+
+// Through the accessibility bus an item may be chosen in a menu that is not shown. GTK cannot show
+// the item's own menu beside it then, and yet both take the pointer and the keys, for good.
+void releaseUnshown(Gtk::MenuItem& item, Gtk::Menu& submenu) {
+  const auto release = [&item, &submenu] {
+    submenu.cancel();
+    if (auto* menu = dynamic_cast<Gtk::MenuShell*>(item.get_parent())) menu->cancel();
+    return false;
+  };
+  item.signal_select().connect([&item, &submenu, release] {
+    if (!item.get_mapped())
+      Glib::signal_idle().connect(sigc::track_obj(release, item, submenu), Glib::PRIORITY_HIGH);
+  });
+}
 
 Gtk::MenuItem* makeItem(const MenuEntry& entry, Gtk::Application& application) {
   Gtk::MenuItem* item = entry.kind == MenuItemKind::toggle
@@ -21,6 +37,7 @@ Gtk::MenuItem* makeItem(const MenuEntry& entry, Gtk::Application& application) {
     auto* menu = Gtk::make_managed<Gtk::Menu>();
     appendSections(*menu, application, entry.submenu);
     item->set_submenu(*menu);
+    releaseUnshown(*item, *menu);
     return item;
   }
   gtk_actionable_set_detailed_action_name(GTK_ACTIONABLE(item->gobj()), entry.action.c_str());

@@ -43,6 +43,15 @@ Gtk::CellRendererText* textCell() {
   return cell;
 }
 
+/// Of a column for such texts, in the user's font.
+int widthFor(Gtk::Widget& widget, const std::string& text, int min) {
+  constexpr int padding = 12;
+  int width = 0;
+  int height = 0;
+  widget.create_pango_layout(text)->get_pixel_size(width, height);
+  return std::max(width + padding, min);
+}
+
 Gtk::TreeViewColumn& added(Gtk::TreeView& view, const char* titleKey, int width) {
   auto* column = Gtk::manage(
       new Gtk::TreeViewColumn(titleKey ? Glib::ustring(localized(titleKey)) : Glib::ustring()));
@@ -161,7 +170,7 @@ void DuplicateView::addFolder() {
 }
 
 void DuplicateView::addFigures() {
-  auto& size = added(*this, "Column_Size", 110);
+  auto& size = added(*this, "Column_Size", widthFor(*this, sizeText(999'990'000'000), 110));
   size.set_alignment(1.0f);
   auto* bytes = textCell();
   bytes->property_xalign() = 1.0f;
@@ -172,7 +181,7 @@ void DuplicateView::addFigures() {
         cell.property_sensitive() = !row.file.has_value();
       },
       rows_);
-  auto& modified = added(*this, "Column_Modified", 150);
+  auto& modified = added(*this, "Column_Modified", widthFor(*this, timeOf({}), 150));
   auto* time = textCell();
   pack(
       modified, *time, true,
@@ -277,11 +286,12 @@ bool DuplicateView::on_key_press_event(GdkEventKey* event) {
       case GDK_KEY_space:
         toggle(path);
         return true;
-      case GDK_KEY_Right:
-        expand_row(group, false);
-        return true;
       case GDK_KEY_Left:
-        if (path.size() > 1)
+      case GDK_KEY_Right:
+        // Rows unfold in the direction in which the user reads.
+        if ((event->keyval == GDK_KEY_Right) == (get_direction() == Gtk::TEXT_DIR_LTR))
+          expand_row(group, false);
+        else if (path.size() > 1)
           set_cursor(group);
         else
           collapse_row(group);

@@ -142,7 +142,7 @@ void MainWindow::openCurrent() {
 
 void MainWindow::copyPath() {
   if (const auto place = results_.view().current())
-    Gtk::Clipboard::get()->set_text(pathText(session_.list()->file(*place).path));
+    Gtk::Clipboard::get()->set_text(plainPath(session_.list()->file(*place).path));
 }
 
 void MainWindow::chooseSomeFolders() {

@@ -17,6 +17,7 @@
 #include <Varnel/Context/TargetKind.h>
 #include <Varnel/GTK3/ErrorDialog.h>
 #include <Varnel/GTK3/Identifiers.h>
+#include <Varnel/GTK3/LongWords.h>
 #include <Varnel/Logging/UserErrorInfo.h>
 #include <orvane-window/Model/Texts.h>
 
@@ -81,6 +82,7 @@ void askBeforeRemoval(Gtk::Window& parent, const PlannedRemoval& plan,
     text += "\n\n" + localized("Confirm_Stay", {countText(left.size())}) + "\n" +
             linesOf(left, maxExamples);
   dialog->set_secondary_text(text);
+  Varnel::GTK3::breakLongWords(dialog->gobj());
   identify(*dialog, "confirmation");
   addButton(*dialog, "Cancel", Gtk::RESPONSE_CANCEL, "confirmation.cancel");
   addButton(*dialog, "MoveToTrash", Gtk::RESPONSE_ACCEPT, "confirmation.move");

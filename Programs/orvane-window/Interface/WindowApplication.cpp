@@ -126,6 +126,11 @@ MainWindow& WindowApplication::window() {
   return *window_;
 }
 
+MainWindow& WindowApplication::shownWindow() {
+  if (!window().get_visible()) window().comeForward();
+  return window();
+}
+
 void WindowApplication::withWindow(std::function<void(MainWindow&)> act) {
   if (window_) return act(*window_);
   // The toolkit's start and the window together would be too long a turn of the main loop.
@@ -159,7 +164,7 @@ void WindowApplication::shutDown() {
 }
 
 void WindowApplication::addActions() {
-  add_action("about", [this] { showAbout(window()); });
+  add_action("about", [this] { showAbout(shownWindow()); });
   add_action("tell-a-friend", [this] { openLink("tell-a-friend"); });
   add_action("preferences", [this] { showPreferences(); });
   add_action("license", [this] { showLicense(); });
@@ -180,17 +185,18 @@ void WindowApplication::addActions() {
 }
 
 bool WindowApplication::kept(const std::optional<Varnel::Platform::PlatformError>& failure) {
-  if (failure) showProblem(window(), localized("Error_NotKept"), failure->localizedDescription());
+  if (failure)
+    showProblem(shownWindow(), localized("Error_NotKept"), failure->localizedDescription());
   return !failure;
 }
 
 void WindowApplication::showPreferences() {
   const auto told = [this](bool isKept) {
-    if (!isKept) showProblem(window(), localized("Error_NotKept"), "");
+    if (!isKept) showProblem(shownWindow(), localized("Error_NotKept"), "");
     return isKept;
   };
   const auto dialog = std::make_shared<PreferencesDialog>(
-      window(),
+      shownWindow(),
       PreferencesDialog::Values{.period = reminding_->period(),
                                 .scan = Preferences::scanRequest(),
                                 .playsSounds = Preferences::playsSounds(),
@@ -221,7 +227,7 @@ void WindowApplication::showLicense() {
   std::ostringstream text;
   if (const auto path = Varnel::Bundle::main().resourcePath("LICENSE"))
     text << std::ifstream(*path).rdbuf();
-  showText(window(), localized("License"), text.str());
+  showText(shownWindow(), localized("License"), text.str());
 }
 
 // A link tells who follows it, and finding that out may take time.
@@ -233,16 +239,16 @@ void WindowApplication::openLink(const std::string& name) {
             std::make_shared<Varnel::UserIdentificator>()));
     const auto link = service.buildURL(name, {});
     return [this, name, link] {
-      if (link) return Varnel::GTK3::openURL(window(), *link);
-      showProblem(window(), localized("Error_Open"), name);
+      if (link) return Varnel::GTK3::openURL(shownWindow(), *link);
+      showProblem(shownWindow(), localized("Error_Open"), name);
     };
   });
 }
 
 void WindowApplication::debug(const std::string& name) {
   if (name == "analytics")
-    showText(window(), "Analytics", std::to_string(ScanAnalytics::waitingEvents()));
-  if (name == "key-view-loop") printKeyViewLoop(window(), 0);
+    showText(shownWindow(), "Analytics", std::to_string(ScanAnalytics::waitingEvents()));
+  if (name == "key-view-loop") printKeyViewLoop(shownWindow(), 0);
   if (name == "crash") std::abort();
   if (name == "exception") throw std::runtime_error("raised by the menu");
 }

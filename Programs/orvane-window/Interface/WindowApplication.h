@@ -40,6 +40,8 @@ class WindowApplication final : public Gtk::Application {
   void shutDown();
   void addActions();
   MainWindow& window();
+  /// For what stands above it: the bus may ask for that before there is a window.
+  MainWindow& shownWindow();
   /// Does so at once, or as soon as there is a window.
   void withWindow(std::function<void(MainWindow&)> act);
   void showPreferences();

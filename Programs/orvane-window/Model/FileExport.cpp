@@ -20,11 +20,6 @@ namespace {
 
 namespace fs = std::filesystem;
 
-std::string lineOf(const std::string& path) {
-  const bool isLine = Varnel::Platform::isValidUTF8(path) && path.find('\n') == std::string::npos;
-  return (isLine ? path : Varnel::Platform::URL::fileURLWithPath(path).absoluteString()) + "\n";
-}
-
 std::error_code lastError() {
   return {errno != 0 ? errno : EIO, std::generic_category()};
 }
@@ -106,12 +101,18 @@ std::error_code writeFile(const std::string& path, const TextSource& source) {
   return isWritten ? std::error_code() : lastError();
 }
 
+std::string plainPath(const std::string& path) {
+  const bool isLine = Varnel::Platform::isValidUTF8(path) && path.find('\n') == std::string::npos;
+  return isLine ? path : Varnel::Platform::URL::fileURLWithPath(path).absoluteString();
+}
+
 bool writeChosenFiles(const DuplicateList& list, const TextWriter& write) {
   TextParts parts(write);
   const auto& groups = list.report()->groups;
   for (std::size_t i = 0; i < groups.size(); ++i)
     for (std::size_t k = 0; k < groups[i].files.size(); ++k)
-      if (list.isChosen({i, k}) && !parts.add(lineOf(groups[i].files[k].path))) return false;
+      if (list.isChosen({i, k}) && !parts.add(plainPath(groups[i].files[k].path) + "\n"))
+        return false;
   return parts.flush();
 }
 

@@ -18,8 +18,11 @@ using TextSource = std::function<bool(const TextWriter&)>;
 /// leaves everything beside it alone. One that it replaces gives it its permissions. Any thread.
 [[nodiscard]] std::error_code writeFile(const std::string& path, const TextSource& source);
 
-/// The paths of the chosen files, a line each. One that is no line of text, for its bytes or a line
-/// break, stands there as a file URL.
+/// A path as other programs take it: whole, and as a file URL where it is no line of text, for its
+/// bytes or a line break.
+[[nodiscard]] std::string plainPath(const std::string& path);
+
+/// The plain paths of the chosen files, a line each.
 [[nodiscard]] bool writeChosenFiles(const DuplicateList& list, const TextWriter& write);
 
 }  // namespace Orvane

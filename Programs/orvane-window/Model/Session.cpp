@@ -9,8 +9,9 @@
 namespace Orvane {
 namespace {
 
-IsPassing passingFilesOf(const Engine& engine) {
-  return [&engine](const std::string& path) { return engine.isPassing(path); };
+/// Asks the file system of each file, which takes most of the time, unless the work is to stop.
+IsPassing passingFilesOf(const Engine& engine, const MoveProgress& progress) {
+  return [&](const std::string& path) { return !progress.shouldStop && engine.isPassing(path); };
 }
 
 }  // namespace
@@ -104,12 +105,13 @@ void Session::choose(KeepRule rule) {
   // A copy of the list is prepared behind the window: there may be a million files.
   begin(Stage::planning);
   ports_.background.start([this, rule, &engine = ports_.engine, report = list_->report(),
-                           lifetime = std::weak_ptr(lifetime_)] {
+                           progress = moveProgress_, lifetime = std::weak_ptr(lifetime_)] {
     auto list = std::make_shared<DuplicateList>(report);
-    list->choose(select(*report, rule, passingFilesOf(engine)));
-    return [this, list, lifetime] {
+    list->choose(select(*report, rule, passingFilesOf(engine, *progress)));
+    return [this, list, progress, lifetime] {
       if (lifetime.expired()) return;
-      *list_ = std::move(*list);  // Who shows it keeps it.
+      // Who shows it keeps it. One that was stopped may have a file in a trash stay for others.
+      if (!progress->shouldStop) *list_ = std::move(*list);
       end(Stage::results, Event::chosen);
     };
   });
@@ -126,7 +128,8 @@ void Session::planRemoval() {
   begin(Stage::planning);
   ports_.background.start([this, &engine = ports_.engine, list = *list_, progress = moveProgress_,
                            lifetime = std::weak_ptr(lifetime_)] {
-    auto plan = engine.plan(list.report(), list.selection(passingFilesOf(engine)), progress);
+    auto plan =
+        engine.plan(list.report(), list.selection(passingFilesOf(engine, *progress)), progress);
     return [this, plan, progress, lifetime] {
       if (lifetime.expired()) return;
       plan_ = progress->shouldStop ? nullptr : plan;
