@@ -2,7 +2,9 @@
 #include <fcntl.h>
 #include <sys/stat.h>
 
+#include <chrono>
 #include <filesystem>
+#include <string>
 
 #include <gtest/gtest.h>
 
@@ -15,6 +17,7 @@ namespace Varnel::Platform {
 namespace {
 
 namespace fs = std::filesystem;
+using namespace std::chrono_literals;
 using Wait = SessionBoard::Wait;
 
 std::unique_ptr<SessionBoard> makeBoard() {
@@ -58,6 +61,22 @@ TEST(SessionBoard, MeansNothingWhereTheSessionHasNoFolder) {
     EXPECT_TRUE(first && board->takePlace("disk", 1, Wait::forPlace)) << value;
     EXPECT_TRUE(board->post("note")) << value;
     EXPECT_TRUE(board->notes().empty()) << value;
+  }
+}
+
+TEST(SessionBoard, PassesOverWhatAStoppedProcessKeeps) {
+  const Tests::TemporaryFolder folder;
+  ::setenv("XDG_RUNTIME_DIR", folder.path().c_str(), 1);
+  const auto stopped = makeBoard();
+  const auto board = POSIX::makeSessionBoard(systemPorts().privateFiles, 20ms);
+  for (const unsigned count : {1u, 2u}) {
+    const std::string name = std::to_string(count);
+    const auto first = stopped->takePlace(name, count, Wait::no);
+    const auto last = count > 1 ? stopped->takePlace(name, count, Wait::no) : nullptr;
+    EXPECT_FALSE(board->takePlace(name, count, Wait::no));
+    EXPECT_TRUE(board->takePlace(name, count, Wait::forPlace));
+    EXPECT_TRUE(board->takePlace(name, count, Wait::no)) << "nobody waits for it anew";
+    EXPECT_FALSE(makeBoard()->takePlace(name, count, Wait::no)) << "it is still kept";
   }
 }
 
