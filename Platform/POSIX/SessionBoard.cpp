@@ -181,6 +181,11 @@ bool isOwnFile(int file) {
   return ::fstat(file, &facts) == 0 && S_ISREG(facts.st_mode) && facts.st_uid == ::geteuid();
 }
 
+bool hasNoName(int file) {
+  struct stat facts {};
+  return ::fstat(file, &facts) == 0 && facts.st_nlink == 0;
+}
+
 /// The board lies in the folder that the session has for what is shared while it lasts.
 class RuntimeFolder final : public SessionBoard {
  public:
@@ -296,6 +301,8 @@ class RuntimeFolder final : public SessionBoard {
     if (note.get() < 0 || !isOwnFile(note.get())) return std::nullopt;
     if (note.isLockedElsewhere())
       return path.extension() == ".new" ? std::nullopt : readAll(note.get());
+    // Its process lives, and has posted the next one or withdrawn it.
+    if (hasNoName(note.get())) return textOf(path);
     ::unlink(path.c_str());
     return std::nullopt;
   }

@@ -2,9 +2,12 @@
 #include <fcntl.h>
 #include <sys/stat.h>
 
+#include <atomic>
 #include <chrono>
 #include <filesystem>
+#include <stop_token>
 #include <string>
+#include <thread>
 
 #include <gtest/gtest.h>
 
@@ -49,6 +52,21 @@ TEST(SessionBoard, KeepsItsFilesToTheUserAndTakesNoneThatOthersPutThere) {
   const fs::path left = folder.write("varnel/processes/1.left", "of a process that was killed");
   EXPECT_EQ(board->notes(), (std::vector<SessionBoard::Note>{{::getpid(), "note"}}));
   EXPECT_FALSE(fs::exists(left));
+}
+
+TEST(SessionBoard, KeepsANoteThatIsPostedWhileOthersLook) {
+  const Tests::TemporaryFolder folder;
+  ::setenv("XDG_RUNTIME_DIR", folder.path().c_str(), 1);
+  const auto board = makeBoard();
+  std::atomic<int> looks = 0;
+  std::jthread other([&](const std::stop_token& stop) {
+    for (const auto own = makeBoard(); !stop.stop_requested(); ++looks) (void)own->notes();
+  });
+  for (int i = 0; i < 50; ++i) {
+    while (board->post("note")) continue;  // one that is half posted may be taken away
+    for (const int before = looks; looks < before + 2;) std::this_thread::yield();
+    EXPECT_EQ(board->notes().size(), 1u);
+  }
 }
 
 TEST(SessionBoard, MeansNothingWhereTheSessionHasNoFolder) {
