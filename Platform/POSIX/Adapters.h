@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <chrono>
 #include <functional>
 #include <memory>
 #include <string>
@@ -42,8 +43,9 @@ using MakeDefaults = std::function<std::unique_ptr<UserDefaults>(const std::stri
 /// `executable` is the absolute path of the running program, which an update may rename meanwhile.
 [[nodiscard]] std::unique_ptr<ProcessInfo> makeProcessInfo(const std::string& executable);
 [[nodiscard]] std::unique_ptr<SecurityScope> makeSecurityScope();
-/// In $XDG_RUNTIME_DIR. The files outlive it.
-[[nodiscard]] std::unique_ptr<SessionBoard> makeSessionBoard(PrivateFiles& files);
+/// In $XDG_RUNTIME_DIR. The files outlive it. Nobody waits longer than `patience` for a place.
+[[nodiscard]] std::unique_ptr<SessionBoard> makeSessionBoard(
+    PrivateFiles& files, std::chrono::milliseconds patience = std::chrono::seconds(10));
 [[nodiscard]] std::unique_ptr<SystemLog> makeSystemLog();
 [[nodiscard]] std::unique_ptr<UserAccount> makeUserAccount();
 [[nodiscard]] std::unique_ptr<UserLocale> makeUserLocale();

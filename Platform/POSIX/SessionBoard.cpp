@@ -11,11 +11,16 @@
 #include <chrono>
 #include <cstdlib>
 #include <filesystem>
+#include <future>
+#include <map>
+#include <memory>
 #include <mutex>
 #include <optional>
+#include <system_error>
 #include <thread>
 #include <utility>
 
+#include <Varnel/Platform/Concurrency/StartThread.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/POSIX/FileDescriptor.h>
 #include <Varnel/Platform/POSIX/LastError.h>
@@ -39,9 +44,7 @@ class LockedFile final {
   explicit LockedFile(FileDescriptor file) : file_(std::move(file)) {}
   LockedFile(LockedFile&&) = default;
   LockedFile& operator=(LockedFile&&) = default;
-  ~LockedFile() {
-    if (file_) set(F_OFD_SETLK, F_UNLCK, 0, 0);
-  }
+  ~LockedFile() { unlockAll(); }
 
   [[nodiscard]] bool tryLock(short kind, off_t byte) { return set(F_OFD_SETLK, kind, byte, 1); }
   [[nodiscard]] bool lock(off_t byte) {
@@ -50,6 +53,9 @@ class LockedFile final {
     return true;
   }
   void unlock(off_t byte) { set(F_OFD_SETLK, F_UNLCK, byte, 1); }
+  void unlockAll() {
+    if (file_) set(F_OFD_SETLK, F_UNLCK, 0, 0);
+  }
 
   /// Whether another description has locked the first byte, as who reads sees it.
   [[nodiscard]] bool isLockedElsewhere() const {
@@ -104,6 +110,8 @@ class Places final {
     return isIn;
   }
 
+  void giveBack() { file_.unlockAll(); }
+
  private:
   static constexpr off_t head = 0;
   // As long as the turns are that readers give one another.
@@ -121,11 +129,29 @@ class Places final {
 
 class HeldPlace final : public SessionBoard::Place {
  public:
-  explicit HeldPlace(std::unique_ptr<Places> places) : places_(std::move(places)) {}
+  explicit HeldPlace(std::shared_ptr<Places> places) : places_(std::move(places)) {}
+  // The thread that waited for it may still have the file.
+  ~HeldPlace() override { places_->giveBack(); }
 
  private:
-  const std::unique_ptr<Places> places_;
+  const std::shared_ptr<Places> places_;
 };
+
+// Absent when none came free in time. The system knows no end of such a wait: what it gives later
+// is given back at once.
+std::optional<bool> waitForOne(const std::shared_ptr<Places>& places,
+                               std::chrono::milliseconds patience) {
+  const auto wait =
+      std::make_shared<std::packaged_task<bool()>>([places] { return places->waitForOne(); });
+  auto isIn = wait->get_future();
+  try {
+    startThread("shared-place", [wait] { (*wait)(); }).detach();
+  } catch (const std::system_error&) {
+    (*wait)();
+  }
+  if (isIn.wait_for(patience) != std::future_status::ready) return std::nullopt;
+  return isIn.get();
+}
 
 bool writeAll(int file, std::string_view bytes) {
   while (!bytes.empty()) {
@@ -155,21 +181,30 @@ bool isOwnFile(int file) {
   return ::fstat(file, &facts) == 0 && S_ISREG(facts.st_mode) && facts.st_uid == ::geteuid();
 }
 
+bool hasNoName(int file) {
+  struct stat facts {};
+  return ::fstat(file, &facts) == 0 && facts.st_nlink == 0;
+}
+
 /// The board lies in the folder that the session has for what is shared while it lasts.
 class RuntimeFolder final : public SessionBoard {
  public:
-  explicit RuntimeFolder(PrivateFiles& files) : files_(files) {}
+  RuntimeFolder(PrivateFiles& files, std::chrono::milliseconds patience)
+      : files_(files), patience_(patience) {}
 
   std::unique_ptr<Place> takePlace(const std::string& name, unsigned count, Wait wait) override {
     auto file = openPlaces(name);
     if (!file) return std::make_unique<Place>();
-    auto places = std::make_unique<Places>(std::move(file), std::max(count, 1u));
-    if (places->tryOne()) return std::make_unique<HeldPlace>(std::move(places));
+    const auto places = std::make_shared<Places>(std::move(file), std::max(count, 1u));
+    if (places->tryOne()) return std::make_unique<HeldPlace>(places);
     // A file system without locks says so, where a lock that is taken says EAGAIN.
     const bool isTaken = errno == EAGAIN || errno == EACCES;
-    if (isTaken && wait == Wait::no) return nullptr;
-    if (!isTaken || !places->waitForOne()) return std::make_unique<Place>();
-    return std::make_unique<HeldPlace>(std::move(places));
+    if (!isTaken || isPassedOver(name)) return std::make_unique<Place>();
+    if (wait == Wait::no) return nullptr;
+    const auto isIn = waitForOne(places, patience_);
+    if (!isIn) passOver(name);
+    if (!isIn.value_or(false)) return std::make_unique<Place>();
+    return std::make_unique<HeldPlace>(places);
   }
 
   std::error_code post(std::string_view text) override {
@@ -215,7 +250,20 @@ class RuntimeFolder final : public SessionBoard {
     std::string path;
     LockedFile file;
   };
+  using Clock = std::chrono::steady_clock;
   static constexpr std::size_t maxNotes = 1000;
+  static constexpr std::chrono::minutes timePassedOver{1};
+
+  // Who has a place, or is the first in line, may have been stopped.
+  void passOver(const std::string& name) {
+    const std::lock_guard lock(mutex_);
+    passedOver_[name] = Clock::now() + timePassedOver;
+  }
+  [[nodiscard]] bool isPassedOver(const std::string& name) {
+    const std::lock_guard lock(mutex_);
+    const auto found = passedOver_.find(name);
+    return found != passedOver_.end() && Clock::now() < found->second;
+  }
 
   // Empty where the session has none.
   static fs::path runtimeFolder() {
@@ -253,20 +301,25 @@ class RuntimeFolder final : public SessionBoard {
     if (note.get() < 0 || !isOwnFile(note.get())) return std::nullopt;
     if (note.isLockedElsewhere())
       return path.extension() == ".new" ? std::nullopt : readAll(note.get());
+    // Its process lives, and has posted the next one or withdrawn it.
+    if (hasNoName(note.get())) return textOf(path);
     ::unlink(path.c_str());
     return std::nullopt;
   }
 
   PrivateFiles& files_;
+  const std::chrono::milliseconds patience_;
   const std::string name_ = randomUUIDString();
   std::mutex mutex_;  ///< Owns what follows.
   std::optional<Posted> note_;
+  std::map<std::string, Clock::time_point> passedOver_;  ///< Until when.
 };
 
 }  // namespace
 
-std::unique_ptr<SessionBoard> makeSessionBoard(PrivateFiles& files) {
-  return std::make_unique<RuntimeFolder>(files);
+std::unique_ptr<SessionBoard> makeSessionBoard(PrivateFiles& files,
+                                               std::chrono::milliseconds patience) {
+  return std::make_unique<RuntimeFolder>(files, patience);
 }
 
 }  // namespace Varnel::Platform::POSIX

@@ -33,7 +33,8 @@ class VARNEL_API SessionBoard {
 
   enum class Wait {
     no,
-    forPlace,  ///< Until there is one: behind those that wait already, and not to be interrupted.
+    /// Until there is one: behind those that wait already, and not to be interrupted.
+    forPlace,
   };
 
   virtual ~SessionBoard() = default;
@@ -41,7 +42,8 @@ class VARNEL_API SessionBoard {
 
   /// One of `count` places, at least 1, of that name; null when none is free and none is waited
   /// for. Who does not wait passes nobody who does. Where the session has no such board, anybody
-  /// gets a place that means nothing.
+  /// gets a place that means nothing, and so does, for a while, who has waited for longer than
+  /// readers take: a process that was stopped, or is stuck, keeps nobody waiting for ever.
   [[nodiscard]] virtual std::unique_ptr<Place> takePlace(const std::string& name, unsigned count,
                                                          Wait wait) = 0;
 

@@ -35,21 +35,22 @@ class VARNEL_API TracelessReader final {
 
  private:
   struct Range {
-    std::uint64_t offset;
-    std::uint64_t size;
+    std::uint64_t begin;
+    std::uint64_t end;
   };
   /// How it reads, from the best way to the one that always works.
   enum class Way {
     droppingBehind,  ///< The system gives back.
     fromCache,       ///< So far all was in the cache.
-    noting,          ///< This has noted what to give back.
+    noting,          ///< This notes what to give back, before it reads.
   };
 
   [[nodiscard]] Count readWith(int flags, std::span<std::byte> buffer, std::uint64_t offset) const;
-  void noteAbsentRanges();
+  void noteAbsentRanges(std::uint64_t offset, std::size_t size);
 
   const int descriptor_;
   Way way_ = Way::droppingBehind;
+  Range noted_{};              ///< Where it has noted that.
   std::vector<Range> absent_;  ///< What was not in the cache before.
 };
 

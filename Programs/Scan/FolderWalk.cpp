@@ -225,7 +225,10 @@ class Walk::Task final : public TaskGroup::Task {
 
   std::optional<std::uint64_t> run(DiskTurn& turn) override {
     do {
-      if (walk_.group_.shouldStop()) return std::nullopt;
+      if (walk_.group_.shouldStop()) {
+        if (folder_) folder_->isWhole = false;
+        return std::nullopt;
+      }
       if (!folder_ && !(folder_ = work_.take())) return std::nullopt;
       if (!listing_ && !begin()) {
         folder_ = nullptr;

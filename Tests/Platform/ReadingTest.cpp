@@ -8,6 +8,7 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <ctime>
 #include <string>
 #include <thread>
 #include <vector>
@@ -25,13 +26,16 @@ namespace {
 constexpr std::size_t pageSize = 4096;
 constexpr unsigned dropBehind = 0x80;  // of preadv2
 
-/// A file of a number of pages, of which the test decides which are in the system's cache.
+/// A file of a number of pages, and a hole behind them, of which the test decides which are in the
+/// system's cache.
 class CachedFile final {
  public:
-  explicit CachedFile(std::size_t pageCount) : pageCount_(pageCount) {
+  explicit CachedFile(std::size_t pageCount, std::size_t holePages = 0) : pageCount_(pageCount) {
     const std::string path = folder_.write("file", std::string(pageCount * pageSize, 'x'));
-    descriptor_ = ::open(path.c_str(), O_RDONLY);
+    descriptor_ = ::open(path.c_str(), O_RDWR);
     ::fsync(descriptor_);
+    const auto size = static_cast<off_t>((pageCount + holePages) * pageSize);
+    EXPECT_EQ(::ftruncate(descriptor_, size), 0);
     ::posix_fadvise(descriptor_, 0, 0, POSIX_FADV_DONTNEED);
   }
   ~CachedFile() { ::close(descriptor_); }
@@ -48,11 +52,12 @@ class CachedFile final {
   }
 
   /// Which pages are in the cache, a digit for each.
-  [[nodiscard]] std::string pages() const {
-    void* mapped = ::mmap(nullptr, pageCount_ * pageSize, PROT_READ, MAP_SHARED, descriptor_, 0);
-    std::vector<unsigned char> present(pageCount_);
-    EXPECT_EQ(::mincore(mapped, pageCount_ * pageSize, present.data()), 0);
-    ::munmap(mapped, pageCount_ * pageSize);
+  [[nodiscard]] std::string pages() const { return pages(pageCount_); }
+  [[nodiscard]] std::string pages(std::size_t count) const {
+    void* mapped = ::mmap(nullptr, count * pageSize, PROT_READ, MAP_SHARED, descriptor_, 0);
+    std::vector<unsigned char> present(count);
+    EXPECT_EQ(::mincore(mapped, count * pageSize, present.data()), 0);
+    ::munmap(mapped, count * pageSize);
     std::string result;
     for (const unsigned char page : present) result += (page & 1) ? '1' : '0';
     return result;
@@ -114,6 +119,22 @@ TEST(TracelessReader, LeavesInTheCacheWhatWasThere) {
     for (int again = 0; again < 9 && !found.empty(); ++again) found = traces(kernel);
     EXPECT_EQ(found, "") << kernel.lacks.size() << ", " << kernel.maxLeft;
   }
+}
+
+TEST(TracelessReader, LooksNotMuchFurtherThanItReads) {
+  constexpr std::size_t readPages = 12'000;
+  const CachedFile diskImage(1, std::size_t{1} << 30);
+  if (diskImage.pages() != "0")
+    GTEST_SKIP() << "the file system of temporary files is a cache itself";
+  const std::clock_t before = std::clock();
+  Tests::onAKernelThatForbids({{SYS_preadv2, dropBehind}}, EOPNOTSUPP, [&] {
+    TracelessReader reader(diskImage.descriptor());
+    std::vector<std::byte> buffer(100 * pageSize);
+    for (std::size_t page = 0; page < readPages; page += 100)
+      EXPECT_TRUE(reader.read(buffer, page * pageSize));
+  });
+  EXPECT_LE((std::clock() - before) / CLOCKS_PER_SEC, 3) << "seconds";
+  EXPECT_LE(std::ranges::count(diskImage.pages(2 * readPages), '1'), 256);
 }
 
 TEST(TracelessReader, JustReadsWhereTheSystemDoesNotHelp) {

@@ -2,7 +2,12 @@
 #include <fcntl.h>
 #include <sys/stat.h>
 
+#include <atomic>
+#include <chrono>
 #include <filesystem>
+#include <stop_token>
+#include <string>
+#include <thread>
 
 #include <gtest/gtest.h>
 
@@ -15,6 +20,7 @@ namespace Varnel::Platform {
 namespace {
 
 namespace fs = std::filesystem;
+using namespace std::chrono_literals;
 using Wait = SessionBoard::Wait;
 
 std::unique_ptr<SessionBoard> makeBoard() {
@@ -48,6 +54,21 @@ TEST(SessionBoard, KeepsItsFilesToTheUserAndTakesNoneThatOthersPutThere) {
   EXPECT_FALSE(fs::exists(left));
 }
 
+TEST(SessionBoard, KeepsANoteThatIsPostedWhileOthersLook) {
+  const Tests::TemporaryFolder folder;
+  ::setenv("XDG_RUNTIME_DIR", folder.path().c_str(), 1);
+  const auto board = makeBoard();
+  std::atomic<int> looks = 0;
+  std::jthread other([&](const std::stop_token& stop) {
+    for (const auto own = makeBoard(); !stop.stop_requested(); ++looks) (void)own->notes();
+  });
+  for (int i = 0; i < 50; ++i) {
+    while (board->post("note")) continue;  // one that is half posted may be taken away
+    for (const int before = looks; looks < before + 2;) std::this_thread::yield();
+    EXPECT_EQ(board->notes().size(), 1u);
+  }
+}
+
 TEST(SessionBoard, MeansNothingWhereTheSessionHasNoFolder) {
   const Tests::TemporaryFolder folder;
   const std::string file = folder.write("file", "").string();
@@ -58,6 +79,22 @@ TEST(SessionBoard, MeansNothingWhereTheSessionHasNoFolder) {
     EXPECT_TRUE(first && board->takePlace("disk", 1, Wait::forPlace)) << value;
     EXPECT_TRUE(board->post("note")) << value;
     EXPECT_TRUE(board->notes().empty()) << value;
+  }
+}
+
+TEST(SessionBoard, PassesOverWhatAStoppedProcessKeeps) {
+  const Tests::TemporaryFolder folder;
+  ::setenv("XDG_RUNTIME_DIR", folder.path().c_str(), 1);
+  const auto stopped = makeBoard();
+  const auto board = POSIX::makeSessionBoard(systemPorts().privateFiles, 20ms);
+  for (const unsigned count : {1u, 2u}) {
+    const std::string name = std::to_string(count);
+    const auto first = stopped->takePlace(name, count, Wait::no);
+    const auto last = count > 1 ? stopped->takePlace(name, count, Wait::no) : nullptr;
+    EXPECT_FALSE(board->takePlace(name, count, Wait::no));
+    EXPECT_TRUE(board->takePlace(name, count, Wait::forPlace));
+    EXPECT_TRUE(board->takePlace(name, count, Wait::no)) << "nobody waits for it anew";
+    EXPECT_FALSE(makeBoard()->takePlace(name, count, Wait::no)) << "it is still kept";
   }
 }
 

@@ -226,5 +226,26 @@ TEST_F(ScanResults, NameTheLargestFoldersThatHoldTheSame) {
   }
 }
 
+TEST_F(ScanResults, NameNoFolderThatWasNotListedToItsEnd) {
+  fs::create_directory(folder.path("b"));
+  std::map<ino_t, std::string> names;
+  for (int i = 10; i <= 42; ++i) {  // One more than are listed at once.
+    const std::string name = std::to_string(i);
+    fs::create_hard_link(folder.write("a/" + name, name), folder.path("b/" + name));
+    struct stat facts {};
+    EXPECT_EQ(::stat(folder.path("b/" + name).c_str(), &facts), 0);
+    names[facts.st_ino] = name;
+  }
+  std::string whole;
+  fileSystem.beforeList = [&](const std::string& path) {
+    if (path == folder.path() || path == whole) return;
+    control.isCancelled = !whole.empty();
+    if (whole.empty()) fs::remove((whole = path) + "/" + names.rbegin()->second);
+  };
+  turns.disk.places = 1;
+  EXPECT_THAT(scan().folderGroups, IsEmpty());
+  EXPECT_TRUE(control.isCancelled);
+}
+
 }  // namespace
 }  // namespace Orvane::Testing
