@@ -240,7 +240,12 @@ void Notifier::findProducts() {
 void Notifier::lookAtFolder(const std::string& name) {
   const fs::path folder = POSIX::stateFolders() / name;
   const fs::path store = POSIX::notificationStoreIn(folder);
-  newFolders_.erase(folder);
+  // Other programs keep files here, or folders for a moment, and the user's watches are few.
+  std::error_code error;
+  std::erase_if(newFolders_, [&](const auto& each) {
+    return each.first == folder || !fs::is_directory(each.first, error);
+  });
+  if (!fs::is_directory(folder, error)) return;
   newFolders_.try_emplace(folder, folder, store.filename(), [this, store] { product(store); });
   Product* const known = product(store);
   if (!known) return;

@@ -157,8 +157,12 @@ TEST_F(NotifierTest, WhatNobodyTellsOfIsFound) {
       })) << pass
           << title;
     }
+    // Files of other programs, which write each anew, are looked at once.
+    for (int i = 0; i < 50; ++i) write(std::to_string(i), "");
     fs::remove_all(folder);
   }
+  const std::string descriptors = "/proc/" + std::to_string(ownerOf(notifierName)) + "/fd";
+  EXPECT_LT(std::stoi(outputOf("ls -l " + descriptors + " | grep -c inotify")), 10);
 }
 
 TEST_F(NotifierTest, AProgramThatIsReplacedTakesOverOnceNoBannerIsUp) {
