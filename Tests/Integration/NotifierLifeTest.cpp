@@ -190,7 +190,15 @@ TEST_F(NotifierTest, AProgramThatIsReplacedTakesOverOnceNoBannerIsUp) {
   fs::rename(copy + ".new", copy);
   EXPECT_TRUE(isAwake());
   EXPECT_EQ(ownerOf(notifierName), old);
+  // One that does not start, as while it is being written, leaves the place to the old one.
+  write("tried", "#!/bin/sh\n: >" + home_ + "/failed\nexit 1\n");
+  fs::permissions(home_ + "/tried", fs::perms::owner_all);
+  fs::rename(home_ + "/tried", copy);
   outputOf("dunstctl close");
+  EXPECT_TRUE(comesTrue([&] { return fs::exists(home_ + "/failed"); }));
+  EXPECT_TRUE(comesTrue([&] { return ownerOf(notifierName) == old; }));
+  fs::copy_file(VARNEL_NOTIFIER, copy + ".new");
+  fs::rename(copy + ".new", copy);
   EXPECT_TRUE(comesTrue([&] {
     const pid_t present = ownerOf(notifierName);
     return present != 0 && present != old;
