@@ -11,6 +11,9 @@ namespace {
 // Processes in different time zones see one date at most this far apart.
 constexpr std::chrono::days sameMoment(2);
 
+// Before this was written nobody scheduled anything with it.
+constexpr Date firstSchedules = std::chrono::sys_days(std::chrono::year(2026) / 1 / 1);
+
 // The dates of one schedule by number, from the original one, 0. They ascend; a date beyond the
 // calendar comes after all others.
 class Dates final {
@@ -83,7 +86,7 @@ ScheduleDecision decide(const NotificationSchedule& schedule, Date now, const Ca
     return {.isDue = true, .deliveryCount = dates.at(next) ? std::optional(next) : std::nullopt};
   }
   const auto beforeLast = count > 0 && dates.repeats() ? dates.at(count - 2) : std::nullopt;
-  if (beforeLast && *beforeLast - sameMoment > now)
+  if (beforeLast && *beforeLast - sameMoment > now && now >= firstSchedules)
     return {.deliveryCount = dates.firstAfter(now, 0)};
   return {.deliveryCount = count};
 }

@@ -42,7 +42,8 @@ struct ScheduleDecision final {
 ///
 /// A clock that is set back repeats nothing that has been delivered. A clock that is set back by
 /// more than a period and some days must have been wrong before: then the schedule goes on from the
-/// present.
+/// present. But one that is set back to a year before 2026 is wrong itself, as at the start of a
+/// machine that has yet to ask for the time.
 [[nodiscard]] ScheduleDecision decide(const NotificationSchedule& schedule, Date now,
                                       const Calendar& calendar);
 
