@@ -38,7 +38,8 @@ struct ScheduleDecision final {
 [[nodiscard]] std::optional<Date> nextDate(const NotificationSchedule& schedule,
                                            const Calendar& calendar);
 
-/// Whether the schedule is due, and how it goes on. Periods that passed unseen count as one.
+/// Whether the schedule is due, and how it goes on. Periods that passed unseen count as one. Where
+/// the calendar cannot count days, having no library, the next delivery waits for one that can.
 ///
 /// A clock that is set back repeats nothing that has been delivered. A clock that is set back by
 /// more than a period and some days must have been wrong before: then the schedule goes on from the
