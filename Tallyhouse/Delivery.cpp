@@ -45,7 +45,10 @@ Delivery::Step Delivery::step(Haste haste, const std::stop_token& stop) {
               .next = next,
               .waiting = outlook->backlog.waiting};
     if (!isDue || stop.stop_requested()) election_.reset();
-    if (!isDue || stop.stop_requested() || hasSent) return step;
+    if (!isDue || stop.stop_requested() || hasSent) {
+      filePause_.succeeded();
+      return step;
+    }
     if (!election_) {
       auto elected = spool_.elect();
       if (!elected) return fileIsAway();

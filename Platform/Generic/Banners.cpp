@@ -74,7 +74,8 @@ Banners::Failure Banners::follow(const std::vector<Delivery>& all, bool mayShow,
       if (std::exchange(isFirst, false)) {
         const auto source = store_.source();
         if (!source) return source.error();
-        if (*source) server_.setSource(**source);
+        source_ = *source;
+        if (source_) server_.setSource(*source_);
       }
       show(*each);
     }

@@ -51,6 +51,8 @@ class Banners final : public NotificationServer::Observer {
   [[nodiscard]] std::size_t onTheirWay() const { return onTheirWay_.size(); }
   /// Whether none is up or on its way, and nothing has to be noted.
   [[nodiscard]] bool isIdle() const;
+  /// Whose banners it has shown; none before the first.
+  [[nodiscard]] const std::optional<NotificationSource>& source() const { return source_; }
 
   void bannerShown(const std::string& token, const std::string& reference) override;
   void bannerFailed(const std::string& token) override;
@@ -76,6 +78,7 @@ class Banners final : public NotificationServer::Observer {
   NotificationServer& server_;
   NotificationStore& store_;
   const Events events_;
+  std::optional<NotificationSource> source_;
 
   /// By this object, or about to be; also expired ones, which the user may bring back and click.
   std::map<std::int64_t, UserNotification> shown_;

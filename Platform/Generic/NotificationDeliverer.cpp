@@ -226,7 +226,9 @@ NotificationDeliverer::Failure NotificationDeliverer::keepLaunch(
 
 Result<std::optional<NotificationSource>> NotificationDeliverer::source() {
   if (!isStoreThere()) return std::optional<NotificationSource>();
-  return store_->source();
+  auto source = store_->source();
+  if (!source && banners_->source()) return banners_->source();
+  return source;
 }
 
 // Others may take longer with the store than anybody here waits for them. That is said when it

@@ -84,7 +84,8 @@ class NotificationDeliverer final {
   /// Keeps a click for the application that is about to be started for it.
   [[nodiscard]] Failure keepLaunch(const NotificationActivation& activation);
 
-  /// Who plans in this store; none before anything was planned.
+  /// Who plans in this store; none before anything was planned. Where the store cannot be read:
+  /// whose banners were shown.
   [[nodiscard]] Result<std::optional<NotificationSource>> source();
 
  private:

@@ -11,6 +11,9 @@ namespace {
 // Processes in different time zones see one date at most this far apart.
 constexpr std::chrono::days sameMoment(2);
 
+// Before this was written nobody scheduled anything with it.
+constexpr Date firstSchedules = std::chrono::sys_days(std::chrono::year(2026) / 1 / 1);
+
 // The dates of one schedule by number, from the original one, 0. They ascend; a date beyond the
 // calendar comes after all others.
 class Dates final {
@@ -24,9 +27,14 @@ class Dates final {
     first_ = after(DateComponents(), 1).value_or(origin_);
     const auto second = interval_ ? after(*interval_, 1) : std::nullopt;
     repeats_ = second && *second > first_;
+    areUnknown_ = interval_ && !second && !calendar.weekdayCount();
   }
 
   bool repeats() const { return repeats_; }
+
+  // Whether there may be more than the first one, which the calendar cannot tell: without its
+  // library it counts no days.
+  bool areUnknown() const { return areUnknown_; }
 
   std::optional<Date> at(std::int64_t number) const {
     if (number == 0) return first_;
@@ -66,6 +74,7 @@ class Dates final {
   std::optional<Calendar::LocalTime> local_;  // Of the origin, where that is in another zone.
   Date first_;
   bool repeats_ = false;
+  bool areUnknown_ = false;
 };
 
 }  // namespace
@@ -78,12 +87,13 @@ ScheduleDecision decide(const NotificationSchedule& schedule, Date now, const Ca
   const Dates dates(schedule, calendar);
   const std::int64_t count = schedule.deliveryCount;
   if (!dates.isAfter(count, now)) {
+    if (dates.areUnknown()) return {.isDue = true, .deliveryCount = count + 1};
     if (!dates.repeats()) return {.isDue = true, .deliveryCount = std::nullopt};
     const std::int64_t next = dates.firstAfter(now, count + 1);
     return {.isDue = true, .deliveryCount = dates.at(next) ? std::optional(next) : std::nullopt};
   }
   const auto beforeLast = count > 0 && dates.repeats() ? dates.at(count - 2) : std::nullopt;
-  if (beforeLast && *beforeLast - sameMoment > now)
+  if (beforeLast && *beforeLast - sameMoment > now && now >= firstSchedules)
     return {.deliveryCount = dates.firstAfter(now, 0)};
   return {.deliveryCount = count};
 }

@@ -38,11 +38,13 @@ struct ScheduleDecision final {
 [[nodiscard]] std::optional<Date> nextDate(const NotificationSchedule& schedule,
                                            const Calendar& calendar);
 
-/// Whether the schedule is due, and how it goes on. Periods that passed unseen count as one.
+/// Whether the schedule is due, and how it goes on. Periods that passed unseen count as one. Where
+/// the calendar cannot count days, having no library, the next delivery waits for one that can.
 ///
 /// A clock that is set back repeats nothing that has been delivered. A clock that is set back by
 /// more than a period and some days must have been wrong before: then the schedule goes on from the
-/// present.
+/// present. But one that is set back to a year before 2026 is wrong itself, as at the start of a
+/// machine that has yet to ask for the time.
 [[nodiscard]] ScheduleDecision decide(const NotificationSchedule& schedule, Date now,
                                       const Calendar& calendar);
 

@@ -51,10 +51,8 @@ int RemindListenCommand::run(Console& console) const {
   router.register_("SchedulerNotification", tell);
   router.register_(nextDay, tell);
   router.register_(nextDay, [&](const auto& notification, Router::EventKind kind) {
-    if (kind == Router::EventKind::didDeliver) return;
-    if (const auto error =
-            router.userNotificationCenter().removeDeliveredNotification(notification))
-      console.complain("the clicked reminder stays listed: " + error->localizedDescription());
+    if (kind != Router::EventKind::didDeliver)
+      removeClicked(router.userNotificationCenter(), notification);
   });
   // A plan that is right stays: assigning the stored period would move the reminder.
   repairPlan(service, console);

@@ -64,6 +64,11 @@ std::string lineOf(const UserNotification& notification) {
                      notification.informativeText.value_or(""));
 }
 
+void removeClicked(UserNotificationCenter& center, const UserNotification& notification) {
+  if (center.removeDeliveredNotification(notification))
+    center.retryLater([&center, notification] { removeClicked(center, notification); });
+}
+
 UserNotificationCenter::Notifications readPatiently(UserNotificationCenter& center,
                                                     NotificationList list) {
   auto found = (center.*list)();

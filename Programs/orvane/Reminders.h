@@ -33,6 +33,11 @@ using NotificationList = Varnel::Platform::UserNotificationCenter::Notifications
 /// be read or written, which it says.
 [[nodiscard]] bool writeStatus(Varnel::Platform::UserNotificationCenter& center, Console& console);
 
+/// Takes a notification that was clicked off the delivered list: now, or when the center can, which
+/// the notifier may hinder with a note of the same click. The center outlives that.
+void removeClicked(Varnel::Platform::UserNotificationCenter& center,
+                   const Varnel::Platform::UserNotification& notification);
+
 /// A notification in a line: its identifier, title and text.
 [[nodiscard]] std::string lineOf(const Varnel::Platform::UserNotification& notification);
 

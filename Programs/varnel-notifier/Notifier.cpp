@@ -168,10 +168,9 @@ bool Notifier::run() {
     if (!ownsName("RequestName")) return true;
     findProducts();
     sleepWhile([&] { return !isOver() && !isIdle(); });
-    if (isOver()) break;
+    if (isDisconnected_) return true;
     static_cast<void>(ownsName("ReleaseName"));
-  } while (!isOver() && !isIdle());
-  if (!isDisconnected_) handOver();
+  } while (!isIdle() && !(isOver() && handsOver()));
   return true;
 }
 
@@ -186,16 +185,19 @@ bool Notifier::isReplaced() {
                      [](const auto& each) { return each.second->isQuiet(); });
 }
 
-// Where there is anything left to do, the bus starts what it finds by now: what lies in this
-// program's place, or the program of another version in that one's. Where all of them are gone it
-// starts nothing.
-void Notifier::handOver() {
-  if (isIdle()) return;
-  static_cast<void>(ownsName("ReleaseName"));
-  bool isAnswered = false;
+// The bus starts what it finds by now: what lies in this program's place, or the program of another
+// version in that one's. Where all of them are gone it starts nothing. Where the one in this place
+// does not start, half written perhaps or with a library that has yet to come, this one goes on.
+bool Notifier::handsOver() {
+  if (isDisconnected_) return true;
+  std::optional<bool> isStarted;
   bus_->ask(messageToBus("StartServiceByName", g_variant_new("(su)", notifierName, 0u)),
-            SessionBus::usualTime, [&](auto*, const auto&) { isAnswered = true; });
-  sleepWhile([&] { return !isAnswered; });
+            SessionBus::usualTime,
+            [&](GDBusMessage* reply, const auto&) { isStarted = reply != nullptr; });
+  sleepWhile([&] { return !isStarted; });
+  if (*isStarted || program_.look() != ProgramFile::State::replaced) return true;
+  program_.postpone();
+  return false;
 }
 
 // Asks the bus for the name, or gives it back; whether this is its owner then.
@@ -240,7 +242,12 @@ void Notifier::findProducts() {
 void Notifier::lookAtFolder(const std::string& name) {
   const fs::path folder = POSIX::stateFolders() / name;
   const fs::path store = POSIX::notificationStoreIn(folder);
-  newFolders_.erase(folder);
+  // Other programs keep files here, or folders for a moment, and the user's watches are few.
+  std::error_code error;
+  std::erase_if(newFolders_, [&](const auto& each) {
+    return each.first == folder || !fs::is_directory(each.first, error);
+  });
+  if (!fs::is_directory(folder, error)) return;
   newFolders_.try_emplace(folder, folder, store.filename(), [this, store] { product(store); });
   Product* const known = product(store);
   if (!known) return;

@@ -38,9 +38,9 @@ class Notifier final {
   Notifier& operator=(const Notifier&) = delete;
 
   /// Delivers until nothing is left to be delivered, shown or clicked, the program's file has gone,
-  /// or the bus has. A program that was replaced takes over while no banner is up, and one that
-  /// came elsewhere when this one has gone. Returns at once where another notifier runs. False
-  /// where there is no bus.
+  /// or the bus has. A program that was replaced takes over while no banner is up, as soon as
+  /// it starts, and one that came elsewhere when this one has gone. Returns at once where another
+  /// notifier runs. False where there is no bus.
   [[nodiscard]] bool run();
 
  private:
@@ -54,7 +54,7 @@ class Notifier final {
   [[nodiscard]] bool isIdle() const;
   [[nodiscard]] bool isOver();
   [[nodiscard]] bool isReplaced();
-  void handOver();
+  [[nodiscard]] bool handsOver();
   void receive(GVariant* arguments, GDBusMethodInvocation* call);
   [[nodiscard]] bool ownsName(const char* method);
   void sleepWhile(const std::function<bool()>& condition);

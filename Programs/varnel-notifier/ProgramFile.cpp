@@ -24,7 +24,14 @@ ProgramFile::State ProgramFile::look() {
   if (!present) return isMissingForLong() ? State::gone : State::inPlace;
   missingSince_.reset();
   timer_->disarm();
-  return own_ && present != own_ ? State::replaced : State::inPlace;
+  if (!own_ || present == own_) return State::inPlace;
+  if (pause_.isOver(clock_.now())) return State::replaced;
+  timer_->arm(pause_.end());
+  return State::inPlace;
+}
+
+void ProgramFile::postpone() {
+  pause_.failed(clock_.now());
 }
 
 // A time from the future was taken before the clock was set back.

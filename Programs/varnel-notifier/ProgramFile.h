@@ -11,6 +11,7 @@
 
 #include <Varnel/Platform/Linux/MainLoop/FileWatch.h>
 #include <Varnel/Platform/Values/Date.h>
+#include <Varnel/Platform/Values/GrowingPause.h>
 
 namespace Varnel {
 
@@ -37,6 +38,10 @@ class ProgramFile final {
 
   [[nodiscard]] State look();
 
+  /// What lies in its place could not be started, as while it is being written: it replaces nothing
+  /// yet, for a pause that grows each time.
+  void postpone();
+
  private:
   using Identity = std::optional<std::pair<dev_t, ino_t>>;
 
@@ -45,9 +50,10 @@ class ProgramFile final {
 
   const std::filesystem::path path_;
   const Platform::Clock& clock_;
-  const std::unique_ptr<Platform::WallClockTimer> timer_;  ///< Ends the wait for a missing file.
+  const std::unique_ptr<Platform::WallClockTimer> timer_;  ///< Ends a pause or an absence.
   const Identity own_;
   std::optional<Platform::Date> missingSince_;
+  Platform::GrowingPause pause_{std::chrono::seconds(1), std::chrono::minutes(5)};
   const Platform::Linux::FileWatch watch_;
 };
 

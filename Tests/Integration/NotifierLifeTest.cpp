@@ -23,14 +23,18 @@ class Product final {
   explicit Product(const std::string& folder)
       : process_(folder + "/notifications.sqlite", std::chrono::system_clock::now()) {}
 
-  void plan(const std::string& title, std::chrono::hours later = 0h) {
+  void plan(const std::string& title, std::chrono::hours later = 0h,
+            std::optional<Platform::DateComponents> interval = std::nullopt) {
     const UserNotification planned{.identifier = title,
                                    .title = title,
-                                   .deliveryDate = std::chrono::system_clock::now() + later};
+                                   .deliveryDate = std::chrono::system_clock::now() + later,
+                                   .deliveryRepeatInterval = interval};
     // The notifier may have the store locked.
     EXPECT_TRUE(comesTrue([&] { return !process_.center.scheduleNotification(planned); }));
   }
   void planForLater() { plan("later", 24h); }
+  [[nodiscard]] std::size_t countPlanned() { return process_.scheduled().size(); }
+  [[nodiscard]] std::size_t countDelivered() { return process_.delivered().size(); }
 
  private:
   Platform::Testing::Process process_;
@@ -157,8 +161,12 @@ TEST_F(NotifierTest, WhatNobodyTellsOfIsFound) {
       })) << pass
           << title;
     }
+    // Files of other programs, which write each anew, are looked at once.
+    for (int i = 0; i < 50; ++i) write(std::to_string(i), "");
     fs::remove_all(folder);
   }
+  const std::string descriptors = "/proc/" + std::to_string(ownerOf(notifierName)) + "/fd";
+  EXPECT_LT(std::stoi(outputOf("ls -l " + descriptors + " | grep -c inotify")), 10);
 }
 
 TEST_F(NotifierTest, AProgramThatIsReplacedTakesOverOnceNoBannerIsUp) {
@@ -186,20 +194,33 @@ TEST_F(NotifierTest, AProgramThatIsReplacedTakesOverOnceNoBannerIsUp) {
   fs::rename(copy + ".new", copy);
   EXPECT_TRUE(isAwake());
   EXPECT_EQ(ownerOf(notifierName), old);
+  // One that does not start, as while it is being written, leaves the place to the old one.
+  write("tried", "#!/bin/sh\n: >" + home_ + "/failed\nexit 1\n");
+  fs::permissions(home_ + "/tried", fs::perms::owner_all);
+  fs::rename(home_ + "/tried", copy);
   outputOf("dunstctl close");
+  EXPECT_TRUE(comesTrue([&] { return fs::exists(home_ + "/failed"); }));
+  EXPECT_TRUE(comesTrue([&] { return ownerOf(notifierName) == old; }));
+  fs::copy_file(VARNEL_NOTIFIER, copy + ".new");
+  fs::rename(copy + ".new", copy);
   EXPECT_TRUE(comesTrue([&] {
     const pid_t present = ownerOf(notifierName);
     return present != 0 && present != old;
   }));
 }
 
-// As an upgrade does that brings another version's folder and takes the old one's away.
+// As an upgrade does that brings another version's folder and takes the old one's away. No module
+// lies beside them: without the one that counts days, what is delivered stays planned.
 TEST_F(NotifierTest, AProgramElsewhereTakesOverFromOneThatHasGone) {
   const std::string copy = home_ + "/varnel-notifier", next = copy + "-of-the-next-version";
   fs::copy_file(VARNEL_NOTIFIER, copy);
   install(copy);
-  Product(home_ + "/upgraded").planForLater();
+  Product product(home_ + "/upgraded");
+  product.planForLater();
+  product.plan("daily", 0h, Platform::DateComponents{.day = 1});
   callBus("StartServiceByName", std::string(notifierName) + " 0");
+  EXPECT_TRUE(comesTrue([&] { return product.countDelivered() == 1; }));
+  EXPECT_TRUE(comesTrue([&] { return product.countPlanned() == 2; }));
   const pid_t old = ownerOf(notifierName);
   ASSERT_NE(old, 0);
   fs::copy_file(copy, next);

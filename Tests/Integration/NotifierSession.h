@@ -169,6 +169,11 @@ class Host final {
       return condition();
     }));
   }
+  void goOn(std::chrono::milliseconds time) {
+    await([end = std::chrono::steady_clock::now() + time] {
+      return std::chrono::steady_clock::now() > end;
+    });
+  }
   void endListening() { router_.reset(); }
   // What it has sent has arrived at the bus.
   void synchronise() {

@@ -312,6 +312,17 @@ TEST_F(NotificationDelivererTest, KeepsAClickForOneStartOnly) {
   EXPECT_EQ(*later.center.takeLaunchNotification(), std::nullopt);
 }
 
+TEST_F(NotificationDelivererTest, KnowsWhomAClickStartsThoughTheStoreIsLocked) {
+  host.schedule(at(start));
+  Notifier notifier(file, start);
+  notifier.hosts.questions.at("A")(true);
+  notifier.settle();
+  auto holder = SQLiteDatabase::open(file.string());
+  ASSERT_FALSE(holder->execute("BEGIN EXCLUSIVE"));
+  EXPECT_TRUE(notifier.deliverer->keepLaunch({at(start)}));
+  EXPECT_EQ(notifier.deliverer->source().valueOr({}), host.source);
+}
+
 // Of two processes one is in front, and it is the other one that delivers.
 TEST_F(NotificationDelivererTest, InFrontIsTheProductWhicheverOfItsProcessesIs) {
   Testing::Process other(file, start);

@@ -173,6 +173,22 @@ TEST_F(DeliveryTest, ALockThatNobodyCanTakeIsSaidOnce) {
   EXPECT_EQ(Process(*this).step(), Delivery::State::idle);
 }
 
+TEST_F(DeliveryTest, AWaitForTheFileIsShortAgainAfterALongOne) {
+  const std::string lock = path() + ".deliverer";
+  Process process(*this);
+  for (const int tries : {20, 1}) {
+    append(20);
+    fs::remove(lock);
+    fs::create_directory(lock);
+    Date next;
+    for (int i = 0; i < tries; ++i, clock.advance(1min))
+      next = process.delivery.step(Delivery::Haste::none, {}).next.value();
+    EXPECT_EQ(next < clock.now() - 1min + 1s, tries == 1);
+    fs::remove(lock);
+    EXPECT_EQ(process.step(), Delivery::State::idle);
+  }
+}
+
 TEST_F(DeliveryTest, ThePauseThatAServerAsksForOutlivesTheProcess) {
   append(20);
   http.setServer([](const HTTPPost&) { return HTTPResponse{.status = 429, .retryAfter = 3600s}; });

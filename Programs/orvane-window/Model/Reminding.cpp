@@ -28,7 +28,7 @@ Reminding::Reminding(Router& router, Console& console, Clicked clicked)
                         Router::EventKind kind) {
     if (kind == Router::EventKind::didDeliver) return;
     // The service does so for its own; once gone it is none to be removed.
-    static_cast<void>(center.removeDeliveredNotification(notification));
+    removeClicked(center, notification);
     clicked(notification.activationToken);
   };
   router.register_("SchedulerNotification", show);
