@@ -162,10 +162,15 @@ std::optional<Problem> Removal::prepare() {
       return Problem{.reason = Problem::Reason::packages, .description = owned.error().message()};
     packaged = std::move(*owned);
   }
-  for (std::size_t begin = 0, end = 0; begin < steps_.size() && !shouldStop_; begin = end) {
-    while (end < steps_.size() && steps_[end].choice == steps_[begin].choice) ++end;
-    lookAtGroup(begin, end, packaged);
+  std::size_t begin = 0;
+  while (begin < steps_.size() && !shouldStop_) {
+    std::size_t next = begin;
+    while (next < steps_.size() && steps_[next].choice == steps_[begin].choice) ++next;
+    lookAtGroup(begin, next, packaged);
+    begin = next;
   }
+  // Of what was not looked at nobody knows whether it would go.
+  end(begin, steps_.size(), Outcome::stopped);
   return std::nullopt;
 }
 

@@ -42,7 +42,9 @@ TEST_F(Orvane, MovesDuplicatesToTheTrashAndRestoresThem) {
   EXPECT_THAT(half.output, AllOf(HasSubstr("something else has its place"), HasSubstr("1 not\n")));
   EXPECT_EQ(read(odd) + read(copy), "samenew");
   fs::remove(copy);
-  EXPECT_EQ(run({"restore", "1"}).status, 0);
+  const Outcome unheard = run({"restore", "1"}, ">/dev/full");
+  EXPECT_EQ(unheard.status, 1);
+  EXPECT_EQ(unheard.errors, "orvane: cannot write the result: No space left on device\n");
   EXPECT_EQ(read(copy), "same");
   expectFailure({"restore"}, "something to give back");
   expectFailure({"restore", "7"}, "no removal 7");

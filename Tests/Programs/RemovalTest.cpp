@@ -141,6 +141,9 @@ TEST_F(RemovalFixture, LeavesWhatCannotBeComparedOrNoted) {
   EXPECT_THAT(removeAll(), ElementsAre(moved, stopped));
   EXPECT_EQ(totals.notMoved, 1u);
   EXPECT_EQ(copiesInTrash("same"), 1);
+  Removal unseen = makeRemoval();
+  EXPECT_FALSE(unseen.prepare());
+  EXPECT_THAT(outcomes(unseen), ElementsAre(stopped, stopped));
 }
 
 TEST_F(RemovalFixture, LeavesWhatIsNoCopy) {
