@@ -27,11 +27,6 @@ using Varnel::Platform::Trash;
 using Varnel::Platform::TrashedFile;
 using Varnel::Platform::TrashError;
 
-bool isAsReported(const FileState& state, const ReportFile& file, std::uint64_t size) {
-  return state.inode == file.inode && state.size == size && state.modified == file.modified &&
-         state.nanoseconds == file.nanoseconds;
-}
-
 FileStatus statusOf(const FileState& state) {
   constexpr std::int64_t nanoseconds = 1'000'000'000;
   return {.identity = {.device = state.device, .inode = state.inode},
@@ -136,6 +131,17 @@ const std::string& Removal::keptFor(const RemovalStep& step) const {
 
 std::uint64_t Removal::sizeOf(const RemovalStep& step) const {
   return groupOf(step).size;
+}
+
+// Where numbers do not last, another one tells nothing; the bytes do, right before the move.
+bool Removal::isAsReported(const FileState& state, const ReportFile& file,
+                           std::uint64_t size) const {
+  if (state.size != size || state.modified != file.modified ||
+      state.nanoseconds != file.nanoseconds)
+    return false;
+  if (state.inode == file.inode) return true;
+  const auto folder = openFolderOf(file.path, ports_.fileSystem);
+  return folder && !(*folder)->keepsNumbers();
 }
 
 std::optional<Problem> Removal::prepare() {

@@ -161,6 +161,15 @@ TEST_F(RemovalFixture, LeavesWhatIsNoCopy) {
               ElementsAre(different, different, different));
 }
 
+TEST_F(RemovalFixture, KnowsFilesByTheirNumbersWhereThoseLast) {
+  write("a", "same"), write("b", "same");
+  report({"a", "b"});
+  for (ReportFile& file : found.groups[0].files) ++file.inode;
+  EXPECT_THAT(removeAll(), ElementsAre(changed));
+  fileSystem.keepsNumbers = false;
+  EXPECT_THAT(removeAll(), ElementsAre(moved));
+}
+
 TEST_F(RemovalFixture, PutsBackWhatHasBecomeTheLastOne) {
   for (const char* name : {"a", "b", "c"}) write(name, "same");
   report({"a", "b", "c"});
