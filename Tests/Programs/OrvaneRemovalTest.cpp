@@ -51,6 +51,7 @@ TEST_F(Orvane, MovesDuplicatesToTheTrashAndRestoresThem) {
   expectFailure({"restore"}, "something to give back");
   expectFailure({"restore", "7"}, "no removal 7");
   expectFailure({"trash", "-k", "oldest", copy}, "no report of a scan");
+  EXPECT_THAT(run(yes, ">/dev/full").errors, HasSubstr("\"orvane restore 2\" gives back"));
 }
 
 // A report whose files are no longer those that it names.
