@@ -27,11 +27,6 @@ using Varnel::Platform::Trash;
 using Varnel::Platform::TrashedFile;
 using Varnel::Platform::TrashError;
 
-bool isAsReported(const FileState& state, const ReportFile& file, std::uint64_t size) {
-  return state.inode == file.inode && state.size == size && state.modified == file.modified &&
-         state.nanoseconds == file.nanoseconds;
-}
-
 FileStatus statusOf(const FileState& state) {
   constexpr std::int64_t nanoseconds = 1'000'000'000;
   return {.identity = {.device = state.device, .inode = state.inode},
@@ -138,6 +133,17 @@ std::uint64_t Removal::sizeOf(const RemovalStep& step) const {
   return groupOf(step).size;
 }
 
+// Where numbers do not last, another one tells nothing; the bytes do, right before the move.
+bool Removal::isAsReported(const FileState& state, const ReportFile& file,
+                           std::uint64_t size) const {
+  if (state.size != size || state.modified != file.modified ||
+      state.nanoseconds != file.nanoseconds)
+    return false;
+  if (state.inode == file.inode) return true;
+  const auto folder = openFolderOf(file.path, ports_.fileSystem);
+  return folder && !(*folder)->keepsNumbers();
+}
+
 std::optional<Problem> Removal::prepare() {
   if (const auto refusal = check(report_, selection_))
     return Problem{.reason = Problem::Reason::selection,
@@ -162,10 +168,15 @@ std::optional<Problem> Removal::prepare() {
       return Problem{.reason = Problem::Reason::packages, .description = owned.error().message()};
     packaged = std::move(*owned);
   }
-  for (std::size_t begin = 0, end = 0; begin < steps_.size() && !shouldStop_; begin = end) {
-    while (end < steps_.size() && steps_[end].choice == steps_[begin].choice) ++end;
-    lookAtGroup(begin, end, packaged);
+  std::size_t begin = 0;
+  while (begin < steps_.size() && !shouldStop_) {
+    std::size_t next = begin;
+    while (next < steps_.size() && steps_[next].choice == steps_[begin].choice) ++next;
+    lookAtGroup(begin, next, packaged);
+    begin = next;
   }
+  // Of what was not looked at nobody knows whether it would go.
+  end(begin, steps_.size(), Outcome::stopped);
   return std::nullopt;
 }
 

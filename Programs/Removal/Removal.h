@@ -153,6 +153,8 @@ class Removal final {
 
   [[nodiscard]] const ReportGroup& groupOf(const RemovalStep& step) const;
   [[nodiscard]] const ReportFile& fileOf(const RemovalStep& step) const;
+  [[nodiscard]] bool isAsReported(const Varnel::Platform::FileState& state, const ReportFile& file,
+                                  std::uint64_t size) const;
   // From one step to another, of one group:
   void lookAtGroup(std::size_t begin, std::size_t end, const Names& packaged);
   void lookAt(RemovalStep& step, bool isOnFileSystemOfKept, const Names& packaged);

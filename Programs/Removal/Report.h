@@ -14,7 +14,7 @@ namespace Orvane {
 struct ScanResult;
 
 /// A file as a scan has found it. One that was replaced or written to since has another inode, size
-/// or time.
+/// or time. Where inodes do not last, another one tells nothing.
 struct ReportFile {
   std::string path;  ///< Absolute, byte for byte.
   std::uint64_t inode = 0;

@@ -128,6 +128,7 @@ class Builder final : public nlohmann::json_sax<nlohmann::json> {
   }
   bool string(string_t& value) override {
     return take([&] {
+      if (isIn(Level::rootURLs)) return takeURL(value, exactRoots_.emplace_back());
       if (isIn(Level::nameURLs)) return takeURL(value, exactNames_.emplace_back());
       if (isAt(Level::file, "url")) return takeURL(value, exactPath_);
       if (isAt(Level::file, "modified")) {
@@ -155,7 +156,7 @@ class Builder final : public nlohmann::json_sax<nlohmann::json> {
   bool end_object() override {
     const Level level = levels_.back();
     levels_.pop_back();
-    if (level == Level::report) return hasVersion_ || fails("it has no schemaVersion");
+    if (level == Level::report) return checkReport();
     return level != Level::file || checkFile();
   }
   bool end_array() override {
@@ -171,7 +172,7 @@ class Builder final : public nlohmann::json_sax<nlohmann::json> {
   }
 
  private:
-  enum class Level { report, roots, groups, group, files, file, names, nameURLs, other };
+  enum class Level { report, roots, rootURLs, groups, group, files, file, names, nameURLs, other };
 
   [[nodiscard]] bool fails(std::string what) {
     problem = std::move(what);
@@ -213,6 +214,7 @@ class Builder final : public nlohmann::json_sax<nlohmann::json> {
     if (isObject) return other;
     if (isAt(report, "groups")) return groups;
     if (isAt(report, "roots")) return roots;
+    if (isAt(report, "rootURLs")) return rootURLs;
     if (isAt(group, "files")) return files;
     if (isAt(file, "names")) return names;
     return isAt(file, "nameURLs") ? nameURLs : other;
@@ -240,8 +242,13 @@ class Builder final : public nlohmann::json_sax<nlohmann::json> {
     return true;
   }
 
+  // Paths that are not UTF-8 are whole in their URLs alone.
+  [[nodiscard]] bool checkReport() {
+    if (!exactRoots_.empty()) report.roots = std::move(exactRoots_);
+    return hasVersion_ || fails("it has no schemaVersion");
+  }
+
   [[nodiscard]] bool checkFile() {
-    // Paths that are not UTF-8 are whole in their URLs alone.
     if (!exactPath_.empty()) file().path = std::exchange(exactPath_, {});
     if (!exactNames_.empty()) file().names = std::exchange(exactNames_, {});
     if (!isPath(file().path)) return fails("a file has no plain, absolute path");
@@ -254,6 +261,7 @@ class Builder final : public nlohmann::json_sax<nlohmann::json> {
   std::vector<Level> levels_;
   std::string key_;
   bool hasVersion_ = false;
+  std::vector<std::string> exactRoots_;
   // Of the file:
   bool hasTime_ = false;
   std::string exactPath_;

@@ -110,6 +110,9 @@ class OpenFolder {
   /// The entry of this name.
   [[nodiscard]] virtual FolderEntry look(const char* name) = 0;
 
+  /// Whether its files keep their numbers while nobody has them in use.
+  [[nodiscard]] virtual bool keepsNumbers() const = 0;
+
   /// Whether its volume lets files share extents, and tells which do.
   [[nodiscard]] virtual bool mayShareExtents() const = 0;
 

@@ -27,6 +27,10 @@ namespace {
 // Not every release of the headers names them.
 constexpr std::uint32_t xfsMagic = 0x5846'5342;
 constexpr std::uint32_t bcachefsMagic = 0xca45'1a4e;
+constexpr std::uint32_t exfatMagic = 0x2011'bab0;
+constexpr std::uint32_t fuseMagic = 0x6573'5546;
+constexpr std::uint32_t cifsMagic = 0xff53'4d42;
+constexpr std::uint32_t smb2Magic = 0xfe53'4d42;
 
 /// A file in more pieces than fit into these is not looked at to its end.
 constexpr unsigned maxMaps = 4096;
@@ -122,6 +126,14 @@ bool isInMemory(int folder) {
   struct statfs facts;
   return ::fstatfs(folder, &facts) == 0 &&
          (facts.f_type == TMPFS_MAGIC || facts.f_type == RAMFS_MAGIC);
+}
+
+bool keepsNumbers(int folder) {
+  struct statfs facts;
+  if (::fstatfs(folder, &facts) != 0) return true;
+  const auto type = static_cast<std::uint32_t>(facts.f_type);
+  return type != MSDOS_SUPER_MAGIC && type != exfatMagic && type != fuseMagic &&
+         type != cifsMagic && type != smb2Magic;
 }
 
 bool tellsSharedExtents(int folder) {

@@ -24,6 +24,10 @@ bool isInMemory(int) {
   return false;
 }
 
+bool keepsNumbers(int) {
+  return true;
+}
+
 bool tellsSharedExtents(int) {
   return false;
 }

@@ -167,6 +167,8 @@ class DescriptorFolder final : public OpenFolder {
     return {.kind = Kind::file, .name = name, .inode = 0, .status = statusFrom(facts)};
   }
 
+  [[nodiscard]] bool keepsNumbers() const override { return Orvane::keepsNumbers(number()); }
+
   [[nodiscard]] bool mayShareExtents() const override { return tellsSharedExtents(number()); }
 
   FileResult<std::unique_ptr<OpenFile>> open(const char* name, ReadingPlan plan) override {

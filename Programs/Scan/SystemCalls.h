@@ -26,6 +26,10 @@ extern const int openToPassThrough;
 /// of them.
 [[nodiscard]] bool isInMemory(int folder);
 
+/// Whether files in the folder have the same numbers whenever they are looked at. Some file systems
+/// give them out anew, as files come into use.
+[[nodiscard]] bool keepsNumbers(int folder);
+
 /// Whether the file system of the folder lets files share extents, and tells which do.
 [[nodiscard]] bool tellsSharedExtents(int folder);
 

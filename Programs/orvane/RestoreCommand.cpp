@@ -102,14 +102,16 @@ int RestoreCommand::run(Console& console) const {
     std::string line = shownPath(step->entry.file.path);
     if (!why.empty()) line += " " + why;
     if (!why.empty() && step->code) line += " (" + step->code.message() + ")";
-    isWritten = console.writeResult(line + "\n") && isWritten;
+    isWritten = isWritten && console.writeResult(line + "\n");
   }
   if (unnoted > 0)
     console.complain("the journal could not be written, and still names " +
                      counted(unnoted, "file that is back", "files that are back"));
-  const std::string summary = counted(restored, "file is", "files are") + " back in place" +
-                              (left > 0 ? ", " + std::to_string(left) + " not" : "") + "\n";
-  isWritten = console.writeResult(summary) && isWritten;
+  const std::uint64_t notReached = restoration.steps().size() - restored - left;
+  std::string summary = counted(restored, "file is", "files are") + " back in place";
+  if (left > 0) summary += ", " + std::to_string(left) + " not";
+  if (notReached > 0) summary += ", " + std::to_string(notReached) + " not reached";
+  isWritten = isWritten && console.writeResult(summary + "\n");
   if (interruption.signal() != 0) return 128 + interruption.signal();
   if (!isWritten) return 1;
   return left > 0 ? someNotMoved : 0;

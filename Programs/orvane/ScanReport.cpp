@@ -62,11 +62,11 @@ Json jsonOf(const FolderGroup& group, const ScanResult& result) {
 
 Json headOf(const ScanResult& result, const ScanFacts& facts) {
   const ScanTotals& totals = result.totals;
-  return {
-      {"schemaVersion", schemaVersion},
-      {"partial", result.isPartial},
-      {"startedAt", fmt::format("{:%Y-%m-%dT%H:%M:%SZ}", facts.startedAt)},
-      {"roots", facts.folders},
+  Json json = {{"schemaVersion", schemaVersion},
+               {"partial", result.isPartial},
+               {"startedAt", fmt::format("{:%Y-%m-%dT%H:%M:%SZ}", facts.startedAt)}};
+  addPaths(json, "roots", "rootURLs", facts.folders);
+  json.update(Json{
       {"folders", totals.folders},
       {"files", totals.files},
       {"bytes", totals.bytes},
@@ -80,7 +80,8 @@ Json headOf(const ScanResult& result, const ScanFacts& facts) {
       {"duplicateGroups", result.groups.size()},
       {"duplicateFiles", totals.duplicateFiles},
       {"wastedBytes", totals.wastedBytes},
-  };
+  });
+  return json;
 }
 
 bool addGroup(TextParts& parts, const ScanResult& result, const DuplicateGroup& group) {
@@ -128,7 +129,9 @@ std::vector<JSONField> scanReportFields() {
       schemaVersionField,
       {"partial", "whether the scan was interrupted; what was compared by then is true"},
       {"startedAt", "when the scan began, in UTC"},
-      {"roots", "the folders that were scanned, as they were named"},
+      {"roots",
+       "the folders that were scanned, in the order in which they were named, without links"},
+      {"rootURLs", "their exact file URLs, only where a path is not UTF-8"},
       {"folders", "how many were read"},
       {"files", "how many were found"},
       {"bytes", "of all files, hard links once"},

@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <orvane/SizeText.h>
 
-#include <cctype>
 #include <charconv>
 #include <optional>
 #include <string_view>
@@ -12,7 +11,8 @@ namespace {
 /// How many bytes the unit stands for; none when there is no such unit.
 std::optional<std::uint64_t> unitOf(std::string_view text) {
   std::string unit;
-  for (const char letter : text) unit += static_cast<char>(std::toupper(letter & 0x7f));
+  for (const char letter : text)
+    unit += letter >= 'a' && letter <= 'z' ? static_cast<char>(letter - 'a' + 'A') : letter;
   if (unit.empty() || unit == "B" || unit == "BYTES") return 1;
   constexpr std::string_view letters = "KMGTPE";
   const std::size_t power = letters.find(unit[0]);

@@ -7,6 +7,8 @@
 #include <span>
 #include <string>
 #include <string_view>
+#include <system_error>
+#include <utility>
 #include <vector>
 
 #include <orvane/ShownText.h>
@@ -33,16 +35,21 @@ std::vector<std::span<const Step>> groupsOf(const std::vector<Step>& steps,
   return groups;
 }
 
-/// A line for each explanation: how many files it is for.
+/// A line for each explanation: how many files it is for. Of what has failed the system says why.
 template <typename Step, typename Outcome>
 std::string explanationsOf(const std::vector<Step>& steps, Wording (*wordingOf)(Outcome),
                            const char* staysText, const char* stayText) {
-  std::map<Outcome, std::uint64_t> counts;
-  for (const Step& step : steps) ++counts[step.outcome];
+  std::map<std::pair<Outcome, std::error_code>, std::uint64_t> counts;
+  for (const Step& step : steps)
+    ++counts[{step.outcome, step.outcome == Outcome::failed ? step.code : std::error_code()}];
   std::string text;
-  for (const auto& [outcome, number] : counts)
-    if (const std::string_view why = wordingOf(outcome).explanation; !why.empty())
-      text += counted(number, staysText, stayText) + ": " + std::string(why) + "\n";
+  for (const auto& [cause, number] : counts) {
+    const auto& [outcome, code] = cause;
+    const std::string_view why = wordingOf(outcome).explanation;
+    if (why.empty()) continue;
+    text += counted(number, staysText, stayText) + ": " + std::string(why);
+    text += code ? " (" + code.message() + ")\n" : "\n";
+  }
   return text;
 }
 

@@ -91,16 +91,18 @@ int TrashCommand::moveOrShow(const Report& report, const std::atomic<bool>& shou
   const RemovalForm form{.columns = isStandardOutputATerminal() ? standardOutputColumns() : 0,
                          .isMade = isMade};
   const auto write = [&](std::string_view text) { return console.writeResult(text); };
+  const RemovalTotals totals = removal.totals();
+  const std::string giveBack = "\"orvane restore " + std::to_string(removal.number()) + "\" gives ";
   bool isWritten =
       isJSON ? writeJSON(removal, selection, write) : writeText(removal, selection, form, write);
-  const RemovalTotals totals = removal.totals();
   if (isWritten && !isJSON) {
     std::string summary = summaryOf(removal, form);
     if (!moves && totals.planned > 0) summary += "nothing was moved yet: --yes does it\n";
-    if (totals.moved > 0)
-      summary += "\"orvane restore " + std::to_string(removal.number()) + "\" gives them back\n";
+    if (totals.moved > 0) summary += giveBack + "them back\n";
     isWritten = console.writeResult(wrapped(summary, form.columns));
   }
+  if (!isWritten && totals.moved > 0 && !console.hasLostReader())
+    console.complain(giveBack + "back what was moved to the trash");
   if (!isWritten) return 1;
   return moves && totals.notMoved > 0 ? someNotMoved : 0;
 }

@@ -48,6 +48,13 @@ TEST_F(TrashTest, KeepsEveryNameThereIs) {
   }
   EXPECT_TRUE(fs::is_empty(folder + "/info"));
   EXPECT_TRUE(fs::is_empty(folder + "/files"));
+  const TrashedFile last = *move(file);
+  fs::rename(folder, home.path() / "elsewhere");
+  EXPECT_EQ(trash->restore(last, Folders::leave)->reason, Reason::emptied);
+  // Through a link it may lie on a disk that is not there now.
+  TrashedFile linked = last;
+  linked.folder = home.path() / "data" / "other";
+  EXPECT_EQ(trash->restore(linked, Folders::leave)->reason, Reason::noTrash);
 }
 
 TEST_F(TrashTest, TellsWhereAndWhenInTheFormOfTheDesktop) {
@@ -207,6 +214,13 @@ TEST_F(TrashTest, KnowsOneDiskInTwoMounts) {
     ASSERT_TRUE(moved) << moved.error().code;
     EXPECT_EQ(moved->folder, second / (".Trash-" + std::to_string(::geteuid())));
     EXPECT_FALSE(trash->restore(*moved, Folders::leave));
+
+    // What is gone is gone only where its disk is there.
+    ASSERT_TRUE(move(second / "a"));
+    fs::remove_all(moved->folder);
+    EXPECT_EQ(trash->restore(*moved, Folders::leave)->reason, Reason::emptied);
+    EXPECT_EQ(::umount2(second.c_str(), MNT_DETACH), 0);
+    EXPECT_EQ(trash->restore(*moved, Folders::leave)->reason, Reason::noTrash);
   });
   if (!isDone) GTEST_SKIP() << "no mounts of its own";
 }

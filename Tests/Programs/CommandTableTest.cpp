@@ -134,6 +134,7 @@ TEST_F(Orvane, PrintsTheMembersThatItsHelpNames) {
     std::istringstream words(command.name + " --json");
     std::vector<std::string> arguments{std::istream_iterator<std::string>(words), {}};
     if (command.operands.max > 0) arguments.push_back(folder.path());
+    if (command.operands.max > 1) arguments.push_back(folder.path("a\xfe"));
     for (const Option& option : command.options)
       if (option.isRequired)
         arguments.insert(arguments.end(), {"--" + option.name, option.value.words.at(0)});

@@ -4,9 +4,11 @@
 #include <filesystem>
 #include <fstream>
 
+#include <Removal/Removal.h>
 #include <Tests/Programs/OrvaneFixture.h>
 #include <Tests/Support/DiskImage.h>
 #include <Tests/Support/MountNamespace.h>
+#include <orvane/StepText.h>
 #include <orvane/TextColumns.h>
 
 namespace Orvane::Testing {
@@ -42,11 +44,14 @@ TEST_F(Orvane, MovesDuplicatesToTheTrashAndRestoresThem) {
   EXPECT_THAT(half.output, AllOf(HasSubstr("something else has its place"), HasSubstr("1 not\n")));
   EXPECT_EQ(read(odd) + read(copy), "samenew");
   fs::remove(copy);
-  EXPECT_EQ(run({"restore", "1"}).status, 0);
+  const Outcome unheard = run({"restore", "1"}, ">/dev/full");
+  EXPECT_EQ(unheard.status, 1);
+  EXPECT_EQ(unheard.errors, "orvane: cannot write the result: No space left on device\n");
   EXPECT_EQ(read(copy), "same");
   expectFailure({"restore"}, "something to give back");
   expectFailure({"restore", "7"}, "no removal 7");
   expectFailure({"trash", "-k", "oldest", copy}, "no report of a scan");
+  EXPECT_THAT(run(yes, ">/dev/full").errors, HasSubstr("\"orvane restore 2\" gives back"));
 }
 
 // A report whose files are no longer those that it names.
@@ -94,6 +99,22 @@ TEST_F(Orvane, SharesTheExtentsOfDuplicates) {
   EXPECT_EQ(again.status, 0);
   EXPECT_THAT(again.output, AllOf(HasSubstr(R"("shared":0,"sharedBefore":1,"notShared":0)"),
                                   HasSubstr(R"("outcome":"shared before")")));
+}
+
+TEST(StepText, TellsWhyTheSystemRefused) {
+  using Step = RemovalStep::Outcome;
+  const auto code = [](std::errc error) { return std::make_error_code(error); };
+  const std::vector<RemovalStep> steps = {
+      {.outcome = Step::failed, .code = code(std::errc::no_space_on_device)},
+      {.outcome = Step::changed, .code = code(std::errc::no_such_file_or_directory)},
+      {.outcome = Step::failed, .code = code(std::errc::read_only_file_system)},
+      {.outcome = Step::failed, .code = code(std::errc::no_space_on_device)}};
+  const auto wordingOf = [](Step outcome) -> Wording {
+    return {"", outcome == Step::failed ? "failed" : "changed"};
+  };
+  EXPECT_EQ(explanationsOf(steps, +wordingOf, "stays", "stay"),
+            "1 stays: changed\n2 stay: failed (No space left on device)\n"
+            "1 stays: failed (Read-only file system)\n");
 }
 
 TEST(TextColumns, CutTextsInTheirMiddle) {

@@ -209,6 +209,7 @@ TEST_F(Orvane, RefusesWrongArgumentsInOneLineAndDoesNothing) {
       {{"scan", "--nope", folder.path()}, 2, "--nope"},
       {{"scan", "--qos", "fast\nest", folder.path()}, 2, "fast\\nest"},
       {{"scan", "--min-size", "10q", "."}, 2, "--min-size: \"10q\" is no size"},
+      {{"scan", "--min-size", "10\xcb", "."}, 2, "--min-size: \"10\\xCB\" is no size"},
       {{"scan", "--max-size", "1K", "--min-size", "1KiB", "."}, 2, "above the largest"},
       {{"scan", "--exclude", "", "."}, 2, "the pattern is empty"},
       {{"scan", "--keep-in", missing, "."}, 1, missing},

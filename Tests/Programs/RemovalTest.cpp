@@ -141,6 +141,9 @@ TEST_F(RemovalFixture, LeavesWhatCannotBeComparedOrNoted) {
   EXPECT_THAT(removeAll(), ElementsAre(moved, stopped));
   EXPECT_EQ(totals.notMoved, 1u);
   EXPECT_EQ(copiesInTrash("same"), 1);
+  Removal unseen = makeRemoval();
+  EXPECT_FALSE(unseen.prepare());
+  EXPECT_THAT(outcomes(unseen), ElementsAre(stopped, stopped));
 }
 
 TEST_F(RemovalFixture, LeavesWhatIsNoCopy) {
@@ -156,6 +159,15 @@ TEST_F(RemovalFixture, LeavesWhatIsNoCopy) {
   trash.devices = fileSystem.devices;
   EXPECT_THAT(removeAll({.otherFileSystems = true, .hardLinks = true}),
               ElementsAre(different, different, different));
+}
+
+TEST_F(RemovalFixture, KnowsFilesByTheirNumbersWhereThoseLast) {
+  write("a", "same"), write("b", "same");
+  report({"a", "b"});
+  for (ReportFile& file : found.groups[0].files) ++file.inode;
+  EXPECT_THAT(removeAll(), ElementsAre(changed));
+  fileSystem.keepsNumbers = false;
+  EXPECT_THAT(removeAll(), ElementsAre(moved));
 }
 
 TEST_F(RemovalFixture, PutsBackWhatHasBecomeTheLastOne) {

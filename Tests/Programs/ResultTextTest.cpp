@@ -85,14 +85,15 @@ TEST_F(ResultText, ReportsTheStateOfEachFile) {
       return true;
     };
     const ScanFacts about{.startedAt = std::chrono::sys_days(std::chrono::year(2026) / 1 / 2),
-                          .folders = {folder.path()}};
+                          .folders = {folder.path(), "/\xe9"}};
     EXPECT_TRUE(writeReport(scan(), about, maxGroups, write));
     EXPECT_THAT(text, EndsWith("}\n"));
     return nlohmann::json::parse(text);
   };
   const auto whole = report(TextForm::allGroups);
   EXPECT_EQ(whole["startedAt"], "2026-01-02T00:00:00Z");
-  EXPECT_EQ(whole["roots"], nlohmann::json({folder.path()}));
+  EXPECT_EQ(whole["roots"], nlohmann::json({folder.path(), "/\xEF\xBF\xBD"}));
+  EXPECT_EQ(whole["rootURLs"][1], "file:///%E9");
   ASSERT_EQ(whole["groups"].size(), 1u);
   const auto& files = whole["groups"][0]["files"];
   EXPECT_EQ(files[0]["path"], plain);

@@ -172,6 +172,7 @@ class FaultyFileSystem final : public FileSystem {
                             std::uint64_t offset, std::uint64_t length)>
       share;
   std::map<std::string, FileIdentity> identities;  ///< Of folders that are mounted again.
+  bool keepsNumbers = true;
   int maxOpenFolders = 1000;
   int maxFoldersBesideAFile = 1000;
   std::atomic<int> placesAsked{0};
@@ -251,6 +252,8 @@ class FaultyFileSystem final : public FileSystem {
     }
 
     FolderEntry look(const char* name) override { return folder_->look(name); }
+
+    [[nodiscard]] bool keepsNumbers() const override { return owner_.keepsNumbers; }
 
     [[nodiscard]] bool mayShareExtents() const override {
       return !owner_.shared.empty() || folder_->mayShareExtents();

@@ -240,7 +240,12 @@ std::optional<TrashError> DesktopTrash::restore(const TrashedFile& file, Folders
       file.name.find('/') != std::string::npos)
     return failed(std::make_error_code(std::errc::invalid_argument));
   const auto trash = TrashFolder::open(file.folder);
-  if (!trash) return noTrash(trash.error());
+  if (!trash) {
+    // Many people empty a trash by removing all of it.
+    const bool isGone = trash.error() == std::errc::no_such_file_or_directory &&
+                        TrashFolder::isDiskThere(file.folder, homePath());
+    return isGone ? because(Reason::emptied) : noTrash(trash.error());
+  }
   const auto info = trash->info(file.name);
   if (!info || trash->pathIn(*info) != file.path) return because(Reason::emptied);
   const auto state = stateAt(trash->files(), file.name);

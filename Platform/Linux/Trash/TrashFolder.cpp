@@ -111,6 +111,14 @@ Result<TrashFolder, std::error_code> TrashFolder::open(const std::string& path) 
   return openIn(held->folder.get(), path, Missing::fails);
 }
 
+bool TrashFolder::isDiskThere(const std::string& path, const std::string& home) {
+  const auto volume = volumeOf(path);
+  if (!volume && path != home) return false;
+  const auto above = HeldFolder::open(volume ? *volume + "/" : path.substr(0, path.rfind('/') + 1),
+                                      Missing::fails);
+  return above && (!volume || above->path == above->volumePath);
+}
+
 Result<TrashFolder, std::error_code> TrashFolder::atHome(const std::string& path,
                                                          const HeldFolder& folder) {
   const auto held = HeldFolder::open(path, Missing::fails);

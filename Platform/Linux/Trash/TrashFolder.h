@@ -32,6 +32,9 @@ class TrashFolder final {
  public:
   /// By its path, in which no link may be. Nothing is made.
   [[nodiscard]] static Result<TrashFolder, std::error_code> open(const std::string& path);
+  /// Whether the disk of the trash with this path is there: that of a volume is mounted, and that
+  /// of the trash `home` has the folder above it. Another disk in its place is not told from it.
+  [[nodiscard]] static bool isDiskThere(const std::string& path, const std::string& home);
 
   /// The user's own, if it is on the mount that the folder lies on (else `cross_device_link`). What
   /// is missing in it is made.
