@@ -121,10 +121,11 @@ bool SpoolingTransport::drain(std::chrono::milliseconds timeout) {
 }
 
 bool SpoolingTransport::hasDiscardedAll() const {
-  return !parts_->recorder.mustEmpty();
+  return !parts_->areTheParents() && !parts_->recorder.mustEmpty();
 }
 
 SpoolCounts SpoolingTransport::counts() const {
+  if (parts_->areTheParents()) return {};
   return parts_->recorder.counts(parts_->maxRefusals);
 }
 

@@ -202,7 +202,7 @@ class RuntimeFolder final : public SessionBoard {
     if (!isTaken || isPassedOver(name)) return std::make_unique<Place>();
     if (wait == Wait::no) return nullptr;
     const auto isIn = waitForOne(places, patience_);
-    if (!isIn) passOver(name);
+    if (!isIn) passOver(name, places);
     if (!isIn.value_or(false)) return std::make_unique<Place>();
     return std::make_unique<HeldPlace>(places);
   }
@@ -250,19 +250,18 @@ class RuntimeFolder final : public SessionBoard {
     std::string path;
     LockedFile file;
   };
-  using Clock = std::chrono::steady_clock;
   static constexpr std::size_t maxNotes = 1000;
-  static constexpr std::chrono::minutes timePassedOver{1};
 
-  // Who has a place, or is the first in line, may have been stopped.
-  void passOver(const std::string& name) {
+  // Who has a place, or is the first in line, may have been stopped. The wait that nobody waits for
+  // any more ends when that process goes on, and till then is the only one.
+  void passOver(const std::string& name, const std::shared_ptr<Places>& waiting) {
     const std::lock_guard lock(mutex_);
-    passedOver_[name] = Clock::now() + timePassedOver;
+    passedOver_[name] = waiting;
   }
   [[nodiscard]] bool isPassedOver(const std::string& name) {
     const std::lock_guard lock(mutex_);
     const auto found = passedOver_.find(name);
-    return found != passedOver_.end() && Clock::now() < found->second;
+    return found != passedOver_.end() && !found->second.expired();
   }
 
   // Empty where the session has none.
@@ -295,14 +294,14 @@ class RuntimeFolder final : public SessionBoard {
 
   // Absent when its process has ended, or it is no note. That of a process which was killed is
   // taken away.
-  static std::optional<std::string> textOf(const fs::path& path) {
+  static std::optional<std::string> textOf(const fs::path& path, bool isAgain = false) {
     const LockedFile note(
         FileDescriptor(::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC)));
     if (note.get() < 0 || !isOwnFile(note.get())) return std::nullopt;
     if (note.isLockedElsewhere())
       return path.extension() == ".new" ? std::nullopt : readAll(note.get());
     // Its process lives, and has posted the next one or withdrawn it.
-    if (hasNoName(note.get())) return textOf(path);
+    if (hasNoName(note.get())) return isAgain ? std::nullopt : textOf(path, true);
     ::unlink(path.c_str());
     return std::nullopt;
   }
@@ -312,7 +311,7 @@ class RuntimeFolder final : public SessionBoard {
   const std::string name_ = randomUUIDString();
   std::mutex mutex_;  ///< Owns what follows.
   std::optional<Posted> note_;
-  std::map<std::string, Clock::time_point> passedOver_;  ///< Until when.
+  std::map<std::string, std::weak_ptr<Places>> passedOver_;  ///< As long as they are waited for.
 };
 
 }  // namespace

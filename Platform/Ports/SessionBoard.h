@@ -33,7 +33,8 @@ class VARNEL_API SessionBoard {
 
   enum class Wait {
     no,
-    /// Until there is one: behind those that wait already, and not to be interrupted.
+    /// Until there is one, or for as long as `takePlace` says: behind those that wait already, and
+    /// not to be interrupted.
     forPlace,
   };
 

@@ -268,7 +268,9 @@ DurableFile::Failure DurableFile::check() {
   if (auto error = connection_->database.row("PRAGMA quick_check(1)", std::tie(verdict)))
     return error;
   if (verdict != "ok") return fileError(SQLiteFailure::damaged, verdict);
-  return judgeColumns(connection_->database, format_);
+  // Another process may migrate the file meanwhile.
+  return connection_->database.transaction(
+      "BEGIN", [&](SQLiteDatabase& database) { return judgeColumns(database, format_); });
 }
 
 PlatformError DurableFile::said(const PlatformError& error) {

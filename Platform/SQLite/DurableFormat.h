@@ -22,7 +22,8 @@ struct FormatVersion final {
   auto operator<=>(const FormatVersion&) const = default;
 };
 
-/// The way from one version to the next of the list.
+/// The way from one version to the next of the list. A column that it adds is written as in the
+/// schema, with type, NOT NULL and default; otherwise the file counts as damaged.
 struct Migration final {
   FormatVersion from;
   std::string sql;  ///< Statements without a transaction of their own.

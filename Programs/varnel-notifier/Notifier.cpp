@@ -195,7 +195,7 @@ bool Notifier::handsOver() {
             SessionBus::usualTime,
             [&](GDBusMessage* reply, const auto&) { isStarted = reply != nullptr; });
   sleepWhile([&] { return !isStarted; });
-  if (*isStarted || program_.look() != ProgramFile::State::replaced) return true;
+  if (*isStarted || program_.look() == ProgramFile::State::gone) return true;
   program_.postpone();
   return false;
 }

@@ -164,8 +164,14 @@ TEST_F(NotifierTest, WhatNobodyTellsOfIsFound) {
     }
     // Files of other programs, which write each anew, are looked at once.
     for (int i = 0; i < 50; ++i) write(std::to_string(i), "");
+    for (int i = 0; i < 50; ++i) {
+      const fs::path ofAMoment = home_ + "/moment" + std::to_string(i);
+      fs::create_directory(ofAMoment);
+      fs::remove(ofAMoment);
+    }
     fs::remove_all(folder);
   }
+  ASSERT_NE(ownerOf(notifierName), 0);
   const std::string descriptors = "/proc/" + std::to_string(ownerOf(notifierName)) + "/fd";
   EXPECT_LT(std::stoi(outputOf("ls -l " + descriptors + " | grep -c inotify")), 10);
 }
