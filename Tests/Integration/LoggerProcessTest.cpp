@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <algorithm>
 #include <filesystem>
+#include <fstream>
 #include <map>
 #include <sstream>
 #include <string>
@@ -110,7 +111,8 @@ TEST_F(LoggerProcessTest, GoesOnWhenTheDiskIsFull) {
   EXPECT_THAT(printed, HasSubstr(report + report + report));
 
   fs::remove(path);
-  Tests::ChildProcess limited = start("exit A 3 0", "ulimit -f 0; ");
+  std::ofstream(path) << std::string(4096, '\n');
+  Tests::ChildProcess limited = start("exit A 3 0", "ulimit -f 1; ");
   EXPECT_THAT(limited.readAll(), HasSubstr("log to file with error File too large\n"));
   EXPECT_EQ(limited.wait(), 0) << "not killed";
 }
