@@ -270,7 +270,7 @@ DurableFile::Failure DurableFile::check() {
   if (verdict != "ok") return fileError(SQLiteFailure::damaged, verdict);
   // Another process may migrate the file meanwhile.
   return connection_->database.transaction(
-      "BEGIN", [&](SQLiteDatabase& database) { return judgeColumns(database, format_); });
+      "BEGIN", [&](SQLiteDatabase& database) { return judgeDefinitions(database, format_); });
 }
 
 PlatformError DurableFile::said(const PlatformError& error) {

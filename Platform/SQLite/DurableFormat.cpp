@@ -2,7 +2,6 @@
 #include <Varnel/Platform/SQLite/DurableFormat.h>
 
 #include <algorithm>
-#include <set>
 
 #include <Varnel/Platform/SQLite/SQLiteDatabase.h>
 #include <Varnel/Platform/SQLite/SQLiteFailure.h>
@@ -59,15 +58,11 @@ Failure missingTable(SQLiteDatabase& database, const DurableFormat& format) {
   return std::nullopt;
 }
 
-// What the schema says of a table's columns, all that an insertion or a search relies on.
-Result<std::set<std::string>> columnsOf(SQLiteDatabase& database, const std::string& table) {
-  std::set<std::string> columns;
-  const auto error = database.each(
-      "SELECT printf('%s %s %d %s %d', name, type, \"notnull\", dflt_value, pk)"
-      " FROM pragma_table_info(?)",
-      [&](SQLiteStatement& row) { columns.emplace(row.text(0).value_or("")); }, table);
-  if (error) return *error;
-  return columns;
+// Then the file has a definition of its own.
+bool isAltered(const DurableFormat& format, const std::string& table) {
+  return std::ranges::any_of(format.migrations, [&](const Migration& migration) {
+    return migration.sql.find("ALTER TABLE " + table) != std::string::npos;
+  });
 }
 
 Failure stamp(SQLiteDatabase& database, const DurableFormat& format) {
@@ -106,21 +101,18 @@ Failure judgeFormat(SQLiteDatabase& database, const DurableFormat& format, Migra
   return version == format.version ? missingTable(database, format) : std::nullopt;
 }
 
-Failure judgeColumns(SQLiteDatabase& database, const DurableFormat& format) {
+Failure judgeDefinitions(SQLiteDatabase& database, const DurableFormat& format) {
   const auto found = formatOf(database);
   if (!found) return found.error();
   if (found->version != format.version) return std::nullopt;
-  auto model = SQLiteDatabase::open(":memory:");
-  if (!model) return model.error();
-  if (auto error = create(*model, format)) return error;
   for (const SavedTable& table : format.tables) {
-    const auto there = columnsOf(database, table.name);
-    if (!there) return there.error();
-    const auto expected = columnsOf(*model, table.name);
-    if (!expected) return expected.error();
-    if (!std::ranges::includes(*there, *expected))
+    std::string definition;
+    if (auto error = database.row("SELECT sql FROM sqlite_master WHERE type = 'table' AND name = ?",
+                                  std::tie(definition), table.name))
+      return error;
+    if (format.schema.find(definition) == std::string::npos && !isAltered(format, table.name))
       return fileError(SQLiteFailure::damaged,
-                       fmt::format("the table {} has other columns", table.name));
+                       fmt::format("the table {} is not the format's", table.name));
   }
   return std::nullopt;
 }

@@ -22,8 +22,8 @@ struct FormatVersion final {
   auto operator<=>(const FormatVersion&) const = default;
 };
 
-/// The way from one version to the next of the list. A column that it adds is written as in the
-/// schema, with type, NOT NULL and default; otherwise the file counts as damaged.
+/// The way from one version to the next of the list. A table that it makes is written as in the
+/// schema; otherwise the file counts as damaged.
 struct Migration final {
   FormatVersion from;
   std::string sql;  ///< Statements without a transaction of their own.
@@ -59,7 +59,8 @@ struct DurableFormat final {
   std::string subject;             ///< For the system's log: "notifications".
   std::int32_t applicationID = 0;  ///< Not 0. A file with another one is refused.
   FormatVersion version;
-  std::string schema;                 ///< Statements that make an empty file one of this format.
+  /// Statements that make an empty file one of this format: "CREATE TABLE NAME(…);" and so on.
+  std::string schema;
   std::vector<Migration> migrations;  ///< Without gaps, the oldest first.
   Journal journal = Journal::rollback;
   Synchronisation synchronisation = Synchronisation::survivesPowerLoss;
@@ -72,10 +73,10 @@ struct DurableFormat final {
                                                        const DurableFormat& format,
                                                        Migrating migrating);
 
-/// Finds damage to the definitions of a file of this very version, which the library's own check of
-/// a file takes for meant. Columns may have been added. Returns the damage, another error, or none.
-[[nodiscard]] std::optional<PlatformError> judgeColumns(SQLiteDatabase& database,
-                                                        const DurableFormat& format);
+/// Finds damage to the definitions of tables in a file of this very version, which the library's
+/// own check of a file takes for meant. Returns the damage, another error, or none.
+[[nodiscard]] std::optional<PlatformError> judgeDefinitions(SQLiteDatabase& database,
+                                                            const DurableFormat& format);
 
 /// Makes an empty file one of this format and migrates one of an earlier version, each in one
 /// transaction, where that may be done. To be called on a file that `judgeFormat` let pass.
