@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Platform/Ports/StandardOutput.h>
 
-#include <pthread.h>
 #include <signal.h>
 #include <unistd.h>
 
@@ -10,39 +9,10 @@
 
 #include <Varnel/Platform/Bare/Adapters.h>
 #include <Varnel/Platform/POSIX/StandardStreams.h>
+#include <Varnel/Platform/POSIX/SuppressedSignal.h>
 
 namespace Varnel::Platform::Bare {
 namespace {
-
-// While it lives, a write to a pipe without a reader only fails. The signal that comes with it goes
-// to the writing thread, and is consumed here whatever the process does with signals.
-class BrokenPipeIsNoSignal final {
- public:
-  BrokenPipeIsNoSignal() {
-    ::sigemptyset(&brokenPipe_);
-    ::sigaddset(&brokenPipe_, SIGPIPE);
-    ::pthread_sigmask(SIG_BLOCK, &brokenPipe_, &before_);
-    wasPending_ = isPending();
-  }
-  ~BrokenPipeIsNoSignal() {
-    int consumed = 0;
-    if (!wasPending_ && isPending()) ::sigwait(&brokenPipe_, &consumed);
-    ::pthread_sigmask(SIG_SETMASK, &before_, nullptr);
-  }
-  BrokenPipeIsNoSignal(const BrokenPipeIsNoSignal&) = delete;
-  BrokenPipeIsNoSignal& operator=(const BrokenPipeIsNoSignal&) = delete;
-
- private:
-  static bool isPending() {
-    sigset_t pending;
-    ::sigpending(&pending);
-    return ::sigismember(&pending, SIGPIPE) == 1;
-  }
-
-  sigset_t brokenPipe_;
-  sigset_t before_;
-  bool wasPending_ = false;
-};
 
 // Writes each text at once, behind what the host has printed: nothing of the framework's own is
 // ever left in a buffer, to be lost, written twice after a fork, or written into a broken pipe by
@@ -53,10 +23,11 @@ class UnbufferedStream final : public StandardOutput {
 
   void print(std::string_view text) override {
     if (!isThere_) return;
-    const BrokenPipeIsNoSignal guard;
+    POSIX::SuppressedSignal brokenPipe(SIGPIPE);
     ::flockfile(stream_);
     if (std::fflush(stream_) == 0) write(text);
     ::funlockfile(stream_);
+    brokenPipe.consume();
   }
 
  private:

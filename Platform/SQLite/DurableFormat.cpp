@@ -45,24 +45,27 @@ bool canMigrate(const DurableFormat& format, FormatVersion version, Migrating mi
                      [&](const Migration& migration) { return migration.from == version; });
 }
 
-// A file that calls itself one of this very version has its tables.
-Failure missingTable(SQLiteDatabase& database, const DurableFormat& format) {
-  for (const SavedTable& table : format.tables) {
-    bool isThere = false;
-    if (auto error = database.row("SELECT 1 FROM sqlite_master WHERE type = 'table' AND name = ?",
-                                  std::tie(isThere), table.name))
-      return error;
-    if (!isThere)
-      return fileError(SQLiteFailure::damaged, fmt::format("there is no table {}", table.name));
-  }
-  return std::nullopt;
-}
-
-// Then the file has a definition of its own.
+// Such a table has a text of its own.
 bool isAltered(const DurableFormat& format, const std::string& table) {
   return std::ranges::any_of(format.migrations, [&](const Migration& migration) {
     return migration.sql.find("ALTER TABLE " + table) != std::string::npos;
   });
+}
+
+// A file that calls itself one of this very version has its tables, and they are what they were
+// made as. The library's own check of a file takes a damaged definition for meant.
+Failure foreignTable(SQLiteDatabase& database, const DurableFormat& format) {
+  for (const SavedTable& table : format.tables) {
+    std::string definition;
+    if (auto error = database.row("SELECT sql FROM sqlite_master WHERE type = 'table' AND name = ?",
+                                  std::tie(definition), table.name))
+      return error;
+    const bool isOurs = format.schema.find(definition) != std::string::npos;
+    if (definition.empty() || (!isOurs && !isAltered(format, table.name)))
+      return fileError(SQLiteFailure::damaged,
+                       fmt::format("there is no table {} of this format", table.name));
+  }
+  return std::nullopt;
 }
 
 Failure stamp(SQLiteDatabase& database, const DurableFormat& format) {
@@ -98,23 +101,7 @@ Failure judgeFormat(SQLiteDatabase& database, const DurableFormat& format, Migra
   if (version.major > format.version.major) return fileError(SQLiteFailure::newer, named);
   if (version.major < format.version.major && !canMigrate(format, version, migrating))
     return fileError(SQLiteFailure::older, named);
-  return version == format.version ? missingTable(database, format) : std::nullopt;
-}
-
-Failure judgeDefinitions(SQLiteDatabase& database, const DurableFormat& format) {
-  const auto found = formatOf(database);
-  if (!found) return found.error();
-  if (found->version != format.version) return std::nullopt;
-  for (const SavedTable& table : format.tables) {
-    std::string definition;
-    if (auto error = database.row("SELECT sql FROM sqlite_master WHERE type = 'table' AND name = ?",
-                                  std::tie(definition), table.name))
-      return error;
-    if (format.schema.find(definition) == std::string::npos && !isAltered(format, table.name))
-      return fileError(SQLiteFailure::damaged,
-                       fmt::format("the table {} is not the format's", table.name));
-  }
-  return std::nullopt;
+  return version == format.version ? foreignTable(database, format) : std::nullopt;
 }
 
 Failure applyFormat(SQLiteDatabase& database, const DurableFormat& format, Migrating migrating) {

@@ -73,11 +73,6 @@ struct DurableFormat final {
                                                        const DurableFormat& format,
                                                        Migrating migrating);
 
-/// Finds damage to the definitions of tables in a file of this very version, which the library's
-/// own check of a file takes for meant. Returns the damage, another error, or none.
-[[nodiscard]] std::optional<PlatformError> judgeDefinitions(SQLiteDatabase& database,
-                                                            const DurableFormat& format);
-
 /// Makes an empty file one of this format and migrates one of an earlier version, each in one
 /// transaction, where that may be done. To be called on a file that `judgeFormat` let pass.
 [[nodiscard]] std::optional<PlatformError> applyFormat(SQLiteDatabase& database,

@@ -224,11 +224,7 @@ class Walk::Task final : public TaskGroup::Task {
       : walk_(walk), work_(work), writer_(*walk.tree_), open_(walk.fileSystem_) {}
 
   std::optional<std::uint64_t> run(DiskTurn& turn) override {
-    do {
-      if (walk_.group_.shouldStop()) {
-        if (folder_) folder_->isWhole = false;
-        return std::nullopt;
-      }
+    while (!walk_.group_.shouldStop()) {
       if (!folder_ && !(folder_ = work_.take())) return std::nullopt;
       if (!listing_ && !begin()) {
         folder_ = nullptr;
@@ -238,8 +234,10 @@ class Walk::Task final : public TaskGroup::Task {
         folder_ = nullptr;
         children_.clear();
       }
-    } while (!turn.isOver());
-    return folder_ ? folder_->identity.inode : 0;
+      if (turn.isOver()) return folder_ ? folder_->identity.inode : 0;
+    }
+    if (folder_) folder_->isWhole = false;
+    return std::nullopt;
   }
 
   void refuse() override {

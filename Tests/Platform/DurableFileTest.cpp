@@ -177,25 +177,18 @@ TEST_P(DurableFileTest, SetsADamagedFileAsideAndSavesItsRows) {
     bool isSalvaged;
   };
   constexpr int rows = 2000;
+  const auto execute = [&](const char* sql) {
+    auto database = SQLiteDatabase::open(path_, SQLiteDatabase::Access::readWrite);
+    EXPECT_FALSE(database->execute(std::string("PRAGMA writable_schema = ON;") + sql));
+  };
   const std::vector<Case> cases{
       {"no database", [&] { std::ofstream(path_) << std::string(20000, 'x'); }, false},
       {"a damaged header", [&] { overwrite(path_, 0, std::string(100, '\0')); }, false},
       {"damaged pages", [&] { overwrite(path_, 6 * 4096, std::string(2 * 4096, 'x')); }, true},
       {"half a file", [&] { fs::resize_file(path_, fs::file_size(path_) / 2); }, true},
-      {"without its table",
-       [&] {
-         auto database = SQLiteDatabase::open(path_, SQLiteDatabase::Access::readWrite);
-         EXPECT_FALSE(database->execute("DROP TABLE note"));
-       },
-       false},
-      {"with another column under the old name",
-       [&] {
-         auto database = SQLiteDatabase::open(path_, SQLiteDatabase::Access::readWrite);
-         EXPECT_FALSE(database->execute(
-             "PRAGMA writable_schema = ON;"
-             "UPDATE sqlite_master SET sql = replace(sql, 'TEXT NOT NULL', 'TEXT NULL')"));
-       },
-       true},
+      {"without its table", [&] { execute("DROP TABLE note"); }, false},
+      {"with another column",
+       [&] { execute("UPDATE sqlite_master SET sql = replace(sql, 'NOT NULL', '')"); }, true},
   };
   for (const Case& one : cases) {
     SCOPED_TRACE(one.what);
