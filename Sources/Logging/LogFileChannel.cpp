@@ -104,6 +104,7 @@ void LogFileChannel::runWriter() {
         lock.unlock();
         flush();
         lock.lock();
+        wakeUp_.wait_for(lock, policy_.pause, [this] { return isClosing_; });
         break;
       case LogWritePolicy::Step::waitForMark:
         wakeMark_ = policy_.highWaterMark;

@@ -7,7 +7,8 @@
 namespace Varnel {
 
 /// When gathered log entries go to the file: as soon as there are `highWaterMark` bytes, or when
-/// the first of them has waited for `interval`.
+/// the first of them has waited for `interval`; but not more often than once in a `pause`, so that
+/// the author of a burst, who pays for waking the writer, pays once.
 struct LogWritePolicy {
   using Duration = std::chrono::steady_clock::duration;
 
@@ -19,6 +20,7 @@ struct LogWritePolicy {
 
   std::size_t highWaterMark = 4096;
   Duration interval = std::chrono::seconds(1);
+  Duration pause = std::chrono::milliseconds(1);
 
   /// What the writer does next. `elapsed` is the time since the first waiting byte or, when none
   /// waits, since the last write: soon after a write the writer sleeps lightly, so that a steady

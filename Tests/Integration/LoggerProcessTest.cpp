@@ -115,6 +115,10 @@ TEST_F(LoggerProcessTest, GoesOnWhenTheDiskIsFull) {
   Tests::ChildProcess limited = start("exit A 3 0", "ulimit -f 1; ");
   EXPECT_THAT(limited.readAll(), HasSubstr("log to file with error File too large\n"));
   EXPECT_EQ(limited.wait(), 0) << "not killed";
+
+  const fs::path printedTo = home.path() / "printed";
+  EXPECT_EQ(start("exit A 2000 0 >'" + printedTo.string() + "'", "ulimit -f 16; ").wait(), 0);
+  EXPECT_EQ(fs::file_size(printedTo), 16 * 512u);
 }
 
 TEST_F(LoggerProcessTest, OutlivesTheReaderOfItsStandardOutput) {

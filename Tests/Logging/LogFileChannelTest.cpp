@@ -75,6 +75,21 @@ TEST_F(LogFileChannelTest, WritesByItselfAfterTheIntervalAlsoWhenItHasSlept) {
   EXPECT_EQ(text().size(), 40 * line.size());
 }
 
+TEST_F(LogFileChannelTest, WritesByItselfOnceInAPauseAndTheRestAtTheEnd) {
+  {
+    LogFileChannel channel(files, output, "/log",
+                           {.highWaterMark = 64, .interval = longTime, .pause = longTime});
+    for (int i = 0; i < 3; ++i) {
+      waitUntilTheWriterSleeps();
+      channel.append(line);
+      files.waitForAppends(1);
+    }
+    waitUntilTheWriterSleeps();
+    EXPECT_EQ(text().size(), line.size());
+  }
+  EXPECT_EQ(text().size(), 3 * line.size());
+}
+
 TEST_F(LogFileChannelTest, NeverMakesAnAuthorWaitForTheDisk) {
   LogFileChannel channel(files, output, "/log");
   files.faults->plan(Fault::delays, 1);

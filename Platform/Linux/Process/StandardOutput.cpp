@@ -4,12 +4,15 @@
 #include <pthread.h>
 #include <signal.h>
 #include <stdio_ext.h>
+#include <sys/stat.h>
 
+#include <algorithm>
 #include <atomic>
 #include <cerrno>
 #include <climits>
 #include <cstdio>
 #include <cstdlib>
+#include <optional>
 
 #include <Varnel/Platform/Linux/Adapters.h>
 #include <Varnel/Platform/POSIX/StandardStreams.h>
@@ -30,19 +33,34 @@ class LockedStream final {
   std::FILE* stream_;
 };
 
+// How the stream's file refuses a write: for want of readers, or where it may not grow.
+struct Refusal {
+  int signal = 0;
+  int error = 0;
+};
+
+// None for a device, as a terminal, whose writes are to cost no more than they must.
+std::optional<Refusal> refusalOf(std::FILE* stream) {
+  struct stat facts {};
+  if (::fstat(::fileno(stream), &facts) != 0 || S_ISCHR(facts.st_mode)) return std::nullopt;
+  return S_ISREG(facts.st_mode) ? Refusal{SIGXFSZ, EFBIG} : Refusal{SIGPIPE, EPIPE};
+}
+
 // Called with the stream's lock held, and only for a write that may go beyond the buffer.
 void write(std::FILE* stream, std::string_view text, bool flushes) {
-  // A pipe takes a part of what is larger and sends the signal, while the rest may meet its next
-  // reader.
-  const bool mayBeParted = ::__fpending(stream) + text.size() > PIPE_BUF;
-  POSIX::SuppressedSignal brokenPipe(SIGPIPE);
+  const std::optional<Refusal> refusal = refusalOf(stream);
+  std::optional<POSIX::SuppressedSignal> suppressed;
+  if (refusal) suppressed.emplace(refusal->signal);
   errno = 0;  // A stream of wide text refuses this one and sets none.
   const bool isWritten = ::fwrite_unlocked(text.data(), 1, text.size(), stream) == text.size() &&
                          (!flushes || ::fflush_unlocked(stream) == 0);
-  const bool isBroken = errno == EPIPE;
-  if (isBroken || mayBeParted) brokenPipe.consume();
-  // Text that nobody can read any more would be written again, at the latest when the process ends.
-  if (isBroken && !isWritten) ::__fpurge(stream);
+  const bool isRefused = refusal && errno == refusal->error;
+  // A pipe takes a part of what is larger and sends the signal, while the rest may meet its next
+  // reader.
+  const bool mayBeParted = std::max(::__fbufsize(stream), text.size()) > PIPE_BUF;
+  if (suppressed && (isRefused || mayBeParted)) suppressed->consume();
+  // Text that was refused would be written again, at the latest when the process ends.
+  if (isRefused && !isWritten) ::__fpurge(stream);
 }
 
 std::atomic<bool> isProcessEnding = false;
