@@ -133,13 +133,14 @@ std::string DiskAccessNote::text() const {
   for (const Disk& disk : disks) {
     PropertyList places;
     for (const Place& place : disk.places)
-      places.push_back(PropertyDictionary{{"propose", place.propose}, {"seconds", place.seconds}});
-    all.push_back(PropertyDictionary{{"uniqueID", disk.uniqueID},
-                                     {"volume", disk.volume},
-                                     {"maxReaders", disk.maxReaders},
-                                     {"places", std::move(places)},
-                                     {"waiters", jsonOf(disk.waiters)},
-                                     {"waitersForProcesses", jsonOf(disk.waitersForProcesses)}});
+      places.emplace_back(
+          PropertyDictionary{{"propose", place.propose}, {"seconds", place.seconds}});
+    all.emplace_back(PropertyDictionary{{"uniqueID", disk.uniqueID},
+                                        {"volume", disk.volume},
+                                        {"maxReaders", disk.maxReaders},
+                                        {"places", std::move(places)},
+                                        {"waiters", jsonOf(disk.waiters)},
+                                        {"waitersForProcesses", jsonOf(disk.waitersForProcesses)}});
   }
   return Basalt::jsonText(PropertyDictionary{{"program", program}, {"disks", std::move(all)}});
 }
