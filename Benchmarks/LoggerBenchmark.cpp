@@ -172,5 +172,7 @@ int main() {
          1.0);
   report("bursts of 1000 entries, p99 / asynchronous spdlog", &Figures::longBursts, asynchronous,
          1.0);
+  report("bursts of 100 entries, p99 / required work", &Figures::shortBursts, required);
+  report("bursts of 1000 entries, p99 / required work", &Figures::longBursts, required);
   report("log entry, 1 thread / synchronous spdlog", &Figures::oneThread, synchronous);
 }
