@@ -6,7 +6,6 @@
 #include <array>
 #include <atomic>
 #include <cstdint>
-#include <cstring>
 
 #include <Varnel/Platform/Ports/TimeZones.h>
 #include <Varnel/Platform/Text/LocaleLibrary.h>
@@ -27,6 +26,10 @@ struct CachedText {
 
 // Formatters share a slot only when more than four are in use on one thread.
 constinit thread_local std::array<CachedText, 4> cachedTexts{};
+
+Second secondOf(Date date) {
+  return std::chrono::floor<std::chrono::seconds>(date);
+}
 
 // Never given twice, unlike an address.
 std::uint64_t nextIdentity() {
@@ -70,6 +73,24 @@ struct DateFormatter::State {
     return format ? format->text(date) : plainText(date, *zone, hasTime);
   }
 
+  /// The text that this thread has kept; empty for none.
+  [[nodiscard]] std::string_view kept(Date date) const {
+    const CachedText& cached = slot();
+    if (!isCached || cached.formatter != identity || cached.second != secondOf(date)) return {};
+    return {cached.characters.data(), cached.size};
+  }
+
+  void keep(Date date, std::string_view text) const {
+    CachedText& cached = slot();
+    if (!isCached || text.size() > cached.characters.size()) return;
+    text.copy(cached.characters.data(), text.size());
+    cached.formatter = identity;
+    cached.second = secondOf(date);
+    cached.size = text.size();
+  }
+
+  [[nodiscard]] CachedText& slot() const { return cachedTexts[identity % cachedTexts.size()]; }
+
   const std::uint64_t identity = nextIdentity();
   const bool isCached;
   bool hasTime = true;
@@ -84,20 +105,17 @@ DateFormatter::DateFormatter(std::string_view pattern, std::string_view localeId
 DateFormatter::~DateFormatter() = default;
 
 std::string DateFormatter::string(Date date) const {
-  if (!state_->isCached) return state_->compute(date);
-  const auto second = std::chrono::floor<std::chrono::seconds>(date);
-  CachedText& cached = cachedTexts[state_->identity % cachedTexts.size()];
-  if (cached.formatter == state_->identity && cached.second == second)
-    return {cached.characters.data(), cached.size};
-
+  if (const std::string_view kept = state_->kept(date); !kept.empty()) return std::string(kept);
   std::string text = state_->compute(date);
-  if (text.size() <= cached.characters.size()) {
-    std::memcpy(cached.characters.data(), text.data(), text.size());
-    cached.formatter = state_->identity;
-    cached.second = second;
-    cached.size = text.size();
-  }
+  state_->keep(date, text);
   return text;
+}
+
+std::size_t DateFormatter::write(Date date, std::span<char> room) const {
+  const std::string_view kept = state_->kept(date);
+  const std::string made = kept.empty() ? string(date) : std::string();
+  const std::string_view text = kept.empty() ? made : kept;
+  return text.size() <= room.size() ? text.copy(room.data(), text.size()) : 0;
 }
 
 }  // namespace Varnel::Platform

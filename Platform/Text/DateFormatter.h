@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <cstddef>
 #include <memory>
+#include <span>
 #include <string>
 #include <string_view>
 
@@ -32,6 +34,10 @@ class VARNEL_API DateFormatter final {
 
   /// The text of the date, in UTF-8.
   [[nodiscard]] std::string string(Date date) const;
+
+  /// Writes that text into `room` and returns its bytes, as strftime() does; 0 when it does not
+  /// fit. Allocates nothing for a second date of one second.
+  std::size_t write(Date date, std::span<char> room) const;
 
  private:
   struct State;

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include <Varnel/Logging/Logger.h>
 
+#include <array>
 #include <cstdlib>
 #include <filesystem>
 #include <system_error>
@@ -125,8 +126,9 @@ void Logger::log(std::string_view message, std::string_view author, const Loggin
     if (auto item = tag.text(*this))
       // A file's name must neither control the terminal nor look like an entry of its own.
       items.push_back(Platform::visibleText(*std::move(item), Platform::Backslashes::kept));
-  const LogEntry::Buffer buffer =
-      LogEntry::text(entryDates_.string(ports_.clock.now()), author, message, items);
+  std::array<char, 96> timestamp;  // In any script's digits.
+  const std::size_t size = entryDates_.write(ports_.clock.now(), timestamp);
+  const LogEntry::Buffer buffer = LogEntry::text({timestamp.data(), size}, author, message, items);
   const std::string_view entry(buffer.data(), buffer.size());
   ports_.standardOutput.print(entry);
   if (fileChannel_) fileChannel_->append(entry);

@@ -7,6 +7,8 @@
 #include <atomic>
 #include <limits>
 #include <memory>
+#include <span>
+#include <string>
 #include <thread>
 
 #include <Tests/Support/Crew.h>
@@ -72,6 +74,23 @@ TEST(DateFormatter, KeepsTextsOfFormattersAndSecondsApart) {
   // Formatters one after the other at one address and one second.
   for (const auto& [pattern, text] : {std::pair{"HH", "01"}, {"dd", "05"}, {"yy", "24"}})
     EXPECT_EQ(DateFormatter(pattern, "en_US", zones).string(date), text);
+}
+
+TEST(DateFormatter, WritesIntoRoomThatIsLargeEnough) {
+  const Tests::LocalZone utc("UTC");
+  const Date date = sys_days(2024y / May / 5) + 1h;
+  for (const char* pattern :
+       {"HH:mm:ss", "ss.SSS", "'a text that is too long to be kept' mm:ss:HH:mm:ss"}) {
+    const DateFormatter formatter(pattern, "en_US", zones);
+    const std::string text = formatter.string(date + 1s);
+    for (const auto second : {0s, 1s, 1s}) {
+      std::string room(text.size() + 1, '~');
+      EXPECT_EQ(formatter.write(date + second, std::span(room).first(text.size() - 1)), 0u);
+      EXPECT_EQ(room.find_first_not_of('~'), std::string::npos);
+      EXPECT_EQ(formatter.write(date + second, std::span(room).first(text.size())), text.size());
+      EXPECT_EQ(room, formatter.string(date + second) + '~');
+    }
+  }
 }
 
 TEST(DateFormatter, SurvivesOddPatternsAndDates) {
