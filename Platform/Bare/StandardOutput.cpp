@@ -24,9 +24,11 @@ class UnbufferedStream final : public StandardOutput {
   void print(std::string_view text) override {
     if (!isThere_) return;
     POSIX::SuppressedSignal brokenPipe(SIGPIPE);
+    POSIX::SuppressedSignal tooLarge(SIGXFSZ);
     ::flockfile(stream_);
     if (std::fflush(stream_) == 0) write(text);
     ::funlockfile(stream_);
+    tooLarge.consume();
     brokenPipe.consume();
   }
 

@@ -36,7 +36,7 @@ class VARNEL_API DateFormatter final {
   [[nodiscard]] std::string string(Date date) const;
 
   /// Writes that text into `room` and returns its bytes, as strftime() does; 0 when it does not
-  /// fit. Allocates nothing for a second date of one second.
+  /// fit. Allocates nothing where the text is not formatted anew and has at most 48 bytes.
   std::size_t write(Date date, std::span<char> room) const;
 
  private:

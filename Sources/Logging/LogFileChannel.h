@@ -79,8 +79,8 @@ class LogFileChannel final {
   std::condition_variable wakeUp_;
   Batch gathered_;
   Clock::time_point since_ = Clock::now();  ///< Of the first waiting byte, or of the last write.
-  std::size_t
-      wakeMark_;  ///< This many bytes wake the writer. While it is awake, more than there can be.
+  std::size_t wakeMark_;  ///< This many bytes wake the writer. While it is awake or rests, more
+                          ///< than there can be.
   bool isStarted_;
   bool isEnded_ = false;  ///< The file could not be opened.
   bool writesThrough_ = false;

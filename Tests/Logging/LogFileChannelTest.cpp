@@ -51,7 +51,8 @@ TEST(LogWritePolicy, WritesAtTheMarkOrAfterTheInterval) {
 }
 
 TEST_F(LogFileChannelTest, WritesByItselfAtTheMark) {
-  LogFileChannel channel(files, output, "/log", {.highWaterMark = 2 * 64, .interval = longTime});
+  LogFileChannel channel(files, output, "/log",
+                         {.highWaterMark = 2 * 64, .interval = longTime, .pause = 0ms});
   for (std::size_t i = 1; i <= 3; ++i) {
     waitUntilTheWriterSleeps();
     channel.append(line);
@@ -63,7 +64,7 @@ TEST_F(LogFileChannelTest, WritesByItselfAtTheMark) {
 
 TEST_F(LogFileChannelTest, WritesByItselfAfterTheIntervalAlsoWhenItHasSlept) {
   for (const auto interval : {0ms, 1ms}) {
-    LogFileChannel channel(files, output, "/log", {.interval = interval});
+    LogFileChannel channel(files, output, "/log", {.interval = interval, .pause = 0ms});
     for (int i = 1; i <= 20; ++i) {
       const std::size_t before = files.appends();
       // With no interval nothing but an entry wakes it.

@@ -42,8 +42,10 @@ struct Refusal {
 // None for a device, as a terminal, whose writes are to cost no more than they must.
 std::optional<Refusal> refusalOf(std::FILE* stream) {
   struct stat facts {};
-  if (::fstat(::fileno(stream), &facts) != 0 || S_ISCHR(facts.st_mode)) return std::nullopt;
-  return S_ISREG(facts.st_mode) ? Refusal{SIGXFSZ, EFBIG} : Refusal{SIGPIPE, EPIPE};
+  const bool isKnown = ::fstat(::fileno(stream), &facts) == 0;
+  if (isKnown && S_ISCHR(facts.st_mode)) return std::nullopt;
+  if (isKnown && S_ISREG(facts.st_mode)) return Refusal{SIGXFSZ, EFBIG};
+  return Refusal{SIGPIPE, EPIPE};
 }
 
 // Called with the stream's lock held, and only for a write that may go beyond the buffer.
