@@ -35,9 +35,10 @@ inline bool inChild(uid_t user, const std::function<void()>& act,
   const pid_t child = ::fork();
   if (child == 0) {
     if (!disk.empty()) {
-      if (!enterMountNamespace().empty() || !mountMemory(disk)) ::_exit(noDisk);
+      if (!enterMountNamespace(self).empty() || !mountMemory(disk)) ::_exit(noDisk);
       std::filesystem::permissions(disk, std::filesystem::perms::owner_all);
       if (user != self) give(disk, user);
+      if (self != 0 && !dropCapabilities()) ::_exit(2);
     }
     if (user != self && (::setgid(user) != 0 || ::setuid(user) != 0)) ::_exit(2);
     act();
