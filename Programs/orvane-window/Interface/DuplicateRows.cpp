@@ -41,9 +41,8 @@ bool DuplicateRows::shrink(std::size_t groups) {
 // A position is two numbers, the second one of which is a file's, from 1 on, or 0.
 bool DuplicateRows::point(iterator& position, const Row& row) const {
   position.set_stamp(stamp);
-  position.gobj()->user_data = reinterpret_cast<void*>(static_cast<std::uintptr_t>(row.group));
-  position.gobj()->user_data2 =
-      reinterpret_cast<void*>(static_cast<std::uintptr_t>(row.file ? *row.file + 1 : 0));
+  position.gobj()->user_data = GSIZE_TO_POINTER(row.group);
+  position.gobj()->user_data2 = GSIZE_TO_POINTER(row.file ? *row.file + 1 : 0);
   position.gobj()->user_data3 = nullptr;
   return true;
 }

@@ -202,8 +202,8 @@ void DuplicateView::collapseAll() {
   const auto place = current();
   Gtk::TreeModel::Path first, last;
   if (get_visible_range(first, last))
-    for (int i = 0; i < static_cast<int>(unfoldedAtFirst); ++i)
-      collapse_row(DuplicateRows::pathOf(static_cast<std::size_t>(first[0] + i)));
+    for (std::size_t i = 0; i < unfoldedAtFirst; ++i)
+      collapse_row(DuplicateRows::pathOf(static_cast<std::size_t>(first[0]) + i));
   replace(rows_->list(), 0, place ? std::optional(place->group) : std::nullopt);
 }
 

@@ -24,6 +24,7 @@ std::vector<MenuSection> sectionsOf(const std::vector<MenuEntry>& entries) {
 
 std::vector<MenuDescription> descriptionsOf(const std::vector<MenuGroup>& groups) {
   std::vector<MenuDescription> descriptions;
+  descriptions.reserve(groups.size());
   for (const MenuGroup& group : groups)
     descriptions.push_back({.identifier = group.identifier,
                             .title = group.textKey.empty() ? Varnel::Globals::applicationName()

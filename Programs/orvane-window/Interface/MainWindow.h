@@ -70,7 +70,7 @@ class MainWindow final : public Gtk::ApplicationWindow {
   // MainWindowActions.cpp: what the user asks for.
   void addActions();
   void addListMenu(Gtk::Application& owner);
-  void addAction(const std::string& name, std::function<void()> act);
+  void addAction(const std::string& name, const std::function<void()>& act);
   void updateActions();
   void select(const std::string& rule);
   void openCurrent();

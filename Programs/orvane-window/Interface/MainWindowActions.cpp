@@ -31,8 +31,8 @@ constexpr std::array rules{
 
 }  // namespace
 
-void MainWindow::addAction(const std::string& name, std::function<void()> act) {
-  actions_[name] = add_action(name, std::move(act));
+void MainWindow::addAction(const std::string& name, const std::function<void()>& act) {
+  actions_[name] = add_action(name, act);
 }
 
 void MainWindow::addActions() {

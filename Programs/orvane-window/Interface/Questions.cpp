@@ -38,12 +38,15 @@ std::string linesOf(const std::vector<MoveOutcome::Left>& left, std::size_t max)
 
 /// Shows the dialog, and keeps it until it is answered.
 void await(const std::shared_ptr<Gtk::Dialog>& dialog, std::function<void(int)> answer = {}) {
-  dialog->signal_response().connect([dialog, answer = std::move(answer)](int response) mutable {
-    dialog->hide();
-    if (answer) answer(response);
-    // Not within its own signal.
-    Glib::signal_idle().connect_once([dialog = std::move(dialog)] {});
-  });
+  dialog->signal_response().connect(
+      [kept = dialog, answer = std::move(answer)](int response) mutable {
+        const auto answered = std::exchange(kept, nullptr);
+        if (!answered) return;
+        answered->hide();
+        if (answer) answer(response);
+        // Not within its own signal.
+        Glib::signal_idle().connect_once([answered] {});
+      });
   dialog->show();
 }
 

@@ -9,6 +9,7 @@
 #include <iostream>
 #include <sstream>
 #include <stdexcept>
+#include <utility>
 
 #include <Varnel/Context/Bundle.h>
 #include <Varnel/Context/Globals.h>
@@ -216,9 +217,9 @@ void WindowApplication::showPreferences() {
               [this, told](bool sends) {
                 return told(storeConsent(sends ? Consent::granted : Consent::refused, console_));
               }});
-  dialog->signal_response().connect([dialog](int) mutable {
-    dialog->hide();
-    Glib::signal_idle().connect_once([dialog = std::move(dialog)] {});
+  dialog->signal_response().connect([shown = dialog](int) mutable {
+    if (shown) shown->hide();
+    Glib::signal_idle().connect_once([closed = std::exchange(shown, nullptr)] {});
   });
   dialog->show();
 }
