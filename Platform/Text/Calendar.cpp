@@ -5,6 +5,7 @@
 
 #include <Varnel/Platform/Ports/TimeZones.h>
 #include <Varnel/Platform/Ports/UserLocale.h>
+#include <Varnel/Platform/Text/GregorianCalendar.h>
 #include <Varnel/Platform/Text/LocaleLibrary.h>
 
 namespace Varnel::Platform {
@@ -96,7 +97,11 @@ struct Calendar::State {
 Calendar::Calendar(const std::string& localeIdentifier, const std::string& timeZoneIdentifier,
                    const TimeZones& timeZones)
     : state_(new State{.zones = timeZones, .zoneIdentifier = timeZoneIdentifier}) {
-  if (const LocaleLibrary* library = localeLibrary())
+  const LocaleLibrary* library = localeLibrary();
+  if (!library) return;
+  if (library->isGregorian(localeIdentifier))
+    state_->calendar = std::make_unique<GregorianCalendar>();
+  else
     state_->calendar = library->wallCalendar(localeIdentifier);
 }
 

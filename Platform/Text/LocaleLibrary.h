@@ -53,7 +53,10 @@ class LocaleLibrary {
       std::string_view pattern, const std::string& locale, const std::string& zoneIdentifier,
       std::shared_ptr<const TimeZone> zone) const = 0;
 
-  /// The calendar that the locale names or its region has; null when there is none.
+  /// Whether the calendar that the locale names, or its region has, is the Gregorian one.
+  [[nodiscard]] virtual bool isGregorian(const std::string& locale) const = 0;
+
+  /// That calendar; null when there is none.
   [[nodiscard]] virtual std::unique_ptr<WallCalendar> wallCalendar(
       const std::string& locale) const = 0;
 

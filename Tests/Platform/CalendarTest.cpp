@@ -61,6 +61,28 @@ TEST(Calendar, CountsInTheCalendarOfTheLocale) {
     EXPECT_EQ(Calendar(locale, "UTC", zones).weekdayCount(), 7) << locale;
 }
 
+TEST(Calendar, CountsInEveryYearOfTheGregorianOne) {
+  // With a locale that names it, where the region has another, and with one that knows none.
+  for (const char* locale : {"en_US", "th_TH@calendar=gregorian", "", "nonsense"}) {
+    const Calendar calendar(locale, "UTC", zones);
+    const auto later = [&](year_month_day date, int months) {
+      return year_month_day(floor<days>(*calendar.adding(month, utc(date, 9h), months)));
+    };
+    EXPECT_EQ(later(2000y / January / 31, -11), 1999y / February / 28) << locale;
+    EXPECT_EQ(later(2000y / January / 31, 1), 2000y / February / 29);
+    EXPECT_EQ(later(2399y / December / 31, 2), 2400y / February / 29);
+    EXPECT_EQ(later(1y / January / 31, -1), 0y / December / 31);
+    EXPECT_EQ(later(0y / January / 31, -11), -1y / February / 28);
+    EXPECT_EQ(later(-400y / February / 29, -1), -400y / January / 29);
+    EXPECT_EQ(later(-1y / December / 31, 12 * 2401 + 2), 2401y / February / 28);
+    EXPECT_EQ(calendar.adding({.day = -800'000}, utc(2026y / March / 1)),
+              utc(2026y / March / 1) - days(800'000));
+    // Years come before months, and days last.
+    EXPECT_EQ(calendar.adding({.year = 1, .month = -1, .day = 1}, utc(2024y / February / 29)),
+              utc(2025y / January / 29));
+  }
+}
+
 TEST(Calendar, MovesAWallClockTimeIntoAnotherZone) {
   const Calendar newYork("en_US", "America/New_York", zones);
   const auto moved = [&](Date date, const char* zone, const DateComponents& components = {}) {

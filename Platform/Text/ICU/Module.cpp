@@ -43,6 +43,9 @@ class Library final : public LocaleLibrary {
                                            std::shared_ptr<const TimeZone> zone) const override {
     return makeDatePattern(pattern, locale, zoneIdentifier, std::move(zone));
   }
+  bool isGregorian(const std::string& locale) const override {
+    return hasGregorianCalendar(locale);
+  }
   std::unique_ptr<WallCalendar> wallCalendar(const std::string& locale) const override {
     return makeWallCalendar(locale);
   }

@@ -2,14 +2,21 @@
 #include <Varnel/Platform/Text/ICU/WallCalendar.h>
 
 #include <unicode/calendar.h>
+#include <unicode/ucal.h>
+#include <unicode/uenum.h>
+#include <unicode/uloc.h>
 
+#include <array>
 #include <cmath>
+#include <string_view>
 
 namespace Varnel::Platform::ICU {
 namespace {
 
 // How far a calculation may lead; `Date` reaches 292,000 years.
 constexpr double maxMilliseconds = 9.0e15;
+
+constexpr std::string_view gregorian = "gregorian";
 
 class Calendar final : public LocaleLibrary::WallCalendar {
  public:
@@ -39,6 +46,19 @@ class Calendar final : public LocaleLibrary::WallCalendar {
 };
 
 }  // namespace
+
+// A calendar would tell, too, but reads much before.
+bool hasGregorianCalendar(const std::string& locale) {
+  UErrorCode status = U_ZERO_ERROR;
+  std::array<char, ULOC_KEYWORDS_CAPACITY> named{};
+  uloc_getKeywordValue(locale.c_str(), "calendar", named.data(), ULOC_KEYWORDS_CAPACITY, &status);
+  if (U_SUCCESS(status) && named.front() != 0) return std::string_view(named.data()) == gregorian;
+  status = U_ZERO_ERROR;
+  const icu::LocalUEnumerationPointer used(
+      ucal_getKeywordValuesForLocale("calendar", locale.c_str(), true, &status));
+  const char* first = U_SUCCESS(status) ? uenum_next(used.getAlias(), nullptr, &status) : nullptr;
+  return first && U_SUCCESS(status) && first == gregorian;
+}
 
 std::unique_ptr<LocaleLibrary::WallCalendar> makeWallCalendar(const std::string& locale) {
   UErrorCode status = U_ZERO_ERROR;

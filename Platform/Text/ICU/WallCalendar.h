@@ -5,6 +5,8 @@
 
 namespace Varnel::Platform::ICU {
 
+[[nodiscard]] bool hasGregorianCalendar(const std::string& locale);
+
 [[nodiscard]] std::unique_ptr<LocaleLibrary::WallCalendar> makeWallCalendar(
     const std::string& locale);
 
