@@ -5,8 +5,8 @@
 
 namespace Varnel::Platform {
 
-/// The calendar of most regions, of every year before and after as well. It needs no library of
-/// locales, whose own reads hundreds of kilobytes before it counts.
+/// The calendar of most regions, counted on into the years before there was one. It needs no
+/// library of locales, whose own reads hundreds of kilobytes before it counts.
 ///
 ///     GregorianCalendar().adding(0, 1, 0, /* 31 January 2025 */ time);  // 28 February
 class GregorianCalendar final : public LocaleLibrary::WallCalendar {

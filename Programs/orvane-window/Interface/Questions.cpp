@@ -36,20 +36,6 @@ std::string linesOf(const std::vector<MoveOutcome::Left>& left, std::size_t max)
   return left.size() > max ? text + "\n…" : text;
 }
 
-/// Shows the dialog, and keeps it until it is answered.
-void await(const std::shared_ptr<Gtk::Dialog>& dialog, std::function<void(int)> answer = {}) {
-  dialog->signal_response().connect(
-      [kept = dialog, answer = std::move(answer)](int response) mutable {
-        const auto answered = std::exchange(kept, nullptr);
-        if (!answered) return;
-        answered->hide();
-        if (answer) answer(response);
-        // Not within its own signal.
-        Glib::signal_idle().connect_once([answered] {});
-      });
-  dialog->show();
-}
-
 void addButton(Gtk::Dialog& dialog, const char* textKey, int response,
                const std::string& identifier) {
   identify(*dialog.add_button(localized(textKey), response), identifier);
@@ -70,6 +56,20 @@ std::shared_ptr<Gtk::FileChooserDialog> fileChooser(Gtk::Window& parent, const c
 }
 
 }  // namespace
+
+void showUntilAnswered(const std::shared_ptr<Gtk::Dialog>& dialog,
+                       std::function<void(int)> answer) {
+  dialog->signal_response().connect(
+      [kept = dialog, answer = std::move(answer)](int response) mutable {
+        const auto answered = std::exchange(kept, nullptr);
+        if (!answered) return;
+        answered->hide();
+        if (answer) answer(response);
+        // Not within its own signal.
+        Glib::signal_idle().connect_once([answered] {});
+      });
+  dialog->show();
+}
 
 void askBeforeRemoval(Gtk::Window& parent, const PlannedRemoval& plan,
                       std::function<void(bool)> answer) {
@@ -94,8 +94,9 @@ void askBeforeRemoval(Gtk::Window& parent, const PlannedRemoval& plan,
       ->add_class("destructive-action");
   dialog->set_response_sensitive(Gtk::RESPONSE_ACCEPT, plan.files() > 0);
   dialog->set_default_response(Gtk::RESPONSE_CANCEL);
-  await(dialog,
-        [answer = std::move(answer)](int response) { answer(response == Gtk::RESPONSE_ACCEPT); });
+  showUntilAnswered(dialog, [answer = std::move(answer)](int response) {
+    answer(response == Gtk::RESPONSE_ACCEPT);
+  });
 }
 
 void showProblem(Gtk::Window& parent, const std::string& title, const std::string& text) {
@@ -127,7 +128,7 @@ void showText(Gtk::Window& parent, const std::string& title, const std::string& 
   scroll->add(*view);
   dialog->get_content_area()->pack_start(*scroll);
   dialog->show_all_children();
-  await(dialog);
+  showUntilAnswered(dialog);
 }
 
 void showDetails(Gtk::Window& parent, const std::vector<MoveOutcome::Left>& left) {
@@ -139,7 +140,7 @@ void chooseFolders(Gtk::Window& parent,
   const auto dialog = fileChooser(parent, "ChooseFolders", Gtk::FILE_CHOOSER_ACTION_SELECT_FOLDER,
                                   "choose-folders", "Choose", ".choose");
   dialog->set_select_multiple(true);
-  await(dialog, [dialog = dialog.get(), chosen = std::move(chosen)](int response) {
+  showUntilAnswered(dialog, [dialog = dialog.get(), chosen = std::move(chosen)](int response) {
     if (response != Gtk::RESPONSE_ACCEPT) return;
     const auto names = dialog->get_filenames();
     chosen(std::vector<std::string>(names.begin(), names.end()));
@@ -152,7 +153,7 @@ void chooseFile(Gtk::Window& parent, const std::string& suggestedName,
                                   "choose-file", "Save", ".save");
   dialog->set_do_overwrite_confirmation();
   dialog->set_current_name(suggestedName);
-  await(dialog, [dialog = dialog.get(), chosen = std::move(chosen)](int response) {
+  showUntilAnswered(dialog, [dialog = dialog.get(), chosen = std::move(chosen)](int response) {
     if (response == Gtk::RESPONSE_ACCEPT && !dialog->get_filename().empty())
       chosen(dialog->get_filename());
   });
@@ -168,7 +169,7 @@ void showAbout(Gtk::Window& parent) {
   dialog->set_license_type(Gtk::LICENSE_MIT_X11);
   dialog->set_logo_icon_name(Varnel::TargetKind::current().bundleID());
   identify(*dialog, "about");
-  await(dialog);
+  showUntilAnswered(dialog);
 }
 
 }  // namespace Orvane

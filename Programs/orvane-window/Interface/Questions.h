@@ -1,9 +1,11 @@
 // SPDX-License-Identifier: MIT
 #pragma once
 
+#include <gtkmm/dialog.h>
 #include <gtkmm/window.h>
 
 #include <functional>
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -13,6 +15,10 @@ namespace Orvane {
 
 // The dialogs that come and go. None of them waits: each calls back, and nothing when its window
 // has been closed. Main thread.
+
+/// Shows the dialog, and keeps it until it is answered.
+void showUntilAnswered(const std::shared_ptr<Gtk::Dialog>& dialog,
+                       std::function<void(int response)> answer = {});
 
 /// Shows what would be moved, and where; the answer is whether to do it.
 void askBeforeRemoval(Gtk::Window& parent, const PlannedRemoval& plan,

@@ -9,7 +9,6 @@
 #include <iostream>
 #include <sstream>
 #include <stdexcept>
-#include <utility>
 
 #include <Varnel/Context/Bundle.h>
 #include <Varnel/Context/Globals.h>
@@ -217,11 +216,7 @@ void WindowApplication::showPreferences() {
               [this, told](bool sends) {
                 return told(storeConsent(sends ? Consent::granted : Consent::refused, console_));
               }});
-  dialog->signal_response().connect([shown = dialog](int) mutable {
-    if (shown) shown->hide();
-    Glib::signal_idle().connect_once([closed = std::exchange(shown, nullptr)] {});
-  });
-  dialog->show();
+  showUntilAnswered(dialog);
 }
 
 void WindowApplication::showLicense() {
