@@ -10,6 +10,7 @@
 #include <vector>
 
 #include <Benchmarks/Measurements.h>
+#include <Tests/Support/TemporaryFolder.h>
 #include <Varnel/Platform/POSIX/Adapters.h>
 #include <Varnel/Platform/Ports/Clock.h>
 #include <Varnel/Platform/Ports/PrivateFiles.h>
@@ -100,15 +101,15 @@ class OtherProcess {
 }  // namespace
 
 int main() {
-  const fs::path folder = fs::temp_directory_path() / "varnel-analytics-benchmark";
+  // Declared first, so that it goes last: the tracker makes anew what it finds gone.
+  const Varnel::Tests::TemporaryFolder temporary;
+  const fs::path& folder = temporary.path();
   const auto files = POSIX::makePrivateFiles();
   const auto clock = POSIX::makeClock();
   Testing::CapturedSystemLog log;
   Testing::FakeHTTPClient http;
   http.setServer([](const HTTPPost&) { return HTTPFailure{"down"}; });
 
-  fs::remove_all(folder);
-  fs::create_directories(folder);
   Tallyhouse::DeliveryPolicy patient;
   patient.linger = std::chrono::hours(1);
   patient.firstRetry = std::chrono::hours(1);
@@ -134,5 +135,4 @@ int main() {
   std::vector<Nanoseconds> waits;
   for (int i = 0; i < repetitions; ++i) waits.push_back(timeOf(track));
   report("trackEvent, file locked by others, worst / 20 ms", percentile(waits, 1), 20e6, 1.0);
-  fs::remove_all(folder);
 }
