@@ -81,8 +81,9 @@ class FakeNotificationServer final : public NotificationServer {
     }
   }
 
-  /// Acts as a server that was started.
+  /// Acts as a server that was started. What failed before is reported before, as on a bus.
   void appear() {
+    report();
     isPresent = true;
     if (const auto observer = observer_.lock()) observer->serverAppeared();
   }
