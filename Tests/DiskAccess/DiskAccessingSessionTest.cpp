@@ -170,17 +170,17 @@ TEST_F(DiskAccessingSessionTest, NestedSessionsNeverWaitForOneAnother) {
     bool isBackgroundMode;
     unsigned threads;
   } cases[] = {{homeFile, true, 2}, {stickFile, false, 4}};
-  for (const auto& [file, isBackgroundMode, threadCount] : cases) {
-    manager_->setIsBackgroundMode(isBackgroundMode);
+  for (const auto& each : cases) {
+    manager_->setIsBackgroundMode(each.isBackgroundMode);
     awaitInventory();
-    const std::shared_ptr<DiskData> disk = DiskAccessGuard(begin(file))->diskData();
+    const std::shared_ptr<DiskData> disk = DiskAccessGuard(begin(each.file))->diskData();
     ASSERT_NE(disk, unknown->diskData()) << "an access that is over binds nobody";
-    std::atomic<unsigned> left = threadCount;
-    Tests::Crew threads(threadCount, [&, &file = file](unsigned) {
+    std::atomic<unsigned> left = each.threads;
+    Tests::Crew threads(each.threads, [&](unsigned) {
       for (int i = 0; i < 5000; ++i) {
-        const DiskAccessGuard outer(begin(file));
+        const DiskAccessGuard outer(begin(each.file));
         std::this_thread::yield();
-        const DiskAccessGuard inner(begin(file));
+        const DiskAccessGuard inner(begin(each.file));
       }
       --left;
     });
